@@ -225,12 +225,15 @@ std::string describeError(std::string_view source, ChassisError const& error) {
     return line + ": " + error.what();
 }
 
+std::string oneLine(std::string text) {
+    std::ranges::replace_if(text, isControl, '?');
+    return text;
+}
+
 std::string inQuotes(std::string_view text) {
     constexpr std::size_t longest = 60;
-    std::string result = "\"";
-    for (char const c : text.substr(0, longest))
-        result += isControl(c) ? '?' : c;
-    return result + (text.size() > longest ? "...\"" : "\"");
+    return "\"" + oneLine(std::string(text.substr(0, longest))) +
+           (text.size() > longest ? "...\"" : "\"");
 }
 
 bool Description::readsAsInteger() const {
@@ -280,7 +283,7 @@ Description describeYaml(std::string const& text) {
         }
     } catch (YAML::Exception const& error) {
         throw ChassisError(error.mark.is_null() ? 0 : error.mark.line + 1,
-                           "not readable as YAML: " + error.msg +
+                           "not readable as YAML: " + oneLine(error.msg) +
                                "; correct it there or just before");
     }
     return builder.take();

@@ -232,6 +232,12 @@ TEST(ChassisReaderTest, KeysWithControlCharactersAreRefusedOnOneLine) {
                        "printable characters");
 }
 
+TEST(ChassisReaderTest, WordsOfTheYamlParserStayOnOneLine) {
+    EXPECT_EQ(refusalOf("boards: \"\\\001\"\n"),
+              "chassis:1: not readable as YAML: unknown escape character: ?; correct it there or "
+              "just before");
+}
+
 TEST(ChassisReaderTest, DeepNestingIsRefusedWithoutUsingUpTheStack) {
     EXPECT_EQ(refusalOf(std::string(100000, '[') + std::string(100000, ']')),
               "chassis:1: too many nested levels; a chassis needs at most 12");

@@ -5,6 +5,8 @@
 // flood COUNT         announces COUNT events and ends at once, while they are being delivered
 // exit-in-handler     from now on the first event ends the process from within its handler
 // end of input        ends the process
+#include <unistd.h>
+
 #include <array>
 #include <atomic>
 #include <cstdio>
@@ -96,6 +98,8 @@ int main() {
         } else if (command == "exit-in-handler") {
             s_printer.exitInHandler = true;
             kvlsim::execute({{"command", "event"}, {"id", 0x40001}});
+            while (true)
+                pause(); // two threads must not both end the process
         }
     }
     return 0;
