@@ -10,7 +10,6 @@
 
 namespace {
 
-// [listener]
 /// Called on the thread that delivers the change, so it only prints.
 class Printer final : public BoardStatusListener {
   public:
@@ -22,12 +21,10 @@ class Printer final : public BoardStatusListener {
         return 0;
     }
 };
-// [listener]
 
 } // namespace
 
 int main(int argc, char** argv) {
-    // [module]
     char const* const file = argc > 1 ? argv[1] : "z7simkvl.so";
     void* const module = dlopen(file, RTLD_NOW);
     void* const entry = module == nullptr ? nullptr : dlsym(module, KVL_BOARD_MODULE_ENTRY_POINT);
@@ -37,12 +34,10 @@ int main(int argc, char** argv) {
     }
     auto* const create = reinterpret_cast<KVLCreateBoardFactory*>(entry);
     ReferenceCounter<BoardFactory> const factory(create(KVL_BOARD_MODULE_ABI_VERSION));
-    // [module]
     if (factory.get() == nullptr) {
         std::fprintf(stderr, "%s is of another version; build it anew\n", file);
         return 1;
     }
-    // [boards]
     Printer printer;
     ReferenceCounter<BoardManager> const manager(new BoardManager);
     manager->AddBoardStatusListener(&printer); // first, so that it hears of the boards found now
@@ -53,7 +48,6 @@ int main(int argc, char** argv) {
         board->GetName(name);
         std::printf("board %d: %s\n", manager->GetIndexByBoard(board), name);
     }
-    // [boards]
     std::fflush(stdout);
     std::getchar();
     std::_Exit(0); // without tearing anything down: a change may be on its way on another thread
