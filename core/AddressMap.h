@@ -27,11 +27,19 @@ class AddressMap {
         }
     }
 
-    /// Requires that `key` is not in the map.
-    void insert(void const* key, Value value) {
-        if (2 * (m_size + 1) > m_slots.size()) grow();
-        place(key, value);
+    /// The value at `key`; when there is none, what `make()` returns, which is put there.
+    template <class Make>
+    Value find_or_insert(void const* key, Make const& make) {
+        if (2 * (m_size + 1) > m_slots.size()) [[unlikely]]
+            grow();
+        std::size_t i = home(key);
+        while (m_slots[i].first != nullptr) {
+            if (m_slots[i].first == key) return m_slots[i].second;
+            i = next(i);
+        }
+        m_slots[i] = {key, make()};
         ++m_size;
+        return m_slots[i].second;
     }
 
     /// Takes `key` out and returns its value; null when it is not in the map.

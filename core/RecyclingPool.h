@@ -49,17 +49,12 @@ class RecyclingPool {
 
     static void give(T* object) {
         Cache& cache = s_cache;
-        if (cache.count >= cache.limit) [[unlikely]]
-            makeRoom();
-        // After its thread has drained it, a cache has no room any more.
-        if (cache.limit == 0) [[unlikely]] {
-            delete blockOf(object);
+        Block* const block = blockOf(object);
+        if (cache.count >= cache.limit) [[unlikely]] {
+            giveToFull(block);
             return;
         }
-        Block* block = blockOf(object);
-        block->next = cache.head;
-        cache.head = block;
-        ++cache.count;
+        put(cache, block);
     }
 
   private:
@@ -105,6 +100,12 @@ class RecyclingPool {
         return reinterpret_cast<Block*>(storage - offsetof(Block, storage));
     }
 
+    static void put(Cache& cache, Block* block) {
+        block->next = cache.head;
+        cache.head = block;
+        ++cache.count;
+    }
+
     static void open(Cache& cache) {
         if (cache.ended || cache.limit != 0) return;
         static thread_local Drain drain;
@@ -129,18 +130,24 @@ class RecyclingPool {
         return (new Block)->object();
     }
 
-    [[gnu::noinline]] static void makeRoom() {
+    [[gnu::noinline]] static void giveToFull(Block* block) {
         Cache& cache = s_cache;
         open(cache);
-        if (cache.count < cache.limit || cache.limit == 0) return;
-        Block* batch = cache.head;
-        Block* last = batch;
-        for (std::int32_t i = 1; i < kBatch; ++i)
-            last = last->next;
-        cache.head = last->next;
-        cache.count -= kBatch;
-        last->next = nullptr;
-        stock(batch, kBatch);
+        if (cache.limit == 0) { // the thread is ending
+            delete block;
+            return;
+        }
+        if (cache.count >= cache.limit) {
+            Block* const batch = cache.head;
+            Block* last = batch;
+            for (std::int32_t i = 1; i < kBatch; ++i)
+                last = last->next;
+            cache.head = last->next;
+            cache.count -= kBatch;
+            last->next = nullptr;
+            stock(batch, kBatch);
+        }
+        put(cache, block);
     }
 
     static void stock(Block* batch, std::int32_t size) {

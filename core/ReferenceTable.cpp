@@ -32,23 +32,20 @@ ReferenceTable::~ReferenceTable() {
 
 ReferenceInfo* ReferenceTable::get_refinfo(Object* object) {
     if (object == nullptr) return nullptr;
-    ObjectGuard const guard(*this);
+    KVL::MutexGuard const guard(mutex());
     return m_records.find(object);
 }
 
 ReferenceInfo* ReferenceTable::create_refinfo(Object* object) {
     if (object == nullptr) return nullptr;
-    ObjectGuard const guard(*this);
-    if (ReferenceInfo* record = m_records.find(object)) return record;
-    ReferenceInfo* record = RecordPool::take();
-    m_records.insert(object, record);
-    return record;
+    KVL::MutexGuard const guard(mutex());
+    return m_records.find_or_insert(object, [] { return RecordPool::take(); });
 }
 
 void ReferenceTable::destroy_refcount(Object* object) {
     ReferenceInfo* record = nullptr;
     if (object != nullptr) {
-        ObjectGuard const guard(*this);
+        KVL::MutexGuard const guard(mutex());
         record = m_records.erase(object);
     }
     if (record != nullptr) {
@@ -58,7 +55,7 @@ void ReferenceTable::destroy_refcount(Object* object) {
 }
 
 void ReferenceTable::dump() {
-    ObjectGuard const guard(*this);
+    KVL::MutexGuard const guard(mutex());
     auto entries = m_records.entries();
     std::sort(entries.begin(), entries.end(), [](auto const& a, auto const& b) {
         return std::less<void const*>()(a.first, b.first);
@@ -78,6 +75,6 @@ void ReferenceTable::dump() {
 }
 
 int ReferenceTable::referenced_objects() {
-    ObjectGuard const guard(*this);
+    KVL::MutexGuard const guard(mutex());
     return static_cast<int>(m_records.size());
 }

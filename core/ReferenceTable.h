@@ -10,6 +10,7 @@
 #include "core/AddressMap.h"
 #include "core/Object.h"
 #include "platform/KVLLockable_pthread.h"
+#include "platform/MutexGuard.h"
 
 /// The count of one object's handles. Changed only under its lock; readable at any time.
 class KVLOAM_API ReferenceInfo {
@@ -19,7 +20,7 @@ class KVLOAM_API ReferenceInfo {
     ReferenceInfo(ReferenceInfo const&) = delete;
     ReferenceInfo& operator=(ReferenceInfo const&) = delete;
 
-    void lock() { pthread_mutex_lock(m_lock->get_impl_mutex()); }
+    void lock() { KVL::lock_briefly(m_lock->get_impl_mutex()); }
     void unlock() { pthread_mutex_unlock(m_lock->get_impl_mutex()); }
 
     std::int32_t count() const { return m_count.load(std::memory_order_relaxed); }
@@ -69,6 +70,11 @@ class KVLOAM_API ReferenceTable : public Object {
     ReferenceTable();
 
   private:
+    /// The table's own object lock, without the way through its virtual operations.
+    pthread_mutex_t* mutex() const {
+        return static_cast<KVLLockable_pthread*>(lockable())->get_impl_mutex();
+    }
+
     static ReferenceTable* m_referenceTable;
 
     KVL::AddressMap<ReferenceInfo*> m_records;
