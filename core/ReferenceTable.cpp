@@ -5,6 +5,7 @@
 #include <cstdio>
 #include <functional>
 #include <iostream>
+#include <new>
 #include <typeinfo>
 
 #include "core/RecyclingPool.h"
@@ -15,10 +16,11 @@ using RecordPool = KVL::RecyclingPool<ReferenceInfo>;
 
 ReferenceTable* ReferenceTable::m_referenceTable = nullptr;
 
-ReferenceInfo::ReferenceInfo() : m_lock(new KVLLockable_pthread(RecursiveLock)) {}
+// The lock shares the record's cache lines: both are touched by every copy of a handle.
+ReferenceInfo::ReferenceInfo() : m_lock(new (m_lockStorage) KVLLockable_pthread(RecursiveLock)) {}
 
 ReferenceInfo::~ReferenceInfo() {
-    delete m_lock;
+    m_lock->~KVLLockable_pthread();
     m_lock = nullptr;
 }
 
@@ -32,20 +34,20 @@ ReferenceTable::~ReferenceTable() {
 
 ReferenceInfo* ReferenceTable::get_refinfo(Object* object) {
     if (object == nullptr) return nullptr;
-    KVL::MutexGuard const guard(mutex());
+    ObjectGuard const guard(*this);
     return m_records.find(object);
 }
 
 ReferenceInfo* ReferenceTable::create_refinfo(Object* object) {
     if (object == nullptr) return nullptr;
-    KVL::MutexGuard const guard(mutex());
+    ObjectGuard const guard(*this);
     return m_records.find_or_insert(object, [] { return RecordPool::take(); });
 }
 
 void ReferenceTable::destroy_refcount(Object* object) {
     ReferenceInfo* record = nullptr;
     if (object != nullptr) {
-        KVL::MutexGuard const guard(mutex());
+        ObjectGuard const guard(*this);
         record = m_records.erase(object);
     }
     if (record != nullptr) {
@@ -55,7 +57,7 @@ void ReferenceTable::destroy_refcount(Object* object) {
 }
 
 void ReferenceTable::dump() {
-    KVL::MutexGuard const guard(mutex());
+    ObjectGuard const guard(*this);
     auto entries = m_records.entries();
     std::sort(entries.begin(), entries.end(), [](auto const& a, auto const& b) {
         return std::less<void const*>()(a.first, b.first);
@@ -75,6 +77,6 @@ void ReferenceTable::dump() {
 }
 
 int ReferenceTable::referenced_objects() {
-    KVL::MutexGuard const guard(mutex());
+    ObjectGuard const guard(*this);
     return static_cast<int>(m_records.size());
 }

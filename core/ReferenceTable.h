@@ -2,15 +2,11 @@
 // The process-wide table of reference counts, keyed by object address.
 #pragma once
 
-#include <pthread.h>
-
 #include <atomic>
 #include <cstdint>
 
 #include "core/AddressMap.h"
 #include "core/Object.h"
-#include "platform/KVLLockable_pthread.h"
-#include "platform/MutexGuard.h"
 
 /// The count of one object's handles. Changed only under its lock; readable at any time.
 class KVLOAM_API ReferenceInfo {
@@ -37,7 +33,8 @@ class KVLOAM_API ReferenceInfo {
 
   private:
     std::atomic<std::int32_t> m_count{0};
-    KVLLockable_pthread* m_lock; ///< recursive
+    KVLLockable_pthread* m_lock; ///< recursive; lives in the storage below
+    alignas(KVLLockable_pthread) unsigned char m_lockStorage[sizeof(KVLLockable_pthread)];
 };
 
 /// Finds the one record that all handles of an object share. Callable from any thread, but the
@@ -70,11 +67,6 @@ class KVLOAM_API ReferenceTable : public Object {
     ReferenceTable();
 
   private:
-    /// The table's own object lock, without the way through its virtual operations.
-    pthread_mutex_t* mutex() const {
-        return static_cast<KVLLockable_pthread*>(lockable())->get_impl_mutex();
-    }
-
     static ReferenceTable* m_referenceTable;
 
     KVL::AddressMap<ReferenceInfo*> m_records;

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Takes a mutex that is held for a few instructions only.
+// Takes a mutex that is held for a few instructions at a time.
 #pragma once
 
 #include <pthread.h>
@@ -18,17 +18,5 @@ inline void lock_briefly(pthread_mutex_t* mutex) {
     if (pthread_mutex_trylock(mutex) != 0) [[unlikely]]
         lock_contended(mutex);
 }
-
-/// Holds a mutex, taken by `lock_briefly`, for a scope.
-class MutexGuard {
-  public:
-    explicit MutexGuard(pthread_mutex_t* mutex) : m_mutex(mutex) { lock_briefly(m_mutex); }
-    ~MutexGuard() { pthread_mutex_unlock(m_mutex); }
-    MutexGuard(MutexGuard const&) = delete;
-    MutexGuard& operator=(MutexGuard const&) = delete;
-
-  private:
-    pthread_mutex_t* m_mutex;
-};
 
 } // namespace KVL

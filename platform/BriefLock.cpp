@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-#include "platform/MutexGuard.h"
+#include "platform/BriefLock.h"
 
 #if defined(__x86_64__) || defined(__i386__)
 #include <immintrin.h>
