@@ -75,11 +75,13 @@ std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
             ->check(CLI::Range(1, 65535));
     app.add_option("--listen", listen,
                    "Listen here, as in udp:127.0.0.1:1161, which is the default; repeatable")
+        ->type_name("ADDRESS")
         ->excludes(portOption);
     app.add_option("--module", options.modules, "Load the board module <name>kvl.so; repeatable")
         ->type_name("NAME");
     app.add_option("--module-dir", options.moduleDirectory,
                    "Where board modules are (environment: KVLOAM_MODULE_DIR)")
+        ->type_name("DIR")
         ->capture_default_str();
     app.add_option("--snmp-config", options.snmpConfig,
                    "Communities, users, views and trap destinations, in Net-SNMP's own syntax; "
@@ -89,23 +91,26 @@ std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
                    "Where SNMPv3 engine state is kept across restarts")
         ->type_name("DIR");
     app.add_option("--enterprise-oid", enterprise, "The arc above KVL-OAM-MIB")
+        ->type_name("OID")
         ->check(checkOid)
         ->capture_default_str();
     app.add_option("--log-level", options.logLevel, "error, warning, info or debug")
         ->transform(CLI::CheckedTransformer(kLogLevels, CLI::ignore_case))
-        ->type_name("LEVEL");
+        ->option_text("LEVEL");
     app.add_flag("--check-config", options.checkConfig,
                  "Check options, modules and configuration, and exit")
         ->configurable(false);
-    app.set_config("--config", "", "Read options from this file, as in module=[\"z7sim\"]");
+    app.set_config("--config", "", "Read options from this file, as in module=[\"z7sim\"]")
+        ->type_name("FILE");
     app.allow_config_extras(CLI::config_extras_mode::error);
 
     try {
         app.parse(argc, argv);
     } catch (CLI::FileError const& error) {
-        return Exit{kExitFailure, oneLine(error.what())};
+        return Exit{kExitFailure, oneLine(error.what()) + "; check --config"};
     } catch (CLI::ConfigError const& error) {
-        return Exit{kExitFailure, "configuration file: " + oneLine(error.what())};
+        return Exit{kExitFailure, "the file that --config names: " + oneLine(error.what()) +
+                                      "; its keys are the long options' names, as in port=1161"};
     } catch (CLI::ParseError const& error) {
         if (error.get_exit_code() == 0) {
             std::ostringstream text;

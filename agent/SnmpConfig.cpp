@@ -3,7 +3,12 @@
 
 #include <unistd.h>
 
+#include <algorithm>
+#include <cerrno>
 #include <cstdlib>
+#include <cstring>
+#include <string_view>
+#include <utility>
 
 #include "agent/Log.h"
 
@@ -33,6 +38,8 @@ constexpr char kLibraryModules[] =
 /// While the configuration is read, its faults are collected here instead of logged.
 std::vector<std::string>* configFaults = nullptr;
 
+bool started = false;
+
 LogLevel levelOf(int priority) {
     if (priority <= LOG_ERR) return LogLevel::Error;
     if (priority == LOG_WARNING) return LogLevel::Warning;
@@ -40,16 +47,34 @@ LogLevel levelOf(int priority) {
     return LogLevel::Debug;
 }
 
+/// The library's messages may have several lines; ours have one.
+std::string oneLine(std::string_view message) {
+    std::string line;
+    for (char const character : message) {
+        if (character != '\n' && character != ' ')
+            line += character;
+        else if (!line.empty() && line.back() != ' ')
+            line += ' ';
+    }
+    while (line.ends_with(' '))
+        line.pop_back();
+    return line;
+}
+
 int takeLogLine(int, int, void* message, void*) {
     auto const* const entry = static_cast<snmp_log_message const*>(message);
-    std::string text = entry->msg;
-    while (!text.empty() && text.back() == '\n')
-        text.pop_back();
-    LogLevel const level = levelOf(entry->priority);
-    if (configFaults != nullptr && level <= LogLevel::Warning)
-        configFaults->push_back(std::move(text));
-    else
-        log(level, text);
+    std::string text = oneLine(entry->msg);
+    if (text.starts_with("Warning: no access control information configured"))
+        text =
+            "no community and no user is configured, so nobody gets an answer; configure them in "
+            "the file that --snmp-config names";
+    // The file is read in two rounds, and some faults are found in both.
+    if (configFaults != nullptr && text.find(": line ") != std::string::npos) {
+        if (std::ranges::find(*configFaults, text) == configFaults->end())
+            configFaults->push_back(std::move(text));
+    } else {
+        log(levelOf(entry->priority), text);
+    }
     return SNMP_ERR_NOERROR;
 }
 
@@ -58,9 +83,9 @@ void nameConfiguration(Options const& options) {
         netsnmp_ds_set_string(NETSNMP_DS_LIBRARY_ID, NETSNMP_DS_LIB_PERSISTENT_DIR,
                               options.persistentDirectory.c_str());
     if (options.snmpConfig.empty()) return;
-    // Only this file counts then, and the state of former runs, which is read along with the
-    // configuration directories: so those are reduced to that one.
-    set_configuration_directory(get_persistent_directory());
+    // Only this file counts then, and the state of former runs, which is read on its own. Nothing
+    // can be below /dev/null.
+    set_configuration_directory("/dev/null");
     netsnmp_ds_set_string(NETSNMP_DS_LIBRARY_ID, NETSNMP_DS_LIB_OPTIONALCONFIG,
                           options.snmpConfig.c_str());
 }
@@ -68,6 +93,9 @@ void nameConfiguration(Options const& options) {
 } // namespace
 
 std::vector<std::string> startSnmp(Options const& options) {
+    if (!options.snmpConfig.empty() && access(options.snmpConfig.c_str(), R_OK) != 0)
+        return {options.snmpConfig + ": can not be read: " + std::strerror(errno) +
+                "; check --snmp-config"};
     snmp_disable_stderrlog();
     snmp_enable_calllog();
     snmp_register_callback(SNMP_CALLBACK_LIBRARY, SNMP_CALLBACK_LOGGING, takeLogLine, nullptr);
@@ -80,8 +108,6 @@ std::vector<std::string> startSnmp(Options const& options) {
     nameConfiguration(options);
 
     std::vector<std::string> faults;
-    if (!options.snmpConfig.empty() && access(options.snmpConfig.c_str(), R_OK) != 0)
-        faults.push_back(options.snmpConfig + ": can not be read; check --snmp-config");
     configFaults = &faults;
     std::string modules = kLibraryModules;
     add_to_init_list(modules.data());
@@ -89,10 +115,12 @@ std::vector<std::string> startSnmp(Options const& options) {
     init_mib_modules();
     init_snmp(kAppName);
     configFaults = nullptr;
+    started = true;
     return faults;
 }
 
 void stopSnmp() {
+    if (!started) return;
     snmp_shutdown(kAppName);
     shutdown_agent();
 }

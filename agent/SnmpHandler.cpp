@@ -60,6 +60,7 @@ void setValue(netsnmp_variable_list* variable, Instance const& instance) {
 struct SnmpHandler::Call {
     SnmpHandler const& handler;
     Facts facts;
+    netsnmp_pdu* pdu;
     Instance instance;
     std::vector<oid> name;
 
@@ -78,7 +79,7 @@ struct SnmpHandler::Call {
 int SnmpHandler::Call::answer(netsnmp_mib_handler* library, netsnmp_handler_registration*,
                               netsnmp_agent_request_info* info, netsnmp_request_info* requests) {
     auto const& handler = *static_cast<SnmpHandler const*>(library->myvoid);
-    Call call{handler, {snapshotOf(handler, info), handler.m_counters}, {}, {}};
+    Call call{handler, {snapshotOf(handler, info), handler.m_counters}, info->asp->pdu, {}, {}};
     for (netsnmp_request_info* request = requests; request != nullptr; request = request->next) {
         if (request->processed != 0) continue;
         switch (info->mode) {
@@ -140,15 +141,25 @@ void SnmpHandler::Call::get(netsnmp_request_info* request) {
 
 void SnmpHandler::Call::getNext(netsnmp_request_info* request) {
     bool orEqual = request->inclusive != 0;
-    Oid const after = relative(request->requestvb, orEqual);
+    Oid after = relative(request->requestvb, orEqual);
     // A variable that is left alone goes to whoever serves the names after ours.
-    if (!handler.m_tree.next(facts, after, orEqual, instance)) return;
-    name.assign(handler.m_enterprise.begin(), handler.m_enterprise.end());
-    name.insert(name.end(), instance.name.begin(), instance.name.end());
-    if (snmp_oid_compare(name.data(), name.size(), request->range_end, request->range_end_len) >= 0)
-        return;
-    snmp_set_var_objid(request->requestvb, name.data(), name.size());
-    setValue(request->requestvb, instance);
+    while (handler.m_tree.next(facts, after, orEqual, instance)) {
+        name.assign(handler.m_enterprise.begin(), handler.m_enterprise.end());
+        name.insert(name.end(), instance.name.begin(), instance.name.end());
+        if (snmp_oid_compare(name.data(), name.size(), request->range_end,
+                             request->range_end_len) >= 0)
+            return;
+        // The library looks at the first answer of a GETBULK only when it compares answers with
+        // what the asker may see; so what he may not see is passed over here.
+        std::size_t length = name.size();
+        if (in_a_view(name.data(), &length, pdu, typeOf(instance.type)) == VACM_SUCCESS) {
+            snmp_set_var_objid(request->requestvb, name.data(), name.size());
+            setValue(request->requestvb, instance);
+            return;
+        }
+        after.swap(instance.name);
+        orEqual = false;
+    }
 }
 
 void SnmpHandler::Call::getBulk(netsnmp_request_info* request) {
@@ -177,7 +188,7 @@ bool SnmpHandler::serve(Oid const& place) {
     std::vector<oid> root(m_enterprise.begin(), m_enterprise.end());
     root.insert(root.end(), place.begin(), place.end());
     netsnmp_handler_registration* const registration = netsnmp_create_handler_registration(
-        "kvloam", &Call::answer, root.data(), root.size(), HANDLER_CAN_RONLY | HANDLER_CAN_GETBULK);
+        "kvloam", &Call::answer, root.data(), root.size(), HANDLER_CAN_RONLY);
     if (registration == nullptr) return false;
     registration->handler->myvoid = this;
     return netsnmp_register_handler(registration) == MIB_REGISTERED_OK;
