@@ -13,7 +13,7 @@ namespace {
 std::string wordsFor(nlohmann::json const& json) {
     if (json.is_object()) return "an object";
     if (json.is_array()) return "a list";
-    if (json.is_string()) return "the text " + inQuotes(json.get_ref<std::string const&>());
+    if (json.is_string()) return inQuotes(json.get_ref<std::string const&>());
     return json.dump();
 }
 

@@ -166,6 +166,8 @@ ObjectSpec readBoard(Description const& description) {
 
 Chassis readChassis(std::string const& yamlText) {
     Description const file = describeYaml(yamlText);
+    if (file.form == Form::nothing)
+        throw ChassisError(1, "there is nothing in it; begin the chassis with \"boards:\"");
     requireMap(file, "a chassis", "boards:");
     refuseUnknownKeys(file, "the chassis", kChassisKeys);
     Description const* const list = file.find("boards");

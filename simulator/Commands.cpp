@@ -189,9 +189,11 @@ Json unset(Context const& context) {
 
 /// Do messages with this identifier always concern one board?
 bool needsBoard(std::uint32_t id) {
-    return channelOf(id) == "FAULT" ||
-           (id >= static_cast<std::uint32_t>(EventId::boardRemoved) &&
-            id <= static_cast<std::uint32_t>(EventId::boardStopPending));
+    auto const between = [id](EventId first, EventId last) {
+        return id >= static_cast<std::uint32_t>(first) && id <= static_cast<std::uint32_t>(last);
+    };
+    return between(EventId::faultRaised, EventId::faultCleared) ||
+           between(EventId::boardRemoved, EventId::boardStopPending);
 }
 
 Json event(Context const& context) {

@@ -77,12 +77,15 @@ class Server {
             auto revents = polled.begin() + 2;
             for (auto& client : m_clients)
                 serve(client, (revents++)->revents);
-            m_clients.remove_if([](Connection const& client) {
-                return client.socket.get() < 0 ||
-                       (!client.busy() && (client.closing || client.ended));
-            });
             if ((polled[1].revents & POLLIN) != 0) acceptClients();
+            dropEnded();
         }
+    }
+
+    void dropEnded() {
+        m_clients.remove_if([](Connection const& client) {
+            return !client.busy() && (client.closing || client.ended);
+        });
     }
 
     static pollfd interestOf(Connection const& client) {

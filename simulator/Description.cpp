@@ -51,7 +51,10 @@ class TreeBuilder final : public YAML::EventHandler {
   public:
     Description take() { return std::move(m_root); }
 
-    void OnDocumentStart(YAML::Mark const&) override {}
+    void OnDocumentStart(YAML::Mark const& mark) override {
+        if (m_begun) throw ChassisError(mark.line + 1, "a second YAML document; keep the first");
+        m_begun = true;
+    }
     void OnDocumentEnd() override {}
 
     void OnNull(YAML::Mark const& mark, YAML::anchor_t) override {
@@ -139,11 +142,14 @@ class TreeBuilder final : public YAML::EventHandler {
                 throw ChassisError(node.line, "a key is missing before the colon; write one");
             parent.key = DescriptionEntry{std::move(node.scalar), node.line, {}};
         } else {
+            // The parser places a missing value where the next thing begins.
+            if (node.form == Description::Form::nothing) node.line = parent.key->line;
             addEntry(parent.node, parent.key->key, parent.key->line, std::move(node));
             parent.key.reset();
         }
     }
 
+    bool m_begun = false;
     Description m_root;
     std::vector<Open> m_open;
 };
@@ -219,12 +225,15 @@ std::string describeError(std::string_view source, ChassisError const& error) {
     return line + ": " + error.what();
 }
 
+std::string oneLine(std::string text) {
+    std::ranges::replace_if(text, isControl, '?');
+    return text;
+}
+
 std::string inQuotes(std::string_view text) {
     constexpr std::size_t longest = 60;
-    std::string result = "\"";
-    for (char const c : text.substr(0, longest))
-        result += isControl(c) ? '?' : c;
-    return result + (text.size() > longest ? "...\"" : "\"");
+    return "\"" + oneLine(std::string(text.substr(0, longest))) +
+           (text.size() > longest ? "...\"" : "\"");
 }
 
 bool Description::readsAsInteger() const {
@@ -270,13 +279,11 @@ Description describeYaml(std::string const& text) {
     TreeBuilder builder;
     try {
         YAML::Parser parser(stream);
-        if (!parser.HandleNextDocument(builder)) return {};
-        TreeBuilder ignored;
-        if (parser.HandleNextDocument(ignored))
-            throw ChassisError(0, "more than one YAML document; keep the first");
+        while (parser.HandleNextDocument(builder)) {
+        }
     } catch (YAML::Exception const& error) {
         throw ChassisError(error.mark.is_null() ? 0 : error.mark.line + 1,
-                           "not readable as YAML: " + error.msg +
+                           "not readable as YAML: " + oneLine(error.msg) +
                                "; correct it there or just before");
     }
     return builder.take();

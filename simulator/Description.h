@@ -32,6 +32,9 @@ constexpr bool isControl(char c) {
     return static_cast<unsigned char>(c) < 0x20 || c == 0x7f;
 }
 
+/// `text` with its control characters replaced.
+std::string oneLine(std::string text);
+
 /// `text` quoted, cut to a readable length and with control characters replaced, fit for one line.
 std::string inQuotes(std::string_view text);
 

@@ -19,17 +19,12 @@ using Json = nlohmann::json;
 constexpr std::size_t kColumns = 9;
 using Row = std::array<std::string, kColumns>;
 
-std::string printable(std::string text) {
-    std::ranges::replace_if(text, isControl, '?');
-    return text;
-}
-
 /// "-" when missing.
 std::string words(Json const& board, char const* attribute) {
     auto const& attributes = board.at("attributes");
     auto const found = attributes.find(attribute);
     if (found == attributes.end()) return "-";
-    return found->is_string() ? printable(found->get<std::string>()) : found->dump();
+    return found->is_string() ? oneLine(found->get<std::string>()) : found->dump();
 }
 
 std::string condition(Json const& board) {
@@ -58,8 +53,8 @@ std::string count(Json const& board, char const* list) {
 
 void printAttributes(Json const& object, std::size_t indent, std::ostream& out) {
     for (auto const& [name, value] : object.at("attributes").items())
-        out << std::string(indent, ' ') << std::left << std::setw(22) << printable(name) << "  "
-            << (value.is_string() ? printable(value.get<std::string>()) : value.dump()) << '\n';
+        out << std::string(indent, ' ') << std::left << std::setw(22) << oneLine(name) << "  "
+            << (value.is_string() ? oneLine(value.get<std::string>()) : value.dump()) << '\n';
 }
 
 void printObjects(Json const& parent, char const* list, char const* kind, std::size_t indent,
