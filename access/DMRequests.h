@@ -1,0 +1,54 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Attribute requests and searches as the device mapper's record classes make them.
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "boardplatform/dm_client.h"
+
+namespace KVL {
+
+/// The size of a text's buffer in a request.
+inline constexpr int kDMTextSize = 128;
+
+/// A four-byte number as the client writes it. API numbers are `long`, which may be wider, so the
+/// client never writes into one.
+class DMNumber {
+  public:
+    explicit DMNumber(std::int32_t start = 0) : m_word(start) {}
+
+    DMAttribute request(char const* name) { return {name, &m_word, 0, 0, sizeof m_word}; }
+    /// What the client wrote, or the start value.
+    long word() const { return m_word; }
+    /// The answer to `request`: a two-byte one is extended; -1 when there was none.
+    long answer(DMAttribute const& request) const;
+
+  private:
+    std::int32_t m_word;
+};
+
+/// A text as the client writes it. A text that fills the buffer has no terminator.
+class DMText {
+  public:
+    DMAttribute request(char const* name) { return {name, m_buffer, 0, 0, kDMTextSize}; }
+    /// The text that the client wrote.
+    std::string text() const;
+    /// The answer to `request`, or `missing` when there was none.
+    std::string answer(DMAttribute const& request, char const* missing) const;
+
+  private:
+    char m_buffer[kDMTextSize] = {};
+};
+
+/// Appends the objects under `parent` that match `criterion` to `found`, at most
+/// `kDMSearchCapacity`; nothing when the search fails.
+void append_matches(DeviceMapperClient& client, long parent, DMAttribute criterion,
+                    std::vector<long>& found);
+
+/// The same of the objects whose "TYPE" is `type`.
+void append_objects_of_type(DeviceMapperClient& client, long parent, int type,
+                            std::vector<long>& found);
+
+} // namespace KVL

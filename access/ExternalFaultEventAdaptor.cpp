@@ -1,0 +1,89 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "access/ExternalFaultEventAdaptor.h"
+
+#include <cstdio>
+#include <cstring>
+
+#include "access/DevMapBoardIf.h"
+
+ExternalFaultEventAdaptor* ExternalFaultEventAdaptor::m_faultEventAdaptor = nullptr;
+
+ExternalFaultEvent::ExternalFaultEvent(std::uint32_t id, std::int32_t board, std::uint16_t fault)
+    : Object(false), m_id(id), m_board(board), m_fault(fault) {}
+
+ExternalFaultEvent::~ExternalFaultEvent() = default;
+
+std::uint32_t ExternalFaultEvent::GetEventID() {
+    return m_id;
+}
+
+ExternalFaultEventAdaptor::ExternalFaultEventAdaptor() : Object(true) {
+    register_for_events();
+}
+
+ExternalFaultEventAdaptor::~ExternalFaultEventAdaptor() {
+    unregister_for_events();
+}
+
+ReferenceCounter<ExternalFaultEventAdaptor> ExternalFaultEventAdaptor::get_instance() {
+    if (m_faultEventAdaptor == nullptr) {
+        m_faultEventAdaptor = new ExternalFaultEventAdaptor;
+        // One handle that nobody drops keeps the instance.
+        static auto const* const keeper =
+            new ReferenceCounter<ExternalFaultEventAdaptor>(m_faultEventAdaptor);
+        static_cast<void>(keeper);
+    }
+    return {m_faultEventAdaptor};
+}
+
+void ExternalFaultEventAdaptor::register_for_events() {
+    VqxEventService::AdminConsumer::FilterCallbackAssoc filters[] = {
+        {this, nullptr, FaultRaised, 1},
+        {this, nullptr, FaultCleared, 1},
+    };
+    m_consumer = new VqxEventService::VqxAdminConsumer("FAULT", L"SNMPFaultChannelMonitor", filters,
+                                                       std::size(filters), nullptr, 0);
+    m_consumer->Start();
+}
+
+void ExternalFaultEventAdaptor::unregister_for_events() {}
+
+int ExternalFaultEventAdaptor::AddExternalFaultEventListener(ExternalFaultEventListener* listener) {
+    ObjectGuard const guard(*this);
+    m_listeners.AddListener(listener);
+    return 0;
+}
+
+int ExternalFaultEventAdaptor::RemoveExternalFaultEventListener(
+    ExternalFaultEventListener* listener) {
+    ObjectGuard const guard(*this);
+    return m_listeners.RemoveListener(listener);
+}
+
+int ExternalFaultEventAdaptor::NotifyExternalFaultEventListeners(
+    ReferenceCounter<ExternalFaultEvent> event) {
+    for_each_listener<ExternalFaultEventListener>(
+        m_listeners, this,
+        [&](ExternalFaultEventListener* listener) { listener->ProcessExternalFaultEvent(event); });
+    return 0;
+}
+
+int ExternalFaultEventAdaptor::HandleEvent(AdminCallbackMsg* message, void* /*context*/) {
+    std::uint32_t const id = message->id;
+    if (id != FaultRaised && id != FaultCleared) {
+        std::printf("UNKNOWN MSG:%u\n", id);
+        return 1;
+    }
+    auto const* const payload = static_cast<unsigned char const*>(message->payload);
+    std::int32_t auid = 0;
+    std::uint16_t fault = 0;
+    std::memcpy(&auid, payload, sizeof auid);
+    std::memcpy(&fault, payload + sizeof auid, sizeof fault);
+
+    DevMapBoardIf board(auid);
+    long identifier = board.LogicalID();
+    if (identifier == -1) identifier = board.VORNDriverBoardID();
+    NotifyExternalFaultEventListeners(ReferenceCounter<ExternalFaultEvent>(
+        new ExternalFaultEvent(id, static_cast<std::int32_t>(identifier), fault)));
+    return 1;
+}

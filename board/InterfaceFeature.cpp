@@ -1,0 +1,12 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "board/InterfaceFeature.h"
+
+namespace KVL {
+
+InterfaceFeature::InterfaceFeature() {
+    interfaces()->add(iid());
+}
+
+InterfaceFeature::~InterfaceFeature() = default;
+
+} // namespace KVL

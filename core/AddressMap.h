@@ -1,0 +1,112 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// A hash map from object addresses, in one flat array.
+#pragma once
+
+#include <bit>
+#include <cstddef>
+#include <cstdint>
+#include <utility>
+#include <vector>
+
+namespace KVL {
+
+/// Maps addresses to `Value`s, which are pointers. The reference table is searched for every handle
+/// made from a plain pointer; linear probing in one array finds an entry in a cache line or two.
+/// Not synchronised. The null address is never a key.
+template <class Value>
+class AddressMap {
+  public:
+    AddressMap() { resize(64); }
+
+    std::size_t size() const { return m_size; }
+
+    /// The value at `key`, or null.
+    Value find(void const* key) const {
+        std::size_t i = home(key);
+        while (m_slots[i].key != key && m_slots[i].key != nullptr)
+            i = (i + 1) & m_mask;
+        return m_slots[i].value;
+    }
+
+    /// The value at `key`; when there is none, what `make()` returns, which is put there.
+    template <class Make>
+    Value find_or_insert(void const* key, Make const& make) {
+        std::size_t i = home(key);
+        for (; m_slots[i].key != nullptr; i = (i + 1) & m_mask)
+            if (m_slots[i].key == key) return m_slots[i].value;
+        Value const value = make();
+        m_slots[i] = {key, value};
+        if (++m_size > m_mask / 2) [[unlikely]]
+            grow();
+        return value;
+    }
+
+    /// Takes `key` out and returns its value; null when it is not in the map.
+    Value erase(void const* key) {
+        std::size_t hole = home(key);
+        while (m_slots[hole].key != key) {
+            if (m_slots[hole].key == nullptr) return nullptr;
+            hole = (hole + 1) & m_mask;
+        }
+        Value const value = m_slots[hole].value;
+        // Entries behind the hole move up unless that would put them before their home.
+        for (std::size_t i = (hole + 1) & m_mask; m_slots[i].key != nullptr; i = (i + 1) & m_mask) {
+            if (((i - home(m_slots[i].key)) & m_mask) < ((i - hole) & m_mask)) continue;
+            m_slots[hole] = m_slots[i];
+            hole = i;
+        }
+        m_slots[hole] = {};
+        --m_size;
+        return value;
+    }
+
+    void clear() {
+        m_size = 0;
+        resize(64);
+    }
+
+    /// All entries, in no order.
+    std::vector<std::pair<void const*, Value>> entries() const {
+        std::vector<std::pair<void const*, Value>> all;
+        all.reserve(m_size);
+        for (Slot const& slot : m_slots)
+            if (slot.key != nullptr) all.emplace_back(slot.key, slot.value);
+        return all;
+    }
+
+  private:
+    struct Slot {
+        void const* key = nullptr;
+        Value value = nullptr;
+    };
+
+    std::size_t home(void const* key) const {
+        // Fibonacci hashing: the top bits of the product spread aligned addresses evenly.
+        auto const address = static_cast<std::uint64_t>(reinterpret_cast<std::uintptr_t>(key));
+        return static_cast<std::size_t>((address * 0x9E3779B97F4A7C15U) >> m_shift);
+    }
+
+    /// An empty array of `capacity`, a power of two. Returns the former one.
+    std::vector<Slot> resize(std::size_t capacity) {
+        m_mask = capacity - 1;
+        m_shift = 64 - std::countr_zero(capacity);
+        return std::exchange(m_slots, std::vector<Slot>(capacity));
+    }
+
+    void grow() {
+        for (Slot const& slot : resize(2 * m_slots.size())) {
+            if (slot.key == nullptr) continue;
+            std::size_t i = home(slot.key);
+            while (m_slots[i].key != nullptr)
+                i = (i + 1) & m_mask;
+            m_slots[i] = slot;
+        }
+    }
+
+    std::vector<Slot> m_slots;
+    std::size_t m_size = 0;
+    std::size_t m_mask = 0;
+    int m_shift = 64;
+};
+
+} // namespace KVL

@@ -1,0 +1,40 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "core/Object.h"
+
+#include <cstdio>
+
+#include "core/RecyclingPool.h"
+
+namespace {
+
+/// An identifier list that begins with the root's own identifier, as every object's does.
+class RootedIIDList : public KVL::IIDList {
+  public:
+    RootedIIDList() { add(KVL::IID("6Object")); }
+};
+
+using ListPool = KVL::RecyclingPool<RootedIIDList>;
+
+} // namespace
+
+Object::Object(bool lockable)
+    : m_lock(lockable ? new KVLLockable_pthread(RecursiveLock) : nullptr),
+      m_interfaces(ListPool::take()) {}
+
+Object::~Object() {
+    m_interfaces->shrink(1);
+    ListPool::give(static_cast<RootedIIDList*>(m_interfaces));
+    delete m_lock;
+}
+
+int Object::lock() {
+    if (m_lock != nullptr) return m_lock->lock();
+    std::puts("Attempting to lock a non-lockable object...");
+    return KVLLockUnknown;
+}
+
+int Object::unlock() {
+    if (m_lock != nullptr) return m_lock->unlock();
+    std::puts("Attempting to unlock a non-lockable object...");
+    return KVLLockUnknown;
+}

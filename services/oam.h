@@ -1,0 +1,16 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Identifies the library without its classes.
+#pragma once
+
+#include "platform/Export.h"
+
+/// The library's version: a tag, "cid", an eight-digit version, a build number and "OAM".
+#define OAM_VERSION_STRING "VQcid 01010000-164 OAM"
+
+extern "C" {
+
+/// `OAM_VERSION_STRING`, held by the library.
+KVLOAM_API char const* OAM_VersionString(void);
+/// The notice text, held by the library.
+KVLOAM_API char const* OAM_GetCopyRight(void);
+}

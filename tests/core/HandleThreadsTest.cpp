@@ -1,0 +1,119 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Handles shared, copied and dropped by many threads lose no count.
+#include <atomic>
+#include <barrier>
+#include <thread>
+#include <vector>
+
+#include <gtest/gtest.h>
+
+#include "core/ReferenceCounter.h"
+
+namespace {
+
+std::atomic<int> s_alive{0};
+
+class Counted : public Object {
+  public:
+    Counted() : Object(false) { ++s_alive; }
+    ~Counted() override { --s_alive; }
+};
+
+using Handle = ReferenceCounter<Counted>;
+
+class HandleThreadsTest : public testing::Test {
+  protected:
+    static constexpr int kThreads = 4;
+
+    /// Runs `body(thread)` on all threads, which begin together.
+    template <class Body>
+    static void together(Body const& body) {
+        std::barrier begin(kThreads);
+        std::vector<std::thread> threads;
+        for (int i = 0; i < kThreads; ++i)
+            threads.emplace_back([&, i] {
+                begin.arrive_and_wait();
+                body(i);
+            });
+        for (auto& thread : threads)
+            thread.join();
+    }
+
+    void SetUp() override { m_before = ReferenceTable::get_instance()->referenced_objects(); }
+    void TearDown() override {
+        EXPECT_EQ(s_alive, 0);
+        EXPECT_EQ(ReferenceTable::get_instance()->referenced_objects(), m_before);
+    }
+
+    int m_before = 0;
+};
+
+TEST_F(HandleThreadsTest, CopiesOfOneObjectOnManyThreadsLoseNoCount) {
+    {
+        Handle const shared(new Counted);
+        together([&](int) {
+            std::vector<Handle> copies;
+            for (int i = 0; i < 20000; ++i) {
+                copies.push_back(shared);
+                if (i % 100 == 99) copies.clear();
+            }
+        });
+        EXPECT_EQ(ReferenceTable::get_instance()->get_refinfo(shared.get())->count(), 1);
+        EXPECT_EQ(s_alive, 1);
+    }
+}
+
+TEST_F(HandleThreadsTest, HandlesMadeFromThePointerOnManyThreadsLoseNoCount) {
+    {
+        Handle const shared(new Counted);
+        together([&](int) {
+            for (int i = 0; i < 20000; ++i) {
+                Handle const again(shared.get());
+                EXPECT_EQ(again.get(), shared.get());
+            }
+        });
+        EXPECT_EQ(ReferenceTable::get_instance()->get_refinfo(shared.get())->count(), 1);
+    }
+}
+
+TEST_F(HandleThreadsTest, FirstHandlesOfOneNewObjectOnManyThreadsShareOneRecord) {
+    for (int round = 0; round < 200; ++round) {
+        auto* object = new Counted;
+        std::vector<Handle> handles(kThreads);
+        together([&](int thread) { handles[static_cast<std::size_t>(thread)] = Handle(object); });
+        EXPECT_EQ(ReferenceTable::get_instance()->get_refinfo(object)->count(), kThreads);
+    }
+}
+
+TEST_F(HandleThreadsTest, ObjectsMadeOnOneThreadAreDeletedByOthers) {
+    constexpr int kObjects = 8000;
+    std::vector<Handle> handles;
+    handles.reserve(kObjects);
+    for (int i = 0; i < kObjects; ++i)
+        handles.emplace_back(new Counted);
+    EXPECT_EQ(s_alive, kObjects);
+    together([&](int thread) {
+        for (std::size_t i = static_cast<std::size_t>(thread); i < handles.size(); i += kThreads)
+            handles[i] = Handle();
+    });
+}
+
+TEST_F(HandleThreadsTest, LastDropOnAnyThreadDeletesTheObject) {
+    for (int round = 0; round < 200; ++round) {
+        std::vector<Handle> handles(kThreads, Handle(new Counted));
+        together([&](int thread) { handles[static_cast<std::size_t>(thread)] = Handle(); });
+        EXPECT_EQ(s_alive, 0);
+    }
+}
+
+TEST_F(HandleThreadsTest, HandlesOfAThreadThatEndsAreDroppedCleanly) {
+    // A handle in thread storage is dropped while the thread's recycling is already gone.
+    for (int round = 0; round < 20; ++round)
+        std::thread([] {
+            static thread_local Handle late;
+            late = Handle(new Counted);
+        }).join();
+    EXPECT_EQ(s_alive, 0);
+}
+
+} // namespace
