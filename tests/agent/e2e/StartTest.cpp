@@ -107,6 +107,13 @@ TEST_F(StartTest, CheckOfAGoodConfigurationSucceedsAndLeavesNothingBehind) {
     EXPECT_NE(stat(path("persistent/kvloamd.conf").c_str(), &file), 0);
 }
 
+TEST_F(StartTest, SampleConfigurationsAreGood) {
+    Result const result =
+        runAgent({"--config", CONFIG_DIR "/kvloamd.toml", "--snmp-config", CONFIG_DIR "/snmp.conf",
+                  "--module-dir", moduleDirectory(), "--check-config"});
+    EXPECT_EQ(result.status, 0) << result.output;
+}
+
 TEST_F(StartTest, CheckNamesEveryFault) {
     configureSnmp("rouserr op\nrocommunityy public\n");
     Result const result = start({"--module", "nothing", "--check-config"});
