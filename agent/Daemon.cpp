@@ -198,9 +198,9 @@ void serve(Options const& options, StopSignals const& stopSignals, Boards& board
                             " boards on " + options.listen.front());
     loop.run();
     stopSignals.letThrough();
+    log(LogLevel::Info, "stopping");
     boards.listener.stop();
     notifier.announceAll();
-    log(LogLevel::Info, "stopped");
 }
 
 } // namespace
@@ -220,6 +220,7 @@ int runDaemon(Options const& options) {
         Clock::time_point const started = Clock::now();
         attachModules(modules, *boards);
         serve(options, stopSignals, *boards, started);
+        log(LogLevel::Info, "stopped");
     } catch (std::exception const& error) {
         log(LogLevel::Error, error.what());
         return kExitFailure;

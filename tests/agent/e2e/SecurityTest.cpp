@@ -51,7 +51,7 @@ TEST_F(SecurityTest, RepeatedWrongPasswordsDoNotFillTheLog) {
         askAs("op", "wrongpass", "privpass1");
     stopAgent();
     EXPECT_THAT(agent().output(), HasSubstr("Authentication failed for op"));
-    EXPECT_THAT(linesOf(agent().output()), SizeIs(3)) << agent().output(); // and start, and stop
+    EXPECT_THAT(linesOf(agent().output()), SizeIs(4)) << agent().output(); // and start, and stop
 }
 
 TEST_F(SecurityTest, WrongPrivacyPasswordIsRefused) {
