@@ -23,8 +23,7 @@ int Board::AddBoardStatusListener(BoardStatusListener* listener) {
 }
 
 int Board::NotifyBoardStatusListeners(ReferenceCounter<Board> board, BoardStatusEnum status) {
-    KVL::deliver_board_status(m_listeners, this,
-                              KVL::make_board_status_event(std::move(board), status));
+    KVL::notify_board_status(m_listeners, this, std::move(board), status);
     return 0;
 }
 
@@ -69,6 +68,9 @@ ReferenceCounter<Feature> Board::GetNextFeature(ReferenceCounter<Feature> previo
 
 BoardStatusEvent::BoardStatusEvent() = default;
 
+BoardStatusEvent::BoardStatusEvent(BoardStatusEnum status, ReferenceCounter<Board>&& board)
+    : m_status(status), m_board(std::move(board)) {}
+
 BoardStatusEvent::~BoardStatusEvent() = default;
 
 BoardStatusEnum BoardStatusEvent::GetBoardStatus() {
@@ -89,12 +91,11 @@ void BoardStatusEvent::SetBoard(ReferenceCounter<Board> board) {
 
 namespace KVL {
 
-ReferenceCounter<BoardStatusEvent> make_board_status_event(ReferenceCounter<Board> board,
-                                                           BoardStatusEnum status) {
-    ReferenceCounter<BoardStatusEvent> event(new BoardStatusEvent);
-    event->SetBoardStatus(status);
-    event->SetBoard(std::move(board));
-    return event;
+void notify_board_status(ListenerTable& listeners, Object* guard, ReferenceCounter<Board>&& board,
+                         BoardStatusEnum status) {
+    deliver_board_status(
+        listeners, guard,
+        ReferenceCounter<BoardStatusEvent>(new BoardStatusEvent(status, std::move(board))));
 }
 
 void deliver_board_status(ListenerTable& listeners, Object* guard,

@@ -84,6 +84,7 @@ class KVLOAM_API Board : public Object {
 class KVLOAM_API BoardStatusEvent : public Event {
   public:
     BoardStatusEvent();
+    BoardStatusEvent(BoardStatusEnum status, ReferenceCounter<Board>&& board);
     ~BoardStatusEvent() override;
 
     virtual BoardStatusEnum GetBoardStatus();
@@ -110,12 +111,12 @@ class KVLOAM_API BoardStatusListener : public EventListener {
 
 namespace KVL {
 
-/// Makes the one event of a notification.
-ReferenceCounter<BoardStatusEvent> make_board_status_event(ReferenceCounter<Board> board,
-                                                           BoardStatusEnum status);
+/// Makes the one event of a notification and hands it to every board status listener of
+/// `listeners`, in order. `guard` as in `for_each_listener`.
+void notify_board_status(ListenerTable& listeners, Object* guard, ReferenceCounter<Board>&& board,
+                         BoardStatusEnum status);
 
-/// Hands `event` to every board status listener of `listeners`, in order. `guard` as in
-/// `for_each_listener`.
+/// Hands `event` on to every board status listener of `listeners`.
 void deliver_board_status(ListenerTable& listeners, Object* guard,
                           ReferenceCounter<BoardStatusEvent> const& event);
 

@@ -14,8 +14,7 @@ int BoardFactory::AddBoardStatusListener(BoardStatusListener* listener) {
 
 int BoardFactory::NotifyBoardStatusListeners(ReferenceCounter<Board> board,
                                              BoardStatusEnum status) {
-    KVL::deliver_board_status(m_listeners, this,
-                              KVL::make_board_status_event(std::move(board), status));
+    KVL::notify_board_status(m_listeners, this, std::move(board), status);
     return 0;
 }
 

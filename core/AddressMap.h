@@ -16,86 +16,96 @@ namespace KVL {
 template <class Value>
 class AddressMap {
   public:
+    AddressMap() { resize(64); }
+
     std::size_t size() const { return m_size; }
 
     /// The value at `key`, or null.
     Value find(void const* key) const {
-        if (m_slots.empty()) return nullptr;
-        for (std::size_t i = home(key);; i = next(i)) {
-            if (m_slots[i].first == key) return m_slots[i].second;
-            if (m_slots[i].first == nullptr) return nullptr;
-        }
+        std::size_t i = home(key);
+        while (m_slots[i].key != key && m_slots[i].key != nullptr)
+            i = (i + 1) & m_mask;
+        return m_slots[i].value;
     }
 
-    /// Requires that `key` is not in the map.
-    void insert(void const* key, Value value) {
-        if (2 * (m_size + 1) > m_slots.size()) grow();
-        place(key, value);
-        ++m_size;
+    /// The value at `key`; when there is none, what `make()` returns, which is put there.
+    template <class Make>
+    Value find_or_insert(void const* key, Make const& make) {
+        std::size_t i = home(key);
+        for (; m_slots[i].key != nullptr; i = (i + 1) & m_mask)
+            if (m_slots[i].key == key) return m_slots[i].value;
+        Value const value = make();
+        m_slots[i] = {key, value};
+        if (++m_size > m_mask / 2) [[unlikely]]
+            grow();
+        return value;
     }
 
     /// Takes `key` out and returns its value; null when it is not in the map.
     Value erase(void const* key) {
-        if (m_slots.empty()) return nullptr;
         std::size_t hole = home(key);
-        while (m_slots[hole].first != key) {
-            if (m_slots[hole].first == nullptr) return nullptr;
-            hole = next(hole);
+        while (m_slots[hole].key != key) {
+            if (m_slots[hole].key == nullptr) return nullptr;
+            hole = (hole + 1) & m_mask;
         }
-        Value const value = m_slots[hole].second;
+        Value const value = m_slots[hole].value;
         // Entries behind the hole move up unless that would put them before their home.
-        for (std::size_t i = next(hole); m_slots[i].first != nullptr; i = next(i)) {
-            std::size_t const mask = m_slots.size() - 1;
-            if (((i - home(m_slots[i].first)) & mask) >= ((i - hole) & mask)) {
-                m_slots[hole] = m_slots[i];
-                hole = i;
-            }
+        for (std::size_t i = (hole + 1) & m_mask; m_slots[i].key != nullptr; i = (i + 1) & m_mask) {
+            if (((i - home(m_slots[i].key)) & m_mask) < ((i - hole) & m_mask)) continue;
+            m_slots[hole] = m_slots[i];
+            hole = i;
         }
-        m_slots[hole] = {nullptr, nullptr};
+        m_slots[hole] = {};
         --m_size;
         return value;
     }
 
     void clear() {
-        m_slots.clear();
         m_size = 0;
+        resize(64);
     }
 
     /// All entries, in no order.
     std::vector<std::pair<void const*, Value>> entries() const {
         std::vector<std::pair<void const*, Value>> all;
         all.reserve(m_size);
-        for (auto const& slot : m_slots)
-            if (slot.first != nullptr) all.push_back(slot);
+        for (Slot const& slot : m_slots)
+            if (slot.key != nullptr) all.emplace_back(slot.key, slot.value);
         return all;
     }
 
   private:
+    struct Slot {
+        void const* key = nullptr;
+        Value value = nullptr;
+    };
+
     std::size_t home(void const* key) const {
         // Fibonacci hashing: the top bits of the product spread aligned addresses evenly.
         auto const address = static_cast<std::uint64_t>(reinterpret_cast<std::uintptr_t>(key));
         return static_cast<std::size_t>((address * 0x9E3779B97F4A7C15U) >> m_shift);
     }
-    std::size_t next(std::size_t i) const { return (i + 1) & (m_slots.size() - 1); }
 
-    void place(void const* key, Value value) {
-        std::size_t i = home(key);
-        while (m_slots[i].first != nullptr)
-            i = next(i);
-        m_slots[i] = {key, value};
+    /// An empty array of `capacity`, a power of two. Returns the former one.
+    std::vector<Slot> resize(std::size_t capacity) {
+        m_mask = capacity - 1;
+        m_shift = 64 - std::countr_zero(capacity);
+        return std::exchange(m_slots, std::vector<Slot>(capacity));
     }
 
     void grow() {
-        std::size_t const capacity = m_slots.empty() ? 64 : 2 * m_slots.size();
-        auto const old =
-            std::exchange(m_slots, std::vector<std::pair<void const*, Value>>(capacity));
-        m_shift = 64 - std::countr_zero(capacity);
-        for (auto const& slot : old)
-            if (slot.first != nullptr) place(slot.first, slot.second);
+        for (Slot const& slot : resize(2 * m_slots.size())) {
+            if (slot.key == nullptr) continue;
+            std::size_t i = home(slot.key);
+            while (m_slots[i].key != nullptr)
+                i = (i + 1) & m_mask;
+            m_slots[i] = slot;
+        }
     }
 
-    std::vector<std::pair<void const*, Value>> m_slots;
+    std::vector<Slot> m_slots;
     std::size_t m_size = 0;
+    std::size_t m_mask = 0;
     int m_shift = 64;
 };
 

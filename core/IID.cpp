@@ -44,9 +44,4 @@ IIDList* IIDList::clone() const {
     return copy;
 }
 
-void IIDList::shrink(std::int32_t count) {
-    while (m_count > count)
-        m_entries[--m_count].m_name[0] = '\0';
-}
-
 } // namespace KVL

@@ -49,7 +49,10 @@ class KVLOAM_API IIDList {
     IIDList* clone() const;
 
     /// Back to the first `count` identifiers.
-    void shrink(std::int32_t count);
+    void shrink(std::int32_t count) {
+        while (m_count > count)
+            [[unlikely]] m_entries[--m_count].m_name[0] = '\0';
+    }
 
   private:
     std::int32_t m_count = 0;

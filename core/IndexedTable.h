@@ -2,9 +2,9 @@
 // A locked, ordered table from small integer indices to handles.
 #pragma once
 
-#include <map>
 #include <utility>
 
+#include "core/IndexedEntries.h"
 #include "core/Object.h"
 
 /// Maps indices to handles `Value`, ascending by index. Index 0 is no index: it ends every walk.
@@ -12,6 +12,8 @@
 template <class Index, class Value>
 class IndexedTable : public Object {
   public:
+    using Entries = KVL::IndexedEntries<Index, Value>;
+
     IndexedTable() : Object(true), m_emptyValue(0) {}
     ~IndexedTable() override = default;
 
@@ -49,8 +51,6 @@ class IndexedTable : public Object {
         }
         return false;
     }
-
-    using Entries = std::map<Index, Value>;
 
     /// The entries themselves, for whoever holds the lock.
     Entries& entries() { return m_entries; }

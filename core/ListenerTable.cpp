@@ -6,8 +6,9 @@
 ListenerTable::~ListenerTable() = default;
 
 int ListenerTable::AddListener(EventListener* listener) {
-    if (std::find(m_listeners.begin(), m_listeners.end(), listener) == m_listeners.end())
-        m_listeners.push_back(listener);
+    if (std::find(m_listeners.begin(), m_listeners.end(), listener) != m_listeners.end()) return 0;
+    m_listeners.push_back(listener);
+    m_version.fetch_add(1, std::memory_order_release);
     return 0;
 }
 
@@ -15,6 +16,7 @@ int ListenerTable::RemoveListener(EventListener* listener) {
     auto const found = std::find(m_listeners.begin(), m_listeners.end(), listener);
     if (found == m_listeners.end()) return 1;
     m_listeners.erase(found);
+    m_version.fetch_add(1, std::memory_order_release);
     return 0;
 }
 

@@ -2,6 +2,10 @@
 // The listeners behind every pair of add-listener and notify-listeners operations.
 #pragma once
 
+#include <array>
+#include <atomic>
+#include <cstddef>
+#include <cstdint>
 #include <vector>
 
 #include "core/Event.h"
@@ -25,22 +29,45 @@ class KVLOAM_API ListenerTable {
     /// itself ends a walk.
     virtual EventListener* GetNextListener(EventListener* listener);
 
+    /// How often the table has changed. Readable without the owner's guard.
+    std::uint32_t version() const { return m_version.load(std::memory_order_acquire); }
+
   private:
     std::vector<EventListener*> m_listeners;
+    std::atomic<std::uint32_t> m_version{0};
 };
 
 /// Calls `call(listener)` for every listener, from first to last. The walk is live: a listener
-/// added meanwhile is called too. `guard`, where there is one, is locked for each step of the walk,
-/// never during a call.
+/// added meanwhile is called too, and a listener that removes itself ends it. `guard`, where there
+/// is one, is locked while the table is read, never during a call.
 template <class Listener, class Call>
 void for_each_listener(ListenerTable& table, Object* guard, Call const& call) {
-    auto const step = [&](EventListener* last) {
-        if (guard != nullptr) guard->lock();
-        EventListener* const next =
+    // Read a few listeners at a time; while the table does not change they are the walk.
+    std::array<EventListener*, 8> ahead;
+    std::size_t count = 0;
+    std::uint32_t version = 0;
+    auto const readAfter = [&](EventListener* last) {
+        version = table.version();
+        count = 0;
+        EventListener* next =
             last == nullptr ? table.GetFirstListener() : table.GetNextListener(last);
-        if (guard != nullptr) guard->unlock();
-        return next;
+        while (next != nullptr && count < ahead.size()) {
+            ahead[count++] = next;
+            next = table.GetNextListener(next);
+        }
     };
-    for (EventListener* listener = step(nullptr); listener != nullptr; listener = step(listener))
+    auto const readGuarded = [&](EventListener* last) {
+        if (guard == nullptr) return readAfter(last);
+        ObjectGuard const held(*guard);
+        readAfter(last);
+    };
+    readGuarded(nullptr);
+    for (std::size_t i = 0; i < count;) {
+        EventListener* const listener = ahead[i++];
         call(static_cast<Listener*>(listener));
+        if (i == ahead.size() || table.version() != version) {
+            readGuarded(listener);
+            i = 0;
+        }
+    }
 }

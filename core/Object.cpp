@@ -4,7 +4,6 @@
 #include <cstdio>
 
 #include "core/RecyclingPool.h"
-#include "platform/KVLLockable_pthread.h"
 
 namespace {
 

@@ -3,7 +3,8 @@
 #pragma once
 
 #include "core/IID.h"
-#include "platform/KVLLockable.h"
+#include "platform/BriefLock.h"
+#include "platform/KVLLockable_pthread.h"
 
 /// A managed object: made with `new`, handed at once to a `ReferenceCounter`, deleted with the last
 /// handle. It may carry a recursive lock of its own, and it carries the list of the interface
@@ -33,16 +34,32 @@ class KVLOAM_API Object {
     /// The lock itself; null when the object was made without one.
     KVLLockable* lockable() const { return m_lock; }
 
+    /// The mutex behind `lockable()`, for our own short critical sections; null without one.
+    pthread_mutex_t* mutex() const { return m_lock ? m_lock->get_impl_mutex() : nullptr; }
+
   private:
-    KVLLockable* m_lock;
+    friend class ObjectGuard;
+
+    KVLLockable_pthread* m_lock;
     KVL::IIDList* m_interfaces;
 };
 
-/// Holds an object's lock for a scope.
+/// Holds an object's lock for a scope. On an object without one it prints what `lock()` prints and
+/// goes on.
 class ObjectGuard {
   public:
-    explicit ObjectGuard(Object& object) : m_object(object) { m_object.lock(); }
-    ~ObjectGuard() { m_object.unlock(); }
+    explicit ObjectGuard(Object& object) : m_object(object) {
+        if (pthread_mutex_t* const mutex = m_object.mutex())
+            KVL::lock_briefly(mutex);
+        else
+            m_object.lock();
+    }
+    ~ObjectGuard() {
+        if (pthread_mutex_t* const mutex = m_object.mutex())
+            pthread_mutex_unlock(mutex);
+        else
+            m_object.unlock();
+    }
     ObjectGuard(ObjectGuard const&) = delete;
     ObjectGuard& operator=(ObjectGuard const&) = delete;
 

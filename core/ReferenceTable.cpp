@@ -5,6 +5,7 @@
 #include <cstdio>
 #include <functional>
 #include <iostream>
+#include <new>
 #include <typeinfo>
 
 #include "core/RecyclingPool.h"
@@ -15,10 +16,11 @@ using RecordPool = KVL::RecyclingPool<ReferenceInfo>;
 
 ReferenceTable* ReferenceTable::m_referenceTable = nullptr;
 
-ReferenceInfo::ReferenceInfo() : m_lock(new KVLLockable_pthread(RecursiveLock)) {}
+// The lock shares the record's cache lines: both are touched by every copy of a handle.
+ReferenceInfo::ReferenceInfo() : m_lock(new (m_lockStorage) KVLLockable_pthread(RecursiveLock)) {}
 
 ReferenceInfo::~ReferenceInfo() {
-    delete m_lock;
+    m_lock->~KVLLockable_pthread();
     m_lock = nullptr;
 }
 
@@ -39,10 +41,7 @@ ReferenceInfo* ReferenceTable::get_refinfo(Object* object) {
 ReferenceInfo* ReferenceTable::create_refinfo(Object* object) {
     if (object == nullptr) return nullptr;
     ObjectGuard const guard(*this);
-    if (ReferenceInfo* record = m_records.find(object)) return record;
-    ReferenceInfo* record = RecordPool::take();
-    m_records.insert(object, record);
-    return record;
+    return m_records.find_or_insert(object, [] { return RecordPool::take(); });
 }
 
 void ReferenceTable::destroy_refcount(Object* object) {

@@ -2,14 +2,11 @@
 // The process-wide table of reference counts, keyed by object address.
 #pragma once
 
-#include <pthread.h>
-
 #include <atomic>
 #include <cstdint>
 
 #include "core/AddressMap.h"
 #include "core/Object.h"
-#include "platform/KVLLockable_pthread.h"
 
 /// The count of one object's handles. Changed only under its lock; readable at any time.
 class KVLOAM_API ReferenceInfo {
@@ -19,7 +16,7 @@ class KVLOAM_API ReferenceInfo {
     ReferenceInfo(ReferenceInfo const&) = delete;
     ReferenceInfo& operator=(ReferenceInfo const&) = delete;
 
-    void lock() { pthread_mutex_lock(m_lock->get_impl_mutex()); }
+    void lock() { KVL::lock_briefly(m_lock->get_impl_mutex()); }
     void unlock() { pthread_mutex_unlock(m_lock->get_impl_mutex()); }
 
     std::int32_t count() const { return m_count.load(std::memory_order_relaxed); }
@@ -36,7 +33,8 @@ class KVLOAM_API ReferenceInfo {
 
   private:
     std::atomic<std::int32_t> m_count{0};
-    KVLLockable_pthread* m_lock; ///< recursive
+    KVLLockable_pthread* m_lock; ///< recursive; lives in the storage below
+    alignas(KVLLockable_pthread) unsigned char m_lockStorage[sizeof(KVLLockable_pthread)];
 };
 
 /// Finds the one record that all handles of an object share. Callable from any thread, but the

@@ -43,7 +43,6 @@ int Z7Board::GetErrorMessage(char* message) {
 }
 
 long Z7Board::GetDeviceChangeDate() {
-    std::scoped_lock const guard(m_mutex);
     return m_deviceChangeDate;
 }
 
@@ -76,7 +75,6 @@ int Z7Board::GetChassisSlotNumber() {
 }
 
 BoardStatusEnum Z7Board::GetLastCondition() {
-    std::scoped_lock const guard(m_mutex);
     return m_lastCondition;
 }
 
@@ -86,19 +84,17 @@ void Z7Board::SetErrorMessage(std::string message) {
 }
 
 void Z7Board::SetDeviceChangeDate(long date) {
-    std::scoped_lock const guard(m_mutex);
-    m_deviceChangeDate = date;
+    m_deviceChangeDate.store(date, std::memory_order_relaxed);
 }
 
 void Z7Board::setLastCondition(BoardStatusEnum condition) {
-    std::scoped_lock const guard(m_mutex);
-    m_lastCondition = condition;
+    m_lastCondition.store(condition, std::memory_order_relaxed);
 }
 
 int Z7Board::AddBoardStatusListener(BoardStatusListener* listener) {
     Board::AddBoardStatusListener(listener);
-    listener->ProcessBoardStatusEvent(
-        KVL::make_board_status_event(ReferenceCounter<Board>(this), GetStatus()));
+    listener->ProcessBoardStatusEvent(ReferenceCounter<BoardStatusEvent>(
+        new BoardStatusEvent(GetStatus(), ReferenceCounter<Board>(this))));
     return -1;
 }
 

@@ -2,6 +2,7 @@
 // The common base of Z7 boards.
 #pragma once
 
+#include <atomic>
 #include <memory>
 #include <mutex>
 #include <string>
@@ -79,9 +80,9 @@ class KVLOAM_API Z7Board : public Board {
     std::shared_ptr<DevMapBoardIf const> m_record;
     std::string m_serialNumber; ///< never changes
     std::string m_errorMessage;
-    long m_deviceChangeDate = 0;
-    BoardStatusEnum m_lastCondition = BoardStatusNone;
-    /// Guards the record's pointer, the error message, the date and the last condition. Never held
-    /// during a callback or a platform request.
+    std::atomic<long> m_deviceChangeDate{0};
+    std::atomic<BoardStatusEnum> m_lastCondition{BoardStatusNone};
+    /// Guards the record's pointer and the error message. Never held during a callback or a
+    /// platform request.
     std::mutex m_mutex;
 };

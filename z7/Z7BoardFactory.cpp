@@ -3,6 +3,7 @@
 
 #include <ctime>
 
+#include <limits>
 #include <string>
 #include <utility>
 
@@ -108,6 +109,13 @@ Z7BoardFactory::BoardMap Z7BoardFactory::copyBoards() {
     return m_boards;
 }
 
+ReferenceCounter<Board> Z7BoardFactory::findBoard(long id) {
+    ObjectGuard const guard(*this);
+    auto const found = m_boards.find(id);
+    if (found == m_boards.end()) return {};
+    return found->second;
+}
+
 int Z7BoardFactory::create_board(long id) {
     ReferenceCounter<Board> const board(MakeBoard(id));
     if (board.get() == nullptr) return -1;
@@ -152,21 +160,30 @@ int Z7BoardFactory::check_for_changed_boards() {
 }
 
 int Z7BoardFactory::notify_board(long id, BoardStatusEnum status) {
-    ReferenceCounter<Board> board;
-    {
-        ObjectGuard const guard(*this);
-        auto const found = m_boards.find(id);
-        if (found == m_boards.end()) return -1;
-        board = found->second;
-    }
-    z7(board)->ProcessExternalEvent(status);
+    ReferenceCounter<Board> const board = findBoard(id);
+    if (Z7Board* const known = z7(board)) known->ProcessExternalEvent(status);
     return -1;
 }
 
 int Z7BoardFactory::notify_all_boards(BoardStatusEnum status) {
-    for (auto const& [id, board] : copyBoards())
-        z7(board)->ProcessExternalEvent(status);
-    return -1;
+    // A few handles at a time: a chassis of thousands would otherwise walk through megabytes twice.
+    constexpr std::size_t kAtATime = 32;
+    std::vector<ReferenceCounter<Board>> boards;
+    boards.reserve(kAtATime);
+    for (long last = std::numeric_limits<long>::min();;) {
+        boards.clear();
+        {
+            ObjectGuard const guard(*this);
+            auto entry = m_boards.upper_bound(last);
+            for (; entry != m_boards.end() && boards.size() < kAtATime; ++entry) {
+                boards.push_back(entry->second);
+                last = entry->first;
+            }
+        }
+        if (boards.empty()) return -1;
+        for (auto const& board : boards)
+            z7(board)->ProcessExternalEvent(status);
+    }
 }
 
 int Z7BoardFactory::ping_boards() {

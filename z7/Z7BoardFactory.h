@@ -81,6 +81,7 @@ class KVLOAM_API Z7BoardFactory : public BoardFactory,
     using BoardMap = std::map<long, ReferenceCounter<Board>>;
 
     BoardMap copyBoards();
+    ReferenceCounter<Board> findBoard(long id);
     void dropBoard(long id, ReferenceCounter<Board> const& board);
 
     std::atomic<int> m_pingInterval{kDefaultPingInterval};

@@ -149,7 +149,8 @@ TEST(AddressMapTest, FindsWhatWasInsertedThroughGrowthAndErasure) {
             EXPECT_EQ(map.erase(&addresses[i]), &addresses[i]);
             --size;
         } else {
-            map.insert(&addresses[i], &addresses[i]);
+            EXPECT_EQ(map.find_or_insert(&addresses[i], [&] { return &addresses[i]; }),
+                      &addresses[i]);
             ++size;
         }
         in[i] = !in[i];
@@ -165,7 +166,7 @@ TEST(AddressMapTest, EraseOfAnAbsentAddressAnswersNull) {
     char one = 0;
     char two = 0;
     EXPECT_EQ(map.erase(&one), nullptr);
-    map.insert(&one, &one);
+    map.find_or_insert(&one, [&] { return &one; });
     EXPECT_EQ(map.erase(&two), nullptr);
     EXPECT_EQ(map.size(), 1U);
 }

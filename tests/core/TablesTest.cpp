@@ -108,6 +108,42 @@ TEST_F(IndexedTableTest, TableIsLockable) {
     EXPECT_EQ(m_table.unlock(), 0);
 }
 
+TEST_F(IndexedTableTest, WalkGoesOnWhenTheEntryBehindItIsRemoved) {
+    Handle const first = enter();
+    enter();
+    enter();
+    int const second = m_table.next_index(m_table.first_index());
+    m_table.remove(first);
+    EXPECT_EQ(m_table.next_index(second), 3);
+}
+
+TEST_F(IndexedTableTest, WalkEndsWhenItsOwnEntryIsRemoved) {
+    enter();
+    Handle const second = enter();
+    enter();
+    int const index = m_table.next_index(m_table.first_index());
+    EXPECT_EQ(m_table[index].get(), second.get());
+    m_table.remove(second);
+    EXPECT_EQ(m_table[index].get(), nullptr);
+    EXPECT_EQ(m_table.next_index(index), 0);
+}
+
+TEST_F(IndexedTableTest, WalkMeetsEntriesThatTheHolderOfTheLockErasesAndEnters) {
+    for (int i = 0; i < 5; ++i)
+        enter();
+    EXPECT_EQ(m_table.next_index(2), 3);
+    m_table.lock();
+    m_table.entries().erase(3);
+    m_table.entries().erase(m_table.entries().find(4));
+    m_table.unlock();
+    EXPECT_EQ(m_table.next_index(2), 5);
+    enter();
+    EXPECT_EQ(walk(), (std::vector{1, 2, 5, 6}));
+    m_table.entries().clear();
+    EXPECT_EQ(m_table[5].get(), nullptr);
+    EXPECT_EQ(m_table.first_index(), 0);
+}
+
 TEST_F(IndexedTableTest, DestructorOfARemovedObjectMayUseTheTable) {
     class Asking : public Object {
       public:
