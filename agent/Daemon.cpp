@@ -37,12 +37,11 @@ namespace {
 class StopSignals {
   public:
     StopSignals() {
-        sigset_t signals;
-        sigemptyset(&signals);
-        sigaddset(&signals, SIGTERM);
-        sigaddset(&signals, SIGINT);
-        pthread_sigmask(SIG_BLOCK, &signals, nullptr);
-        m_descriptor = signalfd(-1, &signals, SFD_CLOEXEC | SFD_NONBLOCK);
+        sigemptyset(&m_signals);
+        sigaddset(&m_signals, SIGTERM);
+        sigaddset(&m_signals, SIGINT);
+        pthread_sigmask(SIG_BLOCK, &m_signals, nullptr);
+        m_descriptor = signalfd(-1, &m_signals, SFD_CLOEXEC | SFD_NONBLOCK);
         if (m_descriptor < 0) throw std::system_error(errno, std::generic_category(), "signalfd");
     }
     ~StopSignals() { close(m_descriptor); }
@@ -51,7 +50,16 @@ class StopSignals {
 
     int descriptor() const { return m_descriptor; }
 
+    /// From now on such a signal ends the process at once, for whoever finds the stop too slow.
+    void letThrough() const {
+        signalfd_siginfo taken;
+        while (read(m_descriptor, &taken, sizeof taken) > 0) {
+        }
+        pthread_sigmask(SIG_UNBLOCK, &m_signals, nullptr);
+    }
+
   private:
+    sigset_t m_signals{};
     int m_descriptor = -1;
 };
 
@@ -125,12 +133,27 @@ bool listen(Options const& options) {
 /// started.
 void attachModules(std::vector<LoadedModule> const& modules, Boards& boards) {
     std::vector<ReferenceCounter<BoardFactory>> factories;
+    factories.reserve(modules.size());
     for (LoadedModule const& module : modules)
         factories.push_back(module.createFactory());
     boards.manager->AddBoardStatusListener(&boards.listener);
     for (ReferenceCounter<BoardFactory> const& factory : factories)
         boards.manager->Attach(factory);
 }
+
+/// Has the listener tell of changes for a scope.
+class ListeningScope {
+  public:
+    ListeningScope(StatusListener& listener, std::function<void()> changed) : m_listener(listener) {
+        m_listener.start(std::move(changed));
+    }
+    ~ListeningScope() { m_listener.stop(); }
+    ListeningScope(ListeningScope const&) = delete;
+    ListeningScope& operator=(ListeningScope const&) = delete;
+
+  private:
+    StatusListener& m_listener;
+};
 
 /// A folder for a scope.
 class TemporaryFolder {
@@ -169,11 +192,12 @@ void serve(Options const& options, StopSignals const& stopSignals, Boards& board
     loop.watch(wakeup.descriptor(), [&] { wakeup.clear(); });
     loop.watch(stopSignals.descriptor(), [&] { loop.stop(); });
     loop.beforeSleep([&] { return notifier.announce(collector.newest()->begun); });
-    boards.listener.start([&] { collector.renew(); });
-    notifier.announceStart();
+    ListeningScope const listening(boards.listener, [&] { collector.renew(); });
+    Notifier::announceStart();
     log(LogLevel::Info, "serving " + std::to_string(collector.newest()->boards.size()) +
                             " boards on " + options.listen.front());
     loop.run();
+    stopSignals.letThrough();
     boards.listener.stop();
     notifier.announceAll();
     log(LogLevel::Info, "stopped");
@@ -185,7 +209,7 @@ int runDaemon(Options const& options) {
     StopSignals const stopSignals;
     tzset();
     // The library's threads reach these until the process ends.
-    static Boards* const boards = new Boards;
+    static auto* const boards = new Boards;
     try {
         std::vector<LoadedModule> const modules = loadModules(options);
         if (modules.empty())

@@ -78,7 +78,7 @@ class RowTable final : public Table {
         auto const& all = rows(facts);
         auto const found = std::partition_point(all.begin(), all.end(), [&](Row const& row) {
             auto const order = compare(row.index(), index);
-            return order < 0 || (order == 0 && !orEqual);
+            return std::is_lt(order) || (std::is_eq(order) && !orEqual);
         });
         return static_cast<std::size_t>(found - all.begin());
     }

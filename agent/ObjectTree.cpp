@@ -28,7 +28,7 @@ ObjectTree::ObjectTree(std::span<Scalar const> scalars, std::span<Table const* c
 
 std::vector<ObjectTree::Node>::const_iterator ObjectTree::nodeAbove(OidView name) const {
     return std::ranges::partition_point(
-        m_nodes, [&](Node const& node) { return compare(node.place, name) <= 0; });
+        m_nodes, [&](Node const& node) { return std::is_lteq(compare(node.place, name)); });
 }
 
 Lookup ObjectTree::find(Facts const& facts, OidView name, Instance& found) const {
@@ -38,7 +38,7 @@ Lookup ObjectTree::find(Facts const& facts, OidView name, Instance& found) const
     if (!startsWith(name, node.place)) return Lookup::NoSuchObject;
     OidView const index = name.subspan(node.place.size());
     if (node.scalar != nullptr) {
-        if (compare(index, kScalarIndex) != 0) return Lookup::NoSuchInstance;
+        if (std::is_neq(compare(index, kScalarIndex))) return Lookup::NoSuchInstance;
         found.value = node.scalar->get(facts);
     } else {
         std::size_t const row = node.table->firstRow(facts, index, true);
@@ -67,7 +67,7 @@ bool ObjectTree::firstIn(Node const& node, Facts const& facts, OidView index, bo
                          Instance& found) {
     if (node.scalar != nullptr) {
         auto const order = compare(index, kScalarIndex);
-        if (order > 0 || (order == 0 && !orEqual)) return false;
+        if (std::is_gt(order) || (std::is_eq(order) && !orEqual)) return false;
         found.value = node.scalar->get(facts);
         if (!isKnown(found.value)) return false;
         found.name = node.place;

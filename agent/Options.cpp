@@ -24,6 +24,11 @@ std::string checkOid(std::string const& text) {
                           : "'" + text + "' is no object identifier; write it as 1.3.6.1.4.1.32473";
 }
 
+/// The SNMP library reads an empty address as its port of every network.
+std::string checkAddress(std::string const& text) {
+    return text.empty() ? "the address is empty; write it as udp:127.0.0.1:1161" : std::string();
+}
+
 std::string defaultModuleDirectory() {
     char const* const directory = std::getenv("KVLOAM_MODULE_DIR");
     return directory != nullptr && *directory != '\0' ? directory : KVLOAM_MODULE_DIRECTORY;
@@ -76,6 +81,7 @@ std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
     app.add_option("--listen", listen,
                    "Listen here, as in udp:127.0.0.1:1161, which is the default; repeatable")
         ->type_name("ADDRESS")
+        ->check(checkAddress)
         ->excludes(portOption);
     app.add_option("--module", options.modules, "Load the board module <name>kvl.so; repeatable")
         ->type_name("NAME");

@@ -65,7 +65,7 @@ std::string oneLine(std::string_view message) {
     return line;
 }
 
-int takeLogLine(int, int, void* message, void*) {
+int takeLogLine(int /*major*/, int /*minor*/, void* message, void* /*argument*/) {
     auto const* const entry = static_cast<snmp_log_message const*>(message);
     std::string text = oneLine(entry->msg);
     if (text.starts_with("Warning: no access control information configured")) {

@@ -64,7 +64,7 @@ struct SnmpHandler::Call {
     Instance instance;
     std::vector<oid> name;
 
-    static int answer(netsnmp_mib_handler* library, netsnmp_handler_registration*,
+    static int answer(netsnmp_mib_handler* library, netsnmp_handler_registration* /*place*/,
                       netsnmp_agent_request_info* info, netsnmp_request_info* requests);
 
     static Snapshot const& snapshotOf(SnmpHandler const& handler, netsnmp_agent_request_info* info);
@@ -76,7 +76,7 @@ struct SnmpHandler::Call {
     void getBulk(netsnmp_request_info* request);
 };
 
-int SnmpHandler::Call::answer(netsnmp_mib_handler* library, netsnmp_handler_registration*,
+int SnmpHandler::Call::answer(netsnmp_mib_handler* library, netsnmp_handler_registration* /*place*/,
                               netsnmp_agent_request_info* info, netsnmp_request_info* requests) {
     auto const& handler = *static_cast<SnmpHandler const*>(library->myvoid);
     Call call{handler, {snapshotOf(handler, info), handler.m_counters}, info->asp->pdu, {}, {}};
@@ -121,7 +121,7 @@ Oid SnmpHandler::Call::relative(netsnmp_variable_list const* variable, bool& orE
     if (startsWith(asked, arc))
         return {asked.begin() + static_cast<std::ptrdiff_t>(arc.size()), asked.end()};
     orEqual = true;
-    return compare(asked, arc) < 0 ? Oid{} : Oid{static_cast<std::uint32_t>(kHighest)};
+    return std::is_lt(compare(asked, arc)) ? Oid{} : Oid{static_cast<std::uint32_t>(kHighest)};
 }
 
 void SnmpHandler::Call::get(netsnmp_request_info* request) {

@@ -18,12 +18,12 @@ using OidView = std::span<std::uint32_t const>;
 /// Lexicographic order, which is the order of every walk.
 inline std::strong_ordering compare(OidView a, OidView b) {
     for (std::size_t i = 0; i < a.size() && i < b.size(); ++i)
-        if (auto const order = a[i] <=> b[i]; order != 0) return order;
+        if (auto const order = a[i] <=> b[i]; std::is_neq(order)) return order;
     return a.size() <=> b.size();
 }
 
 inline bool startsWith(OidView name, OidView prefix) {
-    return name.size() >= prefix.size() && compare(name.first(prefix.size()), prefix) == 0;
+    return name.size() >= prefix.size() && std::is_eq(compare(name.first(prefix.size()), prefix));
 }
 
 enum class ValueType {

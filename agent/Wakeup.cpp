@@ -17,11 +17,13 @@ Wakeup::~Wakeup() {
     close(m_descriptor);
 }
 
+// NOLINTNEXTLINE(readability-make-member-function-const): it changes what the descriptor tells
 void Wakeup::wake() {
     // Fails only when the count is at its limit, and then the descriptor is readable already.
     eventfd_write(m_descriptor, 1);
 }
 
+// NOLINTNEXTLINE(readability-make-member-function-const): the same
 void Wakeup::clear() {
     // Fails only when nobody has woken, and then there is nothing to clear.
     eventfd_t count = 0;

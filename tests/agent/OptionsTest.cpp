@@ -55,6 +55,10 @@ TEST_F(OptionsTest, ListenReplacesTheDefaultAndRepeats) {
                 ElementsAre("udp:127.0.0.1:1", "tcp:127.0.0.1:2"));
 }
 
+TEST_F(OptionsTest, EmptyAddressIsRefused) {
+    EXPECT_EQ(refusal({"--listen", ""}).status, kExitUsage);
+}
+
 TEST_F(OptionsTest, PortAndListenExcludeEachOther) {
     EXPECT_EQ(refusal({"--port", "4711", "--listen", "udp:127.0.0.1:1"}).status, kExitUsage);
 }
