@@ -25,7 +25,7 @@ class Peer : public std::enable_shared_from_this<Peer> {
     Peer(Peer const&) = delete;
     Peer& operator=(Peer const&) = delete;
 
-  private:
+  protected:
     void* m_fields[2] = {};
 };
 
