@@ -1,0 +1,75 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// kvlBoardTable: the boards, with every query of the abstract board.
+#include "agent/Objects.h"
+
+namespace kvloamd {
+
+namespace {
+
+template <std::string BoardRow::*Field>
+Value text(BoardRow const& row) {
+    return std::string_view(row.*Field);
+}
+
+/// Octets that are empty when the board does not know them.
+template <std::string BoardRow::*Field>
+Value textIfKnown(BoardRow const& row) {
+    return (row.*Field).empty() ? Value{} : Value{std::string_view(row.*Field)};
+}
+
+template <std::optional<int> BoardRow::*Field>
+Value number(BoardRow const& row) {
+    return (row.*Field).has_value() ? Value{std::int64_t{*(row.*Field)}} : Value{};
+}
+
+/// A status that the MIB module has no name for is left out.
+template <int BoardRow::*Field>
+Value status(BoardRow const& row) {
+    switch (row.*Field) {
+    case BoardStatusNone:
+    case BoardStatusStarted:
+    case BoardStatusStopped:
+    case BoardStatusAdded:
+    case BoardStatusRemoved:
+    case BoardStatusStartPending:
+    case BoardStatusStopPending:
+    case BoardStatusFailed:
+        return std::int64_t{row.*Field};
+    default:
+        return {};
+    }
+}
+
+using enum ValueType;
+
+constexpr Column<BoardRow> kColumns[] = {
+    {"kvlBoardStatus", 2, Integer, status<&BoardRow::status>},
+    {"kvlBoardSecondaryStatus", 3, Integer, status<&BoardRow::secondaryStatus>},
+    {"kvlBoardName", 4, Text, text<&BoardRow::name>},
+    {"kvlBoardModel", 5, Text, text<&BoardRow::model>},
+    {"kvlBoardFamily", 6, Text, text<&BoardRow::family>},
+    {"kvlBoardFirmwareName", 7, Text, text<&BoardRow::firmwareName>},
+    {"kvlBoardFirmwareVersion", 8, Text, text<&BoardRow::firmwareVersion>},
+    {"kvlBoardSerialNumber", 9, Text, text<&BoardRow::serialNumber>},
+    {"kvlBoardLogicalId", 10, Integer, number<&BoardRow::logicalId>},
+    {"kvlBoardErrorMessage", 11, Text, text<&BoardRow::errorMessage>},
+    {"kvlBoardChangeDate", 12, Date, textIfKnown<&BoardRow::changeDate>},
+    {"kvlBoardFunctionalDescription", 13, Text, text<&BoardRow::functionalDescription>},
+    {"kvlBoardHardwareId", 14, Integer, number<&BoardRow::boardId>},
+    {"kvlBoardSharedMemoryAddress", 15, Text, textIfKnown<&BoardRow::sharedMemoryAddress>},
+    {"kvlBoardIoAddress", 16, Text, textIfKnown<&BoardRow::ioAddress>},
+    {"kvlBoardIrq", 17, Integer, number<&BoardRow::irq>},
+    {"kvlBoardShelfId", 18, Integer, number<&BoardRow::shelfId>},
+    {"kvlBoardPciSlotNumber", 19, Integer, number<&BoardRow::pciSlotNumber>},
+    {"kvlBoardBusNumber", 20, Integer, number<&BoardRow::busNumber>},
+};
+
+} // namespace
+
+Table const& boardTable() {
+    static RowTable<BoardRow, &Snapshot::boards> const table("kvlBoardTable", {1, 1, 2, 4, 1},
+                                                             kColumns);
+    return table;
+}
+
+} // namespace kvloamd

@@ -1,0 +1,85 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/Collector.h"
+
+#include <utility>
+
+namespace kvloamd {
+
+Collector::Collector(ReadBoards readBoards, Clock::time_point started,
+                     std::function<void()> renewed, CollectorPace pace)
+    : m_readBoards(std::move(readBoards)),
+      m_started(started),
+      m_renewed(std::move(renewed)),
+      m_pace(pace),
+      m_snapshot(collect(nullptr)),
+      m_thread([this] { run(); }) {}
+
+Collector::~Collector() {
+    {
+        std::scoped_lock const guard(m_mutex);
+        m_stop = true;
+    }
+    m_wake.notify_one();
+    m_thread.join();
+}
+
+std::shared_ptr<Snapshot const> Collector::snapshot() {
+    std::scoped_lock const guard(m_mutex);
+    if (Clock::now() - m_snapshot->begun > m_pace.requestAge && !m_requested) {
+        m_requested = true;
+        m_wake.notify_one();
+    }
+    return m_snapshot;
+}
+
+std::shared_ptr<Snapshot const> Collector::newest() {
+    std::scoped_lock const guard(m_mutex);
+    return m_snapshot;
+}
+
+void Collector::renew() {
+    {
+        std::scoped_lock const guard(m_mutex);
+        m_eventful = true;
+    }
+    m_wake.notify_one();
+}
+
+void Collector::run() {
+    std::unique_lock lock(m_mutex);
+    while (!m_stop) {
+        m_wake.wait_until(lock, m_snapshot->begun + m_pace.idle,
+                          [this] { return m_stop || m_requested || m_eventful; });
+        // Events come in crowds: one snapshot shows them all.
+        if (!m_requested)
+            m_wake.wait_until(lock, m_snapshot->begun + m_pace.eventPause,
+                              [this] { return m_stop; });
+        if (m_stop) return;
+        m_requested = false;
+        m_eventful = false;
+        std::shared_ptr<Snapshot const> snapshot = m_snapshot;
+        lock.unlock();
+        snapshot = collect(snapshot.get());
+        lock.lock();
+        m_snapshot.swap(snapshot);
+        lock.unlock();
+        snapshot.reset();
+        m_renewed();
+        lock.lock();
+    }
+}
+
+std::shared_ptr<Snapshot const> Collector::collect(Snapshot const* former) {
+    auto snapshot = std::make_shared<Snapshot>();
+    snapshot->begun = Clock::now();
+    snapshot->boards = m_readBoards();
+    if (former == nullptr) return snapshot;
+    using Hundredths = std::chrono::duration<std::uint32_t, std::centi>;
+    snapshot->lastChange =
+        snapshot->boards == former->boards
+            ? former->lastChange
+            : std::chrono::duration_cast<Hundredths>(Clock::now() - m_started).count();
+    return snapshot;
+}
+
+} // namespace kvloamd

@@ -1,0 +1,26 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/Log.h"
+
+#include <cstdio>
+
+namespace kvloamd {
+
+namespace {
+
+LogLevel logLevel = LogLevel::Info;
+
+} // namespace
+
+void setLogLevel(LogLevel level) {
+    logLevel = level;
+}
+
+void log(LogLevel level, std::string_view text) {
+    if (level > logLevel) return;
+    std::string line = "kvloamd: ";
+    line += text;
+    line += '\n';
+    std::fwrite(line.data(), 1, line.size(), stderr);
+}
+
+} // namespace kvloamd

@@ -1,0 +1,25 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The managed objects of KVL-OAM-MIB.
+#pragma once
+
+#include <span>
+#include <vector>
+
+#include "agent/Description.h"
+
+namespace kvloamd {
+
+/// The places of KVL-OAM-MIB's branches, relative.
+inline Oid const kObjectsPlace{1, 1};
+inline Oid const kNotifyObjectsPlace{1, 1, 3};
+inline Oid const kBoardStatusChangePlace{1, 0, 1};
+
+std::span<Scalar const> scalars();
+
+/// kvlBoardTable.
+Table const& boardTable();
+
+/// Every table.
+std::vector<Table const*> tables();
+
+} // namespace kvloamd

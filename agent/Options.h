@@ -1,0 +1,43 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The agent's command line and configuration file.
+#pragma once
+
+#include <optional>
+#include <string>
+#include <variant>
+#include <vector>
+
+#include "agent/Log.h"
+#include "agent/Value.h"
+
+namespace kvloamd {
+
+struct Options {
+    std::vector<std::string> listen{"udp:127.0.0.1:1161"};
+    std::vector<std::string> modules;
+    std::string moduleDirectory;
+    std::string snmpConfig;          ///< empty: where Net-SNMP looks by itself
+    std::string persistentDirectory; ///< empty: Net-SNMP's own
+    Oid enterprise{1, 3, 6, 1, 4, 1, 32473};
+    LogLevel logLevel = LogLevel::Info;
+    bool checkConfig = false;
+};
+
+/// Why there are no options: the text to print and the status to exit with. The text is help or
+/// the version when the status is 0, else one line of what is wrong.
+struct Exit {
+    int status;
+    std::string text;
+};
+
+inline constexpr int kExitFailure = 1;
+inline constexpr int kExitUsage = 2;
+
+/// Reads the command line, and the file that it names with --config. The command line wins.
+std::variant<Options, Exit> parseOptions(int argc, char const* const* argv);
+
+/// "1.3.6.1.4.1.32473", with or without a leading dot; nothing when `text` is no such name of at
+/// least two numbers.
+std::optional<Oid> parseOid(std::string_view text);
+
+} // namespace kvloamd

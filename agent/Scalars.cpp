@@ -1,0 +1,52 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The objects of KVL-OAM-MIB that have one instance.
+#include "agent/Objects.h"
+#include "services/oam.h"
+
+namespace kvloamd {
+
+namespace {
+
+Value count(std::atomic<std::uint32_t> const& counter) {
+    return std::int64_t{counter.load(std::memory_order_relaxed)};
+}
+
+} // namespace
+
+std::span<Scalar const> scalars() {
+    static Scalar const described[] = {
+        {"kvlLibraryVersion",
+         {1, 1, 1, 1},
+         ValueType::Text,
+         [](Facts const&) -> Value { return std::string_view(OAM_VersionString()); }},
+        {"kvlAgentVersion",
+         {1, 1, 1, 2},
+         ValueType::Text,
+         [](Facts const&) -> Value { return std::string_view(KVLOAM_VERSION); }},
+        {"kvlNotificationsDropped",
+         {1, 1, 1, 3},
+         ValueType::Counter,
+         [](Facts const& facts) { return count(facts.counters.notificationsDropped); }},
+        {"kvlBoardCount",
+         {1, 1, 2, 1},
+         ValueType::Gauge,
+         [](Facts const& facts) -> Value {
+             return static_cast<std::int64_t>(facts.snapshot.boards.size());
+         }},
+        {"kvlBoardTableLastChange",
+         {1, 1, 2, 2},
+         ValueType::TimeTicks,
+         [](Facts const& facts) -> Value { return std::int64_t{facts.snapshot.lastChange}; }},
+        {"kvlBoardStatusChanges",
+         {1, 1, 2, 3},
+         ValueType::Counter,
+         [](Facts const& facts) { return count(facts.counters.statusChanges); }},
+    };
+    return described;
+}
+
+std::vector<Table const*> tables() {
+    return {&boardTable()};
+}
+
+} // namespace kvloamd

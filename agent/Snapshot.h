@@ -1,0 +1,35 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// What the agent answers from: all rows as they were at one time, and its own running counts.
+#pragma once
+
+#include <atomic>
+#include <chrono>
+#include <cstdint>
+#include <vector>
+
+#include "agent/BoardRow.h"
+
+namespace kvloamd {
+
+using Clock = std::chrono::steady_clock;
+
+/// Never changed once it is published; shared by whoever answers from it.
+struct Snapshot {
+    std::vector<BoardRow> boards; ///< ascending by index
+    Clock::time_point begun;      ///< when reading began: what happened before is in it
+    std::uint32_t lastChange = 0; ///< hundredths of a second since the agent's start
+};
+
+/// Raised by any thread, read by any thread.
+struct Counters {
+    std::atomic<std::uint32_t> statusChanges{0};
+    std::atomic<std::uint32_t> notificationsDropped{0};
+};
+
+/// What one request is answered from.
+struct Facts {
+    Snapshot const& snapshot;
+    Counters const& counters;
+};
+
+} // namespace kvloamd

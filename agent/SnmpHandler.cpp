@@ -1,0 +1,197 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/SnmpHandler.h"
+
+#include <algorithm>
+#include <limits>
+#include <utility>
+
+// The SNMP library's headers build on each other.
+// clang-format off
+#include <net-snmp/net-snmp-config.h>
+#include <net-snmp/net-snmp-includes.h>
+#include <net-snmp/agent/net-snmp-agent-includes.h>
+// clang-format on
+
+namespace kvloamd {
+
+namespace {
+
+constexpr oid kHighest = std::numeric_limits<std::uint32_t>::max();
+
+constexpr char kSnapshotKey[] = "kvloam_snapshot";
+
+using HeldSnapshot = std::shared_ptr<Snapshot const>;
+
+void freeSnapshot(void* held) {
+    delete static_cast<HeldSnapshot*>(held);
+}
+
+u_char typeOf(ValueType type) {
+    switch (type) {
+    case ValueType::Integer:
+        return ASN_INTEGER;
+    case ValueType::Counter:
+        return ASN_COUNTER;
+    case ValueType::Gauge:
+        return ASN_GAUGE;
+    case ValueType::TimeTicks:
+        return ASN_TIMETICKS;
+    case ValueType::Text:
+    case ValueType::Date:
+        break;
+    }
+    return ASN_OCTET_STR;
+}
+
+void setValue(netsnmp_variable_list* variable, Instance const& instance) {
+    u_char const type = typeOf(instance.type);
+    if (auto const* const octets = std::get_if<std::string_view>(&instance.value)) {
+        snmp_set_var_typed_value(variable, type, octets->data(), octets->size());
+    } else if (auto const* const number = std::get_if<std::int64_t>(&instance.value)) {
+        // The library keeps every number of 32 bits in a long.
+        long const value = static_cast<long>(*number);
+        snmp_set_var_typed_value(variable, type, &value, sizeof value);
+    }
+}
+
+} // namespace
+
+/// One call of the library: one PDU's variables that concern us.
+struct SnmpHandler::Call {
+    SnmpHandler const& handler;
+    Facts facts;
+    netsnmp_pdu* pdu;
+    Instance instance;
+    std::vector<oid> name;
+
+    static int answer(netsnmp_mib_handler* library, netsnmp_handler_registration*,
+                      netsnmp_agent_request_info* info, netsnmp_request_info* requests);
+
+    static Snapshot const& snapshotOf(SnmpHandler const& handler, netsnmp_agent_request_info* info);
+    /// The part of the variable's name below the enterprise arc. A name outside of the arc reads as
+    /// one before or after all of ours.
+    Oid relative(netsnmp_variable_list const* variable, bool& orEqual) const;
+    void get(netsnmp_request_info* request);
+    void getNext(netsnmp_request_info* request);
+    void getBulk(netsnmp_request_info* request);
+};
+
+int SnmpHandler::Call::answer(netsnmp_mib_handler* library, netsnmp_handler_registration*,
+                              netsnmp_agent_request_info* info, netsnmp_request_info* requests) {
+    auto const& handler = *static_cast<SnmpHandler const*>(library->myvoid);
+    Call call{handler, {snapshotOf(handler, info), handler.m_counters}, info->asp->pdu, {}, {}};
+    for (netsnmp_request_info* request = requests; request != nullptr; request = request->next) {
+        if (request->processed != 0) continue;
+        switch (info->mode) {
+        case MODE_GET:
+            call.get(request);
+            break;
+        case MODE_GETNEXT:
+            call.getNext(request);
+            break;
+        case MODE_GETBULK:
+            call.getBulk(request);
+            break;
+        default:
+            netsnmp_request_set_error(request, SNMP_ERR_NOTWRITABLE);
+            break;
+        }
+    }
+    return SNMP_ERR_NOERROR;
+}
+
+Snapshot const& SnmpHandler::Call::snapshotOf(SnmpHandler const& handler,
+                                              netsnmp_agent_request_info* info) {
+    // The library may call several times for one PDU: all of its variables come from one snapshot.
+    auto* held = static_cast<HeldSnapshot*>(netsnmp_agent_get_list_data(info, kSnapshotKey));
+    if (held == nullptr) {
+        held = new HeldSnapshot(handler.m_takeSnapshot());
+        netsnmp_agent_add_list_data(info,
+                                    netsnmp_create_data_list(kSnapshotKey, held, freeSnapshot));
+    }
+    return **held;
+}
+
+Oid SnmpHandler::Call::relative(netsnmp_variable_list const* variable, bool& orEqual) const {
+    Oid const& arc = handler.m_enterprise;
+    Oid asked(variable->name_length);
+    std::transform(
+        variable->name, variable->name + variable->name_length, asked.begin(),
+        [](oid number) { return static_cast<std::uint32_t>(std::min(number, kHighest)); });
+    if (startsWith(asked, arc))
+        return {asked.begin() + static_cast<std::ptrdiff_t>(arc.size()), asked.end()};
+    orEqual = true;
+    return compare(asked, arc) < 0 ? Oid{} : Oid{static_cast<std::uint32_t>(kHighest)};
+}
+
+void SnmpHandler::Call::get(netsnmp_request_info* request) {
+    bool orEqual = false;
+    switch (handler.m_tree.find(facts, relative(request->requestvb, orEqual), instance)) {
+    case Lookup::Found:
+        setValue(request->requestvb, instance);
+        break;
+    case Lookup::NoSuchObject:
+        netsnmp_request_set_error(request, SNMP_NOSUCHOBJECT);
+        break;
+    case Lookup::NoSuchInstance:
+        netsnmp_request_set_error(request, SNMP_NOSUCHINSTANCE);
+        break;
+    }
+}
+
+void SnmpHandler::Call::getNext(netsnmp_request_info* request) {
+    bool orEqual = request->inclusive != 0;
+    Oid after = relative(request->requestvb, orEqual);
+    // A variable that is left alone goes to whoever serves the names after ours.
+    while (handler.m_tree.next(facts, after, orEqual, instance)) {
+        name.assign(handler.m_enterprise.begin(), handler.m_enterprise.end());
+        name.insert(name.end(), instance.name.begin(), instance.name.end());
+        if (snmp_oid_compare(name.data(), name.size(), request->range_end,
+                             request->range_end_len) >= 0)
+            return;
+        // The library looks at the first answer of a GETBULK only when it compares answers with
+        // what the asker may see; so what he may not see is passed over here.
+        std::size_t length = name.size();
+        if (in_a_view(name.data(), &length, pdu, typeOf(instance.type)) == VACM_SUCCESS) {
+            snmp_set_var_objid(request->requestvb, name.data(), name.size());
+            setValue(request->requestvb, instance);
+            return;
+        }
+        after.swap(instance.name);
+        orEqual = false;
+    }
+}
+
+void SnmpHandler::Call::getBulk(netsnmp_request_info* request) {
+    for (;;) {
+        getNext(request);
+        if (request->requestvb->type == ASN_NULL || request->requestvb->type == ASN_PRIV_RETRY)
+            return;
+        if (request->repeat <= 0 || request->requestvb->next_variable == nullptr) return;
+        --request->repeat;
+        netsnmp_variable_list const* const answered = request->requestvb;
+        request->requestvb = request->requestvb->next_variable;
+        snmp_set_var_objid(request->requestvb, answered->name, answered->name_length);
+        request->requestvb->type = ASN_PRIV_RETRY;
+        request->inclusive = 0;
+    }
+}
+
+SnmpHandler::SnmpHandler(ObjectTree const& tree, Counters const& counters, Oid enterprise,
+                         TakeSnapshot takeSnapshot)
+    : m_tree(tree),
+      m_counters(counters),
+      m_enterprise(std::move(enterprise)),
+      m_takeSnapshot(std::move(takeSnapshot)) {}
+
+bool SnmpHandler::serve(Oid const& place) {
+    std::vector<oid> root(m_enterprise.begin(), m_enterprise.end());
+    root.insert(root.end(), place.begin(), place.end());
+    netsnmp_handler_registration* const registration = netsnmp_create_handler_registration(
+        "kvloam", &Call::answer, root.data(), root.size(), HANDLER_CAN_RONLY);
+    if (registration == nullptr) return false;
+    registration->handler->myvoid = this;
+    return netsnmp_register_handler(registration) == MIB_REGISTERED_OK;
+}
+
+} // namespace kvloamd

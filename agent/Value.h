@@ -1,0 +1,45 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// What a managed object's value is, independent of any protocol.
+#pragma once
+
+#include <compare>
+#include <cstdint>
+#include <span>
+#include <string_view>
+#include <variant>
+#include <vector>
+
+namespace kvloamd {
+
+/// An object's place in the tree of names. Whoever says "relative" leaves out the enterprise arc.
+using Oid = std::vector<std::uint32_t>;
+using OidView = std::span<std::uint32_t const>;
+
+/// Lexicographic order, which is the order of every walk.
+inline std::strong_ordering compare(OidView a, OidView b) {
+    for (std::size_t i = 0; i < a.size() && i < b.size(); ++i)
+        if (auto const order = a[i] <=> b[i]; order != 0) return order;
+    return a.size() <=> b.size();
+}
+
+inline bool startsWith(OidView name, OidView prefix) {
+    return name.size() >= prefix.size() && compare(name.first(prefix.size()), prefix) == 0;
+}
+
+enum class ValueType {
+    Integer,   ///< signed, 32 bits
+    Counter,   ///< 32 bits, wraps
+    Gauge,     ///< unsigned, 32 bits
+    TimeTicks, ///< hundredths of a second since the agent's start
+    Text,      ///< printable characters
+    Date,      ///< 11 octets: date, time of day, offset from UTC
+};
+
+/// A number, octets that the snapshot behind them holds, or nothing: the value is not known.
+using Value = std::variant<std::monostate, std::int64_t, std::string_view>;
+
+inline bool isKnown(Value const& value) {
+    return !std::holds_alternative<std::monostate>(value);
+}
+
+} // namespace kvloamd

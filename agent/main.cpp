@@ -1,0 +1,29 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// kvloamd, the SNMP agent.
+#include <cstdio>
+#include <exception>
+#include <string>
+
+#include "agent/Daemon.h"
+#include "agent/Log.h"
+#include "agent/Options.h"
+
+int main(int argc, char** argv) {
+    using namespace kvloamd;
+    try {
+        auto const parsed = parseOptions(argc, argv);
+        if (auto const* const exit = std::get_if<Exit>(&parsed)) {
+            if (exit->status == 0)
+                std::fputs(exit->text.c_str(), stdout);
+            else
+                log(LogLevel::Error, exit->text);
+            return exit->status;
+        }
+        auto const& options = std::get<Options>(parsed);
+        setLogLevel(options.logLevel);
+        return options.checkConfig ? checkConfiguration(options) : runDaemon(options);
+    } catch (std::exception const& error) {
+        log(LogLevel::Error, error.what());
+        return kExitFailure;
+    }
+}

@@ -1,0 +1,14 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The entry point of the reference board module.
+#include <cstdlib>
+
+#include "PingInterval.h"
+#include "Z7SimBoardFactory.h"
+#include "board/BoardModule.h"
+
+BoardFactory* kvl_create_board_factory(int abi_version) {
+    if (abi_version != KVL_BOARD_MODULE_ABI_VERSION) return nullptr;
+    auto* const factory = new Z7SimBoardFactory;
+    factory->SetPingInterval(readPingInterval(std::getenv(kPingIntervalVariable)));
+    return factory;
+}

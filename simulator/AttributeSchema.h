@@ -1,0 +1,35 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// What the simulator knows of the platform's attributes and object types.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <span>
+#include <string_view>
+
+namespace kvlsim {
+
+inline constexpr std::int32_t kBoardType = 200;
+inline constexpr std::int32_t kProcessorType = 800;
+
+/// Longest text: a reader's 128-byte buffer holds it with its terminating NUL.
+inline constexpr std::size_t kMaxTextLength = 127;
+
+/// Values of BOARD_CONDITION.
+enum class BoardCondition : std::int32_t {
+    started = 3,
+    stopped = 4,
+    startPending = 13,
+    stopPending = 14,
+    failed = 15,
+};
+
+/// What a known attribute must be; `any` for names that the simulator does not know.
+enum class AttributeKind : std::uint8_t { any, text, number, byte, descriptor };
+
+AttributeKind kindOf(std::string_view attribute);
+
+std::span<std::int32_t const> deviceTypes();
+std::span<std::int32_t const> subDeviceTypes();
+
+} // namespace kvlsim

@@ -1,0 +1,51 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// One attribute's value as the simulated device mapper stores and answers it.
+#pragma once
+
+#include <array>
+#include <cstdint>
+#include <string>
+#include <string_view>
+
+namespace kvlsim {
+
+/// The forms an attribute's answer can take; the name says how many bytes it has.
+enum class ValueForm : std::uint8_t {
+    text,        ///< the characters and a terminating NUL
+    number,      ///< four bytes, signed
+    shortNumber, ///< two bytes, signed
+    byte,        ///< one byte, signed
+    empty,       ///< no byte at all, yet the attribute is there
+    descriptor,  ///< eight bytes: four 16-bit words
+};
+
+using DescriptorWords = std::array<std::uint16_t, 4>;
+
+/// A value is immutable and compares by its bytes, as a search does.
+class AttributeValue {
+  public:
+    static AttributeValue text(std::string_view text);
+    static AttributeValue number(std::int32_t value);
+    static AttributeValue shortNumber(std::int16_t value);
+    static AttributeValue byte(std::int8_t value);
+    static AttributeValue empty();
+    static AttributeValue descriptor(DescriptorWords const& words);
+
+    ValueForm form() const { return m_form; }
+    /// What the client stores; a text's terminating NUL included.
+    std::string_view bytes() const { return m_bytes; }
+    /// Requires: a text.
+    std::string_view asText() const;
+    /// Requires: a number of any width, or empty (0).
+    std::int32_t asNumber() const;
+    /// Requires: a descriptor.
+    DescriptorWords asDescriptor() const;
+
+  private:
+    AttributeValue(ValueForm form, std::string bytes);
+
+    ValueForm m_form;
+    std::string m_bytes;
+};
+
+} // namespace kvlsim

@@ -1,0 +1,25 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Control of the simulated platform from within its own process, for tests and benchmarks.
+#pragma once
+
+#include <string>
+
+#include <nlohmann/json.hpp>
+
+#pragma GCC visibility push(default)
+
+namespace kvlsim {
+
+/// Executes one control command, exactly as a line on the control socket is. Never throws: the
+/// reply is {"ok": true, ...} or {"ok": false, "error": "..."}. Any thread; "drain" waits until all
+/// events announced so far are delivered, and is refused on the delivery thread.
+nlohmann::json execute(nlohmann::json const& command);
+
+/// Replaces the chassis, announcing nothing. May come before the first platform call, which then
+/// loads no other. Throws std::runtime_error with one line, "chassis:12: ...", when the text is
+/// bad; the chassis is then what it was.
+void loadChassis(std::string const& yamlText);
+
+} // namespace kvlsim
+
+#pragma GCC visibility pop

@@ -1,0 +1,80 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// A chassis or board description as a plain tree, the same whether it was written in YAML or JSON.
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <stdexcept>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include <nlohmann/json_fwd.hpp>
+
+namespace kvlsim {
+
+/// What is wrong with a description, and what to do about it. `line()` is 0 where there is none.
+class ChassisError : public std::runtime_error {
+  public:
+    ChassisError(int line, std::string const& message)
+        : std::runtime_error(message), m_line(line) {}
+    int line() const { return m_line; }
+
+  private:
+    int m_line;
+};
+
+/// The error as one line: "source:line: message".
+std::string describeError(std::string_view source, ChassisError const& error);
+
+/// Is this byte an ASCII control character?
+constexpr bool isControl(char c) {
+    return static_cast<unsigned char>(c) < 0x20 || c == 0x7f;
+}
+
+/// `text` with its control characters replaced.
+std::string oneLine(std::string text);
+
+/// `text` quoted, cut to a readable length and with control characters replaced, fit for one line.
+std::string inQuotes(std::string_view text);
+
+struct DescriptionEntry;
+
+/// One node of the tree.
+struct Description {
+    enum class Form : std::uint8_t {
+        nothing, ///< written, but without a value
+        text,    ///< certainly a text (quoted)
+        plain,   ///< unquoted: a number where it reads as one, else a text
+        other,   ///< a JSON value that is neither text nor whole number (true, 1.5)
+        list,
+        map,
+    };
+
+    Form form = Form::nothing;
+    int line = 0;
+    std::string scalar;
+    std::vector<Description> items;
+    std::vector<DescriptionEntry> entries; ///< in the order written; keys are unique
+
+    bool isScalar() const { return form == Form::text || form == Form::plain; }
+    /// The number that an unquoted scalar reads as, if it reads as one and fits 64 bits.
+    std::optional<std::int64_t> integer() const;
+    /// Does an unquoted scalar read as a whole number, of whatever size?
+    bool readsAsInteger() const;
+    Description const* find(std::string_view key) const;
+    /// For messages: `the list`, `the text "x"`, `11`.
+    std::string words() const;
+};
+
+struct DescriptionEntry {
+    std::string key;
+    int line = 0;
+    Description value;
+};
+
+/// Both throw ChassisError; trees deeper than a chassis can be are refused.
+Description describeYaml(std::string const& text);
+Description describeJson(nlohmann::json const& json);
+
+} // namespace kvlsim

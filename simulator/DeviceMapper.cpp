@@ -1,0 +1,139 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The simulated device mapper client: searches and reads over the chassis.
+#include "simulator/DeviceMapper.h"
+
+#include <algorithm>
+#include <cstring>
+#include <span>
+
+#include "boardplatform/dm_client.h"
+#include "simulator/Platform.h"
+
+namespace kvlsim {
+
+namespace {
+
+/// Equal when sizes and bytes are equal; a text's size counts its terminating NUL.
+bool matches(ChassisObject const& object, DMAttribute const& criterion) {
+    AttributeValue const* const value = object.attribute(criterion.name);
+    if (value == nullptr) return false;
+    std::string_view const bytes = value->bytes();
+    return bytes.size() == static_cast<std::size_t>(criterion.size) &&
+           (bytes.empty() || std::memcmp(bytes.data(), criterion.value, bytes.size()) == 0);
+}
+
+bool isSound(DMAttribute const& criterion) {
+    return criterion.name != nullptr && criterion.size >= 0 &&
+           (criterion.value != nullptr || criterion.size == 0);
+}
+
+/// Answers one attribute; leaves the buffer alone unless the status is 0.
+void readInto(DMAttribute& request, ChassisObject const& object) {
+    std::int32_t const capacity = request.size;
+    request.size = 0;
+    if (request.name == nullptr || capacity < 0 || (request.value == nullptr && capacity > 0)) {
+        request.status = kInvalidAttribute;
+        return;
+    }
+    AttributeValue const* const value = object.attribute(request.name);
+    if (value == nullptr) {
+        request.status = kNoAttribute;
+        return;
+    }
+    std::string_view bytes = value->bytes();
+    // A text is cut to the buffer, without terminator when it fills it; half a number is useless.
+    if (value->form() == ValueForm::text)
+        bytes = bytes.substr(0, static_cast<std::size_t>(capacity));
+    if (bytes.size() > static_cast<std::size_t>(capacity)) {
+        request.status = kBufferTooSmall;
+        return;
+    }
+    if (!bytes.empty()) std::memcpy(request.value, bytes.data(), bytes.size());
+    request.size = static_cast<std::int32_t>(bytes.size());
+    request.status = 0;
+}
+
+void failAll(std::span<DMAttribute> requests) {
+    for (auto& request : requests) {
+        request.status = kInvalidAttribute;
+        request.size = 0;
+    }
+}
+
+class Client final : public DeviceMapperClient {
+  public:
+    int FindObjects(long parent, int count, DMAttribute* criteria, int* found,
+                    long* auids) override {
+        if (found == nullptr) return kInvalidRequest;
+        int const capacity = *found;
+        *found = 0;
+        if (count < 0 || capacity < 0 || (criteria == nullptr && count > 0) ||
+            (auids == nullptr && capacity > 0))
+            return kInvalidRequest;
+        std::span const wanted(criteria, static_cast<std::size_t>(count));
+        if (!std::ranges::all_of(wanted, isSound)) return kInvalidRequest;
+        return Platform::started().read([&](Chassis const* chassis) {
+            if (chassis == nullptr) return kNoChassis;
+            ChassisObject const* const object = chassis->find(parent);
+            if (object == nullptr) return kUnknownObject;
+            for (std::int32_t const handle : object->children) {
+                if (*found == capacity) break;
+                ChassisObject const& child = *chassis->find(handle);
+                auto const holds = [&child](auto const& each) { return matches(child, each); };
+                if (std::ranges::all_of(wanted, holds)) auids[(*found)++] = handle;
+            }
+            return 0;
+        });
+    }
+
+    int Reserved3() override { return kInvalidRequest; }
+
+    int GetRootObject(long* auid) override {
+        if (auid == nullptr) return kInvalidRequest;
+        return Platform::started().read([&](Chassis const* chassis) {
+            if (chassis == nullptr) return kNoChassis;
+            *auid = Chassis::kRootHandle;
+            return 0;
+        });
+    }
+
+    int FindObjectByName(char* name, long* auid) override {
+        if (name == nullptr || auid == nullptr) return kInvalidRequest;
+        return Platform::started().read([&](Chassis const* chassis) {
+            if (chassis == nullptr) return kNoChassis;
+            ChassisObject const* const object = chassis->firstNamed(name);
+            if (object == nullptr) return kUnknownObject;
+            *auid = object->handle;
+            return 0;
+        });
+    }
+
+    int GetAttributes(long auid, int count, DMAttribute* requests) override {
+        if (count < 0 || (requests == nullptr && count > 0)) return kInvalidRequest;
+        std::span const wanted(requests, static_cast<std::size_t>(count));
+        return Platform::started().read([&](Chassis const* chassis) {
+            ChassisObject const* const object = chassis == nullptr ? nullptr : chassis->find(auid);
+            if (object == nullptr) {
+                failAll(wanted);
+                return chassis == nullptr ? kNoChassis : kUnknownObject;
+            }
+            int result = 0;
+            for (auto& request : wanted) {
+                readInto(request, *object);
+                if (request.status != 0) result = kDMSomeAttributesFailed;
+            }
+            return result;
+        });
+    }
+};
+
+} // namespace
+
+} // namespace kvlsim
+
+DeviceMapperClient* dm_getDeviceMapperClient() {
+    // Never destroyed: the process may ask until its very end.
+    static auto* const client = new kvlsim::Client;
+    kvlsim::Platform::started();
+    return client;
+}

@@ -1,0 +1,21 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Result and status codes of the simulated device mapper client.
+#pragma once
+
+namespace kvlsim {
+
+/// The object is not in the chassis.
+inline constexpr int kUnknownObject = 201;
+/// The request itself makes no sense (a null pointer, a negative count).
+inline constexpr int kInvalidRequest = 203;
+/// There is no chassis: the configured one was refused.
+inline constexpr int kNoChassis = 204;
+
+/// Status of one attribute: the object has no such attribute.
+inline constexpr int kNoAttribute = 1;
+/// Status of one attribute: the buffer does not hold the number or descriptor.
+inline constexpr int kBufferTooSmall = 2;
+/// Status of one attribute: name or buffer are missing.
+inline constexpr int kInvalidAttribute = 3;
+
+} // namespace kvlsim

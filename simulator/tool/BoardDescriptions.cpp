@@ -1,0 +1,129 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// What the tool sends: boards from files or options, attribute values from words.
+#include "simulator/tool/BoardDescriptions.h"
+
+#include <algorithm>
+#include <set>
+#include <sstream>
+
+#include "simulator/AttributeSchema.h"
+#include "simulator/ChassisJson.h"
+#include "simulator/ChassisReader.h"
+#include "simulator/Generator.h"
+#include "simulator/tool/ControlClient.h"
+
+namespace kvlsim {
+
+namespace {
+
+nlohmann::json numberOrText(std::string const& words) {
+    Description written;
+    written.form = Description::Form::plain;
+    written.scalar = words;
+    if (auto const number = written.integer()) return *number;
+    return words;
+}
+
+void collectHandles(nlohmann::json const& object, std::set<std::int64_t>& handles) {
+    if (object.contains("handle")) handles.insert(object.at("handle").get<std::int64_t>());
+    for (char const* list : {"boards", "devices", "subdevices", "processors"})
+        if (object.contains(list))
+            for (auto const& child : object.at(list))
+                collectHandles(child, handles);
+}
+
+/// The first free handle behind those of the boards.
+std::int64_t freeBoardHandle(nlohmann::json const& reply, std::set<std::int64_t> const& handles) {
+    std::int64_t handle = 1;
+    for (auto const& board : reply.at("boards"))
+        handle = std::max(handle, board.at("handle").get<std::int64_t>() + 1);
+    while (handles.contains(handle))
+        ++handle;
+    return handle;
+}
+
+Description describeText(std::string const& text) {
+    auto const first = text.find_first_not_of(" \t\r\n");
+    if (first != std::string::npos && text[first] == '{')
+        if (auto const json = nlohmann::json::parse(text, nullptr, false); !json.is_discarded())
+            return describeJson(json);
+    return describeYaml(text);
+}
+
+} // namespace
+
+std::vector<nlohmann::json> readBoardFile(std::string const& path) {
+    try {
+        std::string const text = readChassisFile(path);
+        Description const description = describeText(text);
+        Chassis chassis;
+        if (description.find("boards") != nullptr)
+            chassis = readChassis(text);
+        else
+            chassis.insertBoard(readBoard(description));
+        std::vector<nlohmann::json> boards;
+        for (std::int32_t const handle : chassis.root().children)
+            boards.push_back(toJson(*chassis.find(handle), chassis));
+        return boards;
+    } catch (ChassisError const& error) {
+        throw ToolError(describeError(path, error));
+    }
+}
+
+nlohmann::json makeBoard(BoardOptions const& options, nlohmann::json const& reply) {
+    std::set<std::int64_t> handles;
+    collectHandles(reply, handles);
+    std::int64_t const handle =
+        options.handle != 0 ? options.handle : freeBoardHandle(reply, handles);
+    handles.insert(handle);
+    auto next = static_cast<std::int32_t>(*handles.rbegin() + 1);
+    GeneratorOptions generated;
+    generated.devices = options.devices;
+    generated.seed = static_cast<std::uint32_t>(handle);
+    generated.family = options.family;
+    nlohmann::json board = Generator(generated).board(static_cast<std::int32_t>(handle), next);
+    nlohmann::json& attributes = board["attributes"];
+    attributes["SERIAL_NUMBER"] =
+        options.serial.empty() ? "SIM" + std::to_string(handle) : options.serial;
+    if (!options.family.empty() && attributes["FAMILY"] != options.family) // one of their own
+        attributes["FAMILY"] = attributes["CTPLATFORM"] = attributes["NAME"] = options.family;
+    if (!options.platform.empty()) attributes["CTPLATFORM"] = options.platform;
+    if (!options.name.empty()) attributes["NAME"] = options.name;
+    if (!options.description.empty()) attributes["DESCRIPTION"] = options.description;
+    attributes.update(attributesFrom(options.attributes));
+    return board;
+}
+
+nlohmann::json attributeValue(std::string_view name, std::string const& words,
+                              std::string const& form) {
+    if (form == "empty") return {{"empty", true}};
+    if (form == "text") return words;
+    if (form == "descriptor") {
+        std::string numbers = words;
+        std::ranges::replace(numbers, ',', ' ');
+        std::istringstream stream(numbers);
+        nlohmann::json list = nlohmann::json::array();
+        for (std::string number; stream >> number;)
+            list.push_back(numberOrText(number));
+        return {{"descriptor", list}};
+    }
+    if (!form.empty()) return {{form, numberOrText(words)}};
+    if (kindOf(name) == AttributeKind::descriptor) return attributeValue(name, words, "descriptor");
+    if (kindOf(name) == AttributeKind::text) return words;
+    return numberOrText(words);
+}
+
+nlohmann::json attributesFrom(std::vector<std::string> const& words) {
+    nlohmann::json attributes = nlohmann::json::object();
+    for (auto const& word : words) {
+        auto const equals = word.find('=');
+        if (equals == std::string::npos || equals == 0)
+            throw ToolError("--attribute " + inQuotes(word) + " is no NAME=VALUE; write for " +
+                            "example --attribute IRQ=11");
+        std::string const name = word.substr(0, equals);
+        attributes[name] = attributeValue(name, word.substr(equals + 1), "");
+    }
+    return attributes;
+}
+
+} // namespace kvlsim

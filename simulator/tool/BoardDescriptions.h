@@ -1,0 +1,40 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// What the tool sends: boards from files or options, attribute values from words.
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include <nlohmann/json.hpp>
+
+namespace kvlsim {
+
+/// The boards of a file, which holds one board or a chassis, in YAML or JSON. Throws ToolError.
+std::vector<nlohmann::json> readBoardFile(std::string const& path);
+
+/// Options of `kvlsim insert`; what is empty or 0 is made up.
+struct BoardOptions {
+    std::int64_t handle = 0;
+    std::string serial;
+    std::string name;
+    std::string family;
+    std::string platform;
+    std::string description;
+    std::int32_t devices = 0;
+    std::vector<std::string> attributes; ///< NAME=VALUE
+};
+
+/// A board from options; `reply` is what "show" says, for free handles. Throws ToolError.
+nlohmann::json makeBoard(BoardOptions const& options, nlohmann::json const& reply);
+
+/// A value as it is written in a command: a number where it reads as one and the attribute is not
+/// known to be a text. `form` is empty or one of text, number, short, byte, empty, descriptor.
+nlohmann::json attributeValue(std::string_view name, std::string const& words,
+                              std::string const& form);
+
+/// An object of attributes from "NAME=VALUE" words. Throws ToolError.
+nlohmann::json attributesFrom(std::vector<std::string> const& words);
+
+} // namespace kvlsim

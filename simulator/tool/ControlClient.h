@@ -1,0 +1,40 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The tool's connection to a simulated platform's control socket.
+#pragma once
+
+#include <chrono>
+#include <stdexcept>
+#include <string>
+
+#include <nlohmann/json.hpp>
+
+#include "simulator/ControlSocket.h"
+
+namespace kvlsim {
+
+/// Why the tool gives up: one line that says what to do.
+class ToolError : public std::runtime_error {
+    using std::runtime_error::runtime_error;
+};
+
+class ControlClient {
+  public:
+    /// Throws ToolError when nobody listens at `path`.
+    ControlClient(std::string path, std::chrono::seconds timeout);
+
+    /// Sends a command and returns its reply. Throws ToolError when the platform refuses it, with
+    /// the platform's own words, or when no reply comes in time.
+    nlohmann::json request(nlohmann::json const& command);
+
+  private:
+    void send(std::string const& line);
+    std::string receiveLine();
+    void waitReady(short events);
+
+    std::string m_path;
+    std::chrono::seconds m_timeout;
+    Descriptor m_socket;
+    std::string m_received;
+};
+
+} // namespace kvlsim

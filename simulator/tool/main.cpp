@@ -1,0 +1,318 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// kvlsim: controls a simulated board platform while it runs, makes and checks chassis files.
+#include <cstdlib>
+#include <functional>
+#include <iostream>
+
+#include <CLI/CLI.hpp>
+
+#include "simulator/AttributeSchema.h"
+#include "simulator/ChassisReader.h"
+#include "simulator/Generator.h"
+#include "simulator/tool/BoardDescriptions.h"
+#include "simulator/tool/ControlClient.h"
+#include "simulator/tool/OutputFile.h"
+#include "simulator/tool/ShowTable.h"
+
+namespace {
+
+using kvlsim::ToolError;
+using Json = nlohmann::json;
+
+constexpr int kSuccess = 0;
+constexpr int kFailure = 1;
+constexpr int kUsage = 2;
+
+/// Everything that the command line can say.
+struct Options {
+    std::string socket;
+    long timeout = 30;
+    bool noWait = false;
+    bool json = false;
+    bool cleared = false;
+    std::vector<std::string> boards;
+    std::string board;
+    std::string object;
+    std::string attribute;
+    std::string value;
+    std::string form;
+    std::string serial;
+    std::string file;
+    std::string output;
+    std::vector<std::string> attributes;
+    kvlsim::BoardOptions newBoard;
+    kvlsim::GeneratorOptions generator;
+};
+
+kvlsim::ControlClient connect(Options const& options) {
+    std::string path = options.socket;
+    if (path.empty())
+        if (char const* const named = std::getenv("KVLSIM_SOCKET")) path = named;
+    if (path.empty()) throw ToolError("no platform named; give --socket PATH or set KVLSIM_SOCKET");
+    return {path, std::chrono::seconds(options.timeout)};
+}
+
+/// Sends the commands in turn and waits until what they announced is delivered.
+void change(Options const& options, kvlsim::ControlClient& client,
+            std::vector<Json> const& commands) {
+    for (auto const& command : commands)
+        client.request(command);
+    if (!options.noWait) client.request({{"command", "drain"}});
+}
+
+void change(Options const& options, Json const& command) {
+    auto client = connect(options);
+    change(options, client, {command});
+}
+
+void changeBoards(Options const& options, char const* command) {
+    std::vector<Json> commands;
+    for (auto const& board : options.boards)
+        commands.push_back({{"command", command}, {"board", board}});
+    auto client = connect(options);
+    change(options, client, commands);
+}
+
+void insert(Options const& options) {
+    std::vector<Json> boards;
+    if (!options.file.empty()) boards = kvlsim::readBoardFile(options.file);
+    auto client = connect(options);
+    if (options.file.empty())
+        boards.push_back(makeBoard(options.newBoard, client.request({{"command", "show"}})));
+    std::vector<Json> commands;
+    for (auto const& board : boards)
+        commands.push_back({{"command", "insert"}, {"board", board}});
+    change(options, client, commands);
+    for (auto const& board : boards)
+        std::cout << "board " << board.at("handle") << ", serial number "
+                  << board.at("attributes").at("SERIAL_NUMBER").get<std::string>() << '\n';
+}
+
+void replace(Options const& options) {
+    Json command = {{"command", "replace"}, {"board", options.board}, {"serial", options.serial}};
+    if (!options.attributes.empty())
+        command["attributes"] = kvlsim::attributesFrom(options.attributes);
+    change(options, command);
+}
+
+void fault(Options const& options) {
+    change(options, {{"command", "fault"},
+                     {"board", options.board},
+                     {"value", options.value},
+                     {"cleared", options.cleared}});
+}
+
+void set(Options const& options) {
+    if (options.value.empty() && options.form != "empty" && options.form != "text" &&
+        kvlsim::kindOf(options.attribute) != kvlsim::AttributeKind::text)
+        throw ToolError("no value for " + options.attribute +
+                        "; write one behind it (or --empty for an answer without bytes)");
+    change(options,
+           {{"command", "set"},
+            {"object", options.object},
+            {"attribute", options.attribute},
+            {"value", kvlsim::attributeValue(options.attribute, options.value, options.form)}});
+}
+
+void unset(Options const& options) {
+    change(options,
+           {{"command", "unset"}, {"object", options.object}, {"attribute", options.attribute}});
+}
+
+void event(Options const& options) {
+    Json command = {{"command", "event"}, {"id", options.object}};
+    if (!options.board.empty()) command["board"] = options.board;
+    if (!options.value.empty()) command["value"] = options.value;
+    change(options, command);
+}
+
+void show(Options const& options) {
+    Json command = {{"command", "show"}};
+    if (!options.board.empty()) command["board"] = options.board;
+    Json const reply = connect(options).request(command);
+    if (options.json)
+        std::cout << reply.dump(2, ' ', false, Json::error_handler_t::replace) << '\n';
+    else if (options.board.empty())
+        kvlsim::printBoards(reply, std::cout);
+    else
+        kvlsim::printDetails(reply, std::cout);
+}
+
+void drain(Options const& options) {
+    connect(options).request({{"command", "drain"}});
+}
+
+void generate(Options const& options) {
+    if (kvlsim::Generator::objects(options.generator) >= kvlsim::Chassis::kRootHandle)
+        throw ToolError("so many objects have no handles; ask for fewer boards or devices");
+    std::string const text = kvlsim::Generator(options.generator).chassis();
+    if (!options.output.empty()) {
+        kvlsim::writeWholeFile(options.output, text);
+        return;
+    }
+    std::cout << text;
+}
+
+void check(Options const& options) {
+    try {
+        auto const chassis = kvlsim::readChassis(kvlsim::readChassisFile(options.file));
+        std::cout << options.file << ": good, " << chassis.boardCount() << " boards\n";
+    } catch (kvlsim::ChassisError const& error) {
+        throw ToolError(kvlsim::describeError(options.file, error));
+    }
+}
+
+using Run = std::function<void(Options const&)>;
+
+CLI::App* addCommand(CLI::App& app, char const* name, char const* help, Run& chosen, Run run) {
+    CLI::App* const command = app.add_subcommand(name, help);
+    command->fallthrough();
+    command->callback([&chosen, run = std::move(run)] { chosen = run; });
+    return command;
+}
+
+CLI::App* addChange(CLI::App& app, char const* name, char const* help, Options& options,
+                    Run& chosen, Run run) {
+    CLI::App* const command = addCommand(app, name, help, chosen, std::move(run));
+    command->add_flag("--no-wait", options.noWait,
+                      "Do not wait until the events are delivered to the process");
+    return command;
+}
+
+constexpr char const* kBoardHelp = "Handle, serial number, or NAME where only one board bears it";
+constexpr char const* kAttributeHelp = "Attribute as NAME=VALUE; repeat for more";
+
+void addBoardCommands(CLI::App& app, Options& options, Run& chosen) {
+    struct {
+        char const* name;
+        char const* help;
+    } static constexpr simple[] = {{"remove", "Pull boards out"},
+                                   {"start", "Start boards"},
+                                   {"stop", "Stop boards"},
+                                   {"fail", "Let boards fail"}};
+    for (auto const& [name, help] : simple) {
+        Run run = [name = name](Options const& given) { changeBoards(given, name); };
+        addChange(app, name, help, options, chosen, std::move(run))
+            ->add_option("board", options.boards, kBoardHelp)
+            ->required();
+    }
+
+    auto* command = addChange(app, "insert", "Plug a board in", options, chosen, insert);
+    auto* const file = command->add_option(
+        "file", options.file, "Board or chassis in YAML or JSON; without it a board is made up");
+    auto& made = options.newBoard;
+    constexpr std::int64_t lastHandle = kvlsim::Chassis::kRootHandle - 1;
+    for (auto* option :
+         {command->add_option("--handle", made.handle, "Handle (default: the next free one)")
+              ->check(CLI::Range(std::int64_t(1), lastHandle)),
+          command->add_option("--serial", made.serial,
+                              "Serial number (default: SIM and the handle)"),
+          command->add_option("--name", made.name, "NAME, such as NX5-T1"),
+          command->add_option("--family", made.family, "Family, such as NX5"),
+          command->add_option("--platform", made.platform, "CTPLATFORM (default: the family)"),
+          command->add_option("--description", made.description, "DESCRIPTION"),
+          command->add_option("--devices", made.devices, "Number of devices (default: none)")
+              ->check(CLI::Range(0, 100)),
+          command->add_option("--attribute", made.attributes, kAttributeHelp)
+              ->allow_extra_args(false)})
+        option->excludes(file);
+
+    command = addChange(app, "replace", "Swap a board for another of the same handle", options,
+                        chosen, replace);
+    command->add_option("board", options.board, kBoardHelp)->required();
+    command->add_option("--serial", options.serial, "Serial number of the new board")->required();
+    command->add_option("--attribute", options.attributes, kAttributeHelp)->allow_extra_args(false);
+
+    command = addChange(app, "fault", "Raise or clear a fault of a board", options, chosen, fault);
+    command->add_option("board", options.board, kBoardHelp)->required();
+    command->add_option("value", options.value, "Fault value, 0 to 65535")->required();
+    command->add_flag("--clear", options.cleared, "The fault is over");
+}
+
+void addAttributeCommands(CLI::App& app, Options& options, Run& chosen) {
+    constexpr char const* objectHelp = "Handle, serial number of a board, or unique NAME";
+    auto* command = addChange(app, "set", "Set an attribute of any object; announces nothing",
+                              options, chosen, set);
+    command->add_option("object", options.object, objectHelp)->required();
+    command->add_option("attribute", options.attribute, "Attribute, such as IRQ")->required();
+    command->add_option("value", options.value, "Number, text, or four numbers for a descriptor");
+    auto* const forms = command->add_option_group("form", "How the value is answered");
+    for (char const* form : {"text", "number", "short", "byte", "empty", "descriptor"})
+        forms->add_flag_callback(std::string("--") + form,
+                                 [&options, form] { options.form = form; });
+    forms->require_option(0, 1);
+
+    command = addChange(app, "unset", "Take an attribute away; announces nothing", options, chosen,
+                        unset);
+    command->add_option("object", options.object, objectHelp)->required();
+    command->add_option("attribute", options.attribute, "Attribute, such as IRQ")->required();
+}
+
+void addOtherCommands(CLI::App& app, Options& options, Run& chosen) {
+    auto* command =
+        addChange(app, "event", "Send any event; changes nothing", options, chosen, event);
+    command->add_option("id", options.object, "Identifier, such as 0x40001")->required();
+    command->add_option("--board", options.board, "Board, also one that is not there");
+    command->add_option("--value", options.value, "Fault value, 0 to 65535");
+
+    command = addCommand(app, "show", "Show the boards, or all about one", chosen, show);
+    command->add_option("board", options.board, kBoardHelp);
+    command->add_flag("--json", options.json, "The raw reply");
+
+    addCommand(app, "drain", "Wait until all events so far are delivered", chosen, drain);
+
+    command = addCommand(app, "generate", "Make up a chassis file", chosen, generate);
+    auto& generator = options.generator;
+    command->add_option("--boards", generator.boards, "Number of boards")
+        ->check(CLI::Range(0, 1000000))
+        ->required();
+    command->add_option("--devices", generator.devices, "Devices per board (default: 2)")
+        ->check(CLI::Range(0, 1000));
+    command->add_option("--subdevices", generator.subDevices, "Sub-devices per device (default: 1)")
+        ->check(CLI::Range(0, 1000));
+    command->add_option("--processors", generator.processors, "Processors per board (default: 1)")
+        ->check(CLI::Range(0, 100));
+    command->add_option("--seed", generator.seed, "The same seed makes the same chassis");
+    command->add_option("--output", options.output, "File (default: standard output)");
+
+    command = addCommand(app, "check", "Check a chassis file", chosen, check);
+    command->add_option("file", options.file, "Chassis file")->required();
+}
+
+} // namespace
+
+int main(int argc, char** argv) {
+    CLI::App app("Controls a simulated board platform while it runs; makes and checks chassis "
+                 "files.",
+                 "kvlsim");
+    Options options;
+    Run chosen;
+    app.set_version_flag("--version", "kvlsim " KVLSIM_VERSION);
+    app.add_option("--socket", options.socket, "Control socket (default: KVLSIM_SOCKET)");
+    app.add_option("--timeout", options.timeout, "Seconds to wait for an answer (default: 30)")
+        ->check(CLI::Range(1L, 86400L));
+    app.require_subcommand(0, 1);
+    addBoardCommands(app, options, chosen);
+    addAttributeCommands(app, options, chosen);
+    addOtherCommands(app, options, chosen);
+    try {
+        app.parse(argc, argv);
+    } catch (CLI::Success const& success) {
+        return app.exit(success);
+    } catch (CLI::ParseError const& error) {
+        std::cerr << "kvlsim: " << error.what() << "; kvlsim --help explains\n";
+        return kUsage;
+    }
+    if (!chosen) {
+        std::cerr << "kvlsim: no command; kvlsim --help lists them\n";
+        return kUsage;
+    }
+    try {
+        chosen(options);
+        if (std::cout.flush()) return kSuccess;
+        std::cerr << "kvlsim: standard output cannot be written\n";
+    } catch (std::exception const& error) {
+        std::cerr << "kvlsim: " << error.what() << '\n';
+    }
+    return kFailure;
+}

@@ -1,0 +1,219 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The record classes against answers that a sound device mapper does not give every day. This
+// program has a device mapper client of its own in the place of the platform's.
+#include <cstring>
+
+#include <functional>
+#include <set>
+#include <string>
+#include <vector>
+
+#include <gtest/gtest.h>
+
+#include "access/DevMapBoardIf.h"
+
+namespace {
+
+/// Answers as the test says.
+class ScriptedClient final : public DeviceMapperClient {
+  public:
+    int FindObjects(long /*parent*/, int count, DMAttribute* criteria, int* found,
+                    long* auids) override {
+        ++searches;
+        lastCriterion.assign(static_cast<char const*>(criteria[0].value),
+                             static_cast<std::size_t>(criteria[0].size));
+        lastCriteria = count;
+        lastCapacity = *found;
+        return onFind(found, auids);
+    }
+    int Reserved3() override { return 1; }
+    int GetRootObject(long* auid) override {
+        *auid = 1;
+        return 0;
+    }
+    int FindObjectByName(char* /*name*/, long* /*auid*/) override { return 1; }
+    int GetAttributes(long /*auid*/, int count, DMAttribute* requests) override {
+        asked.clear();
+        for (int i = 0; i < count; ++i)
+            asked.push_back(requests[i]);
+        for (int i = 0; i < count; ++i)
+            onAttribute(requests[i]);
+        return result;
+    }
+
+    int searches = 0;
+    int lastCriteria = 0;
+    int lastCapacity = 0;
+    std::string lastCriterion;
+    std::vector<DMAttribute> asked;
+    int result = 0;
+    std::function<int(int*, long*)> onFind;
+    std::function<void(DMAttribute&)> onAttribute = [](DMAttribute& request) { missing(request); };
+
+    static void missing(DMAttribute& request) {
+        request.status = 1;
+        request.size = 0;
+    }
+};
+
+ScriptedClient* s_client = nullptr;
+
+class ScriptedClientTest : public testing::Test {
+  protected:
+    ScriptedClientTest() {
+        DeviceMapperIf::get_interface(); // makes the client, at the first call
+        *s_client = ScriptedClient();
+    }
+    DeviceMapperIf& mapper() { return *DeviceMapperIf::get_interface(); }
+};
+
+TEST_F(ScriptedClientTest, BoardIsReadInOneRequestOfSixteenAttributes) {
+    DevMapBoardIf const board(5);
+    std::vector<std::string> names;
+    for (auto const& request : s_client->asked)
+        names.emplace_back(request.name);
+    EXPECT_EQ(names, (std::vector<std::string>{"SERIAL_NUMBER", "PCI_SLOT_NUMBER", "PCI_BUS_NUMBER",
+                                               "MEMBASEADDR", "IOBASEADDR", "IRQ", "FIRMWARE_NAME",
+                                               "FIRMWARE_NAME1", "DESCRIPTION", "NAME", "SHELF_ID",
+                                               "VORN_DRIVER_BOARD_ID", "FAMILY", "CHASSIS_SLOT",
+                                               "Board Id (BLT ID)", "FIRMWARE_VERSION"}));
+}
+
+TEST_F(ScriptedClientTest, RequestsComeClearedAndWithTheirSizes) {
+    DevMapBoardIf const board(5);
+    std::set<std::string> const texts = {"SERIAL_NUMBER",   "FIRMWARE_NAME", "FIRMWARE_NAME1",
+                                         "DESCRIPTION",     "NAME",          "FAMILY",
+                                         "FIRMWARE_VERSION"};
+    for (auto const& request : s_client->asked) {
+        EXPECT_EQ(request.status, 0) << request.name;
+        EXPECT_EQ(request.reserved, 0) << request.name;
+        EXPECT_EQ(request.size, texts.contains(request.name) ? 128 : 4) << request.name;
+    }
+}
+
+TEST_F(ScriptedClientTest, TextThatFillsItsBufferIsReadWhole) {
+    s_client->onAttribute = [](DMAttribute& request) {
+        if (request.size == 128) std::memset(request.value, 'x', 128);
+    };
+    DevMapBoardIf const board(5);
+    EXPECT_EQ(board.SerialNumber(), std::string(128, 'x'));
+    EXPECT_EQ(board.Description(), std::string(128, 'x'));
+}
+
+TEST_F(ScriptedClientTest, TextEndsAtItsTerminator) {
+    s_client->onAttribute = [](DMAttribute& request) {
+        if (request.size == 128) std::memcpy(request.value, "one\0two", 8);
+    };
+    EXPECT_EQ(DevMapBoardIf(5).Name(), "one");
+}
+
+TEST_F(ScriptedClientTest, NumbersReadInPlaceKeepWhatWasWrittenWhenTheWholeRequestFails) {
+    s_client->result = 7;
+    s_client->onAttribute = [](DMAttribute& request) {
+        if (request.size == 4) std::memset(request.value, 0, 4);
+        request.status = 1;
+    };
+    DevMapBoardIf const board(5);
+    EXPECT_EQ(board.ShelfID(), 0);
+    EXPECT_EQ(board.ChassisSlot(), 0);
+    EXPECT_EQ(board.VORNDriverBoardID(), 0);
+    EXPECT_EQ(board.IRQ(), -1);
+}
+
+TEST_F(ScriptedClientTest, NumbersReadInPlaceGoByTheirStatusWhenTheRequestFailsInPart) {
+    s_client->result = kDMSomeAttributesFailed;
+    s_client->onAttribute = [](DMAttribute& request) {
+        if (request.size == 4) std::memset(request.value, 0, 4);
+        if (std::string(request.name) == "SHELF_ID") request.status = 1;
+    };
+    DevMapBoardIf const board(5);
+    EXPECT_EQ(board.ShelfID(), -1);
+    EXPECT_EQ(board.ChassisSlot(), 0);
+}
+
+TEST_F(ScriptedClientTest, ConditionKeepsWhatWasWrittenUnlessTheRequestFailsInPart) {
+    s_client->onAttribute = [](DMAttribute& request) {
+        std::int32_t const written = 15;
+        if (request.size == 4) std::memcpy(request.value, &written, sizeof written);
+        request.status = 1;
+    };
+    DevMapBoardIf board(5);
+    s_client->result = 7;
+    EXPECT_EQ(board.BoardCondition(), 15);
+    EXPECT_EQ(board.BoardPresent(), 15);
+    s_client->result = kDMSomeAttributesFailed;
+    EXPECT_EQ(board.BoardCondition(), -1);
+    EXPECT_EQ(board.BoardPresent(), -1);
+}
+
+TEST_F(ScriptedClientTest, DateOfAFailedRequestIsZero) {
+    s_client->onAttribute = [](DMAttribute& request) {
+        std::strcpy(static_cast<char*>(request.value), "Tue Mar  2 09:05:00 2004");
+    };
+    DevMapBoardIf board(5);
+    EXPECT_NE(board.StateChangeDate(), 0);
+    s_client->result = kDMSomeAttributesFailed;
+    EXPECT_EQ(board.StateChangeDate(), 0);
+}
+
+TEST_F(ScriptedClientTest, FailedSearchFindsNothing) {
+    s_client->onFind = [](int* found, long* auids) {
+        auids[0] = 3;
+        *found = 1;
+        return 1;
+    };
+    EXPECT_TRUE(mapper().ListAllBoards().empty());
+}
+
+TEST_F(ScriptedClientTest, FailedSearchOfOneDeviceTypeLeavesOutThatTypeOnly) {
+    s_client->onFind = [](int* found, long* auids) {
+        auids[0] = s_client->searches;
+        *found = 1;
+        return s_client->searches == 2 ? 1 : 0;
+    };
+    EXPECT_EQ(DevMapBoardIf(5).ListAllDevices(),
+              (std::vector<long>{1, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13}));
+}
+
+TEST_F(ScriptedClientTest, CountsBeyondTheCapacityAreNotBelieved) {
+    s_client->onFind = [](int* found, long* /*auids*/) {
+        *found = 5000;
+        return 0;
+    };
+    EXPECT_EQ(mapper().ListAllBoards().size(), 100U);
+    s_client->onFind = [](int* found, long* /*auids*/) {
+        *found = -4;
+        return 0;
+    };
+    EXPECT_TRUE(mapper().ListAllBoards().empty());
+}
+
+TEST_F(ScriptedClientTest, BoardSearchHasOneCriterionAndRoomForOneHundred) {
+    s_client->onFind = [](int* found, long* /*auids*/) {
+        *found = 0;
+        return 0;
+    };
+    mapper().ListAllBoards();
+    std::int32_t const type = 200;
+    EXPECT_EQ(s_client->lastCriteria, 1);
+    EXPECT_EQ(s_client->lastCapacity, 100);
+    EXPECT_EQ(s_client->lastCriterion,
+              std::string(reinterpret_cast<char const*>(&type), sizeof type));
+}
+
+TEST_F(ScriptedClientTest, PlatformCriterionIncludesTheTerminator) {
+    s_client->onFind = [](int* found, long* /*auids*/) {
+        *found = 0;
+        return 0;
+    };
+    mapper().ListBoardsByPlatform("VORN");
+    EXPECT_EQ(s_client->lastCriterion, std::string("VORN\0", 5));
+}
+
+} // namespace
+
+DeviceMapperClient* dm_getDeviceMapperClient() {
+    static ScriptedClient client;
+    s_client = &client;
+    return s_client;
+}

@@ -1,0 +1,66 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/ModuleLoader.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace kvloamd {
+namespace {
+
+using ::testing::AllOf;
+using ::testing::HasSubstr;
+using ::testing::Not;
+
+/// Loads from the folder of deliberately broken modules.
+class ModuleLoaderTest : public ::testing::Test {
+  protected:
+    /// What loading `name` and making its factory complains of; empty: nothing.
+    static std::string complaint(std::string const& name) {
+        try {
+            LoadedModule(name, BROKEN_MODULE_DIR).createFactory();
+        } catch (ModuleError const& error) {
+            return error.what();
+        }
+        return {};
+    }
+};
+
+TEST_F(ModuleLoaderTest, UnknownModuleIsNamedWithThePathThatWasTried) {
+    EXPECT_THAT(complaint("nothing"),
+                AllOf(HasSubstr("'nothing'"), HasSubstr(BROKEN_MODULE_DIR "/nothingkvl.so")));
+}
+
+TEST_F(ModuleLoaderTest, FileThatIsNoSharedObjectIsRefused) {
+    EXPECT_THAT(complaint("text"), AllOf(HasSubstr("'text'"), HasSubstr("can not be loaded"),
+                                         HasSubstr("textkvl.so")));
+}
+
+TEST_F(ModuleLoaderTest, ModuleWithoutEntryPointIsRefused) {
+    EXPECT_THAT(complaint("noentry"),
+                AllOf(HasSubstr("'noentry'"), HasSubstr("kvl_create_board_factory")));
+}
+
+TEST_F(ModuleLoaderTest, ModuleThatRefusesTheVersionIsNamedWithTheVersion) {
+    EXPECT_THAT(complaint("refusing"), AllOf(HasSubstr("'refusing'"), HasSubstr("version 1")));
+}
+
+TEST_F(ModuleLoaderTest, ModuleThatThrowsIsNamedWithItsReason) {
+    EXPECT_THAT(complaint("throwing"), AllOf(HasSubstr("'throwing'"), HasSubstr("out of boards")));
+}
+
+TEST_F(ModuleLoaderTest, ModuleThatThrowsSomethingOddIsRefused) {
+    EXPECT_THAT(complaint("throwing-odd"), HasSubstr("'throwing-odd'"));
+}
+
+TEST_F(ModuleLoaderTest, NameWithAPathIsRefused) {
+    EXPECT_THAT(complaint("../modules/refusing"), HasSubstr("--module-dir"));
+}
+
+TEST_F(ModuleLoaderTest, EveryComplaintIsOneLine) {
+    for (char const* const name :
+         {"nothing", "text", "noentry", "refusing", "throwing", "throwing-odd", "a/b", ""})
+        EXPECT_THAT(complaint(name), AllOf(Not(""), Not(HasSubstr("\n")))) << name;
+}
+
+} // namespace
+} // namespace kvloamd
