@@ -28,7 +28,7 @@ void Arguments::allow(std::initializer_list<std::string_view> names) const {
         if (key == "command" || std::ranges::find(names, key) != names.end()) continue;
         std::string known;
         for (auto const& name : names)
-            known += (known.empty() ? "" : ", ") + std::string(name);
+            appendToList(known, name);
         throw CommandError("unknown argument " + inQuotes(key) +
                            (known.empty() ? "; this command takes none" : "; known: " + known));
     }

@@ -36,7 +36,7 @@ void refuseUnknownKeys(Description const& map, std::string const& what, Keys kno
         if (std::ranges::find(known, entry.key) != known.end()) continue;
         std::string list;
         for (auto const& key : known)
-            list += (list.empty() ? "" : ", ") + std::string(key);
+            appendToList(list, key);
         throw ChassisError(entry.line, "unknown key " + inQuotes(entry.key) + " in " + what +
                                            "; known: " + list);
     }
@@ -70,7 +70,7 @@ std::int32_t readType(Description const& object, std::string const& what,
         return static_cast<std::int32_t>(*number);
     std::string list;
     for (std::int32_t const code : known)
-        list += (list.empty() ? "" : ", ") + std::to_string(code);
+        appendToList(list, std::to_string(code));
     if (type == nullptr)
         throw ChassisError(object.line, what + " has no type; give it one of " + list);
     throw ChassisError(type->line,
@@ -84,7 +84,7 @@ ObjectSpec readObject(Description const& object, ObjectKind kind, Keys keys) {
     spec.kind = kind;
     spec.line = object.line;
     spec.handle = readHandle(object, kind);
-    std::string const what = nameOf(kind) + (" " + std::to_string(spec.handle));
+    std::string const what = std::string(nameOf(kind)) + ' ' + std::to_string(spec.handle);
     refuseUnknownKeys(object, what, keys);
     switch (kind) {
     case ObjectKind::device:

@@ -182,8 +182,9 @@ Json unset(Context const& context) {
     return changeAttribute(
         context, [](Chassis& chassis, ChassisObject const& object, std::string const& name) {
             if (!chassis.unsetAttribute(object.handle, name))
-                throw CommandError(nameOf(object.kind) + (" " + std::to_string(object.handle)) +
-                                   " has no attribute " + inQuotes(name) + "; nothing to unset");
+                throw CommandError(std::string(nameOf(object.kind)) + ' ' +
+                                   std::to_string(object.handle) + " has no attribute " +
+                                   inQuotes(name) + "; nothing to unset");
         });
 }
 
@@ -279,7 +280,7 @@ Command const& commandNamed(Json const& request) {
     std::string known;
     for (auto const& command : kCommands) {
         if (command.name == text) return command;
-        known += (known.empty() ? "" : ", ") + std::string(command.name);
+        appendToList(known, command.name);
     }
     throw CommandError("unknown command " + inQuotes(text) + "; known: " + known);
 }

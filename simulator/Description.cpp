@@ -221,7 +221,7 @@ std::optional<IntegerText> splitInteger(std::string_view text) {
 
 std::string describeError(std::string_view source, ChassisError const& error) {
     std::string line(source);
-    if (error.line() > 0) line += ":" + std::to_string(error.line());
+    if (error.line() > 0) line.append(":").append(std::to_string(error.line()));
     return line + ": " + error.what();
 }
 
@@ -232,8 +232,15 @@ std::string oneLine(std::string text) {
 
 std::string inQuotes(std::string_view text) {
     constexpr std::size_t longest = 60;
-    return "\"" + oneLine(std::string(text.substr(0, longest))) +
-           (text.size() > longest ? "...\"" : "\"");
+    std::string result(1, '"');
+    result += oneLine(std::string(text.substr(0, longest)));
+    result += text.size() > longest ? "...\"" : "\"";
+    return result;
+}
+
+void appendToList(std::string& list, std::string_view word) {
+    if (!list.empty()) list += ", ";
+    list += word;
 }
 
 bool Description::readsAsInteger() const {

@@ -38,6 +38,9 @@ std::string oneLine(std::string text);
 /// `text` quoted, cut to a readable length and with control characters replaced, fit for one line.
 std::string inQuotes(std::string_view text);
 
+/// Appends to "one, two".
+void appendToList(std::string& list, std::string_view word);
+
 struct DescriptionEntry;
 
 /// One node of the tree.

@@ -125,7 +125,7 @@ Json Generator::board(std::int32_t handle, std::int32_t& nextHandle) {
     attributes["FIRMWARE_NAME"] = lower + ".fw";
     attributes["FIRMWARE_NAME1"] = lower + "_dsp.fw";
     attributes["FIRMWARE_VERSION"] = std::to_string(pick(1, 9)) + "." + std::to_string(pick(0, 99));
-    std::string const stem = "b" + std::to_string(handle);
+    std::string const stem = std::string("b").append(std::to_string(handle));
     for (std::int32_t i = 1; i <= m_options.devices; ++i) {
         DeviceKind const& kind =
             kDeviceKinds[static_cast<std::size_t>(pick(0, std::int32_t(kDeviceKinds.size()) - 1))];
