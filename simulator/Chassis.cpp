@@ -71,7 +71,7 @@ ChassisObject const* Chassis::boardWithSerial(std::string_view serialNumber) con
     return found == m_bySerial.end() ? nullptr : find(found->second);
 }
 
-void Chassis::insertBoard(ObjectSpec board) {
+void Chassis::insertBoard(ObjectDraft board) {
     refuseTaken(board);
     if (auto const* serial = textAttribute(board.attributes, kSerialNumber))
         refuseSerial(serial->asText(), board.handle, board.line);
@@ -102,12 +102,12 @@ bool Chassis::unsetAttribute(std::int32_t handle, std::string_view name) {
     return true;
 }
 
-void Chassis::refuseTaken(ObjectSpec const& spec) const {
-    if (auto const* taken = find(spec.handle))
-        throw ChassisError(spec.line, "handle " + std::to_string(spec.handle) +
-                                          " is taken by another " + nameOf(taken->kind) +
-                                          "; choose a free one");
-    for (auto const& child : spec.children)
+void Chassis::refuseTaken(ObjectDraft const& draft) const {
+    if (auto const* taken = find(draft.handle))
+        throw ChassisError(draft.line, "handle " + std::to_string(draft.handle) +
+                                           " is taken by another " + nameOf(taken->kind) +
+                                           "; choose a free one");
+    for (auto const& child : draft.children)
         refuseTaken(child);
 }
 
@@ -120,19 +120,19 @@ void Chassis::refuseSerial(std::string_view serialNumber, std::int32_t forBoard,
                                  " has it; serial numbers must differ");
 }
 
-void Chassis::add(ObjectSpec spec, std::int32_t parent) {
+void Chassis::add(ObjectDraft draft, std::int32_t parent) {
     ChassisObject object;
-    object.kind = spec.kind;
-    object.handle = spec.handle;
+    object.kind = draft.kind;
+    object.handle = draft.handle;
     object.parent = parent;
     object.order = m_nextOrder++;
-    object.attributes = std::move(spec.attributes);
-    ChassisObject const& added = m_objects.emplace(spec.handle, std::move(object)).first->second;
-    m_objects.at(parent).children.push_back(spec.handle);
+    object.attributes = std::move(draft.attributes);
+    ChassisObject const& added = m_objects.emplace(draft.handle, std::move(object)).first->second;
+    m_objects.at(parent).children.push_back(draft.handle);
     index(added, kName);
     index(added, kSerialNumber);
-    for (auto& child : spec.children)
-        add(std::move(child), spec.handle);
+    for (auto& child : draft.children)
+        add(std::move(child), draft.handle);
 }
 
 void Chassis::discard(std::int32_t handle) {

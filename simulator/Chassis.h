@@ -32,13 +32,13 @@ struct TextHash {
 using AttributeMap = std::unordered_map<std::string, AttributeValue, TextHash, std::equal_to<>>;
 
 /// An object as it is described, with its children, before it enters a chassis.
-struct ObjectSpec {
+struct ObjectDraft {
     ObjectKind kind = ObjectKind::board;
     std::int32_t handle = 0;
     std::int32_t type = 0;
     int line = 0;            ///< where it was described; 0 when it came without lines
     AttributeMap attributes; ///< TYPE included
-    std::vector<ObjectSpec> children;
+    std::vector<ObjectDraft> children;
 };
 
 /// An object of the chassis.
@@ -77,7 +77,7 @@ class Chassis {
 
     /// Adds a board behind the others. Throws ChassisError when a handle or the serial number is
     /// taken.
-    void insertBoard(ObjectSpec board);
+    void insertBoard(ObjectDraft board);
     /// Requires: the board is there.
     void removeBoard(std::int32_t handle);
     /// Throws ChassisError when this gives a board the serial number of another.
@@ -87,9 +87,9 @@ class Chassis {
     bool unsetAttribute(std::int32_t handle, std::string_view name);
 
   private:
-    void refuseTaken(ObjectSpec const& spec) const;
+    void refuseTaken(ObjectDraft const& draft) const;
     void refuseSerial(std::string_view serialNumber, std::int32_t forBoard, int line) const;
-    void add(ObjectSpec spec, std::int32_t parent);
+    void add(ObjectDraft draft, std::int32_t parent);
     void discard(std::int32_t handle);
     void index(ChassisObject const& object, std::string_view attribute);
     void unindex(ChassisObject const& object, std::string_view attribute);

@@ -78,36 +78,36 @@ std::int32_t readType(Description const& object, std::string const& what,
 }
 
 /// Handle, attributes and TYPE, which every kind of object has.
-ObjectSpec readObject(Description const& object, ObjectKind kind, Keys keys) {
+ObjectDraft readObject(Description const& object, ObjectKind kind, Keys keys) {
     requireMap(object, std::string("a ") + nameOf(kind), "handle:");
-    ObjectSpec spec;
-    spec.kind = kind;
-    spec.line = object.line;
-    spec.handle = readHandle(object, kind);
-    std::string const what = std::string(nameOf(kind)) + ' ' + std::to_string(spec.handle);
+    ObjectDraft draft;
+    draft.kind = kind;
+    draft.line = object.line;
+    draft.handle = readHandle(object, kind);
+    std::string const what = std::string(nameOf(kind)) + ' ' + std::to_string(draft.handle);
     refuseUnknownKeys(object, what, keys);
     switch (kind) {
     case ObjectKind::device:
-        spec.type = readType(object, what, deviceTypes());
+        draft.type = readType(object, what, deviceTypes());
         break;
     case ObjectKind::subDevice:
-        spec.type = readType(object, what, subDeviceTypes());
+        draft.type = readType(object, what, subDeviceTypes());
         break;
     case ObjectKind::processor:
-        spec.type = kProcessorType;
+        draft.type = kProcessorType;
         break;
     default:
-        spec.type = kBoardType;
+        draft.type = kBoardType;
         break;
     }
     if (Description const* attributes = object.find("attributes"))
-        if (attributes->form != Form::nothing) spec.attributes = readAttributes(*attributes);
-    spec.attributes.emplace("TYPE", AttributeValue::number(spec.type));
-    return spec;
+        if (attributes->form != Form::nothing) draft.attributes = readAttributes(*attributes);
+    draft.attributes.emplace("TYPE", AttributeValue::number(draft.type));
+    return draft;
 }
 
 void readChildren(Description const& parent, std::string_view key, ObjectKind kind, Keys keys,
-                  ObjectSpec& into) {
+                  ObjectDraft& into) {
     Description const* const list = parent.find(key);
     if (list == nullptr || list->form == Form::nothing) return;
     if (list->form != Form::list)
@@ -115,7 +115,7 @@ void readChildren(Description const& parent, std::string_view key, ObjectKind ki
                            std::string(key) + " cannot be " + list->words() +
                                "; write a list, each entry beginning with \"- handle:\"");
     for (auto const& item : list->items) {
-        ObjectSpec child = readObject(item, kind, keys);
+        ObjectDraft child = readObject(item, kind, keys);
         if (kind == ObjectKind::device)
             readChildren(item, "subdevices", ObjectKind::subDevice, kSubDeviceKeys, child);
         into.children.push_back(std::move(child));
@@ -123,8 +123,8 @@ void readChildren(Description const& parent, std::string_view key, ObjectKind ki
 }
 
 /// Two objects of one description with one handle.
-void refuseSharedHandles(std::span<ObjectSpec const> objects,
-                         std::unordered_map<std::int32_t, ObjectSpec const*>& seen) {
+void refuseSharedHandles(std::span<ObjectDraft const> objects,
+                         std::unordered_map<std::int32_t, ObjectDraft const*>& seen) {
     for (auto const& object : objects) {
         auto const [first, isNew] = seen.emplace(object.handle, &object);
         if (!isNew) {
@@ -138,8 +138,8 @@ void refuseSharedHandles(std::span<ObjectSpec const> objects,
     }
 }
 
-ObjectSpec readBoardOnly(Description const& description, std::string const& date) {
-    ObjectSpec board = readObject(description, ObjectKind::board, kBoardKeys);
+ObjectDraft readBoardOnly(Description const& description, std::string const& date) {
+    ObjectDraft board = readObject(description, ObjectKind::board, kBoardKeys);
     auto const serial = board.attributes.find(std::string_view("SERIAL_NUMBER"));
     if (serial == board.attributes.end() || serial->second.form() != ValueForm::text ||
         serial->second.asText().empty())
@@ -157,9 +157,9 @@ ObjectSpec readBoardOnly(Description const& description, std::string const& date
 
 } // namespace
 
-ObjectSpec readBoard(Description const& description) {
-    ObjectSpec board = readBoardOnly(description, currentDate());
-    std::unordered_map<std::int32_t, ObjectSpec const*> seen;
+ObjectDraft readBoard(Description const& description) {
+    ObjectDraft board = readBoardOnly(description, currentDate());
+    std::unordered_map<std::int32_t, ObjectDraft const*> seen;
     refuseSharedHandles({&board, 1}, seen);
     return board;
 }
@@ -173,7 +173,7 @@ Chassis readChassis(std::string const& yamlText) {
     Description const* const list = file.find("boards");
     if (list == nullptr)
         throw ChassisError(file.line, "no boards; begin the chassis with \"boards:\"");
-    std::vector<ObjectSpec> boards;
+    std::vector<ObjectDraft> boards;
     if (list->form != Form::nothing) {
         if (list->form != Form::list)
             throw ChassisError(list->line,
@@ -183,7 +183,7 @@ Chassis readChassis(std::string const& yamlText) {
         for (auto const& item : list->items)
             boards.push_back(readBoardOnly(item, date));
     }
-    std::unordered_map<std::int32_t, ObjectSpec const*> seen;
+    std::unordered_map<std::int32_t, ObjectDraft const*> seen;
     refuseSharedHandles(boards, seen);
     Chassis chassis;
     for (auto& board : boards)

@@ -13,7 +13,7 @@ namespace kvlsim {
 /// All throw ChassisError with the line and a message that says what to do.
 Chassis readChassis(std::string const& yamlText);
 /// Defaults (condition, presence, date) included.
-ObjectSpec readBoard(Description const& description);
+ObjectDraft readBoard(Description const& description);
 /// The attributes of an object of any kind, as a map "name: value".
 AttributeMap readAttributes(Description const& attributes);
 AttributeValue readAttribute(std::string_view name, Description const& value);

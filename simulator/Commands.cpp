@@ -57,7 +57,7 @@ Json insert(Context const& context) {
     if (!description.is_object())
         throw CommandError("\"board\" must be a board's description, an object with \"handle\" "
                            "and \"attributes\"");
-    ObjectSpec board = readBoard(describeJson(description));
+    ObjectDraft board = readBoard(describeJson(description));
     std::int32_t const handle = board.handle;
     context.platform.write([&](Chassis* chassis) {
         present(chassis).insertBoard(std::move(board));
@@ -272,10 +272,10 @@ constexpr std::array<Command, 14> kCommands = {{{"insert", insert},
 
 Command const& commandNamed(Json const& request) {
     if (!request.is_object())
-        throw CommandError("a command is a JSON object, such as {\"command\": \"show\"}");
+        throw CommandError(R"(a command is a JSON object, such as {"command": "show"})");
     auto const name = request.find("command");
     if (name == request.end() || !name->is_string())
-        throw CommandError("\"command\" is missing or no text; write one such as \"show\"");
+        throw CommandError(R"("command" is missing or no text; write one such as "show")");
     auto const& text = name->get_ref<std::string const&>();
     std::string known;
     for (auto const& command : kCommands) {

@@ -57,18 +57,18 @@ class TreeBuilder final : public YAML::EventHandler {
     }
     void OnDocumentEnd() override {}
 
-    void OnNull(YAML::Mark const& mark, YAML::anchor_t) override {
+    void OnNull(YAML::Mark const& mark, YAML::anchor_t /*anchor*/) override {
         Description node;
         node.line = mark.line + 1;
         add(std::move(node));
     }
 
-    void OnAlias(YAML::Mark const& mark, YAML::anchor_t) override {
+    void OnAlias(YAML::Mark const& mark, YAML::anchor_t /*anchor*/) override {
         throw ChassisError(mark.line + 1,
                            "references (*name) are not supported; write the value out");
     }
 
-    void OnScalar(YAML::Mark const& mark, std::string const& tag, YAML::anchor_t,
+    void OnScalar(YAML::Mark const& mark, std::string const& tag, YAML::anchor_t /*anchor*/,
                   std::string const& value) override {
         Description node;
         node.line = mark.line + 1;
@@ -79,14 +79,14 @@ class TreeBuilder final : public YAML::EventHandler {
         add(std::move(node));
     }
 
-    void OnSequenceStart(YAML::Mark const& mark, std::string const& tag, YAML::anchor_t,
-                         YAML::EmitterStyle::value) override {
+    void OnSequenceStart(YAML::Mark const& mark, std::string const& tag, YAML::anchor_t /*anchor*/,
+                         YAML::EmitterStyle::value /*style*/) override {
         open(Description::Form::list, mark, tag);
     }
     void OnSequenceEnd() override { close(); }
 
-    void OnMapStart(YAML::Mark const& mark, std::string const& tag, YAML::anchor_t,
-                    YAML::EmitterStyle::value) override {
+    void OnMapStart(YAML::Mark const& mark, std::string const& tag, YAML::anchor_t /*anchor*/,
+                    YAML::EmitterStyle::value /*style*/) override {
         open(Description::Form::map, mark, tag);
     }
     void OnMapEnd() override {
