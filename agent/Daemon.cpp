@@ -6,7 +6,9 @@
 
 #include <cerrno>
 #include <csignal>
+#include <cstdlib>
 #include <ctime>
+#include <filesystem>
 #include <memory>
 #include <system_error>
 
@@ -130,6 +132,27 @@ void attachModules(std::vector<LoadedModule> const& modules, Boards& boards) {
         boards.manager->Attach(factory);
 }
 
+/// A folder for a scope.
+class TemporaryFolder {
+  public:
+    TemporaryFolder() {
+        m_path = (std::filesystem::temp_directory_path() / "kvloamd-XXXXXX").string();
+        if (mkdtemp(m_path.data()) == nullptr)
+            throw std::system_error(errno, std::generic_category(), m_path);
+    }
+    ~TemporaryFolder() {
+        std::error_code ignored;
+        std::filesystem::remove_all(m_path, ignored);
+    }
+    TemporaryFolder(TemporaryFolder const&) = delete;
+    TemporaryFolder& operator=(TemporaryFolder const&) = delete;
+
+    std::string const& path() const { return m_path; }
+
+  private:
+    std::string m_path;
+};
+
 void serve(Options const& options, StopSignals const& stopSignals, Boards& boards,
            Clock::time_point started) {
     Wakeup wakeup;
@@ -190,7 +213,11 @@ int checkConfiguration(Options const& options) {
             good = false;
         }
     }
-    SnmpSession const snmp(options);
+    // The SNMP library keeps its state as it goes; a check leaves no trace.
+    TemporaryFolder const folder;
+    Options withoutTrace = options;
+    withoutTrace.persistentDirectory = folder.path();
+    SnmpSession const snmp(withoutTrace);
     good = report(snmp.faults()) && good;
     if (good) log(LogLevel::Info, "the configuration is good");
     return good ? 0 : kExitFailure;

@@ -11,6 +11,7 @@
 #include <utility>
 
 #include "agent/Log.h"
+#include "agent/RepeatFilter.h"
 
 // The SNMP library's headers build on each other.
 // clang-format off
@@ -40,6 +41,9 @@ std::vector<std::string>* configFaults = nullptr;
 
 bool started = false;
 
+/// The configuration names no community and no user.
+bool nobodyMayAsk = false;
+
 LogLevel levelOf(int priority) {
     if (priority <= LOG_ERR) return LogLevel::Error;
     if (priority == LOG_WARNING) return LogLevel::Warning;
@@ -64,15 +68,17 @@ std::string oneLine(std::string_view message) {
 int takeLogLine(int, int, void* message, void*) {
     auto const* const entry = static_cast<snmp_log_message const*>(message);
     std::string text = oneLine(entry->msg);
-    if (text.starts_with("Warning: no access control information configured"))
-        text =
-            "no community and no user is configured, so nobody gets an answer; configure them in "
-            "the file that --snmp-config names";
+    if (text.starts_with("Warning: no access control information configured")) {
+        nobodyMayAsk = true;
+        return SNMP_ERR_NOERROR;
+    }
+    // Only a count of what has been said already.
+    if (text.find("error(s) in config file(s)") != std::string::npos) return SNMP_ERR_NOERROR;
     // The file is read in two rounds, and some faults are found in both.
     if (configFaults != nullptr && text.find(": line ") != std::string::npos) {
         if (std::ranges::find(*configFaults, text) == configFaults->end())
             configFaults->push_back(std::move(text));
-    } else {
+    } else if (static RepeatFilter filter; filter.passes(text, RepeatFilter::Clock::now())) {
         log(levelOf(entry->priority), text);
     }
     return SNMP_ERR_NOERROR;
@@ -86,6 +92,7 @@ void nameConfiguration(Options const& options) {
     // Only this file counts then, and the state of former runs, which is read on its own. Nothing
     // can be below /dev/null.
     set_configuration_directory("/dev/null");
+    unsetenv("SNMPCONFPATH");
     netsnmp_ds_set_string(NETSNMP_DS_LIBRARY_ID, NETSNMP_DS_LIB_OPTIONALCONFIG,
                           options.snmpConfig.c_str());
 }
@@ -116,6 +123,9 @@ std::vector<std::string> startSnmp(Options const& options) {
     init_snmp(kAppName);
     configFaults = nullptr;
     started = true;
+    if (nobodyMayAsk && faults.empty())
+        log(LogLevel::Warning, "no community and no user is configured, so nobody gets an answer; "
+                               "configure them in the file that --snmp-config names");
     return faults;
 }
 

@@ -43,8 +43,9 @@ Chassis::Chassis() {
 }
 
 ChassisObject const* Chassis::find(long handle) const {
-    if (handle < 1 || handle > kRootHandle) return nullptr;
-    auto const found = m_objects.find(static_cast<std::int32_t>(handle));
+    auto const narrow = static_cast<std::int32_t>(handle);
+    if (narrow != handle) return nullptr; // a long may have 8 bytes, no handle has
+    auto const found = m_objects.find(narrow);
     return found == m_objects.end() ? nullptr : &found->second;
 }
 

@@ -42,8 +42,9 @@ class Journal final : public VqxEventService::CEventHandlerAdaptor {
         std::int32_t board = 0;
         if (message->payload != nullptr) std::memcpy(&board, message->payload, sizeof board);
         std::snprintf(line.data(), line.size(), "%X", message->id);
-        m_lines.push_back(line.data() +
-                          (message->payload != nullptr ? " " + std::to_string(board) : ""));
+        std::string entry = line.data();
+        if (message->payload != nullptr) entry.append(" ").append(std::to_string(board));
+        m_lines.push_back(entry);
         return 1;
     }
 

@@ -4,6 +4,8 @@
 
 #include <array>
 #include <atomic>
+#include <climits>
+#include <cstdint>
 #include <cstring>
 #include <string>
 #include <thread>
@@ -148,6 +150,12 @@ TEST_F(DeviceMapperTest, SearchUnderAnUnknownParentFailsWithNothingFound) {
     EXPECT_THAT(find(0, {}, 100, 201), IsEmpty());
     EXPECT_THAT(find(-1, {}, 100, 201), IsEmpty());
 }
+
+#if LONG_MAX > INT32_MAX
+TEST_F(DeviceMapperTest, HandleThatMatchesInItsLowerHalfOnlyIsUnknown) {
+    EXPECT_THAT(find((1L << 32) + 30, {}, 100, 201), IsEmpty());
+}
+#endif
 
 TEST_F(DeviceMapperTest, SearchWithNullPointersIsRefused) {
     long auid = 0;

@@ -29,6 +29,7 @@ class KvlsimToolTest : public testing::Test {
     std::string socket() const { return directory.file("socket"); }
 
     ChildProcess& hold(std::vector<std::string> environment = {}) {
+        holder.reset(); // an earlier one gives the socket up before the next wants it
         environment.push_back("KVLSIM_SOCKET=" + socket());
         holder = std::make_unique<ChildProcess>(std::vector<std::string>{KVLSIM_PLATFORM_HOLDER},
                                                 environment);

@@ -1,0 +1,51 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// A child process whose output the test reads.
+#pragma once
+
+#include <sys/types.h>
+
+#include <chrono>
+#include <map>
+#include <string>
+#include <vector>
+
+namespace kvloamd::e2e {
+
+/// The most that a test waits for anything; only a failing one waits that long.
+inline constexpr std::chrono::seconds kPatience{90};
+
+/// Started by the constructor, killed by the destructor if it still runs. Its standard output and
+/// error arrive as one stream.
+class Process {
+  public:
+    using Environment = std::map<std::string, std::string>;
+
+    /// `environment` is all that the child sees. The program is looked for on the test's PATH.
+    Process(std::vector<std::string> const& command, Environment const& environment);
+    ~Process();
+    Process(Process const&) = delete;
+    Process& operator=(Process const&) = delete;
+
+    /// Reads on until `text` has appeared `times` times in all of the output so far. False when the
+    /// output ends or patience does.
+    bool waitFor(std::string const& text, int times = 1);
+    /// Reads to the end of the output, waits for the process, and returns its exit status; 128 and
+    /// the signal when one ended it.
+    int wait();
+    void signal(int number) const;
+
+    std::string const& output() const { return m_output; }
+
+  private:
+    /// False at the end of the output, or at the deadline.
+    bool readMore(std::chrono::steady_clock::time_point deadline);
+
+    pid_t m_pid = -1;
+    int m_pipe = -1;
+    bool m_running = true;
+    std::string m_output;
+};
+
+std::vector<std::string> linesOf(std::string const& text);
+
+} // namespace kvloamd::e2e
