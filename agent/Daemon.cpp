@@ -130,6 +130,8 @@ void attachModules(std::vector<LoadedModule> const& modules, Boards& boards) {
     boards.manager->AddBoardStatusListener(&boards.listener);
     for (ReferenceCounter<BoardFactory> const& factory : factories)
         boards.manager->Attach(factory);
+    for (LoadedModule const& module : modules)
+        ServiceManager::GetInstance()->AddModule(module.name().c_str());
 }
 
 /// A folder for a scope.
@@ -156,7 +158,15 @@ class TemporaryFolder {
 void serve(Options const& options, StopSignals const& stopSignals, Boards& boards,
            Clock::time_point started) {
     Wakeup wakeup;
-    Collector collector([&] { return boards.source.read(); }, started, [&] { wakeup.wake(); });
+    ServiceManager& services = *ServiceManager::GetInstance();
+    Collector collector(
+        [&](Snapshot& snapshot) {
+            snapshot.boards = boards.source.read();
+            snapshot.modules = readModules(services);
+            snapshot.services = readServices(services);
+            snapshot.platformService = readPlatformService(services);
+        },
+        started, [&] { wakeup.wake(); });
     std::vector<Table const*> const allTables = tables();
     ObjectTree const tree(scalars(), allTables);
     SnmpHandler handler(tree, boards.counters, options.enterprise,

@@ -16,8 +16,9 @@ inline Oid const kBoardStatusChangePlace{1, 0, 1};
 
 std::span<Scalar const> scalars();
 
-/// kvlBoardTable.
 Table const& boardTable();
+Table const& moduleTable();
+Table const& serviceTable();
 
 /// Every table.
 std::vector<Table const*> tables();

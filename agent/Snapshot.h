@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "agent/BoardRow.h"
+#include "agent/ServiceRows.h"
 
 namespace kvloamd {
 
@@ -15,9 +16,12 @@ using Clock = std::chrono::steady_clock;
 
 /// Never changed once it is published; shared by whoever answers from it.
 struct Snapshot {
-    std::vector<BoardRow> boards; ///< ascending by index
+    std::vector<BoardRow> boards; ///< ascending by index, as all rows
+    std::vector<ModuleRow> modules;
+    std::vector<ServiceRow> services;
+    PlatformService platformService;
     Clock::time_point begun;      ///< when reading began: what happened before is in it
-    std::uint32_t lastChange = 0; ///< hundredths of a second since the agent's start
+    std::uint32_t lastChange = 0; ///< of the boards: hundredths of a second since the agent's start
 };
 
 /// Raised by any thread, read by any thread.
