@@ -159,12 +159,16 @@ void serve(Options const& options, StopSignals const& stopSignals, Boards& board
            Clock::time_point started) {
     Wakeup wakeup;
     ServiceManager& services = *ServiceManager::GetInstance();
+    KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
+    PlatformReader platform;
     Collector collector(
         [&](Snapshot& snapshot) {
             snapshot.boards = boards.source.read();
             snapshot.modules = readModules(services);
             snapshot.services = readServices(services);
             snapshot.platformService = readPlatformService(services);
+            snapshot.processes = readProcesses(statistics);
+            snapshot.records = platform.read(snapshot.boards);
         },
         started, [&] { wakeup.wake(); });
     std::vector<Table const*> const allTables = tables();

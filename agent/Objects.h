@@ -19,6 +19,11 @@ std::span<Scalar const> scalars();
 Table const& boardTable();
 Table const& moduleTable();
 Table const& serviceTable();
+Table const& deviceTable();
+Table const& subDeviceTable();
+Table const& processorTable();
+Table const& storeTable();
+Table const& processTable();
 
 /// Every table.
 std::vector<Table const*> tables();

@@ -59,7 +59,8 @@ std::span<Scalar const> scalars() {
 }
 
 std::vector<Table const*> tables() {
-    return {&boardTable(), &moduleTable(), &serviceTable()};
+    return {&boardTable(),     &moduleTable(),    &serviceTable(), &deviceTable(),
+            &subDeviceTable(), &processorTable(), &storeTable(),   &processTable()};
 }
 
 } // namespace kvloamd
