@@ -1,11 +1,10 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The tables of devices, store records, modules and processes, asked of the real agent.
-#include <sys/file.h>
+#include <fcntl.h>
 #include <unistd.h>
 
 #include <algorithm>
 #include <filesystem>
-#include <fstream>
 
 #include <gmock/gmock.h>
 
@@ -22,6 +21,26 @@ using ::testing::HasSubstr;
 using ::testing::IsEmpty;
 using ::testing::Not;
 using ::testing::SizeIs;
+
+/// A lock on a whole file that keeps every other process's locks away; its end gives it back.
+class FileLock {
+  public:
+    explicit FileLock(std::string const& file) : m_descriptor(open(file.c_str(), O_RDWR)) {
+        struct flock whole {};
+        whole.l_type = F_WRLCK;
+        whole.l_whence = SEEK_SET;
+        m_held = m_descriptor >= 0 && fcntl(m_descriptor, F_SETLKW, &whole) == 0;
+    }
+    ~FileLock() { close(m_descriptor); }
+    FileLock(FileLock const&) = delete;
+    FileLock& operator=(FileLock const&) = delete;
+
+    bool held() const { return m_held; }
+
+  private:
+    int m_descriptor;
+    bool m_held = false;
+};
 
 class PlatformTest : public AgentFixture {
   protected:
@@ -209,6 +228,18 @@ TEST_F(PlatformTest, TruncatedStoreLeavesTheAgentRunningWithAnEmptyTable) {
     EXPECT_THAT(values("kvlStoreSerialNumber"), IsEmpty());
     EXPECT_THAT(rows("kvlDeviceTable"), SizeIs(8));
     EXPECT_EQ(std::filesystem::file_size(storeFile()), 15U);
+}
+
+TEST_F(PlatformTest, LockedStoreEmptiesItsTableUntilItIsLetGo) {
+    startAgent();
+    ASSERT_THAT(values("kvlStoreSerialNumber"), SizeIs(3));
+    {
+        FileLock const lock(storeFile());
+        ASSERT_TRUE(lock.held());
+        EXPECT_TRUE(eventually([this] { return values("kvlStoreSerialNumber").empty(); }));
+        EXPECT_THAT(rows("kvlDeviceTable"), SizeIs(8));
+    }
+    EXPECT_TRUE(eventually([this] { return values("kvlStoreSerialNumber").size() == 3; }));
 }
 
 TEST_F(PlatformTest, StoreThatIsMadeGoodIsServedAgain) {
