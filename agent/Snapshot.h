@@ -9,7 +9,7 @@
 #include <vector>
 
 #include "agent/BoardRow.h"
-#include "agent/PlatformRecords.h"
+#include "agent/PlatformReader.h"
 #include "agent/ProcessRow.h"
 #include "agent/ServiceRows.h"
 

@@ -13,7 +13,7 @@
 
 #include "agent/BoardFinder.h"
 #include "agent/DeviceRows.h"
-#include "agent/PlatformRecords.h"
+#include "agent/PlatformReader.h"
 #include "boardplatform/dm_client.h"
 
 namespace {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-#include "agent/PlatformRecords.h"
+#include "agent/PlatformReader.h"
 
 #include <algorithm>
 

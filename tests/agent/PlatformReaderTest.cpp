@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // When the platform's records are read, and what becomes of them, on the simulated platform.
-#include "agent/PlatformRecords.h"
+#include "agent/PlatformReader.h"
 
 #include <unistd.h>
 
