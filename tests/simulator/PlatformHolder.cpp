@@ -119,6 +119,11 @@ int main() {
             std::string name;
             words >> handle >> name;
             printAttribute(handle, name);
+        } else if (command == "run") {
+            std::string json;
+            std::getline(words, json);
+            std::puts(kvlsim::execute(nlohmann::json::parse(json)).dump().c_str());
+            std::fflush(stdout);
         } else if (command == "child") {
             std::string name;
             words >> name;

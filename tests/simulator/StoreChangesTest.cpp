@@ -10,6 +10,7 @@
 
 #include <gmock/gmock.h>
 
+#include "tests/simulator/ChildProcess.h"
 #include "tests/support/SimulatedPlatform.h"
 #include "tests/support/SimulatedStore.h"
 
@@ -203,30 +204,41 @@ INSTANTIATE_TEST_SUITE_P(
                   "no record with serial number \"Z1\" in the store"}),
     [](auto const& each) { return each.param.name; });
 
-TEST_F(StoreChangesTest, ReaderSeesTheOldRecordOrTheNewOne) {
-    // Two fields that always change together, read in one call while they change.
-    sim::Json const records[] = {{{"Model", std::string(79, 'a')}, {"FunctionalDescription", "a"}},
-                                 {{"Model", std::string(79, 'b')}, {"FunctionalDescription", "b"}}};
-    sim::command({{"command", "store-set"}, {"serial", "A1"}, {"fields", records[0]}});
+TEST_F(StoreChangesTest, ReaderSeesTheOldRecordOrTheNewOneOfAnotherProcess) {
+    // Two fields that always change together, read in one call while another process changes them.
+    std::string const commands[] = {
+        R"(run {"command": "store-set", "serial": "A1", "fields": {"Model": "aa", "Type": 1}})",
+        R"(run {"command": "store-set", "serial": "A1", "fields": {"Model": "bb", "Type": 2}})"};
+    kvlsim::testing::ChildProcess writer({KVLSIM_PLATFORM_HOLDER},
+                                         {"VQRXCFGPATH=" + store.directory()});
+    ASSERT_EQ(writer.readLine(), "ready");
+    writer.writeLine(commands[0]);
+    ASSERT_THAT(writer.readLine(), HasSubstr("\"ok\":true"));
     auto const board = record("A1")["instance"].get<int>();
     std::array<char, kQSBTypeNameSize> type{};
     int root = 0;
     ASSERT_EQ(QSBOpenStorage(type.data(), &root), QSB_SUCCESS);
     std::atomic<bool> done = false;
-    std::thread writer([&] {
-        for (int i = 1; i <= 100; ++i)
-            sim::command({{"command", "store-set"}, {"serial", "A1"}, {"fields", records[i % 2]}});
+    int refused = 0;
+    std::thread driver([&] {
+        for (int i = 1; i <= 100; ++i) {
+            writer.writeLine(commands[i % 2]);
+            // A change that meets a reader for too long is refused, and changes nothing.
+            if (writer.readLine().find("\"ok\":true") == std::string::npos) ++refused;
+        }
         done = true;
     });
     std::set<std::string> seen;
     do {
-        std::array<char, 165> both{}; // Model, Type, the description's first letter
-        ASSERT_EQ(QSBGetDataValue("Board", board, 80, sizeof both, both.data()), QSB_SUCCESS);
-        seen.insert(std::string(both.data()) + both[84]);
+        std::array<char, 84> both{}; // Model and Type
+        if (QSBGetDataValue("Board", board, 80, sizeof both, both.data()) == QSB_SUCCESS)
+            seen.insert(std::string(both.data()) + std::to_string(both[80] + both[83]));
     } while (!done);
-    writer.join();
-    seen.erase(std::string(79, 'a') + "a");
-    seen.erase(std::string(79, 'b') + "b");
+    driver.join();
+    EXPECT_LT(refused, 100);
+    EXPECT_FALSE(seen.empty());
+    seen.erase("aa1");
+    seen.erase("bb2");
     EXPECT_TRUE(seen.empty()) << *seen.begin();
 }
 
