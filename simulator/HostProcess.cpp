@@ -16,6 +16,9 @@
 #include <filesystem>
 #include <sstream>
 #include <stdexcept>
+#include <utility>
+
+#include "simulator/Description.h"
 
 namespace kvlsim {
 
@@ -35,14 +38,36 @@ std::optional<std::string> readProcFile(pid_t pid, char const* name) {
     return std::string(text.data(), static_cast<std::size_t>(size));
 }
 
+struct Pipe {
+    Descriptor out; ///< to read from
+    Descriptor in;  ///< to write to
+
+    Pipe() {
+        std::array<int, 2> ends{};
+        if (pipe2(ends.data(), O_CLOEXEC) != 0)
+            throw std::runtime_error(std::string("cannot start a process (") +
+                                     std::strerror(errno) + ")");
+        out = Descriptor(ends[0]);
+        in = Descriptor(ends[1]);
+    }
+};
+
+bool readByte(int fd, char& byte) {
+    ssize_t size = 0;
+    do
+        size = read(fd, &byte, 1);
+    while (size < 0 && errno == EINTR);
+    return size == 1;
+}
+
 /// What a spawned process begins with: no signal blocked or ignored, and these files.
 class SpawnPlan {
   public:
-    explicit SpawnPlan(int input) {
+    SpawnPlan(int input, int output) {
         posix_spawn_file_actions_init(&m_files);
         posix_spawn_file_actions_adddup2(&m_files, input, STDIN_FILENO);
-        for (int const output : {STDOUT_FILENO, STDERR_FILENO})
-            posix_spawn_file_actions_addopen(&m_files, output, "/dev/null", O_WRONLY, 0);
+        posix_spawn_file_actions_adddup2(&m_files, output, STDOUT_FILENO);
+        posix_spawn_file_actions_addopen(&m_files, STDERR_FILENO, "/dev/null", O_WRONLY, 0);
         posix_spawnattr_init(&m_attributes);
         sigset_t none;
         sigemptyset(&none);
@@ -119,18 +144,32 @@ std::vector<HostProcess> processesRunning(std::string const& program) {
 }
 
 WaitingChild::WaitingChild(std::string const& name) {
-    std::array<int, 2> ends{};
-    if (pipe2(ends.data(), O_CLOEXEC) != 0)
-        throw std::runtime_error(std::string("cannot start a process (") + std::strerror(errno) +
-                                 ")");
-    Descriptor const input(ends[0]);
-    m_lifeline = Descriptor(ends[1]);
-    // It reads until the lifeline's last holder has gone, which the kernel sees to.
-    pid_t const pid = SpawnPlan(input.get()).spawn("/bin/cat", name);
-    m_process = runningProcess(pid).value_or(HostProcess{pid, 0});
+    Pipe input;
+    Pipe output;
+    // Written while the other end is open here: a child that ends at once raises no signal.
+    char byte = '\n';
+    bool const written = write(input.in.get(), &byte, 1) == 1;
+    // It copies what it reads until the lifeline's last holder has gone, which the kernel sees to.
+    m_process.pid = SpawnPlan(input.out.get(), output.in.get()).spawn("/bin/cat", name);
+    m_lifeline = std::move(input.in);
+    output.in = Descriptor();
+    // Once it has copied a byte it is the program that it is to be: its command line is there only
+    // some time after it has been spawned.
+    bool const copied = written && readByte(output.out.get(), byte);
+    auto const process = runningProcess(m_process.pid);
+    if (copied && process) {
+        m_process = *process;
+        return;
+    }
+    end();
+    throw std::runtime_error("the process " + inQuotes(name) + " does not run");
 }
 
 WaitingChild::~WaitingChild() {
+    end();
+}
+
+void WaitingChild::end() {
     m_lifeline = Descriptor();
     if (!runs()) return;
     kill(m_process.pid, SIGKILL);

@@ -45,6 +45,8 @@ class WaitingChild {
     bool runs();
 
   private:
+    void end();
+
     HostProcess m_process;
     Descriptor m_lifeline; ///< the child reads from its other end
     bool m_reaped = false;
