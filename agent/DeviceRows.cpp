@@ -98,8 +98,8 @@ ProcessorRow processorRow(DevMapProcessorIf const& processor, std::uint32_t boar
 template <class Row>
 void putInOrder(std::vector<Row>& rows) {
     std::ranges::sort(rows, {}, &Row::index);
-    auto const twice = std::ranges::unique(rows, {}, &Row::index);
-    rows.erase(twice.begin(), twice.end());
+    auto const sameIndex = [](Row const& a, Row const& b) { return a.index() == b.index(); };
+    rows.erase(std::unique(rows.begin(), rows.end(), sameIndex), rows.end());
 }
 
 } // namespace
