@@ -13,6 +13,9 @@ namespace KVL {
 /// The size of a text's buffer in a request.
 inline constexpr int kDMTextSize = 128;
 
+/// What a missing text reads as.
+inline constexpr char const* kDMUnknown = "unknown";
+
 /// A four-byte number as the client writes it. API numbers are `long`, which may be wider, so the
 /// client never writes into one.
 class DMNumber {
@@ -22,6 +25,11 @@ class DMNumber {
     DMAttribute request(char const* name) { return {name, &m_word, 0, 0, sizeof m_word}; }
     /// What the client wrote, or the start value.
     long word() const { return m_word; }
+    /// The answer to `request` where the record takes what the client wrote, or the start value:
+    /// only a request that failed in part (`result`) makes a missing number -1.
+    long inPlace(DMAttribute const& request, int result) const {
+        return result == kDMSomeAttributesFailed && request.status != 0 ? -1 : word();
+    }
     /// The answer to `request`: a two-byte one is extended; -1 when there was none.
     long answer(DMAttribute const& request) const;
 
@@ -41,6 +49,11 @@ class DMText {
   private:
     char m_buffer[kDMTextSize] = {};
 };
+
+/// Asks for an address descriptor, which the client writes in place.
+inline DMAttribute descriptor_request(char const* name, QCompDesc& descriptor) {
+    return {name, &descriptor, 0, 0, sizeof descriptor};
+}
 
 /// Appends the objects under `parent` that match `criterion` to `found`, at most
 /// `kDMSearchCapacity`; nothing when the search fails.

@@ -5,19 +5,12 @@
 
 using KVL::DMNumber;
 using KVL::DMText;
+using KVL::kDMUnknown;
 
 namespace {
 
 /// The types of devices on a board, in the order in which they are listed.
 constexpr int kDeviceTypes[] = {501, 503, 505, 507, 509, 514, 516, 518, 520, 521, 511, 525, 527};
-
-constexpr char const* kUnknown = "unknown";
-
-/// A number that the client writes straight into the record: only a request that failed in part
-/// makes a missing one -1.
-long inPlace(DMNumber const& number, DMAttribute const& request, int result) {
-    return result == kDMSomeAttributesFailed && request.status != 0 ? -1 : number.word();
-}
 
 /// Deliberate: an answer of less than two bytes is address 0; boards without shared memory say so.
 long address(DMNumber const& number, DMAttribute const& request) {
@@ -70,22 +63,22 @@ DevMapBoardIf::DevMapBoardIf(long auid) : m_auid(auid), m_dmIf(DeviceMapperIf::g
     };
     int const result = client().GetAttributes(auid, Count, requests);
 
-    m_serialNumber = serialNumber.answer(requests[AtSerialNumber], kUnknown);
-    m_firmwareName = firmwareName.answer(requests[AtFirmwareName], kUnknown);
-    m_firmwareName1 = firmwareName1.answer(requests[AtFirmwareName1], kUnknown);
-    m_description = description.answer(requests[AtDescription], kUnknown);
-    m_name = name.answer(requests[AtName], kUnknown);
-    m_family = family.answer(requests[AtFamily], kUnknown);
-    m_firmwareVersion = firmwareVersion.answer(requests[AtFirmwareVersion], kUnknown);
+    m_serialNumber = serialNumber.answer(requests[AtSerialNumber], kDMUnknown);
+    m_firmwareName = firmwareName.answer(requests[AtFirmwareName], kDMUnknown);
+    m_firmwareName1 = firmwareName1.answer(requests[AtFirmwareName1], kDMUnknown);
+    m_description = description.answer(requests[AtDescription], kDMUnknown);
+    m_name = name.answer(requests[AtName], kDMUnknown);
+    m_family = family.answer(requests[AtFamily], kDMUnknown);
+    m_firmwareVersion = firmwareVersion.answer(requests[AtFirmwareVersion], kDMUnknown);
     m_pciSlotNumber = pciSlot.answer(requests[AtPciSlot]);
     m_pciBusNumber = pciBus.answer(requests[AtPciBus]);
     m_sharedMemoryBaseAddress = address(memoryBase, requests[AtMemoryBase]);
     m_ioBaseAddress = ioBase.answer(requests[AtIOBase]);
     m_irq = irq.answer(requests[AtIrq]);
     m_boardID = boardID.answer(requests[AtBoardID]);
-    m_shelfID = inPlace(shelf, requests[AtShelf], result);
-    m_vornDriverBoardID = inPlace(vornDriverBoard, requests[AtVornDriverBoard], result);
-    m_chassisSlot = inPlace(chassisSlot, requests[AtChassisSlot], result);
+    m_shelfID = shelf.inPlace(requests[AtShelf], result);
+    m_vornDriverBoardID = vornDriverBoard.inPlace(requests[AtVornDriverBoard], result);
+    m_chassisSlot = chassisSlot.inPlace(requests[AtChassisSlot], result);
 }
 
 long DevMapBoardIf::LogicalID() {

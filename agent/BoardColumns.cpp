@@ -1,26 +1,11 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // kvlBoardTable: the boards, with every query of the abstract board.
 #include "agent/Objects.h"
+#include "agent/RowValues.h"
 
 namespace kvloamd {
 
 namespace {
-
-template <std::string BoardRow::*Field>
-Value text(BoardRow const& row) {
-    return std::string_view(row.*Field);
-}
-
-/// Octets that are empty when the board does not know them.
-template <std::string BoardRow::*Field>
-Value textIfKnown(BoardRow const& row) {
-    return (row.*Field).empty() ? Value{} : Value{std::string_view(row.*Field)};
-}
-
-template <std::optional<int> BoardRow::*Field>
-Value number(BoardRow const& row) {
-    return (row.*Field).has_value() ? Value{std::int64_t{*(row.*Field)}} : Value{};
-}
 
 /// A status that the MIB module has no name for is left out.
 template <int BoardRow::*Field>

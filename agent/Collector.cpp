@@ -5,14 +5,23 @@
 
 namespace kvloamd {
 
-Collector::Collector(ReadBoards readBoards, Clock::time_point started,
-                     std::function<void()> renewed, CollectorPace pace)
-    : m_readBoards(std::move(readBoards)),
+Collector::Collector(ReadRows readRows, Clock::time_point started, std::function<void()> renewed,
+                     CollectorPace pace)
+    : m_readRows(std::move(readRows)),
       m_started(started),
       m_renewed(std::move(renewed)),
-      m_pace(pace),
-      m_snapshot(collect(nullptr)),
-      m_thread([this] { run(); }) {}
+      m_pace(pace) {
+    std::promise<void> first;
+    std::future<void> firstDone = first.get_future();
+    m_thread =
+        std::thread([this, promise = std::move(first)]() mutable { begin(std::move(promise)); });
+    try {
+        firstDone.get();
+    } catch (...) {
+        m_thread.join();
+        throw;
+    }
+}
 
 Collector::~Collector() {
     {
@@ -45,6 +54,17 @@ void Collector::renew() {
     m_wake.notify_one();
 }
 
+void Collector::begin(std::promise<void> first) {
+    try {
+        m_snapshot = collect(nullptr);
+    } catch (...) {
+        first.set_exception(std::current_exception());
+        return;
+    }
+    first.set_value();
+    run();
+}
+
 void Collector::run() {
     std::unique_lock lock(m_mutex);
     while (!m_stop) {
@@ -72,7 +92,7 @@ void Collector::run() {
 std::shared_ptr<Snapshot const> Collector::collect(Snapshot const* former) {
     auto snapshot = std::make_shared<Snapshot>();
     snapshot->begun = Clock::now();
-    snapshot->boards = m_readBoards();
+    m_readRows(*snapshot);
     if (former == nullptr) return snapshot;
     using Hundredths = std::chrono::duration<std::uint32_t, std::centi>;
     snapshot->lastChange =

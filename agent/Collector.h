@@ -1,9 +1,10 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Keeps a snapshot of the boards, made on a thread of its own.
+// Keeps a snapshot of all rows, made on a thread of its own.
 #pragma once
 
 #include <condition_variable>
 #include <functional>
+#include <future>
 #include <memory>
 #include <mutex>
 #include <thread>
@@ -24,12 +25,13 @@ struct CollectorPace {
 /// renewed behind the asker's back. All operations may be called from any thread.
 class Collector {
   public:
-    using ReadBoards = std::function<std::vector<BoardRow>()>;
+    /// Fills the rows of a new snapshot. Called on the collector's thread only.
+    using ReadRows = std::function<void(Snapshot&)>;
 
-    /// Reads the boards once, on the caller's thread, then starts the collector's own.
-    /// `started`: the agent's start, from which times of change count. `renewed` is called on the
-    /// collector's thread after every later snapshot.
-    Collector(ReadBoards readBoards, Clock::time_point started, std::function<void()> renewed,
+    /// Starts the collector's thread and waits for the first snapshot; rethrows what reading it
+    /// throws. `started`: the agent's start, from which times of change count. `renewed` is called
+    /// on the collector's thread after every later snapshot.
+    Collector(ReadRows readRows, Clock::time_point started, std::function<void()> renewed,
               CollectorPace pace = {});
     /// Ends the thread; a reading under way is waited for.
     ~Collector();
@@ -44,10 +46,11 @@ class Collector {
     void renew();
 
   private:
+    void begin(std::promise<void> first);
     void run();
     std::shared_ptr<Snapshot const> collect(Snapshot const* former);
 
-    ReadBoards m_readBoards;
+    ReadRows m_readRows;
     Clock::time_point m_started;
     std::function<void()> m_renewed;
     CollectorPace m_pace;

@@ -139,6 +139,8 @@ void attachModules(std::vector<LoadedModule> const& modules, Boards& boards) {
     boards.manager->AddBoardStatusListener(&boards.listener);
     for (ReferenceCounter<BoardFactory> const& factory : factories)
         boards.manager->Attach(factory);
+    for (LoadedModule const& module : modules)
+        ServiceManager::GetInstance()->AddModule(module.name().c_str());
 }
 
 /// Has the listener tell of changes for a scope.
@@ -179,7 +181,19 @@ class TemporaryFolder {
 void serve(Options const& options, StopSignals const& stopSignals, Boards& boards,
            Clock::time_point started) {
     Wakeup wakeup;
-    Collector collector([&] { return boards.source.read(); }, started, [&] { wakeup.wake(); });
+    ServiceManager& services = *ServiceManager::GetInstance();
+    KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
+    PlatformReader platform;
+    Collector collector(
+        [&](Snapshot& snapshot) {
+            snapshot.boards = boards.source.read();
+            snapshot.modules = readModules(services);
+            snapshot.services = readServices(services);
+            snapshot.platformService = readPlatformService(services);
+            snapshot.processes = readProcesses(statistics);
+            snapshot.records = platform.read(snapshot.boards);
+        },
+        started, [&] { wakeup.wake(); });
     std::vector<Table const*> const allTables = tables();
     ObjectTree const tree(scalars(), allTables);
     SnmpHandler handler(tree, boards.counters, options.enterprise,

@@ -7,6 +7,7 @@
 #include <algorithm>
 #include <cstddef>
 #include <cstdint>
+#include <functional>
 #include <span>
 
 #include "agent/Snapshot.h"
@@ -55,8 +56,9 @@ struct Column {
     Value (*get)(Row const&);
 };
 
-/// A table whose rows lie in a sorted vector of the snapshot, `Rows`; a row says its own `index()`.
-template <class Row, std::vector<Row> Snapshot::*Rows>
+/// A table whose rows lie in a sorted vector of the snapshot; a row says its own `index()`.
+/// `Rows`: what gives the vector of a snapshot, a member or a function.
+template <class Row, auto Rows>
 class RowTable final : public Table {
   public:
     RowTable(char const* name, Oid entry, std::span<Column<Row> const> columns)
@@ -87,7 +89,9 @@ class RowTable final : public Table {
     }
 
   private:
-    static std::vector<Row> const& rows(Facts const& facts) { return facts.snapshot.*Rows; }
+    static std::vector<Row> const& rows(Facts const& facts) {
+        return std::invoke(Rows, facts.snapshot);
+    }
 
     char const* m_name;
     Oid m_entry;

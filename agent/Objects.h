@@ -16,8 +16,14 @@ inline Oid const kBoardStatusChangePlace{1, 0, 1};
 
 std::span<Scalar const> scalars();
 
-/// kvlBoardTable.
 Table const& boardTable();
+Table const& moduleTable();
+Table const& serviceTable();
+Table const& deviceTable();
+Table const& subDeviceTable();
+Table const& processorTable();
+Table const& storeTable();
+Table const& processTable();
 
 /// Every table.
 std::vector<Table const*> tables();

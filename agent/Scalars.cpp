@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The objects of KVL-OAM-MIB that have one instance.
 #include "agent/Objects.h"
+#include "agent/RowValues.h"
 #include "services/oam.h"
 
 namespace kvloamd {
@@ -41,12 +42,25 @@ std::span<Scalar const> scalars() {
          {1, 1, 2, 3},
          ValueType::Counter,
          [](Facts const& facts) { return count(facts.counters.statusChanges); }},
+        {"kvlPlatformServiceStatus",
+         {1, 1, 4, 1},
+         ValueType::Integer,
+         [](Facts const& facts) {
+             return number<&PlatformService::status>(facts.snapshot.platformService);
+         }},
+        {"kvlPlatformServiceChangeDate",
+         {1, 1, 4, 2},
+         ValueType::Date,
+         [](Facts const& facts) {
+             return textIfKnown<&PlatformService::changeDate>(facts.snapshot.platformService);
+         }},
     };
     return described;
 }
 
 std::vector<Table const*> tables() {
-    return {&boardTable()};
+    return {&boardTable(),     &moduleTable(),    &serviceTable(), &deviceTable(),
+            &subDeviceTable(), &processorTable(), &storeTable(),   &processTable()};
 }
 
 } // namespace kvloamd

@@ -5,9 +5,13 @@
 #include <atomic>
 #include <chrono>
 #include <cstdint>
+#include <memory>
 #include <vector>
 
 #include "agent/BoardRow.h"
+#include "agent/PlatformReader.h"
+#include "agent/ProcessRow.h"
+#include "agent/ServiceRows.h"
 
 namespace kvloamd {
 
@@ -15,10 +19,21 @@ using Clock = std::chrono::steady_clock;
 
 /// Never changed once it is published; shared by whoever answers from it.
 struct Snapshot {
-    std::vector<BoardRow> boards; ///< ascending by index
+    std::vector<BoardRow> boards; ///< ascending by index, as all rows
+    std::vector<ModuleRow> modules;
+    std::vector<ServiceRow> services;
+    PlatformService platformService;
+    std::vector<ProcessRow> processes;
+    std::shared_ptr<PlatformRecords const> records = std::make_shared<PlatformRecords>(); ///< set
     Clock::time_point begun;      ///< when reading began: what happened before is in it
-    std::uint32_t lastChange = 0; ///< hundredths of a second since the agent's start
+    std::uint32_t lastChange = 0; ///< of the boards: hundredths of a second since the agent's start
 };
+
+/// The rows of one kind among the platform's records.
+template <auto Rows>
+auto const& recorded(Snapshot const& snapshot) {
+    return (*snapshot.records).*Rows;
+}
 
 /// Raised by any thread, read by any thread.
 struct Counters {

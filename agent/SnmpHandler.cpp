@@ -37,6 +37,7 @@ u_char typeOf(ValueType type) {
     case ValueType::TimeTicks:
         return ASN_TIMETICKS;
     case ValueType::Text:
+    case ValueType::Octets:
     case ValueType::Date:
         break;
     }

@@ -32,6 +32,7 @@ enum class ValueType {
     Gauge,     ///< unsigned, 32 bits
     TimeTicks, ///< hundredths of a second since the agent's start
     Text,      ///< printable characters
+    Octets,    ///< any
     Date,      ///< 11 octets: date, time of day, offset from UTC
 };
 

@@ -3,6 +3,8 @@
 
 #include <utility>
 
+#include "core/TableWalk.h"
+
 BoardManager::BoardManager()
     : Object(false),
       m_boards(new BoardTable),
@@ -15,17 +17,11 @@ BoardManager::~BoardManager() {
 }
 
 ReferenceCounter<Board> BoardManager::GetFirstBoard() {
-    BoardTable* const boards = m_boards.get();
-    ObjectGuard const guard(*boards);
-    return (*boards)[boards->first_index()];
+    return KVL::first_entry(*m_boards.operator->());
 }
 
 ReferenceCounter<Board> BoardManager::GetNextBoard(int index) {
-    BoardTable* const boards = m_boards.get();
-    ObjectGuard const guard(*boards);
-    auto entry = boards->entries().find(index);
-    if (entry == boards->entries().end() || ++entry == boards->entries().end()) return {};
-    return entry->second;
+    return KVL::entry_after(*m_boards.operator->(), index);
 }
 
 ReferenceCounter<Board> BoardManager::GetNextBoard(ReferenceCounter<Board> board) {
@@ -33,16 +29,11 @@ ReferenceCounter<Board> BoardManager::GetNextBoard(ReferenceCounter<Board> board
 }
 
 ReferenceCounter<Board> BoardManager::GetBoardByIndex(int index) {
-    BoardTable* const boards = m_boards.get();
-    // The entry must not go before it is copied.
-    ObjectGuard const guard(*boards);
-    return (*boards)[index];
+    return KVL::entry_at(*m_boards.operator->(), index);
 }
 
 int BoardManager::GetNumberOfBoards() {
-    BoardTable* const boards = m_boards.get();
-    ObjectGuard const guard(*boards);
-    return static_cast<int>(boards->entries().size());
+    return KVL::number_of_entries(*m_boards.operator->());
 }
 
 int BoardManager::GetFirstBoardIndex() {
@@ -50,12 +41,7 @@ int BoardManager::GetFirstBoardIndex() {
 }
 
 int BoardManager::GetIndexByBoard(ReferenceCounter<Board> board) {
-    BoardTable* const boards = m_boards.get();
-    Board* const wanted = board.get();
-    ObjectGuard const guard(*boards);
-    for (auto const& [index, entry] : boards->entries())
-        if (entry.get() == wanted) return index;
-    return 0;
+    return KVL::index_of(*m_boards.operator->(), board);
 }
 
 int BoardManager::GetNextBoardIndex(int index) {

@@ -1,10 +1,11 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The chassis: boards with their devices, sub-devices and processors, found by handle, name or
-// serial number.
+// serial number; what its attribute store and its processes are like.
 #pragma once
 
 #include <cstdint>
 #include <functional>
+#include <optional>
 #include <set>
 #include <string>
 #include <string_view>
@@ -13,6 +14,8 @@
 #include <vector>
 
 #include "simulator/AttributeValue.h"
+#include "simulator/ProcessDraft.h"
+#include "simulator/StoreContents.h"
 
 namespace kvlsim {
 
@@ -86,6 +89,13 @@ class Chassis {
     /// Returns whether the object had the attribute. Requires: the object is there.
     bool unsetAttribute(std::int32_t handle, std::string_view name);
 
+    /// What the attribute store holds when it is made.
+    StoreDraft const& store() const { return m_store; }
+    void setStore(StoreDraft store) { m_store = std::move(store); }
+    /// The processes of the runtime library; none: the process itself.
+    std::optional<std::vector<ProcessDraft>> const& processes() const { return m_processes; }
+    void setProcesses(std::vector<ProcessDraft> processes) { m_processes = std::move(processes); }
+
   private:
     void refuseTaken(ObjectDraft const& draft) const;
     void refuseSerial(std::string_view serialNumber, std::int32_t forBoard, int line) const;
@@ -100,6 +110,8 @@ class Chassis {
     std::unordered_map<std::string, Named, TextHash, std::equal_to<>> m_byName;
     std::unordered_map<std::string, std::int32_t, TextHash, std::equal_to<>> m_bySerial;
     std::uint64_t m_nextOrder = 0;
+    StoreDraft m_store;
+    std::optional<std::vector<ProcessDraft>> m_processes;
 };
 
 } // namespace kvlsim

@@ -13,6 +13,8 @@
 #include <span>
 
 #include "simulator/AttributeSchema.h"
+#include "simulator/ProcessDraft.h"
+#include "simulator/StoreContents.h"
 
 namespace kvlsim {
 
@@ -21,7 +23,7 @@ namespace {
 using Form = Description::Form;
 using Keys = std::span<std::string_view const>;
 
-constexpr std::array<std::string_view, 1> kChassisKeys = {"boards"};
+constexpr std::array<std::string_view, 3> kChassisKeys = {"boards", "store", "processes"};
 constexpr std::array<std::string_view, 4> kBoardKeys = {"handle", "attributes", "devices",
                                                         "processors"};
 constexpr std::array<std::string_view, 4> kDeviceKeys = {"handle", "type", "attributes",
@@ -30,23 +32,6 @@ constexpr std::array<std::string_view, 3> kSubDeviceKeys = {"handle", "type", "a
 constexpr std::array<std::string_view, 2> kProcessorKeys = {"handle", "attributes"};
 
 constexpr std::size_t kMaxFileSize = std::size_t(256) << 20;
-
-void refuseUnknownKeys(Description const& map, std::string const& what, Keys known) {
-    for (auto const& entry : map.entries) {
-        if (std::ranges::find(known, entry.key) != known.end()) continue;
-        std::string list;
-        for (auto const& key : known)
-            appendToList(list, key);
-        throw ChassisError(entry.line, "unknown key " + inQuotes(entry.key) + " in " + what +
-                                           "; known: " + list);
-    }
-}
-
-void requireMap(Description const& node, std::string const& what, char const* begin) {
-    if (node.form != Form::map)
-        throw ChassisError(node.line, what + " cannot be " + node.words() + "; begin it with \"" +
-                                          begin + "\"");
-}
 
 std::int32_t readHandle(Description const& object, ObjectKind kind) {
     std::string const what = nameOf(kind);
@@ -157,6 +142,23 @@ ObjectDraft readBoardOnly(Description const& description, std::string const& dat
 
 } // namespace
 
+void refuseUnknownKeys(Description const& map, std::string const& what, Keys known) {
+    for (auto const& entry : map.entries) {
+        if (std::ranges::find(known, entry.key) != known.end()) continue;
+        std::string list;
+        for (auto const& key : known)
+            appendToList(list, key);
+        throw ChassisError(entry.line, "unknown key " + inQuotes(entry.key) + " in " + what +
+                                           "; known: " + list);
+    }
+}
+
+void requireMap(Description const& node, std::string const& what, char const* begin) {
+    if (node.form != Form::map)
+        throw ChassisError(node.line, what + " cannot be " + node.words() + "; begin it with \"" +
+                                          begin + "\"");
+}
+
 ObjectDraft readBoard(Description const& description) {
     ObjectDraft board = readBoardOnly(description, currentDate());
     std::unordered_map<std::int32_t, ObjectDraft const*> seen;
@@ -188,6 +190,12 @@ Chassis readChassis(std::string const& yamlText) {
     Chassis chassis;
     for (auto& board : boards)
         chassis.insertBoard(std::move(board));
+    if (Description const* const store = file.find("store")) {
+        chassis.setStore(readStore(*store));
+        refuseHomelessBoards(chassis.store(), chassis);
+    }
+    if (Description const* const processes = file.find("processes"))
+        chassis.setProcesses(readProcesses(*processes));
     return chassis;
 }
 

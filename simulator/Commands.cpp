@@ -5,10 +5,10 @@
 #include <array>
 #include <string>
 
-#include "simulator/Arguments.h"
 #include "simulator/AttributeSchema.h"
 #include "simulator/ChassisJson.h"
 #include "simulator/ChassisReader.h"
+#include "simulator/CommandContext.h"
 #include "simulator/Control.h"
 #include "simulator/Description.h"
 
@@ -18,25 +18,7 @@ namespace {
 
 using Json = nlohmann::json;
 
-/// What a command works on.
-struct Context {
-    Platform& platform;
-    Arguments const& arguments;
-    std::optional<std::uint64_t>& waitFor;
-
-    std::uint64_t announce(EventId id, std::int32_t board, std::uint16_t fault = 0) const {
-        return platform.events().announce({static_cast<std::uint32_t>(id), board, fault});
-    }
-};
-
-/// Thrown where a command needs a chassis and there is none.
-struct NoChassis {};
-
-template <typename AnyChassis>
-AnyChassis& present(AnyChassis* chassis) {
-    if (chassis == nullptr) throw NoChassis();
-    return *chassis;
-}
+using Context = CommandContext;
 
 /// Sets BOARD_CONDITION and, when that changes it, STATE_CHANGE_DATE.
 void setCondition(Chassis& chassis, std::int32_t board, AttributeValue condition) {
@@ -255,7 +237,7 @@ struct Command {
     Json (*run)(Context const&);
 };
 
-constexpr std::array<Command, 14> kCommands = {{{"insert", insert},
+constexpr std::array<Command, 21> kCommands = {{{"insert", insert},
                                                 {"remove", remove},
                                                 {"replace", replace},
                                                 {"start", start},
@@ -266,6 +248,13 @@ constexpr std::array<Command, 14> kCommands = {{{"insert", insert},
                                                 {"unset", unset},
                                                 {"event", event},
                                                 {"show", show},
+                                                {"store-list", listStore},
+                                                {"store-add", addToStore},
+                                                {"store-set", setInStore},
+                                                {"store-remove", removeFromStore},
+                                                {"process-list", listProcesses},
+                                                {"process-add", addProcess},
+                                                {"process-end", endProcess},
                                                 {"drain", drain},
                                                 {"version", version},
                                                 {"ping", ping}}};
@@ -321,6 +310,10 @@ void loadChassis(std::string const& yamlText) {
     } catch (ChassisError const& error) {
         throw std::runtime_error(describeError("chassis", error));
     }
+}
+
+void setCounterClock(std::chrono::nanoseconds (*clock)()) {
+    Platform::instance().processes().setClock(clock);
 }
 
 } // namespace kvlsim

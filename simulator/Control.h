@@ -2,6 +2,7 @@
 // Control of the simulated platform from within its own process, for tests and benchmarks.
 #pragma once
 
+#include <chrono>
 #include <string>
 
 #include <nlohmann/json.hpp>
@@ -19,6 +20,10 @@ nlohmann::json execute(nlohmann::json const& command);
 /// loads no other. Throws std::runtime_error with one line, "chassis:12: ...", when the text is
 /// bad; the chassis is then what it was.
 void loadChassis(std::string const& yamlText);
+
+/// The clock by which the counters of the runtime library's processes move, from now on and
+/// beginning anew; null: the steady clock. It is called on whatever thread asks for counters.
+void setCounterClock(std::chrono::nanoseconds (*clock)());
 
 } // namespace kvlsim
 

@@ -22,6 +22,20 @@ std::string configured(char const* variable) {
 
 } // namespace
 
+Platform::Platform()
+    : m_store([this] {
+          return read([this](Chassis const* chassis) {
+              if (chassis == nullptr) throw StoreError("there is no chassis: " + m_failure);
+              return contentsFor(*chassis);
+          });
+      }),
+      m_processes([this] {
+          return read([](Chassis const* chassis) {
+              if (chassis != nullptr && chassis->processes()) return *chassis->processes();
+              return std::vector{ProcessDraft{ProcessKind::self, "", 0, defaultCounters()}};
+          });
+      }) {}
+
 Platform& Platform::instance() {
     // Never destroyed: other threads may call until the very end of the process.
     static auto* const platform = new Platform;
@@ -32,6 +46,7 @@ Platform& Platform::started() {
     static std::once_flag once;
     Platform& platform = instance();
     std::call_once(once, [&platform] {
+        platform.store().setDirectory(configured("VQRXCFGPATH"));
         platform.loadConfiguredChassis();
         if (std::string const path = configured("KVLSIM_SOCKET"); !path.empty())
             startControlServer(path, platform);
@@ -40,10 +55,13 @@ Platform& Platform::started() {
 }
 
 void Platform::replaceChassis(Chassis chassis) {
-    std::unique_lock const lock(m_lock);
-    std::swap(m_chassis, chassis);
-    m_loaded = true;
-    m_failure.clear();
+    {
+        std::unique_lock const lock(m_lock);
+        std::swap(m_chassis, chassis);
+        m_loaded = true;
+        m_failure.clear();
+    }
+    m_processes.restart();
 }
 
 std::string Platform::failure() {

@@ -8,8 +8,10 @@
 #include <string>
 #include <utility>
 
+#include "simulator/AttributeStore.h"
 #include "simulator/Chassis.h"
 #include "simulator/EventService.h"
+#include "simulator/ProcessTable.h"
 
 namespace kvlsim {
 
@@ -39,8 +41,9 @@ class FairSharedMutex {
     std::shared_mutex m_mutex;
 };
 
-/// One per process, never destroyed; callable from any thread. Lock order: the chassis, then the
-/// event service's own lock. No callback runs under the chassis lock.
+/// One per process, never destroyed; callable from any thread. Lock order: the store's or the
+/// processes' own lock, the chassis, the event service's own lock. No callback runs under the
+/// chassis lock.
 class Platform {
   public:
     /// The platform, started: the first call loads the chassis that KVLSIM_CHASSIS names (or the
@@ -51,7 +54,8 @@ class Platform {
     /// The platform as it is, to give it a chassis before it starts.
     static Platform& instance();
 
-    /// Replaces the chassis; nothing is announced.
+    /// Replaces the chassis; nothing is announced. Its processes take the place of those that are
+    /// there; an attribute store that has been made stays.
     void replaceChassis(Chassis chassis);
 
     /// Calls `look(chassis)` with the chassis held still; null when there is none.
@@ -73,9 +77,11 @@ class Platform {
     std::string failure();
 
     EventService& events() { return m_events; }
+    AttributeStore& store() { return m_store; }
+    ProcessTable& processes() { return m_processes; }
 
   private:
-    Platform() = default;
+    Platform();
     void loadConfiguredChassis();
 
     FairSharedMutex m_lock;
@@ -83,6 +89,8 @@ class Platform {
     bool m_loaded = false;
     std::string m_failure;
     EventService m_events;
+    AttributeStore m_store;
+    ProcessTable m_processes;
 };
 
 } // namespace kvlsim

@@ -2,22 +2,19 @@
 // Prints what "show" replies for human eyes.
 #include "simulator/tool/ShowTable.h"
 
-#include <algorithm>
-#include <array>
 #include <iomanip>
 #include <string>
 #include <vector>
 
 #include "simulator/AttributeSchema.h"
 #include "simulator/Description.h"
+#include "simulator/tool/TextTable.h"
 
 namespace kvlsim {
 
 namespace {
 
 using Json = nlohmann::json;
-constexpr std::size_t kColumns = 9;
-using Row = std::array<std::string, kColumns>;
 
 /// "-" when missing.
 std::string words(Json const& board, char const* attribute) {
@@ -72,23 +69,15 @@ void printObjects(Json const& parent, char const* list, char const* kind, std::s
 } // namespace
 
 void printBoards(Json const& reply, std::ostream& out) {
-    std::vector<Row> rows = {{"HANDLE", "NAME", "SERIAL", "FAMILY", "CONDITION", "PRESENT",
-                              "DEVICES", "PROCESSORS", "CHANGED"}};
+    std::vector<TextRow> rows = {{"HANDLE", "NAME", "SERIAL", "FAMILY", "CONDITION", "PRESENT",
+                                  "DEVICES", "PROCESSORS", "CHANGED"}};
     for (auto const& board : reply.at("boards"))
         rows.push_back({board.at("handle").dump(), words(board, "NAME"),
                         words(board, "SERIAL_NUMBER"), words(board, "FAMILY"), condition(board),
                         words(board, "BOARD_PRESENT") == "1" ? "yes" : "no",
                         count(board, "devices"), count(board, "processors"),
                         words(board, "STATE_CHANGE_DATE")});
-    std::array<std::size_t, kColumns> widths{};
-    for (auto const& row : rows)
-        for (std::size_t i = 0; i < kColumns; ++i)
-            widths[i] = std::max(widths[i], row[i].size());
-    for (auto const& row : rows) {
-        for (std::size_t i = 0; i + 1 < kColumns; ++i)
-            out << std::left << std::setw(static_cast<int>(widths[i])) << row[i] << "  ";
-        out << row.back() << '\n';
-    }
+    printColumns(rows, out);
 }
 
 void printDetails(Json const& reply, std::ostream& out) {

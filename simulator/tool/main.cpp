@@ -12,7 +12,9 @@
 #include "simulator/tool/BoardDescriptions.h"
 #include "simulator/tool/ControlClient.h"
 #include "simulator/tool/OutputFile.h"
+#include "simulator/tool/ProcessTool.h"
 #include "simulator/tool/ShowTable.h"
+#include "simulator/tool/StoreTool.h"
 
 namespace {
 
@@ -295,6 +297,10 @@ int main(int argc, char** argv) {
     addBoardCommands(app, options, chosen);
     addAttributeCommands(app, options, chosen);
     addOtherCommands(app, options, chosen);
+    kvlsim::Connect const toPlatform = [&options] { return connect(options); };
+    std::function<void()> chosenNested;
+    kvlsim::addStoreCommands(app, toPlatform, chosenNested);
+    kvlsim::addProcessCommands(app, toPlatform, chosenNested);
     try {
         app.parse(argc, argv);
     } catch (CLI::Success const& success) {
@@ -303,6 +309,7 @@ int main(int argc, char** argv) {
         std::cerr << "kvlsim: " << error.what() << "; kvlsim --help explains\n";
         return kUsage;
     }
+    if (chosenNested) chosen = [&chosenNested](Options const&) { chosenNested(); };
     if (!chosen) {
         std::cerr << "kvlsim: no command; kvlsim --help lists them\n";
         return kUsage;

@@ -2,6 +2,7 @@
 #include "agent/Collector.h"
 
 #include <future>
+#include <set>
 
 #include <gtest/gtest.h>
 
@@ -19,8 +20,8 @@ constexpr CollectorPace kByEveryRequest{-1ms, 0ms, 1h};
 class CollectorTest : public ::testing::Test {
   protected:
     void start(CollectorPace pace) {
-        m_collector.emplace([this] { return read(); }, Clock::now() - 1min, [this] { renewed(); },
-                            pace);
+        m_collector.emplace([this](Snapshot& snapshot) { read(snapshot); }, Clock::now() - 1min,
+                            [this] { renewed(); }, pace);
     }
     void name(std::string name) {
         std::scoped_lock const guard(m_mutex);
@@ -38,19 +39,20 @@ class CollectorTest : public ::testing::Test {
     std::string m_name = "first";
     int m_reads = 0;
     int m_renewals = 0;
+    std::set<std::thread::id> m_readingThreads;
     std::function<void()> m_whileReading = [] {};
     std::optional<Collector> m_collector; ///< last: its thread uses all of the above
 
   private:
-    std::vector<BoardRow> read() {
-        std::vector<BoardRow> rows(1);
+    void read(Snapshot& snapshot) {
+        snapshot.boards.resize(1);
         {
             std::scoped_lock const guard(m_mutex);
             ++m_reads;
-            rows[0].name = m_name;
+            m_readingThreads.insert(std::this_thread::get_id());
+            snapshot.boards[0].name = m_name;
         }
         m_whileReading();
-        return rows;
     }
     void renewed() {
         std::scoped_lock const guard(m_mutex);
@@ -62,6 +64,21 @@ class CollectorTest : public ::testing::Test {
 TEST_F(CollectorTest, FirstSnapshotIsThereAtOnce) {
     start(kByEventOnly);
     EXPECT_EQ(shownName(), "first");
+}
+
+TEST_F(CollectorTest, RowsAreAlwaysReadOnTheCollectorsOwnThread) {
+    start(kByEventOnly);
+    m_collector->renew();
+    awaitRenewal();
+    m_collector.reset();
+    EXPECT_EQ(m_reads, 2);
+    EXPECT_EQ(m_readingThreads.size(), 1U);
+    EXPECT_FALSE(m_readingThreads.contains(std::this_thread::get_id()));
+}
+
+TEST_F(CollectorTest, WhatTheFirstReadingThrowsReachesTheCaller) {
+    m_whileReading = [] { throw std::runtime_error("no rows"); };
+    EXPECT_THROW(start(kByEventOnly), std::runtime_error);
 }
 
 TEST_F(CollectorTest, EventBringsANewSnapshot) {

@@ -136,6 +136,46 @@ TEST_F(ObjectTreeTest, ColumnsWithoutRowsArePassedOver) {
     EXPECT_EQ(next({1, 1, 2, 3, 0}), Oid{});
 }
 
+/// The tree over sub-devices 1.7.3, 1.7.9 and 2.1.3.
+class NestedTableTest : public ObjectTreeTest {
+  protected:
+    NestedTableTest() {
+        auto records = std::make_shared<PlatformRecords>();
+        for (auto const& [board, device, auid] :
+             {std::array{1U, 7U, 3U}, std::array{1U, 7U, 9U}, std::array{2U, 1U, 3U}}) {
+            SubDeviceRow row;
+            row.boardIndex = board;
+            row.deviceAuid = device;
+            row.auid = auid;
+            row.name = "sub-device " + std::to_string(auid);
+            records->subDevices.push_back(row);
+        }
+        m_snapshot.records = records;
+    }
+};
+
+Oid const kSubDeviceName{1, 1, 5, 2, 1, 2};
+
+TEST_F(NestedTableTest, CellIsFoundByItsWholeIndex) {
+    ASSERT_EQ(find(with(kSubDeviceName, {1, 7, 9})), Lookup::Found);
+    EXPECT_EQ(text(), "sub-device 9");
+}
+
+TEST_F(NestedTableTest, PartOfAnIndexIsNoInstance) {
+    EXPECT_EQ(find(with(kSubDeviceName, {1, 7})), Lookup::NoSuchInstance);
+    EXPECT_EQ(find(with(kSubDeviceName, {1, 7, 9, 0})), Lookup::NoSuchInstance);
+}
+
+TEST_F(NestedTableTest, NextOfPartOfAnIndexIsTheFirstRowThatBeginsWithIt) {
+    EXPECT_EQ(next(with(kSubDeviceName, {1})), with(kSubDeviceName, {1, 7, 3}));
+    EXPECT_EQ(next(with(kSubDeviceName, {2, 1})), with(kSubDeviceName, {2, 1, 3}));
+}
+
+TEST_F(NestedTableTest, NextGoesFromBoardToBoard) {
+    EXPECT_EQ(next(with(kSubDeviceName, {1, 7, 3})), with(kSubDeviceName, {1, 7, 9}));
+    EXPECT_EQ(next(with(kSubDeviceName, {1, 7, 9})), with(kSubDeviceName, {2, 1, 3}));
+}
+
 TEST_F(ObjectTreeTest, WalkIsStrictlyIncreasingAndFindsEveryStep) {
     Oid name;
     int steps = 0;

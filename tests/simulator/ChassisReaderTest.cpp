@@ -68,7 +68,8 @@ INSTANTIATE_TEST_SUITE_P(
                 ":2: a board cannot be the text \"first\"; begin it with \"handle:\""},
         BadFile{"misspelt-key.yaml", ":3: unknown key \"atributes\" in board 1; known: handle, "
                                      "attributes, devices, processors"},
-        BadFile{"unknown-top-key.yaml", ":2: unknown key \"borads\" in the chassis; known: boards"},
+        BadFile{"unknown-top-key.yaml", ":2: unknown key \"borads\" in the chassis; known: boards, "
+                                        "store, processes"},
         BadFile{"key-twice.yaml",
                 ":6: \"IRQ\" is written twice (first in line 5); keep one of them"},
         BadFile{"list-as-key.yaml", ":2: a key must be a plain word; this one is a list or a map"},

@@ -292,7 +292,8 @@ INSTANTIATE_TEST_SUITE_P(
                    "\"command\" is missing or no text; write one such as \"show\""},
         BadCommand{"UnknownCommand", R"({"command": "explode"})",
                    "unknown command \"explode\"; known: insert, remove, replace, start, stop, "
-                   "fail, fault, set, unset, event, show, drain, version, ping"},
+                   "fail, fault, set, unset, event, show, store-list, store-add, store-set, "
+                   "store-remove, process-list, process-add, process-end, drain, version, ping"},
         BadCommand{"UnknownArgument", R"({"command": "stop", "bord": 5})",
                    "unknown argument \"bord\"; known: board"},
         BadCommand{"ArgumentWhereNoneIsTaken", R"({"command": "drain", "board": 5})",

@@ -19,6 +19,7 @@
 #include <vector>
 
 #include "boardplatform/dm_client.h"
+#include "boardplatform/qsb.h"
 #include "boardplatform/vqx_event_service.h"
 #include "simulator/Control.h"
 
@@ -62,6 +63,36 @@ void printAttribute(long handle, std::string const& name) {
     std::fflush(stdout);
 }
 
+/// All boards of the attribute store, "serials A B ...", or why there are none.
+void printStore() {
+    std::array<char, kQSBTypeNameSize> rootType{};
+    int root = 0;
+    int result = QSBOpenStorage(rootType.data(), &root);
+    if (result != QSB_SUCCESS) {
+        std::printf("result %d\n", result);
+        std::fflush(stdout);
+        return;
+    }
+    std::vector<int> families;
+    int family = 0;
+    for (result = QSBGetFirstInstance("Family", rootType.data(), root, &family);
+         result == QSB_SUCCESS; result = QSBGetNextInstance(&family))
+        families.push_back(family);
+    std::printf("serials");
+    for (int const each : families) {
+        int board = 0;
+        for (result = QSBGetFirstInstance("Board", "Family", each, &board); result == QSB_SUCCESS;
+             result = QSBGetNextInstance(&board)) {
+            std::array<char, 80> serial{};
+            QSBGetDataValue("Board", board, 404, 80, serial.data());
+            std::printf(" %s", serial.data());
+        }
+    }
+    QSBCloseStorage();
+    std::printf("\n");
+    std::fflush(stdout);
+}
+
 } // namespace
 
 int main() {
@@ -88,6 +119,19 @@ int main() {
             std::string name;
             words >> handle >> name;
             printAttribute(handle, name);
+        } else if (command == "run") {
+            std::string json;
+            std::getline(words, json);
+            std::puts(kvlsim::execute(nlohmann::json::parse(json)).dump().c_str());
+            std::fflush(stdout);
+        } else if (command == "child") {
+            std::string name;
+            words >> name;
+            auto const reply = kvlsim::execute({{"command", "process-add"}, {"name", name}});
+            std::printf("child %d\n", reply.value("pid", 0));
+            std::fflush(stdout);
+        } else if (command == "store") {
+            printStore();
         } else if (command == "flood") {
             int count = 0;
             words >> count;

@@ -57,6 +57,7 @@ AgentFixture::AgentFixture() {
     m_snmpConfig = path("snmp.conf");
     // The tools say so when they make it themselves.
     std::filesystem::create_directories(path("client/cert_indexes"));
+    std::filesystem::create_directories(path("store"));
     configureSnmp("rocommunity public 127.0.0.1\n");
 }
 
@@ -74,6 +75,7 @@ Process::Environment AgentFixture::environment() const {
         {"SNMPCONFPATH", m_folder + "/none"},
         {"SNMP_PERSISTENT_DIR", m_folder + "/client"},
         {"KVLSIM_SOCKET", path("sim.sock")},
+        {"VQRXCFGPATH", m_folder + "/store"},
         // The SNMP library's own leak is named in the file.
         {"LSAN_OPTIONS", "print_suppressions=0:suppressions=" LSAN_SUPPRESSIONS},
     };

@@ -78,6 +78,7 @@ class AgentFixture : public ::testing::Test {
     Result run(std::vector<std::string> const& command) const;
 
     static constexpr char kObjects[] = "1.3.6.1.4.1.32473.1";
+    static constexpr char kBoards[] = "1.3.6.1.4.1.32473.1.1.2";
     static constexpr char kTable[] = "1.3.6.1.4.1.32473.1.1.2.4";
 
     /// What children see of the environment.

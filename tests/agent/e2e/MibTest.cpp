@@ -55,6 +55,7 @@ class MibTest : public AgentFixture {
         case ValueType::TimeTicks:
             return ::testing::Eq("TimeTicks");
         case ValueType::Text:
+        case ValueType::Octets:
         case ValueType::Date:
             break;
         }

@@ -1,0 +1,47 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// One board's record in the platform's attribute store.
+#pragma once
+
+#include <memory>
+#include <string>
+
+#include "access/QSBAccessor.h"
+
+/// A board's record, found by serial number; every getter reads its field anew. A text that cannot
+/// be read is "Error", a number -1. While the board is not in the store, every getter looks for it
+/// again.
+///
+/// Not synchronised: see `QSBAccessor`.
+class KVLOAM_API QSBBoard {
+  public:
+    explicit QSBBoard(std::string const& serialNumber);
+    ~QSBBoard();
+    QSBBoard(QSBBoard const&) = delete;
+    QSBBoard& operator=(QSBBoard const&) = delete;
+
+    /// Maps the boards anew and looks for this one.
+    void UpdateInstanceID();
+
+    std::string SerialNumber();
+    std::string Model();
+    std::string Version();
+    std::string FirmwareVersion();
+    std::string FirmwareName();
+    std::string FunctionalDescription();
+    std::string DeviceChangeDate();
+    int Type();
+    int SharedMemoryBaseAddress();
+    int IOBaseAddress();
+    int IRQ();
+    int BoardID();
+    int PCISlotNumber();
+
+  private:
+    bool read(int offset, int length, void* buffer);
+    std::string text(int offset);
+    int number(int offset);
+
+    std::string m_serialNumber;
+    int m_instanceID = -1;
+    std::unique_ptr<QSBAccessor> m_accessor;
+};

@@ -1,0 +1,47 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The steps of a walk over an indexed table of handles, each in one piece under the table's lock.
+#pragma once
+
+#include "core/IndexedTable.h"
+
+namespace KVL {
+
+/// The entry at the lowest index, or an empty handle.
+template <class Value>
+Value first_entry(IndexedTable<int, Value>& table) {
+    ObjectGuard const guard(table);
+    return table[table.first_index()];
+}
+
+/// A copy of the entry at `index`, or an empty handle. The lock keeps the entry until it is copied.
+template <class Value>
+Value entry_at(IndexedTable<int, Value>& table, int index) {
+    ObjectGuard const guard(table);
+    return table[index];
+}
+
+/// The entry at the next index above `index`; an empty handle when `index` is the highest or is not
+/// in the table.
+template <class Value>
+Value entry_after(IndexedTable<int, Value>& table, int index) {
+    ObjectGuard const guard(table);
+    return table[table.next_index(index)];
+}
+
+template <class Value>
+int number_of_entries(IndexedTable<int, Value>& table) {
+    ObjectGuard const guard(table);
+    return static_cast<int>(table.entries().size());
+}
+
+/// The index of the first entry of the same object as `value`; 0 when there is none.
+template <class Value>
+int index_of(IndexedTable<int, Value>& table, Value const& value) {
+    auto* const wanted = value.get();
+    ObjectGuard const guard(table);
+    for (auto const& [index, entry] : table.entries())
+        if (entry.get() == wanted) return index;
+    return 0;
+}
+
+} // namespace KVL

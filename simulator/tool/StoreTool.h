@@ -1,0 +1,18 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// kvlsim store: lists and changes the records of the attribute store.
+#pragma once
+
+#include <functional>
+
+#include <CLI/CLI.hpp>
+
+#include "simulator/tool/ControlClient.h"
+
+namespace kvlsim {
+
+using Connect = std::function<ControlClient()>;
+
+/// Adds the commands; the one that is chosen puts what to do into `chosen`.
+void addStoreCommands(CLI::App& app, Connect connect, std::function<void()>& chosen);
+
+} // namespace kvlsim

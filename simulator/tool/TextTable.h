@@ -1,0 +1,16 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Prints rows in columns as wide as they must be.
+#pragma once
+
+#include <ostream>
+#include <string>
+#include <vector>
+
+namespace kvlsim {
+
+using TextRow = std::vector<std::string>;
+
+/// Requires: rows of one length, and at least one.
+void printColumns(std::vector<TextRow> const& rows, std::ostream& out);
+
+} // namespace kvlsim
