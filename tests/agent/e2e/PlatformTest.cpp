@@ -75,16 +75,16 @@ TEST_F(PlatformTest, DevicesOfTheExampleChassisAreShown) {
     for (std::size_t column = 0; column < deviceTable().columnCount(); ++column)
         EXPECT_THAT(result.output, HasSubstr(deviceTable().column(column).name));
     auto const devices = rows("kvlDeviceTable");
-    ASSERT_THAT(devices, SizeIs(8)) << result.output;
+    ASSERT_THAT(devices, SizeIs(14)) << result.output;
     EXPECT_THAT(devices[0], AllOf(HasSubstr("1.101"), HasSubstr("nx5-trunk-1"), HasSubstr("501"),
-                                  HasSubstr("24"), HasSubstr("1.1.1.0"), HasSubstr("1,3")));
-    EXPECT_THAT(devices[7], AllOf(HasSubstr("3.302"), HasSubstr("vorn-stations")));
+                                  HasSubstr("24"), HasSubstr("1.1.1.0"), HasSubstr("1,3,-1")));
+    EXPECT_THAT(devices[13], AllOf(HasSubstr("3.304"), HasSubstr("vorn-lines")));
 }
 
 TEST_F(PlatformTest, SubDevicesOfTheExampleChassisAreShown) {
     startAgent();
     auto const subDevices = rows("kvlSubDeviceTable");
-    ASSERT_THAT(subDevices, SizeIs(10));
+    ASSERT_THAT(subDevices, SizeIs(15));
     EXPECT_THAT(subDevices[0], AllOf(HasSubstr("1.101.111"), HasSubstr("nx5-trunk-1-slots"),
                                      HasSubstr("1.1.16.1"), HasSubstr("1.1.32.1")));
     EXPECT_EQ(get("kvlSubDeviceClusterAddress.2.202.213"), "STRING: 2.1.48.2");
@@ -111,6 +111,19 @@ TEST_F(PlatformTest, StoreRecordsOfTheExampleChassisAreShown) {
     EXPECT_EQ(get("kvlStoreSharedMemoryAddress.2"), "STRING: 0xd4000000");
     EXPECT_EQ(get("kvlStoreIrq.2"), "INTEGER: 10");
     EXPECT_EQ(get("kvlStorePciSlotNumber.2"), "INTEGER: 6");
+}
+
+TEST_F(PlatformTest, ProcessesOfTheExampleChassisAreShown) {
+    startAgent();
+    EXPECT_THAT(rows("kvlProcessTable"), SizeIs(3));
+    // A child's name shows when the host knows its program.
+    for (char const* const name : {"STRING: kvloamd", "STRING: call-server", "STRING: announcer"})
+        EXPECT_TRUE(eventually([&] {
+            return std::ranges::count(values("kvlProcessName"), name) == 1;
+        })) << name;
+    EXPECT_THAT(values("kvlProcessEventQueueSize"),
+                ::testing::UnorderedElementsAre("Gauge32: 128 events", "Gauge32: 256 events",
+                                                "Gauge32: 64 events"));
 }
 
 TEST_F(PlatformTest, LoadedModulesAreShown) {
@@ -150,14 +163,14 @@ TEST_F(PlatformTest, EveryTableIsWalkedInOrderWhateverTheRequest) {
 
 TEST_F(PlatformTest, BoardThatIsRemovedTakesItsRecordsWithIt) {
     startAgent();
-    ASSERT_THAT(rows("kvlDeviceTable"), SizeIs(8));
+    ASSERT_THAT(rows("kvlDeviceTable"), SizeIs(14));
     sim({"remove", "2"});
     EXPECT_TRUE(eventually([this] { return get("kvlBoardCount.0") == "Gauge32: 2 boards"; }));
     auto const records = walk();
     for (Answer const& answer : records)
         EXPECT_THAT(answer.value, Not(HasSubstr("quillon")));
-    EXPECT_THAT(rows("kvlDeviceTable"), SizeIs(5));
-    EXPECT_THAT(rows("kvlSubDeviceTable"), SizeIs(6));
+    EXPECT_THAT(rows("kvlDeviceTable"), SizeIs(9));
+    EXPECT_THAT(rows("kvlSubDeviceTable"), SizeIs(10));
     EXPECT_THAT(rows("kvlProcessorTable"), SizeIs(3));
     EXPECT_THAT(values("kvlStoreSerialNumber"), SizeIs(2));
 }
@@ -166,7 +179,7 @@ TEST_F(PlatformTest, BoardThatComesBringsItsDevices) {
     startAgent();
     sim({"insert", "--handle", "50", "--serial", "NEW", "--devices", "2"});
     EXPECT_TRUE(eventually([this] { return get("kvlBoardCount.0") == "Gauge32: 4 boards"; }));
-    EXPECT_THAT(rows("kvlDeviceTable"), SizeIs(10));
+    EXPECT_THAT(rows("kvlDeviceTable"), SizeIs(16));
 }
 
 TEST_F(PlatformTest, AttributeThatChangesIsSeen) {
@@ -210,6 +223,7 @@ TEST_F(PlatformTest, StoreRecordThatIsAddedShowsUp) {
 }
 
 TEST_F(PlatformTest, ProcessThatIsAddedShowsUpAndGoesWhenItEnds) {
+    useChassis("boards: []\n"); // and no process but the agent's own
     startAgent();
     EXPECT_THAT(values("kvlProcessName"), ElementsAre("STRING: kvloamd"));
     sim({"process", "add", "--name", "ivr-worker", "--counter", "NumberOfOpens=7"});
@@ -226,7 +240,7 @@ TEST_F(PlatformTest, TruncatedStoreLeavesTheAgentRunningWithAnEmptyTable) {
     startAgent();
     EXPECT_THAT(agent().output(), HasSubstr("the attribute store can not be read"));
     EXPECT_THAT(values("kvlStoreSerialNumber"), IsEmpty());
-    EXPECT_THAT(rows("kvlDeviceTable"), SizeIs(8));
+    EXPECT_THAT(rows("kvlDeviceTable"), SizeIs(14));
     EXPECT_EQ(std::filesystem::file_size(storeFile()), 15U);
 }
 
@@ -237,7 +251,7 @@ TEST_F(PlatformTest, LockedStoreEmptiesItsTableUntilItIsLetGo) {
         FileLock const lock(storeFile());
         ASSERT_TRUE(lock.held());
         EXPECT_TRUE(eventually([this] { return values("kvlStoreSerialNumber").empty(); }));
-        EXPECT_THAT(rows("kvlDeviceTable"), SizeIs(8));
+        EXPECT_THAT(rows("kvlDeviceTable"), SizeIs(14));
     }
     EXPECT_TRUE(eventually([this] { return values("kvlStoreSerialNumber").size() == 3; }));
 }
