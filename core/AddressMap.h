@@ -16,7 +16,7 @@ namespace KVL {
 template <class Value>
 class AddressMap {
   public:
-    AddressMap() { resize(64); }
+    AddressMap() { resize(kSmallest); }
 
     std::size_t size() const { return m_size; }
 
@@ -62,7 +62,7 @@ class AddressMap {
 
     void clear() {
         m_size = 0;
-        resize(64);
+        resize(kSmallest);
     }
 
     /// All entries, in no order.
@@ -75,6 +75,9 @@ class AddressMap {
     }
 
   private:
+    /// Large enough that the few entries that two threads come and go with seldom share a line.
+    static constexpr std::size_t kSmallest = 1024;
+
     struct Slot {
         void const* key = nullptr;
         Value value = nullptr;
@@ -103,8 +106,8 @@ class AddressMap {
         }
     }
 
+    std::size_t m_size = 0; ///< first: an owner may put its lock on the same cache line, before it
     std::vector<Slot> m_slots;
-    std::size_t m_size = 0;
     std::size_t m_mask = 0;
     int m_shift = 64;
 };

@@ -18,8 +18,9 @@ using ListPool = KVL::RecyclingPool<RootedIIDList>;
 } // namespace
 
 Object::Object(bool lockable)
-    : m_lock(lockable ? new KVLLockable_pthread(RecursiveLock) : nullptr),
-      m_interfaces(ListPool::take()) {}
+    : Object(lockable ? new KVLLockable_pthread(RecursiveLock) : nullptr) {}
+
+Object::Object(KVLLockable_pthread* lock) : m_lock(lock), m_interfaces(ListPool::take()) {}
 
 Object::~Object() {
     m_interfaces->shrink(1);

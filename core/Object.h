@@ -31,6 +31,9 @@ class KVLOAM_API Object {
     KVL::IIDList* interfaces() const { return m_interfaces; }
 
   protected:
+    /// An object with a lock of its own making, which the object owns and deletes.
+    explicit Object(KVLLockable_pthread* lock);
+
     /// The lock itself; null when the object was made without one.
     KVLLockable* lockable() const { return m_lock; }
 

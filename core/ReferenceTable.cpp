@@ -24,31 +24,33 @@ ReferenceInfo::~ReferenceInfo() {
     m_lock = nullptr;
 }
 
-ReferenceTable::ReferenceTable() : Object(true) {}
+ReferenceTable::ReferenceTable() : ReferenceTable(new Records) {}
+
+ReferenceTable::ReferenceTable(Records* records) : Object(records), m_records(records) {}
 
 ReferenceTable::~ReferenceTable() {
     lock();
     unlock();
-    m_records.clear();
+    m_records->map.clear();
 }
 
 ReferenceInfo* ReferenceTable::get_refinfo(Object* object) {
     if (object == nullptr) return nullptr;
-    ObjectGuard const guard(*this);
-    return m_records.find(object);
+    KVL::BriefGuard const guard(m_records->get_impl_mutex());
+    return m_records->map.find(object);
 }
 
 ReferenceInfo* ReferenceTable::create_refinfo(Object* object) {
     if (object == nullptr) return nullptr;
-    ObjectGuard const guard(*this);
-    return m_records.find_or_insert(object, [] { return RecordPool::take(); });
+    KVL::BriefGuard const guard(m_records->get_impl_mutex());
+    return m_records->map.find_or_insert(object, [] { return RecordPool::take(); });
 }
 
 void ReferenceTable::destroy_refcount(Object* object) {
     ReferenceInfo* record = nullptr;
     if (object != nullptr) {
-        ObjectGuard const guard(*this);
-        record = m_records.erase(object);
+        KVL::BriefGuard const guard(m_records->get_impl_mutex());
+        record = m_records->map.erase(object);
     }
     if (record != nullptr) {
         record->reset();
@@ -57,8 +59,8 @@ void ReferenceTable::destroy_refcount(Object* object) {
 }
 
 void ReferenceTable::dump() {
-    ObjectGuard const guard(*this);
-    auto entries = m_records.entries();
+    KVL::BriefGuard const guard(m_records->get_impl_mutex());
+    auto entries = m_records->map.entries();
     std::sort(entries.begin(), entries.end(), [](auto const& a, auto const& b) {
         return std::less<void const*>()(a.first, b.first);
     });
@@ -77,6 +79,6 @@ void ReferenceTable::dump() {
 }
 
 int ReferenceTable::referenced_objects() {
-    ObjectGuard const guard(*this);
-    return static_cast<int>(m_records.size());
+    KVL::BriefGuard const guard(m_records->get_impl_mutex());
+    return static_cast<int>(m_records->map.size());
 }

@@ -67,7 +67,16 @@ class KVLOAM_API ReferenceTable : public Object {
     ReferenceTable();
 
   private:
+    /// The table's lock and behind it, on the same cache line, what changes with every entry: two
+    /// threads that take turns at the table hand each other one line.
+    struct alignas(64) Records final : KVLLockable_pthread {
+        Records() : KVLLockable_pthread(RecursiveLock) {}
+        KVL::AddressMap<ReferenceInfo*> map;
+    };
+
+    explicit ReferenceTable(Records* records);
+
     static ReferenceTable* m_referenceTable;
 
-    KVL::AddressMap<ReferenceInfo*> m_records;
+    Records* m_records; ///< owned as the object's lock
 };

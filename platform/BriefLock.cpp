@@ -20,7 +20,7 @@ void pauseBriefly() {
 } // namespace
 
 void lock_contended(pthread_mutex_t* mutex) {
-    for (int pauses = 128; pauses <= 1024; pauses *= 2) {
+    for (int pauses = 256; pauses <= 2048; pauses *= 2) {
         for (int i = 0; i < pauses; ++i)
             pauseBriefly();
         if (pthread_mutex_trylock(mutex) == 0) return;

@@ -19,4 +19,16 @@ inline void lock_briefly(pthread_mutex_t* mutex) {
         lock_contended(mutex);
 }
 
+/// Holds a mutex for a scope, taken by `lock_briefly`.
+class BriefGuard {
+  public:
+    explicit BriefGuard(pthread_mutex_t* mutex) : m_mutex(mutex) { lock_briefly(mutex); }
+    ~BriefGuard() { pthread_mutex_unlock(m_mutex); }
+    BriefGuard(BriefGuard const&) = delete;
+    BriefGuard& operator=(BriefGuard const&) = delete;
+
+  private:
+    pthread_mutex_t* m_mutex;
+};
+
 } // namespace KVL
