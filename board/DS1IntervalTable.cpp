@@ -1,0 +1,90 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "board/DS1IntervalTable.h"
+
+#include <typeinfo>
+
+#include "platform/ActionScheduler_pthread.h"
+
+DS1IntervalTable::DS1IntervalTable() {
+    ActionScheduler_pthread::GetScheduler()->AddPeriodic(this, 1);
+}
+
+DS1IntervalTable::~DS1IntervalTable() {
+    ActionScheduler_pthread::GetScheduler()->Remove(this);
+}
+
+int DS1IntervalTable::GetTimeElapsed() {
+    return m_timeElapsed;
+}
+
+int DS1IntervalTable::GetValidIntervals() {
+    return m_wrapped.load(std::memory_order_relaxed) ? kIntervals : m_next - m_oldest;
+}
+
+int DS1IntervalTable::GetErrorSeconds(int n) {
+    return read(&DS1Interval::ErrorSeconds, n);
+}
+
+int DS1IntervalTable::GetSeverelyErrorSeconds(int n) {
+    return read(&DS1Interval::SeverelyErrorSeconds, n);
+}
+
+int DS1IntervalTable::GetSeverelyErrorFramingSeconds(int n) {
+    return read(&DS1Interval::SeverelyErrorFramingSeconds, n);
+}
+
+int DS1IntervalTable::GetUnavailableSeconds(int n) {
+    return read(&DS1Interval::UnavailableSeconds, n);
+}
+
+int DS1IntervalTable::GetPathCodingViolations(int n) {
+    return read(&DS1Interval::PathCodingViolations, n);
+}
+
+int DS1IntervalTable::GetLineErrorSeconds(int n) {
+    return read(&DS1Interval::LineErrorSeconds, n);
+}
+
+int DS1IntervalTable::GetBurstyErrorSeconds(int n) {
+    return read(&DS1Interval::BurstyErrorSeconds, n);
+}
+
+int DS1IntervalTable::GetLineCodeViolations(int n) {
+    return read(&DS1Interval::LineCodeViolations, n);
+}
+
+int DS1IntervalTable::ScheduledAction() {
+    if (typeid(*this) == typeid(DS1IntervalTable)) return 0;
+    if (m_timeElapsed < kIntervalLength)
+        CollectSecond();
+    else
+        CloseInterval();
+    return 0;
+}
+
+int DS1IntervalTable::GetTrueIndex(int n) {
+    return (m_next - n + kIntervals) % kIntervals;
+}
+
+int DS1IntervalTable::ArchiveInterval(DS1Interval interval) {
+    m_ring[static_cast<std::size_t>(m_next)] = interval;
+    m_next = (m_next + 1) % kIntervals;
+    m_timeElapsed = 0;
+    if (m_next == m_oldest) {
+        m_wrapped.store(true, std::memory_order_relaxed);
+        m_oldest = (m_next + 1) % kIntervals;
+        m_ring[static_cast<std::size_t>(m_next)] = DS1Interval();
+    }
+    return 0;
+}
+
+DS1Interval* DS1IntervalTable::interval(int n) {
+    if (n == 0) return &m_current;
+    int const index = GetTrueIndex(n);
+    return index < 0 || index >= kIntervals ? nullptr : &m_ring[static_cast<std::size_t>(index)];
+}
+
+int DS1IntervalTable::read(DS1Counter DS1Interval::*counter, int n) {
+    DS1Interval const* const record = interval(n);
+    return record == nullptr ? 0 : static_cast<int>(record->*counter);
+}

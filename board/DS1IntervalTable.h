@@ -1,0 +1,123 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The performance history of one DS1 line.
+#pragma once
+
+#include <array>
+#include <atomic>
+#include <cstdint>
+
+#include "core/Object.h"
+#include "platform/Schedulable.h"
+
+/// A counter that one thread changes while others read it. Behaves like the number it holds.
+class DS1Counter {
+  public:
+    DS1Counter(std::int32_t value = 0) : m_value(value) {}
+    DS1Counter(DS1Counter const& other) : m_value(other) {}
+    DS1Counter& operator=(DS1Counter const& other) {
+        if (this != &other) *this = static_cast<std::int32_t>(other);
+        return *this;
+    }
+    DS1Counter& operator=(std::int32_t value) {
+        m_value.store(value, std::memory_order_relaxed);
+        return *this;
+    }
+    operator std::int32_t() const { return m_value.load(std::memory_order_relaxed); }
+    /// Requires that no other thread changes the counter.
+    DS1Counter& operator+=(std::int32_t by) { return *this = *this + by; }
+
+  private:
+    std::atomic<std::int32_t> m_value;
+};
+
+/// One 15-minute interval, a row of DS1-MIB's dsx1IntervalTable (RFC 2495, RFC 4805): its columns
+/// in their order.
+struct DS1Interval {
+    DS1Counter ErrorSeconds;
+    DS1Counter SeverelyErrorSeconds;
+    DS1Counter SeverelyErrorFramingSeconds;
+    DS1Counter UnavailableSeconds;
+    DS1Counter ControlledSlipSeconds;
+    DS1Counter PathCodingViolations;
+    DS1Counter LineErrorSeconds;
+    DS1Counter BurstyErrorSeconds;
+    DS1Counter DegradedMinutes;
+    DS1Counter LineCodeViolations;
+};
+
+static_assert(sizeof(DS1Interval) == 40);
+
+/// The running interval of a line and a ring of the 96 that were closed before it, 24 hours. What a
+/// second counts is the concrete table's: the process's scheduler calls it once a second.
+///
+/// Threads: `ScheduledAction` comes on the scheduler's thread, readers on any. A reader sees the
+/// old or the new value of each counter; a row read while an interval is closed may mix both.
+///
+/// The table is on the scheduler's list before its derived part exists. A concrete table's
+/// constructor must therefore end with `ChangePeriod(this, 1)` of the scheduler, which changes
+/// nothing and waits for a tick under way, and its destructor must begin with `Remove(this)`. A
+/// table must be neither made nor destroyed in a scheduled action.
+class KVLOAM_API DS1IntervalTable : public Object, public Schedulable {
+  public:
+    static constexpr int kIntervals = 96;
+    /// The length of an interval in seconds.
+    static constexpr int kIntervalLength = 900;
+
+    /// Enters the table with the process's scheduler, with a period of one second.
+    DS1IntervalTable();
+    /// Takes the table off the scheduler's list.
+    ~DS1IntervalTable() override;
+
+    /// Seconds of the running interval, 0 to 899 (900 when it is about to be closed).
+    virtual int GetTimeElapsed();
+    /// The number of closed intervals, 0 to 96.
+    /// Deliberate: once the ring is full its oldest entry is cleared for the interval to come, so
+    /// 96 intervals are valid although the last of them reads 0.
+    virtual int GetValidIntervals();
+
+    /// These read interval `n`: 0 is the running one, 1 the one closed last, 96 the oldest. An
+    /// interval that was never closed reads 0. Callers keep `n` within 0 to 96.
+    virtual int GetErrorSeconds(int n);
+    virtual int GetSeverelyErrorSeconds(int n);
+    virtual int GetSeverelyErrorFramingSeconds(int n);
+    virtual int GetUnavailableSeconds(int n);
+    virtual int GetPathCodingViolations(int n);
+    virtual int GetLineErrorSeconds(int n);
+    virtual int GetBurstyErrorSeconds(int n);
+    virtual int GetLineCodeViolations(int n);
+    /// The concrete table answers these two from the same records.
+    virtual int GetControlledSlipSeconds(int n) = 0;
+    virtual int GetDegradedMinutes(int n) = 0;
+
+    /// One second: `CollectSecond`, or `CloseInterval` when the running interval is complete.
+    /// Nothing while the concrete table is not built yet or no longer there. Returns 0.
+    int ScheduledAction() override;
+    /// Counts a second into the running interval and adds 1 to the time elapsed.
+    virtual int CollectSecond() = 0;
+    /// Hands the running interval to `ArchiveInterval` and begins a new one. The second of this
+    /// call belongs to the new interval.
+    virtual int CloseInterval() = 0;
+
+  protected:
+    /// The place in the ring of the `n`-th interval back.
+    int GetTrueIndex(int n);
+    /// Closes an interval: stores it in the ring and sets the time elapsed to 0. Returns 0.
+    int ArchiveInterval(DS1Interval interval);
+    /// The record that the readers read for `n`; null where they have none and answer 0.
+    DS1Interval* interval(int n);
+
+    DS1Counter m_timeElapsed;
+
+  private:
+    std::atomic<bool> m_wrapped{false};
+    DS1Counter m_oldest;
+    DS1Counter m_next;
+
+  protected:
+    DS1Interval m_current;
+
+  private:
+    int read(DS1Counter DS1Interval::*counter, int n);
+
+    std::array<DS1Interval, kIntervals> m_ring;
+};

@@ -1,0 +1,72 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The abstract IP interface and its addresses.
+#pragma once
+
+#include <array>
+#include <cstdint>
+
+#include "board/Interface.h"
+#include "core/ReferenceCounter.h"
+
+namespace KVL {
+
+/// An IPv4 address: four octets, most significant first.
+class KVLOAM_API IPAddress {
+  public:
+    /// The octets of `address` from its most significant byte down.
+    explicit IPAddress(int address);
+    /// Dotted decimal; the text is only read. Deliberate: octets are taken as they are written, 300
+    /// stays 300, and what follows the fourth is ignored. An octet that is missing is 0.
+    explicit IPAddress(char* text);
+    IPAddress& operator=(int address);
+    IPAddress& operator=(char* text);
+
+    /// By octets, from the first.
+    bool operator<(IPAddress const& other) const { return m_octets < other.m_octets; }
+    bool operator==(IPAddress const& other) const = default;
+
+    /// `i` from 0, the most significant, to 3.
+    std::uint32_t octet(int i) const { return m_octets[static_cast<std::size_t>(i)]; }
+
+  private:
+    void parse(char const* text);
+
+    std::array<std::uint32_t, 4> m_octets{};
+};
+
+/// An address with its mask and broadcast address. Not changed after it was made.
+class KVLOAM_API IPAddressConfig : public Object {
+  public:
+    /// Three times 0.0.0.0.
+    IPAddressConfig();
+    IPAddressConfig(int address, int mask, int broadcast);
+    /// The address in dotted decimal; mask and broadcast address 0.0.0.0.
+    explicit IPAddressConfig(char* text);
+    ~IPAddressConfig() override;
+
+    IPAddress GetAddress() const { return m_address; }
+    IPAddress GetMask() const { return m_mask; }
+    IPAddress GetBroadcast() const { return m_broadcast; }
+
+  private:
+    IPAddress m_address;
+    IPAddress m_mask;
+    IPAddress m_broadcast;
+};
+
+/// An IP interface: the interface queries, and its address configurations.
+class KVLOAM_API IPInterface : public Interface {
+  public:
+    IPInterface();
+    ~IPInterface() override;
+
+    /// The first configuration; the next one after `previous`, or an empty handle. Concrete
+    /// interfaces replace both; here the only configuration is 127.1.1.1, made anew at every call.
+    virtual ReferenceCounter<IPAddressConfig> GetFirstIPAddressConfig();
+    virtual ReferenceCounter<IPAddressConfig>
+    GetNextIPAddressConfig(ReferenceCounter<IPAddressConfig> previous);
+
+    static IID iid() { return IID("N3KVL11IPInterfaceE"); }
+};
+
+} // namespace KVL
