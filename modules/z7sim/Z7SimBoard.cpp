@@ -3,6 +3,7 @@
 
 #include <cstring>
 #include <string>
+#include <utility>
 
 namespace {
 
@@ -193,5 +194,30 @@ int Z7SimBoard::StartStage3() {
 
 int Z7SimBoard::StopBoard() {
     m_inService = false;
+    return 0;
+}
+
+int Z7SimBoard::create_extended_features() {
+    offer(makeExtendedFeatures(GetBoardIdentifier()));
+    return 0;
+}
+
+int Z7SimBoard::create_ipethernet_feature() {
+    offer(makeNetworkFeatures(GetBoardIdentifier()));
+    return 0;
+}
+
+void Z7SimBoard::offer(FeatureList features) {
+    if (m_startFailure != nullptr) return;
+    for (auto& feature : features) {
+        AddFeature(feature);
+        m_offered.push_back(std::move(feature));
+    }
+}
+
+int Z7SimBoard::destroy_extended_features() {
+    for (auto const& feature : m_offered)
+        RemoveFeature(feature);
+    m_offered.clear();
     return 0;
 }

@@ -5,6 +5,7 @@
 #include <atomic>
 #include <mutex>
 
+#include "BoardFeatures.h"
 #include "z7/Z7Board.h"
 
 /// A board of the chassis. Most answers come from its device mapper record, which the base keeps;
@@ -48,8 +49,13 @@ class Z7SimBoard final : public Z7Board {
     int StartStage2() override;
     int StartStage3() override;
     int StopBoard() override;
+    int create_ipethernet_feature() override;
+    int create_extended_features() override;
+    /// Takes all features away, the network's too.
+    int destroy_extended_features() override;
 
   private:
+    void offer(FeatureList features);
     bool answers();
     void readLogicalID();
     int giveUp(char const* reason);
@@ -67,4 +73,5 @@ class Z7SimBoard final : public Z7Board {
     bool m_inService = false;             ///< pings watch over it
     bool m_silent = false;                ///< failed because it did not answer
     bool m_retired = false;
+    FeatureList m_offered; ///< what a stop takes away again
 };
