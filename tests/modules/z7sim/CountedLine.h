@@ -2,6 +2,7 @@
 // A line whose changes are added up, interval by interval.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 
 #include <array>
@@ -33,6 +34,11 @@ inline constexpr std::array kLineCountsFields{
 inline void PrintTo(LineCounts const& counts, std::ostream* out) {
     for (auto const& field : kLineCountsFields)
         if (counts.*field.count != 0) *out << field.name << ' ' << counts.*field.count << ' ';
+}
+
+inline void PrintTo(LineFormat format, std::ostream* out) {
+    constexpr std::array kNames{"Esf", "D4", "E1", "E1Crc"};
+    *out << kNames.at(static_cast<std::size_t>(format));
 }
 
 inline bool hasNegativeCount(LineCounts const& counts) {

@@ -84,13 +84,14 @@ TEST(DegradedMinutesTest, EveryMinuteStartsWithoutErrors) {
 }
 
 TEST(DegradedMinutesTest, SevereSecondsAndTheirErrorsBelongToNoMinute) {
-    CountedLine line = begun(92, 59);
+    CountedLine line = begun(92, 58);
     line.count({.pathCodeViolations = 320}, 5);
-    line.count(kClean);
+    line.count(kClean, 2);
     EXPECT_EQ(line.running().degradedMinutes, 0);
 
-    CountedLine degraded = begun(93, 59);
+    CountedLine degraded = begun(93, 58);
     degraded.count({.pathCodeViolations = 320}, 5);
+    degraded.count(kClean);
     EXPECT_EQ(degraded.running().degradedMinutes, 0);
     degraded.count(kClean);
     EXPECT_EQ(degraded.running().degradedMinutes, 1);

@@ -275,18 +275,6 @@ TEST_P(LinePerformanceHistoryTest, CountsAreRightAfterEverySecond) {
 INSTANTIATE_TEST_SUITE_P(Formats, LinePerformanceHistoryTest,
                          testing::Values(LineFormat::esf, LineFormat::d4, LineFormat::e1,
                                          LineFormat::e1Crc),
-                         [](auto const& format) {
-                             switch (format.param) {
-                             case LineFormat::esf:
-                                 return "Esf";
-                             case LineFormat::d4:
-                                 return "D4";
-                             case LineFormat::e1:
-                                 return "E1";
-                             case LineFormat::e1Crc:
-                                 return "E1Crc";
-                             }
-                             return "";
-                         });
+                         testing::PrintToStringParamName());
 
 } // namespace

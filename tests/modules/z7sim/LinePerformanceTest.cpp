@@ -1,5 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // What seconds make of a line's counters: each border once, worked out by hand.
+#include <cstdint>
+
 #include <initializer_list>
 #include <vector>
 
@@ -30,6 +32,22 @@ LineCounts secondsWithoutSignal(int n) {
 
 LineCounts unavailableSeconds(int n) {
     return {.unavailableSeconds = n};
+}
+
+TEST(LineCountsTest, AreAddedAndTakenAwayCountByCount) {
+    LineCounts ones;
+    LineCounts sum;
+    std::int32_t n = 0;
+    for (auto const& field : kLineCountsFields) {
+        ones.*field.count = 1;
+        sum.*field.count = 10 * ++n;
+    }
+    sum += ones;
+    sum += ones;
+    sum -= ones;
+    n = 0;
+    for (auto const& field : kLineCountsFields)
+        EXPECT_EQ(sum.*field.count, 10 * ++n + 1) << field.name;
 }
 
 TEST(LinePerformanceTest, CleanSecondCountsNothing) {
