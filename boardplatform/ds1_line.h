@@ -11,7 +11,8 @@ inline constexpr char const* kDS1LineCounters = "LINE_COUNTERS";
 /// N, in 4 bytes: the seconds of the line's past. Absent when the line has none.
 inline constexpr char const* kDS1LinePastSeconds = "LINE_PAST_SECONDS";
 /// N + 1 DS1LineCounters, oldest first: at every second from N seconds before the line was loaded
-/// up to its loading. Not read when the buffer is too small for all of them.
+/// up to its loading. What happens at the very moment of a record shows in the next one. Not read
+/// when the buffer is too small for all of them.
 inline constexpr char const* kDS1LinePast = "LINE_PAST";
 /// A `DS1LineType`, in 4 bytes.
 inline constexpr char const* kDS1LineType = "LINE_TYPE";
@@ -24,8 +25,8 @@ enum class DS1LineType : std::int32_t {
     e1Crc = 5,
 };
 
-/// The state of a line at one moment; words are in host byte order. All fields but the first and
-/// the last only ever grow, modulo 2^32, and so does `seconds`.
+/// The state of a line at one moment; words are in host byte order. All fields but the last only
+/// ever grow, modulo 2^32.
 ///
 /// The three ...Seconds count the whole seconds of the line's clock in which the defect was there
 /// at any time: a touch counts at once, and no second counts twice. A line without signal or frame,
@@ -52,9 +53,8 @@ static_assert(offsetof(DS1LineCounters, outOfFrameSeconds) == 24);
 static_assert(offsetof(DS1LineCounters, alarmIndicationSeconds) == 28);
 static_assert(offsetof(DS1LineCounters, alarms) == 32);
 
-// Of loss of signal, loss of frame and AIS only the root is named: a line that has lost its signal
-// does not report the loss of frame that comes with it. With any of the three the platform sends
-// the far end RAI.
+// A line that has lost its signal, or receives AIS, does not by that report the loss of frame: only
+// the root is named. With any of the three the platform sends RAI to the far end.
 inline constexpr std::uint32_t kDS1AlarmLossOfSignal = 1;
 inline constexpr std::uint32_t kDS1AlarmLossOfFrame = 2;
 inline constexpr std::uint32_t kDS1AlarmIndication = 4;         ///< AIS received
