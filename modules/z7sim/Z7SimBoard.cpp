@@ -5,6 +5,8 @@
 #include <string>
 #include <utility>
 
+#include "Withdrawable.h"
+
 namespace {
 
 constexpr char const* kNoAnswer = "board does not answer";
@@ -216,8 +218,11 @@ void Z7SimBoard::offer(FeatureList features) {
 }
 
 int Z7SimBoard::destroy_extended_features() {
-    for (auto const& feature : m_offered)
+    for (auto const& feature : m_offered) {
+        if (auto* const withdrawable = dynamic_cast<Withdrawable*>(feature.get()))
+            withdrawable->Withdraw();
         RemoveFeature(feature);
+    }
     m_offered.clear();
     return 0;
 }
