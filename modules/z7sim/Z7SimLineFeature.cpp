@@ -32,12 +32,13 @@ LineSetup readSetup(long device, int number) {
     setup.coding = numberAttributeOr(device, "LINE_CODING", setup.isT1() ? 2 : 3); // B8ZS, HDB3
     setup.length = numberAttributeOr(device, "LINE_LENGTH", 0);
     setup.buildOut = numberAttributeOr(device, "LINE_BUILD_OUT", 1);  // not applicable
-    setup.signalMode = numberAttributeOr(device, "SIGNAL_MODE", 1);   // none
     setup.clockSource = numberAttributeOr(device, "CLOCK_SOURCE", 1); // loop timing
     setup.fdl = numberAttributeOr(device, "FDL", esf ? 2 : 8);        // ANSI T1.403, none
     std::array<char, kMostChannels> states{};
     setup.channelized =
         bytesAttribute(device, kISDNChannelStates, states.data(), states.size()) > 0;
+    // Message oriented where a channel signals for the others, else none.
+    setup.signalMode = numberAttributeOr(device, "SIGNAL_MODE", setup.channelized ? 4 : 1);
     return setup;
 }
 
