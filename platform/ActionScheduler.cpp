@@ -5,7 +5,10 @@
 #include <limits>
 #include <utility>
 
-ActionScheduler::~ActionScheduler() = default;
+ActionScheduler::~ActionScheduler() {
+    for (auto const& entry : m_list)
+        delete entry.second;
+}
 
 int ActionScheduler::AddPeriodic(Schedulable* target, long period) {
     lock_list();
