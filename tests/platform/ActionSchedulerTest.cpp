@@ -241,6 +241,13 @@ TEST_F(ActionSchedulerTest, EntriesThatMeetAfterAPassStandInTheOrderOfTheirCalls
     EXPECT_EQ(called(), "c1004 b1004 a1004 ");
 }
 
+TEST_F(ActionSchedulerTest, EntriesOfDifferentPeriodsMeetAndPart) {
+    m_scheduler.AddPeriodic(&m_a, 3);
+    m_scheduler.AddPeriodic(&m_b, 1);
+    runUntil(1006);
+    EXPECT_EQ(called(), "b1001 b1002 a1003 b1003 b1004 b1005 a1006 b1006 ");
+}
+
 TEST_F(ActionSchedulerTest, EntryCalledAgainStandsBehindThoseThatWereNotDue) {
     m_scheduler.AddPeriodic(&m_a, 1);
     m_scheduler.AddPeriodic(&m_b, 2);
