@@ -7,8 +7,8 @@
 
 #include <benchmark/benchmark.h>
 
+#include "DrivenScheduler.h"
 #include "board/DS1IntervalTable.h"
-#include "platform/ActionScheduler_pthread.h"
 
 namespace {
 
@@ -31,19 +31,6 @@ std::vector<std::unique_ptr<Ticking>> makeTables(std::size_t count) {
         table = std::make_unique<Ticking>();
     return tables;
 }
-
-/// A scheduler without a thread.
-class DrivenScheduler final : public ActionScheduler_pthread {
-  public:
-    DrivenScheduler() : ActionScheduler_pthread([] { return 0L; }) {}
-
-    /// Enters a target that is not on the list, with a period of a second.
-    void enter(Schedulable* target) { put_item_on_list(target, 1, 0); }
-    void passOfNextSecond() { run_pass(m_now++); }
-
-  private:
-    long m_now = 0;
-};
 
 template <std::size_t count>
 void oneSecondOurs(benchmark::State& state) {
