@@ -116,8 +116,8 @@ ChassisObject const& Arguments::board(Chassis const& chassis) const {
     return found("board", chassis, true);
 }
 
-ChassisObject const& Arguments::object(Chassis const& chassis) const {
-    return found("object", chassis, false);
+ChassisObject const& Arguments::object(Chassis const& chassis, char const* name) const {
+    return found(name, chassis, false);
 }
 
 std::int32_t Arguments::boardHandle(Chassis const& chassis) const {

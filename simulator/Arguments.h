@@ -39,7 +39,7 @@ class Arguments {
     /// A board by handle, serial number or NAME (when only one bears it), in this order.
     ChassisObject const& board(Chassis const& chassis) const;
     /// Any object: by handle, serial number of a board, or NAME (when only one bears it).
-    ChassisObject const& object(Chassis const& chassis) const;
+    ChassisObject const& object(Chassis const& chassis, char const* name = "object") const;
     /// As `board`, but a handle need not be in the chassis.
     std::int32_t boardHandle(Chassis const& chassis) const;
 

@@ -185,6 +185,9 @@ AttributeMap readAttributes(Description const& attributes) {
         if (entry.key == "TYPE")
             throw ChassisError(entry.line, "TYPE follows from what the object is; remove it "
                                            "(a device's is written as type:)");
+        if (isLiveAttribute(entry.key))
+            throw ChassisError(entry.line, entry.key + " follows from the device's line: or "
+                                                       "channels:; remove it");
         map.emplace(entry.key, readAttribute(entry.key, entry.value));
     }
     return map;

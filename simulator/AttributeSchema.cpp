@@ -6,6 +6,9 @@
 #include <array>
 #include <unordered_map>
 
+#include "boardplatform/ds1_line.h"
+#include "boardplatform/isdn_channels.h"
+
 namespace kvlsim {
 
 namespace {
@@ -14,6 +17,9 @@ constexpr std::array<std::int32_t, 13> kDeviceTypes = {501, 503, 505, 507, 509, 
                                                        518, 520, 521, 511, 525, 527};
 constexpr std::array<std::int32_t, 11> kSubDeviceTypes = {502, 504, 506, 508, 510, 517,
                                                           519, 522, 512, 526, 528};
+
+constexpr std::array<std::string_view, 5> kLiveAttributes = {
+    kDS1LineCounters, kDS1LinePastSeconds, kDS1LinePast, kISDNChannelStates, kISDNSignallingState};
 
 std::unordered_map<std::string_view, AttributeKind> const& knownAttributes() {
     using enum AttributeKind;
@@ -40,6 +46,13 @@ std::unordered_map<std::string_view, AttributeKind> const& knownAttributes() {
         {"VORN_DRIVER_BOARD_ID", number},
         {"LOGICAL ID", number},
         {"Board Id (BLT ID)", number},
+        {"ETHERNET_DEVICE", text},
+        {"ETHERNET_ADDRESS", text},
+        {"ETHERNET_SPEED", number},
+        {"ETHERNET_MTU", number},
+        {"ETHERNET_IN_OCTETS", number},
+        {"ETHERNET_OUT_OCTETS", number},
+        {"ETHERNET_FCS_ERRORS", number},
         // Devices and sub-devices.
         {"ChannelCount", number},
         {"FrontEndType", number},
@@ -49,6 +62,16 @@ std::unordered_map<std::string_view, AttributeKind> const& knownAttributes() {
         {"CLUSTERADDR", descriptor},
         {"CTBUSADDR", descriptor},
         {"IPVSCADDR", descriptor},
+        // Lines.
+        {kDS1LineType, number},
+        {"LINE_CODING", number},
+        {"LINE_LENGTH", number},
+        {"LINE_BUILD_OUT", number},
+        {"LINE_NUMBER", number},
+        {"SIGNAL_MODE", number},
+        {"CLOCK_SOURCE", number},
+        {"FDL", number},
+        {"CIRCUIT", text},
         // Processors.
         {"PROC_NUM", number},
         {"BK_VERSION", text},
@@ -59,8 +82,8 @@ std::unordered_map<std::string_view, AttributeKind> const& knownAttributes() {
     return known;
 }
 
-bool isProtocolType(std::string_view attribute) {
-    constexpr std::string_view stem = "Protocol_Type_";
+/// Is it this stem and a number behind it?
+bool isNumbered(std::string_view attribute, std::string_view stem) {
     if (!attribute.starts_with(stem) || attribute.size() == stem.size()) return false;
     return std::ranges::all_of(attribute.substr(stem.size()),
                                [](char c) { return c >= '0' && c <= '9'; });
@@ -71,7 +94,14 @@ bool isProtocolType(std::string_view attribute) {
 AttributeKind kindOf(std::string_view attribute) {
     auto const& known = knownAttributes();
     if (auto const found = known.find(attribute); found != known.end()) return found->second;
-    return isProtocolType(attribute) ? AttributeKind::byte : AttributeKind::any;
+    if (isNumbered(attribute, "Protocol_Type_")) return AttributeKind::byte;
+    for (char const* stem : {"IP_ADDRESS_", "IP_MASK_", "IP_BROADCAST_"})
+        if (isNumbered(attribute, stem)) return AttributeKind::text;
+    return AttributeKind::any;
+}
+
+bool isLiveAttribute(std::string_view attribute) {
+    return std::ranges::find(kLiveAttributes, attribute) != kLiveAttributes.end();
 }
 
 std::span<std::int32_t const> deviceTypes() {

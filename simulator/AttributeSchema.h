@@ -29,6 +29,9 @@ enum class AttributeKind : std::uint8_t { any, text, number, byte, descriptor };
 
 AttributeKind kindOf(std::string_view attribute);
 
+/// Is it answered by a line or by ISDN channels, and never written?
+bool isLiveAttribute(std::string_view attribute);
+
 std::span<std::int32_t const> deviceTypes();
 std::span<std::int32_t const> subDeviceTypes();
 

@@ -2,6 +2,8 @@
 // The chassis: its objects and the indexes over them.
 #include "simulator/Chassis.h"
 
+#include <chrono>
+
 #include "simulator/Description.h"
 
 namespace kvlsim {
@@ -103,6 +105,18 @@ bool Chassis::unsetAttribute(std::int32_t handle, std::string_view name) {
     return true;
 }
 
+void Chassis::setLineClock(LineClock* clock) {
+    m_lineClock = clock;
+    LiveLine::Time const now = lineTime();
+    for (auto& [handle, object] : m_objects)
+        if (object.ds1Line) object.ds1Line->restart(now);
+}
+
+LiveLine::Time Chassis::lineTime() const {
+    return m_lineClock != nullptr ? m_lineClock()
+                                  : std::chrono::steady_clock::now().time_since_epoch();
+}
+
 void Chassis::refuseTaken(ObjectDraft const& draft) const {
     if (auto const* taken = find(draft.handle))
         throw ChassisError(draft.line, "handle " + std::to_string(draft.handle) +
@@ -128,6 +142,9 @@ void Chassis::add(ObjectDraft draft, std::int32_t parent) {
     object.parent = parent;
     object.order = m_nextOrder++;
     object.attributes = std::move(draft.attributes);
+    if (draft.ds1Line)
+        object.ds1Line = std::make_unique<LiveLine>(std::move(*draft.ds1Line), lineTime());
+    if (draft.channels) object.channels = std::make_unique<Channels>(std::move(*draft.channels));
     ChassisObject const& added = m_objects.emplace(draft.handle, std::move(object)).first->second;
     m_objects.at(parent).children.push_back(draft.handle);
     index(added, kName);

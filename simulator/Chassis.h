@@ -1,10 +1,11 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The chassis: boards with their devices, sub-devices and processors, found by handle, name or
-// serial number; what its attribute store and its processes are like.
+// serial number; their lines and channels; what its attribute store and its processes are like.
 #pragma once
 
 #include <cstdint>
 #include <functional>
+#include <memory>
 #include <optional>
 #include <set>
 #include <string>
@@ -14,6 +15,8 @@
 #include <vector>
 
 #include "simulator/AttributeValue.h"
+#include "simulator/Channels.h"
+#include "simulator/LiveLine.h"
 #include "simulator/ProcessDraft.h"
 #include "simulator/StoreContents.h"
 
@@ -41,6 +44,8 @@ struct ObjectDraft {
     std::int32_t type = 0;
     int line = 0;            ///< where it was described; 0 when it came without lines
     AttributeMap attributes; ///< TYPE included
+    std::optional<LineDraft> ds1Line;
+    std::optional<Channels> channels;
     std::vector<ObjectDraft> children;
 };
 
@@ -52,6 +57,8 @@ struct ChassisObject {
     std::uint64_t order = 0; ///< place in the chassis: objects found first have lower numbers
     AttributeMap attributes;
     std::vector<std::int32_t> children; ///< in the order of the chassis
+    std::unique_ptr<LiveLine> ds1Line;  ///< null: it is no line
+    std::unique_ptr<Channels> channels; ///< null: it has no ISDN channels
 
     AttributeValue const* attribute(std::string_view name) const {
         auto const found = attributes.find(name);
@@ -65,6 +72,8 @@ class Chassis {
   public:
     /// The root object's handle. Objects have handles from 1 to just below it.
     static constexpr std::int32_t kRootHandle = 0x7FFFFFFF;
+
+    using LineClock = LiveLine::Time();
 
     Chassis();
 
@@ -89,6 +98,14 @@ class Chassis {
     /// Returns whether the object had the attribute. Requires: the object is there.
     bool unsetAttribute(std::int32_t handle, std::string_view name);
 
+    /// The clock of the lines; null: the steady clock. All lines begin again as at loading.
+    void setLineClock(LineClock* clock);
+    /// What the clock of the lines tells now.
+    LiveLine::Time lineTime() const;
+    /// To change them. Require: the object has one.
+    LiveLine& line(std::int32_t handle) { return *m_objects.at(handle).ds1Line; }
+    Channels& channels(std::int32_t handle) { return *m_objects.at(handle).channels; }
+
     /// What the attribute store holds when it is made.
     StoreDraft const& store() const { return m_store; }
     void setStore(StoreDraft store) { m_store = std::move(store); }
@@ -110,6 +127,7 @@ class Chassis {
     std::unordered_map<std::string, Named, TextHash, std::equal_to<>> m_byName;
     std::unordered_map<std::string, std::int32_t, TextHash, std::equal_to<>> m_bySerial;
     std::uint64_t m_nextOrder = 0;
+    LineClock* m_lineClock = nullptr;
     StoreDraft m_store;
     std::optional<std::vector<ProcessDraft>> m_processes;
 };

@@ -26,8 +26,8 @@ using Keys = std::span<std::string_view const>;
 constexpr std::array<std::string_view, 3> kChassisKeys = {"boards", "store", "processes"};
 constexpr std::array<std::string_view, 4> kBoardKeys = {"handle", "attributes", "devices",
                                                         "processors"};
-constexpr std::array<std::string_view, 4> kDeviceKeys = {"handle", "type", "attributes",
-                                                         "subdevices"};
+constexpr std::array<std::string_view, 6> kDeviceKeys = {"handle",     "type", "attributes",
+                                                         "subdevices", "line", "channels"};
 constexpr std::array<std::string_view, 3> kSubDeviceKeys = {"handle", "type", "attributes"};
 constexpr std::array<std::string_view, 2> kProcessorKeys = {"handle", "attributes"};
 
@@ -91,6 +91,26 @@ ObjectDraft readObject(Description const& object, ObjectKind kind, Keys keys) {
     return draft;
 }
 
+/// What a device may have beyond other objects.
+void readDeviceParts(Description const& item, ObjectDraft& device) {
+    std::string const what = "device " + std::to_string(device.handle);
+    Description const* const channels = item.find("channels");
+    if (channels != nullptr) device.channels = readChannels(*channels, what);
+    Description const* const line = item.find("line");
+    if (line == nullptr) return;
+    device.ds1Line = readLine(*line, what);
+    auto const type = AttributeValue::number(static_cast<std::int32_t>(device.ds1Line->type));
+    auto const [attribute, isNew] = device.attributes.emplace(kDS1LineType, type);
+    AttributeValue const& written = attribute->second;
+    if (isNew || written.form() == ValueForm::empty || written.asNumber() == type.asNumber())
+        return;
+    throw ChassisError(
+        line->line,
+        "the line of " + what + " is of type " + std::string(nameOf(device.ds1Line->type)) + " (" +
+            std::to_string(type.asNumber()) + "), but its LINE_TYPE is " +
+            std::to_string(written.asNumber()) + "; remove LINE_TYPE from the attributes");
+}
+
 void readChildren(Description const& parent, std::string_view key, ObjectKind kind, Keys keys,
                   ObjectDraft& into) {
     Description const* const list = parent.find(key);
@@ -101,8 +121,10 @@ void readChildren(Description const& parent, std::string_view key, ObjectKind ki
                                "; write a list, each entry beginning with \"- handle:\"");
     for (auto const& item : list->items) {
         ObjectDraft child = readObject(item, kind, keys);
-        if (kind == ObjectKind::device)
+        if (kind == ObjectKind::device) {
+            readDeviceParts(item, child);
             readChildren(item, "subdevices", ObjectKind::subDevice, kSubDeviceKeys, child);
+        }
         into.children.push_back(std::move(child));
     }
 }

@@ -36,6 +36,17 @@ nlohmann::json addToStore(CommandContext const& context);
 nlohmann::json setInStore(CommandContext const& context);
 nlohmann::json removeFromStore(CommandContext const& context);
 
+nlohmann::json listLines(CommandContext const& context);
+nlohmann::json addLineErrors(CommandContext const& context);
+nlohmann::json setLineRates(CommandContext const& context);
+nlohmann::json setLineAlarm(CommandContext const& context);
+nlohmann::json mendLine(CommandContext const& context);
+
+nlohmann::json listCalls(CommandContext const& context);
+nlohmann::json setUpCall(CommandContext const& context);
+nlohmann::json releaseCall(CommandContext const& context);
+nlohmann::json setSignalling(CommandContext const& context);
+
 nlohmann::json listProcesses(CommandContext const& context);
 nlohmann::json addProcess(CommandContext const& context);
 nlohmann::json endProcess(CommandContext const& context);

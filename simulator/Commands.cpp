@@ -136,6 +136,9 @@ Json changeAttribute(Context const& context, Change change) {
     std::string const name = context.arguments.text("attribute");
     refuseUnfitName(name, 0);
     if (name == "TYPE") throw CommandError("TYPE says what an object is; it cannot be changed");
+    if (isLiveAttribute(name))
+        throw CommandError(name + " is answered by a line or by ISDN channels; \"line-list\" and "
+                                  "\"call-list\" show what there is");
     std::int32_t handle = 0;
     context.platform.write([&](Chassis* maybe) {
         Chassis& chassis = present(maybe);
@@ -146,12 +149,20 @@ Json changeAttribute(Context const& context, Change change) {
     return {{"object", handle}};
 }
 
+/// A line's type is told twice when it is shown: it must be one of those that can be described.
+void refuseUnfitLineType(ChassisObject const& object, std::string_view name,
+                         AttributeValue const& value) {
+    if (!object.ds1Line || name != kDS1LineType || fitsLineType(value)) return;
+    throw CommandError("LINE_TYPE of a line is 2 (esf), 3 (d4), 4 (e1) or 5 (e1-crc), in 4 bytes");
+}
+
 Json set(Context const& context) {
     context.arguments.allow({"object", "attribute", "value"});
     Description const written = describeJson(context.arguments.value("value"));
     return changeAttribute(
         context, [&](Chassis& chassis, ChassisObject const& object, std::string const& name) {
             AttributeValue value = readAttribute(name, written);
+            refuseUnfitLineType(object, name, value);
             if (object.kind == ObjectKind::board && name == "BOARD_CONDITION")
                 setCondition(chassis, object.handle, std::move(value));
             else
@@ -176,7 +187,8 @@ bool needsBoard(std::uint32_t id) {
         return id >= static_cast<std::uint32_t>(first) && id <= static_cast<std::uint32_t>(last);
     };
     return between(EventId::faultRaised, EventId::faultCleared) ||
-           between(EventId::boardRemoved, EventId::boardStopPending);
+           between(EventId::boardRemoved, EventId::boardStopPending) || id == kISDNBearerChanged ||
+           id == kISDNSignallingChanged;
 }
 
 Json event(Context const& context) {
@@ -237,7 +249,7 @@ struct Command {
     Json (*run)(Context const&);
 };
 
-constexpr std::array<Command, 21> kCommands = {{{"insert", insert},
+constexpr std::array<Command, 30> kCommands = {{{"insert", insert},
                                                 {"remove", remove},
                                                 {"replace", replace},
                                                 {"start", start},
@@ -255,6 +267,15 @@ constexpr std::array<Command, 21> kCommands = {{{"insert", insert},
                                                 {"process-list", listProcesses},
                                                 {"process-add", addProcess},
                                                 {"process-end", endProcess},
+                                                {"line-list", listLines},
+                                                {"line-errors", addLineErrors},
+                                                {"line-rates", setLineRates},
+                                                {"line-alarm", setLineAlarm},
+                                                {"line-mend", mendLine},
+                                                {"call-list", listCalls},
+                                                {"call-setup", setUpCall},
+                                                {"call-release", releaseCall},
+                                                {"call-signalling", setSignalling},
                                                 {"drain", drain},
                                                 {"version", version},
                                                 {"ping", ping}}};
@@ -310,6 +331,10 @@ void loadChassis(std::string const& yamlText) {
     } catch (ChassisError const& error) {
         throw std::runtime_error(describeError("chassis", error));
     }
+}
+
+void setLineClock(std::chrono::nanoseconds (*clock)()) {
+    Platform::instance().setLineClock(clock);
 }
 
 void setCounterClock(std::chrono::nanoseconds (*clock)()) {

@@ -25,6 +25,10 @@ void loadChassis(std::string const& yamlText);
 /// beginning anew; null: the steady clock. It is called on whatever thread asks for counters.
 void setCounterClock(std::chrono::nanoseconds (*clock)());
 
+/// The clock by which the lines of the chassis age, from now on and in whatever chassis; null: the
+/// steady clock. They begin anew, as at loading. It is called on whatever thread reads a line.
+void setLineClock(std::chrono::nanoseconds (*clock)());
+
 } // namespace kvlsim
 
 #pragma GCC visibility pop

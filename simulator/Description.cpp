@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <charconv>
+#include <cmath>
 #include <sstream>
 
 #include <nlohmann/json.hpp>
@@ -16,8 +17,8 @@ namespace kvlsim {
 
 namespace {
 
-// A descriptor's words sit at level 9: boards, board, devices, device, subdevices, sub-device,
-// attributes, attribute, words.
+// A spell's alarms sit deepest, at level 10: chassis, boards, board, devices, device, line, past,
+// spells, spell, alarms.
 constexpr std::size_t kMaxDepth = 12;
 
 [[noreturn]] void refuseDepth(int line) {
@@ -256,6 +257,15 @@ std::optional<std::int64_t> Description::integer() const {
         std::errc())
         return std::nullopt;
     return split->negative ? -value : value;
+}
+
+std::optional<double> Description::decimal() const {
+    if (form != Form::plain && form != Form::other) return std::nullopt;
+    double number = 0;
+    auto const* const end = scalar.data() + scalar.size();
+    auto const [stop, error] = std::from_chars(scalar.data(), end, number);
+    if (error != std::errc() || stop != end || !std::isfinite(number)) return std::nullopt;
+    return number;
 }
 
 Description const* Description::find(std::string_view key) const {

@@ -65,6 +65,8 @@ struct Description {
     std::optional<std::int64_t> integer() const;
     /// Does an unquoted scalar read as a whole number, of whatever size?
     bool readsAsInteger() const;
+    /// The finite number, 0.5 or -2, that an unquoted scalar or a JSON number reads as.
+    std::optional<double> decimal() const;
     Description const* find(std::string_view key) const;
     /// For messages: `the list`, `the text "x"`, `11`.
     std::string words() const;

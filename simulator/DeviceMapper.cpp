@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <optional>
 #include <span>
 
 #include "boardplatform/dm_client.h"
@@ -27,12 +28,64 @@ bool isSound(DMAttribute const& criterion) {
            (criterion.value != nullptr || criterion.size == 0);
 }
 
+/// The whole past of a line, or nothing.
+std::int32_t readPast(DMAttribute& request, std::int32_t capacity, LinePast const& past) {
+    std::int64_t const size = (past.seconds + 1) * std::int64_t(sizeof(DS1LineCounters));
+    if (size > capacity) return kBufferTooSmall;
+    auto* to = static_cast<unsigned char*>(request.value);
+    replayPast(past, [&to](DS1LineCounters const& counters) {
+        std::memcpy(to, &counters, sizeof counters);
+        to += sizeof counters;
+    });
+    request.size = static_cast<std::int32_t>(size);
+    return 0;
+}
+
+std::int32_t readBytes(DMAttribute& request, std::int32_t capacity, void const* bytes,
+                       std::size_t size) {
+    if (size > static_cast<std::size_t>(capacity)) return kBufferTooSmall;
+    std::memcpy(request.value, bytes, size);
+    request.size = static_cast<std::int32_t>(size);
+    return 0;
+}
+
+/// Answers what a line or ISDN channels tell of themselves; none: the attribute is no such one.
+std::optional<std::int32_t> readLive(DMAttribute& request, std::int32_t capacity,
+                                     ChassisObject const& object, Chassis const& chassis) {
+    std::string_view const name = request.name;
+    if (object.ds1Line) {
+        LinePast const& past = object.ds1Line->draft().past;
+        if (name == kDS1LineCounters) {
+            DS1LineCounters const counters = object.ds1Line->counters(chassis.lineTime());
+            return readBytes(request, capacity, &counters, sizeof counters);
+        }
+        if (past.seconds > 0 && name == kDS1LinePastSeconds) {
+            auto const seconds = static_cast<std::int32_t>(past.seconds);
+            return readBytes(request, capacity, &seconds, sizeof seconds);
+        }
+        if (past.seconds > 0 && name == kDS1LinePast) return readPast(request, capacity, past);
+    }
+    if (object.channels) {
+        std::string_view const states = object.channels->states();
+        if (name == kISDNChannelStates)
+            return readBytes(request, capacity, states.data(), states.size());
+        auto const signalling = object.channels->signalling();
+        if (name == kISDNSignallingState)
+            return readBytes(request, capacity, &signalling, sizeof signalling);
+    }
+    return std::nullopt;
+}
+
 /// Answers one attribute; leaves the buffer alone unless the status is 0.
-void readInto(DMAttribute& request, ChassisObject const& object) {
+void readInto(DMAttribute& request, ChassisObject const& object, Chassis const& chassis) {
     std::int32_t const capacity = request.size;
     request.size = 0;
     if (request.name == nullptr || capacity < 0 || (request.value == nullptr && capacity > 0)) {
         request.status = kInvalidAttribute;
+        return;
+    }
+    if (auto const status = readLive(request, capacity, object, chassis)) {
+        request.status = *status;
         return;
     }
     AttributeValue const* const value = object.attribute(request.name);
@@ -119,7 +172,7 @@ class Client final : public DeviceMapperClient {
             }
             int result = 0;
             for (auto& request : wanted) {
-                readInto(request, *object);
+                readInto(request, *object, *chassis);
                 if (request.status != 0) result = kDMSomeAttributesFailed;
             }
             return result;

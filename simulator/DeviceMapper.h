@@ -13,7 +13,7 @@ inline constexpr int kNoChassis = 204;
 
 /// Status of one attribute: the object has no such attribute.
 inline constexpr int kNoAttribute = 1;
-/// Status of one attribute: the buffer does not hold the number or descriptor.
+/// Status of one attribute: the buffer does not hold the number, descriptor or record.
 inline constexpr int kBufferTooSmall = 2;
 /// Status of one attribute: name or buffer are missing.
 inline constexpr int kInvalidAttribute = 3;

@@ -18,6 +18,7 @@ std::string_view channelOf(std::uint32_t id) {
     case 3:
         return "FAULT";
     case 4:
+    case 5:
         return "ADMIN";
     default:
         return {};
@@ -27,7 +28,10 @@ std::string_view channelOf(std::uint32_t id) {
 std::uint64_t EventService::announce(Announcement const& announcement) {
     Message message;
     message.id = announcement.id;
-    if (announcement.board) {
+    if (announcement.channel) {
+        message.hasPayload = true;
+        std::memcpy(message.payload.data(), &*announcement.channel, sizeof *announcement.channel);
+    } else if (announcement.board) {
         message.hasPayload = true;
         std::memcpy(message.payload.data(), &*announcement.board, sizeof(std::int32_t));
         if (channelOf(announcement.id) == "FAULT")

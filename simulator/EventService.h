@@ -15,6 +15,7 @@
 #include <thread>
 #include <vector>
 
+#include "boardplatform/isdn_channels.h"
 #include "boardplatform/vqx_event_service.h"
 
 namespace kvlsim {
@@ -34,14 +35,16 @@ enum class EventId : std::uint32_t {
     boardStopPending = 0x4000A,
 };
 
-/// The channel that carries an identifier: "ADMIN" the 0x4...., "FAULT" the 0x3....; else empty.
+/// The channel that carries an identifier: "ADMIN" the 0x4.... and the 0x5...., "FAULT" the
+/// 0x3....; else empty.
 std::string_view channelOf(std::uint32_t id);
 
 /// An event before it is queued.
 struct Announcement {
     std::uint32_t id = 0;
     std::optional<std::int32_t> board;
-    std::uint16_t fault = 0; ///< carried by the fault channel's messages only
+    std::uint16_t fault = 0;                    ///< carried by the fault channel's messages only
+    std::optional<ISDNChannelMsg> channel = {}; ///< the payload in the place of board and fault
 };
 
 /// One subscriber. Its fields are guarded by the service's lock, except those that never change.
@@ -88,7 +91,7 @@ class EventService {
     struct Message {
         std::uint32_t id = 0;
         bool hasPayload = false;
-        std::array<unsigned char, 8> payload{};
+        std::array<unsigned char, sizeof(ISDNChannelMsg)> payload{};
     };
 
     void ensureThread();

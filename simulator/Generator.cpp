@@ -94,6 +94,23 @@ std::int32_t Generator::pick(std::int32_t least, std::int32_t most) {
     return least + static_cast<std::int32_t>(m_random() % range);
 }
 
+Json Generator::line(std::int32_t board, std::int32_t handle, std::int32_t index, bool isE1) {
+    Json device;
+    device["handle"] = handle;
+    device["type"] = 501;
+    Json& of = device["attributes"];
+    of["NAME"] = std::string("b").append(std::to_string(board)) + "-line-" + std::to_string(index);
+    of["ChannelCount"] = isE1 ? 30 : 24;
+    of["LINEADMINADDR"] = descriptor(board, 2, index);
+    of["LINE_NUMBER"] = index;
+    of["CIRCUIT"] = (isE1 ? "E1-" : "T1-") + padded(handle, 8);
+    Json& line = device["line"];
+    line["type"] = isE1 ? "e1-crc" : "esf";
+    line["errors"]["code-violations"] = pick(0, 20) / 10.0;
+    line["errors"]["path-violations"] = pick(0, 10) / 100.0;
+    return device;
+}
+
 Json Generator::board(std::int32_t handle, std::int32_t& nextHandle) {
     auto const wanted = std::ranges::find(kFamilies, m_options.family, &Family::name);
     Family const& family =
@@ -155,6 +172,10 @@ Json Generator::board(std::int32_t handle, std::int32_t& nextHandle) {
         }
         board["devices"].push_back(std::move(device));
     }
+    bool const isE1 =
+        std::string_view(family.models[static_cast<std::size_t>(model)]).ends_with("-E1");
+    for (std::int32_t i = 1; i <= m_options.lines; ++i)
+        board["devices"].push_back(line(handle, nextHandle++, i, isE1));
     for (std::int32_t i = 0; i < m_options.processors; ++i) {
         Json processor;
         processor["handle"] = nextHandle++;
@@ -175,7 +196,9 @@ std::string Generator::chassis() {
                       " --devices " + std::to_string(m_options.devices) + " --subdevices " +
                       std::to_string(m_options.subDevices) + " --processors " +
                       std::to_string(m_options.processors) + " --seed " +
-                      std::to_string(m_options.seed) + "\nboards:\n";
+                      std::to_string(m_options.seed);
+    if (m_options.lines > 0) out += " --lines " + std::to_string(m_options.lines);
+    out += "\nboards:\n";
     std::int32_t nextHandle = m_options.boards + 1;
     for (std::int32_t handle = 1; handle <= m_options.boards; ++handle) {
         out += "  - ";
@@ -185,8 +208,8 @@ std::string Generator::chassis() {
 }
 
 std::int64_t Generator::objects(GeneratorOptions const& options) {
-    std::int64_t const perBoard =
-        1 + std::int64_t(options.devices) * (1 + options.subDevices) + options.processors;
+    std::int64_t const perBoard = 1 + std::int64_t(options.devices) * (1 + options.subDevices) +
+                                  options.lines + options.processors;
     return options.boards * perBoard;
 }
 

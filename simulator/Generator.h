@@ -15,6 +15,7 @@ struct GeneratorOptions {
     std::int32_t devices = 2;    ///< per board
     std::int32_t subDevices = 1; ///< per device, where its type has sub-devices
     std::int32_t processors = 1; ///< per board
+    std::int32_t lines = 0;      ///< per board: trunk devices with a DS1 line, behind the others
     std::uint32_t seed = 1;
     std::string family; ///< of all boards, where it is a known one; else families vary
 };
@@ -36,6 +37,9 @@ class Generator {
     static std::int64_t objects(GeneratorOptions const& options);
 
   private:
+    /// Line `index` of a board.
+    nlohmann::ordered_json line(std::int32_t board, std::int32_t handle, std::int32_t index,
+                                bool isE1);
     std::int32_t pick(std::int32_t least, std::int32_t most);
 
     GeneratorOptions m_options;

@@ -57,11 +57,22 @@ Platform& Platform::started() {
 void Platform::replaceChassis(Chassis chassis) {
     {
         std::unique_lock const lock(m_lock);
-        std::swap(m_chassis, chassis);
-        m_loaded = true;
+        putInPlace(chassis);
         m_failure.clear();
     }
     m_processes.restart();
+}
+
+void Platform::putInPlace(Chassis& chassis) {
+    std::swap(m_chassis, chassis);
+    m_chassis.setLineClock(m_lineClock); // the lines are loaded now, not when they were read
+    m_loaded = true;
+}
+
+void Platform::setLineClock(Chassis::LineClock* clock) {
+    std::unique_lock const lock(m_lock);
+    m_lineClock = clock;
+    m_chassis.setLineClock(clock);
 }
 
 std::string Platform::failure() {
@@ -77,8 +88,7 @@ void Platform::loadConfiguredChassis() {
         Chassis chassis = readChassis(file.empty() ? kBundledChassis : readChassisFile(file));
         std::unique_lock const lock(m_lock);
         if (m_loaded) return; // given by loadChassis meanwhile
-        m_chassis = std::move(chassis);
-        m_loaded = true;
+        putInPlace(chassis);
         return;
     } catch (ChassisError const& error) {
         source = describeError(source, error);

@@ -73,6 +73,9 @@ class Platform {
         return std::forward<Change>(change)(m_loaded ? &m_chassis : nullptr);
     }
 
+    /// The clock of the lines of this chassis and of those that come; null: the steady clock.
+    void setLineClock(Chassis::LineClock* clock);
+
     /// Why there is no chassis, in one line.
     std::string failure();
 
@@ -83,9 +86,12 @@ class Platform {
   private:
     Platform();
     void loadConfiguredChassis();
+    /// Requires: the lock is held alone.
+    void putInPlace(Chassis& chassis);
 
     FairSharedMutex m_lock;
     Chassis m_chassis;
+    Chassis::LineClock* m_lineClock = nullptr;
     bool m_loaded = false;
     std::string m_failure;
     EventService m_events;

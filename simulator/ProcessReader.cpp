@@ -1,10 +1,8 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // Reads the part "processes" of a chassis; counters over time.
 #include <algorithm>
-#include <charconv>
 #include <cmath>
 #include <limits>
-#include <optional>
 #include <set>
 
 #include "simulator/ChassisReader.h"
@@ -36,16 +34,6 @@ void requireCounters(Description const& map, char const* what) {
     if (map.form != Form::map)
         throw ChassisError(map.line, std::string(what) + " cannot be " + map.words() +
                                          "; write one counter a line, such as NumberOfOpens: 3");
-}
-
-/// A decimal number, 0.5 or -2, as YAML and JSON write it.
-std::optional<double> decimal(Description const& value) {
-    if (value.form != Form::plain && value.form != Form::other) return std::nullopt;
-    double number = 0;
-    auto const* const end = value.scalar.data() + value.scalar.size();
-    auto const [stop, error] = std::from_chars(value.scalar.data(), end, number);
-    if (error != std::errc() || stop != end || !std::isfinite(number)) return std::nullopt;
-    return number;
 }
 
 ProcessDraft readProcess(Description const& item) {
@@ -121,7 +109,7 @@ Counters readCounters(Description const* counters, Description const* rates) {
         requireCounters(*rates, "rates");
         for (auto const& entry : rates->entries) {
             auto& rate = read.rates[counterNamed(entry)];
-            auto const number = decimal(entry.value);
+            auto const number = entry.value.decimal();
             if (!number)
                 throw ChassisError(entry.line, "the rate of " + entry.key + " cannot be " +
                                                    entry.value.words() +

@@ -54,6 +54,14 @@ void printAttributes(Json const& object, std::size_t indent, std::ostream& out) 
             << (value.is_string() ? oneLine(value.get<std::string>()) : value.dump()) << '\n';
 }
 
+/// A line's past is left out: it may be long, and is over.
+void printPart(Json const& object, char const* name, std::size_t indent, std::ostream& out) {
+    if (!object.contains(name)) return;
+    Json part = object.at(name);
+    part.erase("past");
+    out << std::string(indent, ' ') << name << ' ' << part.dump() << '\n';
+}
+
 void printObjects(Json const& parent, char const* list, char const* kind, std::size_t indent,
                   std::ostream& out) {
     if (!parent.contains(list)) return;
@@ -62,6 +70,8 @@ void printObjects(Json const& parent, char const* list, char const* kind, std::s
         if (object.contains("type")) out << ", type " << object.at("type").dump();
         out << '\n';
         printAttributes(object, indent + 2, out);
+        printPart(object, "line", indent + 2, out);
+        printPart(object, "channels", indent + 2, out);
         printObjects(object, "subdevices", "sub-device", indent + 2, out);
     }
 }

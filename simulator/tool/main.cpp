@@ -10,7 +10,9 @@
 #include "simulator/ChassisReader.h"
 #include "simulator/Generator.h"
 #include "simulator/tool/BoardDescriptions.h"
+#include "simulator/tool/CallTool.h"
 #include "simulator/tool/ControlClient.h"
+#include "simulator/tool/LineTool.h"
 #include "simulator/tool/OutputFile.h"
 #include "simulator/tool/ProcessTool.h"
 #include "simulator/tool/ShowTable.h"
@@ -274,6 +276,8 @@ void addOtherCommands(CLI::App& app, Options& options, Run& chosen) {
         ->check(CLI::Range(0, 1000));
     command->add_option("--processors", generator.processors, "Processors per board (default: 1)")
         ->check(CLI::Range(0, 100));
+    command->add_option("--lines", generator.lines, "DS1 lines per board (default: none)")
+        ->check(CLI::Range(0, 1000));
     command->add_option("--seed", generator.seed, "The same seed makes the same chassis");
     command->add_option("--output", options.output, "File (default: standard output)");
 
@@ -301,6 +305,8 @@ int main(int argc, char** argv) {
     std::function<void()> chosenNested;
     kvlsim::addStoreCommands(app, toPlatform, chosenNested);
     kvlsim::addProcessCommands(app, toPlatform, chosenNested);
+    kvlsim::addLineCommands(app, toPlatform, chosenNested);
+    kvlsim::addCallCommands(app, toPlatform, chosenNested);
     try {
         app.parse(argc, argv);
     } catch (CLI::Success const& success) {

@@ -293,7 +293,9 @@ INSTANTIATE_TEST_SUITE_P(
         BadCommand{"UnknownCommand", R"({"command": "explode"})",
                    "unknown command \"explode\"; known: insert, remove, replace, start, stop, "
                    "fail, fault, set, unset, event, show, store-list, store-add, store-set, "
-                   "store-remove, process-list, process-add, process-end, drain, version, ping"},
+                   "store-remove, process-list, process-add, process-end, line-list, line-errors, "
+                   "line-rates, line-alarm, line-mend, call-list, call-setup, call-release, "
+                   "call-signalling, drain, version, ping"},
         BadCommand{"UnknownArgument", R"({"command": "stop", "bord": 5})",
                    "unknown argument \"bord\"; known: board"},
         BadCommand{"ArgumentWhereNoneIsTaken", R"({"command": "drain", "board": 5})",

@@ -1,0 +1,42 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The board platform's ISDN channels: what a trunk's attributes answer, and what is announced.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+
+/// Attributes of a device with ISDN channels.
+/// One byte per bearer channel, an `ISDNBearerState` each, in the order of the channels.
+inline constexpr char const* kISDNChannelStates = "CHANNEL_STATES";
+/// An `ISDNSignallingState`, in 4 bytes.
+inline constexpr char const* kISDNSignallingState = "SIGNALLING_STATE";
+
+enum class ISDNBearerState : std::uint8_t {
+    idle = 1,
+    connecting = 2,
+    connected = 3,
+    active = 4,
+};
+
+enum class ISDNSignallingState : std::int32_t {
+    inactive = 1,
+    layer1Active = 2,
+    layer2Active = 3,
+};
+
+/// Messages of the channel "ADMIN", each with an ISDNChannelMsg.
+inline constexpr std::uint32_t kISDNBearerChanged = 0x50001;
+inline constexpr std::uint32_t kISDNSignallingChanged = 0x50002;
+
+/// What a channel has become. The layout is the platform's; words are little-endian.
+struct ISDNChannelMsg {
+    std::int32_t board;   ///< handle
+    std::int32_t device;  ///< handle
+    std::int32_t channel; ///< from 1 in the order of CHANNEL_STATES; 0: the signalling channel
+    std::int32_t state;   ///< an ISDNBearerState, or for channel 0 an ISDNSignallingState
+};
+
+static_assert(sizeof(ISDNChannelMsg) == 16 && alignof(ISDNChannelMsg) == 4);
+static_assert(offsetof(ISDNChannelMsg, device) == 4);
+static_assert(offsetof(ISDNChannelMsg, channel) == 8);
+static_assert(offsetof(ISDNChannelMsg, state) == 12);

@@ -1,0 +1,220 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// kvlsim call: lists ISDN channels, sets calls up and releases them, also from a script.
+#include "simulator/tool/CallTool.h"
+
+#include <algorithm>
+#include <chrono>
+#include <fstream>
+#include <iostream>
+#include <memory>
+#include <sstream>
+#include <thread>
+
+#include "simulator/Channels.h"
+#include "simulator/tool/TextTable.h"
+
+namespace kvlsim {
+
+namespace {
+
+using Json = nlohmann::json;
+
+struct Options {
+    std::string trunk;
+    std::string channel;
+    std::string state;
+    std::string file;
+    bool all = false;
+    bool noWait = false;
+    bool json = false;
+};
+
+constexpr double kMaxWait = 86400;
+
+std::string words(Json const& value) {
+    if (value.is_null()) return "-";
+    return value.is_string() ? oneLine(value.get<std::string>()) : value.dump();
+}
+
+void list(Options const& options, Connect const& connect) {
+    Json const reply = connect().request({{"command", "call-list"}});
+    if (options.json) {
+        std::cout << reply.dump(2, ' ', false, Json::error_handler_t::replace) << '\n';
+        return;
+    }
+    std::vector<TextRow> rows = {{"TRUNK", "NAME", "BOARD", "SIGNALLING", "BEARERS", "IDLE",
+                                  "CONNECTING", "CONNECTED", "ACTIVE"}};
+    for (auto const& trunk : reply.at("trunks")) {
+        Json const& channels = trunk.at("channels");
+        TextRow row;
+        for (char const* key : {"trunk", "name", "board", "signalling"})
+            row.push_back(words(trunk.at(key)));
+        row.push_back(std::to_string(channels.size()));
+        for (auto const& state : kBearerStateNames)
+            row.push_back(std::to_string(std::ranges::count(channels, Json(state))));
+        rows.push_back(std::move(row));
+    }
+    printColumns(rows, std::cout);
+}
+
+Json setupCommand(Options const& options) {
+    Json command = {{"command", "call-setup"}, {"trunk", options.trunk}};
+    if (!options.channel.empty()) command["channel"] = options.channel;
+    if (!options.state.empty()) command["state"] = options.state;
+    return command;
+}
+
+Json releaseCommand(Options const& options) {
+    Json command = {{"command", "call-release"}, {"trunk", options.trunk}};
+    if (options.all)
+        command["all"] = true;
+    else
+        command["channel"] = options.channel;
+    return command;
+}
+
+Json signallingCommand(Options const& options) {
+    return {{"command", "call-signalling"}, {"trunk", options.trunk}, {"state", options.state}};
+}
+
+Json change(Options const& options, ControlClient& client, Json const& command) {
+    Json reply = client.request(command);
+    if (!options.noWait) client.request({{"command", "drain"}});
+    return reply;
+}
+
+void setUp(Options const& options, Connect const& connect) {
+    auto client = connect();
+    Json const reply = change(options, client, setupCommand(options));
+    std::cout << "channel " << reply.at("channel").dump() << '\n';
+}
+
+void release(Options const& options, Connect const& connect) {
+    auto client = connect();
+    change(options, client, releaseCommand(options));
+}
+
+void signalling(Options const& options, Connect const& connect) {
+    auto client = connect();
+    change(options, client, signallingCommand(options));
+}
+
+/// One line of a script; says what was wrong with it by throwing ToolError.
+void runLine(Options const& options, ControlClient& client, std::vector<std::string> const& line) {
+    Options call = options;
+    auto const requireWords = [&line](std::size_t least, std::size_t most, char const* usage) {
+        if (line.size() < least || line.size() > most)
+            throw ToolError("this is no " + line.front() + "; write " + usage);
+    };
+    if (line.front() == "wait") {
+        requireWords(2, 2, "wait SECONDS");
+        Description written;
+        written.form = Description::Form::plain;
+        written.scalar = line[1];
+        auto const seconds = written.decimal();
+        if (!seconds || *seconds < 0 || *seconds > kMaxWait)
+            throw ToolError("cannot wait " + inQuotes(line[1]) +
+                            "; write seconds from 0 to 86400, such as 0.5");
+        std::this_thread::sleep_for(std::chrono::duration<double>(*seconds));
+        return;
+    }
+    if (line.size() > 1) call.trunk = line[1];
+    if (line.front() == "setup") {
+        requireWords(2, 4, "setup TRUNK [CHANNEL [STATE]]");
+        if (line.size() > 2) call.channel = line[2];
+        if (line.size() > 3) call.state = line[3];
+        change(options, client, setupCommand(call));
+    } else if (line.front() == "release") {
+        requireWords(3, 3, "release TRUNK CHANNEL, or release TRUNK all");
+        call.all = line[2] == "all";
+        call.channel = line[2];
+        change(options, client, releaseCommand(call));
+    } else if (line.front() == "signalling") {
+        requireWords(3, 3, "signalling TRUNK inactive, l1 or l2");
+        call.state = line[2];
+        change(options, client, signallingCommand(call));
+    } else {
+        throw ToolError("unknown command " + inQuotes(line.front()) +
+                        "; write setup, release, signalling or wait");
+    }
+}
+
+void runScript(Options const& options, Connect const& connect) {
+    bool const standardInput = options.file == "-";
+    std::string const name = standardInput ? "standard input" : options.file;
+    std::ifstream file;
+    if (!standardInput) {
+        file.open(options.file);
+        if (!file) throw ToolError(name + ": cannot be read; name a script that is readable");
+    }
+    std::istream& in = standardInput ? std::cin : file;
+    auto client = connect();
+    int number = 0;
+    for (std::string text; std::getline(in, text);) {
+        ++number;
+        std::istringstream stream(text.substr(0, text.find('#')));
+        std::vector<std::string> line;
+        for (std::string word; stream >> word;)
+            line.push_back(word);
+        if (line.empty()) continue;
+        try {
+            runLine(options, client, line);
+        } catch (ToolError const& error) {
+            throw ToolError(name + ":" + std::to_string(number) + ": " + error.what());
+        }
+    }
+    if (in.bad()) throw ToolError(name + ": cannot be read; name a script that is readable");
+}
+
+} // namespace
+
+void addCallCommands(CLI::App& app, Connect connect, std::function<void()>& chosen) {
+    auto const options = std::make_shared<Options>();
+    CLI::App* const call = app.add_subcommand("call", "Calls on ISDN channels");
+    call->fallthrough()->require_subcommand(1);
+    auto const addCommand = [&](char const* name, char const* help, auto run) {
+        CLI::App* const command = call->add_subcommand(name, help);
+        command->fallthrough();
+        command->callback([&chosen, options, connect, run] {
+            chosen = [options, connect, run] { run(*options, connect); };
+        });
+        return command;
+    };
+    auto const addChange = [&](char const* name, char const* help, auto run) {
+        CLI::App* const command = addCommand(name, help, run);
+        command->add_flag("--no-wait", options->noWait,
+                          "Do not wait until the events are delivered to the process");
+        return command;
+    };
+    constexpr char const* trunkHelp = "Handle or NAME of a device with ISDN channels";
+
+    addCommand("list", "List the trunks and the states of their channels", list)
+        ->add_flag("--json", options->json, "The raw reply");
+
+    auto* command = addChange("setup", "Set a call up", setUp);
+    command->add_option("trunk", options->trunk, trunkHelp)->required();
+    command->add_option("channel", options->channel,
+                        "Bearer channel, from 1 (default: the first idle one)");
+    command->add_option("--state", options->state,
+                        "How far: connecting, connected or active (default)");
+
+    command = addChange("release", "Release a call", release);
+    command->add_option("trunk", options->trunk, trunkHelp)->required();
+    auto* const which = command->add_option_group("which");
+    which->add_option("channel", options->channel, "Bearer channel, from 1");
+    which->add_flag("--all", options->all, "All calls of the trunk");
+    which->require_option(1);
+
+    command = addChange("signalling", "Set the state of the signalling channel", signalling);
+    command->add_option("trunk", options->trunk, trunkHelp)->required();
+    command->add_option("state", options->state, "inactive, l1 or l2")->required();
+
+    command = addChange("script", "Run commands from a file, one a line", runScript);
+    command
+        ->add_option("file", options->file,
+                     "Script (- for standard input) of lines such as: setup 301 3; release 301 3; "
+                     "signalling 301 l1; wait 0.5; # comment")
+        ->required();
+}
+
+} // namespace kvlsim

@@ -1,0 +1,16 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// kvlsim call: lists ISDN channels, sets calls up and releases them, also from a script.
+#pragma once
+
+#include <functional>
+
+#include <CLI/CLI.hpp>
+
+#include "simulator/tool/StoreTool.h"
+
+namespace kvlsim {
+
+/// Adds the commands; the one that is chosen puts what to do into `chosen`.
+void addCallCommands(CLI::App& app, Connect connect, std::function<void()>& chosen);
+
+} // namespace kvlsim

@@ -1,0 +1,159 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// kvlsim line: lists DS1 lines, and gives them errors and alarms.
+#include "simulator/tool/LineTool.h"
+
+#include <array>
+#include <iostream>
+#include <memory>
+#include <optional>
+
+#include "simulator/Description.h"
+#include "simulator/Line.h"
+#include "simulator/tool/TextTable.h"
+
+namespace kvlsim {
+
+namespace {
+
+using Json = nlohmann::json;
+
+struct Options {
+    std::string line;
+    std::string alarm;
+    std::array<std::optional<std::uint32_t>, kLineErrorNames.size()> errors;
+    std::array<std::optional<double>, kLineErrorNames.size()> rates;
+    bool clear = false;
+    bool noWait = false;
+    bool json = false;
+};
+
+void change(Options const& options, Connect const& connect, Json const& command) {
+    auto client = connect();
+    client.request(command);
+    if (!options.noWait) client.request({{"command", "drain"}});
+}
+
+/// What of these was given, by the errors' names.
+template <typename Values>
+Json given(Values const& values) {
+    Json json = Json::object();
+    for (std::size_t i = 0; i < values.size(); ++i)
+        if (values[i]) json[std::string(kLineErrorNames[i])] = *values[i];
+    return json;
+}
+
+std::string words(Json const& value) {
+    if (value.is_null()) return "-";
+    return value.is_string() ? oneLine(value.get<std::string>()) : value.dump();
+}
+
+std::string typeWords(Json const& type) {
+    static constexpr std::array<char const*, 6> names = {"-", "-", "esf", "d4", "e1", "e1-crc"};
+    auto const number = type.is_number_integer() ? type.get<std::int64_t>() : 0;
+    return number >= 2 && number <= 5 ? names[static_cast<std::size_t>(number)] : words(type);
+}
+
+void list(Options const& options, Connect const& connect) {
+    Json const reply = connect().request({{"command", "line-list"}});
+    if (options.json) {
+        std::cout << reply.dump(2, ' ', false, Json::error_handler_t::replace) << '\n';
+        return;
+    }
+    std::vector<TextRow> rows = {{"LINE", "NAME", "BOARD", "TYPE", "SECONDS", "CODE", "PATH",
+                                  "FRAMING", "SLIPS", "LOS", "OOF", "AIS", "ALARMS"}};
+    for (auto const& line : reply.at("lines")) {
+        TextRow row;
+        for (char const* key : {"line", "name", "board"})
+            row.push_back(words(line.at(key)));
+        row.push_back(typeWords(line.at("type")));
+        row.push_back(line.at("seconds").dump());
+        for (auto const& name : kLineErrorNames)
+            row.push_back(line.at("errors").at(std::string(name)).dump());
+        for (char const* key : {"los-seconds", "out-of-frame-seconds", "ais-seconds"})
+            row.push_back(line.at(key).dump());
+        std::string alarms;
+        for (auto const& alarm : line.at("alarms"))
+            appendToList(alarms, alarm.get<std::string>());
+        row.push_back(alarms.empty() ? "-" : alarms);
+        rows.push_back(std::move(row));
+    }
+    printColumns(rows, std::cout);
+}
+
+void addErrors(Options const& options, Connect const& connect) {
+    change(options, connect,
+           {{"command", "line-errors"}, {"line", options.line}, {"errors", given(options.errors)}});
+}
+
+void setRates(Options const& options, Connect const& connect) {
+    change(options, connect,
+           {{"command", "line-rates"}, {"line", options.line}, {"rates", given(options.rates)}});
+}
+
+void setAlarm(Options const& options, Connect const& connect) {
+    change(options, connect,
+           {{"command", "line-alarm"},
+            {"line", options.line},
+            {"alarm", options.alarm},
+            {"clear", options.clear}});
+}
+
+void mend(Options const& options, Connect const& connect) {
+    change(options, connect, {{"command", "line-mend"}, {"line", options.line}});
+}
+
+/// One option per kind of error, of which at least one must be given.
+template <typename Values>
+void addErrorOptions(CLI::App& command, Values& values, CLI::Validator const& check,
+                     char const* help) {
+    auto* const kinds = command.add_option_group("errors", help);
+    for (std::size_t i = 0; i < values.size(); ++i)
+        kinds->add_option("--" + std::string(kLineErrorNames[i]), values[i])->check(check);
+    kinds->require_option(1, values.size());
+}
+
+} // namespace
+
+void addLineCommands(CLI::App& app, Connect connect, std::function<void()>& chosen) {
+    auto const options = std::make_shared<Options>();
+    CLI::App* const line = app.add_subcommand("line", "DS1 lines: errors and alarms");
+    line->fallthrough()->require_subcommand(1);
+    auto const addCommand = [&](char const* name, char const* help, auto run) {
+        CLI::App* const command = line->add_subcommand(name, help);
+        command->fallthrough();
+        command->callback([&chosen, options, connect, run] {
+            chosen = [options, connect, run] { run(*options, connect); };
+        });
+        return command;
+    };
+    auto const addChange = [&](char const* name, char const* help, auto run) {
+        CLI::App* const command = addCommand(name, help, run);
+        command->add_option("line", options->line, "Handle or NAME of a device with a line")
+            ->required();
+        command->add_flag("--no-wait", options->noWait,
+                          "Do not wait until the events are delivered to the process");
+        return command;
+    };
+
+    addCommand("list", "List the lines and their counters", list)
+        ->add_flag("--json", options->json, "The raw reply");
+
+    addErrorOptions(*addChange("errors", "Count errors at once", addErrors), options->errors,
+                    CLI::Range(0.0, 4294967295.0), "How many of each kind");
+
+    addErrorOptions(
+        *addChange("rates", "Set steady errors; other kinds stay as they are", setRates),
+        options->rates, CLI::Range(0.0, static_cast<double>(kMaxLineRate)),
+        "How many per second of each kind");
+
+    auto* const alarm = addChange("alarm", "Raise or clear an alarm", setAlarm);
+    std::string known;
+    for (auto const& name : kLineAlarmNames)
+        appendToList(known, name);
+    alarm->add_option("alarm", options->alarm, "One of " + known)->required();
+    alarm->add_flag("--clear", options->clear, "The alarm is over");
+
+    addChange("mend", "Clear all alarms and steady errors", mend);
+}
+
+} // namespace kvlsim

@@ -1,0 +1,16 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// kvlsim line: lists DS1 lines, and gives them errors and alarms.
+#pragma once
+
+#include <functional>
+
+#include <CLI/CLI.hpp>
+
+#include "simulator/tool/StoreTool.h"
+
+namespace kvlsim {
+
+/// Adds the commands; the one that is chosen puts what to do into `chosen`.
+void addLineCommands(CLI::App& app, Connect connect, std::function<void()>& chosen);
+
+} // namespace kvlsim
