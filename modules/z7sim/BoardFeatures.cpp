@@ -1,8 +1,25 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "BoardFeatures.h"
 
-FeatureList makeExtendedFeatures(long /*board*/) {
-    return {};
+#include "Z7SimISDNFeature.h"
+#include "access/DevMapBoardIf.h"
+
+namespace {
+
+/// Appends the feature that `feature` refers to, if there is one.
+template <class T>
+void append(FeatureList& features, ReferenceCounter<T> const& feature) {
+    if (feature.get() != nullptr) features.emplace_back(feature.get());
+}
+
+} // namespace
+
+FeatureList makeExtendedFeatures(long board) {
+    std::vector<long> const devices = DevMapBoardIf(board).ListAllDevices();
+    FeatureList features;
+    auto const isdn = makeISDNFeature(board, devices);
+    append(features, isdn);
+    return features;
 }
 
 FeatureList makeNetworkFeatures(long /*board*/) {
