@@ -2,6 +2,7 @@
 #include "BoardFeatures.h"
 
 #include "Z7SimISDNFeature.h"
+#include "Z7SimResourceFeature.h"
 #include "access/DevMapBoardIf.h"
 
 namespace {
@@ -19,6 +20,7 @@ FeatureList makeExtendedFeatures(long board) {
     FeatureList features;
     auto const isdn = makeISDNFeature(board, devices);
     append(features, isdn);
+    append(features, makeResourceFeature(board, devices, isdn));
     return features;
 }
 
