@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "BoardFeatures.h"
 
+#include "Z7SimEthernetFeature.h"
+#include "Z7SimIPFeature.h"
 #include "Z7SimISDNFeature.h"
 #include "Z7SimResourceFeature.h"
 #include "access/DevMapBoardIf.h"
@@ -24,6 +26,11 @@ FeatureList makeExtendedFeatures(long board) {
     return features;
 }
 
-FeatureList makeNetworkFeatures(long /*board*/) {
-    return {};
+FeatureList makeNetworkFeatures(long board) {
+    std::optional<HostDevice> const host = readHostDevice(board);
+    FeatureList features;
+    auto const ethernet = makeEthernetFeature(board, host);
+    append(features, ethernet);
+    append(features, makeIPFeature(board, host, ethernet));
+    return features;
 }
