@@ -43,7 +43,7 @@ std::optional<std::int32_t> readNumber(long object, char const* attribute) {
 
 std::optional<std::string> readText(long object, char const* attribute) {
     constexpr std::size_t kLongest = 128;
-    auto text = readBytes(object, attribute, kLongest);
-    if (text) text->resize(strnlen(text->data(), text->size()));
-    return text;
+    auto const text = readBytes(object, attribute, kLongest);
+    if (!text) return std::nullopt;
+    return std::string(text->data(), strnlen(text->data(), text->size()));
 }

@@ -34,6 +34,6 @@ Z7SimDChannel::Z7SimDChannel(std::string const& name, long device, int bearers, 
 Z7SimDChannel::~Z7SimDChannel() = default;
 
 int Z7SimDChannel::GetCallingAddress(char* address) {
-    std::strcpy(address, m_trunkName.c_str());
+    std::memcpy(address, m_trunkName.c_str(), m_trunkName.size() + 1);
     return 0;
 }
