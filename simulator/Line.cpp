@@ -75,7 +75,7 @@ void Line::add(LineErrors const& errors) {
 void Line::setRates(LineRates const& rates, Time age) {
     for (std::size_t i = 0; i < rates.size(); ++i)
         m_counts[i] = m_counts[i].after(m_rates[i], age - m_since);
-    m_since = std::max(m_since, age);
+    m_since = age;
     m_rates = rates;
 }
 

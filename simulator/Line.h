@@ -37,7 +37,7 @@ inline constexpr std::array<std::string_view, 11> kLineAlarmNames = {"los",
                                                                      "test-code"};
 
 /// Counts evenly and without chance: after t seconds at a rate r, floor(r * t). Times are the
-/// line's age and must not go back; one that does counts as the latest so far.
+/// line's age and do not go back from one call to the next.
 class Line {
   public:
     using Time = std::chrono::nanoseconds;

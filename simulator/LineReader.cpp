@@ -41,8 +41,10 @@ DS1LineType readType(Description const& line, std::string const& what) {
     auto const* const found =
         type->isScalar() ? std::ranges::find(kTypes, type->scalar, &TypeName::name) : kTypes.end();
     if (found == kTypes.end())
-        throw ChassisError(type->line, what + " cannot be of type " + type->words() +
-                                           "; choose one of " + typeNames());
+        throw ChassisError(type->line,
+                           what + " cannot be of type " +
+                               (type->isScalar() ? inQuotes(type->scalar) : type->words()) +
+                               "; choose one of " + typeNames());
     return found->type;
 }
 
@@ -91,14 +93,15 @@ std::uint32_t readAlarms(Description const& parent) {
     return alarms;
 }
 
-/// `parent`'s number of this name. Requires: it is there.
-std::int64_t readWhole(Description const& parent, std::string_view key, std::string const& what,
-                       std::int64_t most) {
+/// `parent`'s number of this name, which is 1 to `most` because of `why`. Requires: it is there.
+std::int64_t readWhole(Description const& parent, std::string_view key, std::int64_t most,
+                       std::string const& why = "") {
     Description const& value = *parent.find(key);
     auto const number = value.integer();
     if (number && *number >= 1 && *number <= most) return *number;
-    throw ChassisError(value.line, what + " cannot be " + value.words() +
-                                       "; write a whole number from 1 to " + std::to_string(most));
+    throw ChassisError(value.line, std::string(key) + " cannot be " + value.words() +
+                                       "; write a whole number from 1 to " + std::to_string(most) +
+                                       why);
 }
 
 LineSpell readSpell(Description const& item, std::int64_t pastSeconds) {
@@ -110,11 +113,9 @@ LineSpell readSpell(Description const& item, std::int64_t pastSeconds) {
                                               "; say when it began (ago:) and how long it lasted "
                                               "(seconds:)");
     LineSpell spell;
-    spell.ago = readWhole(item, "ago", "how long ago a spell of this past began", pastSeconds);
-    spell.seconds = readWhole(item, "seconds",
-                              "the length of a spell that began " + std::to_string(spell.ago) +
-                                  " seconds before loading",
-                              spell.ago);
+    spell.ago = readWhole(item, "ago", pastSeconds, ", the seconds of this past");
+    spell.seconds =
+        readWhole(item, "seconds", spell.ago, ", for the spell ends at the latest with the past");
     spell.alarms = readAlarms(item);
     spell.rates = readRates(item);
     if (spell.alarms == 0 && spell.rates == LineRates{})
@@ -131,9 +132,8 @@ LinePast readPast(Description const& past) {
         throw ChassisError(past.line, "the past of a line has one length; give either \"hours:\" "
                                       "or \"seconds:\"");
     LinePast read;
-    read.seconds =
-        inHours ? 3600 * readWhole(past, "hours", "the hours of a line's past", kMaxLinePast / 3600)
-                : readWhole(past, "seconds", "the seconds of a line's past", kMaxLinePast);
+    read.seconds = inHours ? 3600 * readWhole(past, "hours", kMaxLinePast / 3600)
+                           : readWhole(past, "seconds", kMaxLinePast);
     read.rates = readRates(past);
     Description const* const spells = past.find("spells");
     if (spells == nullptr || spells->form == Form::nothing) return read;
@@ -179,7 +179,7 @@ void readLineRates(Description const& errors, LineRates& rates) {
         auto const number = entry.value.decimal();
         if (!number || *number < 0 || *number > static_cast<double>(kMaxLineRate))
             throw ChassisError(entry.line, "the rate of " + entry.key + " cannot be " +
-                                               entry.value.words() +
+                                               (number ? entry.value.scalar : entry.value.words()) +
                                                "; write a number per second from 0 to " +
                                                std::to_string(kMaxLineRate) + ", such as 0.5");
         rate =

@@ -4,6 +4,7 @@
 #include "Z7SimEthernetFeature.h"
 #include "Z7SimIPFeature.h"
 #include "Z7SimISDNFeature.h"
+#include "Z7SimLineFeature.h"
 #include "Z7SimResourceFeature.h"
 #include "access/DevMapBoardIf.h"
 
@@ -20,9 +21,11 @@ void append(FeatureList& features, ReferenceCounter<T> const& feature) {
 FeatureList makeExtendedFeatures(long board) {
     std::vector<long> const devices = DevMapBoardIf(board).ListAllDevices();
     FeatureList features;
+    auto const lines = Z7SimLineFeature::make(board);
     auto const isdn = makeISDNFeature(board, devices);
+    append(features, lines);
     append(features, isdn);
-    append(features, makeResourceFeature(board, devices, isdn));
+    append(features, makeResourceFeature(board, devices, lines, isdn));
     return features;
 }
 

@@ -24,7 +24,7 @@ int addressIn(sockaddr const* address) {
 }
 
 int readAddress(long board, std::string const& attribute) {
-    return parseIPAddress(readText(board, attribute.c_str()).value_or("")).value_or(0);
+    return parseIPAddress(textAttribute(board, attribute.c_str())).value_or(0);
 }
 
 } // namespace
@@ -39,9 +39,9 @@ std::optional<Z7SimIPInterface::Addresses> readBoardAddresses(long board) {
     Z7SimIPInterface::Addresses addresses;
     for (int n = 0;; ++n) {
         std::string const number = std::to_string(n);
-        auto const text = readText(board, ("IP_ADDRESS_" + number).c_str());
-        if (!text) return n == 0 ? std::nullopt : std::optional(addresses);
-        auto const address = parseIPAddress(*text);
+        std::string const text = textAttribute(board, ("IP_ADDRESS_" + number).c_str());
+        if (text.empty()) return n == 0 ? std::nullopt : std::optional(addresses);
+        auto const address = parseIPAddress(text);
         if (!address) continue;
         addresses.emplace_back(
             new KVL::IPAddressConfig(*address, readAddress(board, "IP_MASK_" + number),

@@ -1,17 +1,20 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Single attributes of device mapper objects, for those that the library's records do not have.
+// Single attributes of the device mapper's objects, asked live.
 #pragma once
 
-#include <cstddef>
 #include <cstdint>
 #include <optional>
 #include <string>
 
-// Each asks the platform, and answers nothing when the object has no such attribute.
+/// A number of 4, 2 or 1 bytes; nothing when the object has no such attribute. `object`: its
+/// handle.
+std::optional<std::int32_t> numberAttribute(long object, char const* name);
+/// The same, or `usual`.
+int numberAttributeOr(long object, char const* name, int usual);
 
-/// A number of one, two or four bytes.
-std::optional<std::int32_t> readNumber(long object, char const* attribute);
-/// A text of at most 128 bytes; what is longer is cut.
-std::optional<std::string> readText(long object, char const* attribute);
-/// As many bytes as there are, at most `capacity`.
-std::optional<std::string> readBytes(long object, char const* attribute, std::size_t capacity);
+/// A text of at most 127 bytes; empty when the object has no such attribute.
+std::string textAttribute(long object, char const* name);
+
+/// Copies the bytes of an attribute that fits `size` bytes. Returns how many there are; 0 when the
+/// object has no such attribute.
+std::size_t bytesAttribute(long object, char const* name, void* bytes, std::size_t size);

@@ -13,7 +13,7 @@ SimulatedEthernet::SimulatedEthernet(long board, std::string const& address)
 SimulatedEthernet::~SimulatedEthernet() = default;
 
 int SimulatedEthernet::number(char const* attribute) const {
-    return readNumber(m_board, attribute).value_or(KVL::kNotSupported);
+    return numberAttributeOr(m_board, attribute, KVL::kNotSupported);
 }
 
 int SimulatedEthernet::GetType() {

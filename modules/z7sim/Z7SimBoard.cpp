@@ -5,7 +5,7 @@
 #include <string>
 #include <utility>
 
-#include "StoppableFeature.h"
+#include "Withdrawable.h"
 
 namespace {
 
@@ -202,7 +202,7 @@ int Z7SimBoard::StopBoard() {
 }
 
 int Z7SimBoard::create_extended_features() {
-    // Features that nobody will stop must not be made.
+    // Features that nobody will withdraw must not be made.
     if (m_startFailure == nullptr) offer(makeExtendedFeatures(GetBoardIdentifier()));
     return 0;
 }
@@ -226,9 +226,9 @@ int Z7SimBoard::destroy_extended_features() {
 
 void Z7SimBoard::withdrawFeatures() {
     for (auto const& feature : m_offered) {
+        if (auto* const withdrawable = dynamic_cast<Withdrawable*>(feature.get()))
+            withdrawable->Withdraw();
         RemoveFeature(feature);
-        if (auto* const stoppable = dynamic_cast<StoppableFeature*>(feature.get()))
-            stoppable->stop();
     }
     m_offered.clear();
 }

@@ -6,36 +6,28 @@
 #include "ObjectAttributes.h"
 #include "boardplatform/ds1_line.h"
 
-namespace {
-
-int numberOf(long device, char const* attribute) {
-    return readNumber(device, attribute).value_or(-1);
-}
-
-} // namespace
-
-int lineStatus(long /*device*/) {
-    return -1;
-}
-
 Z7SimVoiceDevice::Z7SimVoiceDevice(DevMapDeviceIf const& record, DevicePlace place)
     : Z7SimDevice(record, place),
-      m_coderType(numberOf(record.Auid(), "CODER_TYPE")),
-      m_channelState(numberOf(record.Auid(), "CHANNEL_STATE")),
-      m_gain(numberOf(record.Auid(), "GAIN")),
-      m_echoCancellation(numberOf(record.Auid(), "ECHO_CANCELLATION")) {}
+      m_coderType(numberAttributeOr(record.Auid(), "CODER_TYPE", -1)),
+      m_channelState(numberAttributeOr(record.Auid(), "CHANNEL_STATE", -1)),
+      m_gain(numberAttributeOr(record.Auid(), "GAIN", -1)),
+      m_echoCancellation(numberAttributeOr(record.Auid(), "ECHO_CANCELLATION", -1)) {}
 
 Z7SimVoiceDevice::~Z7SimVoiceDevice() = default;
 
-TrunkFacts::TrunkFacts(long device_, int line)
-    : device(device_),
-      lineNumber(line),
-      lineType(numberOf(device, kDS1LineType)),
-      protocolType(numberOf(device, "Protocol_Type_0")) {}
+TrunkFacts::TrunkFacts(long device, int number, ReferenceCounter<DS1LineDevice> ds1Line)
+    : lineNumber(number),
+      lineType(numberAttributeOr(device, kDS1LineType, -1)),
+      protocolType(numberAttributeOr(device, "Protocol_Type_0", -1)),
+      line(std::move(ds1Line)) {}
 
-Z7SimISDNDevice::Z7SimISDNDevice(DevMapDeviceIf const& record, DevicePlace place, int line,
+int TrunkFacts::lineStatus() const {
+    return line.get() == nullptr ? -1 : line->GetLineStatus();
+}
+
+Z7SimISDNDevice::Z7SimISDNDevice(DevMapDeviceIf const& record, DevicePlace place, TrunkFacts facts,
                                  ReferenceCounter<ISDNDChannel> signalling)
-    : Z7SimTrunk(record, place, line), m_signalling(std::move(signalling)) {}
+    : Z7SimTrunk(record, place, std::move(facts)), m_signalling(std::move(signalling)) {}
 
 Z7SimISDNDevice::~Z7SimISDNDevice() = default;
 

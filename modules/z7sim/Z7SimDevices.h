@@ -2,13 +2,13 @@
 // The devices of a board by kind, as the device mapper described them when the board started.
 #pragma once
 
+#include <utility>
+
 #include "access/DevMapDeviceIf.h"
+#include "board/DS1LineDevice.h"
 #include "board/ISDNChannel.h"
 #include "core/ReferenceCounter.h"
 #include "z7/Z7Device.h"
-
-/// DS1-MIB's dsx1LineStatus of the line of `device`; -1 when it is not known.
-int lineStatus(long device);
 
 /// Where a device is on its board.
 struct DevicePlace {
@@ -52,27 +52,31 @@ class Z7SimVoiceDevice final : public Z7SimDevice<Z7VoiceDevice> {
     int const m_echoCancellation;
 };
 
-/// What a trunk reads of itself when it is made. What the platform does not say is -1.
+/// What a trunk knows of itself: read when it is made, but for its line's status. What the platform
+/// does not say is -1.
 struct TrunkFacts {
-    /// `line`: the number of the trunk's line on the board, from 1.
-    TrunkFacts(long device, int line);
+    /// `number`: the trunk's among those of the board, from 1. `ds1Line`: an empty handle when the
+    /// platform has no line of the trunk.
+    TrunkFacts(long device, int number, ReferenceCounter<DS1LineDevice> ds1Line);
 
-    long device;
+    int lineStatus() const;
+
     int lineNumber;
     int lineType;
     int protocolType;
+    ReferenceCounter<DS1LineDevice> line;
 };
 
 /// A trunk of either kind: `Z7TRKDevice` or `Z7ISDNDevice`.
 template <class Kind>
 class Z7SimTrunk : public Z7SimDevice<Kind> {
   public:
-    Z7SimTrunk(DevMapDeviceIf const& record, DevicePlace place, int line)
-        : Z7SimDevice<Kind>(record, place), m_facts(record.Auid(), line) {}
+    Z7SimTrunk(DevMapDeviceIf const& record, DevicePlace place, TrunkFacts facts)
+        : Z7SimDevice<Kind>(record, place), m_facts(std::move(facts)) {}
 
     int GetLineNumber() override { return m_facts.lineNumber; }
     int GetLineType() override { return m_facts.lineType; }
-    int GetLineStatus() override { return lineStatus(m_facts.device); }
+    int GetLineStatus() override { return m_facts.lineStatus(); }
     int GetProtocolType() override { return m_facts.protocolType; }
 
   private:
@@ -82,7 +86,7 @@ class Z7SimTrunk : public Z7SimDevice<Kind> {
 /// A trunk that carries ISDN. It asks its signalling channel; without one it answers -1.
 class Z7SimISDNDevice final : public Z7SimTrunk<Z7ISDNDevice> {
   public:
-    Z7SimISDNDevice(DevMapDeviceIf const& record, DevicePlace place, int line,
+    Z7SimISDNDevice(DevMapDeviceIf const& record, DevicePlace place, TrunkFacts facts,
                     ReferenceCounter<ISDNDChannel> signalling);
     ~Z7SimISDNDevice() override;
 

@@ -22,23 +22,20 @@ Z7SimEthernetFeature::GetNextEthernet(ReferenceCounter<KVL::Ethernet> /*previous
 }
 
 std::optional<HostDevice> readHostDevice(long board) {
-    auto const name = readText(board, "ETHERNET_DEVICE");
-    if (!name) return std::nullopt;
-    if (HostDevice::isName(*name)) return HostDevice(*name);
+    std::string const name = textAttribute(board, "ETHERNET_DEVICE");
+    if (name.empty()) return std::nullopt;
+    if (HostDevice::isName(name)) return HostDevice(name);
     std::fprintf(stderr,
                  "z7sim: board %ld has the ETHERNET_DEVICE \"%s\"; write a network device of this "
                  "host, at most 15 characters without '/'. The board goes without it.\n",
-                 board, name->c_str());
+                 board, name.c_str());
     return std::nullopt;
 }
 
 ReferenceCounter<KVL::EthernetFeature> makeEthernetFeature(long board,
                                                            std::optional<HostDevice> const& host) {
-    ReferenceCounter<KVL::Ethernet> ethernet;
-    if (host)
-        ethernet = ReferenceCounter<KVL::Ethernet>(new HostEthernet(*host));
-    else if (auto const address = readText(board, "ETHERNET_ADDRESS"))
-        ethernet = ReferenceCounter<KVL::Ethernet>(new SimulatedEthernet(board, *address));
-    if (ethernet.get() == nullptr) return {};
-    return {new Z7SimEthernetFeature(std::move(ethernet))};
+    if (host) return {new Z7SimEthernetFeature(new HostEthernet(*host))};
+    std::string const address = textAttribute(board, "ETHERNET_ADDRESS");
+    if (address.empty()) return {};
+    return {new Z7SimEthernetFeature(new SimulatedEthernet(board, address))};
 }

@@ -25,9 +25,9 @@ int Z7SimBChannel::GetChannelType() {
 
 Z7SimDChannel::Z7SimDChannel(std::string const& name, long device, int bearers, int board)
     : ISDNDChannelZ7(name.c_str()),
-      m_protocol(readNumber(device, "Protocol_Type_0").value_or(KVL::kNotSupported)),
+      m_protocol(numberAttributeOr(device, "Protocol_Type_0", KVL::kNotSupported)),
       m_bearers(bearers),
-      m_trunkName(readText(device, "NAME").value_or("")) {
+      m_trunkName(textAttribute(device, "NAME")) {
     ISDNDChannelZ7::SetBoardIndex(board);
 }
 

@@ -14,7 +14,9 @@ constexpr int kBearersOfT1 = 24;
 constexpr int kSignallingSlotOfE1 = 16;
 
 std::string readBearerStates(long device) {
-    return readBytes(device, kISDNChannelStates, kMostBearers).value_or("");
+    std::string states(kMostBearers, '\0');
+    states.resize(bytesAttribute(device, kISDNChannelStates, states.data(), states.size()));
+    return states;
 }
 
 /// The time slot of bearer channel `channel` of so many, both from 1. An E1 keeps one slot in its
@@ -38,7 +40,7 @@ Z7SimISDNFeature::Z7SimISDNFeature(long board, std::vector<long> const& devices)
     SetFeatureName("ISDN");
     for (long const device : devices) {
         auto const bearers = static_cast<int>(readBearerStates(device).size());
-        if (bearers > 0 && readNumber(device, kISDNSignallingState))
+        if (bearers > 0 && numberAttribute(device, kISDNSignallingState))
             addTrunk(board, device, bearers);
     }
 }
@@ -68,7 +70,7 @@ void Z7SimISDNFeature::readStates() {
                                                 ? static_cast<ISDNBChannelStatusEnum>(state)
                                                 : ISDNBChannelStatusIdle);
         }
-        int const state = readNumber(trunk.device, kISDNSignallingState).value_or(0);
+        int const state = numberAttributeOr(trunk.device, kISDNSignallingState, 0);
         trunk.signalling->state().adopt(isSignallingState(state)
                                             ? static_cast<ISDNDChannelStatusEnum>(state)
                                             : ISDNDChannelStatusInactive);
@@ -102,7 +104,7 @@ void Z7SimISDNFeature::applyToSignalling(Trunk const& trunk, ISDNChannelMsg cons
     channel->NotifyDChannelStatusListeners(ReferenceCounter<ISDNDChannel>(channel.get()), status);
 }
 
-void Z7SimISDNFeature::stop() {
+void Z7SimISDNFeature::Withdraw() {
     ISDNMonitor::instance().remove(*this);
 }
 

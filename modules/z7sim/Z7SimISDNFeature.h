@@ -4,7 +4,7 @@
 
 #include <vector>
 
-#include "StoppableFeature.h"
+#include "Withdrawable.h"
 #include "Z7SimISDNChannels.h"
 #include "boardplatform/isdn_channels.h"
 #include "z7/ISDNFeatureZ7.h"
@@ -15,7 +15,7 @@
 ///
 /// Status changes are told on the platform's delivery thread: to the feature's listeners, then to
 /// the channel's own.
-class Z7SimISDNFeature final : public ISDNFeatureZ7, public StoppableFeature {
+class Z7SimISDNFeature final : public ISDNFeatureZ7, public Withdrawable {
   public:
     /// Asks `devices` of the board for their channels. The channels' states are not known before
     /// `readStates`.
@@ -27,7 +27,8 @@ class Z7SimISDNFeature final : public ISDNFeatureZ7, public StoppableFeature {
     void readStates();
     /// Applies one message, and tells of it if it is a change. One at a time.
     void apply(std::uint32_t id, ISDNChannelMsg const& message);
-    void stop() override;
+    /// No message that comes from now on reaches the feature; one under way on another thread may.
+    void Withdraw() override;
 
     /// The devices that are trunks.
     std::vector<long> trunks() const;
@@ -50,5 +51,5 @@ class Z7SimISDNFeature final : public ISDNFeatureZ7, public StoppableFeature {
 };
 
 /// The feature of the board's trunks among `devices`, which follows the platform until it is
-/// stopped; an empty handle when there is no trunk.
+/// withdrawn; an empty handle when there is no trunk.
 ReferenceCounter<Z7SimISDNFeature> makeISDNFeature(long board, std::vector<long> const& devices);

@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 
+#include "board/DS1LineFeature.h"
 #include "board/ISDNChannel.h"
 #include "tests/modules/z7sim/PluggedBoard.h"
 #include "z7/Z7ResourceFeature.h"
@@ -112,6 +113,16 @@ TEST_F(Z7SimResourceFeatureTest, TrunkWithoutAttributesAnswersMinusOne) {
     EXPECT_EQ(trunk->GetLineType(), -1);
     EXPECT_EQ(trunk->GetLineStatus(), -1);
     EXPECT_EQ(trunk->GetProtocolType(), -1);
+}
+
+TEST_F(Z7SimResourceFeatureTest, TrunkTellsTheStatusOfItsLine) {
+    plugIn("", named(501, "other", "", "line: {type: esf}") +
+                   named(501, "trunk", "", "line: {type: esf, alarms: [los]}"));
+    auto const lines = feature<DS1LineFeature>();
+    auto const line = lines->GetNextDevice(lines->GetFirstDevice());
+    auto const trunk = find<Z7TRKDevice>("trunk");
+    EXPECT_EQ(trunk->GetLineStatus(), line->GetLineStatus());
+    EXPECT_NE(trunk->GetLineStatus(), find<Z7TRKDevice>("other")->GetLineStatus());
 }
 
 TEST_F(Z7SimResourceFeatureTest, LinesAreNumberedOverAllTrunksOfTheBoard) {

@@ -1,0 +1,168 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "Z7SimLine.h"
+
+#include <cstring>
+#include <utility>
+
+namespace {
+
+constexpr int kUp = 1;
+constexpr int kDown = 2;
+
+/// Texts of the device mapper have at most 128 bytes with their terminator.
+int copyText(std::string const& text, char* buffer) {
+    std::memcpy(buffer, text.c_str(), text.size() + 1);
+    return 0;
+}
+
+} // namespace
+
+LineFormat LineSetup::format() const {
+    switch (type) {
+    case static_cast<int>(DS1LineType::d4):
+        return LineFormat::d4;
+    case static_cast<int>(DS1LineType::e1):
+        return LineFormat::e1;
+    case static_cast<int>(DS1LineType::e1Crc):
+        return LineFormat::e1Crc;
+    default:
+        return LineFormat::esf;
+    }
+}
+
+bool LineSetup::isT1() const {
+    return format() == LineFormat::esf || format() == LineFormat::d4;
+}
+
+Z7SimLine::Z7SimLine(LineSetup setup, std::shared_ptr<LineState> state,
+                     ReferenceCounter<DS1IntervalTable> intervals)
+    : m_setup(std::move(setup)), m_state(std::move(state)), m_intervals(std::move(intervals)) {}
+
+Z7SimLine::~Z7SimLine() = default;
+
+int Z7SimLine::GetDescription(std::string& description) {
+    description = (m_setup.isT1() ? "T1 line " : "E1 line ") + m_setup.name;
+    return 0;
+}
+int Z7SimLine::GetType() {
+    return 18; // ds1
+}
+int Z7SimLine::GetMTU() {
+    return Interface::GetMTU();
+}
+int Z7SimLine::GetSpeed() {
+    return m_setup.isT1() ? 1544000 : 2048000;
+}
+int Z7SimLine::GetAdminStatus() {
+    return kUp;
+}
+int Z7SimLine::SetAdminStatus(int status) {
+    return Interface::SetAdminStatus(status);
+}
+int Z7SimLine::GetOperStatus() {
+    constexpr int carriesNothing = DS1LineStatusLossOfSignal | DS1LineStatusLossOfFrame |
+                                   DS1LineStatusRcvAIS | DS1LineStatusUnavailSigState;
+    return (m_state->status() & carriesNothing) == 0 ? kUp : kDown;
+}
+int Z7SimLine::GetLastChange(int& seconds, int& microseconds) {
+    seconds = static_cast<int>(m_state->lastChange());
+    microseconds = 0;
+    return 0;
+}
+int Z7SimLine::GetInOctets() {
+    return Interface::GetInOctets();
+}
+int Z7SimLine::GetInUcastPkts() {
+    return Interface::GetInUcastPkts();
+}
+int Z7SimLine::GetInDiscards() {
+    return Interface::GetInDiscards();
+}
+int Z7SimLine::GetInErrors() {
+    return Interface::GetInErrors();
+}
+int Z7SimLine::GetInUnknownProtos() {
+    return Interface::GetInUnknownProtos();
+}
+int Z7SimLine::GetOutOctets() {
+    return Interface::GetOutOctets();
+}
+int Z7SimLine::GetOutUcastPkts() {
+    return Interface::GetOutUcastPkts();
+}
+int Z7SimLine::GetOutDiscards() {
+    return Interface::GetOutDiscards();
+}
+int Z7SimLine::GetOutErrors() {
+    return Interface::GetOutErrors();
+}
+
+int Z7SimLine::GetName(char* name) {
+    return copyText(m_setup.name, name);
+}
+int Z7SimLine::GetLineIndex() {
+    return m_setup.number;
+}
+ReferenceCounter<DS1IntervalTable> Z7SimLine::GetIntervalTable() {
+    return m_intervals;
+}
+int Z7SimLine::GetLineType() {
+    return m_setup.type;
+}
+int Z7SimLine::GetLineCoding() {
+    return m_setup.coding;
+}
+int Z7SimLine::GetSendCode() {
+    return 1; // none
+}
+int Z7SimLine::GetCircuitIdentifier(char* identifier) {
+    return copyText(m_setup.circuit, identifier);
+}
+int Z7SimLine::GetLoopbackConfig() {
+    return 1; // none asked for
+}
+int Z7SimLine::GetLineStatus() {
+    return m_state->status();
+}
+int Z7SimLine::GetSignalMode() {
+    return m_setup.signalMode;
+}
+int Z7SimLine::GetPhysAddressString(char* address) {
+    return GetCircuitIdentifier(address);
+}
+int Z7SimLine::GetTransmitClockSource() {
+    return m_setup.clockSource;
+}
+int Z7SimLine::GetFdl() {
+    return m_setup.fdl;
+}
+int Z7SimLine::GetLineLength() {
+    return m_setup.length;
+}
+long Z7SimLine::GetLineStatusLastChange() {
+    return m_state->lastChange();
+}
+int Z7SimLine::GetLineStatusChangeTrapEnable() {
+    return m_trapEnable;
+}
+int Z7SimLine::SetLineStatusChangeTrapEnable(int enable) {
+    if (enable != 1 && enable != 2) return -1;
+    m_trapEnable = enable;
+    return 0;
+}
+int Z7SimLine::GetLoopbackStatus() {
+    bool const looped = (m_state->status() & DS1LineStatusLoopbackState) != 0;
+    return looped ? 4 : 1; // near end line loopback, none
+}
+int Z7SimLine::GetDs1ChannelNumber() {
+    return 0; // not part of a DS3
+}
+int Z7SimLine::GetChannelization() {
+    return m_setup.channelized ? 2 : 1; // into DS0s, disabled
+}
+int Z7SimLine::GetLineMode() {
+    return 1; // csu
+}
+int Z7SimLine::GetLineBuildOut() {
+    return m_setup.buildOut;
+}

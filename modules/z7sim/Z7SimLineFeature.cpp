@@ -1,0 +1,103 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "Z7SimLineFeature.h"
+
+#include <algorithm>
+#include <array>
+#include <memory>
+#include <utility>
+
+#include "LineSource.h"
+#include "LineStatusDelivery.h"
+#include "ObjectAttributes.h"
+#include "Z7SimIntervalTable.h"
+#include "Z7SimLine.h"
+#include "access/DevMapBoardIf.h"
+#include "boardplatform/isdn_channels.h"
+
+namespace {
+
+constexpr std::size_t kMaxNameLength = 63;
+/// Of an E1 line, one per time slot.
+constexpr std::size_t kMostChannels = 32;
+
+/// What DS1-MIB calls a line's set-up, as far as the platform tells; the rest as lines of this type
+/// are usually set up.
+LineSetup readSetup(long device, int number) {
+    LineSetup setup;
+    setup.name = textAttribute(device, "NAME").substr(0, kMaxNameLength);
+    setup.circuit = textAttribute(device, "CIRCUIT");
+    setup.type = numberAttributeOr(device, kDS1LineType, static_cast<int>(DS1LineType::esf));
+    bool const esf = setup.format() == LineFormat::esf;
+    setup.number = numberAttributeOr(device, "LINE_NUMBER", number);
+    setup.coding = numberAttributeOr(device, "LINE_CODING", setup.isT1() ? 2 : 3); // B8ZS, HDB3
+    setup.length = numberAttributeOr(device, "LINE_LENGTH", 0);
+    setup.buildOut = numberAttributeOr(device, "LINE_BUILD_OUT", 1);  // not applicable
+    setup.clockSource = numberAttributeOr(device, "CLOCK_SOURCE", 1); // loop timing
+    setup.fdl = numberAttributeOr(device, "FDL", esf ? 2 : 8);        // ANSI T1.403, none
+    std::array<char, kMostChannels> states{};
+    setup.channelized =
+        bytesAttribute(device, kISDNChannelStates, states.data(), states.size()) > 0;
+    // Message oriented where a channel signals for the others, else none.
+    setup.signalMode = numberAttributeOr(device, "SIGNAL_MODE", setup.channelized ? 4 : 1);
+    return setup;
+}
+
+} // namespace
+
+Z7SimLineFeature::Z7SimLineFeature(std::uint64_t number) : m_number(number) {
+    SetFeatureName("DS1");
+}
+
+Z7SimLineFeature::~Z7SimLineFeature() = default;
+
+ReferenceCounter<Z7SimLineFeature> Z7SimLineFeature::make(long board) {
+    LineStatusDelivery& delivery = LineStatusDelivery::instance();
+    ReferenceCounter<Z7SimLineFeature> feature(new Z7SimLineFeature(delivery.reserve()));
+    for (long const device : DevMapBoardIf(board).ListAllDevices())
+        feature->add(device);
+    if (feature->m_lines.empty()) return {};
+    delivery.open(feature->m_number, feature);
+    return feature;
+}
+
+void Z7SimLineFeature::add(long device) {
+    auto const source = std::make_shared<PlatformLine>(device);
+    DS1LineCounters counters{};
+    if (!source->read(counters)) return;
+    auto const place = static_cast<int>(m_lines.size());
+    LineSetup setup = readSetup(device, place + 1);
+    auto const state = std::make_shared<LineState>(m_number, place);
+    ReferenceCounter<DS1IntervalTable> const intervals(
+        new Z7SimIntervalTable(setup.format(), source, state, source->past()));
+    m_lines.emplace_back(new Z7SimLine(std::move(setup), state, intervals));
+    m_devices.push_back(device);
+}
+
+int Z7SimLineFeature::GetNumberOfLines() {
+    return static_cast<int>(m_lines.size());
+}
+
+int Z7SimLineFeature::NotifyLineStatusListeners(ReferenceCounter<DS1LineDevice> line,
+                                                DS1LineStatusEnum status) {
+    ReferenceCounter<DS1LineStatusEvent> const event(
+        new DS1LineStatusEvent(status, std::move(line)));
+    for_each_listener<DS1LineStatusListener>(
+        m_listeners, this, [&](auto* listener) { listener->ProcessLineStatusEvent(event); });
+    return 0;
+}
+
+void Z7SimLineFeature::Withdraw() {
+    LineStatusDelivery::instance().close(m_number);
+}
+
+ReferenceCounter<DS1LineDevice> Z7SimLineFeature::lineAt(int i) {
+    auto const place = static_cast<std::size_t>(i);
+    if (i < 0 || place >= m_lines.size()) return {};
+    return m_lines[place];
+}
+
+ReferenceCounter<DS1LineDevice> Z7SimLineFeature::lineOfDevice(long device) {
+    auto const found = std::find(m_devices.begin(), m_devices.end(), device);
+    if (found == m_devices.end()) return {};
+    return m_lines[static_cast<std::size_t>(found - m_devices.begin())];
+}

@@ -1,0 +1,87 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// A line whose changes are added up, interval by interval.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+
+#include <array>
+#include <ostream>
+#include <vector>
+
+#include <gtest/gtest.h>
+
+#include "LinePerformance.h"
+
+struct LineCountsField {
+    char const* name;
+    std::int32_t LineCounts::*count;
+};
+
+inline constexpr std::array kLineCountsFields{
+    LineCountsField{"ES", &LineCounts::errorSeconds},
+    LineCountsField{"SES", &LineCounts::severelyErrorSeconds},
+    LineCountsField{"SEFS", &LineCounts::severelyErrorFramingSeconds},
+    LineCountsField{"UAS", &LineCounts::unavailableSeconds},
+    LineCountsField{"CSS", &LineCounts::controlledSlipSeconds},
+    LineCountsField{"PCV", &LineCounts::pathCodingViolations},
+    LineCountsField{"LES", &LineCounts::lineErrorSeconds},
+    LineCountsField{"BES", &LineCounts::burstyErrorSeconds},
+    LineCountsField{"DM", &LineCounts::degradedMinutes},
+    LineCountsField{"LCV", &LineCounts::lineCodeViolations},
+};
+
+inline void PrintTo(LineCounts const& counts, std::ostream* out) {
+    for (auto const& field : kLineCountsFields)
+        if (counts.*field.count != 0) *out << field.name << ' ' << counts.*field.count << ' ';
+}
+
+inline void PrintTo(LineFormat format, std::ostream* out) {
+    constexpr std::array kNames{"Esf", "D4", "E1", "E1Crc"};
+    *out << kNames.at(static_cast<std::size_t>(format));
+}
+
+inline bool hasNegativeCount(LineCounts const& counts) {
+    for (auto const& field : kLineCountsFields)
+        if (counts.*field.count < 0) return true;
+    return false;
+}
+
+/// Any change that makes a count negative, or that falls into an interval there never was, fails
+/// the test.
+class CountedLine {
+  public:
+    explicit CountedLine(LineFormat format) : m_line(format) {}
+
+    /// Answers what the (last) second changed.
+    LinePerformance::Change count(LineSecond const& second, int times = 1) {
+        LinePerformance::Change change;
+        for (int i = 0; i < times; ++i) {
+            change = m_line.count(second);
+            add(change.running, m_intervals.back());
+            if (m_intervals.size() > 1)
+                add(change.previous, m_intervals[m_intervals.size() - 2]);
+            else
+                EXPECT_EQ(change.previous, LineCounts());
+        }
+        return change;
+    }
+    void closeInterval() {
+        m_line.closeInterval();
+        m_intervals.emplace_back();
+    }
+    bool unavailable() const { return m_line.unavailable(); }
+    LineCounts const& running() const { return m_intervals.back(); }
+    LineCounts const& previous() const { return m_intervals.at(m_intervals.size() - 2); }
+    /// The oldest first; the last one is running.
+    std::vector<LineCounts> const& intervals() const { return m_intervals; }
+
+  private:
+    static void add(LineCounts const& change, LineCounts& counts) {
+        counts += change;
+        EXPECT_FALSE(hasNegativeCount(counts)) << testing::PrintToString(counts);
+    }
+
+    LinePerformance m_line;
+    std::vector<LineCounts> m_intervals{1};
+};
