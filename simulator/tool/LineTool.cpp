@@ -139,7 +139,7 @@ void addLineCommands(CLI::App& app, Connect connect, std::function<void()>& chos
         ->add_flag("--json", options->json, "The raw reply");
 
     addErrorOptions(*addChange("errors", "Count errors at once", addErrors), options->errors,
-                    CLI::Range(0.0, 4294967295.0), "How many of each kind");
+                    CLI::Range(std::int64_t(0), std::int64_t(UINT32_MAX)), "How many of each kind");
 
     addErrorOptions(
         *addChange("rates", "Set steady errors; other kinds stay as they are", setRates),

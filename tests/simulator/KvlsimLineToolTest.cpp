@@ -117,6 +117,25 @@ TEST_F(KvlsimLineToolTest, ShowDescribesLineAndChannels) {
     EXPECT_THAT(text, HasSubstr(R"(channels {"bearers":30,"signalling":"l2"})"));
 }
 
+TEST_F(KvlsimLineToolTest, InsertedBoardBringsItsLinesAndChannels) {
+    succeed({"insert", write("board.yaml", "handle: 50\n"
+                                           "attributes: {SERIAL_NUMBER: \"FILE\"}\n"
+                                           "devices:\n"
+                                           "  - handle: 501\n"
+                                           "    type: 514\n"
+                                           "    line: {type: e1, alarms: [rai], errors: {slips: "
+                                           "0.25}, past: {seconds: 100}}\n"
+                                           "    channels: {bearers: 4, signalling: inactive}\n")});
+    EXPECT_EQ(line(501)["alarms"], json::array({"rai"}));
+    EXPECT_EQ(line(501)["rates"]["slips"], 0.25);
+    EXPECT_GE(line(501)["seconds"], 100);
+    EXPECT_EQ(trunk(501)["channels"].size(), 4U);
+    EXPECT_EQ(trunk(501)["signalling"], "inactive");
+    succeed({"remove", "50"});
+    EXPECT_EQ(line(501), json());
+    EXPECT_EQ(trunk(501), json());
+}
+
 TEST_F(KvlsimLineToolTest, CallsAreSetUpAndReleased) {
     EXPECT_EQ(succeed({"call", "setup", "301"}), "channel 1\n");
     EXPECT_EQ(succeed({"call", "setup", "301", "5", "--state", "connecting"}), "channel 5\n");
