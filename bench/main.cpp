@@ -24,6 +24,10 @@ int main(int argc, char** argv) {
         {"walk of 10,000 boards by index", 5.0},
         {"one administrative event to the agent's listener", 4.0},
         {"one status to all of 10,000 boards", 5.0},
+        {"one second of 1,000 tables", 2.0},
+        {"one second of 10,000 tables", 2.0},
+        {"one second of 10,000 lines", 2.0},
+        {"one second, from 1,000 to 10,000 tables", 12.0},
     });
     benchmark::RunSpecifiedBenchmarks(&reporter);
     benchmark::Shutdown();

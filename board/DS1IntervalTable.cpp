@@ -18,7 +18,9 @@ int DS1IntervalTable::GetTimeElapsed() {
 }
 
 int DS1IntervalTable::GetValidIntervals() {
-    return m_wrapped.load(std::memory_order_relaxed) ? kIntervals : m_next - m_oldest;
+    // The ring is marked full before its places wrap around, and so it is asked after them.
+    int const closed = m_next - m_oldest;
+    return m_wrapped.load(std::memory_order_relaxed) ? kIntervals : closed;
 }
 
 int DS1IntervalTable::GetErrorSeconds(int n) {
@@ -68,10 +70,12 @@ int DS1IntervalTable::GetTrueIndex(int n) {
 
 int DS1IntervalTable::ArchiveInterval(DS1Interval interval) {
     m_ring[static_cast<std::size_t>(m_next)] = interval;
-    m_next = (m_next + 1) % kIntervals;
+    int const next = (m_next + 1) % kIntervals;
+    bool const full = next == m_oldest;
+    if (full) m_wrapped.store(true, std::memory_order_relaxed);
+    m_next = next;
     m_timeElapsed = 0;
-    if (m_next == m_oldest) {
-        m_wrapped.store(true, std::memory_order_relaxed);
+    if (full) {
         m_oldest = (m_next + 1) % kIntervals;
         m_ring[static_cast<std::size_t>(m_next)] = DS1Interval();
     }

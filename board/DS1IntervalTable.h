@@ -9,7 +9,8 @@
 #include "core/Object.h"
 #include "platform/Schedulable.h"
 
-/// A counter that one thread changes while others read it. Behaves like the number it holds.
+/// A counter that one thread changes while others read it. Behaves like the number it holds. Who
+/// reads a value also sees what was done before it was set.
 class DS1Counter {
   public:
     DS1Counter(std::int32_t value = 0) : m_value(value) {}
@@ -19,10 +20,10 @@ class DS1Counter {
         return *this;
     }
     DS1Counter& operator=(std::int32_t value) {
-        m_value.store(value, std::memory_order_relaxed);
+        m_value.store(value, std::memory_order_release);
         return *this;
     }
-    operator std::int32_t() const { return m_value.load(std::memory_order_relaxed); }
+    operator std::int32_t() const { return m_value.load(std::memory_order_acquire); }
     /// Requires that no other thread changes the counter.
     DS1Counter& operator+=(std::int32_t by) { return *this = *this + by; }
 

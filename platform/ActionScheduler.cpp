@@ -5,7 +5,18 @@
 #include <limits>
 #include <utility>
 
-ActionScheduler::~ActionScheduler() = default;
+namespace {
+
+bool earlier(SchedItem const* a, SchedItem const* b) {
+    return a->due < b->due;
+}
+
+} // namespace
+
+ActionScheduler::~ActionScheduler() {
+    for (SchedItem const* item : m_list)
+        delete item;
+}
 
 int ActionScheduler::AddPeriodic(Schedulable* target, long period) {
     lock_list();
@@ -29,45 +40,53 @@ bool ActionScheduler::check_on_list(Schedulable* target) {
 
 ActionScheduler::List::iterator ActionScheduler::find_item_on_list(Schedulable* target) {
     return std::find_if(m_list.begin(), m_list.end(),
-                        [=](auto const& entry) { return entry.second->target == target; });
+                        [=](SchedItem const* item) { return item->target == target; });
 }
 
 void ActionScheduler::insert(SchedItem* item) {
-    m_list.emplace(item->due, item);
+    m_list.insert(firstAfter(item->due), item);
 }
 
 void ActionScheduler::run_pass(long now) {
     if (now >= m_nextWakeUp)
         callDue(now);
     else if (!m_list.empty())
-        m_nextWakeUp = m_list.begin()->first;
+        m_nextWakeUp = m_list.front()->due;
     if (m_list.empty()) m_nextWakeUp = kNever;
 }
 
+ActionScheduler::List::iterator ActionScheduler::firstAfter(long time) {
+    return std::upper_bound(m_list.begin(), m_list.end(), time,
+                            [](long limit, SchedItem const* item) { return limit < item->due; });
+}
+
 void ActionScheduler::callDue(long now) {
+    // Thousands of entries of one period come by every second: they keep their places.
+    auto const notDue = firstAfter(now);
+    auto kept = m_list.begin();
     long next = kNever;
-    while (!m_list.empty() && m_list.begin()->first <= now) {
-        SchedItem* const item = m_list.begin()->second;
+    long latest = std::numeric_limits<long>::min();
+    bool inOrder = true;
+    for (auto entry = m_list.begin(); entry != notDue; ++entry) {
+        SchedItem* const item = *entry;
         item->target->ScheduledAction();
-        // The list's nodes are used again: thousands of entries come by every second.
-        auto node = m_list.extract(m_list.begin());
         if (item->period <= 0) {
             delete item;
             continue;
         }
         item->due = add_saturated(item->due, item->period);
-        node.key() = item->due;
         next = std::min(next, item->due);
-        m_called.push_back(std::move(node));
+        inOrder = inOrder && latest <= item->due;
+        latest = std::max(latest, item->due);
+        *kept++ = item;
     }
-    for (auto& node : m_called) {
-        bool const last = m_list.empty() || m_list.rbegin()->first <= node.key();
-        if (last)
-            m_list.insert(m_list.end(), std::move(node));
-        else
-            m_list.insert(std::move(node));
+    auto const rest = m_list.erase(kept, notDue);
+    if (!inOrder) std::stable_sort(m_list.begin(), rest, earlier);
+    if (rest != m_list.end() && latest >= (*rest)->due) {
+        // Behind those that are due at the same time and were not called.
+        auto const called = std::rotate(m_list.begin(), rest, m_list.end());
+        std::inplace_merge(m_list.begin(), called, m_list.end(), earlier);
     }
-    m_called.clear();
     m_nextWakeUp = next;
 }
 

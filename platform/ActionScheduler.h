@@ -2,7 +2,6 @@
 // The scheduler's bookkeeping: who is called back when.
 #pragma once
 
-#include <map>
 #include <vector>
 
 #include "platform/Runnable.h"
@@ -37,7 +36,7 @@ class KVLOAM_API ActionScheduler : public Runnable {
   protected:
     ActionScheduler() = default;
 
-    using List = std::multimap<long, SchedItem*>;
+    using List = std::vector<SchedItem*>;
 
     /// What "nothing to wait for" is written as.
     static constexpr long kNever = 0x7FFFFFFF;
@@ -79,10 +78,10 @@ class KVLOAM_API ActionScheduler : public Runnable {
     static long add_saturated(long time, long seconds);
 
     long m_nextWakeUp = kNever;
-    List m_list;
+    List m_list; ///< owned items by due time; those due at the same time as they were entered
 
   private:
     void callDue(long now);
-
-    std::vector<List::node_type> m_called; ///< empty between passes
+    /// The first entry that is due after `time`.
+    List::iterator firstAfter(long time);
 };

@@ -60,8 +60,9 @@ int ActionScheduler_pthread::Remove(Schedulable* target) {
     auto const found = find_item_on_list(target);
     bool const known = found != m_list.end();
     if (known) {
-        delete found->second;
+        SchedItem const* const item = *found;
         m_list.erase(found);
+        delete item;
         pthread_cond_signal(&m_listChanged);
     }
     unlock_list();
@@ -72,9 +73,9 @@ int ActionScheduler_pthread::ChangePeriod(Schedulable* target, long period) {
     lock_list();
     auto const found = find_item_on_list(target);
     bool const changes =
-        found != m_list.end() && found->second->period >= 1 && found->second->period != period;
+        found != m_list.end() && (*found)->period >= 1 && (*found)->period != period;
     if (changes) {
-        SchedItem* const item = found->second;
+        SchedItem* const item = *found;
         m_list.erase(found);
         item->due = add_saturated(item->due, add_saturated(period, -item->period));
         item->period = period;

@@ -43,9 +43,10 @@ class KVLOAM_API ActionScheduler_pthread : public ActionScheduler, public KVLThr
     int lock_list() override;
     int unlock_list() override;
 
-  private:
+    /// Null until the first `GetScheduler`. A driven scheduler may put itself here before that.
     static ActionScheduler_pthread* s_actionScheduler;
 
+  private:
     timespec m_deadline{};
     pthread_mutex_t m_listMutex;
     pthread_mutexattr_t m_listMutexAttributes;

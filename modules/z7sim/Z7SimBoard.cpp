@@ -25,7 +25,9 @@ Z7SimBoard::Z7SimBoard(long id) : Z7Board(id) {
     readLogicalID();
 }
 
-Z7SimBoard::~Z7SimBoard() = default;
+Z7SimBoard::~Z7SimBoard() {
+    withdrawFeatures();
+}
 
 // Queries: answered from the record or from the board's own state, never by asking the platform.
 
@@ -200,17 +202,17 @@ int Z7SimBoard::StopBoard() {
 }
 
 int Z7SimBoard::create_extended_features() {
-    offer(makeExtendedFeatures(GetBoardIdentifier()));
+    // Features that nobody will withdraw must not be made.
+    if (m_startFailure == nullptr) offer(makeExtendedFeatures(GetBoardIdentifier()));
     return 0;
 }
 
 int Z7SimBoard::create_ipethernet_feature() {
-    offer(makeNetworkFeatures(GetBoardIdentifier()));
+    if (m_startFailure == nullptr) offer(makeNetworkFeatures(GetBoardIdentifier()));
     return 0;
 }
 
 void Z7SimBoard::offer(FeatureList features) {
-    if (m_startFailure != nullptr) return;
     for (auto& feature : features) {
         AddFeature(feature);
         m_offered.push_back(std::move(feature));
@@ -218,11 +220,15 @@ void Z7SimBoard::offer(FeatureList features) {
 }
 
 int Z7SimBoard::destroy_extended_features() {
+    withdrawFeatures();
+    return 0;
+}
+
+void Z7SimBoard::withdrawFeatures() {
     for (auto const& feature : m_offered) {
         if (auto* const withdrawable = dynamic_cast<Withdrawable*>(feature.get()))
             withdrawable->Withdraw();
         RemoveFeature(feature);
     }
     m_offered.clear();
-    return 0;
 }

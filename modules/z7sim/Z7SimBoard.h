@@ -51,11 +51,12 @@ class Z7SimBoard final : public Z7Board {
     int StopBoard() override;
     int create_ipethernet_feature() override;
     int create_extended_features() override;
-    /// Takes all features away, the network's too.
+    /// Takes all features away, the network's too, and stops those that follow the platform.
     int destroy_extended_features() override;
 
   private:
     void offer(FeatureList features);
+    void withdrawFeatures();
     bool answers();
     void readLogicalID();
     int giveUp(char const* reason);

@@ -9,6 +9,7 @@
 #include "board/Feature.h"
 #include "board/InterfaceFeature.h"
 #include "core/ReferenceCounter.h"
+#include "tests/support/BareInterface.h"
 #include "tests/support/Slots.h"
 
 namespace {
@@ -64,30 +65,8 @@ TEST(FeatureHelperTest, MinAndMaxPickByValue) {
 }
 
 /// Leaves every query to the base.
-class BareEthernet final : public KVL::Ethernet {
+class BareEthernet final : public BareInterface<KVL::Ethernet> {
   public:
-    int GetDescription(std::string& text) override { return Ethernet::GetDescription(text); }
-    int GetType() override { return Ethernet::GetType(); }
-    int GetMTU() override { return Ethernet::GetMTU(); }
-    int GetSpeed() override { return Ethernet::GetSpeed(); }
-    int GetPhysAddress(char* buffer, int& length) override {
-        return Ethernet::GetPhysAddress(buffer, length);
-    }
-    int GetAdminStatus() override { return Ethernet::GetAdminStatus(); }
-    int SetAdminStatus(int status) override { return Ethernet::SetAdminStatus(status); }
-    int GetOperStatus() override { return Ethernet::GetOperStatus(); }
-    int GetLastChange(int& seconds, int& microseconds) override {
-        return Ethernet::GetLastChange(seconds, microseconds);
-    }
-    int GetInOctets() override { return Ethernet::GetInOctets(); }
-    int GetInUcastPkts() override { return Ethernet::GetInUcastPkts(); }
-    int GetInDiscards() override { return Ethernet::GetInDiscards(); }
-    int GetInErrors() override { return Ethernet::GetInErrors(); }
-    int GetInUnknownProtos() override { return Ethernet::GetInUnknownProtos(); }
-    int GetOutOctets() override { return Ethernet::GetOutOctets(); }
-    int GetOutUcastPkts() override { return Ethernet::GetOutUcastPkts(); }
-    int GetOutDiscards() override { return Ethernet::GetOutDiscards(); }
-    int GetOutErrors() override { return Ethernet::GetOutErrors(); }
     int GetAlignmentErrors() override { return KVL::kNotSupported; }
     int GetFCSErrors() override { return KVL::kNotSupported; }
     int GetSingleCollisionFrames() override { return KVL::kNotSupported; }

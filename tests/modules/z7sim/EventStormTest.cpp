@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <array>
 #include <atomic>
-#include <mutex>
 #include <random>
 #include <string>
 #include <string_view>
@@ -14,6 +13,7 @@
 
 #include "board/BoardManager.h"
 #include "core/ReferenceTable.h"
+#include "tests/modules/z7sim/FaultLog.h"
 #include "tests/modules/z7sim/OpenFactory.h"
 #include "tests/support/SimulatedPlatform.h"
 
@@ -31,23 +31,6 @@ constexpr std::array<int, 3> kNumbers = {5, 0x0BAD0BAD, -77};
 constexpr std::array<std::string_view, 4> kMessageTexts = {
     "", "board does not answer", "board is reported failed by the platform",
     "another board answers in its place"};
-
-/// Keeps the first fault that a thread finds.
-class FaultLog {
-  public:
-    void add(std::string const& fault) {
-        std::scoped_lock const guard(m_mutex);
-        if (m_first.empty()) m_first = fault;
-    }
-    std::string first() {
-        std::scoped_lock const guard(m_mutex);
-        return m_first;
-    }
-
-  private:
-    std::mutex m_mutex;
-    std::string m_first;
-};
 
 /// Asks a board everything and judges the answers.
 class Reader {

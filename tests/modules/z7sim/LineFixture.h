@@ -32,15 +32,24 @@ class LineClock {
     static inline std::atomic<std::chrono::nanoseconds> s_now{};
 };
 
-/// A table whose ticks the test drives, for as long as this lives.
-inline void takeOffScheduler(DS1IntervalTable* table) {
-    ActionScheduler_pthread::GetScheduler()->Remove(table);
-}
+/// The process's scheduler, standing still: no tick but the test's own. Made before any line.
+class StillScheduler final : public ActionScheduler_pthread {
+  public:
+    static void install() {
+        if (s_actionScheduler == nullptr) s_actionScheduler = new StillScheduler;
+    }
+
+  private:
+    StillScheduler() : ActionScheduler_pthread([] { return 0L; }) {}
+};
 
 /// Board 5 with line 51, as the reference factory makes it.
 class LineTest : public testing::Test {
   protected:
-    LineTest() { m_factory->SetPingInterval(0); }
+    LineTest() {
+        StillScheduler::install();
+        m_factory->SetPingInterval(0);
+    }
     ~LineTest() override {
         if (m_feature.get() != nullptr) m_feature->Withdraw();
     }
@@ -73,7 +82,6 @@ class LineTest : public testing::Test {
         m_feature = {dynamic_cast<Z7SimLineFeature*>(feature.get())};
         m_line = m_feature->GetFirstDevice();
         m_table = m_line->GetIntervalTable();
-        takeOffScheduler(m_table.get());
     }
 
     /// `count` seconds pass, and each is counted.

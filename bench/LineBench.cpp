@@ -1,0 +1,89 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// One second of DS1 lines as the reference module counts them.
+#include <cstddef>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include <benchmark/benchmark.h>
+
+#include "DrivenScheduler.h"
+#include "LineSource.h"
+#include "LineState.h"
+#include "Z7SimIntervalTable.h"
+#include "core/ReferenceCounter.h"
+#include "simulator/Control.h"
+
+namespace {
+
+/// A line's counters in memory: a few errors every second.
+class CountingLine final : public LineSource {
+  public:
+    bool read(DS1LineCounters& counters) override {
+        ++m_counters.seconds;
+        m_counters.pathCodeViolations += 3;
+        m_counters.lineCodeViolations += 2;
+        counters = m_counters;
+        return true;
+    }
+
+  private:
+    DS1LineCounters m_counters{};
+};
+
+using Table = ReferenceCounter<DS1IntervalTable>;
+
+/// The benchmark ticks the table, not the process's scheduler.
+Table tableOf(std::shared_ptr<LineSource> source) {
+    Table table(new Z7SimIntervalTable(LineFormat::esf, std::move(source),
+                                       std::make_shared<LineState>(0, 0), {}));
+    ActionScheduler_pthread::GetScheduler()->Remove(table.get());
+    return table;
+}
+
+std::vector<Table> makeTables(std::size_t count) {
+    std::vector<Table> tables;
+    for (std::size_t i = 0; i < count; ++i)
+        tables.push_back(tableOf(std::make_shared<CountingLine>()));
+    return tables;
+}
+
+void oneSecondOfLinesOurs(benchmark::State& state) {
+    auto const tables = makeTables(10000);
+    DrivenScheduler scheduler;
+    for (auto const& table : tables)
+        scheduler.enter(table.get());
+    for (auto _ : state)
+        scheduler.passOfNextSecond();
+}
+
+void oneSecondOfLinesPeer(benchmark::State& state) {
+    auto const tables = makeTables(10000);
+    std::vector<DS1IntervalTable*> list;
+    for (auto const& table : tables)
+        list.push_back(table.get());
+    for (auto _ : state)
+        for (DS1IntervalTable* const table : list)
+            table->ScheduledAction();
+}
+
+void oneLineInMemory(benchmark::State& state) {
+    Table const table = tableOf(std::make_shared<CountingLine>());
+    for (auto _ : state)
+        table->ScheduledAction();
+}
+
+void oneLineOfThePlatform(benchmark::State& state) {
+    kvlsim::loadChassis("boards: [{handle: 1, attributes: {SERIAL_NUMBER: A}, devices: [{handle: "
+                        "11, type: 501, line: {type: esf}}]}]");
+    Table const table = tableOf(std::make_shared<PlatformLine>(11));
+    for (auto _ : state)
+        table->ScheduledAction();
+}
+
+BENCHMARK(oneSecondOfLinesOurs)->Name("one second of 10,000 lines/ours");
+BENCHMARK(oneSecondOfLinesPeer)->Name("one second of 10,000 lines/peer");
+BENCHMARK(oneLineInMemory)->Name("one second of a line, counters in memory");
+BENCHMARK(oneLineOfThePlatform)->Name("one second of a line, counters of the simulated platform");
+
+} // namespace

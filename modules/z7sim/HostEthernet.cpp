@@ -1,0 +1,158 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "HostEthernet.h"
+
+#include <net/if.h>
+#include <net/if_arp.h>
+
+#include <algorithm>
+#include <array>
+#include <limits>
+#include <string_view>
+#include <utility>
+
+#include "PhysAddress.h"
+
+namespace {
+
+/// The last 32 bits, which an agent sends as they are.
+int low32(std::int64_t number) {
+    return static_cast<int>(static_cast<std::uint32_t>(number));
+}
+
+struct NamedState {
+    std::string_view name;
+    int state;
+};
+
+constexpr int kOperUp = 1;
+constexpr int kOperUnknown = 4;
+/// The kernel's names for IF-MIB's ifOperStatus, without "unknown".
+constexpr std::array<NamedState, 6> kOperStates = {{{"up", kOperUp},
+                                                    {"down", 2},
+                                                    {"testing", 3},
+                                                    {"dormant", 5},
+                                                    {"notpresent", 6},
+                                                    {"lowerlayerdown", 7}}};
+/// For EtherLike-MIB's dot3StatsDuplexStatus.
+constexpr std::array<NamedState, 3> kDuplexStates = {{{"unknown", 1}, {"half", 2}, {"full", 3}}};
+
+template <std::size_t size>
+int stateNamed(std::array<NamedState, size> const& states, std::string_view name, int otherwise) {
+    auto const found = std::ranges::find(states, name, &NamedState::name);
+    return found == states.end() ? otherwise : found->state;
+}
+
+} // namespace
+
+HostEthernet::HostEthernet(HostDevice device)
+    : Z7SimEthernet("host interface " + device.name()), m_device(std::move(device)) {}
+
+HostEthernet::~HostEthernet() = default;
+
+int HostEthernet::number(char const* file) const {
+    auto const value = m_device.number(file);
+    return value ? low32(*value) : KVL::kNotSupported;
+}
+
+int HostEthernet::GetType() {
+    auto const type = m_device.number("type");
+    if (!type) return KVL::kNotSupported;
+    if (*type == ARPHRD_ETHER) return kTypeEthernet;
+    return *type == ARPHRD_LOOPBACK ? kTypeLoopback : kTypeOther;
+}
+
+int HostEthernet::GetMTU() {
+    return number("mtu");
+}
+
+int HostEthernet::GetSpeed() {
+    auto const megabits = m_device.number("speed");
+    if (!megabits || *megabits < 0) return KVL::kNotSupported; // -1: no link
+    std::int64_t const most = std::numeric_limits<std::uint32_t>::max();
+    return low32(*megabits > most / 1'000'000 ? most : *megabits * 1'000'000);
+}
+
+int HostEthernet::GetPhysAddress(char* buffer, int& length) {
+    return answerPhysAddress(parsePhysAddress(m_device.text("address").value_or("")), buffer,
+                             length);
+}
+
+int HostEthernet::GetAdminStatus() {
+    auto const flags = m_device.flags();
+    if (!flags) return KVL::kNotSupported;
+    return (*flags & IFF_UP) != 0 ? 1 : 2;
+}
+
+int HostEthernet::GetOperStatus() {
+    auto const state = m_device.text("operstate");
+    if (!state) return KVL::kNotSupported;
+    // A driver without states, the loopback's for one, is "unknown"; it runs while it is up and has
+    // a carrier.
+    bool const runs = GetAdminStatus() == 1 && m_device.number("carrier") == 1;
+    return stateNamed(kOperStates, *state, runs ? kOperUp : kOperUnknown);
+}
+
+int HostEthernet::GetInOctets() {
+    return number("statistics/rx_bytes");
+}
+
+int HostEthernet::GetInUcastPkts() {
+    return number("statistics/rx_packets");
+}
+
+int HostEthernet::GetInDiscards() {
+    return number("statistics/rx_dropped");
+}
+
+int HostEthernet::GetInErrors() {
+    return number("statistics/rx_errors");
+}
+
+int HostEthernet::GetOutOctets() {
+    return number("statistics/tx_bytes");
+}
+
+int HostEthernet::GetOutUcastPkts() {
+    return number("statistics/tx_packets");
+}
+
+int HostEthernet::GetOutDiscards() {
+    return number("statistics/tx_dropped");
+}
+
+int HostEthernet::GetOutErrors() {
+    return number("statistics/tx_errors");
+}
+
+int HostEthernet::GetAlignmentErrors() {
+    return number("statistics/rx_frame_errors");
+}
+
+int HostEthernet::GetFCSErrors() {
+    return number("statistics/rx_crc_errors");
+}
+
+int HostEthernet::GetSQETestErrors() {
+    return number("statistics/tx_heartbeat_errors");
+}
+
+int HostEthernet::GetLateCollisions() {
+    return number("statistics/tx_window_errors");
+}
+
+int HostEthernet::GetExcessiveCollisions() {
+    return number("statistics/tx_aborted_errors");
+}
+
+int HostEthernet::GetCarrierSenseErrors() {
+    return number("statistics/tx_carrier_errors");
+}
+
+int HostEthernet::GetFrameTooLongs() {
+    return number("statistics/rx_length_errors");
+}
+
+int HostEthernet::GetDuplexStatus() {
+    auto const duplex = m_device.text("duplex");
+    return duplex ? stateNamed(kDuplexStates, *duplex, KVL::kNotSupported) : KVL::kNotSupported;
+}

@@ -1,0 +1,70 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The ISDN channels of a board, whose states follow the platform's messages.
+#pragma once
+
+#include <atomic>
+#include <string>
+
+#include "z7/ISDNChannelZ7.h"
+
+/// A channel's state, told by messages and, before the first of them, read from the platform. Any
+/// thread may ask.
+template <class State>
+class ChannelState {
+  public:
+    int get() const { return m_state; }
+    /// Takes what the platform answered, unless a message has come already: what was read may be
+    /// older than the message, and if it is not, there are more messages to come.
+    void adopt(State state) {
+        int unread = kUnread;
+        m_state.compare_exchange_strong(unread, state);
+    }
+    /// Takes what a message said. Returns whether that is a change.
+    bool change(State state) { return m_state.exchange(state) != state; }
+
+  private:
+    static constexpr int kUnread = 0;
+    std::atomic<int> m_state{kUnread};
+};
+
+/// A bearer channel of a trunk.
+class Z7SimBChannel final : public ISDNBChannelZ7 {
+  public:
+    /// `timeSlot`: from 1. `board`: the board's index.
+    Z7SimBChannel(std::string const& name, int timeSlot, int board);
+    ~Z7SimBChannel() override;
+
+    /// All calls are dialled.
+    int GetChannelType() override;
+    int GetOperStatus() override { return m_state.get(); }
+    int GetChannelNumber() override { return m_timeSlot; }
+
+    ChannelState<ISDNBChannelStatusEnum>& state() { return m_state; }
+
+  private:
+    int const m_timeSlot;
+    ChannelState<ISDNBChannelStatusEnum> m_state;
+};
+
+/// The signalling channel of a trunk.
+class Z7SimDChannel final : public ISDNDChannelZ7 {
+  public:
+    /// `device`: the trunk's handle in the device mapper; its protocol and name are read now.
+    Z7SimDChannel(std::string const& name, long device, int bearers, int board);
+    ~Z7SimDChannel() override;
+
+    /// `KVL::kNotSupported` when the platform knows no protocol.
+    int GetProtocol() override { return m_protocol; }
+    int GetOperStatus() override { return m_state.get(); }
+    int GetBChannelCount() override { return m_bearers; }
+    /// The trunk's name.
+    int GetCallingAddress(char* address) override;
+
+    ChannelState<ISDNDChannelStatusEnum>& state() { return m_state; }
+
+  private:
+    int const m_protocol;
+    int const m_bearers;
+    std::string const m_trunkName;
+    ChannelState<ISDNDChannelStatusEnum> m_state;
+};
