@@ -230,8 +230,9 @@ void IndexFile::add(IndexRecords const& records) {
                         "INSERT INTO block (serialNumber, first, size) VALUES (?, ?, ?)");
         for (IndexBlock const& added : records.blocks)
             block.bind(1, added.serialNumber).bind(2, added.first).bind(3, added.size).run();
-        Statement entry(m_database.get(), "INSERT INTO interface (serialNumber, kind, name, ifIndex)"
-                                          " VALUES (?, ?, ?, ?)");
+        Statement entry(m_database.get(),
+                        "INSERT INTO interface (serialNumber, kind, name, ifIndex)"
+                        " VALUES (?, ?, ?, ?)");
         for (IndexEntry const& added : records.entries)
             entry.bind(1, added.serialNumber)
                 .bind(2, static_cast<std::int64_t>(added.key.kind))
@@ -253,8 +254,7 @@ void IndexFile::setAside(std::string const& why) {
     // Left behind, it would be taken for the new file's.
     std::filesystem::rename(m_path + "-journal", aside + "-journal", fault);
     log(LogLevel::Warning, m_path + ": the file of interface indices can not be read (" + why +
-                               "); it is kept as " + aside +
-                               ", and interfaces are numbered anew");
+                               "); it is kept as " + aside + ", and interfaces are numbered anew");
 }
 
 void IndexFile::giveUp(std::string const& why) {

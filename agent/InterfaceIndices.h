@@ -49,7 +49,7 @@ class InterfaceIndices {
     void makeRoom(std::string const& serialNumber, Board& board, std::size_t count);
 
     IndexFile m_file;
-    std::uint64_t m_free; ///< the first index of the next block
+    std::uint64_t m_free;                  ///< the first index of the next block
     std::map<std::string, Board> m_boards; ///< by serial number
     IndexRecords m_unsaved;
 };
