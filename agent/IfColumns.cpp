@@ -133,7 +133,10 @@ Table const& ifStackTable() {
 }
 
 std::vector<Table const*> standardTables() {
-    return {&ifTable(), &ifXTable(), &ifStackTable()};
+    return {&ifTable(),         &ifXTable(),         &ifStackTable(),
+            &dsx1ConfigTable(), &dsx1CurrentTable(), &dsx1IntervalTable(),
+            &dsx1TotalTable(),  &isdnBearerTable(),  &isdnSignalingTable(),
+            &isdnLapdTable(),   &dot3StatsTable()};
 }
 
 } // namespace kvloamd

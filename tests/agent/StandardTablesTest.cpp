@@ -89,5 +89,82 @@ TEST_F(StandardTablesTest, InterfaceCountIsThatOfTheRows) {
     EXPECT_EQ(numberAt({2, 1, 0}), 3);
 }
 
+Oid const kErroredSeconds{10, 18, 8, 1, 3};
+Oid const kLineCodeViolations{10, 18, 8, 1, 12};
+Oid const kValidData{10, 18, 8, 1, 13};
+
+Oid with(Oid column, std::initializer_list<std::uint32_t> index) {
+    column.insert(column.end(), index);
+    return column;
+}
+
+TEST_F(StandardTablesTest, IntervalIsFoundByLineAndNumber) {
+    EXPECT_EQ(numberAt(with(kErroredSeconds, {10, 2})), 100200);
+    EXPECT_EQ(numberAt(with(kLineCodeViolations, {30, 96})), 309609);
+    EXPECT_EQ(numberAt({10, 18, 8, 1, 1, 30, 5}), 30);
+    EXPECT_EQ(numberAt({10, 18, 8, 1, 2, 30, 5}), 5);
+}
+
+TEST_F(StandardTablesTest, IntervalsThatWereNeverClosedHaveNoInstance) {
+    for (auto const& index : std::initializer_list<std::initializer_list<std::uint32_t>>{
+             {10, 0}, {10, 3}, {20, 1}, {30, 97}, {40, 1}, {50, 1}, {10}, {10, 1, 1}, {}})
+        EXPECT_EQ(find(with(kErroredSeconds, index)), Lookup::NoSuchInstance);
+}
+
+TEST_F(StandardTablesTest, NextIntervalIsOfTheSameLineThenOfTheNextWithAny) {
+    EXPECT_EQ(next(kErroredSeconds), with(kErroredSeconds, {10, 1}));
+    EXPECT_EQ(next(with(kErroredSeconds, {10})), with(kErroredSeconds, {10, 1}));
+    EXPECT_EQ(next(with(kErroredSeconds, {10, 1})), with(kErroredSeconds, {10, 2}));
+    EXPECT_EQ(next(with(kErroredSeconds, {10, 1, 9})), with(kErroredSeconds, {10, 2}));
+    EXPECT_EQ(next(with(kErroredSeconds, {10, 2})), with(kErroredSeconds, {30, 1}));
+    EXPECT_EQ(next(with(kErroredSeconds, {11})), with(kErroredSeconds, {30, 1}));
+    EXPECT_EQ(next(with(kErroredSeconds, {20, 4294967295U})), with(kErroredSeconds, {30, 1}));
+    EXPECT_EQ(next(with(kErroredSeconds, {30, 96})), with({10, 18, 8, 1, 4}, {10, 1}));
+}
+
+TEST_F(StandardTablesTest, NextOrEqualIntervalIsTheIntervalItself) {
+    EXPECT_EQ(next(with(kErroredSeconds, {10, 2}), true), with(kErroredSeconds, {10, 2}));
+    EXPECT_EQ(next(with(kErroredSeconds, {10, 0}), true), with(kErroredSeconds, {10, 1}));
+    EXPECT_EQ(next(with(kErroredSeconds, {10, 3}), true), with(kErroredSeconds, {30, 1}));
+}
+
+TEST_F(StandardTablesTest, WalkOfTheIntervalsIsStrictlyIncreasingAndFindsEveryStep) {
+    Oid name{10, 18, 8};
+    int steps = 0;
+    for (Oid after = next(name); startsWith(after, Oid{10, 18, 8}); after = next(name), ++steps) {
+        ASSERT_TRUE(compare(name, after) < 0);
+        name = after;
+        EXPECT_EQ(find(name), Lookup::Found);
+    }
+    EXPECT_EQ(steps, 13 * (2 + 96));
+}
+
+TEST_F(StandardTablesTest, OldestIntervalOfAFullHistoryHasNoValidData) {
+    EXPECT_EQ(numberAt(with(kValidData, {30, 95})), 1);
+    EXPECT_EQ(numberAt(with(kValidData, {30, 96})), 2);
+    EXPECT_EQ(numberAt({10, 18, 6, 1, 4, 30}), 96); // dsx1ValidIntervals
+    EXPECT_EQ(numberAt({10, 18, 6, 1, 14, 30}), 1); // dsx1InvalidIntervals
+    EXPECT_EQ(numberAt({10, 18, 6, 1, 14, 10}), 0);
+}
+
+TEST_F(StandardTablesTest, LineWithoutHistoryIsInTheTableOfLinesOnly) {
+    EXPECT_EQ(numberAt({10, 18, 6, 1, 1, 20}), 20);
+    EXPECT_EQ(find({10, 18, 6, 1, 4, 20}), Lookup::NoSuchInstance);
+    EXPECT_EQ(find({10, 18, 7, 1, 1, 20}), Lookup::NoSuchInstance);
+    EXPECT_EQ(find({10, 18, 9, 1, 2, 20}), Lookup::NoSuchInstance);
+}
+
+TEST_F(StandardTablesTest, RunningIntervalIsTheFirstRecord) {
+    EXPECT_EQ(numberAt({10, 18, 7, 1, 2, 40}), 400000);
+    EXPECT_EQ(numberAt({10, 18, 7, 1, 11, 10}), 100009);
+}
+
+TEST_F(StandardTablesTest, CountThatALineDoesNotKnowHasNoInstance) {
+    m_snapshot.interfaces.lines[0].intervals[1][9] = -2;
+    EXPECT_EQ(find(with(kLineCodeViolations, {10, 1})), Lookup::NoSuchInstance);
+    EXPECT_EQ(find(with(kErroredSeconds, {10, 1})), Lookup::Found);
+    EXPECT_EQ(next(kLineCodeViolations), with(kLineCodeViolations, {10, 2}));
+}
+
 } // namespace
 } // namespace kvloamd
