@@ -17,6 +17,8 @@
 #include "access/ExternalFaultEventAdaptor.h"
 #include "agent/BoardSource.h"
 #include "agent/Collector.h"
+#include "agent/InterfaceIndices.h"
+#include "agent/InterfaceReader.h"
 #include "agent/Log.h"
 #include "agent/ModuleLoader.h"
 #include "agent/Notifier.h"
@@ -25,6 +27,7 @@
 #include "agent/SnmpConfig.h"
 #include "agent/SnmpHandler.h"
 #include "agent/SnmpLoop.h"
+#include "agent/StandardObjects.h"
 #include "agent/StatusListener.h"
 #include "agent/Wakeup.h"
 
@@ -184,6 +187,8 @@ void serve(Options const& options, StopSignals const& stopSignals, Boards& board
     ServiceManager& services = *ServiceManager::GetInstance();
     KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
     PlatformReader platform;
+    InterfaceIndices indices(persistentDirectory() + "/ifindex.sqlite", options.interfaceBase);
+    InterfaceReader interfaces(*boards.manager.get(), indices, started);
     Collector collector(
         [&](Snapshot& snapshot) {
             snapshot.boards = boards.source.read();
@@ -192,6 +197,7 @@ void serve(Options const& options, StopSignals const& stopSignals, Boards& board
             snapshot.platformService = readPlatformService(services);
             snapshot.processes = readProcesses(statistics);
             snapshot.records = platform.read(snapshot.boards);
+            snapshot.interfaces = interfaces.read(snapshot.boards);
         },
         started, [&] { wakeup.wake(); });
     std::vector<Table const*> const allTables = tables();
@@ -201,6 +207,14 @@ void serve(Options const& options, StopSignals const& stopSignals, Boards& board
     if (!handler.serve(kObjectsPlace))
         throw std::runtime_error("the SNMP library does not let the agent serve its objects; check "
                                  "--enterprise-oid");
+    std::vector<Table const*> const allStandardTables = standardTables();
+    ObjectTree const standardTree(standardScalars(), allStandardTables);
+    SnmpHandler standardHandler(standardTree, boards.counters, kStandardArc,
+                                [&] { return collector.snapshot(); });
+    for (Oid const& place : kStandardPlaces)
+        if (!standardHandler.serve(place))
+            throw std::runtime_error("the SNMP library does not let the agent serve the standard "
+                                     "interface objects; check --enterprise-oid");
     Notifier notifier(boards.queue, options.enterprise);
     SnmpLoop loop;
     loop.watch(wakeup.descriptor(), [&] { wakeup.clear(); });

@@ -94,11 +94,15 @@ std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
                    "without it kvloamd.conf is looked for where Net-SNMP looks")
         ->type_name("FILE");
     app.add_option("--persistent-dir", options.persistentDirectory,
-                   "Where SNMPv3 engine state is kept across restarts")
+                   "Where SNMPv3 engine state and interface indices are kept across restarts")
         ->type_name("DIR");
     app.add_option("--enterprise-oid", enterprise, "The arc above KVL-OAM-MIB")
         ->type_name("OID")
         ->check(checkOid)
+        ->capture_default_str();
+    app.add_option("--interface-base", options.interfaceBase,
+                   "The lowest ifIndex that is given to an interface that has none yet")
+        ->check(CLI::Range(1, 1000000000))
         ->capture_default_str();
     app.add_option("--log-level", options.logLevel, "error, warning, info or debug")
         ->transform(CLI::CheckedTransformer(kLogLevels, CLI::ignore_case))

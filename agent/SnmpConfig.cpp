@@ -129,6 +129,11 @@ std::vector<std::string> startSnmp(Options const& options) {
     return faults;
 }
 
+std::string persistentDirectory() {
+    char const* const directory = get_persistent_directory();
+    return directory == nullptr ? std::string() : std::string(directory);
+}
+
 void stopSnmp() {
     if (!started) return;
     snmp_shutdown(kAppName);

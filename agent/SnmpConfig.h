@@ -13,6 +13,9 @@ namespace kvloamd {
 /// it, a line each. Called once, on the thread that does all SNMP, and followed by `stopSnmp`.
 std::vector<std::string> startSnmp(Options const& options);
 
+/// Where state is kept that outlives the process. After `startSnmp`.
+std::string persistentDirectory();
+
 /// Stores the state that outlives the process and lets go of everything.
 void stopSnmp();
 

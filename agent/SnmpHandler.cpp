@@ -32,6 +32,8 @@ u_char typeOf(ValueType type) {
         return ASN_INTEGER;
     case ValueType::Counter:
         return ASN_COUNTER;
+    case ValueType::Counter64:
+        return ASN_COUNTER64;
     case ValueType::Gauge:
         return ASN_GAUGE;
     case ValueType::TimeTicks:
@@ -49,6 +51,12 @@ void setValue(netsnmp_variable_list* variable, Instance const& instance) {
     if (auto const* const octets = std::get_if<std::string_view>(&instance.value)) {
         snmp_set_var_typed_value(variable, type, octets->data(), octets->size());
     } else if (auto const* const number = std::get_if<std::int64_t>(&instance.value)) {
+        if (type == ASN_COUNTER64) {
+            auto const bits = static_cast<std::uint64_t>(*number);
+            counter64 const value{bits >> 32, bits & kHighest};
+            snmp_set_var_typed_value(variable, type, &value, sizeof value);
+            return;
+        }
         // The library keeps every number of 32 bits in a long.
         long const value = static_cast<long>(*number);
         snmp_set_var_typed_value(variable, type, &value, sizeof value);
@@ -69,7 +77,7 @@ struct SnmpHandler::Call {
                       netsnmp_agent_request_info* info, netsnmp_request_info* requests);
 
     static Snapshot const& snapshotOf(SnmpHandler const& handler, netsnmp_agent_request_info* info);
-    /// The part of the variable's name below the enterprise arc. A name outside of the arc reads as
+    /// The part of the variable's name below the arc. A name outside of the arc reads as
     /// one before or after all of ours.
     Oid relative(netsnmp_variable_list const* variable, bool& orEqual) const;
     void get(netsnmp_request_info* request);
@@ -114,7 +122,7 @@ Snapshot const& SnmpHandler::Call::snapshotOf(SnmpHandler const& handler,
 }
 
 Oid SnmpHandler::Call::relative(netsnmp_variable_list const* variable, bool& orEqual) const {
-    Oid const& arc = handler.m_enterprise;
+    Oid const& arc = handler.m_arc;
     Oid asked(variable->name_length);
     std::transform(
         variable->name, variable->name + variable->name_length, asked.begin(),
@@ -145,7 +153,7 @@ void SnmpHandler::Call::getNext(netsnmp_request_info* request) {
     Oid after = relative(request->requestvb, orEqual);
     // A variable that is left alone goes to whoever serves the names after ours.
     while (handler.m_tree.next(facts, after, orEqual, instance)) {
-        name.assign(handler.m_enterprise.begin(), handler.m_enterprise.end());
+        name.assign(handler.m_arc.begin(), handler.m_arc.end());
         name.insert(name.end(), instance.name.begin(), instance.name.end());
         if (snmp_oid_compare(name.data(), name.size(), request->range_end,
                              request->range_end_len) >= 0)
@@ -178,15 +186,15 @@ void SnmpHandler::Call::getBulk(netsnmp_request_info* request) {
     }
 }
 
-SnmpHandler::SnmpHandler(ObjectTree const& tree, Counters const& counters, Oid enterprise,
+SnmpHandler::SnmpHandler(ObjectTree const& tree, Counters const& counters, Oid arc,
                          TakeSnapshot takeSnapshot)
     : m_tree(tree),
       m_counters(counters),
-      m_enterprise(std::move(enterprise)),
+      m_arc(std::move(arc)),
       m_takeSnapshot(std::move(takeSnapshot)) {}
 
 bool SnmpHandler::serve(Oid const& place) {
-    std::vector<oid> root(m_enterprise.begin(), m_enterprise.end());
+    std::vector<oid> root(m_arc.begin(), m_arc.end());
     root.insert(root.end(), place.begin(), place.end());
     netsnmp_handler_registration* const registration = netsnmp_create_handler_registration(
         "kvloam", &Call::answer, root.data(), root.size(), HANDLER_CAN_RONLY);

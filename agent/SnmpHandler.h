@@ -9,13 +9,14 @@
 
 namespace kvloamd {
 
-/// One handler for all objects. Used on the thread that does all SNMP only.
+/// One handler for all objects of a tree. Used on the thread that does all SNMP only.
 class SnmpHandler {
   public:
     using TakeSnapshot = std::function<std::shared_ptr<Snapshot const>()>;
 
-    /// `tree` and `counters` outlive the handler. `enterprise` is the arc above all names.
-    SnmpHandler(ObjectTree const& tree, Counters const& counters, Oid enterprise,
+    /// `tree` and `counters` outlive the handler. `arc` is above all names
+    /// of the tree.
+    SnmpHandler(ObjectTree const& tree, Counters const& counters, Oid arc,
                 TakeSnapshot takeSnapshot);
     SnmpHandler(SnmpHandler const&) = delete;
     SnmpHandler& operator=(SnmpHandler const&) = delete;
@@ -30,7 +31,7 @@ class SnmpHandler {
   private:
     ObjectTree const& m_tree;
     Counters const& m_counters;
-    Oid m_enterprise;
+    Oid m_arc;
     TakeSnapshot m_takeSnapshot;
 };
 

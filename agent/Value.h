@@ -11,7 +11,8 @@
 
 namespace kvloamd {
 
-/// An object's place in the tree of names. Whoever says "relative" leaves out the enterprise arc.
+/// An object's place in the tree of names. Whoever says "relative" leaves out the arc above
+/// all objects of its tree.
 using Oid = std::vector<std::uint32_t>;
 using OidView = std::span<std::uint32_t const>;
 
@@ -29,6 +30,7 @@ inline bool startsWith(OidView name, OidView prefix) {
 enum class ValueType {
     Integer,   ///< signed, 32 bits
     Counter,   ///< 32 bits, wraps
+    Counter64, ///< 64 bits
     Gauge,     ///< unsigned, 32 bits
     TimeTicks, ///< hundredths of a second since the agent's start
     Text,      ///< printable characters
@@ -36,7 +38,8 @@ enum class ValueType {
     Date,      ///< 11 octets: date, time of day, offset from UTC
 };
 
-/// A number, octets that the snapshot behind them holds, or nothing: the value is not known.
+/// A number (an unsigned one of 64 bits as the same bits), octets that the snapshot behind them
+/// holds, or nothing: the value is not known.
 using Value = std::variant<std::monostate, std::int64_t, std::string_view>;
 
 inline bool isKnown(Value const& value) {

@@ -103,6 +103,16 @@ TEST_F(OptionsTest, EnterpriseArcThatIsNoNameIsRefused) {
     }
 }
 
+TEST_F(OptionsTest, InterfaceBaseIsRead) {
+    EXPECT_EQ(options({}).interfaceBase, 1000U);
+    EXPECT_EQ(options({"--interface-base", "1"}).interfaceBase, 1U);
+}
+
+TEST_F(OptionsTest, InterfaceBaseOutOfRangeIsRefused) {
+    for (char const* const base : {"0", "-1", "1000000001", "many"})
+        EXPECT_EQ(refusal({"--interface-base", base}).status, kExitUsage) << base;
+}
+
 TEST_F(OptionsTest, LogLevelIsRead) {
     EXPECT_EQ(options({"--log-level", "debug"}).logLevel, LogLevel::Debug);
 }

@@ -50,6 +50,8 @@ class MibTest : public AgentFixture {
             return ::testing::AnyOf("Integer32", "INTEGER");
         case ValueType::Counter:
             return ::testing::Eq("Counter32");
+        case ValueType::Counter64:
+            return ::testing::Eq("Counter64");
         case ValueType::Gauge:
             return ::testing::Eq("Gauge32");
         case ValueType::TimeTicks:

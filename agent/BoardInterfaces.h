@@ -1,0 +1,28 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Reads the lines, channels and interfaces of one board.
+#pragma once
+
+#include <functional>
+#include <vector>
+
+#include "agent/IndexFile.h"
+#include "agent/InterfaceRows.h"
+#include "board/Board.h"
+
+namespace kvloamd {
+
+/// The rows of one board. In the place of every ifIndex is the interface's number on the board,
+/// from 1 in the order of `keys`; the rows are in no order.
+struct BoardInterfaces {
+    std::vector<InterfaceKey> keys; ///< all different
+    InterfaceRows rows;
+};
+
+/// Seconds since the epoch as hundredths of a second since the agent's start.
+using ToTicks = std::function<std::uint32_t(long)>;
+
+/// Asks the board's features for all that they hold: lines first, then channels, Ethernet
+/// interfaces and IP interfaces.
+BoardInterfaces readInterfaces(Board& board, ToTicks const& toTicks);
+
+} // namespace kvloamd

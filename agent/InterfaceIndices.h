@@ -1,0 +1,57 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Gives every interface an ifIndex that it keeps.
+#pragma once
+
+#include <cstdint>
+#include <map>
+#include <span>
+#include <string>
+#include <vector>
+
+#include "agent/IndexFile.h"
+
+namespace kvloamd {
+
+/// An interface is known by its board's serial number, its kind and its name. It keeps its index
+/// while its board is away, and across restarts as far as the file can be used.
+///
+/// The interfaces that a board has when it first comes get neighbouring indices, in a block whose
+/// size is a power of two, with room for some more; a board that outgrows its blocks gets another.
+/// Not synchronised.
+class InterfaceIndices {
+  public:
+    static constexpr std::uint32_t kDefaultBase = 1000;
+
+    /// `file`: where indices are kept; empty: nowhere. `base`: the lowest index that is given to
+    /// whoever has none yet, above 0.
+    InterfaceIndices(std::string file, std::uint32_t base);
+
+    /// The indices of a board's interfaces, in the order of `keys`, which are all different. 0 for
+    /// an interface that there is no index left for.
+    std::vector<std::uint32_t> indicesOf(std::string const& serialNumber,
+                                         std::span<InterfaceKey const> keys);
+    /// Writes what has been given since the last time to the file, in one piece.
+    void save();
+
+  private:
+    /// What is free in a block: `next` to `end - 1`.
+    struct Room {
+        std::uint32_t next;
+        std::uint32_t end;
+    };
+    struct Board {
+        std::map<InterfaceKey, std::uint32_t> indices;
+        std::vector<Room> rooms;
+    };
+
+    void load(IndexRecords const& records);
+    /// Makes room for `count` more indices, unless there are none left.
+    void makeRoom(std::string const& serialNumber, Board& board, std::size_t count);
+
+    IndexFile m_file;
+    std::uint64_t m_free;                  ///< the first index of the next block
+    std::map<std::string, Board> m_boards; ///< by serial number
+    IndexRecords m_unsaved;
+};
+
+} // namespace kvloamd

@@ -1,0 +1,151 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/InterfaceReader.h"
+
+#include <algorithm>
+#include <iterator>
+#include <set>
+#include <utility>
+
+namespace kvloamd {
+
+namespace {
+
+using Ticks = std::chrono::duration<std::int64_t, std::centi>;
+
+/// Moves rows over, with their numbers on the board made indices; rows without one are left out.
+template <class Row>
+void moveRows(std::vector<Row>& all, std::vector<Row>& rows,
+              std::vector<std::uint32_t> const& indices) {
+    for (Row& row : rows) {
+        row.ifIndex = indices[row.ifIndex - 1];
+        if (row.ifIndex != 0) all.push_back(std::move(row));
+    }
+}
+
+template <class Row>
+void sortByIndex(std::vector<Row>& rows) {
+    std::ranges::sort(rows, {}, &Row::ifIndex);
+}
+
+/// Each interface and what is below it, with nothing above the topmost and below the lowest.
+void completeStack(InterfaceRows& all) {
+    std::set<std::uint32_t> higher;
+    std::set<std::uint32_t> lower;
+    for (StackRow const& row : all.stack) {
+        higher.insert(row.higher);
+        lower.insert(row.lower);
+    }
+    for (InterfaceRow const& row : all.interfaces) {
+        if (!lower.contains(row.ifIndex)) all.stack.push_back({0, row.ifIndex});
+        if (!higher.contains(row.ifIndex)) all.stack.push_back({row.ifIndex, 0});
+    }
+    std::ranges::sort(all.stack);
+}
+
+} // namespace
+
+InterfaceReader::InterfaceReader(BoardManager& manager, InterfaceIndices& indices,
+                                 Clock::time_point started)
+    : m_manager(manager),
+      m_indices(indices),
+      m_started(started),
+      m_startDate(std::chrono::duration_cast<std::chrono::milliseconds>(
+          std::chrono::system_clock::now().time_since_epoch() - (Clock::now() - started))) {}
+
+InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
+    InterfaceRows all;
+    for (auto& [index, counted] : m_counted)
+        counted.present = false;
+    ToTicks const toTicks = [this](long seconds) { return ticksOf(seconds); };
+    std::set<std::string> serialNumbers;
+    for (BoardRow const& row : boards) {
+        auto const board = m_manager.GetBoardByIndex(static_cast<int>(row.boardIndex));
+        Board* const asked = board.get();
+        if (asked == nullptr) continue;
+        std::string serialNumber = row.serialNumber == "unknown" ? "" : row.serialNumber;
+        // Boards that nothing else tells apart are told apart by their indices.
+        if (serialNumber.empty() || serialNumbers.contains(serialNumber))
+            serialNumber += "@" + std::to_string(row.boardIndex);
+        serialNumbers.insert(serialNumber);
+        BoardInterfaces found = readInterfaces(*asked, toTicks);
+        auto const indices = m_indices.indicesOf(serialNumber, found.keys);
+        append(all, std::move(found), indices, row.boardIndex);
+    }
+    m_indices.save();
+    std::erase_if(m_counted, [](auto const& entry) { return !entry.second.present; });
+    sortByIndex(all.interfaces);
+    sortByIndex(all.lines);
+    sortByIndex(all.bearers);
+    sortByIndex(all.signalling);
+    sortByIndex(all.ethernets);
+    completeStack(all);
+    std::size_t before = 0;
+    for (LineRow& line : all.lines) {
+        line.intervalsBefore = before;
+        before += line.closedIntervals();
+    }
+    noteChanges(all);
+    m_read = true;
+    return all;
+}
+
+void InterfaceReader::append(InterfaceRows& all, BoardInterfaces&& board,
+                             std::vector<std::uint32_t> const& indices, std::uint32_t boardIndex) {
+    auto const begin = std::ssize(all.interfaces);
+    moveRows(all.interfaces, board.rows.interfaces, indices);
+    std::for_each(all.interfaces.begin() + begin, all.interfaces.end(),
+                  [&](InterfaceRow& row) { countOn(row, boardIndex); });
+    moveRows(all.lines, board.rows.lines, indices);
+    moveRows(all.bearers, board.rows.bearers, indices);
+    moveRows(all.signalling, board.rows.signalling, indices);
+    moveRows(all.ethernets, board.rows.ethernets, indices);
+    for (StackRow const& row : board.rows.stack) {
+        StackRow const placed{indices[row.higher - 1], indices[row.lower - 1]};
+        if (placed.higher != 0 && placed.lower != 0) all.stack.push_back(placed);
+    }
+}
+
+void InterfaceReader::countOn(InterfaceRow& row, std::uint32_t boardIndex) {
+    auto const [place, isNew] = m_counted.try_emplace(row.ifIndex);
+    Counted& counted = place->second;
+    if (isNew || counted.boardIndex != boardIndex)
+        counted = {boardIndex, m_read ? now() : 0, row.counters, true};
+    counted.present = true;
+    for (std::size_t i = 0; i < row.counters.size(); ++i) {
+        if (!row.counters[i]) continue;
+        if (!counted.counters[i]) {
+            counted.counters[i] = row.counters[i];
+            continue;
+        }
+        std::uint64_t& total = *counted.counters[i];
+        total += static_cast<std::uint32_t>(*row.counters[i] - total);
+        row.counters[i] = total;
+    }
+    row.discontinuity = counted.since;
+}
+
+void InterfaceReader::noteChanges(InterfaceRows& all) {
+    std::vector<std::uint32_t> indices;
+    indices.reserve(all.interfaces.size());
+    for (InterfaceRow const& row : all.interfaces)
+        indices.push_back(row.ifIndex);
+    if (m_read && indices != m_formerIndices) m_lastChange = now();
+    if (m_read && all.stack != m_formerStack) m_stackLastChange = now();
+    m_formerIndices = std::move(indices);
+    m_formerStack = all.stack;
+    all.lastChange = m_lastChange;
+    all.stackLastChange = m_stackLastChange;
+}
+
+std::uint32_t InterfaceReader::now() const {
+    return static_cast<std::uint32_t>(
+        std::chrono::duration_cast<Ticks>(Clock::now() - m_started).count());
+}
+
+std::uint32_t InterfaceReader::ticksOf(long seconds) const {
+    auto const since = std::chrono::seconds(seconds) - m_startDate;
+    if (since <= std::chrono::milliseconds::zero()) return 0;
+    return static_cast<std::uint32_t>(std::chrono::duration_cast<Ticks>(since).count());
+}
+
+} // namespace kvloamd

@@ -1,0 +1,64 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Reads all boards' lines, channels and interfaces.
+#pragma once
+
+#include <chrono>
+#include <cstdint>
+#include <map>
+#include <string>
+#include <vector>
+
+#include "agent/BoardInterfaces.h"
+#include "agent/BoardRow.h"
+#include "agent/InterfaceIndices.h"
+#include "agent/InterfaceRows.h"
+#include "board/BoardManager.h"
+
+namespace kvloamd {
+
+/// Gives interfaces their indices, counts their counters on beyond 32 bits, and notes when
+/// interfaces come and go. Belongs to one thread.
+///
+/// A counter must be read before it has gone once around; what is lost when it is not, and when a
+/// board counts anew from 0, can not be told.
+class InterfaceReader {
+  public:
+    using Clock = std::chrono::steady_clock;
+
+    /// `manager` and `indices` outlive the reader. `started`: the agent's start.
+    InterfaceReader(BoardManager& manager, InterfaceIndices& indices, Clock::time_point started);
+
+    /// The rows of `boards`, which are ascending by index.
+    InterfaceRows read(std::vector<BoardRow> const& boards);
+
+  private:
+    using Counters = decltype(InterfaceRow::counters);
+
+    /// How far an interface's counters have come.
+    struct Counted {
+        std::uint32_t boardIndex; ///< a board that comes back has another
+        std::uint32_t since;
+        Counters counters;
+        bool present;
+    };
+
+    void append(InterfaceRows& all, BoardInterfaces&& board,
+                std::vector<std::uint32_t> const& indices, std::uint32_t boardIndex);
+    void countOn(InterfaceRow& row, std::uint32_t boardIndex);
+    void noteChanges(InterfaceRows& all);
+    std::uint32_t now() const;
+    std::uint32_t ticksOf(long seconds) const;
+
+    BoardManager& m_manager;
+    InterfaceIndices& m_indices;
+    Clock::time_point m_started;
+    std::chrono::milliseconds m_startDate; ///< the start, since the epoch
+    std::map<std::uint32_t, Counted> m_counted;
+    bool m_read = false;
+    std::vector<std::uint32_t> m_formerIndices;
+    std::vector<StackRow> m_formerStack;
+    std::uint32_t m_lastChange = 0;
+    std::uint32_t m_stackLastChange = 0;
+};
+
+} // namespace kvloamd

@@ -1,0 +1,158 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Lines and channels whose answers a test chooses, and the features that hold them.
+#pragma once
+
+#include <cstring>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "platform/ActionScheduler_pthread.h"
+#include "z7/DS1LineFeatureZ7.h"
+#include "z7/ISDNChannelZ7.h"
+#include "z7/ISDNFeatureZ7.h"
+
+/// A history that only the test writes.
+class FakeHistory final : public DS1IntervalTable {
+  public:
+    FakeHistory() { ActionScheduler_pthread::GetScheduler()->Remove(this); }
+
+    bool knowsDegradedMinutes = true;
+
+    int GetControlledSlipSeconds(int n) override { return interval(n)->ControlledSlipSeconds; }
+    int GetDegradedMinutes(int n) override {
+        return knowsDegradedMinutes ? static_cast<int>(interval(n)->DegradedMinutes)
+                                    : KVL::kNotSupported;
+    }
+    int CollectSecond() override { return 0; }
+    int CloseInterval() override { return 0; }
+
+    /// Closes an interval with these error seconds, and degraded minutes of the same number.
+    void close(int errorSeconds) {
+        DS1Interval closed;
+        closed.ErrorSeconds = errorSeconds;
+        closed.DegradedMinutes = errorSeconds;
+        ArchiveInterval(closed);
+    }
+    /// What the running interval has counted, and for how long.
+    void run(int errorSeconds, int timeElapsed) {
+        m_current.ErrorSeconds = errorSeconds;
+        m_timeElapsed = timeElapsed;
+    }
+};
+
+/// Supports nothing but its name, its circuit and what a test sets.
+class FakeLine final : public DS1LineDevice {
+  public:
+    FakeLine(std::string name, std::string circuit)
+        : m_name(std::move(name)), m_circuit(std::move(circuit)) {}
+
+    int lineStatus = KVL::kNotSupported;
+    ReferenceCounter<DS1IntervalTable> history;
+
+    int GetDescription(std::string& description) override {
+        return Interface::GetDescription(description);
+    }
+    int GetType() override { return Interface::GetType(); }
+    int GetMTU() override { return Interface::GetMTU(); }
+    int GetSpeed() override { return Interface::GetSpeed(); }
+    int GetAdminStatus() override { return Interface::GetAdminStatus(); }
+    int SetAdminStatus(int status) override { return Interface::SetAdminStatus(status); }
+    int GetOperStatus() override { return Interface::GetOperStatus(); }
+    int GetLastChange(int& seconds, int& microseconds) override {
+        return Interface::GetLastChange(seconds, microseconds);
+    }
+    int GetInOctets() override { return Interface::GetInOctets(); }
+    int GetInUcastPkts() override { return Interface::GetInUcastPkts(); }
+    int GetInDiscards() override { return Interface::GetInDiscards(); }
+    int GetInErrors() override { return Interface::GetInErrors(); }
+    int GetInUnknownProtos() override { return Interface::GetInUnknownProtos(); }
+    int GetOutOctets() override { return Interface::GetOutOctets(); }
+    int GetOutUcastPkts() override { return Interface::GetOutUcastPkts(); }
+    int GetOutDiscards() override { return Interface::GetOutDiscards(); }
+    int GetOutErrors() override { return Interface::GetOutErrors(); }
+
+    int GetName(char* name) override { return give(name, m_name); }
+    int GetLineIndex() override { return KVL::kNotSupported; }
+    ReferenceCounter<DS1IntervalTable> GetIntervalTable() override { return history; }
+    int GetLineType() override { return KVL::kNotSupported; }
+    int GetLineCoding() override { return KVL::kNotSupported; }
+    int GetSendCode() override { return KVL::kNotSupported; }
+    int GetCircuitIdentifier(char* identifier) override { return give(identifier, m_circuit); }
+    int GetLoopbackConfig() override { return KVL::kNotSupported; }
+    int GetLineStatus() override { return lineStatus; }
+    int GetSignalMode() override { return KVL::kNotSupported; }
+    int GetPhysAddressString(char* address) override { return give(address, ""); }
+    int GetTransmitClockSource() override { return KVL::kNotSupported; }
+    int GetFdl() override { return KVL::kNotSupported; }
+    int GetLineLength() override { return KVL::kNotSupported; }
+    long GetLineStatusLastChange() override { return KVL::kNotSupported; }
+    int GetLineStatusChangeTrapEnable() override { return KVL::kNotSupported; }
+    int SetLineStatusChangeTrapEnable(int /*enable*/) override { return KVL::kNotSupported; }
+    int GetLoopbackStatus() override { return KVL::kNotSupported; }
+    int GetDs1ChannelNumber() override { return KVL::kNotSupported; }
+    int GetChannelization() override { return KVL::kNotSupported; }
+    int GetLineMode() override { return KVL::kNotSupported; }
+    int GetLineBuildOut() override { return KVL::kNotSupported; }
+
+  private:
+    static int give(char* answer, std::string const& value) {
+        std::strcpy(answer, value.c_str());
+        return 0;
+    }
+
+    std::string m_name;
+    std::string m_circuit;
+};
+
+class FakeLineFeature final : public DS1LineFeatureZ7 {
+  public:
+    explicit FakeLineFeature(std::vector<FakeLine*> const& lines) {
+        for (FakeLine* const line : lines)
+            m_lines.emplace_back(line);
+    }
+    int GetNumberOfLines() override { return static_cast<int>(m_lines.size()); }
+};
+
+class FakeBChannel final : public ISDNBChannelZ7 {
+  public:
+    FakeBChannel(char const* name, int status) : ISDNBChannelZ7(name), m_status(status) {}
+    int GetChannelType() override { return 1; }
+    int GetOperStatus() override { return m_status; }
+    int GetChannelNumber() override { return KVL::kNotSupported; }
+
+  private:
+    int m_status;
+};
+
+class FakeDChannel final : public ISDNDChannelZ7 {
+  public:
+    FakeDChannel(char const* name, int status, int bearers, std::string callingAddress)
+        : ISDNDChannelZ7(name),
+          m_status(status),
+          m_bearers(bearers),
+          m_callingAddress(std::move(callingAddress)) {}
+    int GetProtocol() override { return KVL::kNotSupported; }
+    int GetOperStatus() override { return m_status; }
+    int GetBChannelCount() override { return m_bearers; }
+    int GetCallingAddress(char* address) override {
+        std::strcpy(address, m_callingAddress.c_str());
+        return 0;
+    }
+
+  private:
+    int m_status;
+    int m_bearers;
+    std::string m_callingAddress;
+};
+
+class FakeISDNFeature final : public ISDNFeatureZ7 {
+  public:
+    FakeISDNFeature(std::vector<FakeDChannel*> const& signalling,
+                    std::vector<FakeBChannel*> const& bearers) {
+        for (FakeDChannel* const channel : signalling)
+            m_signallingChannels.emplace_back(channel);
+        for (FakeBChannel* const channel : bearers)
+            m_bearerChannels.emplace_back(channel);
+    }
+};
