@@ -14,6 +14,7 @@ namespace kvloamd {
 
 struct Options {
     std::vector<std::string> listen{"udp:127.0.0.1:1161"};
+    std::string agentx; ///< the SNMP master's address; empty: the agent stands alone
     std::vector<std::string> modules;
     std::string moduleDirectory;
     std::string snmpConfig;          ///< empty: where Net-SNMP looks by itself
@@ -21,6 +22,8 @@ struct Options {
     Oid enterprise{1, 3, 6, 1, 4, 1, 32473};
     LogLevel logLevel = LogLevel::Info;
     bool checkConfig = false;
+
+    bool operator==(Options const&) const = default;
 };
 
 /// Why there are no options: the text to print and the status to exit with. The text is help or
