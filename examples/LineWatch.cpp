@@ -46,12 +46,12 @@ void forEachFeature(BoardManager& manager, Call const& call) {
 }
 
 void printHead(char const* first) {
-    std::printf("%-16s %4s %4s %4s %4s %4s %6s %4s %4s %4s %6s\n", first, "ES", "SES", "SEFS",
+    std::printf("%-20s %4s %4s %4s %4s %4s %6s %4s %4s %4s %6s\n", first, "ES", "SES", "SEFS",
                 "UAS", "CSS", "PCV", "LES", "BES", "DM", "LCV");
 }
 
 void printRow(std::string const& first, DS1IntervalTable& table, int n) {
-    std::printf("%-16s %4d %4d %4d %4d %4d %6d %4d %4d %4d %6d\n", first.c_str(),
+    std::printf("%-20s %4d %4d %4d %4d %4d %6d %4d %4d %4d %6d\n", first.c_str(),
                 table.GetErrorSeconds(n), table.GetSeverelyErrorSeconds(n),
                 table.GetSeverelyErrorFramingSeconds(n), table.GetUnavailableSeconds(n),
                 table.GetControlledSlipSeconds(n), table.GetPathCodingViolations(n),

@@ -11,6 +11,7 @@
 #include <thread>
 
 #include "simulator/Channels.h"
+#include "simulator/tool/CommandGroup.h"
 #include "simulator/tool/TextTable.h"
 
 namespace kvlsim {
@@ -169,26 +170,17 @@ void runScript(Options const& options, Connect const& connect) {
 } // namespace
 
 void addCallCommands(CLI::App& app, Connect connect, std::function<void()>& chosen) {
-    auto const options = std::make_shared<Options>();
-    CLI::App* const call = app.add_subcommand("call", "Calls on ISDN channels");
-    call->fallthrough()->require_subcommand(1);
-    auto const addCommand = [&](char const* name, char const* help, auto run) {
-        CLI::App* const command = call->add_subcommand(name, help);
-        command->fallthrough();
-        command->callback([&chosen, options, connect, run] {
-            chosen = [options, connect, run] { run(*options, connect); };
-        });
-        return command;
-    };
+    CommandGroup<Options> group(app, "call", "Calls on ISDN channels", connect, chosen);
+    auto const& options = group.options();
     auto const addChange = [&](char const* name, char const* help, auto run) {
-        CLI::App* const command = addCommand(name, help, run);
+        CLI::App* const command = group.add(name, help, run);
         command->add_flag("--no-wait", options->noWait,
                           "Do not wait until the events are delivered to the process");
         return command;
     };
     constexpr char const* trunkHelp = "Handle or NAME of a device with ISDN channels";
 
-    addCommand("list", "List the trunks and the states of their channels", list)
+    group.add("list", "List the trunks and the states of their channels", list)
         ->add_flag("--json", options->json, "The raw reply");
 
     auto* command = addChange("setup", "Set a call up", setUp);

@@ -9,6 +9,7 @@
 
 #include "simulator/Description.h"
 #include "simulator/Line.h"
+#include "simulator/tool/CommandGroup.h"
 #include "simulator/tool/TextTable.h"
 
 namespace kvlsim {
@@ -115,19 +116,10 @@ void addErrorOptions(CLI::App& command, Values& values, CLI::Validator const& ch
 } // namespace
 
 void addLineCommands(CLI::App& app, Connect connect, std::function<void()>& chosen) {
-    auto const options = std::make_shared<Options>();
-    CLI::App* const line = app.add_subcommand("line", "DS1 lines: errors and alarms");
-    line->fallthrough()->require_subcommand(1);
-    auto const addCommand = [&](char const* name, char const* help, auto run) {
-        CLI::App* const command = line->add_subcommand(name, help);
-        command->fallthrough();
-        command->callback([&chosen, options, connect, run] {
-            chosen = [options, connect, run] { run(*options, connect); };
-        });
-        return command;
-    };
+    CommandGroup<Options> group(app, "line", "DS1 lines: errors and alarms", connect, chosen);
+    auto const& options = group.options();
     auto const addChange = [&](char const* name, char const* help, auto run) {
-        CLI::App* const command = addCommand(name, help, run);
+        CLI::App* const command = group.add(name, help, run);
         command->add_option("line", options->line, "Handle or NAME of a device with a line")
             ->required();
         command->add_flag("--no-wait", options->noWait,
@@ -135,7 +127,7 @@ void addLineCommands(CLI::App& app, Connect connect, std::function<void()>& chos
         return command;
     };
 
-    addCommand("list", "List the lines and their counters", list)
+    group.add("list", "List the lines and their counters", list)
         ->add_flag("--json", options->json, "The raw reply");
 
     addErrorOptions(*addChange("errors", "Count errors at once", addErrors), options->errors,

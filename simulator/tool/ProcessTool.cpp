@@ -8,6 +8,7 @@
 
 #include "simulator/Description.h"
 #include "simulator/ProcessDraft.h"
+#include "simulator/tool/CommandGroup.h"
 #include "simulator/tool/TextTable.h"
 
 namespace kvlsim {
@@ -84,23 +85,14 @@ void end(Options const& options, Connect const& connect) {
 } // namespace
 
 void addProcessCommands(CLI::App& app, Connect connect, std::function<void()>& chosen) {
-    auto const options = std::make_shared<Options>();
-    CLI::App* const process =
-        app.add_subcommand("process", "Processes that use the runtime library");
-    process->fallthrough()->require_subcommand(1);
-    auto const addCommand = [&](char const* name, char const* help, auto run) {
-        CLI::App* const command = process->add_subcommand(name, help);
-        command->fallthrough();
-        command->callback([&chosen, options, connect, run] {
-            chosen = [options, connect, run] { run(*options, connect); };
-        });
-        return command;
-    };
+    CommandGroup<Options> group(app, "process", "Processes that use the runtime library", connect,
+                                chosen);
+    auto const& options = group.options();
 
-    auto* command = addCommand("list", "List the processes and their counters", list);
+    auto* command = group.add("list", "List the processes and their counters", list);
     command->add_flag("--json", options->json, "The raw reply");
 
-    command = addCommand("add", "Add a process", add);
+    command = group.add("add", "Add a process", add);
     auto* const which = command->add_option_group("process");
     which->add_option("--name", options->name, "Start a child that bears this name or path");
     which->add_option("--pid", options->pid, "A process of this host")
@@ -117,7 +109,7 @@ void addProcessCommands(CLI::App& app, Connect connect, std::function<void()>& c
                      "Its change per second as NAME=VALUE, such as TotalQueuedEvents=0.5; repeat")
         ->allow_extra_args(false);
 
-    command = addCommand("end", "End a child, or take other processes off the list", end);
+    command = group.add("end", "End a child, or take other processes off the list", end);
     command->add_option("process", options->which, "Process id or name")->required();
 }
 

@@ -9,6 +9,7 @@
 #include "simulator/Description.h"
 #include "simulator/StoreSchema.h"
 #include "simulator/tool/BoardDescriptions.h"
+#include "simulator/tool/CommandGroup.h"
 #include "simulator/tool/TextTable.h"
 
 namespace kvlsim {
@@ -110,24 +111,15 @@ void remove(Options const& options, Connect const& connect) {
 } // namespace
 
 void addStoreCommands(CLI::App& app, Connect connect, std::function<void()>& chosen) {
-    auto const options = std::make_shared<Options>();
-    CLI::App* const store = app.add_subcommand("store", "Records of the attribute store");
-    store->fallthrough()->require_subcommand(1);
-    auto const addCommand = [&](char const* name, char const* help, auto run) {
-        CLI::App* const command = store->add_subcommand(name, help);
-        command->fallthrough();
-        command->callback([&chosen, options, connect, run] {
-            chosen = [options, connect, run] { run(*options, connect); };
-        });
-        return command;
-    };
+    CommandGroup<Options> group(app, "store", "Records of the attribute store", connect, chosen);
+    auto const& options = group.options();
     constexpr char const* serialHelp = "Serial number of the board";
 
-    auto* command = addCommand("list", "List the records, or show one", list);
+    auto* command = group.add("list", "List the records, or show one", list);
     command->add_option("serial", options->serial, serialHelp);
     command->add_flag("--json", options->json, "The raw reply");
 
-    command = addCommand("add", "Add a board's record, or a family", add);
+    command = group.add("add", "Add a board's record, or a family", add);
     auto* const serial = command->add_option("serial", options->serial, serialHelp);
     auto* const family =
         command->add_option("--family", options->family,
@@ -141,11 +133,11 @@ void addStoreCommands(CLI::App& app, Connect connect, std::function<void()>& cho
         chosen = [options, connect] { add(*options, connect); };
     });
 
-    command = addCommand("set", "Set fields of a record", set);
+    command = group.add("set", "Set fields of a record", set);
     command->add_option("serial", options->serial, serialHelp)->required();
     command->add_option("fields", options->fields, kFieldHelp)->required();
 
-    command = addCommand("remove", "Remove records", remove);
+    command = group.add("remove", "Remove records", remove);
     auto* const serials = command->add_option("serials", options->serials, serialHelp);
     auto* const whole =
         command->add_option("--family", options->family, "A family, removed with all its boards");

@@ -9,6 +9,7 @@
 #include <gtest/gtest.h>
 
 #include "simulator/AttributeSchema.h"
+#include "tests/simulator/BadFixture.h"
 
 namespace {
 
@@ -33,22 +34,10 @@ AttributeValue attributeOf(Chassis const& chassis, long handle, char const* name
     return *chassis.find(handle)->attribute(name);
 }
 
-struct BadFile {
-    char const* file;
-    char const* refusal; ///< behind the file's name
-};
-
-class BadChassisFileTest : public testing::TestWithParam<BadFile> {};
+class BadChassisFileTest : public testing::TestWithParam<BadFixture> {};
 
 TEST_P(BadChassisFileTest, IsRefusedWithPlaceAndRemedy) {
-    std::string const path = std::string(KVLSIM_FIXTURES "/") + GetParam().file;
-    std::string refusal = "accepted";
-    try {
-        readChassis(readChassisFile(path));
-    } catch (ChassisError const& error) {
-        refusal = describeError(GetParam().file, error);
-    }
-    EXPECT_EQ(refusal, std::string(GetParam().file) + GetParam().refusal);
+    EXPECT_EQ(refusalOf(GetParam()), std::string(GetParam().file) + GetParam().refusal);
 }
 
 constexpr char const* kAllSubDeviceTypes =
@@ -58,80 +47,95 @@ constexpr char const* kAllSubDeviceTypes =
 INSTANTIATE_TEST_SUITE_P(
     Fixtures, BadChassisFileTest,
     testing::Values(
-        BadFile{"not-yaml.yaml", ":4: not readable as YAML: end of map flow not found; correct it "
-                                 "there or just before"},
-        BadFile{"empty.yaml", ":1: there is nothing in it; begin the chassis with \"boards:\""},
-        BadFile{"no-boards.yaml", ":2: no boards; begin the chassis with \"boards:\""},
-        BadFile{"boards-is-a-map.yaml", ":2: boards cannot be a map; write a list, each board "
-                                        "beginning with \"- handle:\""},
-        BadFile{"board-is-a-text.yaml",
-                ":2: a board cannot be the text \"first\"; begin it with \"handle:\""},
-        BadFile{"misspelt-key.yaml", ":3: unknown key \"atributes\" in board 1; known: handle, "
-                                     "attributes, devices, processors"},
-        BadFile{"unknown-top-key.yaml", ":2: unknown key \"borads\" in the chassis; known: boards, "
-                                        "store, processes"},
-        BadFile{"key-twice.yaml",
-                ":6: \"IRQ\" is written twice (first in line 5); keep one of them"},
-        BadFile{"list-as-key.yaml", ":2: a key must be a plain word; this one is a list or a map"},
-        BadFile{"no-handle.yaml",
-                ":4: board without handle; give it a \"handle:\" of its own, 1 or more"},
-        BadFile{"handle-zero.yaml",
-                ":2: the handle of a board cannot be 0; write a number from 1 to 2147483646"},
-        BadFile{"handle-too-large.yaml", ":3: the handle of a board cannot be 2147483647; write a "
-                                         "number from 1 to 2147483646"},
-        BadFile{"handle-huge.yaml", ":2: the handle of a board cannot be "
-                                    "99999999999999999999999999; write a number from 1 to "
-                                    "2147483646"},
-        BadFile{"handle-text.yaml", ":2: the handle of a board cannot be the text \"1\"; write a "
-                                    "number from 1 to 2147483646"},
-        BadFile{"handle-twice.yaml", ":6: handle 7 is already the processor of line 5; give every "
-                                     "object a handle of its own"},
-        BadFile{"no-serial.yaml", ":2: board 5 has no SERIAL_NUMBER; give it one under attributes"},
-        BadFile{"serial-twice.yaml", ":4: board 2 cannot have SERIAL_NUMBER \"A1\": board 1 has "
-                                     "it; serial numbers must differ"},
-        BadFile{"serial-number.yaml",
-                ":4: SERIAL_NUMBER cannot be 12345; it is a text, write it in quotes"},
-        BadFile{"number-as-text.yaml", ":5: IRQ cannot be the text \"eleven\"; it is a number, "
-                                       "write a decimal or 0x number"},
-        BadFile{"number-quoted.yaml", ":5: IRQ cannot be the text \"11\"; it is a number, write a "
-                                      "decimal or 0x number"},
-        BadFile{"number-out-of-range.yaml", ":5: IRQ: 4294967296 is out of range; a number of 4 "
-                                            "bytes goes from -2147483648 to 4294967295"},
-        BadFile{"short-out-of-range.yaml", ":5: LOGICAL ID: 65536 is out of range; a number of 2 "
-                                           "bytes goes from -32768 to 65535"},
-        BadFile{"byte-out-of-range.yaml", ":8: Protocol_Type_3: 256 is out of range; a number of 1 "
-                                          "byte goes from -128 to 255"},
-        BadFile{"descriptor-short.yaml", ":8: LINEADMINADDR: a descriptor is a list of four "
-                                         "numbers; write {descriptor: [1, 2, 3, 4]}"},
-        BadFile{"descriptor-as-number.yaml", ":8: LINEADMINADDR cannot be 5; it is a descriptor, "
-                                             "write {descriptor: [1, 2, 3, 4]}"},
-        BadFile{"unknown-form.yaml", ":5: IRQ: no form of value is called \"word\"; there are "
-                                     "text, number, short, byte, empty, descriptor"},
-        BadFile{"list-as-value.yaml",
-                ":5: COLOUR cannot be a list; write a text, a whole number, or one of {short: 1}, "
-                "{byte: 1}, {empty: true}, {descriptor: [1, 2, 3, 4]}"},
-        BadFile{"no-value.yaml", ":5: IRQ has no value; write one or remove the attribute"},
-        BadFile{"long-text.yaml",
-                ":5: DESCRIPTION: a text of 128 bytes is too long; 127 is the most"},
-        BadFile{"nul-in-text.yaml", ":4: SERIAL_NUMBER: a text cannot contain a NUL; remove it"},
-        BadFile{"type-attribute.yaml", ":5: TYPE follows from what the object is; remove it (a "
-                                       "device's is written as type:)"},
-        BadFile{"no-device-type.yaml", ":5: device 2 has no type; give it one of 501, 503, 505, "
-                                       "507, 509, 514, 516, 518, 520, 521, 511, 525, 527"},
-        BadFile{"unknown-device-type.yaml",
-                ":6: device 2 cannot be of type 502; choose one of 501, 503, 505, 507, 509, 514, "
-                "516, 518, 520, 521, 511, 525, 527"},
-        BadFile{"unknown-subdevice-type.yaml", kAllSubDeviceTypes},
-        BadFile{"devices-is-a-map.yaml", ":4: devices cannot be a map; write a list, each entry "
-                                         "beginning with \"- handle:\""},
-        BadFile{"reference.yaml", ":5: references (*name) are not supported; write the value out"},
-        BadFile{"tag.yaml", ":4: the tag \"!secret\" means nothing here; remove it"},
-        BadFile{"two-documents.yaml", ":2: a second YAML document; keep the first"},
-        BadFile{"too-deep.yaml", ":5: too many nested levels; a chassis needs at most 12"},
-        BadFile{"no-such-file.yaml", ": cannot be read (No such file or directory); name a chassis "
-                                     "file that exists and is readable"},
-        BadFile{".", ": cannot be read (Is a directory); name a chassis file that exists and is "
-                     "readable"}));
+        BadFixture{"not-yaml.yaml",
+                   ":4: not readable as YAML: end of map flow not found; correct it "
+                   "there or just before"},
+        BadFixture{"empty.yaml", ":1: there is nothing in it; begin the chassis with \"boards:\""},
+        BadFixture{"no-boards.yaml", ":2: no boards; begin the chassis with \"boards:\""},
+        BadFixture{"boards-is-a-map.yaml", ":2: boards cannot be a map; write a list, each board "
+                                           "beginning with \"- handle:\""},
+        BadFixture{"board-is-a-text.yaml",
+                   ":2: a board cannot be the text \"first\"; begin it with \"handle:\""},
+        BadFixture{"misspelt-key.yaml", ":3: unknown key \"atributes\" in board 1; known: handle, "
+                                        "attributes, devices, processors"},
+        BadFixture{"unknown-top-key.yaml",
+                   ":2: unknown key \"borads\" in the chassis; known: boards, "
+                   "store, processes"},
+        BadFixture{"key-twice.yaml",
+                   ":6: \"IRQ\" is written twice (first in line 5); keep one of them"},
+        BadFixture{"list-as-key.yaml",
+                   ":2: a key must be a plain word; this one is a list or a map"},
+        BadFixture{"no-handle.yaml",
+                   ":4: board without handle; give it a \"handle:\" of its own, 1 or more"},
+        BadFixture{"handle-zero.yaml",
+                   ":2: the handle of a board cannot be 0; write a number from 1 to 2147483646"},
+        BadFixture{"handle-too-large.yaml",
+                   ":3: the handle of a board cannot be 2147483647; write a "
+                   "number from 1 to 2147483646"},
+        BadFixture{"handle-huge.yaml", ":2: the handle of a board cannot be "
+                                       "99999999999999999999999999; write a number from 1 to "
+                                       "2147483646"},
+        BadFixture{"handle-text.yaml",
+                   ":2: the handle of a board cannot be the text \"1\"; write a "
+                   "number from 1 to 2147483646"},
+        BadFixture{"handle-twice.yaml",
+                   ":6: handle 7 is already the processor of line 5; give every "
+                   "object a handle of its own"},
+        BadFixture{"no-serial.yaml",
+                   ":2: board 5 has no SERIAL_NUMBER; give it one under attributes"},
+        BadFixture{"serial-twice.yaml", ":4: board 2 cannot have SERIAL_NUMBER \"A1\": board 1 has "
+                                        "it; serial numbers must differ"},
+        BadFixture{"serial-number.yaml",
+                   ":4: SERIAL_NUMBER cannot be 12345; it is a text, write it in quotes"},
+        BadFixture{"number-as-text.yaml", ":5: IRQ cannot be the text \"eleven\"; it is a number, "
+                                          "write a decimal or 0x number"},
+        BadFixture{"number-quoted.yaml",
+                   ":5: IRQ cannot be the text \"11\"; it is a number, write a "
+                   "decimal or 0x number"},
+        BadFixture{"number-out-of-range.yaml", ":5: IRQ: 4294967296 is out of range; a number of 4 "
+                                               "bytes goes from -2147483648 to 4294967295"},
+        BadFixture{"short-out-of-range.yaml",
+                   ":5: LOGICAL ID: 65536 is out of range; a number of 2 "
+                   "bytes goes from -32768 to 65535"},
+        BadFixture{"byte-out-of-range.yaml",
+                   ":8: Protocol_Type_3: 256 is out of range; a number of 1 "
+                   "byte goes from -128 to 255"},
+        BadFixture{"descriptor-short.yaml", ":8: LINEADMINADDR: a descriptor is a list of four "
+                                            "numbers; write {descriptor: [1, 2, 3, 4]}"},
+        BadFixture{"descriptor-as-number.yaml",
+                   ":8: LINEADMINADDR cannot be 5; it is a descriptor, "
+                   "write {descriptor: [1, 2, 3, 4]}"},
+        BadFixture{"unknown-form.yaml", ":5: IRQ: no form of value is called \"word\"; there are "
+                                        "text, number, short, byte, empty, descriptor"},
+        BadFixture{
+            "list-as-value.yaml",
+            ":5: COLOUR cannot be a list; write a text, a whole number, or one of {short: 1}, "
+            "{byte: 1}, {empty: true}, {descriptor: [1, 2, 3, 4]}"},
+        BadFixture{"no-value.yaml", ":5: IRQ has no value; write one or remove the attribute"},
+        BadFixture{"long-text.yaml",
+                   ":5: DESCRIPTION: a text of 128 bytes is too long; 127 is the most"},
+        BadFixture{"nul-in-text.yaml", ":4: SERIAL_NUMBER: a text cannot contain a NUL; remove it"},
+        BadFixture{"type-attribute.yaml", ":5: TYPE follows from what the object is; remove it (a "
+                                          "device's is written as type:)"},
+        BadFixture{"no-device-type.yaml", ":5: device 2 has no type; give it one of 501, 503, 505, "
+                                          "507, 509, 514, 516, 518, 520, 521, 511, 525, 527"},
+        BadFixture{
+            "unknown-device-type.yaml",
+            ":6: device 2 cannot be of type 502; choose one of 501, 503, 505, 507, 509, 514, "
+            "516, 518, 520, 521, 511, 525, 527"},
+        BadFixture{"unknown-subdevice-type.yaml", kAllSubDeviceTypes},
+        BadFixture{"devices-is-a-map.yaml", ":4: devices cannot be a map; write a list, each entry "
+                                            "beginning with \"- handle:\""},
+        BadFixture{"reference.yaml",
+                   ":5: references (*name) are not supported; write the value out"},
+        BadFixture{"tag.yaml", ":4: the tag \"!secret\" means nothing here; remove it"},
+        BadFixture{"two-documents.yaml", ":2: a second YAML document; keep the first"},
+        BadFixture{"too-deep.yaml", ":5: too many nested levels; a chassis needs at most 12"},
+        BadFixture{"no-such-file.yaml",
+                   ": cannot be read (No such file or directory); name a chassis "
+                   "file that exists and is readable"},
+        BadFixture{".", ": cannot be read (Is a directory); name a chassis file that exists and is "
+                        "readable"}));
 
 TEST(ChassisReaderTest, PlainWholeNumbersAreFourBytes) {
     Chassis const chassis = readChassis(boardWith("      IRQ: 0x0B\n"));

@@ -9,8 +9,7 @@
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 
-#include "tests/simulator/ChildProcess.h"
-#include "tests/simulator/TemporaryDirectory.h"
+#include "tests/simulator/ToolFixture.h"
 
 namespace {
 
@@ -19,34 +18,10 @@ using kvlsim::testing::Finished;
 using nlohmann::json;
 using testing::HasSubstr;
 
-class KvlsimLineToolTest : public testing::Test {
+class KvlsimLineToolTest : public ToolTest {
   protected:
     KvlsimLineToolTest() { hold(); }
 
-    void hold(std::vector<std::string> environment = {}) {
-        holder.reset();
-        environment.push_back("KVLSIM_SOCKET=" + directory.file("socket"));
-        holder = std::make_unique<ChildProcess>(std::vector<std::string>{KVLSIM_PLATFORM_HOLDER},
-                                                environment);
-        EXPECT_EQ(holder->readLine(), "ready");
-    }
-    Finished kvlsim(std::vector<std::string> arguments) const {
-        arguments.insert(arguments.begin(), KVLSIM_TOOL);
-        return kvlsim::testing::run(arguments, {"KVLSIM_SOCKET=" + directory.file("socket")});
-    }
-    std::string succeed(std::vector<std::string> const& arguments) const {
-        Finished const finished = kvlsim(arguments);
-        EXPECT_EQ(finished.status, 0) << finished.err;
-        EXPECT_EQ(finished.err, "");
-        return finished.out;
-    }
-    void expectRefusal(std::vector<std::string> const& arguments, int status,
-                       std::string const& words) const {
-        Finished const finished = kvlsim(arguments);
-        EXPECT_EQ(finished.status, status);
-        EXPECT_THAT(finished.err, HasSubstr(words));
-        EXPECT_EQ(finished.out, "");
-    }
     json listed(char const* what, char const* list, char const* key, int handle) const {
         json const reply = json::parse(succeed({what, "list", "--json"}));
         for (auto const& each : reply[list])
@@ -55,14 +30,6 @@ class KvlsimLineToolTest : public testing::Test {
     }
     json line(int handle) const { return listed("line", "lines", "line", handle); }
     json trunk(int handle) const { return listed("call", "trunks", "trunk", handle); }
-    std::string write(char const* name, std::string const& text) const {
-        std::string const path = directory.file(name);
-        std::ofstream(path) << text;
-        return path;
-    }
-
-    kvlsim::testing::TemporaryDirectory directory;
-    std::unique_ptr<ChildProcess> holder;
 };
 
 TEST_F(KvlsimLineToolTest, ListIsATable) {

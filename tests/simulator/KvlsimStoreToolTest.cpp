@@ -10,51 +10,22 @@
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 
-#include "tests/simulator/ChildProcess.h"
-#include "tests/simulator/TemporaryDirectory.h"
+#include "tests/simulator/ToolFixture.h"
 
 namespace {
 
-using kvlsim::testing::ChildProcess;
 using kvlsim::testing::Finished;
 using nlohmann::json;
 using testing::HasSubstr;
 
-class KvlsimStoreToolTest : public testing::Test {
+class KvlsimStoreToolTest : public ToolTest {
   protected:
-    KvlsimStoreToolTest() { hold("VQRXCFGPATH=" + directory.file(".")); }
+    KvlsimStoreToolTest() { hold({"VQRXCFGPATH=" + directory.file(".")}); }
 
-    void hold(std::string const& variable) {
-        holder.reset();
-        holder = std::make_unique<ChildProcess>(
-            std::vector<std::string>{KVLSIM_PLATFORM_HOLDER},
-            std::vector<std::string>{variable, "KVLSIM_SOCKET=" + directory.file("socket")});
-        EXPECT_EQ(holder->readLine(), "ready");
-    }
-    Finished kvlsim(std::vector<std::string> arguments) const {
-        arguments.insert(arguments.begin(), KVLSIM_TOOL);
-        return kvlsim::testing::run(arguments, {"KVLSIM_SOCKET=" + directory.file("socket")});
-    }
-    std::string succeed(std::vector<std::string> const& arguments) const {
-        Finished const finished = kvlsim(arguments);
-        EXPECT_EQ(finished.status, 0) << finished.err;
-        EXPECT_EQ(finished.err, "");
-        return finished.out;
-    }
-    void expectRefusal(std::vector<std::string> const& arguments, int status,
-                       std::string const& line) const {
-        Finished const finished = kvlsim(arguments);
-        EXPECT_EQ(finished.status, status);
-        EXPECT_THAT(finished.err, HasSubstr(line));
-        EXPECT_EQ(finished.out, "");
-    }
     std::string serials() const {
         holder->writeLine("store");
         return holder->readLine();
     }
-
-    kvlsim::testing::TemporaryDirectory directory;
-    std::unique_ptr<ChildProcess> holder;
 };
 
 TEST_F(KvlsimStoreToolTest, AddedAndRemovedRecordsReachARunningReader) {
@@ -81,7 +52,7 @@ TEST_F(KvlsimStoreToolTest, ListIsATable) {
 }
 
 TEST_F(KvlsimStoreToolTest, ProcessWithoutADirectoryHasNoStore) {
-    hold("VQRXCFGPATH=");
+    hold({"VQRXCFGPATH="});
     expectRefusal({"store", "list"}, 1,
                   "kvlsim: no attribute store: the process has no VQRXCFGPATH; set it to a "
                   "directory\n");

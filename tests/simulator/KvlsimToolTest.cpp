@@ -13,8 +13,7 @@
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 
-#include "tests/simulator/ChildProcess.h"
-#include "tests/simulator/TemporaryDirectory.h"
+#include "tests/simulator/ToolFixture.h"
 
 namespace {
 
@@ -24,30 +23,8 @@ using nlohmann::json;
 using testing::HasSubstr;
 using testing::StartsWith;
 
-class KvlsimToolTest : public testing::Test {
+class KvlsimToolTest : public ToolTest {
   protected:
-    std::string socket() const { return directory.file("socket"); }
-
-    ChildProcess& hold(std::vector<std::string> environment = {}) {
-        holder.reset(); // an earlier one gives the socket up before the next wants it
-        environment.push_back("KVLSIM_SOCKET=" + socket());
-        holder = std::make_unique<ChildProcess>(std::vector<std::string>{KVLSIM_PLATFORM_HOLDER},
-                                                environment);
-        EXPECT_EQ(holder->readLine(), "ready");
-        return *holder;
-    }
-
-    Finished kvlsim(std::vector<std::string> arguments) const {
-        arguments.insert(arguments.begin(), KVLSIM_TOOL);
-        return kvlsim::testing::run(arguments, {"KVLSIM_SOCKET=" + socket()});
-    }
-
-    void succeed(std::vector<std::string> const& arguments) const {
-        Finished const finished = kvlsim(arguments);
-        EXPECT_EQ(finished.status, 0) << arguments.front() << ": " << finished.err;
-        EXPECT_EQ(finished.err, "");
-    }
-
     json board(std::string const& name) const {
         Finished const shown = kvlsim({"show", name, "--json"});
         EXPECT_EQ(shown.status, 0) << shown.err;
@@ -61,15 +38,6 @@ class KvlsimToolTest : public testing::Test {
         EXPECT_EQ(finished.err, line + "\n");
         EXPECT_EQ(finished.out, "");
     }
-
-    std::string write(char const* name, std::string const& text) const {
-        std::string const path = directory.file(name);
-        std::ofstream(path) << text;
-        return path;
-    }
-
-    kvlsim::testing::TemporaryDirectory directory;
-    std::unique_ptr<ChildProcess> holder;
 };
 
 TEST_F(KvlsimToolTest, PulledBoardIsAnnouncedAndGone) {

@@ -9,110 +9,108 @@
 
 #include "simulator/ChassisJson.h"
 #include "simulator/ChassisReader.h"
+#include "tests/simulator/BadFixture.h"
 
 namespace {
 
 using namespace kvlsim;
 
-struct BadPart {
-    char const* file;
-    char const* refusal; ///< behind the file's name
-};
-
-class BadLinePartTest : public testing::TestWithParam<BadPart> {};
+class BadLinePartTest : public testing::TestWithParam<BadFixture> {};
 
 TEST_P(BadLinePartTest, IsRefusedWithPlaceAndRemedy) {
-    std::string const path = std::string(KVLSIM_FIXTURES "/") + GetParam().file;
-    std::string refusal = "accepted";
-    try {
-        readChassis(readChassisFile(path));
-    } catch (ChassisError const& error) {
-        refusal = describeError(GetParam().file, error);
-    }
-    EXPECT_EQ(refusal, std::string(GetParam().file) + GetParam().refusal);
+    EXPECT_EQ(refusalOf(GetParam()), std::string(GetParam().file) + GetParam().refusal);
 }
 
 INSTANTIATE_TEST_SUITE_P(
     Fixtures, BadLinePartTest,
     testing::Values(
-        BadPart{"channels-is-a-number.yaml",
-                ":7: the part channels of device 2 cannot be 30; begin it with \"bearers:\""},
-        BadPart{"channels-no-bearers.yaml",
-                ":7: the part channels of device 2 has no bearers; give it \"bearers:\", 1 to 31"},
-        BadPart{"channels-too-many-bearers.yaml",
-                ":8: bearers cannot be 32; write a whole number from 1 to 31"},
-        BadPart{"channels-unknown-key.yaml", ":7: unknown key \"signaling\" in the part channels "
-                                             "of device 2; known: bearers, signalling"},
-        BadPart{"channels-unknown-signalling.yaml",
-                ":9: signalling cannot be the text \"l3\"; choose inactive, l1 or l2"},
-        BadPart{"line-alarm-is-a-map.yaml",
-                ":9: an alarm cannot be a map; write a name, such as los"},
-        BadPart{"line-alarm-twice.yaml", ":9: alarm \"los\" is written twice; keep one"},
-        BadPart{"line-alarms-is-a-text.yaml",
-                ":9: alarms cannot be the text \"los\"; write a list of names, such as [los, rai]"},
-        BadPart{"line-counters-written.yaml",
-                ":8: LINE_COUNTERS follows from the device's line: or channels:; remove it"},
-        BadPart{"line-errors-is-a-list.yaml",
-                ":9: errors cannot be a list; write one kind a line, such as slips: 2"},
-        BadPart{"line-is-a-text.yaml",
-                ":7: the line of device 2 cannot be the text \"esf\"; begin it with \"type:\""},
-        BadPart{"line-no-type.yaml",
-                ":7: the line of device 2 has no type; give it one of esf, d4, e1, e1-crc"},
-        BadPart{"line-of-a-subdevice.yaml",
-                ":8: unknown key \"line\" in sub-device 3; known: handle, type, attributes"},
-        BadPart{"line-past-is-a-number.yaml",
-                ":9: the past of a line cannot be 24; begin it with \"hours:\""},
-        BadPart{"line-past-no-length.yaml",
-                ":9: the past of a line has one length; give either \"hours:\" or \"seconds:\""},
-        BadPart{"line-past-of-no-second.yaml",
-                ":9: seconds cannot be 0; write a whole number from 1 to 86400"},
-        BadPart{"line-past-too-long.yaml",
-                ":9: hours cannot be 25; write a whole number from 1 to 24"},
-        BadPart{"line-past-two-lengths.yaml",
-                ":9: the past of a line has one length; give either \"hours:\" or \"seconds:\""},
-        BadPart{"line-past-unknown-key.yaml", ":9: unknown key \"alarms\" in the past of a line; "
-                                              "known: hours, seconds, errors, spells"},
-        BadPart{"line-rate-negative.yaml", ":10: the rate of slips cannot be -0.5; write a number "
-                                           "per second from 0 to 1000000, such as 0.5"},
-        BadPart{"line-rate-text.yaml",
-                ":9: the rate of code-violations cannot be the text \"some\"; write a number per "
-                "second from 0 to 1000000, such as 0.5"},
-        BadPart{"line-rate-too-large.yaml",
-                ":9: the rate of path-violations cannot be 1000000.5; write a number per second "
-                "from 0 to 1000000, such as 0.5"},
-        BadPart{"line-spell-before-the-past.yaml", ":12: ago cannot be 3601; write a whole number "
-                                                   "from 1 to 3600, the seconds of this past"},
-        BadPart{"line-spell-beyond-loading.yaml",
-                ":12: seconds cannot be 61; write a whole number from 1 to 60, for the spell ends "
-                "at the latest with the past"},
-        BadPart{"line-spell-is-a-text.yaml",
-                ":11: a spell cannot be the text \"los\"; begin it with \"ago:\""},
-        BadPart{
+        BadFixture{"channels-is-a-number.yaml",
+                   ":7: the part channels of device 2 cannot be 30; begin it with \"bearers:\""},
+        BadFixture{
+            "channels-no-bearers.yaml",
+            ":7: the part channels of device 2 has no bearers; give it \"bearers:\", 1 to 31"},
+        BadFixture{"channels-too-many-bearers.yaml",
+                   ":8: bearers cannot be 32; write a whole number from 1 to 31"},
+        BadFixture{"channels-unknown-key.yaml",
+                   ":7: unknown key \"signaling\" in the part channels "
+                   "of device 2; known: bearers, signalling"},
+        BadFixture{"channels-unknown-signalling.yaml",
+                   ":9: signalling cannot be the text \"l3\"; choose inactive, l1 or l2"},
+        BadFixture{"line-alarm-is-a-map.yaml",
+                   ":9: an alarm cannot be a map; write a name, such as los"},
+        BadFixture{"line-alarm-twice.yaml", ":9: alarm \"los\" is written twice; keep one"},
+        BadFixture{
+            "line-alarms-is-a-text.yaml",
+            ":9: alarms cannot be the text \"los\"; write a list of names, such as [los, rai]"},
+        BadFixture{"line-counters-written.yaml",
+                   ":8: LINE_COUNTERS follows from the device's line: or channels:; remove it"},
+        BadFixture{"line-errors-is-a-list.yaml",
+                   ":9: errors cannot be a list; write one kind a line, such as slips: 2"},
+        BadFixture{"line-is-a-text.yaml",
+                   ":7: the line of device 2 cannot be the text \"esf\"; begin it with \"type:\""},
+        BadFixture{"line-no-type.yaml",
+                   ":7: the line of device 2 has no type; give it one of esf, d4, e1, e1-crc"},
+        BadFixture{"line-of-a-subdevice.yaml",
+                   ":8: unknown key \"line\" in sub-device 3; known: handle, type, attributes"},
+        BadFixture{"line-past-is-a-number.yaml",
+                   ":9: the past of a line cannot be 24; begin it with \"hours:\""},
+        BadFixture{"line-past-no-length.yaml",
+                   ":9: the past of a line has one length; give either \"hours:\" or \"seconds:\""},
+        BadFixture{"line-past-of-no-second.yaml",
+                   ":9: seconds cannot be 0; write a whole number from 1 to 86400"},
+        BadFixture{"line-past-too-long.yaml",
+                   ":9: hours cannot be 25; write a whole number from 1 to 24"},
+        BadFixture{"line-past-two-lengths.yaml",
+                   ":9: the past of a line has one length; give either \"hours:\" or \"seconds:\""},
+        BadFixture{"line-past-unknown-key.yaml",
+                   ":9: unknown key \"alarms\" in the past of a line; "
+                   "known: hours, seconds, errors, spells"},
+        BadFixture{"line-rate-negative.yaml",
+                   ":10: the rate of slips cannot be -0.5; write a number "
+                   "per second from 0 to 1000000, such as 0.5"},
+        BadFixture{
+            "line-rate-text.yaml",
+            ":9: the rate of code-violations cannot be the text \"some\"; write a number per "
+            "second from 0 to 1000000, such as 0.5"},
+        BadFixture{"line-rate-too-large.yaml",
+                   ":9: the rate of path-violations cannot be 1000000.5; write a number per second "
+                   "from 0 to 1000000, such as 0.5"},
+        BadFixture{"line-spell-before-the-past.yaml",
+                   ":12: ago cannot be 3601; write a whole number "
+                   "from 1 to 3600, the seconds of this past"},
+        BadFixture{
+            "line-spell-beyond-loading.yaml",
+            ":12: seconds cannot be 61; write a whole number from 1 to 60, for the spell ends "
+            "at the latest with the past"},
+        BadFixture{"line-spell-is-a-text.yaml",
+                   ":11: a spell cannot be the text \"los\"; begin it with \"ago:\""},
+        BadFixture{
             "line-spell-no-ago.yaml",
             ":12: a spell has no ago; say when it began (ago:) and how long it lasted (seconds:)"},
-        BadPart{"line-spell-no-seconds.yaml", ":12: a spell has no seconds; say when it began "
-                                              "(ago:) and how long it lasted (seconds:)"},
-        BadPart{"line-spell-of-nothing.yaml",
-                ":12: a spell without alarms and errors is none; give it one or remove it"},
-        BadPart{"line-spell-unknown-key.yaml",
-                ":12: unknown key \"alarm\" in a spell; known: ago, seconds, alarms, errors"},
-        BadPart{"line-spells-is-a-map.yaml",
-                ":11: spells cannot be a map; write a list, each spell beginning with \"- ago:\""},
-        BadPart{"line-type-contradicted.yaml",
-                ":8: the line of device 2 is of type esf (2), but its LINE_TYPE is 3; remove "
-                "LINE_TYPE from the attributes"},
-        BadPart{"line-unknown-alarm.yaml",
-                ":9: no alarm is called \"red\"; there are los, lof, ais, rai, sending-rai, "
-                "sending-ais, loopback, ts16-ais, remote-multiframe, sending-remote-multiframe, "
-                "test-code"},
-        BadPart{"line-unknown-error.yaml",
-                ":10: no error of a line is called \"slip\"; there are code-violations, "
-                "path-violations, framing-errors, slips"},
-        BadPart{
+        BadFixture{"line-spell-no-seconds.yaml", ":12: a spell has no seconds; say when it began "
+                                                 "(ago:) and how long it lasted (seconds:)"},
+        BadFixture{"line-spell-of-nothing.yaml",
+                   ":12: a spell without alarms and errors is none; give it one or remove it"},
+        BadFixture{"line-spell-unknown-key.yaml",
+                   ":12: unknown key \"alarm\" in a spell; known: ago, seconds, alarms, errors"},
+        BadFixture{
+            "line-spells-is-a-map.yaml",
+            ":11: spells cannot be a map; write a list, each spell beginning with \"- ago:\""},
+        BadFixture{"line-type-contradicted.yaml",
+                   ":8: the line of device 2 is of type esf (2), but its LINE_TYPE is 3; remove "
+                   "LINE_TYPE from the attributes"},
+        BadFixture{"line-unknown-alarm.yaml",
+                   ":9: no alarm is called \"red\"; there are los, lof, ais, rai, sending-rai, "
+                   "sending-ais, loopback, ts16-ais, remote-multiframe, sending-remote-multiframe, "
+                   "test-code"},
+        BadFixture{"line-unknown-error.yaml",
+                   ":10: no error of a line is called \"slip\"; there are code-violations, "
+                   "path-violations, framing-errors, slips"},
+        BadFixture{
             "line-unknown-key.yaml",
             ":9: unknown key \"error\" in the line of device 2; known: type, errors, alarms, past"},
-        BadPart{"line-unknown-type.yaml", ":8: the line of device 2 cannot be of type \"t1\"; "
-                                          "choose one of esf, d4, e1, e1-crc"}),
+        BadFixture{"line-unknown-type.yaml", ":8: the line of device 2 cannot be of type \"t1\"; "
+                                             "choose one of esf, d4, e1, e1-crc"}),
     [](auto const& each) {
         std::string name = each.param.file;
         name.erase(name.find('.'));

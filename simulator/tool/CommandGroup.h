@@ -1,0 +1,44 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// A word of kvlsim with commands below it, such as `kvlsim line ...`.
+#pragma once
+
+#include <functional>
+#include <memory>
+
+#include <CLI/CLI.hpp>
+
+#include "simulator/tool/StoreTool.h"
+
+namespace kvlsim {
+
+/// Its commands share one set of options; the command that is chosen puts what to do into `chosen`.
+template <class Options>
+class CommandGroup {
+  public:
+    CommandGroup(CLI::App& app, char const* name, char const* help, Connect connect,
+                 std::function<void()>& chosen)
+        : m_group(app.add_subcommand(name, help)), m_connect(std::move(connect)), m_chosen(chosen) {
+        m_group->fallthrough()->require_subcommand(1);
+    }
+
+    std::shared_ptr<Options> const& options() const { return m_options; }
+
+    /// `run(options, connect)` does the work.
+    template <class Run>
+    CLI::App* add(char const* name, char const* help, Run run) {
+        CLI::App* const command = m_group->add_subcommand(name, help);
+        command->fallthrough();
+        command->callback([&chosen = m_chosen, options = m_options, connect = m_connect, run] {
+            chosen = [options, connect, run] { run(*options, connect); };
+        });
+        return command;
+    }
+
+  private:
+    CLI::App* m_group;
+    std::shared_ptr<Options> m_options = std::make_shared<Options>();
+    Connect m_connect;
+    std::function<void()>& m_chosen;
+};
+
+} // namespace kvlsim
