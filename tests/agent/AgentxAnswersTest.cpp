@@ -1,6 +1,9 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/AgentxAnswers.h"
 
+#include <algorithm>
+#include <random>
+
 #include <gtest/gtest.h>
 
 #include "agent/Objects.h"
@@ -216,6 +219,34 @@ TEST_F(AgentxAnswersTest, RequestThatEndsTooSoonIsAnError) {
     AgentxWriter writer(AgentxKind::Get, 1, 2, 3);
     writer.name(m_name2);
     EXPECT_THROW(answer(writer.take()), AgentxError);
+}
+
+TEST_F(AgentxAnswersTest, DamagedRequestsAreAnsweredOrRefused) {
+    AgentxWriter writer(AgentxKind::GetBulk, 1, 2, 3);
+    writer.number16(1);
+    writer.number16(2);
+    for (Oid const& name : {m_name2, m_name5, m_name2, m_name5})
+        writer.name(name);
+    std::string const good = writer.take();
+    std::mt19937 random(1);
+    int answered = 0;
+    int refused = 0;
+    for (int round = 0; round < 5000; ++round) {
+        std::string request = good;
+        for (int damage = 0; damage < 3; ++damage)
+            request[random() % request.size()] = static_cast<char>(random() % 256);
+        request.resize(std::max<std::size_t>(AgentxHeader::kSize, random() % (good.size() * 2)));
+        try {
+            std::string const response = answer(request);
+            EXPECT_TRUE(response.empty() ||
+                        parseAgentxHeader(response).kind == AgentxKind::Response);
+            ++answered;
+        } catch (AgentxError const&) {
+            ++refused;
+        }
+    }
+    EXPECT_GT(answered, 100);
+    EXPECT_GT(refused, 100);
 }
 
 } // namespace

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/AgentxSession.h"
 
+#include <arpa/inet.h>
+#include <netinet/in.h>
 #include <poll.h>
 #include <sys/socket.h>
 #include <sys/un.h>
@@ -335,6 +337,31 @@ TEST_F(AgentxSessionTest, MasterThatLetsNobodyInIsWaitedForWithoutBlocking) {
         m_master->hangUp();
     }
     connectSession();
+}
+
+TEST_F(AgentxSessionTest, RefusedConnectionOfTheNetworkIsTriedAgain) {
+    // A bound port where nobody listens.
+    int const bound = socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0);
+    sockaddr_in address{};
+    address.sin_family = AF_INET;
+    address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+    socklen_t size = sizeof address;
+    ASSERT_EQ(bind(bound, reinterpret_cast<sockaddr*>(&address), size), 0);
+    ASSERT_EQ(getsockname(bound, reinterpret_cast<sockaddr*>(&address), &size), 0);
+    m_session.emplace(
+        *parseAgentxAddress("tcp:" + std::to_string(ntohs(address.sin_port))),
+        std::vector<Oid>{kRoot}, [](AgentxHeader const&, std::string_view) { return ""; },
+        patient());
+    EXPECT_TRUE(runUntil([this] { return m_session->descriptor() < 0; }));
+    ASSERT_EQ(listen(bound, 1), 0);
+    int accepted = -1;
+    EXPECT_TRUE(runUntil([&] {
+        pollfd door{bound, POLLIN, 0};
+        if (poll(&door, 1, 0) > 0) accepted = accept4(bound, nullptr, nullptr, SOCK_CLOEXEC);
+        return accepted >= 0;
+    }));
+    close(accepted);
+    close(bound);
 }
 
 TEST_F(AgentxSessionTest, LeaveIsTaken) {
