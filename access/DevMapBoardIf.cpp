@@ -110,7 +110,11 @@ time_t DevMapBoardIf::StateChangeDate() {
     std::tm date{};
     if (strptime(text.text().c_str(), "%a %b %e %T %Y", &date) == nullptr) return 0;
     date.tm_isdst = -1; // the text does not say whether summer time was in force
-    return std::mktime(&date);
+    // Where time_t has 32 bits it may not hold the date; mktime() fails and leaves the weekday
+    // alone.
+    date.tm_wday = -1;
+    time_t const seconds = std::mktime(&date);
+    return date.tm_wday < 0 ? 0 : seconds;
 }
 
 std::vector<long> DevMapBoardIf::ListDevicesByType(int type) {

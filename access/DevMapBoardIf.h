@@ -43,7 +43,8 @@ class KVLOAM_API DevMapBoardIf {
     long BoardCondition();
     /// Live. -1 when there is none.
     long BoardPresent();
-    /// Live. Seconds since the epoch; 0 when there is none or it is no date.
+    /// Live. Seconds since the epoch; 0 when there is none, it is no date, or `time_t` cannot
+    /// hold it.
     time_t StateChangeDate();
 
     /// The board's devices of one type, at most `kDMSearchCapacity`.

@@ -19,6 +19,10 @@ function(kvloam_target target)
         $<$<AND:$<CXX_COMPILER_ID:GNU>,$<VERSION_LESS:$<CXX_COMPILER_VERSION>,13>>:-Wno-restrict>
         $<$<CXX_COMPILER_ID:Clang>:-Winconsistent-missing-override -Wsuggest-override>
         $<$<BOOL:${KVLOAM_WERROR}>:-Werror>)
+    if(CMAKE_SIZEOF_VOID_P EQUAL 4)
+        # Or stat() fails for a file with a large inode number.
+        target_compile_definitions(${target} PRIVATE _FILE_OFFSET_BITS=64)
+    endif()
     if(KVLOAM_SANITIZE)
         target_compile_options(${target} PRIVATE
             -fsanitize=${KVLOAM_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer)

@@ -185,6 +185,11 @@ TEST_F(DevMapBoardIfTest, StateChangeDateThatIsNoDateIsZero) {
     EXPECT_EQ(dateOf("yesterday", "UTC0"), 0);
 }
 
+TEST_F(DevMapBoardIfTest, StateChangeDateThatIsTooLateForTheSystemsTimeIsZero) {
+    time_t const known = sizeof(time_t) == 4 ? 0 : static_cast<time_t>(4102444800);
+    EXPECT_EQ(dateOf("Fri Jan  1 00:00:00 2100", "UTC0"), known);
+}
+
 TEST_F(DevMapBoardIfTest, StateChangeDateThatIsMissingIsZero) {
     DevMapBoardIf board = record("");
     sim::unset(5, "STATE_CHANGE_DATE");

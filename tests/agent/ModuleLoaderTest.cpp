@@ -23,6 +23,13 @@ class ModuleLoaderTest : public ::testing::Test {
         }
         return {};
     }
+
+    /// What is said of a module that was built for another version.
+    static std::string refusal(std::string const& name) {
+        return "module '" + name + "' refuses version " +
+               std::to_string(KVL_BOARD_MODULE_ABI_VERSION) +
+               " of the module interface; rebuild it for this agent";
+    }
 };
 
 TEST_F(ModuleLoaderTest, UnknownModuleIsNamedWithThePathThatWasTried) {
@@ -44,6 +51,18 @@ TEST_F(ModuleLoaderTest, ModuleThatRefusesTheVersionIsNamedWithTheVersion) {
     EXPECT_THAT(complaint("refusing"), AllOf(HasSubstr("'refusing'"), HasSubstr("version 1")));
 }
 
+TEST_F(ModuleLoaderTest, ModuleOfTheVersionBeforeIsRefusedWithTheVersionItWasAskedFor) {
+    EXPECT_EQ(complaint("older"), refusal("older"));
+}
+
+TEST_F(ModuleLoaderTest, ModuleOfTheNextVersionIsRefusedWithTheVersionItWasAskedFor) {
+    EXPECT_EQ(complaint("newer"), refusal("newer"));
+}
+
+TEST_F(ModuleLoaderTest, ModuleOfThisVersionMakesAFactory) {
+    EXPECT_NE(LoadedModule("current", BROKEN_MODULE_DIR).createFactory().get(), nullptr);
+}
+
 TEST_F(ModuleLoaderTest, ModuleThatThrowsIsNamedWithItsReason) {
     EXPECT_THAT(complaint("throwing"), AllOf(HasSubstr("'throwing'"), HasSubstr("out of boards")));
 }
@@ -57,8 +76,8 @@ TEST_F(ModuleLoaderTest, NameWithAPathIsRefused) {
 }
 
 TEST_F(ModuleLoaderTest, EveryComplaintIsOneLine) {
-    for (char const* const name :
-         {"nothing", "text", "noentry", "refusing", "throwing", "throwing-odd", "a/b", ""})
+    for (char const* const name : {"nothing", "text", "noentry", "refusing", "older", "newer",
+                                   "throwing", "throwing-odd", "a/b", ""})
         EXPECT_THAT(complaint(name), AllOf(Not(""), Not(HasSubstr("\n")))) << name;
 }
 

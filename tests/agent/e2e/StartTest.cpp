@@ -67,7 +67,8 @@ TEST_F(StartTest, UnknownModuleIsNamedWithTheFileThatWasTried) {
 }
 
 TEST_F(StartTest, BrokenModulesAreNamed) {
-    for (char const* const module : {"noentry", "refusing", "throwing", "throwing-odd", "text"})
+    for (char const* const module :
+         {"noentry", "refusing", "older", "newer", "throwing", "throwing-odd", "text"})
         expectOneLine(start({"--module", module}, BROKEN_MODULE_DIR), kExitFailure,
                       HasSubstr("'" + std::string(module) + "'"));
 }
