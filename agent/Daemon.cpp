@@ -1,11 +1,8 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/Daemon.h"
 
-#include <sys/signalfd.h>
-#include <unistd.h>
-
+#include <algorithm>
 #include <cerrno>
-#include <csignal>
 #include <cstdlib>
 #include <ctime>
 #include <filesystem>
@@ -17,6 +14,7 @@
 #include "access/ExternalFaultEventAdaptor.h"
 #include "agent/BoardSource.h"
 #include "agent/Collector.h"
+#include "agent/Front.h"
 #include "agent/InterfaceIndices.h"
 #include "agent/InterfaceReader.h"
 #include "agent/Log.h"
@@ -24,9 +22,9 @@
 #include "agent/Notifier.h"
 #include "agent/ObjectTree.h"
 #include "agent/Objects.h"
+#include "agent/ServiceNotice.h"
+#include "agent/Signals.h"
 #include "agent/SnmpConfig.h"
-#include "agent/SnmpHandler.h"
-#include "agent/SnmpLoop.h"
 #include "agent/StandardObjects.h"
 #include "agent/StatusListener.h"
 #include "agent/Wakeup.h"
@@ -35,36 +33,8 @@ namespace kvloamd {
 
 namespace {
 
-/// SIGTERM and SIGINT as a descriptor. They are blocked for the whole process: made before any
-/// other thread.
-class StopSignals {
-  public:
-    StopSignals() {
-        sigemptyset(&m_signals);
-        sigaddset(&m_signals, SIGTERM);
-        sigaddset(&m_signals, SIGINT);
-        pthread_sigmask(SIG_BLOCK, &m_signals, nullptr);
-        m_descriptor = signalfd(-1, &m_signals, SFD_CLOEXEC | SFD_NONBLOCK);
-        if (m_descriptor < 0) throw std::system_error(errno, std::generic_category(), "signalfd");
-    }
-    ~StopSignals() { close(m_descriptor); }
-    StopSignals(StopSignals const&) = delete;
-    StopSignals& operator=(StopSignals const&) = delete;
-
-    int descriptor() const { return m_descriptor; }
-
-    /// From now on such a signal ends the process at once, for whoever finds the stop too slow.
-    void letThrough() const {
-        signalfd_siginfo taken;
-        while (read(m_descriptor, &taken, sizeof taken) > 0) {
-        }
-        pthread_sigmask(SIG_UNBLOCK, &m_signals, nullptr);
-    }
-
-  private:
-    sigset_t m_signals{};
-    int m_descriptor = -1;
-};
+/// How long a stop may be held up by notifications that a master does not take.
+constexpr std::chrono::seconds kLastWords{1};
 
 /// What the library's threads may reach until the process ends. Never destroyed.
 struct Boards {
@@ -98,38 +68,6 @@ std::vector<LoadedModule> loadModules(Options const& options) {
     for (std::string const& name : options.modules)
         modules.emplace_back(name, options.moduleDirectory);
     return modules;
-}
-
-bool report(std::vector<std::string> const& faults) {
-    for (std::string const& fault : faults)
-        log(LogLevel::Error, fault);
-    return faults.empty();
-}
-
-/// The SNMP library, from its start to its end.
-class SnmpSession {
-  public:
-    explicit SnmpSession(Options const& options) : m_faults(startSnmp(options)) {}
-    ~SnmpSession() { stopSnmp(); }
-    SnmpSession(SnmpSession const&) = delete;
-    SnmpSession& operator=(SnmpSession const&) = delete;
-
-    std::vector<std::string> const& faults() const { return m_faults; }
-
-  private:
-    std::vector<std::string> m_faults;
-};
-
-/// Opens every address that `options` name.
-bool listen(Options const& options) {
-    bool open = true;
-    for (std::string const& address : options.listen) {
-        std::string const fault = SnmpLoop::listen(address);
-        if (fault.empty()) continue;
-        log(LogLevel::Error, fault);
-        open = false;
-    }
-    return open;
 }
 
 /// Every module's factory is made before the first is attached: a bad module leaves nothing half
@@ -181,14 +119,65 @@ class TemporaryFolder {
     std::string m_path;
 };
 
-void serve(Options const& options, StopSignals const& stopSignals, Boards& boards,
-           Clock::time_point started) {
+bool checkSnmpConfig(Options const& options) {
+    // The SNMP library keeps its state as it goes; a check leaves no trace.
+    TemporaryFolder const folder;
+    Options withoutTrace = options;
+    withoutTrace.persistentDirectory = folder.path();
+    std::vector<std::string> const faults = startSnmp(withoutTrace);
+    for (std::string const& fault : faults)
+        log(LogLevel::Error, fault);
+    stopSnmp();
+    return faults.empty();
+}
+
+using Deadline = std::optional<Clock::time_point>;
+
+Deadline earliest(Deadline const& one, Deadline const& other) {
+    return one && other ? std::min(*one, *other) : one ? one : other;
+}
+
+/// Reads the options again. What can change while the agent runs changes; the rest waits for the
+/// next start.
+void reload(Options const& started, ReadOptions const& readAgain) {
+    auto const read = readAgain();
+    auto const* const options = std::get_if<Options>(&read);
+    if (options == nullptr) {
+        log(LogLevel::Error, std::get<Exit>(read).text + "; going on as before");
+        return;
+    }
+    setLogLevel(options->logLevel);
+    Options now = *options;
+    now.logLevel = started.logLevel;
+    log(LogLevel::Info, now == started ? "the configuration has been read again"
+                                       : "the configuration has been read again; what has changed "
+                                         "beside the log level counts from the next start on");
+}
+
+/// Has the last notifications leave, if they can soon.
+void announceLast(Notifier& notifier, StatusQueue& queue, Front& front) {
+    front.beforeSleep([&]() -> std::optional<Clock::time_point> {
+        if (notifier.announceAll()) front.stop();
+        return std::nullopt;
+    });
+    front.run(Clock::now() + kLastWords);
+    if (std::size_t const left = queue.size(); left > 0)
+        log(LogLevel::Warning,
+            "notifications that could not be sent before the stop: " + std::to_string(left));
+}
+
+void serve(Options const& options, ReadOptions const& readAgain, Front& front,
+           Signals const& signals, Boards& boards, Clock::time_point started) {
     Wakeup wakeup;
     ServiceManager& services = *ServiceManager::GetInstance();
     KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
     PlatformReader platform;
-    InterfaceIndices indices(persistentDirectory() + "/ifindex.sqlite", options.interfaceBase);
-    InterfaceReader interfaces(*boards.manager.get(), indices, started);
+    std::optional<InterfaceIndices> indices;
+    std::optional<InterfaceReader> interfaces;
+    if (front.servesStandardObjects()) {
+        indices.emplace(persistentDirectory() + "/ifindex.sqlite", options.interfaceBase);
+        interfaces.emplace(*boards.manager.get(), *indices, started);
+    }
     Collector collector(
         [&](Snapshot& snapshot) {
             snapshot.boards = boards.source.read();
@@ -197,44 +186,48 @@ void serve(Options const& options, StopSignals const& stopSignals, Boards& board
             snapshot.platformService = readPlatformService(services);
             snapshot.processes = readProcesses(statistics);
             snapshot.records = platform.read(snapshot.boards);
-            snapshot.interfaces = interfaces.read(snapshot.boards);
+            if (interfaces) snapshot.interfaces = interfaces->read(snapshot.boards);
         },
         started, [&] { wakeup.wake(); });
     std::vector<Table const*> const allTables = tables();
     ObjectTree const tree(scalars(), allTables);
-    SnmpHandler handler(tree, boards.counters, options.enterprise,
-                        [&] { return collector.snapshot(); });
-    if (!handler.serve(kObjectsPlace))
-        throw std::runtime_error("the SNMP library does not let the agent serve its objects; check "
-                                 "--enterprise-oid");
     std::vector<Table const*> const allStandardTables = standardTables();
     ObjectTree const standardTree(standardScalars(), allStandardTables);
-    SnmpHandler standardHandler(standardTree, boards.counters, kStandardArc,
-                                [&] { return collector.snapshot(); });
-    for (Oid const& place : kStandardPlaces)
-        if (!standardHandler.serve(place))
-            throw std::runtime_error("the SNMP library does not let the agent serve the standard "
-                                     "interface objects; check --enterprise-oid");
-    Notifier notifier(boards.queue, options.enterprise);
-    SnmpLoop loop;
-    loop.watch(wakeup.descriptor(), [&] { wakeup.clear(); });
-    loop.watch(stopSignals.descriptor(), [&] { loop.stop(); });
-    loop.beforeSleep([&] { return notifier.announce(collector.newest()->begun); });
+    std::vector<ServedTree> served{{tree, options.enterprise, {kObjectsPlace}}};
+    if (interfaces)
+        served.push_back(
+            {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}});
+    front.serve({std::move(served), boards.counters, [&] { return collector.snapshot(); }});
+    Notifier notifier(boards.queue, front.notifications(), options.enterprise);
+    ServiceNotice notice;
+    std::string const serving =
+        "serving " + std::to_string(collector.newest()->boards.size()) + " boards " + front.place();
+    front.watch(wakeup.descriptor(), [&] { wakeup.clear(); });
+    front.watch(signals.descriptor(), [&] {
+        while (auto const signal = signals.next()) {
+            if (*signal == Signal::Stop) return front.stop();
+            notice.reloading();
+            reload(options, readAgain);
+            notice.ready(serving);
+        }
+    });
+    front.beforeSleep(
+        [&] { return earliest(notifier.announce(collector.newest()->begun), notice.beat()); });
     ListeningScope const listening(boards.listener, [&] { collector.renew(); });
-    Notifier::announceStart();
-    log(LogLevel::Info, "serving " + std::to_string(collector.newest()->boards.size()) +
-                            " boards on " + options.listen.front());
-    loop.run();
-    stopSignals.letThrough();
+    log(LogLevel::Info, serving);
+    notice.ready(serving);
+    front.run();
+    signals.letStopThrough();
+    notice.stopping();
     log(LogLevel::Info, "stopping");
     boards.listener.stop();
-    notifier.announceAll();
+    announceLast(notifier, boards.queue, front);
 }
 
 } // namespace
 
-int runDaemon(Options const& options) {
-    StopSignals const stopSignals;
+int runDaemon(Options const& options, ReadOptions const& readAgain) {
+    Signals const signals;
     tzset();
     // The library's threads reach these until the process ends.
     static auto* const boards = new Boards;
@@ -243,11 +236,11 @@ int runDaemon(Options const& options) {
         if (modules.empty())
             log(LogLevel::Warning, "no board module is named, so there will be no boards; name one "
                                    "with --module");
-        SnmpSession const snmp(options);
-        if (!report(snmp.faults()) || !listen(options) || !platformAnswers()) return kExitFailure;
+        std::unique_ptr<Front> const front = makeFront(options);
+        if (!front->open() || !platformAnswers()) return kExitFailure;
         Clock::time_point const started = Clock::now();
         attachModules(modules, *boards);
-        serve(options, stopSignals, *boards, started);
+        serve(options, readAgain, *front, signals, *boards, started);
         log(LogLevel::Info, "stopped");
     } catch (std::exception const& error) {
         log(LogLevel::Error, error.what());
@@ -266,12 +259,8 @@ int checkConfiguration(Options const& options) {
             good = false;
         }
     }
-    // The SNMP library keeps its state as it goes; a check leaves no trace.
-    TemporaryFolder const folder;
-    Options withoutTrace = options;
-    withoutTrace.persistentDirectory = folder.path();
-    SnmpSession const snmp(withoutTrace);
-    good = report(snmp.faults()) && good;
+    // Beside a master, who may ask is the master's concern.
+    if (options.agentx.empty()) good = checkSnmpConfig(options) && good;
     if (good) log(LogLevel::Info, "the configuration is good");
     return good ? 0 : kExitFailure;
 }

@@ -1,13 +1,14 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/Log.h"
 
+#include <atomic>
 #include <cstdio>
 
 namespace kvloamd {
 
 namespace {
 
-LogLevel logLevel = LogLevel::Info;
+std::atomic<LogLevel> logLevel = LogLevel::Info;
 
 } // namespace
 

@@ -9,8 +9,7 @@ namespace kvloamd {
 
 enum class LogLevel { Error, Warning, Info, Debug };
 
-/// Lines above `level` are left out. The level is `Info` until it is set; set it before other
-/// threads log.
+/// Lines above `level` are left out from now on. The level is `Info` until it is set. Any thread.
 void setLogLevel(LogLevel level);
 
 /// Writes "kvloamd: <text>" as one line, in one piece. Any thread.

@@ -1,10 +1,11 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Announces status changes as SNMP notifications.
+// Announces status changes as notifications.
 #pragma once
 
 #include <chrono>
 #include <optional>
 
+#include "agent/NotificationSink.h"
 #include "agent/StatusQueue.h"
 
 namespace kvloamd {
@@ -17,23 +18,23 @@ class Notifier {
     /// the same.
     static constexpr std::chrono::milliseconds kPatience{1000};
 
-    /// `queue` outlives the notifier. `enterprise` is the arc above all names.
-    Notifier(StatusQueue& queue, Oid enterprise);
-
-    /// Announces that the agent has started.
-    static void announceStart();
+    /// `queue` and `sink` outlive the notifier. `enterprise` is the arc above all names.
+    Notifier(StatusQueue& queue, NotificationSink& sink, Oid enterprise);
 
     /// Announces the changes that a snapshot begun at `snapshotBegun` shows, and those that have
-    /// waited long enough. Returns when to come again at the latest, if any is left.
+    /// waited long enough, as far as the sink is ready. A change stays in the queue until the sink
+    /// answers for it. Returns when to come again at the latest, if only time is missing.
     std::optional<Clock::time_point> announce(Clock::time_point snapshotBegun);
 
-    /// Announces all that is left.
-    void announceAll();
+    /// Announces without waiting for a snapshot. Whether nothing is left.
+    bool announceAll();
 
   private:
-    void send(StatusChange const& change) const;
+    Notification notificationOf(StatusChange const& change) const;
+    void send(StatusChange const& change);
 
     StatusQueue& m_queue;
+    NotificationSink& m_sink;
     Oid m_enterprise;
 };
 

@@ -8,6 +8,7 @@
 
 #include <CLI/CLI.hpp>
 
+#include "agent/AgentxAddress.h"
 #include "services/oam.h"
 
 namespace kvloamd {
@@ -32,6 +33,21 @@ std::string checkAddress(std::string const& text) {
 std::string defaultModuleDirectory() {
     char const* const directory = std::getenv("KVLOAM_MODULE_DIR");
     return directory != nullptr && *directory != '\0' ? directory : KVLOAM_MODULE_DIRECTORY;
+}
+
+/// What is wrong with options that are good each by itself; empty: nothing.
+std::string checkTogether(Options const& options, bool listens) {
+    if (options.agentx.empty()) return {};
+    if (listens)
+        return "--agentx excludes --port and --listen: beside an SNMP master the agent has no port "
+               "of its own; leave one of them out";
+    if (!options.snmpConfig.empty())
+        return "--agentx excludes --snmp-config: beside an SNMP master, who may ask and who is "
+               "notified stands in the master's configuration; leave one of them out";
+    if (!parseAgentxAddress(options.agentx))
+        return "--agentx: '" + options.agentx +
+               "' is no address; write it as unix:/var/agentx/master or tcp:127.0.0.1:705";
+    return {};
 }
 
 /// The parser's messages may have several lines; ours have one.
@@ -83,6 +99,13 @@ std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
         ->type_name("ADDRESS")
         ->check(checkAddress)
         ->excludes(portOption);
+    auto* const agentxOption =
+        app.add_option(
+               "--agentx", options.agentx,
+               "Serve through the SNMP master here, as in unix:/var/agentx/master, which is "
+               "the default, instead of a port of our own")
+            ->type_name("[ADDRESS]")
+            ->expected(0, 1);
     app.add_option("--module", options.modules, "Load the board module <name>kvl.so; repeatable")
         ->type_name("NAME");
     app.add_option("--module-dir", options.moduleDirectory,
@@ -129,6 +152,9 @@ std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
         }
         return Exit{kExitUsage, oneLine(error.what()) + "; try kvloamd --help"};
     }
+    if (agentxOption->count() > 0 && options.agentx.empty()) options.agentx = kMasterAddress;
+    if (std::string fault = checkTogether(options, !listen.empty() || port != 0); !fault.empty())
+        return Exit{kExitUsage, std::move(fault) + "; try kvloamd --help"};
     if (!listen.empty()) options.listen = listen;
     if (port != 0) options.listen = {"udp:127.0.0.1:" + std::to_string(port)};
     options.enterprise = *parseOid(enterprise);

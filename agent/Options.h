@@ -15,6 +15,7 @@ namespace kvloamd {
 
 struct Options {
     std::vector<std::string> listen{"udp:127.0.0.1:1161"};
+    std::string agentx; ///< the SNMP master's address; empty: the agent stands alone
     std::vector<std::string> modules;
     std::string moduleDirectory;
     std::string snmpConfig;          ///< empty: where Net-SNMP looks by itself
@@ -23,6 +24,8 @@ struct Options {
     std::uint32_t interfaceBase = InterfaceIndices::kDefaultBase;
     LogLevel logLevel = LogLevel::Info;
     bool checkConfig = false;
+
+    bool operator==(Options const&) const = default;
 };
 
 /// Why there are no options: the text to print and the status to exit with. The text is help or

@@ -84,17 +84,21 @@ std::string SnmpLoop::listen(std::string const& address) {
     return {};
 }
 
-void SnmpLoop::run() {
-    while (!m_stop)
-        step();
+void SnmpLoop::run(Clock::time_point until) {
+    m_stop = false;
+    while (!m_stop && Clock::now() < until)
+        step(until);
 }
 
-void SnmpLoop::step() {
-    std::optional<Clock::time_point> const wake = m_prepare ? m_prepare() : std::nullopt;
+void SnmpLoop::step(Clock::time_point until) {
+    std::optional<Clock::time_point> const prepared = m_prepare ? m_prepare() : std::nullopt;
+    if (m_stop) return;
+    Clock::time_point const latest = std::min(until, Clock::now() + std::chrono::hours(1));
+    Clock::time_point const wake = prepared ? std::min(*prepared, latest) : latest;
     DescriptorSet readable;
     int count = 0;
     // In: the longest sleep that suits us. Out: what suits the library's own timers too.
-    timeval timeout = toTimeval(wake ? *wake - Clock::now() : std::chrono::hours(1));
+    timeval timeout = toTimeval(wake - Clock::now());
     int block = 0;
     snmp_select_info2(&count, readable.get(), &timeout, &block);
     for (Watched const& watched : m_watched) {

@@ -23,8 +23,8 @@ class SnmpLoop {
     /// Opens an address such as udp:127.0.0.1:1161. Returns what is wrong, one line; empty: done.
     static std::string listen(std::string const& address);
 
-    /// Serves until `stop`.
-    void run();
+    /// Serves until `stop`, or until `until`.
+    void run(Clock::time_point until);
     void stop() { m_stop = true; }
 
   private:
@@ -33,7 +33,7 @@ class SnmpLoop {
         std::function<void()> readable;
     };
 
-    void step();
+    void step(Clock::time_point until);
 
     std::vector<Watched> m_watched;
     std::function<std::optional<Clock::time_point>()> m_prepare;

@@ -38,19 +38,25 @@ class StatusQueue {
             ++m_counters.notificationsDropped;
     }
 
-    /// When the oldest change happened; nothing when the queue is empty.
-    std::optional<Clock::time_point> oldest() {
+    /// The oldest change, which stays; nothing when the queue is empty.
+    std::optional<StatusChange> oldest() {
         std::scoped_lock const guard(m_mutex);
         if (m_changes.empty()) return std::nullopt;
-        return m_changes.front().when;
+        return m_changes.front();
     }
 
+    /// Takes the oldest change out; nothing when the queue is empty. There is one consumer only.
     std::optional<StatusChange> pop() {
         std::scoped_lock const guard(m_mutex);
         if (m_changes.empty()) return std::nullopt;
         StatusChange change = std::move(m_changes.front());
         m_changes.pop_front();
         return change;
+    }
+
+    std::size_t size() {
+        std::scoped_lock const guard(m_mutex);
+        return m_changes.size();
     }
 
   private:

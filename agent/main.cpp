@@ -21,7 +21,8 @@ int main(int argc, char** argv) {
         }
         auto const& options = std::get<Options>(parsed);
         setLogLevel(options.logLevel);
-        return options.checkConfig ? checkConfiguration(options) : runDaemon(options);
+        if (options.checkConfig) return checkConfiguration(options);
+        return runDaemon(options, [=] { return parseOptions(argc, argv); });
     } catch (std::exception const& error) {
         log(LogLevel::Error, error.what());
         return kExitFailure;

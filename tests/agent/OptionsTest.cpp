@@ -69,6 +69,36 @@ TEST_F(OptionsTest, PortOutOfRangeIsRefused) {
     EXPECT_THAT(exit.text, HasSubstr("65536"));
 }
 
+TEST_F(OptionsTest, AgentStandsAloneUnlessAskedOtherwise) {
+    EXPECT_EQ(options({}).agentx, "");
+}
+
+TEST_F(OptionsTest, MasterIsWhereMastersAreUnlessAnAddressIsGiven) {
+    EXPECT_EQ(options({"--agentx"}).agentx, "/var/agentx/master");
+    EXPECT_EQ(options({"--agentx", "--module", "a"}).agentx, "/var/agentx/master");
+    EXPECT_EQ(options({"--agentx", "tcp:127.0.0.1:705"}).agentx, "tcp:127.0.0.1:705");
+}
+
+TEST_F(OptionsTest, FileNamesTheMasterToo) {
+    EXPECT_EQ(options({"--config", file("agentx=\"unix:/run/master\"\n")}).agentx,
+              "unix:/run/master");
+}
+
+TEST_F(OptionsTest, MasterThatIsNoAddressIsRefused) {
+    Exit const exit = refusal({"--agentx", "here"});
+    EXPECT_EQ(exit.status, kExitUsage);
+    EXPECT_THAT(exit.text, HasSubstr("'here' is no address; write it as unix:"));
+}
+
+TEST_F(OptionsTest, MasterAndWhatIsTheMastersOwnExcludeEachOther) {
+    EXPECT_THAT(refusal({"--agentx", "--port", "4711"}).text, HasSubstr("excludes --port"));
+    EXPECT_THAT(refusal({"--agentx", "--listen", "udp:127.0.0.1:1"}).text,
+                HasSubstr("excludes --port and --listen"));
+    EXPECT_THAT(refusal({"--agentx", "--snmp-config", "file"}).text,
+                HasSubstr("excludes --snmp-config"));
+    EXPECT_EQ(refusal({"--agentx", "--port", "4711"}).status, kExitUsage);
+}
+
 TEST_F(OptionsTest, ModulesRepeat) {
     EXPECT_THAT(options({"--module", "a", "--module", "b"}).modules, ElementsAre("a", "b"));
 }

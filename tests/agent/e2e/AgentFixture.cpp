@@ -23,16 +23,6 @@ std::string inherited(char const* name) {
     return value == nullptr ? std::string() : value;
 }
 
-/// Whether somebody on this host has bound the UDP port, as the kernel lists it.
-bool udpPortIsBound(int port) {
-    char wanted[16];
-    std::snprintf(wanted, sizeof wanted, ":%04X ", static_cast<unsigned>(port));
-    std::ifstream table("/proc/net/udp");
-    for (std::string line; std::getline(table, line);)
-        if (line.find(wanted) != std::string::npos) return true;
-    return false;
-}
-
 } // namespace
 
 std::vector<Answer> parseAnswers(std::string const& output) {
@@ -83,6 +73,8 @@ Process::Environment AgentFixture::environment() const {
          {"ASAN_OPTIONS", "TSAN_OPTIONS", "UBSAN_OPTIONS", "LD_LIBRARY_PATH"})
         if (std::string value = inherited(name); !value.empty()) variables[name] = value;
     if (m_chassis) variables["KVLSIM_CHASSIS"] = *m_chassis;
+    for (auto const& [name, value] : m_variables)
+        variables[name] = value;
     return variables;
 }
 
@@ -105,6 +97,12 @@ void AgentFixture::startAgent(std::vector<std::string> const& arguments) {
         if (m_agent->output().find("port is in use") == std::string::npos) break;
     }
     FAIL() << "the agent does not start: " << m_agent->output();
+}
+
+void AgentFixture::launchAgent(std::vector<std::string> const& arguments) {
+    std::vector<std::string> command{KVLOAMD};
+    command.insert(command.end(), arguments.begin(), arguments.end());
+    m_agent = std::make_unique<Process>(command, environment());
 }
 
 Result AgentFixture::runAgent(std::vector<std::string> const& arguments) {
@@ -188,6 +186,15 @@ void AgentFixture::startTrapReceiver(std::string const& config) {
             return;
     }
     FAIL() << "snmptrapd does not start: " << m_trapReceiver->output();
+}
+
+bool AgentFixture::udpPortIsBound(int port) {
+    char wanted[16];
+    std::snprintf(wanted, sizeof wanted, ":%04X ", static_cast<unsigned>(port));
+    std::ifstream table("/proc/net/udp");
+    for (std::string line; std::getline(table, line);)
+        if (line.find(wanted) != std::string::npos) return true;
+    return false;
 }
 
 int AgentFixture::freePort() {

@@ -42,6 +42,8 @@ class AgentFixture : public ::testing::Test {
 
     /// Starts the agent on a free port and waits until it serves.
     void startAgent(std::vector<std::string> const& arguments = {});
+    /// Starts the agent with these arguments only; it need not serve yet.
+    void launchAgent(std::vector<std::string> const& arguments);
     /// Starts the agent with these arguments only, waits for its end.
     Result runAgent(std::vector<std::string> const& arguments);
     Process& agent() { return *m_agent; }
@@ -69,6 +71,14 @@ class AgentFixture : public ::testing::Test {
     Process& trapReceiver() { return *m_trapReceiver; }
 
     static int freePort();
+    /// Whether somebody on this host has bound the UDP port, as the kernel lists it.
+    static bool udpPortIsBound(int port);
+    /// Has the SNMP tools ask whoever serves this port of loopback.
+    void askPort(int port) { m_port = port; }
+    /// What children started later see beside the fixture's own variables.
+    void setVariable(std::string const& name, std::string const& value) {
+        m_variables[name] = value;
+    }
     std::string address() const { return "127.0.0.1:" + std::to_string(m_port); }
     std::string trapAddress() const { return "127.0.0.1:" + std::to_string(m_trapPort); }
     std::string path(std::string const& name) const { return m_folder + "/" + name; }
@@ -88,6 +98,7 @@ class AgentFixture : public ::testing::Test {
     std::string m_folder;
     std::string m_snmpConfig;
     std::optional<std::string> m_chassis;
+    Process::Environment m_variables;
     int m_port = 0;
     int m_trapPort = 0;
     std::unique_ptr<Process> m_trapReceiver;

@@ -1,0 +1,280 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/AgentxSession.h"
+
+#include <poll.h>
+#include <sys/socket.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <cstring>
+#include <utility>
+
+#include "agent/Log.h"
+
+namespace kvloamd {
+
+namespace {
+
+/// snmpTrapOID.0, whose value says which notification it is.
+Oid const kTrapOid{1, 3, 6, 1, 6, 3, 1, 1, 4, 1, 0};
+
+constexpr std::uint8_t kReasonShutdown = 5;
+constexpr std::uint8_t kPriority = 127;
+
+/// A master that asks on and never reads is given up at this many octets.
+constexpr std::size_t kMaxUnread = 4 * 1024 * 1024;
+
+std::string nameOf(AgentxFault fault) {
+    switch (fault) {
+    case AgentxFault::DuplicateRegistration:
+        return "another agent serves them already";
+    case AgentxFault::RequestDenied:
+        return "it does not allow it";
+    default:
+        return "fault " + std::to_string(static_cast<int>(fault));
+    }
+}
+
+} // namespace
+
+AgentxSession::AgentxSession(AgentxAddress address, std::vector<Oid> roots, Answer answer,
+                             AgentxPace pace)
+    : m_address(std::move(address)),
+      m_roots(std::move(roots)),
+      m_answer(std::move(answer)),
+      m_pace(pace) {
+    connectNow();
+}
+
+AgentxSession::~AgentxSession() {
+    if (m_stage == Stage::Registering || m_stage == Stage::Serving) {
+        AgentxWriter close = request(AgentxKind::Close);
+        close.octet(kReasonShutdown);
+        for (int i = 0; i < 3; ++i)
+            close.octet(0);
+        queue(close.take());
+    }
+    disconnect();
+}
+
+short AgentxSession::events() const {
+    bool const writes = m_stage == Stage::Connecting || !m_out.empty();
+    return static_cast<short>(writes ? POLLIN | POLLOUT : POLLIN);
+}
+
+Clock::time_point AgentxSession::deadline() const {
+    if (m_stage == Stage::Away) return m_retryAt;
+    if (m_stage == Stage::Serving && m_awaited.empty()) return m_heard + m_pace.ping;
+    return m_heard + (m_told == Told::Lost ? m_pace.surrender : m_pace.patience);
+}
+
+void AgentxSession::advance(short happened) {
+    if (m_socket >= 0 && m_stage == Stage::Connecting && happened != 0) {
+        int fault = 0;
+        socklen_t size = sizeof fault;
+        getsockopt(m_socket, SOL_SOCKET, SO_ERROR, &fault, &size);
+        if (fault == 0)
+            connected();
+        else
+            drop(std::strerror(fault));
+    } else if (m_socket >= 0) {
+        if ((happened & POLLOUT) != 0) flush();
+        if (m_socket >= 0 && (happened & (POLLIN | POLLHUP | POLLERR)) != 0) receive();
+    }
+    checkTime();
+}
+
+void AgentxSession::checkTime() {
+    auto const now = Clock::now();
+    if (now < deadline()) return;
+    if (m_stage == Stage::Away) {
+        connectNow();
+    } else if (m_stage == Stage::Serving && m_awaited.empty()) {
+        queue(request(AgentxKind::Ping).take());
+    } else if (m_told != Told::Lost) {
+        tellLost("it does not answer");
+    } else {
+        drop("it does not answer");
+    }
+}
+
+void AgentxSession::connectNow() {
+    m_socket = socket(m_address.socket.ss_family, SOCK_STREAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0);
+    if (m_socket < 0) return drop(std::strerror(errno));
+    m_stage = Stage::Connecting;
+    m_heard = Clock::now();
+    if (connect(m_socket, reinterpret_cast<sockaddr const*>(&m_address.socket), m_address.size) ==
+        0)
+        connected();
+    else if (errno == EAGAIN)
+        drop("it does not answer"); // those who wait to be let in are too many already
+    else if (errno != EINPROGRESS)
+        drop(std::strerror(errno));
+}
+
+void AgentxSession::connected() {
+    m_stage = Stage::Opening;
+    AgentxWriter packet = request(AgentxKind::Open);
+    for (int i = 0; i < 4; ++i)
+        packet.octet(0); // the master's own timeout
+    packet.name({});
+    packet.text("kvloamd");
+    queue(packet.take());
+}
+
+void AgentxSession::registerRoots() {
+    m_stage = Stage::Registering;
+    for (Oid const& root : m_roots) {
+        AgentxWriter packet = request(AgentxKind::Register);
+        packet.octet(0); // the session's timeout
+        packet.octet(kPriority);
+        packet.octet(0); // one name, no range of names
+        packet.octet(0);
+        packet.name(root);
+        queue(packet.take());
+        if (m_socket < 0) return;
+    }
+}
+
+void AgentxSession::send(Notification const& notification, std::function<void()> taken) {
+    AgentxWriter packet = request(AgentxKind::Notify);
+    packet.variable(kTrapOid, notification.name);
+    for (Instance const& variable : notification.variables)
+        packet.variable(variable.name, variable.type, variable.value);
+    m_taken = std::move(taken);
+    queue(packet.take());
+}
+
+AgentxWriter AgentxSession::request(AgentxKind kind) {
+    if (m_awaited.empty()) m_heard = Clock::now();
+    m_awaited.push_back({++m_lastPacket, kind});
+    return {kind, m_session, 0, m_lastPacket};
+}
+
+void AgentxSession::queue(std::string packet) {
+    m_out += packet;
+    flush();
+}
+
+void AgentxSession::flush() {
+    while (!m_out.empty()) {
+        ssize_t const sent =
+            ::send(m_socket, m_out.data(), m_out.size(), MSG_DONTWAIT | MSG_NOSIGNAL);
+        if (sent < 0) {
+            if (errno == EINTR) continue;
+            if (errno != EAGAIN) return drop(std::strerror(errno));
+            if (m_out.size() > kMaxUnread) drop("it does not read our answers");
+            return;
+        }
+        m_out.erase(0, static_cast<std::size_t>(sent));
+    }
+}
+
+void AgentxSession::receive() {
+    char buffer[16384];
+    ssize_t const got = recv(m_socket, buffer, sizeof buffer, MSG_DONTWAIT);
+    if (got == 0) return drop("it has closed the connection");
+    if (got < 0) {
+        if (errno != EAGAIN && errno != EINTR) drop(std::strerror(errno));
+        return;
+    }
+    m_in.append(buffer, static_cast<std::size_t>(got));
+    try {
+        while (m_in.size() >= AgentxHeader::kSize) {
+            AgentxHeader const header = parseAgentxHeader(m_in);
+            std::size_t const size = AgentxHeader::kSize + header.payload;
+            if (m_in.size() < size) break;
+            std::string const packet = m_in.substr(0, size);
+            m_in.erase(0, size);
+            takePacket(header, std::string_view(packet).substr(AgentxHeader::kSize));
+            if (m_socket < 0) return;
+        }
+    } catch (AgentxError const& error) {
+        drop(std::string("it has sent ") + error.what());
+    }
+}
+
+void AgentxSession::takePacket(AgentxHeader const& header, std::string_view payload) {
+    m_heard = Clock::now();
+    if (m_stage == Stage::Serving) tellConnected();
+    if (header.kind == AgentxKind::Response) {
+        takeResponse(header, payload);
+    } else if (header.kind == AgentxKind::Close) {
+        drop("it has closed the session");
+    } else if (std::string answer = m_answer(header, payload); !answer.empty()) {
+        queue(std::move(answer));
+    }
+}
+
+void AgentxSession::takeResponse(AgentxHeader const& header, std::string_view payload) {
+    auto const awaited = std::ranges::find(m_awaited, header.packet, &Awaited::packet);
+    if (awaited == m_awaited.end()) return;
+    AgentxKind const kind = awaited->kind;
+    m_awaited.erase(awaited);
+    AgentxReader reader(payload, header.networkOrder);
+    reader.number(); // the master's time
+    auto const fault = static_cast<AgentxFault>(reader.number16());
+    if (fault == AgentxFault::NotOpen) return drop("it has forgotten the session");
+    switch (kind) {
+    case AgentxKind::Open:
+        if (fault != AgentxFault::None) return drop("it refuses the session: " + nameOf(fault));
+        m_session = header.session;
+        registerRoots();
+        break;
+    case AgentxKind::Register:
+        if (fault != AgentxFault::None)
+            return drop("it refuses the agent's names: " + nameOf(fault));
+        if (m_awaited.empty()) {
+            m_stage = Stage::Serving;
+            tellConnected();
+        }
+        break;
+    case AgentxKind::Notify:
+        // Refused, it would be refused again.
+        if (fault != AgentxFault::None)
+            log(LogLevel::Warning, "the SNMP master refuses a notification: " + nameOf(fault));
+        std::exchange(m_taken, nullptr)();
+        break;
+    default:
+        break;
+    }
+}
+
+void AgentxSession::drop(std::string const& why) {
+    disconnect();
+    m_retryAt = Clock::now() + m_pace.retry;
+    tellLost(why);
+}
+
+void AgentxSession::disconnect() {
+    if (m_socket >= 0) close(m_socket);
+    m_socket = -1;
+    m_stage = Stage::Away;
+    m_session = 0;
+    m_awaited.clear();
+    m_taken = nullptr;
+    m_in.clear();
+    m_out.clear();
+}
+
+void AgentxSession::tellConnected() {
+    if (m_told == Told::Connected) return;
+    m_told = Told::Connected;
+    log(LogLevel::Info, "connected to the SNMP master at " + m_address.text);
+}
+
+void AgentxSession::tellLost(std::string const& why) {
+    if (m_told == Told::Lost) {
+        log(LogLevel::Debug, "the SNMP master at " + m_address.text + ": " + why);
+        return;
+    }
+    bool const had = m_told == Told::Connected;
+    m_told = Told::Lost;
+    log(LogLevel::Warning,
+        (had ? "lost the SNMP master at " : "no connection to the SNMP master at ") +
+            m_address.text + ": " + why + "; trying again until " +
+            (had ? "it is back" : "there is one"));
+}
+
+} // namespace kvloamd

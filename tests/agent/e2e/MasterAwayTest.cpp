@@ -1,0 +1,163 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Masters that are late, go, come back, or hang: the agent goes on, and says so once.
+#include <csignal>
+
+#include <gmock/gmock.h>
+
+#include "tests/agent/e2e/MasterFixture.h"
+
+namespace kvloamd::e2e {
+namespace {
+
+using ::testing::ElementsAre;
+using ::testing::HasSubstr;
+
+class MasterAwayTest : public MasterFixture {
+  protected:
+    /// Master and agent, with a receiver of the master's notifications.
+    void start() {
+        startTrapReceiver("authCommunity log public\n");
+        configureMaster("trap2sink " + trapAddress() + " public\n");
+        startMaster();
+        startSubagent();
+        ASSERT_TRUE(isConnected()) << agent().output();
+    }
+    static std::string announced(std::string const& serialNumber, std::string const& status) {
+        return "\tKVL-OAM-MIB::kvlNotifyBoardSerialNumber.0 = " + serialNumber +
+               "\tKVL-OAM-MIB::kvlNotifyBoardStatus.0 = " + status + "\n";
+    }
+    void expectAnnounced(std::string const& serialNumber, std::string const& status) {
+        EXPECT_TRUE(trapReceiver().waitFor(announced(serialNumber, status)))
+            << trapReceiver().output();
+    }
+};
+
+TEST_F(MasterAwayTest, AgentStartedFirstServesOnceTheMasterIsThere) {
+    startSubagent();
+    ASSERT_TRUE(agent().waitFor("kvloamd: no connection to the SNMP master at"))
+        << agent().output();
+    startMaster();
+    ASSERT_TRUE(isConnected()) << agent().output();
+    EXPECT_EQ(get("kvlBoardCount.0"), "Gauge32: 3 boards");
+    EXPECT_THAT(statesTold(), ElementsAre("none", "connected"));
+}
+
+TEST_F(MasterAwayTest, NotificationGoesThroughTheMaster) {
+    start();
+    sim({"remove", "2"});
+    expectAnnounced("QL-77-0420", "removed");
+    EXPECT_EQ(count(trapReceiver().output(), "kvlBoardStatusChange"), 1);
+}
+
+TEST_F(MasterAwayTest, TableShowsTheChangeWhenItsNotificationArrives) {
+    start();
+    sim({"stop", "1"});
+    expectAnnounced("NX50001", "stopped");
+    EXPECT_EQ(get("kvlBoardStatus.1"), "INTEGER: stopped(4)");
+}
+
+TEST_F(MasterAwayTest, MasterThatIsKilledAndComesBackServesAgain) {
+    start();
+    killMaster();
+    ASSERT_TRUE(isLost()) << agent().output();
+    startMaster();
+    ASSERT_TRUE(isConnected(2)) << agent().output();
+    EXPECT_EQ(get("kvlBoardCount.0"), "Gauge32: 3 boards");
+    EXPECT_EQ(stopAgent(), 0) << agent().output();
+    EXPECT_THAT(statesTold(), ElementsAre("connected", "lost", "connected"));
+}
+
+TEST_F(MasterAwayTest, MasterThatRestartsFiveTimesQuicklyServesInTheEnd) {
+    start();
+    for (int round = 0; round < 5; ++round) {
+        killMaster();
+        startMaster();
+    }
+    EXPECT_TRUE(eventually([this] { return get("kvlBoardCount.0") == "Gauge32: 3 boards"; }))
+        << agent().output();
+    EXPECT_EQ(stopAgent(), 0) << agent().output();
+    auto const states = statesTold();
+    ASSERT_GE(states.size(), 3U);
+    for (std::size_t i = 0; i < states.size(); ++i)
+        EXPECT_EQ(states[i], i % 2 == 0 ? "connected" : "lost") << agent().output();
+    EXPECT_EQ(states.back(), "connected");
+}
+
+TEST_F(MasterAwayTest, MasterThatHangsServesAgainWhenItGoesOn) {
+    start();
+    master().signal(SIGSTOP);
+    // The notification is what the master does not answer.
+    sim({"stop", "1"});
+    ASSERT_TRUE(isLost()) << agent().output();
+    EXPECT_THAT(agent().output(), HasSubstr("it does not answer"));
+    sim({"remove", "2"});
+    master().signal(SIGCONT);
+    ASSERT_TRUE(isConnected(2)) << agent().output();
+    expectAnnounced("NX50001", "stopped");
+    expectAnnounced("QL-77-0420", "removed");
+    EXPECT_EQ(count(trapReceiver().output(), "kvlBoardStatusChange"), 2);
+    EXPECT_EQ(get("kvlBoardStatus.1"), "INTEGER: stopped(4)");
+    EXPECT_EQ(stopAgent(), 0) << agent().output();
+    EXPECT_THAT(statesTold(), ElementsAre("connected", "lost", "connected"));
+}
+
+TEST_F(MasterAwayTest, MasterThatHangsAtTheStartServesWhenItGoesOn) {
+    startMaster();
+    master().signal(SIGSTOP);
+    startSubagent();
+    ASSERT_TRUE(agent().waitFor("kvloamd: no connection to the SNMP master at"))
+        << agent().output();
+    master().signal(SIGCONT);
+    ASSERT_TRUE(isConnected()) << agent().output();
+    EXPECT_EQ(get("kvlBoardCount.0"), "Gauge32: 3 boards");
+    EXPECT_THAT(statesTold(), ElementsAre("none", "connected"));
+}
+
+TEST_F(MasterAwayTest, NotificationsOfTheTimeWithoutAMasterArriveInOrderOnceItIsBack) {
+    start();
+    killMaster();
+    ASSERT_TRUE(isLost()) << agent().output();
+    sim({"stop", "1"});
+    sim({"start", "1"});
+    sim({"remove", "2"});
+    startMaster();
+    expectAnnounced("NX50001", "stopped");
+    expectAnnounced("NX50001", "started");
+    expectAnnounced("QL-77-0420", "removed");
+    auto const& output = trapReceiver().output();
+    EXPECT_LT(output.find(announced("NX50001", "stopped")),
+              output.find(announced("NX50001", "started")));
+    EXPECT_LT(output.find(announced("NX50001", "started")),
+              output.find(announced("QL-77-0420", "removed")));
+    EXPECT_EQ(count(output, "kvlBoardStatusChange"), 3);
+    EXPECT_EQ(get("kvlNotificationsDropped.0"), "Counter32: 0 notifications");
+}
+
+TEST_F(MasterAwayTest, NotificationThatAHangingMasterDiesWithArrivesThroughTheNext) {
+    start();
+    master().signal(SIGSTOP);
+    sim({"remove", "2"});
+    ASSERT_TRUE(isLost()) << agent().output();
+    killMaster();
+    startMaster();
+    expectAnnounced("QL-77-0420", "removed");
+}
+
+TEST_F(MasterAwayTest, StopIsNotHeldUpByAMasterThatHangs) {
+    start();
+    master().signal(SIGSTOP);
+    EXPECT_EQ(stopAgent(), 0) << agent().output();
+    EXPECT_THAT(agent().output(), HasSubstr("kvloamd: stopped"));
+}
+
+TEST_F(MasterAwayTest, StopWithoutAMasterSaysWhatCouldNotBeSent) {
+    startSubagent();
+    ASSERT_TRUE(agent().waitFor("kvloamd: no connection to the SNMP master at"))
+        << agent().output();
+    sim({"remove", "2"});
+    EXPECT_EQ(stopAgent(), 0) << agent().output();
+    EXPECT_THAT(agent().output(), HasSubstr("could not be sent before the stop: 1"));
+}
+
+} // namespace
+} // namespace kvloamd::e2e
