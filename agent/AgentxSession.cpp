@@ -197,7 +197,6 @@ void AgentxSession::receive() {
 
 void AgentxSession::takePacket(AgentxHeader const& header, std::string_view payload) {
     m_heard = Clock::now();
-    if (m_stage == Stage::Serving) tellConnected();
     if (header.kind == AgentxKind::Response) {
         takeResponse(header, payload);
     } else if (header.kind == AgentxKind::Close) {
@@ -205,6 +204,8 @@ void AgentxSession::takePacket(AgentxHeader const& header, std::string_view payl
     } else if (std::string answer = m_answer(header, payload); !answer.empty()) {
         queue(std::move(answer));
     }
+    // It may be back after a silence.
+    if (m_stage == Stage::Serving) tellConnected();
 }
 
 void AgentxSession::takeResponse(AgentxHeader const& header, std::string_view payload) {
@@ -225,10 +226,7 @@ void AgentxSession::takeResponse(AgentxHeader const& header, std::string_view pa
     case AgentxKind::Register:
         if (fault != AgentxFault::None)
             return drop("it refuses the agent's names: " + nameOf(fault));
-        if (m_awaited.empty()) {
-            m_stage = Stage::Serving;
-            tellConnected();
-        }
+        if (m_awaited.empty()) m_stage = Stage::Serving;
         break;
     case AgentxKind::Notify:
         // Refused, it would be refused again.
