@@ -48,8 +48,9 @@ std::vector<Table> makeTables(std::size_t count) {
     return tables;
 }
 
+template <std::size_t count>
 void oneSecondOfLinesOurs(benchmark::State& state) {
-    auto const tables = makeTables(10000);
+    auto const tables = makeTables(count);
     DrivenScheduler scheduler;
     for (auto const& table : tables)
         scheduler.enter(table.get());
@@ -81,8 +82,11 @@ void oneLineOfThePlatform(benchmark::State& state) {
         table->ScheduledAction();
 }
 
-BENCHMARK(oneSecondOfLinesOurs)->Name("one second of 10,000 lines/ours");
+BENCHMARK(oneSecondOfLinesOurs<10000>)->Name("one second of 10,000 lines/ours");
 BENCHMARK(oneSecondOfLinesPeer)->Name("one second of 10,000 lines/peer");
+// The same pass at two sizes: how it grows.
+BENCHMARK(oneSecondOfLinesOurs<10000>)->Name("one second, from 1,000 to 10,000 lines/ours");
+BENCHMARK(oneSecondOfLinesOurs<1000>)->Name("one second, from 1,000 to 10,000 lines/peer");
 BENCHMARK(oneLineInMemory)->Name("one second of a line, counters in memory");
 BENCHMARK(oneLineOfThePlatform)->Name("one second of a line, counters of the simulated platform");
 

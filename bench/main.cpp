@@ -27,6 +27,7 @@ int main(int argc, char** argv) {
         {"one second of 1,000 tables", 2.0},
         {"one second of 10,000 tables", 2.0},
         {"one second of 10,000 lines", 2.0},
+        {"one second, from 1,000 to 10,000 lines", 12.0},
         {"one second, from 1,000 to 10,000 tables", 12.0},
     });
     benchmark::RunSpecifiedBenchmarks(&reporter);
