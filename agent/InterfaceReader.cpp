@@ -2,8 +2,10 @@
 #include "agent/InterfaceReader.h"
 
 #include <algorithm>
+#include <functional>
 #include <iterator>
 #include <set>
+#include <unordered_set>
 #include <utility>
 
 namespace kvloamd {
@@ -22,9 +24,10 @@ void moveRows(std::vector<Row>& all, std::vector<Row>& rows,
     }
 }
 
-template <class Row>
-void sortByIndex(std::vector<Row>& rows) {
-    std::ranges::sort(rows, {}, &Row::ifIndex);
+/// Rows mostly come in order: boards do, and so do the indices that they were given.
+template <class Row, class Index = std::identity>
+void sortBy(std::vector<Row>& rows, Index index = {}) {
+    if (!std::ranges::is_sorted(rows, {}, index)) std::ranges::sort(rows, {}, index);
 }
 
 /// Each interface and what is below it, with nothing above the topmost and below the lowest.
@@ -35,11 +38,11 @@ void completeStack(InterfaceRows& all) {
         higher.insert(row.higher);
         lower.insert(row.lower);
     }
-    for (InterfaceRow const& row : all.interfaces) {
+    for (InterfaceRow const& row : all.interfaces)
         if (!lower.contains(row.ifIndex)) all.stack.push_back({0, row.ifIndex});
+    for (InterfaceRow const& row : all.interfaces)
         if (!higher.contains(row.ifIndex)) all.stack.push_back({row.ifIndex, 0});
-    }
-    std::ranges::sort(all.stack);
+    sortBy(all.stack);
 }
 
 } // namespace
@@ -54,10 +57,15 @@ InterfaceReader::InterfaceReader(BoardManager& manager, InterfaceIndices& indice
 
 InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     InterfaceRows all;
+    // Hardly ever do interfaces come or go.
+    all.interfaces.reserve(m_formerIndices.size());
+    all.lines.reserve(m_formerLines);
+    all.stack.reserve(m_formerStack.size());
     for (auto& [index, counted] : m_counted)
         counted.present = false;
+    m_histories.begin(Clock::now());
     ToTicks const toTicks = [this](long seconds) { return ticksOf(seconds); };
-    std::set<std::string> serialNumbers;
+    std::unordered_set<std::string> serialNumbers;
     for (BoardRow const& row : boards) {
         auto const board = m_manager.GetBoardByIndex(static_cast<int>(row.boardIndex));
         Board* const asked = board.get();
@@ -67,17 +75,17 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
         if (serialNumber.empty() || serialNumbers.contains(serialNumber))
             serialNumber += "@" + std::to_string(row.boardIndex);
         serialNumbers.insert(serialNumber);
-        BoardInterfaces found = readInterfaces(*asked, toTicks);
+        BoardInterfaces found = readInterfaces(*asked, toTicks, m_histories);
         auto const indices = m_indices.indicesOf(serialNumber, found.keys);
         append(all, std::move(found), indices, row.boardIndex);
     }
     m_indices.save();
     std::erase_if(m_counted, [](auto const& entry) { return !entry.second.present; });
-    sortByIndex(all.interfaces);
-    sortByIndex(all.lines);
-    sortByIndex(all.bearers);
-    sortByIndex(all.signalling);
-    sortByIndex(all.ethernets);
+    sortBy(all.interfaces, &InterfaceRow::ifIndex);
+    sortBy(all.lines, &LineRow::ifIndex);
+    sortBy(all.bearers, &BearerRow::ifIndex);
+    sortBy(all.signalling, &SignallingRow::ifIndex);
+    sortBy(all.ethernets, &EthernetRow::ifIndex);
     completeStack(all);
     std::size_t before = 0;
     for (LineRow& line : all.lines) {
@@ -133,6 +141,7 @@ void InterfaceReader::noteChanges(InterfaceRows& all) {
     if (m_read && all.stack != m_formerStack) m_stackLastChange = now();
     m_formerIndices = std::move(indices);
     m_formerStack = all.stack;
+    m_formerLines = all.lines.size();
     all.lastChange = m_lastChange;
     all.stackLastChange = m_stackLastChange;
 }

@@ -4,8 +4,8 @@
 
 #include <chrono>
 #include <cstdint>
-#include <map>
 #include <string>
+#include <unordered_map>
 #include <vector>
 
 #include "agent/BoardInterfaces.h"
@@ -53,10 +53,12 @@ class InterfaceReader {
     InterfaceIndices& m_indices;
     Clock::time_point m_started;
     std::chrono::milliseconds m_startDate; ///< the start, since the epoch
-    std::map<std::uint32_t, Counted> m_counted;
+    LineHistories m_histories;
+    std::unordered_map<std::uint32_t, Counted> m_counted; ///< by ifIndex
     bool m_read = false;
     std::vector<std::uint32_t> m_formerIndices;
     std::vector<StackRow> m_formerStack;
+    std::size_t m_formerLines = 0;
     std::uint32_t m_lastChange = 0;
     std::uint32_t m_stackLastChange = 0;
 };

@@ -18,9 +18,10 @@ std::string chassis(int boards) {
         text += "  - handle: " + number + "\n    attributes: {SERIAL_NUMBER: S" + number +
                 ", NAME: BENCH}\n    devices:\n";
         for (int line = 1; line <= kLinesOfABoard; ++line) {
-            text += "      - {handle: " + std::to_string(++handle) +
-                    ", type: 501, attributes: {NAME: b" + number + "-line-" + std::to_string(line) +
-                    "}, line: {type: esf, past: {hours: 24, errors: {code-violations: 0.01}}}}\n";
+            text +=
+                "      - {handle: " + std::to_string(++handle) +
+                ", type: 501, attributes: {NAME: b" + number + "-line-" + std::to_string(line) +
+                "}, line: {type: esf, past: {seconds: 86000, errors: {code-violations: 0.01}}}}\n";
         }
     }
     return text;

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "IntervalRows.h"
 
+#include <memory>
 #include <random>
 
 kvloamd::Snapshot makeIntervals(std::uint32_t lines) {
@@ -12,10 +13,12 @@ kvloamd::Snapshot makeIntervals(std::uint32_t lines) {
     for (std::uint32_t i = 0; i < lines; ++i) {
         kvloamd::LineRow line;
         line.ifIndex = kFirstLine + i;
-        line.intervals.resize(kIntervalsOfALine + 1);
-        for (kvloamd::LineCounts& interval : line.intervals)
+        auto const closed = std::make_shared<kvloamd::ClosedIntervals>();
+        closed->counts.resize(kIntervalsOfALine);
+        for (kvloamd::LineCounts& interval : closed->counts)
             for (std::int32_t& count : interval)
                 count = static_cast<std::int32_t>(counts(random));
+        line.closed = closed;
         line.intervalsBefore = before;
         before += line.closedIntervals();
         snapshot.interfaces.lines.push_back(std::move(line));

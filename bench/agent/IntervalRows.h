@@ -19,9 +19,11 @@ inline constexpr std::uint32_t kFirstLine = 1000;
 inline kvloamd::Oid const kOurArc{1, 3, 6, 1, 4, 1, 32473, 90};
 inline kvloamd::Oid const kOurPlace{10, 18};
 inline kvloamd::Oid const kOurEntry{1, 3, 6, 1, 4, 1, 32473, 90, 10, 18, 8, 1};
-/// Where the peers serve the same; their tables.
+/// Where the peers serve the same; their tables and their entries.
 inline kvloamd::Oid const kTableDataPlace{1, 3, 6, 1, 4, 1, 32473, 91, 10, 18, 8};
 inline kvloamd::Oid const kIteratorPlace{1, 3, 6, 1, 4, 1, 32473, 92, 10, 18, 8};
+inline kvloamd::Oid const kTableDataEntry{1, 3, 6, 1, 4, 1, 32473, 91, 10, 18, 8, 1};
+inline kvloamd::Oid const kIteratorEntry{1, 3, 6, 1, 4, 1, 32473, 92, 10, 18, 8, 1};
 
 /// A snapshot with nothing but `lines` lines.
 kvloamd::Snapshot makeIntervals(std::uint32_t lines);

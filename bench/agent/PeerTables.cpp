@@ -68,8 +68,8 @@ std::vector<Row>& allRows(InterfaceRows const& lines) {
     static std::vector<Row> rows;
     if (!rows.empty()) return rows;
     for (LineRow const& line : lines.lines)
-        for (std::size_t n = 1; n < line.intervals.size(); ++n)
-            rows.push_back({line.ifIndex, static_cast<long>(n), &line.intervals[n]});
+        for (std::size_t n = 0; n < line.closedIntervals(); ++n)
+            rows.push_back({line.ifIndex, static_cast<long>(n + 1), &line.closed->counts[n]});
     return rows;
 }
 

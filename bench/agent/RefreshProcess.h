@@ -12,7 +12,7 @@ class RefreshProcess {
     RefreshProcess(RefreshProcess const&) = delete;
     RefreshProcess& operator=(RefreshProcess const&) = delete;
 
-    /// Refreshes once; returns how long it took, in seconds.
+    /// Refreshes once; returns the processor's seconds that it took.
     double refresh() const;
 
   private:

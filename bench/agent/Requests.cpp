@@ -59,8 +59,8 @@ void checkTable(LeanClient& client, Oid const& entry, std::uint32_t lines) {
                 std::uint32_t const line = rows / kIntervalsOfALine;
                 std::uint32_t const interval = rows % kIntervalsOfALine + 1;
                 if (line == lines) break; // what comes behind the column
-                auto const count =
-                    made.interfaces.lines[line].intervals[interval][column - kFirstCounterColumn];
+                auto const count = made.interfaces.lines[line]
+                                       .closed->counts[interval - 1][column - kFirstCounterColumn];
                 if (name != below(entry, {column, kFirstLine + line, interval}) ||
                     number(value) != static_cast<std::uint32_t>(count))
                     throw std::runtime_error("an agent answers wrongly");

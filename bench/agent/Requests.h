@@ -19,6 +19,6 @@ std::vector<std::string> requestsFor(kvloamd::Oid const& entry,
 /// The counters' columns.
 std::vector<std::uint32_t> counterColumns();
 
-/// Reads a table's counters with `client` and compares them with what was made up. Throws
-/// std::runtime_error when anything is wrong or missing.
+/// Reads the counters of a table's first `lines` lines with `client` and compares them with what
+/// was made up. Throws std::runtime_error when anything is wrong or missing.
 void checkTable(LeanClient& client, kvloamd::Oid const& entry, std::uint32_t lines);
