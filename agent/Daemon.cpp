@@ -40,6 +40,7 @@ constexpr std::chrono::seconds kLastWords{1};
 struct Boards {
     ReferenceCounter<BoardManager> manager{new BoardManager};
     Counters counters;
+    Settings settings;
     BoardSource source{*manager.get()};
     StatusQueue queue{counters};
     StatusListener listener{*manager.get(), source, queue};
@@ -166,6 +167,23 @@ void announceLast(Notifier& notifier, StatusQueue& queue, Front& front) {
             "notifications that could not be sent before the stop: " + std::to_string(left));
 }
 
+/// Has the settings of former runs, and keeps those of this one in the same file.
+class KeptSettings {
+  public:
+    KeptSettings(Settings& settings, InterfaceIndices& file) : m_settings(settings), m_file(file) {
+        m_settings.load(m_file.settings());
+    }
+    ~KeptSettings() { save(); }
+    KeptSettings(KeptSettings const&) = delete;
+    KeptSettings& operator=(KeptSettings const&) = delete;
+
+    void save() { m_file.save(m_settings.takeUnsaved()); }
+
+  private:
+    Settings& m_settings;
+    InterfaceIndices& m_file;
+};
+
 void serve(Options const& options, ReadOptions const& readAgain, Front& front,
            Signals const& signals, Boards& boards, Clock::time_point started) {
     Wakeup wakeup;
@@ -173,13 +191,16 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
     PlatformReader platform;
     std::optional<InterfaceIndices> indices;
+    std::optional<KeptSettings> keptSettings;
     std::optional<InterfaceReader> interfaces;
     if (front.servesStandardObjects()) {
         indices.emplace(persistentDirectory() + "/ifindex.sqlite", options.interfaceBase);
+        keptSettings.emplace(boards.settings, *indices);
         interfaces.emplace(*boards.manager.get(), *indices, started);
     }
     Collector collector(
         [&](Snapshot& snapshot) {
+            if (keptSettings) keptSettings->save();
             snapshot.boards = boards.source.read();
             snapshot.modules = readModules(services);
             snapshot.services = readServices(services);
@@ -197,7 +218,8 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     if (interfaces)
         served.push_back(
             {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}});
-    front.serve({std::move(served), boards.counters, [&] { return collector.snapshot(); }});
+    front.serve({std::move(served), boards.counters, [&] { return collector.snapshot(); },
+                 boards.settings});
     Notifier notifier(boards.queue, front.notifications(), options.enterprise);
     ServiceNotice notice;
     std::string const serving =
@@ -211,8 +233,10 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             notice.ready(serving);
         }
     });
-    front.beforeSleep(
-        [&] { return earliest(notifier.announce(collector.newest()->begun), notice.beat()); });
+    front.beforeSleep([&] {
+        if (boards.settings.hasUnsaved()) collector.renew();
+        return earliest(notifier.announce(collector.newest()->begun), notice.beat());
+    });
     ListeningScope const listening(boards.listener, [&] { collector.renew(); });
     log(LogLevel::Info, serving);
     notice.ready(serving);

@@ -10,6 +10,10 @@ namespace kvloamd {
 
 namespace {
 
+// ifLinkUpDownTrapEnable's.
+constexpr int kEnabled = 1;
+constexpr int kDisabled = 2;
+
 using Ticks = std::chrono::duration<std::int64_t, std::centi>;
 
 /// Moves rows over, with their numbers on the board made indices; rows without one are left out.
@@ -35,9 +39,12 @@ void completeStack(InterfaceRows& all) {
         higher.insert(row.higher);
         lower.insert(row.lower);
     }
-    for (InterfaceRow const& row : all.interfaces) {
+    for (InterfaceRow& row : all.interfaces) {
+        bool const stacked = higher.contains(row.ifIndex);
         if (!lower.contains(row.ifIndex)) all.stack.push_back({0, row.ifIndex});
-        if (!higher.contains(row.ifIndex)) all.stack.push_back({row.ifIndex, 0});
+        if (!stacked) all.stack.push_back({row.ifIndex, 0});
+        // One broken line is told of once, not once more for each of its channels.
+        row.linkUpDownTraps = stacked ? kDisabled : kEnabled;
     }
     std::ranges::sort(all.stack);
 }
