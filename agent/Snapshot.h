@@ -48,8 +48,7 @@ struct Counters {
 struct Facts {
     Snapshot const& snapshot;
     Counters const& counters;
-    Settings const* settings =
-        nullptr; ///< count before what the snapshot says; null: there are none
+    Settings const* settings = nullptr; ///< come before what the snapshot says; null: none
 };
 
 } // namespace kvloamd
