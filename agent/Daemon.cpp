@@ -18,6 +18,8 @@
 #include "agent/Front.h"
 #include "agent/InterfaceIndices.h"
 #include "agent/InterfaceReader.h"
+#include "agent/LineListener.h"
+#include "agent/LinkWatch.h"
 #include "agent/Log.h"
 #include "agent/ModuleLoader.h"
 #include "agent/Notifier.h"
@@ -48,6 +50,7 @@ struct Boards {
     BoardSource source{*manager.get()};
     NotificationQueue queue{counters};
     StatusListener listener;
+    LineListener lines{*manager.get(), settings, queue, counters};
 };
 
 /// Makes the first calls of the library's singletons, which belong to one thread, and asks the
@@ -89,10 +92,11 @@ void attachModules(std::vector<LoadedModule> const& modules, Boards& boards) {
         ServiceManager::GetInstance()->AddModule(module.name().c_str());
 }
 
-/// Has the listener tell of changes for a scope.
+/// Has a listener tell of changes for a scope.
+template <class Listener>
 class ListeningScope {
   public:
-    ListeningScope(StatusListener& listener, std::function<void()> changed) : m_listener(listener) {
+    ListeningScope(Listener& listener, std::function<void()> changed) : m_listener(listener) {
         m_listener.start(std::move(changed));
     }
     ~ListeningScope() { m_listener.stop(); }
@@ -100,7 +104,7 @@ class ListeningScope {
     ListeningScope& operator=(ListeningScope const&) = delete;
 
   private:
-    StatusListener& m_listener;
+    Listener& m_listener;
 };
 
 /// A folder for a scope.
@@ -197,6 +201,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     std::optional<InterfaceIndices> indices;
     std::optional<KeptSettings> keptSettings;
     std::optional<InterfaceReader> interfaces;
+    LinkWatch links(boards.settings, boards.queue);
     if (front.servesStandardObjects()) {
         indices.emplace(persistentDirectory() + "/ifindex.sqlite", options.interfaceBase);
         keptSettings.emplace(boards.settings, *indices);
@@ -211,7 +216,14 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             snapshot.platformService = readPlatformService(services);
             snapshot.processes = readProcesses(statistics);
             snapshot.records = platform.read(snapshot.boards);
-            if (interfaces) snapshot.interfaces = interfaces->read(snapshot.boards);
+            if (interfaces) {
+                boards.lines.listen(snapshot.boards, interfaces->uptime());
+                snapshot.interfaces = interfaces->read(snapshot.boards);
+                std::vector<PlacedLine> const lines = interfaces->takeLines();
+                boards.lines.place(lines);
+                handOn(boards.settings, lines);
+                links.note(snapshot.interfaces.interfaces, snapshot.begun);
+            }
         },
         started, [&] { wakeup.wake(); });
     std::vector<Table const*> const allTables = tables();
@@ -242,6 +254,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
         return earliest(notifier.announce(collector.newest()->begun), notice.beat());
     });
     ListeningScope const listening(boards.listener, [&] { collector.renew(); });
+    ListeningScope const listeningToLines(boards.lines, [&] { collector.renew(); });
     log(LogLevel::Info, serving);
     notice.ready(serving);
     front.run();
@@ -249,6 +262,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     notice.stopping();
     log(LogLevel::Info, "stopping");
     boards.listener.stop();
+    boards.lines.stop();
     announceLast(notifier, boards.queue, front);
 }
 

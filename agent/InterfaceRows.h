@@ -28,6 +28,7 @@ enum InterfaceCounter : std::size_t {
 /// this one; what only its kind has is in another, of the same index.
 struct InterfaceRow {
     std::uint32_t ifIndex = 0;
+    std::uint32_t boardIndex = 0;
     std::string description;
     std::string name;
     std::string alias;
