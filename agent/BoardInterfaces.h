@@ -9,6 +9,8 @@
 #include "agent/InterfaceRows.h"
 #include "agent/LineHistories.h"
 #include "board/Board.h"
+#include "board/DS1LineDevice.h"
+#include "core/ReferenceCounter.h"
 
 namespace kvloamd {
 
@@ -17,6 +19,7 @@ namespace kvloamd {
 struct BoardInterfaces {
     std::vector<InterfaceKey> keys; ///< all different
     InterfaceRows rows;
+    std::vector<ReferenceCounter<DS1LineDevice>> lines; ///< as `rows.lines`
 };
 
 /// Seconds since the epoch as hundredths of a second since the agent's start.

@@ -18,6 +18,8 @@
 #include "agent/Front.h"
 #include "agent/InterfaceIndices.h"
 #include "agent/InterfaceReader.h"
+#include "agent/LineListener.h"
+#include "agent/LinkWatch.h"
 #include "agent/Log.h"
 #include "agent/ModuleLoader.h"
 #include "agent/Notifier.h"
@@ -44,9 +46,11 @@ struct Boards {
 
     ReferenceCounter<BoardManager> manager{new BoardManager};
     Counters counters;
+    Settings settings;
     BoardSource source{*manager.get()};
     NotificationQueue queue{counters};
     StatusListener listener;
+    LineListener lines{*manager.get(), settings, queue, counters};
 };
 
 /// Makes the first calls of the library's singletons, which belong to one thread, and asks the
@@ -88,10 +92,11 @@ void attachModules(std::vector<LoadedModule> const& modules, Boards& boards) {
         ServiceManager::GetInstance()->AddModule(module.name().c_str());
 }
 
-/// Has the listener tell of changes for a scope.
+/// Has a listener tell of changes for a scope.
+template <class Listener>
 class ListeningScope {
   public:
-    ListeningScope(StatusListener& listener, std::function<void()> changed) : m_listener(listener) {
+    ListeningScope(Listener& listener, std::function<void()> changed) : m_listener(listener) {
         m_listener.start(std::move(changed));
     }
     ~ListeningScope() { m_listener.stop(); }
@@ -99,7 +104,7 @@ class ListeningScope {
     ListeningScope& operator=(ListeningScope const&) = delete;
 
   private:
-    StatusListener& m_listener;
+    Listener& m_listener;
 };
 
 /// A folder for a scope.
@@ -170,6 +175,23 @@ void announceLast(Notifier& notifier, NotificationQueue& queue, Front& front) {
             "notifications that could not be sent before the stop: " + std::to_string(left));
 }
 
+/// Has the settings of former runs, and keeps those of this one in the same file.
+class KeptSettings {
+  public:
+    KeptSettings(Settings& settings, InterfaceIndices& file) : m_settings(settings), m_file(file) {
+        m_settings.load(m_file.settings());
+    }
+    ~KeptSettings() { save(); }
+    KeptSettings(KeptSettings const&) = delete;
+    KeptSettings& operator=(KeptSettings const&) = delete;
+
+    void save() { m_file.save(m_settings.takeUnsaved()); }
+
+  private:
+    Settings& m_settings;
+    InterfaceIndices& m_file;
+};
+
 void serve(Options const& options, ReadOptions const& readAgain, Front& front,
            Signals const& signals, Boards& boards, Clock::time_point started) {
     Wakeup wakeup;
@@ -177,20 +199,31 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
     PlatformReader platform;
     std::optional<InterfaceIndices> indices;
+    std::optional<KeptSettings> keptSettings;
     std::optional<InterfaceReader> interfaces;
+    LinkWatch links(boards.settings, boards.queue);
     if (front.servesStandardObjects()) {
         indices.emplace(persistentDirectory() + "/ifindex.sqlite", options.interfaceBase);
+        keptSettings.emplace(boards.settings, *indices);
         interfaces.emplace(*boards.manager.get(), *indices, started);
     }
     Collector collector(
         [&](Snapshot& snapshot) {
+            if (keptSettings) keptSettings->save();
             snapshot.boards = boards.source.read();
             snapshot.modules = readModules(services);
             snapshot.services = readServices(services);
             snapshot.platformService = readPlatformService(services);
             snapshot.processes = readProcesses(statistics);
             snapshot.records = platform.read(snapshot.boards);
-            if (interfaces) snapshot.interfaces = interfaces->read(snapshot.boards);
+            if (interfaces) {
+                boards.lines.listen(snapshot.boards, interfaces->uptime());
+                snapshot.interfaces = interfaces->read(snapshot.boards);
+                std::vector<PlacedLine> const lines = interfaces->takeLines();
+                boards.lines.place(lines);
+                handOn(boards.settings, lines);
+                links.note(snapshot.interfaces.interfaces, snapshot.begun);
+            }
         },
         started, [&] { wakeup.wake(); });
     std::vector<Table const*> const allTables = tables();
@@ -201,7 +234,8 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     if (interfaces)
         served.push_back(
             {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}});
-    front.serve({std::move(served), boards.counters, [&] { return collector.snapshot(); }});
+    front.serve({std::move(served), boards.counters, [&] { return collector.snapshot(); },
+                 boards.settings});
     Notifier notifier(boards.queue, front.notifications());
     ServiceNotice notice;
     std::string const serving =
@@ -215,9 +249,12 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             notice.ready(serving);
         }
     });
-    front.beforeSleep(
-        [&] { return earliest(notifier.announce(collector.newest()->begun), notice.beat()); });
+    front.beforeSleep([&] {
+        if (boards.settings.hasUnsaved()) collector.renew();
+        return earliest(notifier.announce(collector.newest()->begun), notice.beat());
+    });
     ListeningScope const listening(boards.listener, [&] { collector.renew(); });
+    ListeningScope const listeningToLines(boards.lines, [&] { collector.renew(); });
     log(LogLevel::Info, serving);
     notice.ready(serving);
     front.run();
@@ -225,6 +262,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     notice.stopping();
     log(LogLevel::Info, "stopping");
     boards.listener.stop();
+    boards.lines.stop();
     announceLast(notifier, boards.queue, front);
 }
 

@@ -13,6 +13,7 @@
 #include "agent/PlatformReader.h"
 #include "agent/ProcessRow.h"
 #include "agent/ServiceRows.h"
+#include "agent/Settings.h"
 
 namespace kvloamd {
 
@@ -47,6 +48,7 @@ struct Counters {
 struct Facts {
     Snapshot const& snapshot;
     Counters const& counters;
+    Settings const* settings = nullptr; ///< come before what the snapshot says; null: none
 };
 
 } // namespace kvloamd

@@ -18,6 +18,7 @@
 #include "agent/Collector.h"
 #include "agent/Log.h"
 #include "agent/ObjectTree.h"
+#include "agent/Settings.h"
 #include "agent/StandAlone.h"
 #include "agent/StandardObjects.h"
 #include "agent/Subagent.h"
@@ -32,7 +33,8 @@ void serveFrom(Front& front, Oid const& arc,
     std::vector<Table const*> const tables = standardTables();
     ObjectTree const tree(standardScalars(), tables);
     Counters const counters;
-    front.serve({{{tree, arc, {kOurPlace}}}, counters, std::move(takeSnapshot)});
+    Settings settings;
+    front.serve({{{tree, arc, {kOurPlace}}}, counters, std::move(takeSnapshot), settings});
     front.run();
 }
 
