@@ -245,8 +245,9 @@ SnmpHandler::SnmpHandler(ObjectTree const& tree, Counters const& counters, Oid a
 bool SnmpHandler::serve(Oid const& place) {
     std::vector<oid> root(m_arc.begin(), m_arc.end());
     root.insert(root.end(), place.begin(), place.end());
-    netsnmp_handler_registration* const registration = netsnmp_create_handler_registration(
-        "kvloam", &Call::answer, root.data(), root.size(), HANDLER_CAN_RWRITE);
+    netsnmp_handler_registration* const registration =
+        netsnmp_create_handler_registration("kvloam", &Call::answer, root.data(), root.size(),
+                                            HANDLER_CAN_RWRITE | HANDLER_CAN_GETBULK);
     if (registration == nullptr) return false;
     registration->handler->myvoid = this;
     return netsnmp_register_handler(registration) == MIB_REGISTERED_OK;
