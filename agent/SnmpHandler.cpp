@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <limits>
+#include <span>
 #include <utility>
 
 // The SNMP library's headers build on each other.
@@ -135,14 +136,18 @@ Snapshot const& SnmpHandler::Call::snapshotOf(SnmpHandler const& handler,
 
 Oid SnmpHandler::Call::relative(netsnmp_variable_list const* variable, bool& orEqual) const {
     Oid const& arc = handler.m_arc;
-    Oid asked(variable->name_length);
-    std::transform(
-        variable->name, variable->name + variable->name_length, asked.begin(),
-        [](oid number) { return static_cast<std::uint32_t>(std::min(number, kHighest)); });
-    if (startsWith(asked, arc))
-        return {asked.begin() + static_cast<std::ptrdiff_t>(arc.size()), asked.end()};
+    std::span<oid const> const asked(variable->name, variable->name_length);
+    auto const [differs, differsFrom] = std::ranges::mismatch(asked, arc);
+    if (differsFrom == arc.end()) {
+        Oid rest(static_cast<std::size_t>(asked.end() - differs));
+        std::transform(differs, asked.end(), rest.begin(), [](oid number) {
+            return static_cast<std::uint32_t>(std::min(number, kHighest));
+        });
+        return rest;
+    }
     orEqual = true;
-    return std::is_lt(compare(asked, arc)) ? Oid{} : Oid{static_cast<std::uint32_t>(kHighest)};
+    bool const before = differs == asked.end() || *differs < *differsFrom;
+    return before ? Oid{} : Oid{static_cast<std::uint32_t>(kHighest)};
 }
 
 void SnmpHandler::Call::get(netsnmp_request_info* request) {
