@@ -64,8 +64,7 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     all.lines.reserve(m_formerLines);
     all.stack.reserve(m_formerStack.size());
     m_lines.clear();
-    for (auto& [index, counted] : m_counted)
-        counted.present = false;
+    ++m_reading;
     m_histories.begin(Clock::now());
     ToTicks const toTicks = [this](long seconds) { return m_uptime.of(seconds); };
     std::unordered_set<std::string> serialNumbers;
@@ -83,7 +82,9 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
         append(all, std::move(found), indices, row.boardIndex);
     }
     m_indices.save();
-    std::erase_if(m_counted, [](auto const& entry) { return !entry.second.present; });
+    if (m_counted.size() > all.interfaces.size())
+        std::erase_if(m_counted,
+                      [this](auto const& entry) { return entry.second.reading != m_reading; });
     sortBy(all.interfaces, &InterfaceRow::ifIndex);
     sortBy(all.lines, &LineRow::ifIndex);
     sortBy(all.bearers, &BearerRow::ifIndex);
@@ -123,8 +124,8 @@ void InterfaceReader::countOn(InterfaceRow& row, std::uint32_t boardIndex) {
     auto const [place, isNew] = m_counted.try_emplace(row.ifIndex);
     Counted& counted = place->second;
     if (isNew || counted.boardIndex != boardIndex)
-        counted = {boardIndex, m_read ? m_uptime.now() : 0, row.counters, true};
-    counted.present = true;
+        counted = {boardIndex, m_read ? m_uptime.now() : 0, row.counters, m_reading};
+    counted.reading = m_reading;
     for (std::size_t i = 0; i < row.counters.size(); ++i) {
         if (!row.counters[i]) continue;
         if (!counted.counters[i]) {

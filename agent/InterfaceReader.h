@@ -45,7 +45,7 @@ class InterfaceReader {
         std::uint32_t boardIndex; ///< a board that comes back has another
         std::uint32_t since;
         Counters counters;
-        bool present;
+        std::uint64_t reading; ///< the last that found the interface
     };
 
     void append(InterfaceRows& all, BoardInterfaces&& board,
@@ -59,6 +59,7 @@ class InterfaceReader {
     LineHistories m_histories;
     std::vector<PlacedLine> m_lines;
     std::unordered_map<std::uint32_t, Counted> m_counted; ///< by ifIndex
+    std::uint64_t m_reading = 0;                          ///< which one this is
     bool m_read = false;
     std::vector<std::uint32_t> m_formerIndices;
     std::vector<StackRow> m_formerStack;

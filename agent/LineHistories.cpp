@@ -56,8 +56,10 @@ std::shared_ptr<ClosedIntervals const> readClosed(DS1IntervalTable& table) {
 } // namespace
 
 void LineHistories::begin(Clock::time_point now) {
-    std::erase_if(m_kept, [this](auto const& kept) { return kept.second.readAt != m_now; });
+    if (m_kept.size() > m_readSince)
+        std::erase_if(m_kept, [this](auto const& kept) { return kept.second.readAt != m_now; });
     m_now = now;
+    m_readSince = 0;
 }
 
 void LineHistories::read(ReferenceCounter<DS1IntervalTable> const& handle, LineRow& row) {
@@ -74,6 +76,7 @@ void LineHistories::read(ReferenceCounter<DS1IntervalTable> const& handle, LineR
     // An interval that was closed during the reading may be there in part.
     kept.elapsed = table.GetTimeElapsed() < elapsed ? 0 : elapsed;
     kept.readAt = m_now;
+    ++m_readSince;
 }
 
 bool LineHistories::isUnchanged(Kept const& kept, DS1IntervalTable& table, int elapsed) const {

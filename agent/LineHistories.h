@@ -36,6 +36,7 @@ class LineHistories {
     bool isUnchanged(Kept const& kept, DS1IntervalTable& table, int elapsed) const;
 
     Clock::time_point m_now;
+    std::size_t m_readSince = 0; ///< tables, each once
     std::unordered_map<DS1IntervalTable*, Kept> m_kept;
 };
 
