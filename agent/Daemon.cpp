@@ -15,7 +15,6 @@
 #include "agent/BoardSource.h"
 #include "agent/Collector.h"
 #include "agent/Front.h"
-#include "agent/InterfaceIndices.h"
 #include "agent/InterfaceReader.h"
 #include "agent/Log.h"
 #include "agent/ModuleLoader.h"
@@ -25,6 +24,7 @@
 #include "agent/ServiceNotice.h"
 #include "agent/Signals.h"
 #include "agent/SnmpConfig.h"
+#include "agent/StableIndices.h"
 #include "agent/StandardObjects.h"
 #include "agent/StatusListener.h"
 #include "agent/Wakeup.h"
@@ -172,10 +172,11 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     ServiceManager& services = *ServiceManager::GetInstance();
     KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
     PlatformReader platform;
-    std::optional<InterfaceIndices> indices;
+    std::optional<StableIndices> indices;
     std::optional<InterfaceReader> interfaces;
     if (front.servesStandardObjects()) {
-        indices.emplace(persistentDirectory() + "/ifindex.sqlite", options.interfaceBase);
+        indices.emplace(persistentDirectory() + "/ifindex.sqlite", options.interfaceBase,
+                        "interfaces");
         interfaces.emplace(*boards.manager.get(), *indices, started);
     }
     Collector collector(

@@ -10,8 +10,8 @@
 
 #include "agent/BoardInterfaces.h"
 #include "agent/BoardRow.h"
-#include "agent/InterfaceIndices.h"
 #include "agent/InterfaceRows.h"
+#include "agent/StableIndices.h"
 #include "board/BoardManager.h"
 
 namespace kvloamd {
@@ -26,7 +26,7 @@ class InterfaceReader {
     using Clock = std::chrono::steady_clock;
 
     /// `manager` and `indices` outlive the reader. `started`: the agent's start.
-    InterfaceReader(BoardManager& manager, InterfaceIndices& indices, Clock::time_point started);
+    InterfaceReader(BoardManager& manager, StableIndices& indices, Clock::time_point started);
 
     /// The rows of `boards`, which are ascending by index.
     InterfaceRows read(std::vector<BoardRow> const& boards);
@@ -50,7 +50,7 @@ class InterfaceReader {
     std::uint32_t ticksOf(long seconds) const;
 
     BoardManager& m_manager;
-    InterfaceIndices& m_indices;
+    StableIndices& m_indices;
     Clock::time_point m_started;
     std::chrono::milliseconds m_startDate; ///< the start, since the epoch
     std::map<std::uint32_t, Counted> m_counted;

@@ -41,7 +41,7 @@ class InterfaceReaderTest : public ::testing::Test {
 
     FakeChassis m_chassis;
     BoardSource m_source{*m_chassis.manager.get()};
-    InterfaceIndices m_indices{"", 1000};
+    StableIndices m_indices{"", 1000, "interfaces"};
     // Long ago, so that what happens now is told by a time that is not 0.
     InterfaceReader m_reader{*m_chassis.manager.get(), m_indices,
                              InterfaceReader::Clock::now() - std::chrono::hours(1)};
