@@ -14,6 +14,7 @@
 #include "access/ExternalFaultEventAdaptor.h"
 #include "agent/BoardSource.h"
 #include "agent/Collector.h"
+#include "agent/EntityReader.h"
 #include "agent/Front.h"
 #include "agent/InterfaceReader.h"
 #include "agent/Log.h"
@@ -35,6 +36,9 @@ namespace {
 
 /// How long a stop may be held up by notifications that a master does not take.
 constexpr std::chrono::seconds kLastWords{1};
+
+/// The lowest entPhysicalIndex, which is the chassis's.
+constexpr std::uint32_t kFirstEntity = 1;
 
 /// What the library's threads may reach until the process ends. Never destroyed.
 struct Boards {
@@ -174,10 +178,15 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     PlatformReader platform;
     std::optional<StableIndices> indices;
     std::optional<InterfaceReader> interfaces;
+    std::optional<StableIndices> entityIndices;
+    std::optional<EntityReader> entities;
     if (front.servesStandardObjects()) {
         indices.emplace(persistentDirectory() + "/ifindex.sqlite", options.interfaceBase,
                         "interfaces");
         interfaces.emplace(*boards.manager.get(), *indices, started);
+        entityIndices.emplace(persistentDirectory() + "/entity.sqlite", kFirstEntity,
+                              "physical entities");
+        entities.emplace(*entityIndices, started, [] { return std::time(nullptr); });
     }
     Collector collector(
         [&](Snapshot& snapshot) {
@@ -188,6 +197,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             snapshot.processes = readProcesses(statistics);
             snapshot.records = platform.read(snapshot.boards);
             if (interfaces) snapshot.interfaces = interfaces->read(snapshot.boards);
+            if (entities) snapshot.entities = entities->read(snapshot);
         },
         started, [&] { wakeup.wake(); });
     std::vector<Table const*> const allTables = tables();
