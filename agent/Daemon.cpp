@@ -15,6 +15,7 @@
 #include "access/ExternalFaultEventAdaptor.h"
 #include "agent/BoardSource.h"
 #include "agent/Collector.h"
+#include "agent/EntityNotices.h"
 #include "agent/EntityReader.h"
 #include "agent/Front.h"
 #include "agent/InterfaceReader.h"
@@ -214,6 +215,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}});
     front.serve({std::move(served), boards.counters, [&] { return collector.snapshot(); }});
     Notifier notifier(boards.queue, front.notifications());
+    EntityNotices entityNotices(boards.queue);
     ServiceNotice notice;
     std::string const serving =
         "serving " + std::to_string(collector.newest()->boards.size()) + " boards " + front.place();
@@ -226,8 +228,11 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             notice.ready(serving);
         }
     });
-    front.beforeSleep(
-        [&] { return earliest(notifier.announce(collector.newest()->begun), notice.beat()); });
+    front.beforeSleep([&] {
+        auto const entityNews = entityNotices.tell(collector.newest(), Clock::now());
+        return earliest(entityNews,
+                        earliest(notifier.announce(collector.newest()->begun), notice.beat()));
+    });
     ListeningScope const listening(boards.listener, [&] { collector.renew(); });
     log(LogLevel::Info, serving);
     notice.ready(serving);

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// ENTITY-MIB's tables: the physical entities, and what contains what.
+// ENTITY-MIB's tables: the physical entities, which interfaces they are, and what contains what.
 #include "agent/RowValues.h"
 #include "agent/StandardObjects.h"
 
@@ -13,6 +13,12 @@ constexpr std::int64_t kFalse = 2;
 template <auto Rows>
 auto const& entityRows(Snapshot const& snapshot) {
     return (*snapshot.entities.physical).*Rows;
+}
+
+/// The name that stands for no type of a vendor's.
+Value vendorType(PhysicalRow const& /*row*/) {
+    static constexpr std::uint32_t kNone[] = {0, 0};
+    return NameView{kNone};
 }
 
 Value containedIn(PhysicalRow const& row) {
@@ -42,6 +48,10 @@ Value manufacturingDate(PhysicalRow const& /*row*/) {
     return std::string_view(kNoDate, sizeof kNoDate);
 }
 
+Value interface(AliasRow const& row) {
+    return NameView{row.interface};
+}
+
 Value child(ContainsRow const& row) {
     return std::int64_t{row.child};
 }
@@ -51,6 +61,7 @@ using Row = PhysicalRow;
 
 constexpr Column<Row> kPhysicalColumns[] = {
     {"entPhysicalDescr", 2, Text, text<&Row::description>},
+    {"entPhysicalVendorType", 3, ObjectId, vendorType},
     {"entPhysicalContainedIn", 4, Integer, containedIn},
     {"entPhysicalClass", 5, Integer, physicalClass},
     {"entPhysicalParentRelPos", 6, Integer, position},
@@ -68,6 +79,10 @@ constexpr Column<Row> kPhysicalColumns[] = {
     {"entPhysicalUUID", 19, Octets, notKnown},
 };
 
+constexpr Column<AliasRow> kAliasColumns[] = {
+    {"entAliasMappingIdentifier", 2, ObjectId, interface},
+};
+
 constexpr Column<ContainsRow> kContainsColumns[] = {
     {"entPhysicalChildIndex", 1, Integer, child},
 };
@@ -77,6 +92,12 @@ constexpr Column<ContainsRow> kContainsColumns[] = {
 Table const& entPhysicalTable() {
     static RowTable<Row, entityRows<&PhysicalEntities::entities>> const table(
         "entPhysicalTable", {47, 1, 1, 1, 1}, kPhysicalColumns);
+    return table;
+}
+
+Table const& entAliasMappingTable() {
+    static RowTable<AliasRow, entityRows<&PhysicalEntities::aliases>> const table(
+        "entAliasMappingTable", {47, 1, 3, 2, 1}, kAliasColumns);
     return table;
 }
 

@@ -151,6 +151,7 @@ std::vector<Table const*> standardTables() {
             &isdnLapdTable(),
             &dot3StatsTable(),
             &entPhysicalTable(),
+            &entAliasMappingTable(),
             &entPhysicalContainsTable(),
             &entStateTable()};
 }

@@ -38,6 +38,7 @@ Table const& isdnSignalingTable();
 Table const& isdnLapdTable();
 Table const& dot3StatsTable();
 Table const& entPhysicalTable();
+Table const& entAliasMappingTable();
 Table const& entPhysicalContainsTable();
 Table const& entStateTable();
 

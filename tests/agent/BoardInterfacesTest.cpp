@@ -48,6 +48,16 @@ TEST_F(BoardInterfacesTest, LinesAreReadOnceThoughTheyAreInterfacesToo) {
     EXPECT_THAT(found.rows.interfaces, SizeIs(2));
 }
 
+TEST_F(BoardInterfacesTest, LinesArePortsAndChannelsAreNot) {
+    addLine("one");
+    add(new FakeISDNFeature({new FakeDChannel("D", 1, 1, "one")}, {new FakeBChannel("B", 1)}));
+    auto const rows = read();
+    EXPECT_THAT(rows.interfaces, SizeIs(3));
+    ASSERT_THAT(rows.ports, SizeIs(1));
+    EXPECT_EQ(rows.ports[0].ifIndex, rows.lines[0].ifIndex);
+    EXPECT_EQ(rows.ports[0].key, (IndexKey{IndexKind::Line, "one"}));
+}
+
 TEST_F(BoardInterfacesTest, LinesOfOneNameAreToldApart) {
     addLine("same");
     addLine("same");

@@ -175,6 +175,16 @@ TEST_F(InterfaceReaderTest, ComingAndGoingIsTimedAndStayingIsNot) {
     EXPECT_EQ(read().lastChange, changed.lastChange);
 }
 
+TEST_F(InterfaceReaderTest, EthernetIsAPortOfItsBoard) {
+    m_chassis.insert("A");
+    addPort(m_chassis.insert("B"));
+    auto const ports = read().ports;
+    ASSERT_THAT(ports, SizeIs(1));
+    EXPECT_EQ(ports[0].ifIndex, 1000U);
+    EXPECT_EQ(ports[0].boardIndex, 2U);
+    EXPECT_EQ(ports[0].key, (IndexKey{IndexKind::Ethernet, "1"}));
+}
+
 TEST_F(InterfaceReaderTest, InterfaceWithNothingAboveOrBelowStandsAlone) {
     addPort(m_chassis.insert("A"));
     EXPECT_THAT(read().stack, ElementsAre(StackRow{0, 1000}, StackRow{1000, 0}));
