@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <map>
 #include <set>
+#include <span>
 #include <string>
 #include <utility>
 #include <vector>
@@ -38,10 +39,12 @@ std::string slotName(BoardRow const& board) {
     return name + "slot " + std::to_string(*board.pciSlotNumber);
 }
 
-/// The rows of one board among rows that are ascending by board.
-template <class Row>
-auto rowsOf(std::vector<Row> const& rows, std::uint32_t boardIndex) {
-    return std::ranges::equal_range(rows, boardIndex, {}, &Row::boardIndex);
+/// The processors of one board.
+std::span<ProcessorRow const> rowsOf(std::vector<ProcessorRow> const& rows,
+                                     std::uint32_t boardIndex) {
+    auto const begin = std::ranges::lower_bound(rows, boardIndex, {}, &ProcessorRow::boardIndex);
+    auto const end = std::ranges::upper_bound(rows, boardIndex, {}, &ProcessorRow::boardIndex);
+    return {begin, end};
 }
 
 /// The entities of one snapshot, while they are put together.
