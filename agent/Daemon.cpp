@@ -185,6 +185,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             snapshot.services = readServices(services);
             snapshot.platformService = readPlatformService(services);
             snapshot.processes = readProcesses(statistics);
+            snapshot.resources = readResources(*boards.manager.get(), snapshot.boards);
             snapshot.records = platform.read(snapshot.boards);
             if (interfaces) snapshot.interfaces = interfaces->read(snapshot.boards);
         },

@@ -24,6 +24,7 @@ Table const& subDeviceTable();
 Table const& processorTable();
 Table const& storeTable();
 Table const& processTable();
+Table const& resourceDeviceTable();
 
 /// Every table.
 std::vector<Table const*> tables();

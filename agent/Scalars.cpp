@@ -60,7 +60,8 @@ std::span<Scalar const> scalars() {
 
 std::vector<Table const*> tables() {
     return {&boardTable(),     &moduleTable(),    &serviceTable(), &deviceTable(),
-            &subDeviceTable(), &processorTable(), &storeTable(),   &processTable()};
+            &subDeviceTable(), &processorTable(), &storeTable(),   &processTable(),
+            &resourceDeviceTable()};
 }
 
 } // namespace kvloamd

@@ -12,6 +12,7 @@
 #include "agent/InterfaceRows.h"
 #include "agent/PlatformReader.h"
 #include "agent/ProcessRow.h"
+#include "agent/ResourceRows.h"
 #include "agent/ServiceRows.h"
 
 namespace kvloamd {
@@ -25,6 +26,7 @@ struct Snapshot {
     std::vector<ServiceRow> services;
     PlatformService platformService;
     std::vector<ProcessRow> processes;
+    std::vector<ResourceRow> resources;
     std::shared_ptr<PlatformRecords const> records = std::make_shared<PlatformRecords>(); ///< set
     InterfaceRows interfaces;
     Clock::time_point begun;      ///< when reading began: what happened before is in it
