@@ -17,7 +17,6 @@ constexpr std::size_t kLengthAt = 16;
 /// A name that begins so, with a number of one octet after it, is written without its beginning.
 constexpr std::array<std::uint32_t, 4> kInternet{1, 3, 6, 1};
 
-constexpr std::uint16_t kObjectIdentifier = 6;
 constexpr std::uint16_t kOctetString = 4;
 constexpr std::uint16_t kNoSuchObject = 128;
 constexpr std::uint16_t kNoSuchInstance = 129;
@@ -35,6 +34,8 @@ std::uint16_t typeOf(ValueType type) {
         return 67;
     case ValueType::Counter64:
         return 70;
+    case ValueType::ObjectId:
+        return 6;
     case ValueType::Text:
     case ValueType::Octets:
     case ValueType::Date:
@@ -163,14 +164,10 @@ void AgentxWriter::head(std::uint16_t type, OidView named) {
 void AgentxWriter::variable(OidView named, ValueType type, Value const& value) {
     head(typeOf(type), named);
     if (auto const* const octets = std::get_if<std::string_view>(&value)) return text(*octets);
+    if (auto const* const place = std::get_if<NameView>(&value)) return name(place->name);
     auto const bits = static_cast<std::uint64_t>(std::get<std::int64_t>(value));
     if (type == ValueType::Counter64) number(static_cast<std::uint32_t>(bits >> 32U));
     number(static_cast<std::uint32_t>(bits));
-}
-
-void AgentxWriter::variable(OidView named, OidView value) {
-    head(kObjectIdentifier, named);
-    name(value);
 }
 
 void AgentxWriter::noSuchObject(OidView named) {

@@ -103,8 +103,6 @@ class AgentxWriter {
     void text(std::string_view value);
     /// A variable with its value; `value` is known.
     void variable(OidView name, ValueType type, Value const& value);
-    /// A variable whose value is a name.
-    void variable(OidView name, OidView value);
     /// A variable that says why it has no value.
     void noSuchObject(OidView name);
     void noSuchInstance(OidView name);

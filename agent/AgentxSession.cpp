@@ -139,9 +139,9 @@ void AgentxSession::registerRoots() {
 
 void AgentxSession::send(Notification const& notification, std::function<void()> taken) {
     AgentxWriter packet = request(AgentxKind::Notify);
-    packet.variable(kTrapOid, notification.name);
-    for (Instance const& variable : notification.variables)
-        packet.variable(variable.name, variable.type, variable.value);
+    packet.variable(kTrapOid, ValueType::ObjectId, NameView{notification.name});
+    for (NotifiedObject const& object : notification.objects)
+        packet.variable(object.name, object.type, object.view());
     m_taken = std::move(taken);
     queue(packet.take());
 }

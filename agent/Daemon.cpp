@@ -8,6 +8,7 @@
 #include <filesystem>
 #include <memory>
 #include <system_error>
+#include <utility>
 
 #include "access/DeviceMapperIf.h"
 #include "access/ExternalEventAdaptor.h"
@@ -38,11 +39,14 @@ constexpr std::chrono::seconds kLastWords{1};
 
 /// What the library's threads may reach until the process ends. Never destroyed.
 struct Boards {
+    explicit Boards(Oid enterprise)
+        : listener(*manager.get(), source, queue, counters, std::move(enterprise)) {}
+
     ReferenceCounter<BoardManager> manager{new BoardManager};
     Counters counters;
     BoardSource source{*manager.get()};
-    StatusQueue queue{counters};
-    StatusListener listener{*manager.get(), source, queue};
+    NotificationQueue queue{counters};
+    StatusListener listener;
 };
 
 /// Makes the first calls of the library's singletons, which belong to one thread, and asks the
@@ -155,7 +159,7 @@ void reload(Options const& started, ReadOptions const& readAgain) {
 }
 
 /// Has the last notifications leave, if they can soon.
-void announceLast(Notifier& notifier, StatusQueue& queue, Front& front) {
+void announceLast(Notifier& notifier, NotificationQueue& queue, Front& front) {
     front.beforeSleep([&]() -> std::optional<Clock::time_point> {
         if (notifier.announceAll()) front.stop();
         return std::nullopt;
@@ -199,7 +203,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
         served.push_back(
             {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}});
     front.serve({std::move(served), boards.counters, [&] { return collector.snapshot(); }});
-    Notifier notifier(boards.queue, front.notifications(), options.enterprise);
+    Notifier notifier(boards.queue, front.notifications());
     ServiceNotice notice;
     std::string const serving =
         "serving " + std::to_string(collector.newest()->boards.size()) + " boards " + front.place();
@@ -231,7 +235,7 @@ int runDaemon(Options const& options, ReadOptions const& readAgain) {
     Signals const signals;
     tzset();
     // The library's threads reach these until the process ends.
-    static auto* const boards = new Boards;
+    static auto* const boards = new Boards(options.enterprise);
     try {
         std::vector<LoadedModule> const modules = loadModules(options);
         if (modules.empty())

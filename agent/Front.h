@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "agent/NotificationSink.h"
+#include "agent/ObjectTree.h"
 #include "agent/Options.h"
 
 namespace kvloamd {

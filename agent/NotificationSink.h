@@ -3,17 +3,10 @@
 #pragma once
 
 #include <functional>
-#include <vector>
 
-#include "agent/ObjectTree.h"
+#include "agent/Notification.h"
 
 namespace kvloamd {
-
-/// A notification's names are absolute.
-struct Notification {
-    Oid name;
-    std::vector<Instance> variables; ///< integers and texts
-};
 
 /// Used on the thread that does all SNMP only.
 class NotificationSink {

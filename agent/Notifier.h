@@ -1,12 +1,12 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Announces status changes as notifications.
+// Sends what the notification queue holds.
 #pragma once
 
 #include <chrono>
 #include <optional>
 
+#include "agent/NotificationQueue.h"
 #include "agent/NotificationSink.h"
-#include "agent/StatusQueue.h"
 
 namespace kvloamd {
 
@@ -18,24 +18,22 @@ class Notifier {
     /// the same.
     static constexpr std::chrono::milliseconds kPatience{1000};
 
-    /// `queue` and `sink` outlive the notifier. `enterprise` is the arc above all names.
-    Notifier(StatusQueue& queue, NotificationSink& sink, Oid enterprise);
+    /// `queue` and `sink` outlive the notifier.
+    Notifier(NotificationQueue& queue, NotificationSink& sink) : m_queue(queue), m_sink(sink) {}
 
-    /// Announces the changes that a snapshot begun at `snapshotBegun` shows, and those that have
-    /// waited long enough, as far as the sink is ready. A change stays in the queue until the sink
+    /// Sends the notifications whose news a snapshot begun at `snapshotBegun` shows, and those that
+    /// have waited long enough, as far as the sink is ready. One stays in the queue until the sink
     /// answers for it. Returns when to come again at the latest, if only time is missing.
     std::optional<Clock::time_point> announce(Clock::time_point snapshotBegun);
 
-    /// Announces without waiting for a snapshot. Whether nothing is left.
+    /// Sends without waiting for a snapshot. Whether nothing is left.
     bool announceAll();
 
   private:
-    Notification notificationOf(StatusChange const& change) const;
-    void send(StatusChange const& change);
+    void send(Notification const& notification);
 
-    StatusQueue& m_queue;
+    NotificationQueue& m_queue;
     NotificationSink& m_sink;
-    Oid m_enterprise;
 };
 
 } // namespace kvloamd

@@ -12,6 +12,8 @@
 #include <net-snmp/agent/net-snmp-agent-includes.h>
 // clang-format on
 
+#include "agent/SnmpValues.h"
+
 namespace kvloamd {
 
 namespace {
@@ -24,43 +26,6 @@ using HeldSnapshot = std::shared_ptr<Snapshot const>;
 
 void freeSnapshot(void* held) {
     delete static_cast<HeldSnapshot*>(held);
-}
-
-u_char typeOf(ValueType type) {
-    switch (type) {
-    case ValueType::Integer:
-        return ASN_INTEGER;
-    case ValueType::Counter:
-        return ASN_COUNTER;
-    case ValueType::Counter64:
-        return ASN_COUNTER64;
-    case ValueType::Gauge:
-        return ASN_GAUGE;
-    case ValueType::TimeTicks:
-        return ASN_TIMETICKS;
-    case ValueType::Text:
-    case ValueType::Octets:
-    case ValueType::Date:
-        break;
-    }
-    return ASN_OCTET_STR;
-}
-
-void setValue(netsnmp_variable_list* variable, Instance const& instance) {
-    u_char const type = typeOf(instance.type);
-    if (auto const* const octets = std::get_if<std::string_view>(&instance.value)) {
-        snmp_set_var_typed_value(variable, type, octets->data(), octets->size());
-    } else if (auto const* const number = std::get_if<std::int64_t>(&instance.value)) {
-        if (type == ASN_COUNTER64) {
-            auto const bits = static_cast<std::uint64_t>(*number);
-            counter64 const value{bits >> 32, bits & kHighest};
-            snmp_set_var_typed_value(variable, type, &value, sizeof value);
-            return;
-        }
-        // The library keeps every number of 32 bits in a long.
-        long const value = static_cast<long>(*number);
-        snmp_set_var_typed_value(variable, type, &value, sizeof value);
-    }
 }
 
 } // namespace
@@ -137,7 +102,7 @@ void SnmpHandler::Call::get(netsnmp_request_info* request) {
     bool orEqual = false;
     switch (handler.m_tree.find(facts, relative(request->requestvb, orEqual), instance)) {
     case Lookup::Found:
-        setValue(request->requestvb, instance);
+        setVariable(request->requestvb, instance.type, instance.value);
         break;
     case Lookup::NoSuchObject:
         netsnmp_request_set_error(request, SNMP_NOSUCHOBJECT);
@@ -161,9 +126,9 @@ void SnmpHandler::Call::getNext(netsnmp_request_info* request) {
         // The library looks at the first answer of a GETBULK only when it compares answers with
         // what the asker may see; so what he may not see is passed over here.
         std::size_t length = name.size();
-        if (in_a_view(name.data(), &length, pdu, typeOf(instance.type)) == VACM_SUCCESS) {
+        if (in_a_view(name.data(), &length, pdu, asnTypeOf(instance.type)) == VACM_SUCCESS) {
             snmp_set_var_objid(request->requestvb, name.data(), name.size());
-            setValue(request->requestvb, instance);
+            setVariable(request->requestvb, instance.type, instance.value);
             return;
         }
         after.swap(instance.name);

@@ -21,7 +21,8 @@ int StatusListener::ProcessBoardStatusEvent(ReferenceCounter<BoardStatusEvent> e
     if (index == 0) return 0;
     BoardStatusEnum const status = told->GetBoardStatus();
     if (status == BoardStatusRemoved) m_source.boardHasGone(index);
-    m_queue.push({index, readSerialNumber(*changed), status, Clock::now()});
+    ++m_counters.statusChanges;
+    m_queue.push(boardStatusChange(m_enterprise, index, readSerialNumber(*changed), status));
     std::scoped_lock const guard(m_mutex);
     if (m_phase == Phase::Running) m_changed();
     return 0;

@@ -2,12 +2,13 @@
 // Takes the board manager's status changes off the threads that tell of them.
 #pragma once
 
-#include <atomic>
 #include <functional>
+#include <mutex>
 #include <thread>
+#include <utility>
 
 #include "agent/BoardSource.h"
-#include "agent/StatusQueue.h"
+#include "agent/NotificationQueue.h"
 #include "board/BoardManager.h"
 
 namespace kvloamd {
@@ -23,9 +24,15 @@ namespace kvloamd {
 /// process ends, so it is never destroyed.
 class StatusListener final : public BoardStatusListener {
   public:
-    /// Made on the thread that attaches the factories. All arguments live as long as the process.
-    StatusListener(BoardManager& manager, BoardSource& source, StatusQueue& queue)
-        : m_manager(manager), m_source(source), m_queue(queue) {}
+    /// Made on the thread that attaches the factories. What is referred to lives as long as the
+    /// process. `enterprise` is the arc above all names of KVL-OAM-MIB.
+    StatusListener(BoardManager& manager, BoardSource& source, NotificationQueue& queue,
+                   Counters& counters, Oid enterprise)
+        : m_manager(manager),
+          m_source(source),
+          m_queue(queue),
+          m_counters(counters),
+          m_enterprise(std::move(enterprise)) {}
 
     int ProcessBoardStatusEvent(ReferenceCounter<BoardStatusEvent> event) override;
 
@@ -40,7 +47,9 @@ class StatusListener final : public BoardStatusListener {
 
     BoardManager& m_manager;
     BoardSource& m_source;
-    StatusQueue& m_queue;
+    NotificationQueue& m_queue;
+    Counters& m_counters;
+    Oid const m_enterprise;
     std::thread::id const m_startingThread = std::this_thread::get_id();
     std::mutex m_mutex; ///< guards what follows; held during `m_changed`
     Phase m_phase = Phase::Starting;

@@ -27,6 +27,13 @@ inline bool startsWith(OidView name, OidView prefix) {
     return name.size() >= prefix.size() && std::is_eq(compare(name.first(prefix.size()), prefix));
 }
 
+/// One name after the other.
+inline Oid joined(OidView a, OidView b) {
+    Oid name(a.begin(), a.end());
+    name.insert(name.end(), b.begin(), b.end());
+    return name;
+}
+
 enum class ValueType {
     Integer,   ///< signed, 32 bits
     Counter,   ///< 32 bits, wraps
@@ -36,11 +43,21 @@ enum class ValueType {
     Text,      ///< printable characters
     Octets,    ///< any
     Date,      ///< 11 octets: date, time of day, offset from UTC
+    ObjectId,  ///< a place in the tree of names, absolute
 };
 
-/// A number (an unsigned one of 64 bits as the same bits), octets that the snapshot behind them
-/// holds, or nothing: the value is not known.
-using Value = std::variant<std::monostate, std::int64_t, std::string_view>;
+/// A name that is a value.
+struct NameView {
+    OidView name;
+
+    friend bool operator==(NameView const& a, NameView const& b) {
+        return std::is_eq(compare(a.name, b.name));
+    }
+};
+
+/// A number (an unsigned one of 64 bits as the same bits), octets or a name that the snapshot
+/// behind them holds, or nothing: the value is not known.
+using Value = std::variant<std::monostate, std::int64_t, std::string_view, NameView>;
 
 inline bool isKnown(Value const& value) {
     return !std::holds_alternative<std::monostate>(value);

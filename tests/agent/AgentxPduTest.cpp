@@ -89,6 +89,7 @@ TEST(AgentxPduTest, TextIsFilledUpToFourOctets) {
 }
 
 TEST(AgentxPduTest, ValuesAreWrittenWithTheirTypes) {
+    Oid const name{1, 3, 6, 1, 2, 7};
     struct Case {
         ValueType type;
         Value value;
@@ -102,7 +103,8 @@ TEST(AgentxPduTest, ValuesAreWrittenWithTheirTypes) {
                "\0\106\0\0\0\0\0\0\0\0\0\1\0\0\0\2"sv},
           Case{ValueType::Gauge, std::int64_t{1}, "\0\102\0\0\0\0\0\0\0\0\0\1"sv},
           Case{ValueType::TimeTicks, std::int64_t{256}, "\0\103\0\0\0\0\0\0\0\0\1\0"sv},
-          Case{ValueType::Text, "ab"sv, "\0\4\0\0\0\0\0\0\0\0\0\2ab\0\0"sv}}) {
+          Case{ValueType::Text, "ab"sv, "\0\4\0\0\0\0\0\0\0\0\0\2ab\0\0"sv},
+          Case{ValueType::ObjectId, NameView{name}, "\0\6\0\0\0\0\0\0\1\2\0\0\0\0\0\7"sv}}) {
         AgentxWriter writer = ping();
         writer.variable(Oid{}, example.type, example.value);
         EXPECT_EQ(payloadOf(writer.take()), example.written);

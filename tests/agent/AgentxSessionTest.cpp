@@ -156,7 +156,7 @@ class AgentxSessionTest : public ::testing::Test {
         EXPECT_TRUE(runUntil([this] { return m_session->isConnected(); }));
     }
     void notify() {
-        m_session->send({{1, 3, 6, 1, 4, 1, 32473, 1, 0, 1}, {}}, [this] { ++m_taken; });
+        m_session->send({{1, 3, 6, 1, 4, 1, 32473, 1, 0, 1}, {}, {}}, [this] { ++m_taken; });
     }
 
     std::string path() const { return m_folder + "/master"; }

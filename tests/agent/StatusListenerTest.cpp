@@ -21,11 +21,18 @@ class StatusListenerTest : public ::testing::Test {
         m_chassis.factoryHandle->NotifyBoardStatusListeners(board, status);
     }
 
+    static std::string serialNumberOf(Notification const& change) {
+        return std::get<std::string>(change.objects.at(1).value);
+    }
+    static std::int64_t statusOf(Notification const& change) {
+        return std::get<std::int64_t>(change.objects.at(2).value);
+    }
+
     FakeChassis m_chassis;
     Counters m_counters;
     BoardSource m_source{*m_chassis.manager.get()};
-    StatusQueue m_queue{m_counters};
-    StatusListener m_listener{*m_chassis.manager.get(), m_source, m_queue};
+    NotificationQueue m_queue{m_counters};
+    StatusListener m_listener{*m_chassis.manager.get(), m_source, m_queue, m_counters, {1, 3, 9}};
     int m_told = 0;
 };
 
@@ -35,9 +42,12 @@ TEST_F(StatusListenerTest, ChangeIsQueuedWithIndexSerialNumberAndStatus) {
     announce(m_chassis.insert("B"), BoardStatusStopped);
     auto const change = m_queue.pop();
     ASSERT_TRUE(change.has_value());
-    EXPECT_EQ(change->boardIndex, 2);
-    EXPECT_EQ(change->serialNumber, "B");
-    EXPECT_EQ(change->status, BoardStatusStopped);
+    EXPECT_EQ(change->name, (Oid{1, 3, 9, 1, 0, 1}));
+    ASSERT_EQ(change->objects.size(), 3U);
+    EXPECT_EQ(change->objects[0].name, (Oid{1, 3, 9, 1, 1, 3, 1, 0}));
+    EXPECT_EQ(change->objects[0].view(), Value{std::int64_t{2}});
+    EXPECT_EQ(serialNumberOf(*change), "B");
+    EXPECT_EQ(statusOf(*change), BoardStatusStopped);
     EXPECT_EQ(m_told, 1);
 }
 
@@ -47,7 +57,7 @@ TEST_F(StatusListenerTest, ChangeIsWhatItWasWhenTheBoardChangesAfterwards) {
     announce(board, BoardStatusRemoved);
     m_chassis.factory->takeOut(board);
     FakeChassis::fake(board).serialNumber = "B";
-    EXPECT_EQ(m_queue.pop()->serialNumber, "A");
+    EXPECT_EQ(serialNumberOf(m_queue.pop().value()), "A");
 }
 
 TEST_F(StatusListenerTest, BoardsThatAreFoundAtTheStartAreNoChanges) {
@@ -61,7 +71,7 @@ TEST_F(StatusListenerTest, ChangeThatAnotherThreadTellsDuringTheStartIsOne) {
     ReferenceCounter<Board> const board = m_chassis.insert("A");
     std::thread([&] { announce(board, BoardStatusFailed); }).join();
     start();
-    EXPECT_EQ(m_queue.pop()->status, BoardStatusFailed);
+    EXPECT_EQ(statusOf(m_queue.pop().value()), BoardStatusFailed);
 }
 
 TEST_F(StatusListenerTest, RemovedBoardIsOutOfTheSnapshotAtOnce) {

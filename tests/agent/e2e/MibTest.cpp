@@ -56,6 +56,8 @@ class MibTest : public AgentFixture {
             return ::testing::Eq("Gauge32");
         case ValueType::TimeTicks:
             return ::testing::Eq("TimeTicks");
+        case ValueType::ObjectId:
+            return ::testing::Eq("OBJECT");
         case ValueType::Text:
         case ValueType::Octets:
         case ValueType::Date:

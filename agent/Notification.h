@@ -1,0 +1,36 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// A notification: which one it is, and what it carries.
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <variant>
+#include <vector>
+
+#include "agent/Snapshot.h"
+#include "agent/Value.h"
+
+namespace kvloamd {
+
+/// An object that a notification carries, with a value of its own: no snapshot is behind it.
+struct NotifiedObject {
+    Oid name; ///< absolute
+    ValueType type = ValueType::Integer;
+    /// An unsigned number of 64 bits as the same bits.
+    std::variant<std::int64_t, std::string, Oid> value;
+
+    /// Good while the object is.
+    Value view() const;
+};
+
+struct Notification {
+    Oid name; ///< absolute
+    std::vector<NotifiedObject> objects;
+    Clock::time_point when; ///< of what it tells of
+};
+
+/// kvlBoardStatusChange. `enterprise` is the arc above all names of KVL-OAM-MIB.
+Notification boardStatusChange(Oid const& enterprise, int boardIndex, std::string serialNumber,
+                               int status);
+
+} // namespace kvloamd
