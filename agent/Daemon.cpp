@@ -15,6 +15,7 @@
 #include "access/ExternalFaultEventAdaptor.h"
 #include "agent/BoardSource.h"
 #include "agent/Collector.h"
+#include "agent/FaultListener.h"
 #include "agent/Front.h"
 #include "agent/InterfaceIndices.h"
 #include "agent/InterfaceReader.h"
@@ -39,14 +40,17 @@ constexpr std::chrono::seconds kLastWords{1};
 
 /// What the library's threads may reach until the process ends. Never destroyed.
 struct Boards {
-    explicit Boards(Oid enterprise)
-        : listener(*manager.get(), source, queue, counters, std::move(enterprise)) {}
+    explicit Boards(Oid const& enterprise)
+        : listener(*manager.get(), source, queue, counters, enterprise),
+          faultListener(*manager.get(), faults, queue, enterprise) {}
 
     ReferenceCounter<BoardManager> manager{new BoardManager};
     Counters counters;
     BoardSource source{*manager.get()};
     NotificationQueue queue{counters};
+    FaultLog faults;
     StatusListener listener;
+    FaultListener faultListener;
 };
 
 /// Makes the first calls of the library's singletons, which belong to one thread, and asks the
@@ -82,24 +86,32 @@ void attachModules(std::vector<LoadedModule> const& modules, Boards& boards) {
     for (LoadedModule const& module : modules)
         factories.push_back(module.createFactory());
     boards.manager->AddBoardStatusListener(&boards.listener);
+    boards.manager->AddBoardStatusListener(&boards.faultListener);
+    ExternalFaultEventAdaptor::get_instance()->AddExternalFaultEventListener(&boards.faultListener);
     for (ReferenceCounter<BoardFactory> const& factory : factories)
         boards.manager->Attach(factory);
     for (LoadedModule const& module : modules)
         ServiceManager::GetInstance()->AddModule(module.name().c_str());
 }
 
-/// Has the listener tell of changes for a scope.
+/// Has the listeners tell of changes for a scope.
 class ListeningScope {
   public:
-    ListeningScope(StatusListener& listener, std::function<void()> changed) : m_listener(listener) {
-        m_listener.start(std::move(changed));
+    ListeningScope(Boards& boards, std::function<void()> const& changed) : m_boards(boards) {
+        m_boards.listener.start(changed);
+        m_boards.faultListener.start(changed);
     }
-    ~ListeningScope() { m_listener.stop(); }
+    ~ListeningScope() { stop(); }
     ListeningScope(ListeningScope const&) = delete;
     ListeningScope& operator=(ListeningScope const&) = delete;
 
+    void stop() {
+        m_boards.listener.stop();
+        m_boards.faultListener.stop();
+    }
+
   private:
-    StatusListener& m_listener;
+    Boards& m_boards;
 };
 
 /// A folder for a scope.
@@ -189,6 +201,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             snapshot.services = readServices(services);
             snapshot.platformService = readPlatformService(services);
             snapshot.processes = readProcesses(statistics);
+            snapshot.faults = boards.faults.read(started);
             snapshot.resources = readResources(*boards.manager.get(), snapshot.boards);
             snapshot.records = platform.read(snapshot.boards);
             if (interfaces) snapshot.interfaces = interfaces->read(snapshot.boards);
@@ -218,14 +231,14 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     });
     front.beforeSleep(
         [&] { return earliest(notifier.announce(collector.newest()->begun), notice.beat()); });
-    ListeningScope const listening(boards.listener, [&] { collector.renew(); });
+    ListeningScope listening(boards, [&] { collector.renew(); });
     log(LogLevel::Info, serving);
     notice.ready(serving);
     front.run();
     signals.letStopThrough();
     notice.stopping();
     log(LogLevel::Info, "stopping");
-    boards.listener.stop();
+    listening.stop();
     announceLast(notifier, boards.queue, front);
 }
 

@@ -54,14 +54,34 @@ std::span<Scalar const> scalars() {
          [](Facts const& facts) {
              return textIfKnown<&PlatformService::changeDate>(facts.snapshot.platformService);
          }},
+        {"kvlFaultCount",
+         {1, 1, 8, 1},
+         ValueType::Gauge,
+         [](Facts const& facts) -> Value {
+             return static_cast<std::int64_t>(facts.snapshot.faults.rows.size());
+         }},
+        {"kvlFaultsRaised",
+         {1, 1, 8, 2},
+         ValueType::Counter,
+         [](Facts const& facts) -> Value { return std::int64_t{facts.snapshot.faults.raised}; }},
+        {"kvlFaultTableLastChange",
+         {1, 1, 8, 3},
+         ValueType::TimeTicks,
+         [](Facts const& facts) -> Value {
+             return std::int64_t{facts.snapshot.faults.lastChange};
+         }},
+        {"kvlFaultsUnlisted",
+         {1, 1, 8, 4},
+         ValueType::Counter,
+         [](Facts const& facts) -> Value { return std::int64_t{facts.snapshot.faults.unlisted}; }},
     };
     return described;
 }
 
 std::vector<Table const*> tables() {
-    return {&boardTable(),     &moduleTable(),    &serviceTable(), &deviceTable(),
-            &subDeviceTable(), &processorTable(), &storeTable(),   &processTable(),
-            &resourceDeviceTable()};
+    return {&boardTable(),          &moduleTable(),    &serviceTable(), &deviceTable(),
+            &subDeviceTable(),      &processorTable(), &storeTable(),   &processTable(),
+            &resourceDeviceTable(), &faultTable()};
 }
 
 } // namespace kvloamd

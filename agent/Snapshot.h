@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "agent/BoardRow.h"
+#include "agent/FaultRow.h"
 #include "agent/InterfaceRows.h"
 #include "agent/PlatformReader.h"
 #include "agent/ProcessRow.h"
@@ -27,6 +28,7 @@ struct Snapshot {
     PlatformService platformService;
     std::vector<ProcessRow> processes;
     std::vector<ResourceRow> resources;
+    Faults faults;
     std::shared_ptr<PlatformRecords const> records = std::make_shared<PlatformRecords>(); ///< set
     InterfaceRows interfaces;
     Clock::time_point begun;      ///< when reading began: what happened before is in it
