@@ -183,7 +183,8 @@ void announceLast(Notifier& notifier, NotificationQueue& queue, Front& front) {
 }
 
 void serve(Options const& options, ReadOptions const& readAgain, Front& front,
-           Signals const& signals, Boards& boards, Clock::time_point started) {
+           Signals const& signals, Boards& boards) {
+    Clock::time_point const started = boards.counters.started;
     Wakeup wakeup;
     ServiceManager& services = *ServiceManager::GetInstance();
     KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
@@ -215,7 +216,10 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     if (interfaces)
         served.push_back(
             {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}});
-    front.serve({std::move(served), boards.counters, [&] { return collector.snapshot(); }});
+    front.serve({std::move(served), boards.counters, [&] {
+                     ++boards.counters.requests;
+                     return collector.snapshot();
+                 }});
     Notifier notifier(boards.queue, front.notifications());
     ServiceNotice notice;
     std::string const serving =
@@ -256,9 +260,9 @@ int runDaemon(Options const& options, ReadOptions const& readAgain) {
                                    "with --module");
         std::unique_ptr<Front> const front = makeFront(options);
         if (!front->open() || !platformAnswers()) return kExitFailure;
-        Clock::time_point const started = Clock::now();
+        boards->counters.started = Clock::now();
         attachModules(modules, *boards);
-        serve(options, readAgain, *front, signals, *boards, started);
+        serve(options, readAgain, *front, signals, *boards);
         log(LogLevel::Info, "stopped");
     } catch (std::exception const& error) {
         log(LogLevel::Error, error.what());
