@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/FaultListener.h"
 
-#include <ranges>
 #include <utility>
 
 #include "agent/BoardRow.h"
@@ -84,8 +83,7 @@ void FaultListener::forgetBoard(int index) {
 
 FaultListener::KnownBoard const* FaultListener::find(int platformBoard) {
     bool allHaveLogicalIds = true;
-    // The newest first: it has taken the place of one that is going.
-    for (auto const& [index, board] : m_boards | std::views::reverse) {
+    for (auto const& [index, board] : m_boards) {
         if (board.logicalId == platformBoard) return &board;
         allHaveLogicalIds = allHaveLogicalIds && board.logicalId.has_value();
     }
@@ -93,7 +91,7 @@ FaultListener::KnownBoard const* FaultListener::find(int platformBoard) {
     if (!m_finder) m_finder.emplace();
     auto const found = m_finder->serialNumberOfDriverBoard(platformBoard);
     if (!found) return nullptr;
-    for (auto const& [index, board] : m_boards | std::views::reverse)
+    for (auto const& [index, board] : m_boards)
         if (!board.logicalId && board.serialNumber == *found) return &board;
     return nullptr;
 }

@@ -64,7 +64,8 @@ class FaultListener final : public ExternalFaultEventListener, public BoardStatu
     Oid const m_enterprise;
 
     std::mutex m_boardsMutex; ///< guards what follows, and that the log has faults of them only
-    std::map<int, KnownBoard> m_boards;
+    /// By index, the newest first: it has taken the place of one that is going.
+    std::map<int, KnownBoard, std::greater<>> m_boards;
     std::optional<BoardFinder> m_finder; ///< good until the next status change
 
     std::mutex m_mutex; ///< guards what follows; held during `m_changed`
