@@ -7,6 +7,7 @@
 #include <string>
 #include <utility>
 
+#include "agent/BoardFeatures.h"
 #include "agent/BoardRow.h"
 #include "agent/RowValues.h"
 #include "board/DS1LineFeature.h"
@@ -51,14 +52,6 @@ std::string text(Asked& asked, int (Asked::*query)(char*)) {
 std::optional<std::uint32_t> unsignedNumber(int answer) {
     if (answer == KVL::kNotSupported) return std::nullopt;
     return static_cast<std::uint32_t>(answer);
-}
-
-/// Calls `call(feature)` for every feature of `board` that is a `Kind`.
-template <class Kind, class Call>
-void forEachFeature(Board& board, Call const& call) {
-    for (auto feature = board.GetFirstFeature(Kind::iid()); feature.get() != nullptr;
-         feature = board.GetNextFeature(feature, Kind::iid()))
-        if (auto* const found = dynamic_cast<Kind*>(feature.get())) call(*found);
 }
 
 class Reading {
@@ -200,8 +193,10 @@ void Reading::readLine(DS1LineDevice& line) {
 
 void Reading::readLines(DS1LineFeature& feature) {
     for (auto line = feature.GetFirstDevice(); line.get() != nullptr;
-         line = feature.GetNextDevice(line))
+         line = feature.GetNextDevice(line)) {
         readLine(*line.get());
+        m_found.lines.push_back(line);
+    }
 }
 
 std::uint32_t Reading::readSignalling(ISDNDChannel& channel) {

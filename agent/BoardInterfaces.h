@@ -8,6 +8,8 @@
 #include "agent/IndexFile.h"
 #include "agent/InterfaceRows.h"
 #include "board/Board.h"
+#include "board/DS1LineDevice.h"
+#include "core/ReferenceCounter.h"
 
 namespace kvloamd {
 
@@ -16,6 +18,7 @@ namespace kvloamd {
 struct BoardInterfaces {
     std::vector<InterfaceKey> keys; ///< all different
     InterfaceRows rows;
+    std::vector<ReferenceCounter<DS1LineDevice>> lines; ///< as `rows.lines`
 };
 
 /// Seconds since the epoch as hundredths of a second since the agent's start.

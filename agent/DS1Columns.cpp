@@ -50,6 +50,9 @@ Value total(LineRow const& row) {
 using enum ValueType;
 using Row = LineRow;
 
+/// Enabled or disabled.
+constexpr Writable kTraps{Setting::LineStatusChangeTraps, 1, 2};
+
 constexpr Column<Row> kConfigColumns[] = {
     {"dsx1LineIndex", 1, Integer, index},
     {"dsx1TimeElapsed", 3, Integer, number<&Row::timeElapsed>},
@@ -66,7 +69,7 @@ constexpr Column<Row> kConfigColumns[] = {
     {"dsx1InvalidIntervals", 14, Integer, invalidIntervals},
     {"dsx1LineLength", 15, Integer, number<&Row::lineLength>},
     {"dsx1LineStatusLastChange", 16, TimeTicks, number<&Row::statusLastChange>},
-    {"dsx1LineStatusChangeTrapEnable", 17, Integer, number<&Row::statusChangeTrapEnable>},
+    {"dsx1LineStatusChangeTrapEnable", 17, Integer, number<&Row::statusChangeTrapEnable>, kTraps},
     {"dsx1LoopbackStatus", 18, Integer, number<&Row::loopbackStatus>},
     {"dsx1Ds1ChannelNumber", 19, Integer, number<&Row::ds1ChannelNumber>},
     {"dsx1Channelization", 20, Integer, number<&Row::channelization>},

@@ -19,6 +19,8 @@
 #include "agent/Front.h"
 #include "agent/InterfaceIndices.h"
 #include "agent/InterfaceReader.h"
+#include "agent/LineListener.h"
+#include "agent/LinkWatch.h"
 #include "agent/Log.h"
 #include "agent/ModuleLoader.h"
 #include "agent/Notifier.h"
@@ -46,11 +48,13 @@ struct Boards {
 
     ReferenceCounter<BoardManager> manager{new BoardManager};
     Counters counters;
+    Settings settings;
     BoardSource source{*manager.get()};
     NotificationQueue queue{counters};
     FaultLog faults;
     StatusListener listener;
     FaultListener faultListener;
+    LineListener lines{*manager.get(), settings, queue, counters};
 };
 
 /// Makes the first calls of the library's singletons, which belong to one thread, and asks the
@@ -94,24 +98,19 @@ void attachModules(std::vector<LoadedModule> const& modules, Boards& boards) {
         ServiceManager::GetInstance()->AddModule(module.name().c_str());
 }
 
-/// Has the listeners tell of changes for a scope.
+/// Has a listener tell of changes for a scope.
+template <class Listener>
 class ListeningScope {
   public:
-    ListeningScope(Boards& boards, std::function<void()> const& changed) : m_boards(boards) {
-        m_boards.listener.start(changed);
-        m_boards.faultListener.start(changed);
+    ListeningScope(Listener& listener, std::function<void()> changed) : m_listener(listener) {
+        m_listener.start(std::move(changed));
     }
-    ~ListeningScope() { stop(); }
+    ~ListeningScope() { m_listener.stop(); }
     ListeningScope(ListeningScope const&) = delete;
     ListeningScope& operator=(ListeningScope const&) = delete;
 
-    void stop() {
-        m_boards.listener.stop();
-        m_boards.faultListener.stop();
-    }
-
   private:
-    Boards& m_boards;
+    Listener& m_listener;
 };
 
 /// A folder for a scope.
@@ -182,6 +181,23 @@ void announceLast(Notifier& notifier, NotificationQueue& queue, Front& front) {
             "notifications that could not be sent before the stop: " + std::to_string(left));
 }
 
+/// Has the settings of former runs, and keeps those of this one in the same file.
+class KeptSettings {
+  public:
+    KeptSettings(Settings& settings, InterfaceIndices& file) : m_settings(settings), m_file(file) {
+        m_settings.load(m_file.settings());
+    }
+    ~KeptSettings() { save(); }
+    KeptSettings(KeptSettings const&) = delete;
+    KeptSettings& operator=(KeptSettings const&) = delete;
+
+    void save() { m_file.save(m_settings.takeUnsaved()); }
+
+  private:
+    Settings& m_settings;
+    InterfaceIndices& m_file;
+};
+
 void serve(Options const& options, ReadOptions const& readAgain, Front& front,
            Signals const& signals, Boards& boards) {
     Clock::time_point const started = boards.counters.started;
@@ -190,13 +206,17 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
     PlatformReader platform;
     std::optional<InterfaceIndices> indices;
+    std::optional<KeptSettings> keptSettings;
     std::optional<InterfaceReader> interfaces;
+    LinkWatch links(boards.settings, boards.queue);
     if (front.servesStandardObjects()) {
         indices.emplace(persistentDirectory() + "/ifindex.sqlite", options.interfaceBase);
+        keptSettings.emplace(boards.settings, *indices);
         interfaces.emplace(*boards.manager.get(), *indices, started);
     }
     Collector collector(
         [&](Snapshot& snapshot) {
+            if (keptSettings) keptSettings->save();
             snapshot.boards = boards.source.read();
             snapshot.modules = readModules(services);
             snapshot.services = readServices(services);
@@ -205,7 +225,14 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             snapshot.faults = boards.faults.read(started);
             snapshot.resources = readResources(*boards.manager.get(), snapshot.boards);
             snapshot.records = platform.read(snapshot.boards);
-            if (interfaces) snapshot.interfaces = interfaces->read(snapshot.boards);
+            if (interfaces) {
+                boards.lines.listen(snapshot.boards, interfaces->uptime());
+                snapshot.interfaces = interfaces->read(snapshot.boards);
+                std::vector<PlacedLine> const lines = interfaces->takeLines();
+                boards.lines.place(lines);
+                handOn(boards.settings, lines);
+                links.note(snapshot.interfaces.interfaces, snapshot.begun);
+            }
         },
         started, [&] { wakeup.wake(); });
     std::vector<Table const*> const allTables = tables();
@@ -216,10 +243,12 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     if (interfaces)
         served.push_back(
             {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}});
-    front.serve({std::move(served), boards.counters, [&] {
+    front.serve({std::move(served), boards.counters,
+                 [&] {
                      ++boards.counters.requests;
                      return collector.snapshot();
-                 }});
+                 },
+                 boards.settings});
     Notifier notifier(boards.queue, front.notifications());
     ServiceNotice notice;
     std::string const serving =
@@ -233,16 +262,22 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             notice.ready(serving);
         }
     });
-    front.beforeSleep(
-        [&] { return earliest(notifier.announce(collector.newest()->begun), notice.beat()); });
-    ListeningScope listening(boards, [&] { collector.renew(); });
+    front.beforeSleep([&] {
+        if (boards.settings.hasUnsaved()) collector.renew();
+        return earliest(notifier.announce(collector.newest()->begun), notice.beat());
+    });
+    ListeningScope const listening(boards.listener, [&] { collector.renew(); });
+    ListeningScope const listeningToLines(boards.lines, [&] { collector.renew(); });
+    ListeningScope const listeningToFaults(boards.faultListener, [&] { collector.renew(); });
     log(LogLevel::Info, serving);
     notice.ready(serving);
     front.run();
     signals.letStopThrough();
     notice.stopping();
     log(LogLevel::Info, "stopping");
-    listening.stop();
+    boards.listener.stop();
+    boards.lines.stop();
+    boards.faultListener.stop();
     announceLast(notifier, boards.queue, front);
 }
 

@@ -8,6 +8,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <functional>
+#include <optional>
 #include <span>
 
 #include "agent/Snapshot.h"
@@ -23,10 +24,18 @@ struct Scalar {
     Value (*get)(Facts const&);
 };
 
+/// What can be set in a column of integers.
+struct Writable {
+    Setting setting;
+    int lowest; ///< an enumeration without gaps is the range of its numbers
+    int highest;
+};
+
 struct ColumnHead {
     char const* name;
     std::uint32_t number; ///< in the table's entry
     ValueType type;
+    std::optional<Writable> writable = std::nullopt; ///< nothing: the column is read-only
 };
 
 /// A table: columns ascending by number, rows ascending by index.
@@ -54,6 +63,8 @@ struct Column {
     std::uint32_t number;
     ValueType type;
     Value (*get)(Row const&);
+    std::optional<Writable> writable =
+        std::nullopt; ///< then `get` says what counts until it is set
 };
 
 /// A table whose rows lie in a sorted vector of the snapshot; a row says its own `index()`.
@@ -69,7 +80,7 @@ class RowTable final : public Table {
     std::size_t columnCount() const override { return m_columns.size(); }
     ColumnHead column(std::size_t column) const override {
         Column<Row> const& described = m_columns[column];
-        return {described.name, described.number, described.type};
+        return {described.name, described.number, described.type, described.writable};
     }
     std::size_t rowCount(Facts const& facts) const override { return rows(facts).size(); }
     void appendIndex(Facts const& facts, std::size_t row, Oid& name) const override {
@@ -85,7 +96,12 @@ class RowTable final : public Table {
         return static_cast<std::size_t>(found - all.begin());
     }
     Value value(Facts const& facts, std::size_t column, std::size_t row) const override {
-        return m_columns[column].get(rows(facts)[row]);
+        Column<Row> const& described = m_columns[column];
+        Row const& asked = rows(facts)[row];
+        Value const value = described.get(asked);
+        if (!described.writable || facts.settings == nullptr || !isKnown(value)) return value;
+        auto const set = facts.settings->find({described.writable->setting, asked.index().front()});
+        return set ? Value{std::int64_t{*set}} : value;
     }
 
   private:

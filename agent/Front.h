@@ -26,6 +26,7 @@ struct Served {
     std::vector<ServedTree> trees; ///< the agent's own MIB module first
     Counters& counters;
     std::function<std::shared_ptr<Snapshot const>()> takeSnapshot;
+    Settings& settings;
 };
 
 /// Used on the thread that does all SNMP only.

@@ -7,8 +7,6 @@ namespace kvloamd {
 
 namespace {
 
-// TruthValue's and ifLinkUpDownTrapEnable's.
-constexpr std::int64_t kDisabled = 2;
 /// RowStatus's.
 constexpr std::int64_t kActive = 1;
 
@@ -34,9 +32,8 @@ Value highSpeed(InterfaceRow const& row) {
     return std::int64_t{*row.speed / 1'000'000 + (*row.speed % 1'000'000 >= 500'000 ? 1 : 0)};
 }
 
-/// Nothing is told of links that come and go.
-Value linkTrapEnable(InterfaceRow const& /*row*/) {
-    return kDisabled;
+Value linkUpDownTraps(InterfaceRow const& row) {
+    return std::int64_t{row.linkUpDownTraps};
 }
 
 Value discontinuity(InterfaceRow const& row) {
@@ -49,6 +46,9 @@ Value stackStatus(StackRow const& /*row*/) {
 
 using enum ValueType;
 using Row = InterfaceRow;
+
+/// Enabled or disabled.
+constexpr Writable kTraps{Setting::LinkUpDownTraps, 1, 2};
 
 constexpr Column<Row> kColumns[] = {
     {"ifIndex", 1, Integer, index},
@@ -77,7 +77,7 @@ constexpr Column<Row> kMoreColumns[] = {
     {"ifHCInUcastPkts", 7, Counter64, count64<kInUcastPkts>},
     {"ifHCOutOctets", 10, Counter64, count64<kOutOctets>},
     {"ifHCOutUcastPkts", 11, Counter64, count64<kOutUcastPkts>},
-    {"ifLinkUpDownTrapEnable", 14, Integer, linkTrapEnable},
+    {"ifLinkUpDownTrapEnable", 14, Integer, linkUpDownTraps, kTraps},
     {"ifHighSpeed", 15, Gauge, highSpeed},
     {"ifConnectorPresent", 17, Integer, number<&Row::connectorPresent>},
     {"ifAlias", 18, Text, text<&Row::alias>},

@@ -32,6 +32,12 @@ constexpr char kSchema[] =
     " PRIMARY KEY (serialNumber, kind, name)) WITHOUT ROWID;"
     "PRAGMA application_id = 1266043256;"
     "PRAGMA user_version = 1;";
+/// An addition that a program which does not know it leaves alone; so the version stays.
+constexpr char kAddedSchema[] = "CREATE TABLE IF NOT EXISTS setting ("
+                                " ifIndex INTEGER NOT NULL,"
+                                " setting INTEGER NOT NULL,"
+                                " value INTEGER NOT NULL,"
+                                " PRIMARY KEY (ifIndex, setting)) WITHOUT ROWID;";
 static_assert(kApplicationId == 1266043256 && kVersion == 1 && kLastIndex == 2147483647);
 
 /// The file can not be used now.
@@ -185,6 +191,7 @@ void IndexFile::open() {
         numberOf(database, "PRAGMA application_id") == 0)
         execute(database, kSchema);
     checkContents();
+    execute(database, kAddedSchema);
     readContents();
     transaction.commit();
 }
@@ -220,6 +227,12 @@ void IndexFile::readContents() {
             {entries.text(0),
              {static_cast<InterfaceKind>(entries.number(1)), entries.text(2)},
              static_cast<std::uint32_t>(entries.number(3))});
+    Statement settings(m_database.get(),
+                       "SELECT setting, ifIndex, value FROM setting ORDER BY setting, ifIndex");
+    while (settings.step())
+        m_records.settings.push_back({{static_cast<Setting>(settings.number(0)),
+                                       static_cast<std::uint32_t>(settings.number(1))},
+                                      static_cast<int>(settings.number(2))});
 }
 
 void IndexFile::add(IndexRecords const& records) {
@@ -239,6 +252,16 @@ void IndexFile::add(IndexRecords const& records) {
                 .bind(3, added.key.name)
                 .bind(4, added.ifIndex)
                 .run();
+        Statement set(m_database.get(),
+                      "INSERT OR REPLACE INTO setting (ifIndex, setting, value) VALUES (?, ?, ?)");
+        Statement forget(m_database.get(), "DELETE FROM setting WHERE ifIndex = ? AND setting = ?");
+        for (SettingEntry const& changed : records.settings) {
+            Statement& statement = changed.value ? set : forget;
+            statement.bind(1, changed.key.index)
+                .bind(2, static_cast<std::int64_t>(changed.key.setting));
+            if (changed.value) statement.bind(3, *changed.value);
+            statement.run();
+        }
         transaction.commit();
     } catch (std::runtime_error const& error) {
         giveUp(error.what());
@@ -254,14 +277,16 @@ void IndexFile::setAside(std::string const& why) {
     // Left behind, it would be taken for the new file's.
     std::filesystem::rename(m_path + "-journal", aside + "-journal", fault);
     log(LogLevel::Warning, m_path + ": the file of interface indices can not be read (" + why +
-                               "); it is kept as " + aside + ", and interfaces are numbered anew");
+                               "); it is kept as " + aside +
+                               ", interfaces are numbered anew, and what was set for them is lost");
 }
 
 void IndexFile::giveUp(std::string const& why) {
     m_database.reset();
     m_records = {};
-    log(LogLevel::Warning, m_path + ": interface indices are not kept across restarts: " + why +
-                               "; check --persistent-dir");
+    log(LogLevel::Warning,
+        m_path + ": interface indices and settings are not kept across restarts: " + why +
+            "; check --persistent-dir");
 }
 
 } // namespace kvloamd

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The file that remembers which interface has which ifIndex.
+// The file that remembers which interface has which ifIndex, and what is set for it.
 #pragma once
 
 #include <compare>
@@ -7,6 +7,8 @@
 #include <memory>
 #include <string>
 #include <vector>
+
+#include "agent/Settings.h"
 
 struct sqlite3;
 
@@ -47,6 +49,7 @@ struct IndexEntry {
 struct IndexRecords {
     std::vector<IndexBlock> blocks;
     std::vector<IndexEntry> entries;
+    std::vector<SettingEntry> settings;
 };
 
 /// No index is above this.
@@ -62,7 +65,8 @@ class IndexFile {
 
     /// What the file held when it was opened.
     IndexRecords const& records() const { return m_records; }
-    /// Adds all of `records` or, if that fails, nothing from now on.
+    /// Adds all of `records`, settings in the place of those of their keys; or, if that fails,
+    /// nothing from now on.
     void add(IndexRecords const& records);
 
   private:

@@ -70,6 +70,13 @@ void InterfaceIndices::save() {
     m_unsaved = {};
 }
 
+void InterfaceIndices::save(std::vector<SettingEntry> settings) {
+    if (settings.empty()) return;
+    IndexRecords changed;
+    changed.settings = std::move(settings);
+    m_file.add(changed);
+}
+
 void InterfaceIndices::makeRoom(std::string const& serialNumber, Board& board, std::size_t count) {
     std::uint64_t room = 0;
     for (Room const& block : board.rooms)

@@ -33,6 +33,11 @@ class InterfaceIndices {
     /// Writes what has been given since the last time to the file, in one piece.
     void save();
 
+    /// What the file held of settings, when it was opened.
+    std::vector<SettingEntry> const& settings() const { return m_file.records().settings; }
+    /// Writes changes of settings to the file.
+    void save(std::vector<SettingEntry> settings);
+
   private:
     /// What is free in a block: `next` to `end - 1`.
     struct Room {

@@ -10,7 +10,9 @@ namespace kvloamd {
 
 namespace {
 
-using Ticks = std::chrono::duration<std::int64_t, std::centi>;
+// ifLinkUpDownTrapEnable's.
+constexpr int kEnabled = 1;
+constexpr int kDisabled = 2;
 
 /// Moves rows over, with their numbers on the board made indices; rows without one are left out.
 template <class Row>
@@ -35,9 +37,12 @@ void completeStack(InterfaceRows& all) {
         higher.insert(row.higher);
         lower.insert(row.lower);
     }
-    for (InterfaceRow const& row : all.interfaces) {
+    for (InterfaceRow& row : all.interfaces) {
+        bool const stacked = higher.contains(row.ifIndex);
         if (!lower.contains(row.ifIndex)) all.stack.push_back({0, row.ifIndex});
-        if (!higher.contains(row.ifIndex)) all.stack.push_back({row.ifIndex, 0});
+        if (!stacked) all.stack.push_back({row.ifIndex, 0});
+        // One broken line is told of once, not once more for each of its channels.
+        row.linkUpDownTraps = stacked ? kDisabled : kEnabled;
     }
     std::ranges::sort(all.stack);
 }
@@ -46,17 +51,14 @@ void completeStack(InterfaceRows& all) {
 
 InterfaceReader::InterfaceReader(BoardManager& manager, InterfaceIndices& indices,
                                  Clock::time_point started)
-    : m_manager(manager),
-      m_indices(indices),
-      m_started(started),
-      m_startDate(std::chrono::duration_cast<std::chrono::milliseconds>(
-          std::chrono::system_clock::now().time_since_epoch() - (Clock::now() - started))) {}
+    : m_manager(manager), m_indices(indices), m_uptime(started) {}
 
 InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     InterfaceRows all;
+    m_lines.clear();
     for (auto& [index, counted] : m_counted)
         counted.present = false;
-    ToTicks const toTicks = [this](long seconds) { return ticksOf(seconds); };
+    ToTicks const toTicks = [this](long seconds) { return m_uptime.of(seconds); };
     std::set<std::string> serialNumbers;
     for (BoardRow const& row : boards) {
         auto const board = m_manager.GetBoardByIndex(static_cast<int>(row.boardIndex));
@@ -95,6 +97,9 @@ void InterfaceReader::append(InterfaceRows& all, BoardInterfaces&& board,
     moveRows(all.interfaces, board.rows.interfaces, indices);
     std::for_each(all.interfaces.begin() + begin, all.interfaces.end(),
                   [&](InterfaceRow& row) { countOn(row, boardIndex); });
+    for (std::size_t i = 0; i < board.lines.size(); ++i)
+        if (auto const index = indices[board.rows.lines[i].ifIndex - 1]; index != 0)
+            m_lines.push_back({index, std::move(board.lines[i])});
     moveRows(all.lines, board.rows.lines, indices);
     moveRows(all.bearers, board.rows.bearers, indices);
     moveRows(all.signalling, board.rows.signalling, indices);
@@ -109,7 +114,7 @@ void InterfaceReader::countOn(InterfaceRow& row, std::uint32_t boardIndex) {
     auto const [place, isNew] = m_counted.try_emplace(row.ifIndex);
     Counted& counted = place->second;
     if (isNew || counted.boardIndex != boardIndex)
-        counted = {boardIndex, m_read ? now() : 0, row.counters, true};
+        counted = {boardIndex, m_read ? m_uptime.now() : 0, row.counters, true};
     counted.present = true;
     for (std::size_t i = 0; i < row.counters.size(); ++i) {
         if (!row.counters[i]) continue;
@@ -122,6 +127,7 @@ void InterfaceReader::countOn(InterfaceRow& row, std::uint32_t boardIndex) {
         row.counters[i] = total;
     }
     row.discontinuity = counted.since;
+    row.boardIndex = boardIndex;
 }
 
 void InterfaceReader::noteChanges(InterfaceRows& all) {
@@ -129,23 +135,12 @@ void InterfaceReader::noteChanges(InterfaceRows& all) {
     indices.reserve(all.interfaces.size());
     for (InterfaceRow const& row : all.interfaces)
         indices.push_back(row.ifIndex);
-    if (m_read && indices != m_formerIndices) m_lastChange = now();
-    if (m_read && all.stack != m_formerStack) m_stackLastChange = now();
+    if (m_read && indices != m_formerIndices) m_lastChange = m_uptime.now();
+    if (m_read && all.stack != m_formerStack) m_stackLastChange = m_uptime.now();
     m_formerIndices = std::move(indices);
     m_formerStack = all.stack;
     all.lastChange = m_lastChange;
     all.stackLastChange = m_stackLastChange;
-}
-
-std::uint32_t InterfaceReader::now() const {
-    return static_cast<std::uint32_t>(
-        std::chrono::duration_cast<Ticks>(Clock::now() - m_started).count());
-}
-
-std::uint32_t InterfaceReader::ticksOf(long seconds) const {
-    auto const since = std::chrono::seconds(seconds) - m_startDate;
-    if (since <= std::chrono::milliseconds::zero()) return 0;
-    return static_cast<std::uint32_t>(std::chrono::duration_cast<Ticks>(since).count());
 }
 
 } // namespace kvloamd

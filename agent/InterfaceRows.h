@@ -28,6 +28,7 @@ enum InterfaceCounter : std::size_t {
 /// this one; what only its kind has is in another, of the same index.
 struct InterfaceRow {
     std::uint32_t ifIndex = 0;
+    std::uint32_t boardIndex = 0;
     std::string description;
     std::string name;
     std::string alias;
@@ -43,6 +44,9 @@ struct InterfaceRow {
     /// Since when the counters have counted on, as `lastChange`; 0: since the agent's start.
     std::uint32_t discontinuity = 0;
     std::optional<int> connectorPresent; ///< 1: yes, 2: no
+    /// Whether it is told when the link goes up or down, unless that has been set: 1 enabled, 2
+    /// disabled.
+    int linkUpDownTraps = 1;
 
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
 };

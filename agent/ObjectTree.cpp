@@ -31,11 +31,17 @@ std::vector<ObjectTree::Node>::const_iterator ObjectTree::nodeAbove(OidView name
         m_nodes, [&](Node const& node) { return std::is_lteq(compare(node.place, name)); });
 }
 
-Lookup ObjectTree::find(Facts const& facts, OidView name, Instance& found) const {
+ObjectTree::Node const* ObjectTree::nodeOf(OidView name) const {
     auto const above = nodeAbove(name);
-    if (above == m_nodes.begin()) return Lookup::NoSuchObject;
+    if (above == m_nodes.begin()) return nullptr;
     Node const& node = *std::prev(above);
-    if (!startsWith(name, node.place)) return Lookup::NoSuchObject;
+    return startsWith(name, node.place) ? &node : nullptr;
+}
+
+Lookup ObjectTree::find(Facts const& facts, OidView name, Instance& found) const {
+    Node const* const around = nodeOf(name);
+    if (around == nullptr) return Lookup::NoSuchObject;
+    Node const& node = *around;
     OidView const index = name.subspan(node.place.size());
     if (node.scalar != nullptr) {
         if (std::is_neq(compare(index, kScalarIndex))) return Lookup::NoSuchInstance;
@@ -61,6 +67,20 @@ bool ObjectTree::next(Facts const& facts, OidView name, bool orEqual, Instance& 
     for (; node != m_nodes.end(); ++node)
         if (firstIn(*node, facts, {}, true, found)) return true;
     return false;
+}
+
+SetFault ObjectTree::test(Facts const& facts, OidView name, std::optional<std::int64_t> integer,
+                          std::optional<Change>& change) const {
+    Node const* const node = nodeOf(name);
+    if (node == nullptr || node->table == nullptr) return SetFault::NotWritable;
+    auto const writable = node->table->column(node->column).writable;
+    if (!writable) return SetFault::NotWritable;
+    if (!integer) return SetFault::WrongType;
+    if (*integer < writable->lowest || *integer > writable->highest) return SetFault::WrongValue;
+    Instance present;
+    if (find(facts, name, present) != Lookup::Found) return SetFault::NoCreation;
+    change = {{writable->setting, name[node->place.size()]}, static_cast<int>(*integer)};
+    return SetFault::None;
 }
 
 bool ObjectTree::firstIn(Node const& node, Facts const& facts, OidView index, bool orEqual,

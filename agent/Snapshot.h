@@ -15,6 +15,7 @@
 #include "agent/ProcessRow.h"
 #include "agent/ResourceRows.h"
 #include "agent/ServiceRows.h"
+#include "agent/Settings.h"
 
 namespace kvloamd {
 
@@ -67,6 +68,7 @@ struct Counters {
 struct Facts {
     Snapshot const& snapshot;
     Counters const& counters;
+    Settings const* settings = nullptr; ///< come before what the snapshot says; null: none
 };
 
 } // namespace kvloamd

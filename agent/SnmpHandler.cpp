@@ -21,11 +21,39 @@ namespace {
 constexpr oid kHighest = std::numeric_limits<std::uint32_t>::max();
 
 constexpr char kSnapshotKey[] = "kvloam_snapshot";
+constexpr char kSetKey[] = "kvloam_set";
 
 using HeldSnapshot = std::shared_ptr<Snapshot const>;
 
 void freeSnapshot(void* held) {
     delete static_cast<HeldSnapshot*>(held);
+}
+
+/// What a variable of a SET is to change, and how it was.
+struct HeldChange {
+    Change change;
+    bool made = false; ///< not yet, when another variable can not be set after all
+    std::optional<int> former;
+};
+
+void freeChange(void* held) {
+    delete static_cast<HeldChange*>(held);
+}
+
+int errorOf(SetFault fault) {
+    switch (fault) {
+    case SetFault::None:
+        return SNMP_ERR_NOERROR;
+    case SetFault::NotWritable:
+        return SNMP_ERR_NOTWRITABLE;
+    case SetFault::WrongType:
+        return SNMP_ERR_WRONGTYPE;
+    case SetFault::WrongValue:
+        return SNMP_ERR_WRONGVALUE;
+    case SetFault::NoCreation:
+        return SNMP_ERR_NOCREATION;
+    }
+    return SNMP_ERR_GENERR;
 }
 
 } // namespace
@@ -48,12 +76,26 @@ struct SnmpHandler::Call {
     void get(netsnmp_request_info* request);
     void getNext(netsnmp_request_info* request);
     void getBulk(netsnmp_request_info* request);
+    /// Whether it can be set; the library asks that of all variables before any is.
+    void testSet(netsnmp_request_info* request);
+    static HeldChange* heldChange(netsnmp_request_info* request);
+    void commitSet(netsnmp_request_info* request);
+    /// Undoes the last first: one instance may be set twice.
+    void undoSets(netsnmp_request_info* requests);
 };
 
 int SnmpHandler::Call::answer(netsnmp_mib_handler* library, netsnmp_handler_registration* /*place*/,
                               netsnmp_agent_request_info* info, netsnmp_request_info* requests) {
     auto const& handler = *static_cast<SnmpHandler const*>(library->myvoid);
-    Call call{handler, {snapshotOf(handler, info), handler.m_counters}, info->asp->pdu, {}, {}};
+    Call call{handler,
+              {snapshotOf(handler, info), handler.m_counters, &handler.m_settings},
+              info->asp->pdu,
+              {},
+              {}};
+    if (info->mode == MODE_SET_UNDO) {
+        call.undoSets(requests);
+        return SNMP_ERR_NOERROR;
+    }
     for (netsnmp_request_info* request = requests; request != nullptr; request = request->next) {
         if (request->processed != 0) continue;
         switch (info->mode) {
@@ -66,8 +108,13 @@ int SnmpHandler::Call::answer(netsnmp_mib_handler* library, netsnmp_handler_regi
         case MODE_GETBULK:
             call.getBulk(request);
             break;
-        default:
-            netsnmp_request_set_error(request, SNMP_ERR_NOTWRITABLE);
+        case MODE_SET_RESERVE1:
+            call.testSet(request);
+            break;
+        case MODE_SET_ACTION:
+            call.commitSet(request);
+            break;
+        default: // the other steps of a SET need nothing
             break;
         }
     }
@@ -151,18 +198,55 @@ void SnmpHandler::Call::getBulk(netsnmp_request_info* request) {
     }
 }
 
+void SnmpHandler::Call::testSet(netsnmp_request_info* request) {
+    netsnmp_variable_list const& variable = *request->requestvb;
+    std::optional<std::int64_t> integer;
+    if (variable.type == ASN_INTEGER) integer = *variable.val.integer;
+    bool orEqual = false;
+    std::optional<Change> change;
+    SetFault const fault =
+        handler.m_tree.test(facts, relative(&variable, orEqual), integer, change);
+    if (fault != SetFault::None || !change) {
+        netsnmp_request_set_error(request, errorOf(fault));
+        return;
+    }
+    netsnmp_request_add_list_data(
+        request, netsnmp_create_data_list(kSetKey, new HeldChange{*change, false, {}}, freeChange));
+}
+
+HeldChange* SnmpHandler::Call::heldChange(netsnmp_request_info* request) {
+    return static_cast<HeldChange*>(netsnmp_request_get_list_data(request, kSetKey));
+}
+
+void SnmpHandler::Call::commitSet(netsnmp_request_info* request) {
+    HeldChange* const held = heldChange(request);
+    if (held == nullptr) return;
+    held->former = handler.m_settings.exchange(held->change.key, held->change.value);
+    held->made = true;
+}
+
+void SnmpHandler::Call::undoSets(netsnmp_request_info* requests) {
+    netsnmp_request_info* last = requests;
+    while (last->next != nullptr)
+        last = last->next;
+    for (netsnmp_request_info* request = last; request != nullptr; request = request->prev)
+        if (HeldChange const* const held = heldChange(request); held != nullptr && held->made)
+            handler.m_settings.exchange(held->change.key, held->former);
+}
+
 SnmpHandler::SnmpHandler(ObjectTree const& tree, Counters const& counters, Oid arc,
-                         TakeSnapshot takeSnapshot)
+                         TakeSnapshot takeSnapshot, Settings& settings)
     : m_tree(tree),
       m_counters(counters),
       m_arc(std::move(arc)),
-      m_takeSnapshot(std::move(takeSnapshot)) {}
+      m_takeSnapshot(std::move(takeSnapshot)),
+      m_settings(settings) {}
 
 bool SnmpHandler::serve(Oid const& place) {
     std::vector<oid> root(m_arc.begin(), m_arc.end());
     root.insert(root.end(), place.begin(), place.end());
     netsnmp_handler_registration* const registration = netsnmp_create_handler_registration(
-        "kvloam", &Call::answer, root.data(), root.size(), HANDLER_CAN_RONLY);
+        "kvloam", &Call::answer, root.data(), root.size(), HANDLER_CAN_RWRITE);
     if (registration == nullptr) return false;
     registration->handler->myvoid = this;
     return netsnmp_register_handler(registration) == MIB_REGISTERED_OK;

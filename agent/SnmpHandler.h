@@ -14,10 +14,10 @@ class SnmpHandler {
   public:
     using TakeSnapshot = std::function<std::shared_ptr<Snapshot const>()>;
 
-    /// `tree` and `counters` outlive the handler. `arc` is above all names
+    /// `tree`, `counters` and `settings` outlive the handler. `arc` is above all names
     /// of the tree.
     SnmpHandler(ObjectTree const& tree, Counters const& counters, Oid arc,
-                TakeSnapshot takeSnapshot);
+                TakeSnapshot takeSnapshot, Settings& settings);
     SnmpHandler(SnmpHandler const&) = delete;
     SnmpHandler& operator=(SnmpHandler const&) = delete;
 
@@ -33,6 +33,7 @@ class SnmpHandler {
     Counters const& m_counters;
     Oid m_arc;
     TakeSnapshot m_takeSnapshot;
+    Settings& m_settings;
 };
 
 } // namespace kvloamd

@@ -27,8 +27,8 @@ bool StandAlone::open() {
 
 void StandAlone::serve(Served served) {
     for (ServedTree const& each : served.trees) {
-        SnmpHandler& handler =
-            m_handlers.emplace_back(each.tree, served.counters, each.arc, served.takeSnapshot);
+        SnmpHandler& handler = m_handlers.emplace_back(each.tree, served.counters, each.arc,
+                                                       served.takeSnapshot, served.settings);
         for (Oid const& place : each.places)
             if (!handler.serve(place))
                 throw std::runtime_error("the SNMP library does not let the agent serve its "

@@ -7,6 +7,7 @@
 #include <fstream>
 
 #include <gmock/gmock.h>
+#include <sqlite3.h>
 
 #include "agent/InterfaceIndices.h"
 
@@ -70,6 +71,13 @@ class InterfaceIndicesTest : public ::testing::Test {
             if (std::string name = entry.path().filename(); name.find(".damaged-") != name.npos)
                 names.push_back(std::move(name));
         return names;
+    }
+    /// Changes the file as another program would.
+    void execute(char const* sql) const {
+        sqlite3* database = nullptr;
+        ASSERT_EQ(sqlite3_open(file().c_str(), &database), SQLITE_OK);
+        EXPECT_EQ(sqlite3_exec(database, sql, nullptr, nullptr, nullptr), SQLITE_OK) << sql;
+        sqlite3_close(database);
     }
     void write(std::string const& content) const {
         std::ofstream stream(file(), std::ios::binary);
@@ -257,6 +265,50 @@ TEST_F(InterfaceIndicesTest, MissingDirectoryIsMadeForItsOwnerOnly) {
     struct stat status {};
     ASSERT_EQ(stat(folder.c_str(), &status), 0);
     EXPECT_EQ(status.st_mode & 0777, 0700U);
+}
+
+constexpr SettingKey kFirst{Setting::LineStatusChangeTraps, 1000};
+constexpr SettingKey kSecond{Setting::LinkUpDownTraps, 1001};
+
+TEST_F(InterfaceIndicesTest, SettingsAreTheSameAfterARestart) {
+    {
+        auto indices = open();
+        EXPECT_THAT(indices.settings(), IsEmpty());
+        indices.save({{kFirst, 1}, {kSecond, 1}});
+        indices.save({{kSecond, 2}});
+    }
+    EXPECT_THAT(open().settings(), ElementsAre(SettingEntry{kFirst, 1}, SettingEntry{kSecond, 2}));
+}
+
+TEST_F(InterfaceIndicesTest, ForgottenSettingIsGoneAfterARestart) {
+    {
+        auto indices = open();
+        indices.save({{kFirst, 1}, {kSecond, 1}});
+        indices.save({{kFirst, std::nullopt}});
+    }
+    EXPECT_THAT(open().settings(), ElementsAre(SettingEntry{kSecond, 1}));
+}
+
+TEST_F(InterfaceIndicesTest, FileFromBeforeThereWereSettingsKeepsItsIndicesAndTakesSettings) {
+    {
+        auto indices = open();
+        ask(indices, "A", lines(3));
+    }
+    execute("DROP TABLE setting");
+    {
+        auto indices = open();
+        EXPECT_THAT(ask(indices, "A", lines(3)), ElementsAre(1000, 1001, 1002));
+        indices.save({{kFirst, 1}});
+    }
+    EXPECT_THAT(damagedFiles(), IsEmpty());
+    EXPECT_THAT(open().settings(), ElementsAre(SettingEntry{kFirst, 1}));
+}
+
+TEST_F(InterfaceIndicesTest, SettingsWithoutAFileAreNotKeptAndNothingIsSaid) {
+    LogCapture log;
+    InterfaceIndices indices("", 1000);
+    indices.save({{kFirst, 1}});
+    EXPECT_EQ(log.take(), "");
 }
 
 } // namespace

@@ -166,5 +166,90 @@ TEST_F(StandardTablesTest, CountThatALineDoesNotKnowHasNoInstance) {
     EXPECT_EQ(next(kLineCodeViolations), with(kLineCodeViolations, {10, 2}));
 }
 
+Oid const kLineTraps{10, 18, 6, 1, 17};
+Oid const kLinkTraps{31, 1, 1, 1, 14};
+
+/// Lines 10, 20, 30 and 40, of which all but 20 know whether they tell; interfaces 10 and 50, the
+/// latter stacked.
+class StandardSetTest : public StandardTablesTest {
+  protected:
+    StandardSetTest() {
+        for (LineRow& line : m_snapshot.interfaces.lines)
+            if (line.ifIndex != 20) line.statusChangeTrapEnable = 2;
+        m_snapshot.interfaces.interfaces.resize(2);
+        m_snapshot.interfaces.interfaces[0].ifIndex = 10;
+        m_snapshot.interfaces.interfaces[1].ifIndex = 50;
+        m_snapshot.interfaces.interfaces[1].linkUpDownTraps = 2;
+    }
+
+    SetFault test(Oid const& name, std::optional<std::int64_t> integer) {
+        return m_tree.test(m_withSettings, name, integer, m_change);
+    }
+    std::int64_t setNumberAt(Oid const& name) {
+        Instance found;
+        return m_tree.find(m_withSettings, name, found) == Lookup::Found
+                   ? std::get<std::int64_t>(found.value)
+                   : -1;
+    }
+
+    Settings m_settings;
+    Facts const m_withSettings{m_snapshot, m_counters, &m_settings};
+    std::optional<Change> m_change;
+};
+
+TEST_F(StandardSetTest, WritableColumnTakesItsValues) {
+    EXPECT_EQ(test(with(kLineTraps, {10}), 1), SetFault::None);
+    ASSERT_TRUE(m_change);
+    EXPECT_EQ(m_change->key, (SettingKey{Setting::LineStatusChangeTraps, 10}));
+    EXPECT_EQ(m_change->value, 1);
+    EXPECT_EQ(test(with(kLinkTraps, {50}), 2), SetFault::None);
+    EXPECT_EQ(m_change->key, (SettingKey{Setting::LinkUpDownTraps, 50}));
+}
+
+TEST_F(StandardSetTest, TestChangesNothing) {
+    test(with(kLineTraps, {10}), 1);
+    EXPECT_EQ(setNumberAt(with(kLineTraps, {10})), 2);
+}
+
+TEST_F(StandardSetTest, WhatIsSetShowsAtOnceAndInItsRowOnly) {
+    m_settings.exchange({Setting::LineStatusChangeTraps, 10}, 1);
+    EXPECT_EQ(setNumberAt(with(kLineTraps, {10})), 1);
+    EXPECT_EQ(setNumberAt(with(kLineTraps, {30})), 2);
+    EXPECT_EQ(setNumberAt(with(kLinkTraps, {10})), 1);
+}
+
+TEST_F(StandardSetTest, ValueThatIsNoIntegerIsOfTheWrongType) {
+    EXPECT_EQ(test(with(kLineTraps, {10}), std::nullopt), SetFault::WrongType);
+}
+
+TEST_F(StandardSetTest, NumbersBesideTheRangeAreWrongValues) {
+    for (std::int64_t const number : {0, 3, -1, 2147483647})
+        EXPECT_EQ(test(with(kLinkTraps, {10}), number), SetFault::WrongValue) << number;
+}
+
+TEST_F(StandardSetTest, RowThatIsNotThereIsNotMade) {
+    for (auto const& index : std::initializer_list<std::initializer_list<std::uint32_t>>{
+             {11}, {}, {10, 0}, {4294967295U}})
+        EXPECT_EQ(test(with(kLineTraps, index), 1), SetFault::NoCreation);
+}
+
+TEST_F(StandardSetTest, LineThatDoesNotKnowWhetherItTellsHasNothingToSet) {
+    EXPECT_EQ(test(with(kLineTraps, {20}), 1), SetFault::NoCreation);
+    m_settings.exchange({Setting::LineStatusChangeTraps, 20}, 1);
+    EXPECT_EQ(setNumberAt(with(kLineTraps, {20})), -1);
+}
+
+TEST_F(StandardSetTest, WhatIsWrongWithTheObjectIsToldBeforeWhatIsWrongWithTheValue) {
+    EXPECT_EQ(test(with(kLineTraps, {11}), std::nullopt), SetFault::WrongType);
+    EXPECT_EQ(test(with(kLineTraps, {11}), 7), SetFault::WrongValue);
+    EXPECT_EQ(test({10, 18, 6, 1, 10, 11}, std::nullopt), SetFault::NotWritable);
+}
+
+TEST_F(StandardSetTest, OtherObjectsAndUnknownOnesAreNotWritable) {
+    for (Oid const& name : {Oid{10, 18, 6, 1, 10, 10}, Oid{10, 18, 8, 1, 3, 10, 1}, Oid{2, 1, 0},
+                            Oid{10, 18, 6, 1, 99, 10}, Oid{10, 18, 6}, Oid{}, Oid{99}})
+        EXPECT_EQ(test(name, 1), SetFault::NotWritable);
+}
+
 } // namespace
 } // namespace kvloamd
