@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "agent/BoardRow.h"
+#include "agent/EntityRows.h"
 #include "agent/FaultRow.h"
 #include "agent/InterfaceRows.h"
 #include "agent/PlatformReader.h"
@@ -32,6 +33,7 @@ struct Snapshot {
     Faults faults;
     std::shared_ptr<PlatformRecords const> records = std::make_shared<PlatformRecords>(); ///< set
     InterfaceRows interfaces;
+    EntityRows entities;
     Clock::time_point begun;                  ///< when reading began: what happened before is in it
     std::uint32_t number = 1;                 ///< how many have been made, this one included
     std::chrono::milliseconds refreshTime{0}; ///< how long reading took
