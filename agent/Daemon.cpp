@@ -194,35 +194,31 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     ServiceManager& services = *ServiceManager::GetInstance();
     KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
     PlatformReader platform;
-    std::optional<InterfaceIndices> indices;
-    std::optional<KeptSettings> keptSettings;
-    std::optional<InterfaceReader> interfaces;
-    if (front.servesStandardObjects()) {
-        indices.emplace(persistentDirectory() + "/ifindex.sqlite", options.interfaceBase);
-        keptSettings.emplace(boards.settings, *indices);
-        interfaces.emplace(*boards.manager.get(), *indices, started);
-    }
+    InterfaceIndices indices(persistentDirectory(options) + "/ifindex.sqlite",
+                             options.interfaceBase);
+    KeptSettings keptSettings(boards.settings, indices);
+    InterfaceReader interfaces(*boards.manager.get(), indices, started);
     Collector collector(
         [&](Snapshot& snapshot) {
-            if (keptSettings) keptSettings->save();
+            keptSettings.save();
             snapshot.boards = boards.source.read();
             snapshot.modules = readModules(services);
             snapshot.services = readServices(services);
             snapshot.platformService = readPlatformService(services);
             snapshot.processes = readProcesses(statistics);
             snapshot.records = platform.read(snapshot.boards);
-            if (interfaces) snapshot.interfaces = interfaces->read(snapshot.boards);
+            snapshot.interfaces = interfaces.read(snapshot.boards);
         },
         started, [&] { wakeup.wake(); });
     std::vector<Table const*> const allTables = tables();
     ObjectTree const tree(scalars(), allTables);
     std::vector<Table const*> const allStandardTables = standardTables();
     ObjectTree const standardTree(standardScalars(), allStandardTables);
-    std::vector<ServedTree> served{{tree, options.enterprise, {kObjectsPlace}}};
-    if (interfaces)
-        served.push_back(
-            {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}});
-    front.serve({std::move(served), boards.counters, [&] { return collector.snapshot(); },
+    front.serve({{{tree, options.enterprise, {{kObjectsPlace, "KVL-OAM-MIB"}}},
+                  {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}}},
+                 boards.counters,
+                 [&] { return collector.snapshot(); },
+                 [&] { return collector.newest(); },
                  boards.settings});
     Notifier notifier(boards.queue, front.notifications());
     ServiceNotice notice;
