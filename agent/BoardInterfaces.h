@@ -8,14 +8,17 @@
 #include "agent/IndexFile.h"
 #include "agent/InterfaceRows.h"
 #include "board/Board.h"
+#include "board/DS1LineDevice.h"
+#include "core/ReferenceCounter.h"
 
 namespace kvloamd {
 
 /// The rows of one board. In the place of every ifIndex is the interface's number on the board,
 /// from 1 in the order of `keys`; the rows are in no order.
 struct BoardInterfaces {
-    std::vector<InterfaceKey> keys; ///< all different
+    std::vector<IndexKey> keys; ///< all different
     InterfaceRows rows;
+    std::vector<ReferenceCounter<DS1LineDevice>> lines; ///< as `rows.lines`
 };
 
 /// Seconds since the epoch as hundredths of a second since the agent's start.

@@ -15,9 +15,12 @@
 #include "access/ExternalFaultEventAdaptor.h"
 #include "agent/BoardSource.h"
 #include "agent/Collector.h"
+#include "agent/EntityNotices.h"
+#include "agent/EntityReader.h"
 #include "agent/Front.h"
-#include "agent/InterfaceIndices.h"
 #include "agent/InterfaceReader.h"
+#include "agent/LineListener.h"
+#include "agent/LinkWatch.h"
 #include "agent/Log.h"
 #include "agent/ModuleLoader.h"
 #include "agent/Notifier.h"
@@ -26,6 +29,7 @@
 #include "agent/ServiceNotice.h"
 #include "agent/Signals.h"
 #include "agent/SnmpConfig.h"
+#include "agent/StableIndices.h"
 #include "agent/StandardObjects.h"
 #include "agent/StatusListener.h"
 #include "agent/Wakeup.h"
@@ -36,6 +40,9 @@ namespace {
 
 /// How long a stop may be held up by notifications that a master does not take.
 constexpr std::chrono::seconds kLastWords{1};
+
+/// The lowest entPhysicalIndex, which is the chassis's.
+constexpr std::uint32_t kFirstEntity = 1;
 
 /// What the library's threads may reach until the process ends. Never destroyed.
 struct Boards {
@@ -48,6 +55,7 @@ struct Boards {
     BoardSource source{*manager.get()};
     NotificationQueue queue{counters};
     StatusListener listener;
+    LineListener lines{*manager.get(), settings, queue, counters};
 };
 
 /// Makes the first calls of the library's singletons, which belong to one thread, and asks the
@@ -89,10 +97,11 @@ void attachModules(std::vector<LoadedModule> const& modules, Boards& boards) {
         ServiceManager::GetInstance()->AddModule(module.name().c_str());
 }
 
-/// Has the listener tell of changes for a scope.
+/// Has a listener tell of changes for a scope.
+template <class Listener>
 class ListeningScope {
   public:
-    ListeningScope(StatusListener& listener, std::function<void()> changed) : m_listener(listener) {
+    ListeningScope(Listener& listener, std::function<void()> changed) : m_listener(listener) {
         m_listener.start(std::move(changed));
     }
     ~ListeningScope() { m_listener.stop(); }
@@ -100,7 +109,7 @@ class ListeningScope {
     ListeningScope& operator=(ListeningScope const&) = delete;
 
   private:
-    StatusListener& m_listener;
+    Listener& m_listener;
 };
 
 /// A folder for a scope.
@@ -174,7 +183,7 @@ void announceLast(Notifier& notifier, NotificationQueue& queue, Front& front) {
 /// Has the settings of former runs, and keeps those of this one in the same file.
 class KeptSettings {
   public:
-    KeptSettings(Settings& settings, InterfaceIndices& file) : m_settings(settings), m_file(file) {
+    KeptSettings(Settings& settings, StableIndices& file) : m_settings(settings), m_file(file) {
         m_settings.load(m_file.settings());
     }
     ~KeptSettings() { save(); }
@@ -185,7 +194,7 @@ class KeptSettings {
 
   private:
     Settings& m_settings;
-    InterfaceIndices& m_file;
+    StableIndices& m_file;
 };
 
 void serve(Options const& options, ReadOptions const& readAgain, Front& front,
@@ -194,10 +203,13 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     ServiceManager& services = *ServiceManager::GetInstance();
     KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
     PlatformReader platform;
-    InterfaceIndices indices(persistentDirectory(options) + "/ifindex.sqlite",
-                             options.interfaceBase);
+    std::string const directory = persistentDirectory(options);
+    StableIndices indices(directory + "/ifindex.sqlite", options.interfaceBase, "interfaces");
     KeptSettings keptSettings(boards.settings, indices);
     InterfaceReader interfaces(*boards.manager.get(), indices, started);
+    StableIndices entityIndices(directory + "/entity.sqlite", kFirstEntity, "physical entities");
+    EntityReader entities(entityIndices, started, [] { return std::time(nullptr); });
+    LinkWatch links(boards.settings, boards.queue);
     Collector collector(
         [&](Snapshot& snapshot) {
             keptSettings.save();
@@ -207,7 +219,13 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             snapshot.platformService = readPlatformService(services);
             snapshot.processes = readProcesses(statistics);
             snapshot.records = platform.read(snapshot.boards);
+            boards.lines.listen(snapshot.boards, interfaces.uptime());
             snapshot.interfaces = interfaces.read(snapshot.boards);
+            std::vector<PlacedLine> const lines = interfaces.takeLines();
+            boards.lines.place(lines);
+            handOn(boards.settings, lines);
+            links.note(snapshot.interfaces.interfaces, snapshot.begun);
+            snapshot.entities = entities.read(snapshot);
         },
         started, [&] { wakeup.wake(); });
     std::vector<Table const*> const allTables = tables();
@@ -221,6 +239,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
                  [&] { return collector.newest(); },
                  boards.settings});
     Notifier notifier(boards.queue, front.notifications());
+    EntityNotices entityNotices(boards.queue);
     ServiceNotice notice;
     std::string const serving =
         "serving " + std::to_string(collector.newest()->boards.size()) + " boards " + front.place();
@@ -235,9 +254,12 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     });
     front.beforeSleep([&] {
         if (boards.settings.hasUnsaved()) collector.renew();
-        return earliest(notifier.announce(collector.newest()->begun), notice.beat());
+        auto const entityNews = entityNotices.tell(collector.newest(), Clock::now());
+        return earliest(entityNews,
+                        earliest(notifier.announce(collector.newest()->begun), notice.beat()));
     });
     ListeningScope const listening(boards.listener, [&] { collector.renew(); });
+    ListeningScope const listeningToLines(boards.lines, [&] { collector.renew(); });
     log(LogLevel::Info, serving);
     notice.ready(serving);
     front.run();
@@ -245,6 +267,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     notice.stopping();
     log(LogLevel::Info, "stopping");
     boards.listener.stop();
+    boards.lines.stop();
     announceLast(notifier, boards.queue, front);
 }
 

@@ -14,8 +14,6 @@ namespace {
 constexpr int kEnabled = 1;
 constexpr int kDisabled = 2;
 
-using Ticks = std::chrono::duration<std::int64_t, std::centi>;
-
 /// Moves rows over, with their numbers on the board made indices; rows without one are left out.
 template <class Row>
 void moveRows(std::vector<Row>& all, std::vector<Row>& rows,
@@ -51,32 +49,25 @@ void completeStack(InterfaceRows& all) {
 
 } // namespace
 
-InterfaceReader::InterfaceReader(BoardManager& manager, InterfaceIndices& indices,
+InterfaceReader::InterfaceReader(BoardManager& manager, StableIndices& indices,
                                  Clock::time_point started)
-    : m_manager(manager),
-      m_indices(indices),
-      m_started(started),
-      m_startDate(std::chrono::duration_cast<std::chrono::milliseconds>(
-          std::chrono::system_clock::now().time_since_epoch() - (Clock::now() - started))) {}
+    : m_manager(manager), m_indices(indices), m_uptime(started) {}
 
 InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     InterfaceRows all;
+    m_lines.clear();
     for (auto& [index, counted] : m_counted)
         counted.present = false;
-    ToTicks const toTicks = [this](long seconds) { return ticksOf(seconds); };
-    std::set<std::string> serialNumbers;
-    for (BoardRow const& row : boards) {
-        auto const board = m_manager.GetBoardByIndex(static_cast<int>(row.boardIndex));
+    ToTicks const toTicks = [this](long seconds) { return m_uptime.of(seconds); };
+    std::vector<std::string> const names = keptNames(boards);
+    for (std::size_t i = 0; i < boards.size(); ++i) {
+        std::uint32_t const boardIndex = boards[i].boardIndex;
+        auto const board = m_manager.GetBoardByIndex(static_cast<int>(boardIndex));
         Board* const asked = board.get();
         if (asked == nullptr) continue;
-        std::string serialNumber = row.serialNumber == "unknown" ? "" : row.serialNumber;
-        // Boards that nothing else tells apart are told apart by their indices.
-        if (serialNumber.empty() || serialNumbers.contains(serialNumber))
-            serialNumber += "@" + std::to_string(row.boardIndex);
-        serialNumbers.insert(serialNumber);
         BoardInterfaces found = readInterfaces(*asked, toTicks);
-        auto const indices = m_indices.indicesOf(serialNumber, found.keys);
-        append(all, std::move(found), indices, row.boardIndex);
+        auto const indices = m_indices.indicesOf(names[i], found.keys);
+        append(all, std::move(found), indices, boardIndex);
     }
     m_indices.save();
     std::erase_if(m_counted, [](auto const& entry) { return !entry.second.present; });
@@ -85,6 +76,7 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     sortByIndex(all.bearers);
     sortByIndex(all.signalling);
     sortByIndex(all.ethernets);
+    sortByIndex(all.ports);
     completeStack(all);
     std::size_t before = 0;
     for (LineRow& line : all.lines) {
@@ -102,10 +94,16 @@ void InterfaceReader::append(InterfaceRows& all, BoardInterfaces&& board,
     moveRows(all.interfaces, board.rows.interfaces, indices);
     std::for_each(all.interfaces.begin() + begin, all.interfaces.end(),
                   [&](InterfaceRow& row) { countOn(row, boardIndex); });
+    for (std::size_t i = 0; i < board.lines.size(); ++i)
+        if (auto const index = indices[board.rows.lines[i].ifIndex - 1]; index != 0)
+            m_lines.push_back({index, std::move(board.lines[i])});
     moveRows(all.lines, board.rows.lines, indices);
     moveRows(all.bearers, board.rows.bearers, indices);
     moveRows(all.signalling, board.rows.signalling, indices);
     moveRows(all.ethernets, board.rows.ethernets, indices);
+    for (PortRow& port : board.rows.ports)
+        port.boardIndex = boardIndex;
+    moveRows(all.ports, board.rows.ports, indices);
     for (StackRow const& row : board.rows.stack) {
         StackRow const placed{indices[row.higher - 1], indices[row.lower - 1]};
         if (placed.higher != 0 && placed.lower != 0) all.stack.push_back(placed);
@@ -116,7 +114,7 @@ void InterfaceReader::countOn(InterfaceRow& row, std::uint32_t boardIndex) {
     auto const [place, isNew] = m_counted.try_emplace(row.ifIndex);
     Counted& counted = place->second;
     if (isNew || counted.boardIndex != boardIndex)
-        counted = {boardIndex, m_read ? now() : 0, row.counters, true};
+        counted = {boardIndex, m_read ? m_uptime.now() : 0, row.counters, true};
     counted.present = true;
     for (std::size_t i = 0; i < row.counters.size(); ++i) {
         if (!row.counters[i]) continue;
@@ -129,6 +127,7 @@ void InterfaceReader::countOn(InterfaceRow& row, std::uint32_t boardIndex) {
         row.counters[i] = total;
     }
     row.discontinuity = counted.since;
+    row.boardIndex = boardIndex;
 }
 
 void InterfaceReader::noteChanges(InterfaceRows& all) {
@@ -136,23 +135,12 @@ void InterfaceReader::noteChanges(InterfaceRows& all) {
     indices.reserve(all.interfaces.size());
     for (InterfaceRow const& row : all.interfaces)
         indices.push_back(row.ifIndex);
-    if (m_read && indices != m_formerIndices) m_lastChange = now();
-    if (m_read && all.stack != m_formerStack) m_stackLastChange = now();
+    if (m_read && indices != m_formerIndices) m_lastChange = m_uptime.now();
+    if (m_read && all.stack != m_formerStack) m_stackLastChange = m_uptime.now();
     m_formerIndices = std::move(indices);
     m_formerStack = all.stack;
     all.lastChange = m_lastChange;
     all.stackLastChange = m_stackLastChange;
-}
-
-std::uint32_t InterfaceReader::now() const {
-    return static_cast<std::uint32_t>(
-        std::chrono::duration_cast<Ticks>(Clock::now() - m_started).count());
-}
-
-std::uint32_t InterfaceReader::ticksOf(long seconds) const {
-    auto const since = std::chrono::seconds(seconds) - m_startDate;
-    if (since <= std::chrono::milliseconds::zero()) return 0;
-    return static_cast<std::uint32_t>(std::chrono::duration_cast<Ticks>(since).count());
 }
 
 } // namespace kvloamd

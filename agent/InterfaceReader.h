@@ -2,16 +2,18 @@
 // Reads all boards' lines, channels and interfaces.
 #pragma once
 
-#include <chrono>
 #include <cstdint>
 #include <map>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "agent/BoardInterfaces.h"
 #include "agent/BoardRow.h"
-#include "agent/InterfaceIndices.h"
 #include "agent/InterfaceRows.h"
+#include "agent/PlacedLine.h"
+#include "agent/StableIndices.h"
+#include "agent/Uptime.h"
 #include "board/BoardManager.h"
 
 namespace kvloamd {
@@ -23,13 +25,17 @@ namespace kvloamd {
 /// board counts anew from 0, can not be told.
 class InterfaceReader {
   public:
-    using Clock = std::chrono::steady_clock;
+    using Clock = Uptime::Clock;
 
     /// `manager` and `indices` outlive the reader. `started`: the agent's start.
-    InterfaceReader(BoardManager& manager, InterfaceIndices& indices, Clock::time_point started);
+    InterfaceReader(BoardManager& manager, StableIndices& indices, Clock::time_point started);
 
     /// The rows of `boards`, which are ascending by index.
     InterfaceRows read(std::vector<BoardRow> const& boards);
+    /// The lines of the last reading.
+    std::vector<PlacedLine> takeLines() { return std::exchange(m_lines, {}); }
+
+    Uptime const& uptime() const { return m_uptime; }
 
   private:
     using Counters = decltype(InterfaceRow::counters);
@@ -46,13 +52,11 @@ class InterfaceReader {
                 std::vector<std::uint32_t> const& indices, std::uint32_t boardIndex);
     void countOn(InterfaceRow& row, std::uint32_t boardIndex);
     void noteChanges(InterfaceRows& all);
-    std::uint32_t now() const;
-    std::uint32_t ticksOf(long seconds) const;
 
     BoardManager& m_manager;
-    InterfaceIndices& m_indices;
-    Clock::time_point m_started;
-    std::chrono::milliseconds m_startDate; ///< the start, since the epoch
+    StableIndices& m_indices;
+    Uptime const m_uptime;
+    std::vector<PlacedLine> m_lines;
     std::map<std::uint32_t, Counted> m_counted;
     bool m_read = false;
     std::vector<std::uint32_t> m_formerIndices;

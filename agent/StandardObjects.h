@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The objects of the standard MIB modules that tell of lines, channels and interfaces.
+// The objects of the standard MIB modules: lines, channels, interfaces and physical entities.
 #pragma once
 
 #include <array>
@@ -14,7 +14,7 @@ namespace kvloamd {
 inline Oid const kStandardArc{1, 3, 6, 1, 2, 1};
 
 /// The places that the agent takes over, relative, and no others below the arc.
-inline std::array<Place, 9> const kStandardPlaces{{
+inline std::array<Place, 11> const kStandardPlaces{{
     {{2, 1}, "ifNumber", HostHas::All},
     {{2, 2}, "ifTable", HostHas::Rows},
     {{10, 7, 2}, "dot3StatsTable", HostHas::Rows},
@@ -24,6 +24,8 @@ inline std::array<Place, 9> const kStandardPlaces{{
     {{31, 1, 2}, "ifStackTable"},
     {{31, 1, 5}, "ifTableLastChange", HostHas::All},
     {{31, 1, 6}, "ifStackLastChange"},
+    {{47, 1}, "ENTITY-MIB"},
+    {{131, 1}, "ENTITY-STATE-MIB"},
 }};
 
 std::span<Scalar const> standardScalars();
@@ -39,6 +41,10 @@ Table const& isdnBearerTable();
 Table const& isdnSignalingTable();
 Table const& isdnLapdTable();
 Table const& dot3StatsTable();
+Table const& entPhysicalTable();
+Table const& entAliasMappingTable();
+Table const& entPhysicalContainsTable();
+Table const& entStateTable();
 
 /// Every table.
 std::vector<Table const*> standardTables();

@@ -48,6 +48,8 @@ class FakeLine final : public DS1LineDevice {
         : m_name(std::move(name)), m_circuit(std::move(circuit)) {}
 
     int lineStatus = KVL::kNotSupported;
+    long statusLastChange = KVL::kNotSupported;
+    int trapEnable = KVL::kNotSupported;
     ReferenceCounter<DS1IntervalTable> history;
 
     int GetDescription(std::string& description) override {
@@ -86,9 +88,12 @@ class FakeLine final : public DS1LineDevice {
     int GetTransmitClockSource() override { return KVL::kNotSupported; }
     int GetFdl() override { return KVL::kNotSupported; }
     int GetLineLength() override { return KVL::kNotSupported; }
-    long GetLineStatusLastChange() override { return KVL::kNotSupported; }
-    int GetLineStatusChangeTrapEnable() override { return KVL::kNotSupported; }
-    int SetLineStatusChangeTrapEnable(int /*enable*/) override { return KVL::kNotSupported; }
+    long GetLineStatusLastChange() override { return statusLastChange; }
+    int GetLineStatusChangeTrapEnable() override { return trapEnable; }
+    int SetLineStatusChangeTrapEnable(int enable) override {
+        trapEnable = enable;
+        return 0;
+    }
     int GetLoopbackStatus() override { return KVL::kNotSupported; }
     int GetDs1ChannelNumber() override { return KVL::kNotSupported; }
     int GetChannelization() override { return KVL::kNotSupported; }
@@ -112,6 +117,19 @@ class FakeLineFeature final : public DS1LineFeatureZ7 {
             m_lines.emplace_back(line);
     }
     int GetNumberOfLines() override { return static_cast<int>(m_lines.size()); }
+    int NotifyLineStatusListeners(ReferenceCounter<DS1LineDevice> line,
+                                  DS1LineStatusEnum status) override {
+        ReferenceCounter<DS1LineStatusEvent> const event(
+            new DS1LineStatusEvent(status, std::move(line)));
+        for_each_listener<DS1LineStatusListener>(
+            m_listeners, this, [&](auto* listener) { listener->ProcessLineStatusEvent(event); });
+        return 0;
+    }
+    int listenerCount() {
+        int count = 0;
+        for_each_listener<DS1LineStatusListener>(m_listeners, this, [&](auto*) { ++count; });
+        return count;
+    }
 };
 
 class FakeBChannel final : public ISDNBChannelZ7 {
