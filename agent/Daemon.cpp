@@ -217,24 +217,16 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     ServiceManager& services = *ServiceManager::GetInstance();
     KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
     PlatformReader platform;
-    std::optional<StableIndices> indices;
-    std::optional<KeptSettings> keptSettings;
-    std::optional<InterfaceReader> interfaces;
-    std::optional<StableIndices> entityIndices;
-    std::optional<EntityReader> entities;
+    std::string const directory = persistentDirectory(options);
+    StableIndices indices(directory + "/ifindex.sqlite", options.interfaceBase, "interfaces");
+    KeptSettings keptSettings(boards.settings, indices);
+    InterfaceReader interfaces(*boards.manager.get(), indices, started);
+    StableIndices entityIndices(directory + "/entity.sqlite", kFirstEntity, "physical entities");
+    EntityReader entities(entityIndices, started, [] { return std::time(nullptr); });
     LinkWatch links(boards.settings, boards.queue);
-    if (front.servesStandardObjects()) {
-        indices.emplace(persistentDirectory() + "/ifindex.sqlite", options.interfaceBase,
-                        "interfaces");
-        keptSettings.emplace(boards.settings, *indices);
-        interfaces.emplace(*boards.manager.get(), *indices, started);
-        entityIndices.emplace(persistentDirectory() + "/entity.sqlite", kFirstEntity,
-                              "physical entities");
-        entities.emplace(*entityIndices, started, [] { return std::time(nullptr); });
-    }
     Collector collector(
         [&](Snapshot& snapshot) {
-            if (keptSettings) keptSettings->save();
+            keptSettings.save();
             snapshot.boards = boards.source.read();
             snapshot.modules = readModules(services);
             snapshot.services = readServices(services);
@@ -243,30 +235,27 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             snapshot.faults = boards.faults.read(started);
             snapshot.resources = readResources(*boards.manager.get(), snapshot.boards);
             snapshot.records = platform.read(snapshot.boards);
-            if (interfaces) {
-                boards.lines.listen(snapshot.boards, interfaces->uptime());
-                snapshot.interfaces = interfaces->read(snapshot.boards);
-                std::vector<PlacedLine> const lines = interfaces->takeLines();
-                boards.lines.place(lines);
-                handOn(boards.settings, lines);
-                links.note(snapshot.interfaces.interfaces, snapshot.begun);
-            }
-            if (entities) snapshot.entities = entities->read(snapshot);
+            boards.lines.listen(snapshot.boards, interfaces.uptime());
+            snapshot.interfaces = interfaces.read(snapshot.boards);
+            std::vector<PlacedLine> const lines = interfaces.takeLines();
+            boards.lines.place(lines);
+            handOn(boards.settings, lines);
+            links.note(snapshot.interfaces.interfaces, snapshot.begun);
+            snapshot.entities = entities.read(snapshot);
         },
         started, [&] { wakeup.wake(); });
     std::vector<Table const*> const allTables = tables();
     ObjectTree const tree(scalars(), allTables);
     std::vector<Table const*> const allStandardTables = standardTables();
     ObjectTree const standardTree(standardScalars(), allStandardTables);
-    std::vector<ServedTree> served{{tree, options.enterprise, {kObjectsPlace}}};
-    if (interfaces)
-        served.push_back(
-            {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}});
-    front.serve({std::move(served), boards.counters,
+    front.serve({{{tree, options.enterprise, {{kObjectsPlace, "KVL-OAM-MIB"}}},
+                  {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}}},
+                 boards.counters,
                  [&] {
                      ++boards.counters.requests;
                      return collector.snapshot();
                  },
+                 [&] { return collector.newest(); },
                  boards.settings});
     Notifier notifier(boards.queue, front.notifications());
     EntityNotices entityNotices(boards.queue);

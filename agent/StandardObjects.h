@@ -6,7 +6,7 @@
 #include <span>
 #include <vector>
 
-#include "agent/Description.h"
+#include "agent/ServedTree.h"
 
 namespace kvloamd {
 
@@ -14,14 +14,18 @@ namespace kvloamd {
 inline Oid const kStandardArc{1, 3, 6, 1, 2, 1};
 
 /// The places that the agent takes over, relative, and no others below the arc.
-inline std::array<Oid, 7> const kStandardPlaces{{
-    {2},        // interfaces of IF-MIB
-    {10, 7, 2}, // EtherLike-MIB
-    {10, 18},   // DS1-MIB
-    {10, 20},   // ISDN-MIB
-    {31, 1},    // the rest of IF-MIB
-    {47, 1},    // ENTITY-MIB
-    {131, 1},   // ENTITY-STATE-MIB
+inline std::array<Place, 11> const kStandardPlaces{{
+    {{2, 1}, "ifNumber", HostHas::All},
+    {{2, 2}, "ifTable", HostHas::Rows},
+    {{10, 7, 2}, "dot3StatsTable", HostHas::Rows},
+    {{10, 18}, "DS1-MIB"},
+    {{10, 20}, "ISDN-MIB"},
+    {{31, 1, 1}, "ifXTable", HostHas::Rows},
+    {{31, 1, 2}, "ifStackTable"},
+    {{31, 1, 5}, "ifTableLastChange", HostHas::All},
+    {{31, 1, 6}, "ifStackLastChange"},
+    {{47, 1}, "ENTITY-MIB"},
+    {{131, 1}, "ENTITY-STATE-MIB"},
 }};
 
 std::span<Scalar const> standardScalars();

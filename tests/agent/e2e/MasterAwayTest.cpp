@@ -49,6 +49,24 @@ TEST_F(MasterAwayTest, NotificationGoesThroughTheMaster) {
     EXPECT_EQ(count(trapReceiver().output(), "kvlBoardStatusChange"), 1);
 }
 
+TEST_F(MasterAwayTest, LineThatIsCutIsToldThroughTheMaster) {
+    startTrapReceiver("authCommunity log public\n");
+    configureMaster("rwcommunity private 127.0.0.1\ntrap2sink " + trapAddress() + " public\n");
+    startMaster();
+    startSubagent();
+    ASSERT_TRUE(isConnected()) << agent().output();
+    Result const set = snmp("snmpset", {"-v2c", "-c", "private", "-t", "30", address(),
+                                        "1.3.6.1.2.1.10.18.6.1.17.1000", "i", "1"});
+    ASSERT_EQ(set.status, 0) << set.output;
+    sim({"line", "alarm", "101", "los"});
+    EXPECT_TRUE(trapReceiver().waitFor("1.1.4.1.0 = SNMPv2-SMI::mib-2.10.18.15.0.1\tSNMPv2-SMI::"
+                                       "mib-2.10.18.6.1.10.1000 = 68\t"))
+        << trapReceiver().output();
+    EXPECT_TRUE(trapReceiver().waitFor("1.1.4.1.0 = SNMPv2-SMI::snmpModules.1.1.5.3\tSNMPv2-SMI::"
+                                       "mib-2.2.2.1.1.1000 = 1000\t"))
+        << trapReceiver().output();
+}
+
 TEST_F(MasterAwayTest, TableShowsTheChangeWhenItsNotificationArrives) {
     start();
     sim({"stop", "1"});
