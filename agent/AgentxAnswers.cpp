@@ -1,9 +1,8 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/AgentxAnswers.h"
 
-#include <limits>
+#include <algorithm>
 #include <utility>
-#include <vector>
 
 namespace kvloamd {
 
@@ -14,16 +13,18 @@ constexpr std::size_t kLongAnswer = 32 * 1024;
 
 } // namespace
 
-AgentxAnswers::AgentxAnswers(ObjectTree const& tree, Counters const& counters, Oid enterprise,
-                             TakeSnapshot takeSnapshot)
-    : m_tree(tree),
-      m_counters(counters),
-      m_enterprise(std::move(enterprise)),
-      m_takeSnapshot(std::move(takeSnapshot)) {}
+AgentxAnswers::AgentxAnswers(std::vector<ServedTree> const& trees, Counters const& counters,
+                             TakeSnapshot takeSnapshot, Settings& settings)
+    : m_counters(counters), m_takeSnapshot(std::move(takeSnapshot)), m_settings(settings) {
+    for (ServedTree const& served : trees)
+        m_trees.push_back({served.arc, &served.tree});
+    std::ranges::sort(m_trees, {}, &Tree::arc);
+}
 
-std::string AgentxAnswers::answer(AgentxHeader const& header, std::string_view payload) const {
+std::string AgentxAnswers::answer(AgentxHeader const& header, std::string_view payload) {
     // All names are registered without a context.
-    if (header.hasContext) return agentxResponse(header, AgentxFault::UnsupportedContext);
+    if (header.hasContext && header.kind != AgentxKind::CleanupSet)
+        return agentxResponse(header, AgentxFault::UnsupportedContext);
     AgentxReader const reader(payload, header.networkOrder);
     switch (header.kind) {
     case AgentxKind::Get:
@@ -33,13 +34,10 @@ std::string AgentxAnswers::answer(AgentxHeader const& header, std::string_view p
     case AgentxKind::GetBulk:
         return getBulk(header, reader);
     case AgentxKind::TestSet:
-        return agentxResponse(header, AgentxFault::NotWritable, 1);
     case AgentxKind::CommitSet:
-        return agentxResponse(header, AgentxFault::CommitFailed, 1);
     case AgentxKind::UndoSet:
-        return agentxResponse(header, AgentxFault::UndoFailed, 1);
     case AgentxKind::CleanupSet:
-        return {};
+        return set(header, reader);
     default:
         return agentxResponse(header, AgentxFault::RequestDenied);
     }
@@ -50,27 +48,53 @@ AgentxAnswers::Range AgentxAnswers::readRange(AgentxReader& reader) {
     return {std::move(start), reader.name().name};
 }
 
-/// The part of a name below the enterprise arc. A name outside of the arc reads as one before or
-/// after all of ours.
-Oid AgentxAnswers::relative(OidView name, bool& orEqual) const {
-    if (startsWith(name, m_enterprise)) {
-        OidView const rest = name.subspan(m_enterprise.size());
-        return {rest.begin(), rest.end()};
+ObjectTree const* AgentxAnswers::treeOf(OidView& name) const {
+    for (Tree const& each : m_trees) {
+        if (!startsWith(name, each.arc)) continue;
+        name = name.subspan(each.arc.size());
+        return each.tree;
     }
-    orEqual = true;
-    return std::is_lt(compare(name, m_enterprise)) ? Oid{}
-                                                   : Oid{std::numeric_limits<std::uint32_t>::max()};
+    return nullptr;
+}
+
+Lookup AgentxAnswers::find(Facts const& facts, OidView name, Instance& found) const {
+    ObjectTree const* const tree = treeOf(name);
+    return tree == nullptr ? Lookup::NoSuchObject : tree->find(facts, name, found);
+}
+
+bool AgentxAnswers::next(Facts const& facts, AgentxName const& start, Instance& found) const {
+    OidView const name = start.name;
+    for (Tree const& each : m_trees) {
+        bool const within = startsWith(name, each.arc);
+        if (!within && std::is_gt(compare(name, each.arc))) continue;
+        OidView const after = within ? name.subspan(each.arc.size()) : OidView{};
+        if (!each.tree->next(facts, after, !within || start.include, found)) continue;
+        found.name.insert(found.name.begin(), each.arc.begin(), each.arc.end());
+        return true;
+    }
+    return false;
+}
+
+std::string AgentxAnswers::set(AgentxHeader const& header, AgentxReader reader) {
+    auto const snapshot = m_takeSnapshot();
+    Facts const facts{*snapshot, m_counters, &m_settings};
+    return m_sets.answer(
+        header, reader,
+        [&](OidView name, std::optional<std::int64_t> integer, std::optional<Change>& change) {
+            ObjectTree const* const tree = treeOf(name);
+            return tree == nullptr ? SetFault::NotWritable
+                                   : tree->test(facts, name, integer, change);
+        });
 }
 
 std::string AgentxAnswers::get(AgentxHeader const& header, AgentxReader reader) const {
     auto const snapshot = m_takeSnapshot();
-    Facts const facts{*snapshot, m_counters};
+    Facts const facts{*snapshot, m_counters, &m_settings};
     AgentxWriter response = beginAgentxResponse(header);
     while (!reader.atEnd()) {
         Oid const name = readRange(reader).start.name;
-        bool orEqual = false;
         Instance instance;
-        switch (m_tree.find(facts, relative(name, orEqual), instance)) {
+        switch (find(facts, name, instance)) {
         case Lookup::Found:
             response.variable(name, instance.type, instance.value);
             break;
@@ -86,24 +110,19 @@ std::string AgentxAnswers::get(AgentxHeader const& header, AgentxReader reader) 
 }
 
 void AgentxAnswers::writeNext(AgentxWriter& response, Facts const& facts, Range& range) const {
-    bool orEqual = range.start.include;
-    Oid const after = relative(range.start.name, orEqual);
     Instance instance;
-    if (m_tree.next(facts, after, orEqual, instance)) {
-        Oid name = m_enterprise;
-        name.insert(name.end(), instance.name.begin(), instance.name.end());
-        if (range.end.empty() || std::is_lt(compare(name, range.end))) {
-            response.variable(name, instance.type, instance.value);
-            range.start = {std::move(name), false};
-            return;
-        }
+    if (next(facts, range.start, instance) &&
+        (range.end.empty() || std::is_lt(compare(instance.name, range.end)))) {
+        response.variable(instance.name, instance.type, instance.value);
+        range.start = {std::move(instance.name), false};
+        return;
     }
     response.endOfView(range.start.name);
 }
 
 std::string AgentxAnswers::getNext(AgentxHeader const& header, AgentxReader reader) const {
     auto const snapshot = m_takeSnapshot();
-    Facts const facts{*snapshot, m_counters};
+    Facts const facts{*snapshot, m_counters, &m_settings};
     AgentxWriter response = beginAgentxResponse(header);
     while (!reader.atEnd()) {
         Range range = readRange(reader);
@@ -116,7 +135,7 @@ std::string AgentxAnswers::getBulk(AgentxHeader const& header, AgentxReader read
     std::size_t single = reader.number16();
     std::size_t const rounds = reader.number16();
     auto const snapshot = m_takeSnapshot();
-    Facts const facts{*snapshot, m_counters};
+    Facts const facts{*snapshot, m_counters, &m_settings};
     AgentxWriter response = beginAgentxResponse(header);
     std::vector<Range> repeated;
     while (!reader.atEnd()) {

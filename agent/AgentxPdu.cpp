@@ -19,7 +19,16 @@ constexpr std::size_t kUsualSize = 512;
 /// A name that begins so, with a number of one octet after it, is written without its beginning.
 constexpr std::array<std::uint32_t, 4> kInternet{1, 3, 6, 1};
 
+constexpr std::uint16_t kInteger = 2;
 constexpr std::uint16_t kOctetString = 4;
+constexpr std::uint16_t kNull = 5;
+constexpr std::uint16_t kObjectId = 6;
+constexpr std::uint16_t kIpAddress = 64;
+constexpr std::uint16_t kCounter = 65;
+constexpr std::uint16_t kGauge = 66;
+constexpr std::uint16_t kTimeTicks = 67;
+constexpr std::uint16_t kOpaque = 68;
+constexpr std::uint16_t kCounter64 = 70;
 constexpr std::uint16_t kNoSuchObject = 128;
 constexpr std::uint16_t kNoSuchInstance = 129;
 constexpr std::uint16_t kEndOfView = 130;
@@ -27,17 +36,17 @@ constexpr std::uint16_t kEndOfView = 130;
 std::uint16_t typeOf(ValueType type) {
     switch (type) {
     case ValueType::Integer:
-        return 2;
+        return kInteger;
     case ValueType::Counter:
-        return 65;
+        return kCounter;
     case ValueType::Gauge:
-        return 66;
+        return kGauge;
     case ValueType::TimeTicks:
-        return 67;
+        return kTimeTicks;
     case ValueType::Counter64:
-        return 70;
+        return kCounter64;
     case ValueType::ObjectId:
-        return 6;
+        return kObjectId;
     case ValueType::Text:
     case ValueType::Octets:
     case ValueType::Date:
@@ -107,6 +116,42 @@ AgentxName AgentxReader::name() {
     }
     for (std::size_t i = 0; i < count; ++i)
         result.name.push_back(number());
+    return result;
+}
+
+AgentxVariable AgentxReader::variable() {
+    std::uint16_t const type = number16();
+    number16();
+    AgentxVariable result;
+    result.name = name().name;
+    switch (type) {
+    case kInteger:
+        result.integer = static_cast<std::int32_t>(number());
+        break;
+    case kCounter:
+    case kGauge:
+    case kTimeTicks:
+        number();
+        break;
+    case kCounter64:
+        take(8);
+        break;
+    case kOctetString:
+    case kIpAddress:
+    case kOpaque: {
+        std::size_t const size = number();
+        take(size);
+        take((4 - size % 4) % 4);
+        break;
+    }
+    case kObjectId:
+        name();
+        break;
+    case kNull:
+        break;
+    default:
+        throw AgentxError("a value of an unknown type");
+    }
     return result;
 }
 

@@ -4,6 +4,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <optional>
 #include <stdexcept>
 #include <string>
 #include <string_view>
@@ -16,6 +17,7 @@ enum class AgentxKind : std::uint8_t {
     Open = 1,
     Close = 2,
     Register = 3,
+    Unregister = 4,
     Get = 5,
     GetNext = 6,
     GetBulk = 7,
@@ -31,8 +33,10 @@ enum class AgentxKind : std::uint8_t {
 /// What a Response says went wrong.
 enum class AgentxFault : std::uint16_t {
     None = 0,
+    WrongType = 7,
+    WrongValue = 10,
+    NoCreation = 11,
     CommitFailed = 14,
-    UndoFailed = 15,
     NotWritable = 17,
     NotOpen = 257,
     UnsupportedContext = 262,
@@ -70,6 +74,12 @@ struct AgentxName {
     bool include = false;
 };
 
+/// A variable that is to be set.
+struct AgentxVariable {
+    Oid name;
+    std::optional<std::int64_t> integer; ///< nothing when its value is of another type
+};
+
 /// Reads a packet's payload from its beginning to its end. Throws AgentxError past the end.
 class AgentxReader {
   public:
@@ -81,6 +91,8 @@ class AgentxReader {
     std::uint16_t number16();
     std::uint32_t number();
     AgentxName name();
+    /// A variable and its value, of whatever type.
+    AgentxVariable variable();
 
   private:
     std::string_view take(std::size_t size);

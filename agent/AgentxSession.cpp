@@ -8,6 +8,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
+#include <optional>
 #include <utility>
 
 #include "agent/Log.h"
@@ -36,12 +37,31 @@ std::string nameOf(AgentxFault fault) {
     }
 }
 
+/// `nameOf`, and what to do.
+std::string adviceOn(AgentxFault fault) {
+    return nameOf(fault) + (fault == AgentxFault::DuplicateRegistration
+                                ? "; stop it, then restart the master or this agent"
+                                : "; see the master's configuration");
+}
+
+/// The rest of a Register or Unregister packet. `last`, if any: of the range that the name's last
+/// number begins.
+void writeRegion(AgentxWriter& packet, OidView name, std::optional<std::uint32_t> last) {
+    packet.octet(0); // the session's timeout
+    packet.octet(kPriority);
+    packet.octet(last ? static_cast<std::uint8_t>(name.size()) : 0);
+    packet.octet(0);
+    packet.name(name);
+    if (last) packet.number(*last);
+}
+
 } // namespace
 
-AgentxSession::AgentxSession(AgentxAddress address, std::vector<Oid> roots, Answer answer,
-                             AgentxPace pace)
+AgentxSession::AgentxSession(AgentxAddress address, std::vector<AgentxRoot> roots, SharedRows& rows,
+                             Answer answer, AgentxPace pace)
     : m_address(std::move(address)),
       m_roots(std::move(roots)),
+      m_rows(rows),
       m_answer(std::move(answer)),
       m_pace(pace) {
     connectNow();
@@ -125,16 +145,49 @@ void AgentxSession::connected() {
 
 void AgentxSession::registerRoots() {
     m_stage = Stage::Registering;
-    for (Oid const& root : m_roots) {
+    m_rows.restart();
+    for (std::size_t root = 0; root < m_roots.size(); ++root) {
         AgentxWriter packet = request(AgentxKind::Register);
-        packet.octet(0); // the session's timeout
-        packet.octet(kPriority);
-        packet.octet(0); // one name, no range of names
-        packet.octet(0);
-        packet.name(root);
+        m_awaited.back().root = root;
+        writeRegion(packet, m_roots[root].name, std::nullopt);
         queue(packet.take());
         if (m_socket < 0) return;
     }
+}
+
+void AgentxSession::registerRows() {
+    if (m_stage != Stage::Serving) return;
+    auto const step = m_rows.next();
+    if (!step) return;
+    AgentxWriter packet = request(step->enters ? AgentxKind::Register : AgentxKind::Unregister);
+    Oid name = step->range.column;
+    name.push_back(step->range.first);
+    writeRegion(packet, name, step->range.last);
+    queue(packet.take());
+}
+
+void AgentxSession::takeRegistered(std::size_t root, AgentxFault fault) {
+    if (m_stage == Stage::Serving) {
+        if (fault == AgentxFault::None)
+            m_rows.done();
+        else
+            m_rows.refused(adviceOn(fault));
+        return registerRows();
+    }
+    std::string const& what = m_roots[root].what;
+    auto const told = std::ranges::find(m_refused, what);
+    if (fault == AgentxFault::None) {
+        if (told != m_refused.end()) m_refused.erase(told);
+    } else if (m_roots[root].needed) {
+        return drop("it refuses the agent's names: " + nameOf(fault));
+    } else if (told == m_refused.end()) {
+        m_refused.push_back(what);
+        log(LogLevel::Warning,
+            "the SNMP master refuses " + what + ": " + adviceOn(fault) + "; the rest is served");
+    }
+    if (!m_awaited.empty()) return;
+    m_stage = Stage::Serving;
+    registerRows();
 }
 
 void AgentxSession::send(Notification const& notification, std::function<void()> taken) {
@@ -148,7 +201,7 @@ void AgentxSession::send(Notification const& notification, std::function<void()>
 
 AgentxWriter AgentxSession::request(AgentxKind kind) {
     if (m_awaited.empty()) m_heard = Clock::now();
-    m_awaited.push_back({++m_lastPacket, kind});
+    m_awaited.push_back({++m_lastPacket, kind, 0});
     return {kind, m_session, 0, m_lastPacket};
 }
 
@@ -212,6 +265,7 @@ void AgentxSession::takeResponse(AgentxHeader const& header, std::string_view pa
     auto const awaited = std::ranges::find(m_awaited, header.packet, &Awaited::packet);
     if (awaited == m_awaited.end()) return;
     AgentxKind const kind = awaited->kind;
+    std::size_t const root = awaited->root;
     m_awaited.erase(awaited);
     AgentxReader reader(payload, header.networkOrder);
     reader.number(); // the master's time
@@ -224,9 +278,8 @@ void AgentxSession::takeResponse(AgentxHeader const& header, std::string_view pa
         registerRoots();
         break;
     case AgentxKind::Register:
-        if (fault != AgentxFault::None)
-            return drop("it refuses the agent's names: " + nameOf(fault));
-        if (m_awaited.empty()) m_stage = Stage::Serving;
+    case AgentxKind::Unregister:
+        takeRegistered(root, fault);
         break;
     case AgentxKind::Notify:
         // Refused, it would be refused again.
@@ -269,6 +322,7 @@ void AgentxSession::tellLost(std::string const& why) {
     }
     bool const had = m_told == Told::Connected;
     m_told = Told::Lost;
+    if (had) ++m_timesLost;
     log(LogLevel::Warning,
         (had ? "lost the SNMP master at " : "no connection to the SNMP master at ") +
             m_address.text + ": " + why + "; trying again until " +

@@ -11,6 +11,7 @@
 #include "agent/AgentxAddress.h"
 #include "agent/AgentxPdu.h"
 #include "agent/NotificationSink.h"
+#include "agent/SharedRows.h"
 
 namespace kvloamd {
 
@@ -24,6 +25,13 @@ struct AgentxPace {
     std::chrono::milliseconds surrender{60000};
 };
 
+/// Everything below a name is asked of the agent.
+struct AgentxRoot {
+    Oid name;         ///< absolute
+    std::string what; ///< is there, for a message
+    bool needed;      ///< without it there is no session
+};
+
 /// Never blocks: whoever owns it waits for its descriptor and its deadline. One log line per change
 /// of the master's state. Used on one thread only.
 class AgentxSession final : public NotificationSink {
@@ -31,9 +39,10 @@ class AgentxSession final : public NotificationSink {
     /// The response to a request of the master; empty: none. May throw AgentxError.
     using Answer = std::function<std::string(AgentxHeader const&, std::string_view payload)>;
 
-    /// Everything below one of `roots`, absolute, is asked of `answer`. Begins to connect.
-    AgentxSession(AgentxAddress address, std::vector<Oid> roots, Answer answer,
-                  AgentxPace pace = {});
+    /// What is below `roots`, and the cells of `rows`, which outlives the session, is asked of
+    /// `answer`. Begins to connect.
+    AgentxSession(AgentxAddress address, std::vector<AgentxRoot> roots, SharedRows& rows,
+                  Answer answer, AgentxPace pace = {});
     /// Takes leave of the master, whose clients see the names go.
     ~AgentxSession() override;
     AgentxSession(AgentxSession const&) = delete;
@@ -46,9 +55,14 @@ class AgentxSession final : public NotificationSink {
     Clock::time_point deadline() const;
     /// Does what can be done: `happened` is what poll() has told of the descriptor.
     void advance(short happened);
+    /// Has the master learn what is new among the rows. There is one registration under way at a
+    /// time, so that requests come in between.
+    void registerRows();
 
-    /// Whether the master serves our names, and answers.
+    /// Whether the master serves our names, the rows apart, and answers.
     bool isConnected() const { return m_told == Told::Connected; }
+    /// How often the master has been lost after it was connected.
+    std::uint32_t timesLost() const { return m_timesLost; }
 
     bool ready() const override { return isConnected() && !m_taken; }
     void send(Notification const& notification, std::function<void()> taken) override;
@@ -59,6 +73,7 @@ class AgentxSession final : public NotificationSink {
     struct Awaited {
         std::uint32_t packet;
         AgentxKind kind;
+        std::size_t root = 0; ///< that is being registered
     };
 
     void connectNow();
@@ -68,6 +83,7 @@ class AgentxSession final : public NotificationSink {
     void takeResponse(AgentxHeader const& header, std::string_view payload);
     void checkTime();
     void registerRoots();
+    void takeRegistered(std::size_t root, AgentxFault fault);
     AgentxWriter request(AgentxKind kind);
     void queue(std::string packet);
     void flush();
@@ -78,19 +94,22 @@ class AgentxSession final : public NotificationSink {
     void tellLost(std::string const& why);
 
     AgentxAddress m_address;
-    std::vector<Oid> m_roots;
+    std::vector<AgentxRoot> m_roots;
+    SharedRows& m_rows;
     Answer m_answer;
     AgentxPace m_pace;
 
     int m_socket = -1;
     Stage m_stage = Stage::Away;
     Told m_told = Told::Nothing;
+    std::uint32_t m_timesLost = 0;
     std::uint32_t m_session = 0;
     std::uint32_t m_lastPacket = 0;
     std::vector<Awaited> m_awaited;
-    std::function<void()> m_taken; ///< set while a notification is under way
-    Clock::time_point m_retryAt;   ///< while away
-    Clock::time_point m_heard;     ///< the master's last word, or when it was asked after that
+    std::vector<std::string> m_refused; ///< of the roots, what has been told
+    std::function<void()> m_taken;      ///< set while a notification is under way
+    Clock::time_point m_retryAt;        ///< while away
+    Clock::time_point m_heard;          ///< the master's last word, or when it was asked after that
     std::string m_in;
     std::string m_out;
 };

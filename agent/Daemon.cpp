@@ -15,8 +15,10 @@
 #include "access/ExternalFaultEventAdaptor.h"
 #include "agent/BoardSource.h"
 #include "agent/Collector.h"
+#include "agent/EntityNotices.h"
+#include "agent/EntityReader.h"
+#include "agent/FaultListener.h"
 #include "agent/Front.h"
-#include "agent/InterfaceIndices.h"
 #include "agent/InterfaceReader.h"
 #include "agent/LineListener.h"
 #include "agent/LinkWatch.h"
@@ -28,6 +30,7 @@
 #include "agent/ServiceNotice.h"
 #include "agent/Signals.h"
 #include "agent/SnmpConfig.h"
+#include "agent/StableIndices.h"
 #include "agent/StandardObjects.h"
 #include "agent/StatusListener.h"
 #include "agent/Wakeup.h"
@@ -39,18 +42,24 @@ namespace {
 /// How long a stop may be held up by notifications that a master does not take.
 constexpr std::chrono::seconds kLastWords{1};
 
+/// The lowest entPhysicalIndex, which is the chassis's.
+constexpr std::uint32_t kFirstEntity = 1;
+
 /// What the library's threads may reach until the process ends. Never destroyed.
 struct Boards {
-    explicit Boards(Oid enterprise)
-        : listener(*manager.get(), source, queue, counters, std::move(enterprise)) {}
+    explicit Boards(Oid const& enterprise)
+        : listener(*manager.get(), source, queue, counters, enterprise),
+          faultListener(*manager.get(), faults, queue, enterprise) {}
 
     ReferenceCounter<BoardManager> manager{new BoardManager};
     Counters counters;
     Settings settings;
     BoardSource source{*manager.get()};
     NotificationQueue queue{counters};
+    FaultLog faults;
     StatusListener listener;
     LineListener lines{*manager.get(), settings, queue, counters};
+    FaultListener faultListener;
 };
 
 /// Makes the first calls of the library's singletons, which belong to one thread, and asks the
@@ -86,25 +95,34 @@ void attachModules(std::vector<LoadedModule> const& modules, Boards& boards) {
     for (LoadedModule const& module : modules)
         factories.push_back(module.createFactory());
     boards.manager->AddBoardStatusListener(&boards.listener);
+    boards.manager->AddBoardStatusListener(&boards.faultListener);
+    ExternalFaultEventAdaptor::get_instance()->AddExternalFaultEventListener(&boards.faultListener);
     for (ReferenceCounter<BoardFactory> const& factory : factories)
         boards.manager->Attach(factory);
     for (LoadedModule const& module : modules)
         ServiceManager::GetInstance()->AddModule(module.name().c_str());
 }
 
-/// Has a listener tell of changes for a scope.
-template <class Listener>
+/// Has the listeners tell of changes for a scope.
 class ListeningScope {
   public:
-    ListeningScope(Listener& listener, std::function<void()> changed) : m_listener(listener) {
-        m_listener.start(std::move(changed));
+    ListeningScope(Boards& boards, std::function<void()> const& changed) : m_boards(boards) {
+        m_boards.listener.start(changed);
+        m_boards.faultListener.start(changed);
+        m_boards.lines.start(changed);
     }
-    ~ListeningScope() { m_listener.stop(); }
+    ~ListeningScope() { stop(); }
     ListeningScope(ListeningScope const&) = delete;
     ListeningScope& operator=(ListeningScope const&) = delete;
 
+    void stop() {
+        m_boards.listener.stop();
+        m_boards.faultListener.stop();
+        m_boards.lines.stop();
+    }
+
   private:
-    Listener& m_listener;
+    Boards& m_boards;
 };
 
 /// A folder for a scope.
@@ -178,7 +196,7 @@ void announceLast(Notifier& notifier, NotificationQueue& queue, Front& front) {
 /// Has the settings of former runs, and keeps those of this one in the same file.
 class KeptSettings {
   public:
-    KeptSettings(Settings& settings, InterfaceIndices& file) : m_settings(settings), m_file(file) {
+    KeptSettings(Settings& settings, StableIndices& file) : m_settings(settings), m_file(file) {
         m_settings.load(m_file.settings());
     }
     ~KeptSettings() { save(); }
@@ -189,54 +207,58 @@ class KeptSettings {
 
   private:
     Settings& m_settings;
-    InterfaceIndices& m_file;
+    StableIndices& m_file;
 };
 
 void serve(Options const& options, ReadOptions const& readAgain, Front& front,
-           Signals const& signals, Boards& boards, Clock::time_point started) {
+           Signals const& signals, Boards& boards) {
+    Clock::time_point const started = boards.counters.started;
     Wakeup wakeup;
     ServiceManager& services = *ServiceManager::GetInstance();
     KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
     PlatformReader platform;
-    std::optional<InterfaceIndices> indices;
-    std::optional<KeptSettings> keptSettings;
-    std::optional<InterfaceReader> interfaces;
+    std::string const directory = persistentDirectory(options);
+    StableIndices indices(directory + "/ifindex.sqlite", options.interfaceBase, "interfaces");
+    KeptSettings keptSettings(boards.settings, indices);
+    InterfaceReader interfaces(*boards.manager.get(), indices, started);
+    StableIndices entityIndices(directory + "/entity.sqlite", kFirstEntity, "physical entities");
+    EntityReader entities(entityIndices, started, [] { return std::time(nullptr); });
     LinkWatch links(boards.settings, boards.queue);
-    if (front.servesStandardObjects()) {
-        indices.emplace(persistentDirectory() + "/ifindex.sqlite", options.interfaceBase);
-        keptSettings.emplace(boards.settings, *indices);
-        interfaces.emplace(*boards.manager.get(), *indices, started);
-    }
     Collector collector(
         [&](Snapshot& snapshot) {
-            if (keptSettings) keptSettings->save();
+            keptSettings.save();
             snapshot.boards = boards.source.read();
             snapshot.modules = readModules(services);
             snapshot.services = readServices(services);
             snapshot.platformService = readPlatformService(services);
             snapshot.processes = readProcesses(statistics);
+            snapshot.faults = boards.faults.read(started);
+            snapshot.resources = readResources(*boards.manager.get(), snapshot.boards);
             snapshot.records = platform.read(snapshot.boards);
-            if (interfaces) {
-                boards.lines.listen(snapshot.boards, interfaces->uptime());
-                snapshot.interfaces = interfaces->read(snapshot.boards);
-                std::vector<PlacedLine> const lines = interfaces->takeLines();
-                boards.lines.place(lines);
-                handOn(boards.settings, lines);
-                links.note(snapshot.interfaces.interfaces, snapshot.begun);
-            }
+            boards.lines.listen(snapshot.boards, interfaces.uptime());
+            snapshot.interfaces = interfaces.read(snapshot.boards);
+            std::vector<PlacedLine> const lines = interfaces.takeLines();
+            boards.lines.place(lines);
+            handOn(boards.settings, lines);
+            links.note(snapshot.interfaces.interfaces, snapshot.begun);
+            snapshot.entities = entities.read(snapshot);
         },
         started, [&] { wakeup.wake(); });
     std::vector<Table const*> const allTables = tables();
     ObjectTree const tree(scalars(), allTables);
     std::vector<Table const*> const allStandardTables = standardTables();
     ObjectTree const standardTree(standardScalars(), allStandardTables);
-    std::vector<ServedTree> served{{tree, options.enterprise, {kObjectsPlace}}};
-    if (interfaces)
-        served.push_back(
-            {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}});
-    front.serve({std::move(served), boards.counters, [&] { return collector.snapshot(); },
+    front.serve({{{tree, options.enterprise, {{kObjectsPlace, "KVL-OAM-MIB"}}},
+                  {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}}},
+                 boards.counters,
+                 [&] {
+                     ++boards.counters.requests;
+                     return collector.snapshot();
+                 },
+                 [&] { return collector.newest(); },
                  boards.settings});
     Notifier notifier(boards.queue, front.notifications());
+    EntityNotices entityNotices(boards.queue);
     ServiceNotice notice;
     std::string const serving =
         "serving " + std::to_string(collector.newest()->boards.size()) + " boards " + front.place();
@@ -251,18 +273,18 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     });
     front.beforeSleep([&] {
         if (boards.settings.hasUnsaved()) collector.renew();
-        return earliest(notifier.announce(collector.newest()->begun), notice.beat());
+        auto const entityNews = entityNotices.tell(collector.newest(), Clock::now());
+        return earliest(entityNews,
+                        earliest(notifier.announce(collector.newest()->begun), notice.beat()));
     });
-    ListeningScope const listening(boards.listener, [&] { collector.renew(); });
-    ListeningScope const listeningToLines(boards.lines, [&] { collector.renew(); });
+    ListeningScope listening(boards, [&] { collector.renew(); });
     log(LogLevel::Info, serving);
     notice.ready(serving);
     front.run();
     signals.letStopThrough();
     notice.stopping();
     log(LogLevel::Info, "stopping");
-    boards.listener.stop();
-    boards.lines.stop();
+    listening.stop();
     announceLast(notifier, boards.queue, front);
 }
 
@@ -280,9 +302,9 @@ int runDaemon(Options const& options, ReadOptions const& readAgain) {
                                    "with --module");
         std::unique_ptr<Front> const front = makeFront(options);
         if (!front->open() || !platformAnswers()) return kExitFailure;
-        Clock::time_point const started = Clock::now();
+        boards->counters.started = Clock::now();
         attachModules(modules, *boards);
-        serve(options, readAgain, *front, signals, *boards, started);
+        serve(options, readAgain, *front, signals, *boards);
         log(LogLevel::Info, "stopped");
     } catch (std::exception const& error) {
         log(LogLevel::Error, error.what());

@@ -11,21 +11,16 @@
 #include "agent/NotificationSink.h"
 #include "agent/ObjectTree.h"
 #include "agent/Options.h"
+#include "agent/ServedTree.h"
 
 namespace kvloamd {
-
-/// Objects, and where in the world's tree they are.
-struct ServedTree {
-    ObjectTree const& tree;
-    Oid arc;                 ///< above all names
-    std::vector<Oid> places; ///< relative; what is served, with all below
-};
 
 /// What a front serves. Outlives `run`.
 struct Served {
     std::vector<ServedTree> trees; ///< the agent's own MIB module first
-    Counters const& counters;
-    std::function<std::shared_ptr<Snapshot const>()> takeSnapshot;
+    Counters& counters;
+    std::function<std::shared_ptr<Snapshot const>()> takeSnapshot;   ///< for a request
+    std::function<std::shared_ptr<Snapshot const>()> newestSnapshot; ///< as it is
     Settings& settings;
 };
 
@@ -39,8 +34,6 @@ class Front {
 
     /// Gets ready. False when the agent can not start; what is wrong has been logged.
     virtual bool open() = 0;
-    /// Whether the front serves the standard MIB modules beside the agent's own.
-    virtual bool servesStandardObjects() const = 0;
     /// From now on requests are answered while `run` runs. Throws std::runtime_error.
     virtual void serve(Served served) = 0;
     /// Where the agent is reached, for a message: "on udp:127.0.0.1:1161".

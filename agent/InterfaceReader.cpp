@@ -5,7 +5,6 @@
 #include <functional>
 #include <iterator>
 #include <set>
-#include <unordered_set>
 #include <utility>
 
 namespace kvloamd {
@@ -53,7 +52,7 @@ void completeStack(InterfaceRows& all) {
 
 } // namespace
 
-InterfaceReader::InterfaceReader(BoardManager& manager, InterfaceIndices& indices,
+InterfaceReader::InterfaceReader(BoardManager& manager, StableIndices& indices,
                                  Clock::time_point started)
     : m_manager(manager), m_indices(indices), m_uptime(started) {}
 
@@ -67,19 +66,15 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     ++m_reading;
     m_histories.begin(Clock::now());
     ToTicks const toTicks = [this](long seconds) { return m_uptime.of(seconds); };
-    std::unordered_set<std::string> serialNumbers;
-    for (BoardRow const& row : boards) {
-        auto const board = m_manager.GetBoardByIndex(static_cast<int>(row.boardIndex));
+    std::vector<std::string> const names = keptNames(boards);
+    for (std::size_t i = 0; i < boards.size(); ++i) {
+        std::uint32_t const boardIndex = boards[i].boardIndex;
+        auto const board = m_manager.GetBoardByIndex(static_cast<int>(boardIndex));
         Board* const asked = board.get();
         if (asked == nullptr) continue;
-        std::string serialNumber = row.serialNumber == "unknown" ? "" : row.serialNumber;
-        // Boards that nothing else tells apart are told apart by their indices.
-        if (serialNumber.empty() || serialNumbers.contains(serialNumber))
-            serialNumber += "@" + std::to_string(row.boardIndex);
-        serialNumbers.insert(serialNumber);
         BoardInterfaces found = readInterfaces(*asked, toTicks, m_histories);
-        auto const indices = m_indices.indicesOf(serialNumber, found.keys);
-        append(all, std::move(found), indices, row.boardIndex);
+        auto const indices = m_indices.indicesOf(names[i], found.keys);
+        append(all, std::move(found), indices, boardIndex);
     }
     m_indices.save();
     if (m_counted.size() > all.interfaces.size())
@@ -90,6 +85,7 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     sortBy(all.bearers, &BearerRow::ifIndex);
     sortBy(all.signalling, &SignallingRow::ifIndex);
     sortBy(all.ethernets, &EthernetRow::ifIndex);
+    sortBy(all.ports, &PortRow::ifIndex);
     completeStack(all);
     std::size_t before = 0;
     for (LineRow& line : all.lines) {
@@ -114,6 +110,9 @@ void InterfaceReader::append(InterfaceRows& all, BoardInterfaces&& board,
     moveRows(all.bearers, board.rows.bearers, indices);
     moveRows(all.signalling, board.rows.signalling, indices);
     moveRows(all.ethernets, board.rows.ethernets, indices);
+    for (PortRow& port : board.rows.ports)
+        port.boardIndex = boardIndex;
+    moveRows(all.ports, board.rows.ports, indices);
     for (StackRow const& row : board.rows.stack) {
         StackRow const placed{indices[row.higher - 1], indices[row.lower - 1]};
         if (placed.higher != 0 && placed.lower != 0) all.stack.push_back(placed);

@@ -72,6 +72,14 @@ bool ObjectTree::next(Facts const& facts, OidView name, bool orEqual, Instance& 
     return false;
 }
 
+std::vector<TableColumn> ObjectTree::columnsBelow(OidView place) const {
+    std::vector<TableColumn> columns;
+    for (Node const& node : m_nodes)
+        if (node.table != nullptr && startsWith(node.place, place))
+            columns.push_back({node.place, node.table, node.column});
+    return columns;
+}
+
 SetFault ObjectTree::test(Facts const& facts, OidView name, std::optional<std::int64_t> integer,
                           std::optional<Change>& change) const {
     Node const* const node = nodeOf(name);

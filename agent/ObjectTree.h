@@ -18,6 +18,13 @@ struct Instance {
     Value value;
 };
 
+/// A table's column and its place.
+struct TableColumn {
+    Oid place; ///< relative
+    Table const* table;
+    std::size_t column;
+};
+
 enum class Lookup {
     Found,
     NoSuchObject,  ///< no object has this name
@@ -56,6 +63,9 @@ class ObjectTree {
     /// `change` is what to do, if it can.
     SetFault test(Facts const& facts, OidView name, std::optional<std::int64_t> integer,
                   std::optional<Change>& change) const;
+
+    /// The columns of tables that are at `place` or below, ascending.
+    std::vector<TableColumn> columnsBelow(OidView place) const;
 
   private:
     /// A scalar, or one column of a table.

@@ -129,7 +129,8 @@ std::vector<std::string> startSnmp(Options const& options) {
     return faults;
 }
 
-std::string persistentDirectory() {
+std::string persistentDirectory(Options const& options) {
+    if (!options.persistentDirectory.empty()) return options.persistentDirectory;
     char const* const directory = get_persistent_directory();
     return directory == nullptr ? std::string() : std::string(directory);
 }

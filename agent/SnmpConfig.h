@@ -14,7 +14,7 @@ namespace kvloamd {
 std::vector<std::string> startSnmp(Options const& options);
 
 /// Where state is kept that outlives the process. After `startSnmp`.
-std::string persistentDirectory();
+std::string persistentDirectory(Options const& options);
 
 /// Stores the state that outlives the process and lets go of everything.
 void stopSnmp();

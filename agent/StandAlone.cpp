@@ -29,8 +29,8 @@ void StandAlone::serve(Served served) {
     for (ServedTree const& each : served.trees) {
         SnmpHandler& handler = m_handlers.emplace_back(each.tree, served.counters, each.arc,
                                                        served.takeSnapshot, served.settings);
-        for (Oid const& place : each.places)
-            if (!handler.serve(place))
+        for (Place const& place : each.places)
+            if (!handler.serve(place.place))
                 throw std::runtime_error("the SNMP library does not let the agent serve its "
                                          "objects; check --enterprise-oid");
     }

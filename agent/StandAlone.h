@@ -20,7 +20,6 @@ class StandAlone final : public Front {
     ~StandAlone() override;
 
     bool open() override;
-    bool servesStandardObjects() const override { return true; }
     void serve(Served served) override;
     std::string place() const override { return "on " + m_options.listen.front(); }
     NotificationSink& notifications() override { return m_notifications; }

@@ -25,17 +25,35 @@ int millisecondsUntil(Clock::time_point when) {
 } // namespace
 
 void Subagent::serve(Served served) {
-    ServedTree const& own = served.trees.front();
-    std::vector<Oid> roots;
-    for (Oid const& place : own.places) {
-        roots.push_back(own.arc);
-        roots.back().insert(roots.back().end(), place.begin(), place.end());
+    std::vector<AgentxRoot> roots;
+    for (ServedTree const& tree : served.trees) {
+        for (Place const& place : tree.places) {
+            if (place.hostHas != HostHas::Nothing) continue;
+            // Another agent that has the first tree is one of our kind, and has it all.
+            roots.push_back(
+                {joined(tree.arc, place.place), place.name, &tree == &served.trees.front()});
+        }
     }
-    m_answers.emplace(own.tree, served.counters, own.arc, std::move(served.takeSnapshot));
-    m_session.emplace(m_address, std::move(roots),
+    m_counters = &served.counters;
+    m_newestSnapshot = std::move(served.newestSnapshot);
+    m_rows.emplace(served.trees);
+    updateRows();
+    m_answers.emplace(served.trees, served.counters, std::move(served.takeSnapshot),
+                      served.settings);
+    m_session.emplace(m_address, std::move(roots), *m_rows,
                       [this](AgentxHeader const& header, std::string_view payload) {
+                          m_counters->master =
+                              m_session->isConnected() ? Master::Connected : Master::Lost;
+                          m_counters->masterLosses = m_session->timesLost();
                           return m_answers->answer(header, payload);
                       });
+}
+
+void Subagent::updateRows() {
+    auto newest = m_newestSnapshot();
+    if (newest == m_seen) return;
+    m_seen = std::move(newest);
+    m_rows->update({*m_seen, *m_counters}, Clock::now());
 }
 
 void Subagent::watch(int descriptor, std::function<void()> readable) {
@@ -55,6 +73,8 @@ void Subagent::run(Clock::time_point until) {
 void Subagent::step(Clock::time_point until) {
     std::optional<Clock::time_point> const prepared = m_prepare ? m_prepare() : std::nullopt;
     if (m_stop) return;
+    updateRows();
+    m_session->registerRows();
     Clock::time_point wake = std::min(until, m_session->deadline());
     if (prepared) wake = std::min(wake, *prepared);
 

@@ -2,6 +2,8 @@
 // The agent beside the host's own: the host's master asks it, and forwards its notifications.
 #pragma once
 
+#include <functional>
+#include <memory>
 #include <optional>
 #include <vector>
 
@@ -9,6 +11,7 @@
 #include "agent/AgentxAnswers.h"
 #include "agent/AgentxSession.h"
 #include "agent/Front.h"
+#include "agent/SharedRows.h"
 
 namespace kvloamd {
 
@@ -18,8 +21,6 @@ class Subagent final : public Front {
 
     /// A master need not be there yet.
     bool open() override { return true; }
-    /// The master has an interface table of its own.
-    bool servesStandardObjects() const override { return false; }
     void serve(Served served) override;
     std::string place() const override { return "through the SNMP master at " + m_address.text; }
     NotificationSink& notifications() override { return *m_session; }
@@ -34,10 +35,16 @@ class Subagent final : public Front {
         std::function<void()> readable;
     };
 
+    /// Has the master learn of rows that have come and gone.
+    void updateRows();
     void step(Clock::time_point until);
 
     AgentxAddress m_address;
+    std::function<std::shared_ptr<Snapshot const>()> m_newestSnapshot;
+    Counters* m_counters = nullptr;
     std::optional<AgentxAnswers> m_answers;
+    std::optional<SharedRows> m_rows;
+    std::shared_ptr<Snapshot const> m_seen; ///< by the rows
     std::optional<AgentxSession> m_session;
     std::vector<Watched> m_watched;
     std::function<std::optional<Clock::time_point>()> m_prepare;

@@ -29,12 +29,16 @@ using namespace kvloamd;
 
 /// Serves the standard objects below `arc` until the process is ended.
 void serveFrom(Front& front, Oid const& arc,
-               std::function<std::shared_ptr<Snapshot const>()> takeSnapshot) {
+               std::function<std::shared_ptr<Snapshot const>()> const& takeSnapshot) {
     std::vector<Table const*> const tables = standardTables();
     ObjectTree const tree(standardScalars(), tables);
     Counters const counters;
     Settings settings;
-    front.serve({{{tree, arc, {kOurPlace}}}, counters, std::move(takeSnapshot), settings});
+    front.serve({{{tree, arc, {{kOurPlace, "the intervals"}}}},
+                 counters,
+                 takeSnapshot,
+                 takeSnapshot,
+                 settings});
     front.run();
 }
 

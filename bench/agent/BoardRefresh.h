@@ -5,9 +5,9 @@
 #include <optional>
 
 #include "agent/BoardSource.h"
-#include "agent/InterfaceIndices.h"
 #include "agent/InterfaceReader.h"
 #include "agent/Snapshot.h"
+#include "agent/StableIndices.h"
 #include "board/BoardManager.h"
 
 /// Boards of the reference module on the simulated platform, each with four lines that have a full
@@ -21,6 +21,6 @@ class BoardRefresh {
   private:
     ReferenceCounter<BoardManager> m_manager;
     kvloamd::BoardSource m_source;
-    kvloamd::InterfaceIndices m_indices;
+    kvloamd::StableIndices m_indices;
     kvloamd::InterfaceReader m_interfaces;
 };

@@ -7,6 +7,7 @@
 #include <gtest/gtest.h>
 
 #include "agent/Objects.h"
+#include "agent/StandardObjects.h"
 
 namespace kvloamd {
 namespace {
@@ -40,7 +41,7 @@ constexpr int kNoSuchObject = 128;
 constexpr int kNoSuchInstance = 129;
 constexpr int kEndOfView = 130;
 
-/// A tree over boards 2 and 5.
+/// The trees over boards 2 and 5, and interfaces 1000 and 1002.
 class AgentxAnswersTest : public ::testing::Test {
   protected:
     AgentxAnswersTest() {
@@ -51,6 +52,12 @@ class AgentxAnswersTest : public ::testing::Test {
             row.status = BoardStatusStarted;
             row.name = "board " + std::to_string(index);
             snapshot->boards.push_back(row);
+        }
+        for (std::uint32_t const index : {1000U, 1002U}) {
+            InterfaceRow row;
+            row.ifIndex = index;
+            row.description = "interface " + std::to_string(index);
+            snapshot->interfaces.interfaces.push_back(row);
         }
         m_snapshot = snapshot;
     }
@@ -121,15 +128,25 @@ class AgentxAnswersTest : public ::testing::Test {
     std::vector<Table const*> const m_tables = tables();
     ObjectTree const m_tree{scalars(), m_tables};
     Counters m_counters;
-    AgentxAnswers m_answers{m_tree, m_counters, kEnterprise, [this] {
+    std::vector<Table const*> const m_standardTables = standardTables();
+    ObjectTree const m_standardTree{standardScalars(), m_standardTables};
+    Settings m_settings;
+    AgentxAnswers m_answers{{{m_tree, kEnterprise, {}}, {m_standardTree, kStandardArc, {}}},
+                            m_counters,
+                            [this] {
                                 ++m_snapshotsTaken;
                                 return m_snapshot;
-                            }};
+                            },
+                            m_settings};
 
     Oid const m_name2 = absolute({1, 1, 2, 4, 1, 4, 2});
     Oid const m_name5 = absolute({1, 1, 2, 4, 1, 4, 5});
     Variable const m_board2{kText, m_name2, 0, "board 2"};
     Variable const m_board5{kText, m_name5, 0, "board 5"};
+    Oid const m_description1000{1, 3, 6, 1, 2, 1, 2, 2, 1, 2, 1000};
+    Oid const m_description1002{1, 3, 6, 1, 2, 1, 2, 2, 1, 2, 1002};
+    Variable const m_interface1000{kText, m_description1000, 0, "interface 1000"};
+    Variable const m_interface1002{kText, m_description1002, 0, "interface 1002"};
 };
 
 TEST_F(AgentxAnswersTest, GetAnswersValuesAndWhyThereAreNone) {
@@ -157,7 +174,44 @@ TEST_F(AgentxAnswersTest, InclusiveGetNextOfAGapAnswersWhatComesAfter) {
 TEST_F(AgentxAnswersTest, GetNextBeforeAllOfOursAnswersTheFirst) {
     auto const answered = ask(AgentxKind::GetNext, {{{1, 3, 6, 1, 2}, false, {}}});
     ASSERT_EQ(answered.size(), 1U);
+    EXPECT_EQ(answered[0].name, (Oid{1, 3, 6, 1, 2, 1, 2, 1, 0}));
+}
+
+TEST_F(AgentxAnswersTest, GetNextBetweenTheTreesAnswersTheFirstOfTheSecond) {
+    auto const answered = ask(AgentxKind::GetNext, {{{1, 3, 6, 1, 4, 1}, false, {}}});
+    ASSERT_EQ(answered.size(), 1U);
     EXPECT_TRUE(startsWith(answered[0].name, kEnterprise));
+}
+
+TEST_F(AgentxAnswersTest, GetNextAfterTheFirstTreesLastAnswersTheFirstOfTheSecond) {
+    auto const answered = ask(AgentxKind::GetNext, {{{1, 3, 6, 1, 2, 1, 200}, false, {}}});
+    ASSERT_EQ(answered.size(), 1U);
+    EXPECT_TRUE(startsWith(answered[0].name, kEnterprise));
+}
+
+TEST_F(AgentxAnswersTest, RangeThatEndsBeforeTheNextTreeDoesNotLeak) {
+    Oid const start{1, 3, 6, 1, 2, 1, 200};
+    EXPECT_EQ(ask(AgentxKind::GetNext, {{start, false, {1, 3, 6, 1, 2, 1, 201}}}),
+              (std::vector<Variable>{{kEndOfView, start, 0, ""}}));
+}
+
+TEST_F(AgentxAnswersTest, RequestAsksSeveralTrees) {
+    EXPECT_EQ(ask(AgentxKind::Get, {{m_name2, false, {}}, {m_description1002, false, {}}}),
+              (std::vector{m_board2, m_interface1002}));
+    EXPECT_EQ(ask(AgentxKind::GetNext, {{m_name2, false, {}}, {m_description1000, false, {}}}),
+              (std::vector{m_board5, m_interface1002}));
+}
+
+TEST_F(AgentxAnswersTest, InclusiveRangeOfOneCellAnswersTheCell) {
+    EXPECT_EQ(
+        ask(AgentxKind::GetNext, {{m_description1000, true, {1, 3, 6, 1, 2, 1, 2, 2, 1, 2, 1001}}}),
+        std::vector{m_interface1000});
+}
+
+TEST_F(AgentxAnswersTest, InclusiveRangeOfACellThatIsGoneIsEmpty) {
+    Oid const gone{1, 3, 6, 1, 2, 1, 2, 2, 1, 2, 1001};
+    EXPECT_EQ(ask(AgentxKind::GetNext, {{gone, true, m_description1002}}),
+              (std::vector<Variable>{{kEndOfView, gone, 0, ""}}));
 }
 
 TEST_F(AgentxAnswersTest, GetNextAfterAllOfOursIsAtTheEnd) {
@@ -199,14 +253,36 @@ TEST_F(AgentxAnswersTest, OneResponseComesFromOneSnapshot) {
     EXPECT_EQ(m_snapshotsTaken, 1);
 }
 
-TEST_F(AgentxAnswersTest, EveryStepOfASetIsRefused) {
-    EXPECT_EQ(faultOf(AgentxKind::TestSet), static_cast<int>(AgentxFault::NotWritable));
-    EXPECT_EQ(faultOf(AgentxKind::CommitSet), static_cast<int>(AgentxFault::CommitFailed));
-    EXPECT_EQ(faultOf(AgentxKind::UndoSet), static_cast<int>(AgentxFault::UndoFailed));
+TEST_F(AgentxAnswersTest, SetIsTestedInTheTreeThatItsNameIsIn) {
+    // ifLinkUpDownTrapEnable and kvlBoardName
+    AgentxWriter writable(AgentxKind::TestSet, 1, 2, 3);
+    writable.variable(Oid{1, 3, 6, 1, 2, 1, 31, 1, 1, 1, 14, 1000}, ValueType::Integer,
+                      std::int64_t{2});
+    EXPECT_EQ(faultOf(writable.take()), static_cast<int>(AgentxFault::None));
+    AgentxWriter readOnly(AgentxKind::TestSet, 1, 2, 3);
+    readOnly.variable(m_name2, ValueType::Text, std::string_view("another"));
+    EXPECT_EQ(faultOf(readOnly.take()), static_cast<int>(AgentxFault::NotWritable));
+    AgentxWriter foreign(AgentxKind::TestSet, 1, 2, 3);
+    foreign.variable(Oid{1, 3, 6, 1, 6, 1}, ValueType::Integer, std::int64_t{2});
+    EXPECT_EQ(faultOf(foreign.take()), static_cast<int>(AgentxFault::NotWritable));
 }
 
-TEST_F(AgentxAnswersTest, EndOfASetIsNotAnswered) {
-    EXPECT_EQ(answer(AgentxWriter(AgentxKind::CleanupSet, 1, 2, 3).take()), "");
+TEST_F(AgentxAnswersTest, AnswersShowWhatIsSet) {
+    Oid const trapEnable{1, 3, 6, 1, 2, 1, 31, 1, 1, 1, 14, 1000};
+    AgentxWriter test(AgentxKind::TestSet, 1, 2, 3);
+    test.variable(trapEnable, ValueType::Integer, std::int64_t{2});
+    answer(test.take());
+    EXPECT_EQ(faultOf(AgentxKind::CommitSet), static_cast<int>(AgentxFault::None));
+    auto const answered = ask(AgentxKind::Get, {{trapEnable, false, {}}});
+    ASSERT_EQ(answered.size(), 1U);
+    EXPECT_EQ(answered[0].number, 2);
+}
+
+TEST_F(AgentxAnswersTest, EndOfASetIsNotAnsweredInAnyContext) {
+    std::string request = AgentxWriter(AgentxKind::CleanupSet, 1, 2, 3).take();
+    EXPECT_EQ(answer(request), "");
+    request[2] |= 0x08;
+    EXPECT_EQ(answer(request), "");
 }
 
 TEST_F(AgentxAnswersTest, OtherContextIsRefused) {

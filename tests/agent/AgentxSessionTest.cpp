@@ -13,7 +13,9 @@
 #include <optional>
 #include <stdexcept>
 
-#include <gtest/gtest.h>
+#include <gmock/gmock.h>
+
+#include "agent/StandardObjects.h"
 
 namespace kvloamd {
 namespace {
@@ -23,6 +25,7 @@ using std::chrono::milliseconds;
 constexpr std::chrono::seconds kTestPatience{60};
 
 Oid const kRoot{1, 3, 6, 1, 4, 1, 32473, 1, 1};
+Oid const kOtherRoot{1, 3, 6, 1, 2, 1, 10, 18};
 
 struct Packet {
     AgentxHeader header;
@@ -119,7 +122,7 @@ class AgentxSessionTest : public ::testing::Test {
     void startMaster() { m_master.emplace(path()); }
     void startSession(AgentxPace const& pace = patient()) {
         m_session.emplace(
-            *parseAgentxAddress(path()), std::vector<Oid>{kRoot},
+            *parseAgentxAddress(path()), roots(), m_rows,
             [](AgentxHeader const& header, std::string_view) {
                 return agentxResponse(header, AgentxFault::NotWritable);
             },
@@ -161,7 +164,54 @@ class AgentxSessionTest : public ::testing::Test {
 
     std::string path() const { return m_folder + "/master"; }
 
+    std::vector<AgentxRoot> roots() const {
+        std::vector<AgentxRoot> all{{kRoot, "KVL-OAM-MIB", true}};
+        if (m_servesOther) all.push_back({kOtherRoot, "DS1-MIB", false});
+        return all;
+    }
+    /// There are interfaces of these indices, of which ifIndex and ifDescr are known.
+    void haveInterfaces(std::vector<std::uint32_t> const& indices) {
+        m_snapshot.interfaces.interfaces.clear();
+        for (std::uint32_t const index : indices)
+            m_snapshot.interfaces.interfaces.emplace_back().ifIndex = index;
+        m_rows.update({m_snapshot, m_counters}, m_now);
+        if (m_session) m_session->registerRows();
+    }
+    /// What a Register or Unregister packet is about: "2.1000-1003" of ifTable's columns.
+    static std::string rangeOf(Packet const& packet) {
+        AgentxReader reader(packet.payload, true);
+        reader.number16();
+        std::size_t const place = reader.octet();
+        reader.octet();
+        Oid const name = reader.name().name;
+        if (place == 0) return "no range";
+        EXPECT_EQ(place, name.size());
+        EXPECT_EQ(name.size(), 11U);
+        EXPECT_TRUE(startsWith(name, Oid{1, 3, 6, 1, 2, 1, 2, 2, 1}));
+        std::string const text = std::to_string(name[9]) + "." + std::to_string(name[10]) + "-" +
+                                 std::to_string(reader.number());
+        EXPECT_TRUE(reader.atEnd());
+        return text;
+    }
+    /// Grants all that comes until nothing more is asked for; what it was about.
+    std::vector<std::string> grantRanges(AgentxKind kind, std::size_t count) {
+        std::vector<std::string> ranges;
+        for (std::size_t i = 0; i < count; ++i)
+            ranges.push_back(rangeOf(grant(kind)));
+        // What comes after the last is the answer to a question.
+        m_master->say(AgentxWriter(AgentxKind::TestSet, 77, 5, 6).take());
+        EXPECT_EQ(next().header.kind, AgentxKind::Response);
+        return ranges;
+    }
+
     std::string m_folder;
+    std::vector<Table const*> const m_tables = standardTables();
+    ObjectTree const m_tree{standardScalars(), m_tables};
+    Snapshot m_snapshot;
+    Counters m_counters;
+    Clock::time_point m_now = Clock::now();
+    SharedRows m_rows{{{m_tree, kStandardArc, {{{2, 2}, "ifTable", HostHas::Rows}}}}};
+    bool m_servesOther = false;
     std::optional<ScriptedMaster> m_master;
     std::optional<AgentxSession> m_session;
     int m_taken = 0;
@@ -217,6 +267,130 @@ TEST_F(AgentxSessionTest, TriesAgainWhenItsNamesAreRefused) {
     connectSession();
 }
 
+TEST_F(AgentxSessionTest, NamesThatCanBeDoneWithoutMayBeRefused) {
+    m_servesOther = true;
+    startMaster();
+    startSession();
+    grant(AgentxKind::Open);
+    grant(AgentxKind::Register);
+    ::testing::internal::CaptureStderr();
+    m_master->respond(next(), AgentxFault::DuplicateRegistration);
+    EXPECT_TRUE(runUntil([this] { return m_session->isConnected(); }));
+    std::string const told = ::testing::internal::GetCapturedStderr();
+    EXPECT_THAT(told, ::testing::HasSubstr("the SNMP master refuses DS1-MIB: another agent serves "
+                                           "them already; stop it"));
+    // The next master refuses them too, which is no news.
+    m_master->hangUp();
+    ::testing::internal::CaptureStderr();
+    grant(AgentxKind::Open);
+    grant(AgentxKind::Register);
+    m_master->respond(next(), AgentxFault::DuplicateRegistration);
+    EXPECT_TRUE(runUntil([this] { return m_session->isConnected(); }));
+    EXPECT_THAT(::testing::internal::GetCapturedStderr(),
+                ::testing::Not(::testing::HasSubstr("refuses")));
+}
+
+TEST_F(AgentxSessionTest, IsConnectedBeforeTheRowsAreRegistered) {
+    startMaster();
+    haveInterfaces({1000});
+    startSession();
+    connectSession();
+    EXPECT_EQ(rangeOf(next()), "2.1000-1000");
+}
+
+TEST_F(AgentxSessionTest, RowsAreRegisteredOneRangeAfterTheOther) {
+    startMaster();
+    haveInterfaces({1000, 1001, 1016});
+    startSession();
+    connectSession();
+    Packet const first = next();
+    EXPECT_EQ(first.header.kind, AgentxKind::Register);
+    EXPECT_EQ(first.header.session, 77U);
+    // Nothing more comes before the answer, but answers.
+    m_master->say(AgentxWriter(AgentxKind::TestSet, 77, 5, 6).take());
+    EXPECT_EQ(next().header.kind, AgentxKind::Response);
+    EXPECT_FALSE(m_master->receive().has_value());
+    m_master->respond(first);
+    EXPECT_THAT(grantRanges(AgentxKind::Register, 3),
+                ::testing::ElementsAre("2.1000-1001", "1.1016-1016", "1.1000-1001"));
+}
+
+TEST_F(AgentxSessionTest, RowsThatComeLaterAreRegistered) {
+    startMaster();
+    startSession();
+    connectSession();
+    haveInterfaces({1000});
+    EXPECT_THAT(grantRanges(AgentxKind::Register, 2),
+                ::testing::ElementsAre("2.1000-1000", "1.1000-1000"));
+}
+
+TEST_F(AgentxSessionTest, RowsThatHaveLongBeenGoneAreUnregistered) {
+    startMaster();
+    haveInterfaces({1000, 1001});
+    startSession();
+    connectSession();
+    grantRanges(AgentxKind::Register, 2);
+    m_now += SharedRows::kKeep + std::chrono::seconds(1);
+    haveInterfaces({});
+    EXPECT_THAT(grantRanges(AgentxKind::Unregister, 2),
+                ::testing::ElementsAre("2.1000-1001", "1.1000-1001"));
+}
+
+TEST_F(AgentxSessionTest, RefusedRowsLeaveTheRestServed) {
+    startMaster();
+    haveInterfaces({1000, 1016});
+    startSession();
+    connectSession();
+    m_master->respond(next(), AgentxFault::DuplicateRegistration);
+    EXPECT_THAT(grantRanges(AgentxKind::Register, 3),
+                ::testing::ElementsAre("2.1000-1000", "1.1016-1016", "1.1000-1000"));
+    EXPECT_TRUE(m_session->isConnected());
+}
+
+TEST_F(AgentxSessionTest, MasterThatDiesAmidTheRowsIsToldAllAgain) {
+    startMaster();
+    haveInterfaces({1000, 1016});
+    startSession();
+    connectSession();
+    EXPECT_EQ(rangeOf(grant(AgentxKind::Register)), "2.1016-1016");
+    EXPECT_EQ(rangeOf(next()), "2.1000-1000");
+    m_master->hangUp();
+    EXPECT_TRUE(runUntil([this] { return !m_session->isConnected(); }));
+    connectSession();
+    EXPECT_THAT(grantRanges(AgentxKind::Register, 4),
+                ::testing::ElementsAre("2.1016-1016", "2.1000-1000", "1.1016-1016", "1.1000-1000"));
+}
+
+TEST_F(AgentxSessionTest, MasterThatHangsAmidTheRowsGoesOnWithThem) {
+    startMaster();
+    AgentxPace pace = patient();
+    pace.patience = milliseconds(20);
+    haveInterfaces({1000});
+    startSession(pace);
+    connectSession();
+    Packet const packet = next();
+    EXPECT_TRUE(runUntil([this] { return !m_session->isConnected(); }));
+    m_master->respond(packet);
+    EXPECT_TRUE(runUntil([this] { return m_session->isConnected(); }));
+    EXPECT_THAT(grantRanges(AgentxKind::Register, 1), ::testing::ElementsAre("1.1000-1000"));
+}
+
+TEST_F(AgentxSessionTest, NotificationGoesOutAmidTheRows) {
+    startMaster();
+    haveInterfaces({1000});
+    startSession();
+    connectSession();
+    Packet const range = next();
+    ASSERT_TRUE(m_session->ready());
+    notify();
+    Packet const packet = next();
+    EXPECT_EQ(packet.header.kind, AgentxKind::Notify);
+    m_master->respond(packet);
+    EXPECT_TRUE(runUntil([this] { return m_taken == 1; }));
+    m_master->respond(range);
+    EXPECT_THAT(grantRanges(AgentxKind::Register, 1), ::testing::ElementsAre("1.1000-1000"));
+}
+
 TEST_F(AgentxSessionTest, RequestIsAnsweredWhateverPiecesItComesIn) {
     startMaster();
     startSession();
@@ -256,6 +430,54 @@ TEST_F(AgentxSessionTest, NotificationIsTakenWhenTheMasterSaysSo) {
     EXPECT_TRUE(m_session->ready());
 }
 
+TEST_F(AgentxSessionTest, NotificationCarriesValuesOfEveryType) {
+    startMaster();
+    startSession();
+    connectSession();
+    Oid const name{1, 3, 6, 1, 4, 1, 32473, 9};
+    std::string const bits("\xa0\x00", 2);
+    m_session->send({joined(kRoot, Oid{0, 1}),
+                     {{name, ValueType::Integer, std::int64_t{-5}},
+                      {name, ValueType::TimeTicks, std::int64_t{4294967295}},
+                      {name, ValueType::Counter64, std::int64_t{1} << 40},
+                      {name, ValueType::Text, std::string("text")},
+                      {name, ValueType::Octets, bits},
+                      {name, ValueType::ObjectId, kOtherRoot}},
+                     Clock::now()},
+                    [] {});
+    Packet const packet = next();
+    AgentxReader reader(packet.payload, true);
+    auto const head = [&](unsigned type, Oid const& of) {
+        EXPECT_EQ(reader.number16(), type);
+        reader.number16();
+        EXPECT_EQ(reader.name().name, of);
+    };
+    auto const octets = [&] {
+        std::string text(reader.number(), '\0');
+        for (std::size_t i = 0; i < (text.size() + 3) / 4 * 4; ++i) {
+            auto const octet = static_cast<char>(reader.octet());
+            if (i < text.size()) text[i] = octet;
+        }
+        return text;
+    };
+    head(6, {1, 3, 6, 1, 6, 3, 1, 1, 4, 1, 0});
+    EXPECT_EQ(reader.name().name, joined(kRoot, Oid{0, 1}));
+    head(2, name);
+    EXPECT_EQ(reader.number(), 0xfffffffb);
+    head(67, name);
+    EXPECT_EQ(reader.number(), 0xffffffff);
+    head(70, name);
+    EXPECT_EQ(reader.number(), 256U);
+    EXPECT_EQ(reader.number(), 0U);
+    head(4, name);
+    EXPECT_EQ(octets(), "text");
+    head(4, name);
+    EXPECT_EQ(octets(), bits);
+    head(6, name);
+    EXPECT_EQ(reader.name().name, kOtherRoot);
+    EXPECT_TRUE(reader.atEnd());
+}
+
 TEST_F(AgentxSessionTest, NotificationOfALostConnectionIsNotTaken) {
     startMaster();
     startSession();
@@ -268,6 +490,25 @@ TEST_F(AgentxSessionTest, NotificationOfALostConnectionIsNotTaken) {
     connectSession();
     EXPECT_TRUE(m_session->ready());
     EXPECT_EQ(m_taken, 0);
+}
+
+TEST_F(AgentxSessionTest, LossesOfAMasterThatWasConnectedAreCounted) {
+    startMaster();
+    startSession();
+    connectSession();
+    EXPECT_EQ(m_session->timesLost(), 0U);
+    m_master->hangUp();
+    EXPECT_TRUE(runUntil([this] { return !m_session->isConnected(); }));
+    EXPECT_EQ(m_session->timesLost(), 1U);
+}
+
+TEST_F(AgentxSessionTest, MasterThatWasNeverConnectedIsNotLost) {
+    startMaster();
+    startSession();
+    EXPECT_EQ(next().header.kind, AgentxKind::Open);
+    m_master->hangUp();
+    EXPECT_TRUE(runUntil([this] { return m_session->descriptor() < 0; }));
+    EXPECT_EQ(m_session->timesLost(), 0U);
 }
 
 TEST_F(AgentxSessionTest, RefusedNotificationIsNotSentAgain) {
@@ -349,9 +590,8 @@ TEST_F(AgentxSessionTest, RefusedConnectionOfTheNetworkIsTriedAgain) {
     ASSERT_EQ(bind(bound, reinterpret_cast<sockaddr*>(&address), size), 0);
     ASSERT_EQ(getsockname(bound, reinterpret_cast<sockaddr*>(&address), &size), 0);
     m_session.emplace(
-        *parseAgentxAddress("tcp:" + std::to_string(ntohs(address.sin_port))),
-        std::vector<Oid>{kRoot}, [](AgentxHeader const&, std::string_view) { return ""; },
-        patient());
+        *parseAgentxAddress("tcp:" + std::to_string(ntohs(address.sin_port))), roots(), m_rows,
+        [](AgentxHeader const&, std::string_view) { return ""; }, patient());
     EXPECT_TRUE(runUntil([this] { return m_session->descriptor() < 0; }));
     ASSERT_EQ(listen(bound, 1), 0);
     int accepted = -1;

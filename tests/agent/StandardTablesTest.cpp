@@ -52,8 +52,8 @@ class StandardTablesTest : public ::testing::Test {
 
 TEST_F(StandardTablesTest, EveryTableIsBelowAPlaceThatIsServed) {
     for (Table const* const table : m_tables)
-        EXPECT_TRUE(std::ranges::any_of(kStandardPlaces, [&](Oid const& place) {
-            return startsWith(table->entry(), place);
+        EXPECT_TRUE(std::ranges::any_of(kStandardPlaces, [&](Place const& place) {
+            return startsWith(table->entry(), place.place);
         })) << table->name();
 }
 

@@ -49,6 +49,24 @@ TEST_F(MasterAwayTest, NotificationGoesThroughTheMaster) {
     EXPECT_EQ(count(trapReceiver().output(), "kvlBoardStatusChange"), 1);
 }
 
+TEST_F(MasterAwayTest, LineThatIsCutIsToldThroughTheMaster) {
+    startTrapReceiver("authCommunity log public\n");
+    configureMaster("rwcommunity private 127.0.0.1\ntrap2sink " + trapAddress() + " public\n");
+    startMaster();
+    startSubagent();
+    ASSERT_TRUE(isConnected()) << agent().output();
+    Result const set = snmp("snmpset", {"-v2c", "-c", "private", "-t", "30", address(),
+                                        "1.3.6.1.2.1.10.18.6.1.17.1000", "i", "1"});
+    ASSERT_EQ(set.status, 0) << set.output;
+    sim({"line", "alarm", "101", "los"});
+    EXPECT_TRUE(trapReceiver().waitFor("1.1.4.1.0 = SNMPv2-SMI::mib-2.10.18.15.0.1\tSNMPv2-SMI::"
+                                       "mib-2.10.18.6.1.10.1000 = 68\t"))
+        << trapReceiver().output();
+    EXPECT_TRUE(trapReceiver().waitFor("1.1.4.1.0 = SNMPv2-SMI::snmpModules.1.1.5.3\tSNMPv2-SMI::"
+                                       "mib-2.2.2.1.1.1000 = 1000\t"))
+        << trapReceiver().output();
+}
+
 TEST_F(MasterAwayTest, TableShowsTheChangeWhenItsNotificationArrives) {
     start();
     sim({"stop", "1"});
@@ -65,6 +83,26 @@ TEST_F(MasterAwayTest, MasterThatIsKilledAndComesBackServesAgain) {
     EXPECT_EQ(get("kvlBoardCount.0"), "Gauge32: 3 boards");
     EXPECT_EQ(stopAgent(), 0) << agent().output();
     EXPECT_THAT(statesTold(), ElementsAre("connected", "lost", "connected"));
+}
+
+TEST_F(MasterAwayTest, LossesOfTheMasterAreCounted) {
+    start();
+    EXPECT_EQ(get("kvlAgentFront.0"), "INTEGER: subagent(2)");
+    EXPECT_EQ(get("kvlMasterState.0"), "INTEGER: connected(1)");
+    EXPECT_EQ(get("kvlMasterLosses.0"), "Counter32: 0 times");
+    killMaster();
+    ASSERT_TRUE(isLost()) << agent().output();
+    startMaster();
+    ASSERT_TRUE(isConnected(2)) << agent().output();
+    EXPECT_EQ(get("kvlMasterLosses.0"), "Counter32: 1 times");
+}
+
+TEST_F(MasterAwayTest, FaultIsAnnouncedThroughTheMaster) {
+    start();
+    sim({"fault", "2", "17"});
+    EXPECT_TRUE(trapReceiver().waitFor("\tKVL-OAM-MIB::kvlNotifyFaultValue.0 = 17\t"))
+        << trapReceiver().output();
+    EXPECT_EQ(get("kvlFaultTimesRaised.2.17"), "Counter32: 1 times");
 }
 
 TEST_F(MasterAwayTest, MasterThatRestartsFiveTimesQuicklyServesInTheEnd) {

@@ -15,8 +15,11 @@ MasterFixture::MasterFixture()
 MasterFixture::~MasterFixture() = default;
 
 void MasterFixture::startMaster() {
+    // A line a request would fill the pipe of its output.
     write(path("snmpd.conf"), "master agentx\nagentXSocket " + m_address +
-                                  "\nrocommunity public 127.0.0.1\n" + m_config);
+                                  "\ndontLogTCPWrappersConnects yes\n"
+                                  "rocommunity public 127.0.0.1\n" +
+                                  m_config);
     Process::Environment variables = environment();
     variables["SNMP_PERSISTENT_DIR"] = path("master");
     variables["MIBS"] = "";
@@ -33,9 +36,10 @@ void MasterFixture::killMaster() {
     master().wait();
 }
 
-void MasterFixture::startSubagent() {
+void MasterFixture::startSubagent(int boards) {
     launchAgent({"--agentx", m_address, "--module", "z7sim", "--module-dir", moduleDirectory()});
-    ASSERT_TRUE(agent().waitFor("kvloamd: serving 3 boards through the SNMP master"))
+    ASSERT_TRUE(agent().waitFor("kvloamd: serving " + std::to_string(boards) +
+                                " boards through the SNMP master"))
         << agent().output();
 }
 

@@ -29,8 +29,9 @@ class MasterFixture : public AgentFixture {
     /// Where subagents reach masters started later.
     void useMasterAddress(std::string const& address) { m_address = address; }
 
-    /// Starts the agent as a subagent; waits until it serves, which needs no master.
-    void startSubagent();
+    /// Starts the agent as a subagent; waits until it serves that many boards, which needs no
+    /// master.
+    void startSubagent(int boards = 3);
     /// Waits until the agent has said `times` times that it is connected.
     bool isConnected(int times = 1) {
         return agent().waitFor("kvloamd: connected to the SNMP master", times);
