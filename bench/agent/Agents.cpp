@@ -32,7 +32,7 @@ void serveFrom(Front& front, Oid const& arc,
                std::function<std::shared_ptr<Snapshot const>()> const& takeSnapshot) {
     std::vector<Table const*> const tables = standardTables();
     ObjectTree const tree(standardScalars(), tables);
-    Counters const counters;
+    Counters counters;
     Settings settings;
     front.serve({{{tree, arc, {{kOurPlace, "the intervals"}}}},
                  counters,
