@@ -13,6 +13,8 @@ constexpr std::uint8_t kVersion = 1;
 constexpr std::uint8_t kHasContext = 0x08;
 constexpr std::uint8_t kNetworkOrder = 0x10;
 constexpr std::size_t kLengthAt = 16;
+/// Of packets that are written in one piece.
+constexpr std::size_t kUsualSize = 512;
 
 /// A name that begins so, with a number of one octet after it, is written without its beginning.
 constexpr std::array<std::uint32_t, 4> kInternet{1, 3, 6, 1};
@@ -107,6 +109,7 @@ AgentxName AgentxReader::name() {
     std::uint32_t const prefix = octet();
     result.include = octet() != 0;
     octet();
+    result.name.reserve(kInternet.size() + 1 + count);
     if (prefix != 0) {
         result.name.assign(kInternet.begin(), kInternet.end());
         result.name.push_back(prefix);
@@ -154,6 +157,7 @@ AgentxVariable AgentxReader::variable() {
 
 AgentxWriter::AgentxWriter(AgentxKind kind, std::uint32_t session, std::uint32_t transaction,
                            std::uint32_t packet) {
+    m_octets.reserve(kUsualSize);
     octet(kVersion);
     octet(static_cast<std::uint8_t>(kind));
     octet(kNetworkOrder);

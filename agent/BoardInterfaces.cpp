@@ -56,7 +56,8 @@ std::optional<std::uint32_t> unsignedNumber(int answer) {
 
 class Reading {
   public:
-    explicit Reading(ToTicks const& toTicks) : m_toTicks(toTicks) {}
+    Reading(ToTicks const& toTicks, LineHistories& histories)
+        : m_toTicks(toTicks), m_histories(histories) {}
 
     void readLines(DS1LineFeature& feature);
     void readChannels(ISDNFeature& feature);
@@ -80,6 +81,7 @@ class Reading {
     std::uint32_t findLine(std::string const& name) const;
 
     ToTicks const& m_toTicks;
+    LineHistories& m_histories;
     BoardInterfaces m_found;
     std::set<IndexKey> m_taken;
     std::map<IndexKind, int> m_nameless;
@@ -125,38 +127,6 @@ void Reading::readInterface(KVL::Interface& interface, InterfaceRow& row) const 
         unsignedNumber(interface.GetOutErrors())};
 }
 
-/// Interval `n`; 0 is the running one.
-LineCounts readInterval(DS1IntervalTable& table, int n) {
-    return {table.GetErrorSeconds(n),
-            table.GetSeverelyErrorSeconds(n),
-            table.GetSeverelyErrorFramingSeconds(n),
-            table.GetUnavailableSeconds(n),
-            table.GetControlledSlipSeconds(n),
-            table.GetPathCodingViolations(n),
-            table.GetLineErrorSeconds(n),
-            table.GetBurstyErrorSeconds(n),
-            table.GetDegradedMinutes(n),
-            table.GetLineCodeViolations(n)};
-}
-
-void readHistory(DS1IntervalTable& table, LineRow& row) {
-    // The running interval lasts 900 seconds for the moment in which it is closed.
-    row.timeElapsed = std::clamp(table.GetTimeElapsed(), 0, DS1IntervalTable::kIntervalLength - 1);
-    int const closed = std::clamp(table.GetValidIntervals(), 0, DS1IntervalTable::kIntervals);
-    row.intervals.reserve(static_cast<std::size_t>(closed) + 1);
-    for (int n = 0; n <= closed; ++n)
-        row.intervals.push_back(readInterval(table, n));
-    for (std::size_t counter = 0; counter < row.total.size(); ++counter)
-        for (std::size_t n = 1; n < row.intervals.size(); ++n) {
-            std::int32_t const count = row.intervals[n][counter];
-            // What one interval does not know, the sum does not.
-            if (count < 0 || row.total[counter] < 0)
-                row.total[counter] = KVL::kNotSupported;
-            else
-                row.total[counter] += count;
-        }
-}
-
 void Reading::readLine(DS1LineDevice& line) {
     std::string const name = text(line, &DS1LineDevice::GetName);
     LineRow row;
@@ -185,8 +155,8 @@ void Reading::readLine(DS1LineDevice& line) {
     row.channelization = unlessNegative(line.GetChannelization());
     row.lineMode = unlessNegative(line.GetLineMode());
     row.lineBuildOut = unlessNegative(line.GetLineBuildOut());
-    auto const table = line.GetIntervalTable();
-    if (DS1IntervalTable* const history = table.get()) readHistory(*history, row);
+    auto const history = line.GetIntervalTable();
+    if (history.get() != nullptr) m_histories.read(history, row);
     m_lines.emplace(name, row.ifIndex);
     m_lines.emplace(row.circuitIdentifier, row.ifIndex);
     m_found.rows.lines.push_back(std::move(row));
@@ -309,8 +279,8 @@ void Reading::readOthers(KVL::InterfaceFeature& feature) {
 
 } // namespace
 
-BoardInterfaces readInterfaces(Board& board, ToTicks const& toTicks) {
-    Reading reading(toTicks);
+BoardInterfaces readInterfaces(Board& board, ToTicks const& toTicks, LineHistories& histories) {
+    Reading reading(toTicks, histories);
     forEachFeature<DS1LineFeature>(board, [&](auto& feature) { reading.readLines(feature); });
     forEachFeature<ISDNFeature>(board, [&](auto& feature) { reading.readChannels(feature); });
     forEachFeature<KVL::EthernetFeature>(board,

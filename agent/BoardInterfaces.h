@@ -7,6 +7,7 @@
 
 #include "agent/IndexFile.h"
 #include "agent/InterfaceRows.h"
+#include "agent/LineHistories.h"
 #include "board/Board.h"
 #include "board/DS1LineDevice.h"
 #include "core/ReferenceCounter.h"
@@ -26,6 +27,6 @@ using ToTicks = std::function<std::uint32_t(long)>;
 
 /// Asks the board's features for all that they hold: lines first, then channels, Ethernet
 /// interfaces and IP interfaces.
-BoardInterfaces readInterfaces(Board& board, ToTicks const& toTicks);
+BoardInterfaces readInterfaces(Board& board, ToTicks const& toTicks, LineHistories& histories);
 
 } // namespace kvloamd

@@ -1,10 +1,21 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/Collector.h"
 
+#include <sys/resource.h>
+#include <unistd.h>
+
 #include <algorithm>
 #include <utility>
 
 namespace kvloamd {
+
+namespace {
+
+/// A request that comes while boards are read has the processor at once, should there be one only.
+/// Not the least: where others keep all processors busy, boards are still read.
+constexpr int kNiceness = 15;
+
+} // namespace
 
 Collector::Collector(ReadRows readRows, Clock::time_point started, std::function<void()> renewed,
                      CollectorPace pace)
@@ -56,6 +67,8 @@ void Collector::renew() {
 }
 
 void Collector::begin(std::promise<void> first) {
+    // Of this thread only. Without it, everything works, with some requests a few ms later.
+    setpriority(PRIO_PROCESS, static_cast<id_t>(gettid()), kNiceness);
     try {
         m_snapshot = collect(nullptr);
     } catch (...) {
@@ -67,6 +80,9 @@ void Collector::begin(std::promise<void> first) {
 }
 
 void Collector::run() {
+    // Goes once there is a newer one, when no request uses it any more: giving all its rows back
+    // takes a while, which is no request's to spend.
+    std::shared_ptr<Snapshot const> former;
     std::unique_lock lock(m_mutex);
     while (!m_stop) {
         m_wake.wait_until(lock, m_snapshot->begun + m_pace.idle,
@@ -84,7 +100,7 @@ void Collector::run() {
         lock.lock();
         m_snapshot.swap(snapshot);
         lock.unlock();
-        snapshot.reset();
+        former = std::move(snapshot);
         m_renewed();
         lock.lock();
     }

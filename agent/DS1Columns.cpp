@@ -19,7 +19,7 @@ Value index(LineRow const& row) {
 }
 
 Value validIntervals(LineRow const& row) {
-    return row.intervals.empty() ? Value{} : static_cast<std::int64_t>(row.closedIntervals());
+    return row.keepsHistory() ? static_cast<std::int64_t>(row.closedIntervals()) : Value{};
 }
 
 /// The oldest record of a full history is cleared for the interval to come: it counts, but says
@@ -29,7 +29,7 @@ bool isValid(std::size_t interval) {
 }
 
 Value invalidIntervals(LineRow const& row) {
-    if (row.intervals.empty()) return {};
+    if (!row.keepsHistory()) return {};
     return std::int64_t{isValid(row.closedIntervals()) ? 0 : 1};
 }
 
@@ -39,12 +39,12 @@ Value countValue(std::int32_t count) {
 
 template <std::size_t Counter>
 Value current(LineRow const& row) {
-    return row.intervals.empty() ? Value{} : countValue(row.intervals.front()[Counter]);
+    return row.keepsHistory() ? countValue(row.running[Counter]) : Value{};
 }
 
 template <std::size_t Counter>
 Value total(LineRow const& row) {
-    return row.intervals.empty() ? Value{} : countValue(row.total[Counter]);
+    return row.keepsHistory() ? countValue(row.closed->total[Counter]) : Value{};
 }
 
 using enum ValueType;
@@ -79,7 +79,7 @@ constexpr Column<Row> kConfigColumns[] = {
 
 constexpr Column<Row> kCurrentColumns[] = {
     {"dsx1CurrentIndex", 1, Integer,
-     [](Row const& row) { return row.intervals.empty() ? Value{} : index(row); }},
+     [](Row const& row) { return row.keepsHistory() ? index(row) : Value{}; }},
     {"dsx1CurrentESs", 2, Gauge, current<0>},
     {"dsx1CurrentSESs", 3, Gauge, current<1>},
     {"dsx1CurrentSEFSs", 4, Gauge, current<2>},
@@ -94,7 +94,7 @@ constexpr Column<Row> kCurrentColumns[] = {
 
 constexpr Column<Row> kTotalColumns[] = {
     {"dsx1TotalIndex", 1, Integer,
-     [](Row const& row) { return row.intervals.empty() ? Value{} : index(row); }},
+     [](Row const& row) { return row.keepsHistory() ? index(row) : Value{}; }},
     {"dsx1TotalESs", 2, Gauge, total<0>},
     {"dsx1TotalSESs", 3, Gauge, total<1>},
     {"dsx1TotalSEFSs", 4, Gauge, total<2>},
@@ -158,7 +158,7 @@ class IntervalTable final : public Table {
         if (column == 0) return std::int64_t{place.line.ifIndex};
         if (column == 1) return static_cast<std::int64_t>(place.interval);
         if (column == kValidData) return isValid(place.interval) ? kTrue : kFalse;
-        return countValue(place.line.intervals[place.interval][column - kFirstCounter]);
+        return countValue(place.line.closed->counts[place.interval - 1][column - kFirstCounter]);
     }
 
   private:

@@ -2,8 +2,10 @@
 #include "agent/InterfaceReader.h"
 
 #include <algorithm>
+#include <functional>
 #include <iterator>
 #include <set>
+#include <unordered_set>
 #include <utility>
 
 namespace kvloamd {
@@ -24,9 +26,10 @@ void moveRows(std::vector<Row>& all, std::vector<Row>& rows,
     }
 }
 
-template <class Row>
-void sortByIndex(std::vector<Row>& rows) {
-    std::ranges::sort(rows, {}, &Row::ifIndex);
+/// Rows mostly come in order: boards do, and so do the indices that they were given.
+template <class Row, class Index = std::identity>
+void sortBy(std::vector<Row>& rows, Index index = {}) {
+    if (!std::ranges::is_sorted(rows, {}, index)) std::ranges::sort(rows, {}, index);
 }
 
 /// Each interface and what is below it, with nothing above the topmost and below the lowest.
@@ -37,14 +40,15 @@ void completeStack(InterfaceRows& all) {
         higher.insert(row.higher);
         lower.insert(row.lower);
     }
+    for (InterfaceRow const& row : all.interfaces)
+        if (!lower.contains(row.ifIndex)) all.stack.push_back({0, row.ifIndex});
     for (InterfaceRow& row : all.interfaces) {
         bool const stacked = higher.contains(row.ifIndex);
-        if (!lower.contains(row.ifIndex)) all.stack.push_back({0, row.ifIndex});
         if (!stacked) all.stack.push_back({row.ifIndex, 0});
         // One broken line is told of once, not once more for each of its channels.
         row.linkUpDownTraps = stacked ? kDisabled : kEnabled;
     }
-    std::ranges::sort(all.stack);
+    sortBy(all.stack);
 }
 
 } // namespace
@@ -55,9 +59,14 @@ InterfaceReader::InterfaceReader(BoardManager& manager, StableIndices& indices,
 
 InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     InterfaceRows all;
+    // Hardly ever do interfaces come or go.
+    all.interfaces.reserve(m_formerIndices.size());
+    all.lines.reserve(m_formerLines);
+    all.stack.reserve(m_formerStack.size());
     m_lines.clear();
     for (auto& [index, counted] : m_counted)
         counted.present = false;
+    m_histories.begin(Clock::now());
     ToTicks const toTicks = [this](long seconds) { return m_uptime.of(seconds); };
     std::vector<std::string> const names = keptNames(boards);
     for (std::size_t i = 0; i < boards.size(); ++i) {
@@ -65,18 +74,18 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
         auto const board = m_manager.GetBoardByIndex(static_cast<int>(boardIndex));
         Board* const asked = board.get();
         if (asked == nullptr) continue;
-        BoardInterfaces found = readInterfaces(*asked, toTicks);
+        BoardInterfaces found = readInterfaces(*asked, toTicks, m_histories);
         auto const indices = m_indices.indicesOf(names[i], found.keys);
         append(all, std::move(found), indices, boardIndex);
     }
     m_indices.save();
     std::erase_if(m_counted, [](auto const& entry) { return !entry.second.present; });
-    sortByIndex(all.interfaces);
-    sortByIndex(all.lines);
-    sortByIndex(all.bearers);
-    sortByIndex(all.signalling);
-    sortByIndex(all.ethernets);
-    sortByIndex(all.ports);
+    sortBy(all.interfaces, &InterfaceRow::ifIndex);
+    sortBy(all.lines, &LineRow::ifIndex);
+    sortBy(all.bearers, &BearerRow::ifIndex);
+    sortBy(all.signalling, &SignallingRow::ifIndex);
+    sortBy(all.ethernets, &EthernetRow::ifIndex);
+    sortBy(all.ports, &PortRow::ifIndex);
     completeStack(all);
     std::size_t before = 0;
     for (LineRow& line : all.lines) {
@@ -139,6 +148,7 @@ void InterfaceReader::noteChanges(InterfaceRows& all) {
     if (m_read && all.stack != m_formerStack) m_stackLastChange = m_uptime.now();
     m_formerIndices = std::move(indices);
     m_formerStack = all.stack;
+    m_formerLines = all.lines.size();
     all.lastChange = m_lastChange;
     all.stackLastChange = m_stackLastChange;
 }

@@ -3,8 +3,8 @@
 #pragma once
 
 #include <cstdint>
-#include <map>
 #include <string>
+#include <unordered_map>
 #include <utility>
 #include <vector>
 
@@ -56,11 +56,13 @@ class InterfaceReader {
     BoardManager& m_manager;
     StableIndices& m_indices;
     Uptime const m_uptime;
+    LineHistories m_histories;
     std::vector<PlacedLine> m_lines;
-    std::map<std::uint32_t, Counted> m_counted;
+    std::unordered_map<std::uint32_t, Counted> m_counted; ///< by ifIndex
     bool m_read = false;
     std::vector<std::uint32_t> m_formerIndices;
     std::vector<StackRow> m_formerStack;
+    std::size_t m_formerLines = 0;
     std::uint32_t m_lastChange = 0;
     std::uint32_t m_stackLastChange = 0;
 };

@@ -4,6 +4,7 @@
 
 #include <array>
 #include <cstdint>
+#include <memory>
 #include <optional>
 #include <string>
 #include <vector>
@@ -65,6 +66,12 @@ struct StackRow {
 /// The counters of a line's interval, in the order of DS1-MIB's tables; negative: not known.
 using LineCounts = std::array<std::int32_t, 10>;
 
+/// Never changed once a row has them: snapshots share them.
+struct ClosedIntervals {
+    std::vector<LineCounts> counts; ///< from the newest
+    LineCounts total{};             ///< of all of them
+};
+
 struct LineRow {
     std::uint32_t ifIndex = 0;
     std::optional<int> lineType;
@@ -85,14 +92,13 @@ struct LineRow {
     std::optional<int> lineMode;
     std::optional<int> lineBuildOut;
 
-    std::optional<int> timeElapsed; ///< of the running interval, in seconds
-    /// By the number of the interval: the running one, then the closed ones from the newest. Empty
-    /// when the line keeps no history.
-    std::vector<LineCounts> intervals;
-    LineCounts total{};              ///< of the closed intervals
-    std::size_t intervalsBefore = 0; ///< closed ones of all lines before this one
+    std::optional<int> timeElapsed;                ///< of the running interval, in seconds
+    LineCounts running{};                          ///< good when the line keeps a history
+    std::shared_ptr<ClosedIntervals const> closed; ///< none: the line keeps no history
+    std::size_t intervalsBefore = 0;               ///< closed ones of all lines before this one
 
-    std::size_t closedIntervals() const { return intervals.empty() ? 0 : intervals.size() - 1; }
+    bool keepsHistory() const { return closed != nullptr; }
+    std::size_t closedIntervals() const { return keepsHistory() ? closed->counts.size() : 0; }
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
 };
 

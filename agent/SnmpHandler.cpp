@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <limits>
+#include <span>
 #include <utility>
 
 // The SNMP library's headers build on each other.
@@ -135,14 +136,18 @@ Snapshot const& SnmpHandler::Call::snapshotOf(SnmpHandler const& handler,
 
 Oid SnmpHandler::Call::relative(netsnmp_variable_list const* variable, bool& orEqual) const {
     Oid const& arc = handler.m_arc;
-    Oid asked(variable->name_length);
-    std::transform(
-        variable->name, variable->name + variable->name_length, asked.begin(),
-        [](oid number) { return static_cast<std::uint32_t>(std::min(number, kHighest)); });
-    if (startsWith(asked, arc))
-        return {asked.begin() + static_cast<std::ptrdiff_t>(arc.size()), asked.end()};
+    std::span<oid const> const asked(variable->name, variable->name_length);
+    auto const [differs, differsFrom] = std::ranges::mismatch(asked, arc);
+    if (differsFrom == arc.end()) {
+        Oid rest(static_cast<std::size_t>(asked.end() - differs));
+        std::transform(differs, asked.end(), rest.begin(), [](oid number) {
+            return static_cast<std::uint32_t>(std::min(number, kHighest));
+        });
+        return rest;
+    }
     orEqual = true;
-    return std::is_lt(compare(asked, arc)) ? Oid{} : Oid{static_cast<std::uint32_t>(kHighest)};
+    bool const before = differs == asked.end() || *differs < *differsFrom;
+    return before ? Oid{} : Oid{static_cast<std::uint32_t>(kHighest)};
 }
 
 void SnmpHandler::Call::get(netsnmp_request_info* request) {
@@ -245,8 +250,9 @@ SnmpHandler::SnmpHandler(ObjectTree const& tree, Counters const& counters, Oid a
 bool SnmpHandler::serve(Oid const& place) {
     std::vector<oid> root(m_arc.begin(), m_arc.end());
     root.insert(root.end(), place.begin(), place.end());
-    netsnmp_handler_registration* const registration = netsnmp_create_handler_registration(
-        "kvloam", &Call::answer, root.data(), root.size(), HANDLER_CAN_RWRITE);
+    netsnmp_handler_registration* const registration =
+        netsnmp_create_handler_registration("kvloam", &Call::answer, root.data(), root.size(),
+                                            HANDLER_CAN_RWRITE | HANDLER_CAN_GETBULK);
     if (registration == nullptr) return false;
     registration->handler->myvoid = this;
     return netsnmp_register_handler(registration) == MIB_REGISTERED_OK;

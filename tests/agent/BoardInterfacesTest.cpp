@@ -28,7 +28,7 @@ class BoardInterfacesTest : public ::testing::Test {
         line.history = ReferenceCounter<DS1IntervalTable>(history);
         return *history;
     }
-    InterfaceRows read() { return readInterfaces(*m_board.get(), m_toTicks).rows; }
+    InterfaceRows read() { return readInterfaces(*m_board.get(), m_toTicks, m_histories).rows; }
     LineRow readLine() {
         auto rows = read();
         EXPECT_THAT(rows.lines, SizeIs(1));
@@ -36,13 +36,14 @@ class BoardInterfacesTest : public ::testing::Test {
     }
 
     ToTicks const m_toTicks = [](long seconds) { return static_cast<std::uint32_t>(seconds); };
+    LineHistories m_histories;
     ReferenceCounter<Board> m_board{new FakeBoard};
 };
 
 TEST_F(BoardInterfacesTest, LinesAreReadOnceThoughTheyAreInterfacesToo) {
     addLine("one");
     addLine("two");
-    auto const found = readInterfaces(*m_board.get(), m_toTicks);
+    auto const found = readInterfaces(*m_board.get(), m_toTicks, m_histories);
     EXPECT_THAT(found.keys,
                 ElementsAre(IndexKey{IndexKind::Line, "one"}, IndexKey{IndexKind::Line, "two"}));
     EXPECT_THAT(found.rows.interfaces, SizeIs(2));
@@ -62,7 +63,7 @@ TEST_F(BoardInterfacesTest, LinesOfOneNameAreToldApart) {
     addLine("same");
     addLine("same");
     EXPECT_THAT(
-        readInterfaces(*m_board.get(), m_toTicks).keys,
+        readInterfaces(*m_board.get(), m_toTicks, m_histories).keys,
         ElementsAre(IndexKey{IndexKind::Line, "same"}, IndexKey{IndexKind::Line, "same#2"}));
 }
 
@@ -73,7 +74,7 @@ TEST_F(BoardInterfacesTest, WhatALineDoesNotSupportIsNotKnown) {
     EXPECT_EQ(line.lineLength, std::nullopt);
     EXPECT_EQ(line.statusLastChange, std::nullopt);
     EXPECT_EQ(line.timeElapsed, std::nullopt);
-    EXPECT_THAT(line.intervals, IsEmpty());
+    EXPECT_FALSE(line.keepsHistory());
 }
 
 TEST_F(BoardInterfacesTest, HistoryIsReadFromTheRunningIntervalBackwards) {
@@ -83,11 +84,10 @@ TEST_F(BoardInterfacesTest, HistoryIsReadFromTheRunningIntervalBackwards) {
     history.run(1, 300);
     LineRow const line = readLine();
     EXPECT_EQ(line.timeElapsed, 300);
-    ASSERT_THAT(line.intervals, SizeIs(3));
-    EXPECT_EQ(line.closedIntervals(), 2U);
-    EXPECT_EQ(line.intervals[0][0], 1);
-    EXPECT_EQ(line.intervals[1][0], 7);
-    EXPECT_EQ(line.intervals[2][0], 5);
+    ASSERT_EQ(line.closedIntervals(), 2U);
+    EXPECT_EQ(line.running[0], 1);
+    EXPECT_EQ(line.closed->counts[0][0], 7);
+    EXPECT_EQ(line.closed->counts[1][0], 5);
 }
 
 TEST_F(BoardInterfacesTest, TotalLeavesOutTheRunningInterval) {
@@ -95,7 +95,7 @@ TEST_F(BoardInterfacesTest, TotalLeavesOutTheRunningInterval) {
     history.close(5);
     history.close(7);
     history.run(100, 300);
-    EXPECT_EQ(readLine().total[0], 12);
+    EXPECT_EQ(readLine().closed->total[0], 12);
 }
 
 TEST_F(BoardInterfacesTest, TotalOfWhatIsNotSupportedIsNotKnown) {
@@ -104,8 +104,8 @@ TEST_F(BoardInterfacesTest, TotalOfWhatIsNotSupportedIsNotKnown) {
     history.close(5);
     history.close(7);
     LineRow const line = readLine();
-    EXPECT_LT(line.total[8], 0);
-    EXPECT_EQ(line.total[0], 12);
+    EXPECT_LT(line.closed->total[8], 0);
+    EXPECT_EQ(line.closed->total[0], 12);
 }
 
 TEST_F(BoardInterfacesTest, IntervalThatIsAboutToBeClosedHasLasted899Seconds) {

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstring>
+#include <memory>
 #include <string>
 #include <utility>
 #include <vector>
@@ -18,6 +19,7 @@ class FakeHistory final : public DS1IntervalTable {
     FakeHistory() { ActionScheduler_pthread::GetScheduler()->Remove(this); }
 
     bool knowsDegradedMinutes = true;
+    std::shared_ptr<int> const alive = std::make_shared<int>(); ///< ends with the table
 
     int GetControlledSlipSeconds(int n) override { return interval(n)->ControlledSlipSeconds; }
     int GetDegradedMinutes(int n) override {
@@ -34,6 +36,8 @@ class FakeHistory final : public DS1IntervalTable {
         closed.DegradedMinutes = errorSeconds;
         ArchiveInterval(closed);
     }
+    /// Corrects the interval that was closed last.
+    void correctNewest(int errorSeconds) { interval(1)->ErrorSeconds = errorSeconds; }
     /// What the running interval has counted, and for how long.
     void run(int errorSeconds, int timeElapsed) {
         m_current.ErrorSeconds = errorSeconds;

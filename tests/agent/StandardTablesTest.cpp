@@ -17,12 +17,17 @@ class StandardTablesTest : public ::testing::Test {
              {std::pair{10U, 3U}, std::pair{20U, 0U}, std::pair{30U, 97U}, std::pair{40U, 1U}}) {
             LineRow line;
             line.ifIndex = index;
+            auto const closed = std::make_shared<ClosedIntervals>();
             for (std::uint32_t n = 0; n < records; ++n) {
                 LineCounts counts{};
                 for (std::size_t i = 0; i < counts.size(); ++i)
                     counts[i] = static_cast<std::int32_t>(index * 10000 + n * 100 + i);
-                line.intervals.push_back(counts);
+                if (n == 0)
+                    line.running = counts;
+                else
+                    closed->counts.push_back(counts);
             }
+            if (records > 0) line.closed = closed;
             line.intervalsBefore = before;
             before += line.closedIntervals();
             m_snapshot.interfaces.lines.push_back(std::move(line));
@@ -160,7 +165,10 @@ TEST_F(StandardTablesTest, RunningIntervalIsTheFirstRecord) {
 }
 
 TEST_F(StandardTablesTest, CountThatALineDoesNotKnowHasNoInstance) {
-    m_snapshot.interfaces.lines[0].intervals[1][9] = -2;
+    LineRow& line = m_snapshot.interfaces.lines[0];
+    auto const closed = std::make_shared<ClosedIntervals>(*line.closed);
+    closed->counts[0][9] = -2;
+    line.closed = closed;
     EXPECT_EQ(find(with(kLineCodeViolations, {10, 1})), Lookup::NoSuchInstance);
     EXPECT_EQ(find(with(kErroredSeconds, {10, 1})), Lookup::Found);
     EXPECT_EQ(next(kLineCodeViolations), with(kLineCodeViolations, {10, 2}));

@@ -177,7 +177,17 @@ TEST_F(WalkTest, WalksStayInOrderWhileBoardsComeAndGo) {
     std::atomic<bool> done{false};
     std::thread operating([&] {
         for (int round = 0; round < 5; ++round) {
-            sim({"insert", "--handle", "50", "--serial", "COMES" + std::to_string(round)});
+            // Each has a line of its own, and so rows in the standard tables.
+            std::string const number = std::to_string(round);
+            std::string const board = path("board" + number + ".yaml");
+            write(board, "boards:\n"
+                         "  - handle: 50\n"
+                         "    attributes: {SERIAL_NUMBER: COMES" +
+                             number +
+                             "}\n"
+                             "    devices: [{handle: 500, type: 501, attributes: {NAME: line}, "
+                             "line: {type: esf}}]\n");
+            sim({"insert", board});
             sim({"stop", "1"});
             sim({"start", "1"});
             sim({"remove", "50"});
@@ -186,8 +196,8 @@ TEST_F(WalkTest, WalksStayInOrderWhileBoardsComeAndGo) {
     });
     int walks = 0;
     do {
-        auto const single = walk();
-        auto const bulk = answers("snmpbulkwalk", {"-Cr7", kObjects});
+        auto const single = walk("1.3.6.1");
+        auto const bulk = answers("snmpbulkwalk", {"-Cr7", "1.3.6.1"});
         EXPECT_TRUE(isStrictlyIncreasing(single));
         EXPECT_TRUE(isStrictlyIncreasing(bulk));
         for (auto const* const walked : {&single, &bulk})

@@ -1,0 +1,26 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// What a refresh of the agent's snapshot reads of boards and their lines.
+#pragma once
+
+#include <optional>
+
+#include "agent/BoardSource.h"
+#include "agent/InterfaceIndices.h"
+#include "agent/InterfaceReader.h"
+#include "agent/Snapshot.h"
+#include "board/BoardManager.h"
+
+/// Boards of the reference module on the simulated platform, each with four lines that have a full
+/// day behind them. One for a process.
+class BoardRefresh {
+  public:
+    explicit BoardRefresh(int boards);
+
+    void read(kvloamd::Snapshot& snapshot);
+
+  private:
+    ReferenceCounter<BoardManager> m_manager;
+    kvloamd::BoardSource m_source;
+    kvloamd::InterfaceIndices m_indices;
+    kvloamd::InterfaceReader m_interfaces;
+};

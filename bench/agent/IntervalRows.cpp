@@ -1,0 +1,27 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "IntervalRows.h"
+
+#include <memory>
+#include <random>
+
+kvloamd::Snapshot makeIntervals(std::uint32_t lines) {
+    kvloamd::Snapshot snapshot;
+    std::mt19937 random(1);
+    // Counters of all sizes, mostly small.
+    std::exponential_distribution<double> counts(1.0 / 50);
+    std::size_t before = 0;
+    for (std::uint32_t i = 0; i < lines; ++i) {
+        kvloamd::LineRow line;
+        line.ifIndex = kFirstLine + i;
+        auto const closed = std::make_shared<kvloamd::ClosedIntervals>();
+        closed->counts.resize(kIntervalsOfALine);
+        for (kvloamd::LineCounts& interval : closed->counts)
+            for (std::int32_t& count : interval)
+                count = static_cast<std::int32_t>(counts(random));
+        line.closed = closed;
+        line.intervalsBefore = before;
+        before += line.closedIntervals();
+        snapshot.interfaces.lines.push_back(std::move(line));
+    }
+    return snapshot;
+}

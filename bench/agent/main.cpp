@@ -1,0 +1,211 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Compares the agent with Net-SNMP's own table helpers, and with itself at other sizes.
+#include <algorithm>
+#include <cstdio>
+#include <cstdlib>
+#include <exception>
+#include <functional>
+#include <iterator>
+#include <map>
+#include <memory>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include <benchmark/benchmark.h>
+
+#include "Agents.h"
+#include "Child.h"
+#include "DelayReport.h"
+#include "IntervalRows.h"
+#include "LeanClient.h"
+#include "RatioReporter.h"
+#include "RefreshProcess.h"
+#include "Requests.h"
+
+namespace {
+
+constexpr std::uint32_t kFewLines = 28;
+constexpr std::uint32_t kManyLines = 280;
+constexpr int kBoards[] = {125, 250, 500, 1000};
+
+// Each process is started when the first benchmark needs it.
+
+Agent const& few() {
+    static IntervalAgent const agent(kFewLines);
+    return agent;
+}
+
+Agent const& many() {
+    static IntervalAgent const agent(kManyLines);
+    return agent;
+}
+
+Agent const& master() {
+    static MasterAgent const agent(kFewLines);
+    return agent;
+}
+
+RefreshProcess const& refreshOf(int boards) {
+    static std::map<int, std::unique_ptr<RefreshProcess>> processes;
+    auto& process = processes[boards];
+    if (process == nullptr) process = std::make_unique<RefreshProcess>(boards);
+    return *process;
+}
+
+/// A table somewhere.
+struct Target {
+    Agent const& (*agent)();
+    kvloamd::Oid entry;
+    std::uint32_t lines;
+};
+
+/// Asks all requests over and over.
+class Asking {
+  public:
+    Asking(Target const& target, std::vector<std::string> requests)
+        : m_client(target.agent().port()), m_requests(std::move(requests)) {
+        // A benchmark of wrong answers would be none.
+        checkTable(m_client, target.entry, 1);
+        // An agent may answer fewer variables than it is asked for.
+        std::size_t variables = 0;
+        for (std::string const& request : m_requests)
+            variables += LeanClient::read(m_client.ask(request)).size();
+        m_variablesOfARequest =
+            static_cast<double>(variables) / static_cast<double>(m_requests.size());
+    }
+
+    void run(benchmark::State& state) {
+        for (auto _ : state) {
+            benchmark::DoNotOptimize(m_client.ask(m_requests[m_next]));
+            // Few requests, too, come from all over the table.
+            m_next = (m_next + kStride) % m_requests.size();
+        }
+        state.counters["items"] = m_variablesOfARequest;
+    }
+
+  private:
+    static constexpr std::size_t kStride = 37;
+
+    LeanClient m_client;
+    std::vector<std::string> m_requests;
+    double m_variablesOfARequest = 0;
+    std::size_t m_next = 0;
+};
+
+void add(std::string const& name, std::function<void(benchmark::State&)> const& run) {
+    benchmark::RegisterBenchmark(name.c_str(), run)->UseRealTime()->Unit(benchmark::kMicrosecond);
+}
+
+void addRequests(std::string const& name, Target const& target,
+                 std::vector<std::string> const& requests) {
+    add(name, [=, asking = std::shared_ptr<Asking>()](benchmark::State& state) mutable {
+        if (asking == nullptr) asking = std::make_shared<Asking>(target, requests);
+        asking->run(state);
+    });
+}
+
+/// The counters, one column after the other.
+void addColumns(std::string const& name, Target const& target) {
+    std::vector<std::string> requests;
+    for (std::uint32_t const column : counterColumns())
+        for (std::string& request : requestsFor(target.entry, {column}, target.lines))
+            requests.push_back(std::move(request));
+    addRequests(name, target, requests);
+}
+
+/// All counters together.
+void addRows(std::string const& name, Target const& target) {
+    addRequests(name, target, requestsFor(target.entry, counterColumns(), target.lines));
+}
+
+void addWalk(std::string const& name, Target const& target) {
+    add(name, [=](benchmark::State& state) {
+        std::string root;
+        for (std::uint32_t const number : target.entry)
+            root += "." + std::to_string(number);
+        std::vector<std::string> const command{
+            "snmpbulkwalk", "-v2c", "-c", "public", "-On", "-Cr50", target.agent().address(), root};
+        for (auto _ : state)
+            if (Child(command).wait() != 0) state.SkipWithError("the walk fails");
+    });
+}
+
+/// What else runs on the machine makes a refresh slower, never faster.
+double fastestOf(RefreshProcess const& process) {
+    double fastest = process.refresh();
+    for (int more = 0; more < 9; ++more)
+        fastest = std::min(fastest, process.refresh());
+    return fastest;
+}
+
+void addRefresh(std::string const& name, int boards) {
+    benchmark::RegisterBenchmark(name.c_str(),
+                                 [=](benchmark::State& state) {
+                                     RefreshProcess const& process = refreshOf(boards);
+                                     for (auto _ : state)
+                                         state.SetIterationTime(fastestOf(process));
+                                 })
+        ->UseManualTime()
+        ->Unit(benchmark::kMicrosecond);
+}
+
+int run(int argc, char** argv) {
+    useOneProcessor();
+    // Neither the tools nor the agents look for MIB files.
+    setenv("MIBS", "", 1);
+    Target const ours{few, kOurEntry, kFewLines};
+    Target const ourMany{many, kOurEntry, kManyLines};
+    Target const ourThroughMaster{master, kOurEntry, kFewLines};
+    Target const tableData{few, kTableDataEntry, kFewLines};
+    Target const tableDataThroughMaster{master, kTableDataEntry, kFewLines};
+    Target const iterator{few, kIteratorEntry, kFewLines};
+
+    addColumns("a column, table_data/ours", ours);
+    addColumns("a column, table_data/peer", tableData);
+    addColumns("a column, table_iterator/ours", ours);
+    addColumns("a column, table_iterator/peer", iterator);
+    addWalk("snmpbulkwalk, table_data/ours", ours);
+    addWalk("snmpbulkwalk, table_data/peer", tableData);
+    addColumns("a column, from 28 to 280 lines/ours", ourMany);
+    addColumns("a column, from 28 to 280 lines/peer", ours);
+    addColumns("a column through a master, table_data/ours", ourThroughMaster);
+    addColumns("a column through a master, table_data/peer", tableDataThroughMaster);
+    addRows("through a master, ten columns at once or singly/ours", ourThroughMaster);
+    addColumns("through a master, ten columns at once or singly/peer", ourThroughMaster);
+    for (std::size_t i = 1; i < std::size(kBoards); ++i) {
+        std::string const topic = "a refresh, from " + std::to_string(kBoards[i - 1]) + " to " +
+                                  std::to_string(kBoards[i]) + " boards";
+        addRefresh(topic + "/ours", kBoards[i]);
+        addRefresh(topic + "/peer", kBoards[i - 1]);
+    }
+    benchmark::Initialize(&argc, argv);
+    if (benchmark::ReportUnrecognizedArguments(argc, argv)) return 2;
+    RatioReporter reporter({
+        {"a column, table_data/real_time", 1 / 2.5},
+        {"a column, table_iterator/real_time", 1 / 40.0},
+        {"snmpbulkwalk, table_data/real_time", 1 / 1.8},
+        {"a column, from 28 to 280 lines/real_time", 1.15},
+        {"a column through a master, table_data/real_time", 1.0},
+        {"through a master, ten columns at once or singly/real_time", 1 / 4.0},
+        {"a refresh, from 125 to 250 boards/manual_time", 2.2},
+        {"a refresh, from 250 to 500 boards/manual_time", 2.2},
+        {"a refresh, from 500 to 1000 boards/manual_time", 2.2},
+    });
+    benchmark::RunSpecifiedBenchmarks(&reporter);
+    benchmark::Shutdown();
+    bool const ratiosKept = reporter.printRatios();
+    bool const delaysKept = reportDelays(1000);
+    return ratiosKept && delaysKept ? 0 : 1;
+}
+
+} // namespace
+
+int main(int argc, char** argv) {
+    try {
+        return run(argc, argv);
+    } catch (std::exception const& error) {
+        std::fprintf(stderr, "bench_agent: %s\n", error.what());
+        return 1;
+    }
+}
