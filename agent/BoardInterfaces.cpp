@@ -68,9 +68,9 @@ class Reading {
   private:
     /// Enters an interface under a name that no other of its kind has. The row is good until the
     /// next one is entered.
-    InterfaceRow& enter(InterfaceKind kind, std::string const& name);
+    InterfaceRow& enter(IndexKind kind, std::string const& name);
     /// An interface that has no name of its own is known by its place among those of its kind.
-    InterfaceRow& enterNameless(InterfaceKind kind);
+    InterfaceRow& enterNameless(IndexKind kind);
     void readInterface(KVL::Interface& interface, InterfaceRow& row) const;
     void readLine(DS1LineDevice& line);
     std::uint32_t readSignalling(ISDNDChannel& channel);
@@ -81,13 +81,13 @@ class Reading {
 
     ToTicks const& m_toTicks;
     BoardInterfaces m_found;
-    std::set<InterfaceKey> m_taken;
-    std::map<InterfaceKind, int> m_nameless;
+    std::set<IndexKey> m_taken;
+    std::map<IndexKind, int> m_nameless;
     std::map<std::string, std::uint32_t> m_lines; ///< by name and by circuit
 };
 
-InterfaceRow& Reading::enter(InterfaceKind kind, std::string const& name) {
-    InterfaceKey key{kind, name};
+InterfaceRow& Reading::enter(IndexKind kind, std::string const& name) {
+    IndexKey key{kind, name};
     for (int copy = 2; !m_taken.insert(key).second; ++copy)
         key.name = name + "#" + std::to_string(copy);
     m_found.keys.push_back(std::move(key));
@@ -96,7 +96,7 @@ InterfaceRow& Reading::enter(InterfaceKind kind, std::string const& name) {
     return row;
 }
 
-InterfaceRow& Reading::enterNameless(InterfaceKind kind) {
+InterfaceRow& Reading::enterNameless(IndexKind kind) {
     return enter(kind, std::to_string(++m_nameless[kind]));
 }
 
@@ -161,12 +161,13 @@ void Reading::readLine(DS1LineDevice& line) {
     std::string const name = text(line, &DS1LineDevice::GetName);
     LineRow row;
     row.circuitIdentifier = text(line, &DS1LineDevice::GetCircuitIdentifier);
-    InterfaceRow& interface = enter(InterfaceKind::Line, name);
+    InterfaceRow& interface = enter(IndexKind::Line, name);
     readInterface(line, interface);
     interface.name = name;
     interface.alias = row.circuitIdentifier;
     interface.connectorPresent = kTrue;
     row.ifIndex = interface.ifIndex;
+    m_found.rows.ports.push_back({row.ifIndex, 0, m_found.keys.back()});
     row.lineType = unlessNegative(line.GetLineType());
     row.lineCoding = unlessNegative(line.GetLineCoding());
     row.sendCode = unlessNegative(line.GetSendCode());
@@ -201,7 +202,7 @@ void Reading::readLines(DS1LineFeature& feature) {
 
 std::uint32_t Reading::readSignalling(ISDNDChannel& channel) {
     std::string const name = text(channel, &ISDNDChannel::GetName);
-    InterfaceRow& interface = enter(InterfaceKind::SignallingChannel, name);
+    InterfaceRow& interface = enter(IndexKind::SignallingChannel, name);
     SignallingRow row;
     row.ifIndex = interface.ifIndex;
     row.protocol = unlessNegative(channel.GetProtocol());
@@ -220,7 +221,7 @@ std::uint32_t Reading::readSignalling(ISDNDChannel& channel) {
 
 std::uint32_t Reading::readBearer(ISDNBChannel& channel) {
     std::string const name = text(channel, &ISDNBChannel::GetName);
-    InterfaceRow& interface = enter(InterfaceKind::BearerChannel, name);
+    InterfaceRow& interface = enter(IndexKind::BearerChannel, name);
     BearerRow row;
     row.ifIndex = interface.ifIndex;
     row.channelType = unlessNegative(channel.GetChannelType());
@@ -272,9 +273,10 @@ void Reading::readEthernets(KVL::EthernetFeature& feature) {
     for (auto handle = feature.GetFirstEthernet(); handle.get() != nullptr;
          handle = feature.GetNextEthernet(handle)) {
         KVL::Ethernet& ethernet = *handle.get();
-        InterfaceRow& interface = enterNameless(InterfaceKind::Ethernet);
+        InterfaceRow& interface = enterNameless(IndexKind::Ethernet);
         readInterface(ethernet, interface);
         interface.connectorPresent = interface.type == kTypeLoopback ? kFalse : kTrue;
+        m_found.rows.ports.push_back({interface.ifIndex, 0, m_found.keys.back()});
         m_found.rows.ethernets.push_back({interface.ifIndex,
                                           unsignedNumber(ethernet.GetAlignmentErrors()),
                                           unsignedNumber(ethernet.GetFCSErrors()),
@@ -299,7 +301,7 @@ void Reading::readOthers(KVL::InterfaceFeature& feature) {
     for (auto handle = feature.GetFirstInterface(); handle.get() != nullptr;
          handle = feature.GetNextInterface(handle)) {
         bool const ip = dynamic_cast<KVL::IPInterface*>(handle.get()) != nullptr;
-        InterfaceRow& row = enterNameless(ip ? InterfaceKind::Ip : InterfaceKind::Other);
+        InterfaceRow& row = enterNameless(ip ? IndexKind::Ip : IndexKind::Other);
         readInterface(*handle.get(), row);
         if (ip) row.connectorPresent = kFalse;
     }

@@ -16,7 +16,7 @@ namespace kvloamd {
 /// The rows of one board. In the place of every ifIndex is the interface's number on the board,
 /// from 1 in the order of `keys`; the rows are in no order.
 struct BoardInterfaces {
-    std::vector<InterfaceKey> keys; ///< all different
+    std::vector<IndexKey> keys; ///< all different
     InterfaceRows rows;
     std::vector<ReferenceCounter<DS1LineDevice>> lines; ///< as `rows.lines`
 };

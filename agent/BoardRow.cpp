@@ -4,6 +4,7 @@
 #include <cinttypes>
 #include <cstdio>
 #include <ctime>
+#include <set>
 
 namespace kvloamd {
 
@@ -53,6 +54,18 @@ BoardRow readBoard(Board& board, int boardIndex) {
 
 std::string readSerialNumber(Board& board) {
     return text(board, &Board::GetSerialNumber);
+}
+
+std::vector<std::string> keptNames(std::vector<BoardRow> const& boards) {
+    std::vector<std::string> names;
+    std::set<std::string> taken;
+    for (BoardRow const& board : boards) {
+        std::string name = board.serialNumber == "unknown" ? "" : board.serialNumber;
+        if (name.empty() || taken.contains(name)) name += "@" + std::to_string(board.boardIndex);
+        taken.insert(name);
+        names.push_back(std::move(name));
+    }
+    return names;
 }
 
 std::string printable(std::string_view text) {

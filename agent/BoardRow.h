@@ -5,6 +5,7 @@
 #include <array>
 #include <optional>
 #include <string>
+#include <vector>
 
 #include "agent/Value.h"
 #include "board/Board.h"
@@ -47,6 +48,10 @@ BoardRow readBoard(Board& board, int boardIndex);
 
 /// The serial number as `readBoard` gives it.
 std::string readSerialNumber(Board& board);
+
+/// What each of `boards` is known by wherever something is kept for it: its serial number; where
+/// that is unknown, or a board's before it, the board index besides. None is empty.
+std::vector<std::string> keptNames(std::vector<BoardRow> const& boards);
 
 /// `text` as it is served: what is not printable ASCII becomes '?', what is too long is cut.
 std::string printable(std::string_view text);

@@ -15,8 +15,9 @@
 #include "access/ExternalFaultEventAdaptor.h"
 #include "agent/BoardSource.h"
 #include "agent/Collector.h"
+#include "agent/EntityNotices.h"
+#include "agent/EntityReader.h"
 #include "agent/Front.h"
-#include "agent/InterfaceIndices.h"
 #include "agent/InterfaceReader.h"
 #include "agent/LineListener.h"
 #include "agent/LinkWatch.h"
@@ -28,6 +29,7 @@
 #include "agent/ServiceNotice.h"
 #include "agent/Signals.h"
 #include "agent/SnmpConfig.h"
+#include "agent/StableIndices.h"
 #include "agent/StandardObjects.h"
 #include "agent/StatusListener.h"
 #include "agent/Wakeup.h"
@@ -38,6 +40,9 @@ namespace {
 
 /// How long a stop may be held up by notifications that a master does not take.
 constexpr std::chrono::seconds kLastWords{1};
+
+/// The lowest entPhysicalIndex, which is the chassis's.
+constexpr std::uint32_t kFirstEntity = 1;
 
 /// What the library's threads may reach until the process ends. Never destroyed.
 struct Boards {
@@ -178,7 +183,7 @@ void announceLast(Notifier& notifier, NotificationQueue& queue, Front& front) {
 /// Has the settings of former runs, and keeps those of this one in the same file.
 class KeptSettings {
   public:
-    KeptSettings(Settings& settings, InterfaceIndices& file) : m_settings(settings), m_file(file) {
+    KeptSettings(Settings& settings, StableIndices& file) : m_settings(settings), m_file(file) {
         m_settings.load(m_file.settings());
     }
     ~KeptSettings() { save(); }
@@ -189,7 +194,7 @@ class KeptSettings {
 
   private:
     Settings& m_settings;
-    InterfaceIndices& m_file;
+    StableIndices& m_file;
 };
 
 void serve(Options const& options, ReadOptions const& readAgain, Front& front,
@@ -198,14 +203,20 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     ServiceManager& services = *ServiceManager::GetInstance();
     KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
     PlatformReader platform;
-    std::optional<InterfaceIndices> indices;
+    std::optional<StableIndices> indices;
     std::optional<KeptSettings> keptSettings;
     std::optional<InterfaceReader> interfaces;
+    std::optional<StableIndices> entityIndices;
+    std::optional<EntityReader> entities;
     LinkWatch links(boards.settings, boards.queue);
     if (front.servesStandardObjects()) {
-        indices.emplace(persistentDirectory() + "/ifindex.sqlite", options.interfaceBase);
+        indices.emplace(persistentDirectory() + "/ifindex.sqlite", options.interfaceBase,
+                        "interfaces");
         keptSettings.emplace(boards.settings, *indices);
         interfaces.emplace(*boards.manager.get(), *indices, started);
+        entityIndices.emplace(persistentDirectory() + "/entity.sqlite", kFirstEntity,
+                              "physical entities");
+        entities.emplace(*entityIndices, started, [] { return std::time(nullptr); });
     }
     Collector collector(
         [&](Snapshot& snapshot) {
@@ -224,6 +235,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
                 handOn(boards.settings, lines);
                 links.note(snapshot.interfaces.interfaces, snapshot.begun);
             }
+            if (entities) snapshot.entities = entities->read(snapshot);
         },
         started, [&] { wakeup.wake(); });
     std::vector<Table const*> const allTables = tables();
@@ -237,6 +249,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     front.serve({std::move(served), boards.counters, [&] { return collector.snapshot(); },
                  boards.settings});
     Notifier notifier(boards.queue, front.notifications());
+    EntityNotices entityNotices(boards.queue);
     ServiceNotice notice;
     std::string const serving =
         "serving " + std::to_string(collector.newest()->boards.size()) + " boards " + front.place();
@@ -251,7 +264,9 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     });
     front.beforeSleep([&] {
         if (boards.settings.hasUnsaved()) collector.renew();
-        return earliest(notifier.announce(collector.newest()->begun), notice.beat());
+        auto const entityNews = entityNotices.tell(collector.newest(), Clock::now());
+        return earliest(entityNews,
+                        earliest(notifier.announce(collector.newest()->begun), notice.beat()));
     });
     ListeningScope const listening(boards.listener, [&] { collector.renew(); });
     ListeningScope const listeningToLines(boards.lines, [&] { collector.renew(); });

@@ -110,6 +110,12 @@ std::span<Scalar const> standardScalars() {
          [](Facts const& facts) -> Value {
              return std::int64_t{facts.snapshot.interfaces.stackLastChange};
          }},
+        {"entLastChangeTime",
+         {47, 1, 4, 1},
+         TimeTicks,
+         [](Facts const& facts) -> Value {
+             return std::int64_t{facts.snapshot.entities.lastChange};
+         }},
     };
     return described;
 }
@@ -133,10 +139,21 @@ Table const& ifStackTable() {
 }
 
 std::vector<Table const*> standardTables() {
-    return {&ifTable(),         &ifXTable(),         &ifStackTable(),
-            &dsx1ConfigTable(), &dsx1CurrentTable(), &dsx1IntervalTable(),
-            &dsx1TotalTable(),  &isdnBearerTable(),  &isdnSignalingTable(),
-            &isdnLapdTable(),   &dot3StatsTable()};
+    return {&ifTable(),
+            &ifXTable(),
+            &ifStackTable(),
+            &dsx1ConfigTable(),
+            &dsx1CurrentTable(),
+            &dsx1IntervalTable(),
+            &dsx1TotalTable(),
+            &isdnBearerTable(),
+            &isdnSignalingTable(),
+            &isdnLapdTable(),
+            &dot3StatsTable(),
+            &entPhysicalTable(),
+            &entAliasMappingTable(),
+            &entPhysicalContainsTable(),
+            &entStateTable()};
 }
 
 } // namespace kvloamd

@@ -19,6 +19,7 @@ namespace {
 constexpr std::int64_t kApplicationId = 0x4b764978; // "KvIx"
 constexpr std::int64_t kVersion = 1;
 
+// Whatever is numbered: the names of the first use are in the files of all agents.
 constexpr char kSchema[] =
     "CREATE TABLE block ("
     " first INTEGER PRIMARY KEY CHECK (first > 0),"
@@ -161,7 +162,8 @@ void IndexFile::Close::operator()(sqlite3* database) const {
     sqlite3_close(database);
 }
 
-IndexFile::IndexFile(std::string path) : m_path(std::move(path)) {
+IndexFile::IndexFile(std::string path, std::string things)
+    : m_path(std::move(path)), m_things(std::move(things)) {
     if (m_path.empty()) return;
     try {
         makeDirectory(std::filesystem::path(m_path).parent_path());
@@ -208,7 +210,7 @@ void IndexFile::checkContents() {
     if (numberOf(database, "SELECT count(*) FROM interface i WHERE NOT EXISTS (SELECT 1 FROM block"
                            " WHERE serialNumber = i.serialNumber AND i.ifIndex >= first"
                            " AND i.ifIndex < first + size)") != 0)
-        throw Damaged("an interface has an index of no block of its board");
+        throw Damaged("an index is in no block of its board");
     if (numberOf(database, "SELECT count(*) FROM (SELECT first, lag(first + size) OVER (ORDER BY"
                            " first) AS free FROM block) WHERE free > first") != 0)
         throw Damaged("blocks of indices overlap");
@@ -223,10 +225,9 @@ void IndexFile::readContents() {
     Statement entries(m_database.get(),
                       "SELECT serialNumber, kind, name, ifIndex FROM interface ORDER BY ifIndex");
     while (entries.step())
-        m_records.entries.push_back(
-            {entries.text(0),
-             {static_cast<InterfaceKind>(entries.number(1)), entries.text(2)},
-             static_cast<std::uint32_t>(entries.number(3))});
+        m_records.entries.push_back({entries.text(0),
+                                     {static_cast<IndexKind>(entries.number(1)), entries.text(2)},
+                                     static_cast<std::uint32_t>(entries.number(3))});
     Statement settings(m_database.get(),
                        "SELECT setting, ifIndex, value FROM setting ORDER BY setting, ifIndex");
     while (settings.step())
@@ -250,7 +251,7 @@ void IndexFile::add(IndexRecords const& records) {
             entry.bind(1, added.serialNumber)
                 .bind(2, static_cast<std::int64_t>(added.key.kind))
                 .bind(3, added.key.name)
-                .bind(4, added.ifIndex)
+                .bind(4, added.index)
                 .run();
         Statement set(m_database.get(),
                       "INSERT OR REPLACE INTO setting (ifIndex, setting, value) VALUES (?, ?, ?)");
@@ -276,17 +277,17 @@ void IndexFile::setAside(std::string const& why) {
     if (fault) throw Unusable(why + ", and it can not be renamed: " + fault.message());
     // Left behind, it would be taken for the new file's.
     std::filesystem::rename(m_path + "-journal", aside + "-journal", fault);
-    log(LogLevel::Warning, m_path + ": the file of interface indices can not be read (" + why +
-                               "); it is kept as " + aside +
-                               ", interfaces are numbered anew, and what was set for them is lost");
+    log(LogLevel::Warning, m_path + ": the indices of " + m_things + " can not be read (" + why +
+                               "); the file is kept as " + aside + ", " + m_things +
+                               " are numbered anew, and what was set for them is lost");
 }
 
 void IndexFile::giveUp(std::string const& why) {
     m_database.reset();
     m_records = {};
-    log(LogLevel::Warning,
-        m_path + ": interface indices and settings are not kept across restarts: " + why +
-            "; check --persistent-dir");
+    log(LogLevel::Warning, m_path + ": the indices of " + m_things +
+                               " and what is set for them are not kept across restarts: " + why +
+                               "; check --persistent-dir");
 }
 
 } // namespace kvloamd

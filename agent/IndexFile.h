@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The file that remembers which interface has which ifIndex, and what is set for it.
+// The file that remembers which thing of a board has which index, and what is set for it.
 #pragma once
 
 #include <compare>
@@ -14,22 +14,27 @@ struct sqlite3;
 
 namespace kvloamd {
 
-/// The numbers are in the file: they stay.
-enum class InterfaceKind : int {
+/// What has an index: interfaces, and physical entities in a file of their own. The numbers are in
+/// the files: they stay.
+enum class IndexKind : int {
     Line = 1,
     BearerChannel = 2,
     SignallingChannel = 3,
     Ethernet = 4,
     Ip = 5,
-    Other = 6
+    Other = 6,
+    Chassis = 7,
+    Slot = 8,
+    Board = 9,
+    Processor = 10
 };
 
-/// An interface among those of its board.
-struct InterfaceKey {
-    InterfaceKind kind = InterfaceKind::Other;
+/// One thing among those of its board, or among those of no board.
+struct IndexKey {
+    IndexKind kind = IndexKind::Other;
     std::string name;
 
-    auto operator<=>(InterfaceKey const&) const = default;
+    auto operator<=>(IndexKey const&) const = default;
 };
 
 /// Indices that belong to one board: `first` to `first + size - 1`.
@@ -41,8 +46,8 @@ struct IndexBlock {
 
 struct IndexEntry {
     std::string serialNumber;
-    InterfaceKey key;
-    std::uint32_t ifIndex = 0;
+    IndexKey key;
+    std::uint32_t index = 0;
 };
 
 /// Every entry lies in a block of its board, blocks do not overlap.
@@ -60,8 +65,9 @@ inline constexpr std::uint32_t kLastIndex = 0x7fffffff;
 /// kept. Either is logged once. Not synchronised.
 class IndexFile {
   public:
-    /// An empty `path`: nothing is kept, and nothing is said.
-    explicit IndexFile(std::string path);
+    /// An empty `path`: nothing is kept, and nothing is said. `things`: what is numbered, for the
+    /// log: "interfaces".
+    IndexFile(std::string path, std::string things);
 
     /// What the file held when it was opened.
     IndexRecords const& records() const { return m_records; }
@@ -81,6 +87,7 @@ class IndexFile {
     void giveUp(std::string const& why);
 
     std::string m_path;
+    std::string m_things;
     IndexRecords m_records;
     std::unique_ptr<sqlite3, Close> m_database; ///< null: nothing is kept
 };

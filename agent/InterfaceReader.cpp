@@ -49,7 +49,7 @@ void completeStack(InterfaceRows& all) {
 
 } // namespace
 
-InterfaceReader::InterfaceReader(BoardManager& manager, InterfaceIndices& indices,
+InterfaceReader::InterfaceReader(BoardManager& manager, StableIndices& indices,
                                  Clock::time_point started)
     : m_manager(manager), m_indices(indices), m_uptime(started) {}
 
@@ -59,19 +59,15 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     for (auto& [index, counted] : m_counted)
         counted.present = false;
     ToTicks const toTicks = [this](long seconds) { return m_uptime.of(seconds); };
-    std::set<std::string> serialNumbers;
-    for (BoardRow const& row : boards) {
-        auto const board = m_manager.GetBoardByIndex(static_cast<int>(row.boardIndex));
+    std::vector<std::string> const names = keptNames(boards);
+    for (std::size_t i = 0; i < boards.size(); ++i) {
+        std::uint32_t const boardIndex = boards[i].boardIndex;
+        auto const board = m_manager.GetBoardByIndex(static_cast<int>(boardIndex));
         Board* const asked = board.get();
         if (asked == nullptr) continue;
-        std::string serialNumber = row.serialNumber == "unknown" ? "" : row.serialNumber;
-        // Boards that nothing else tells apart are told apart by their indices.
-        if (serialNumber.empty() || serialNumbers.contains(serialNumber))
-            serialNumber += "@" + std::to_string(row.boardIndex);
-        serialNumbers.insert(serialNumber);
         BoardInterfaces found = readInterfaces(*asked, toTicks);
-        auto const indices = m_indices.indicesOf(serialNumber, found.keys);
-        append(all, std::move(found), indices, row.boardIndex);
+        auto const indices = m_indices.indicesOf(names[i], found.keys);
+        append(all, std::move(found), indices, boardIndex);
     }
     m_indices.save();
     std::erase_if(m_counted, [](auto const& entry) { return !entry.second.present; });
@@ -80,6 +76,7 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     sortByIndex(all.bearers);
     sortByIndex(all.signalling);
     sortByIndex(all.ethernets);
+    sortByIndex(all.ports);
     completeStack(all);
     std::size_t before = 0;
     for (LineRow& line : all.lines) {
@@ -104,6 +101,9 @@ void InterfaceReader::append(InterfaceRows& all, BoardInterfaces&& board,
     moveRows(all.bearers, board.rows.bearers, indices);
     moveRows(all.signalling, board.rows.signalling, indices);
     moveRows(all.ethernets, board.rows.ethernets, indices);
+    for (PortRow& port : board.rows.ports)
+        port.boardIndex = boardIndex;
+    moveRows(all.ports, board.rows.ports, indices);
     for (StackRow const& row : board.rows.stack) {
         StackRow const placed{indices[row.higher - 1], indices[row.lower - 1]};
         if (placed.higher != 0 && placed.lower != 0) all.stack.push_back(placed);

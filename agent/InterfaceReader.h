@@ -10,9 +10,9 @@
 
 #include "agent/BoardInterfaces.h"
 #include "agent/BoardRow.h"
-#include "agent/InterfaceIndices.h"
 #include "agent/InterfaceRows.h"
 #include "agent/PlacedLine.h"
+#include "agent/StableIndices.h"
 #include "agent/Uptime.h"
 #include "board/BoardManager.h"
 
@@ -28,7 +28,7 @@ class InterfaceReader {
     using Clock = Uptime::Clock;
 
     /// `manager` and `indices` outlive the reader. `started`: the agent's start.
-    InterfaceReader(BoardManager& manager, InterfaceIndices& indices, Clock::time_point started);
+    InterfaceReader(BoardManager& manager, StableIndices& indices, Clock::time_point started);
 
     /// The rows of `boards`, which are ascending by index.
     InterfaceRows read(std::vector<BoardRow> const& boards);
@@ -54,7 +54,7 @@ class InterfaceReader {
     void noteChanges(InterfaceRows& all);
 
     BoardManager& m_manager;
-    InterfaceIndices& m_indices;
+    StableIndices& m_indices;
     Uptime const m_uptime;
     std::vector<PlacedLine> m_lines;
     std::map<std::uint32_t, Counted> m_counted;

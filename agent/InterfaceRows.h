@@ -8,6 +8,8 @@
 #include <string>
 #include <vector>
 
+#include "agent/IndexFile.h"
+
 namespace kvloamd {
 
 /// The counters of an interface, in the order of IF-MIB's ifTable.
@@ -133,6 +135,13 @@ struct EthernetRow {
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
 };
 
+/// A line or an Ethernet interface: where a board has a cable.
+struct PortRow {
+    std::uint32_t ifIndex = 0;
+    std::uint32_t boardIndex = 0;
+    IndexKey key; ///< on its board
+};
+
 /// All ascending by index.
 struct InterfaceRows {
     std::vector<InterfaceRow> interfaces;
@@ -141,6 +150,7 @@ struct InterfaceRows {
     std::vector<BearerRow> bearers;
     std::vector<SignallingRow> signalling;
     std::vector<EthernetRow> ethernets;
+    std::vector<PortRow> ports;
     // When interfaces last came or went: hundredths of a second since the agent's start.
     std::uint32_t lastChange = 0;
     std::uint32_t stackLastChange = 0;

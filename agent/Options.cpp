@@ -117,7 +117,7 @@ std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
                    "without it kvloamd.conf is looked for where Net-SNMP looks")
         ->type_name("FILE");
     app.add_option("--persistent-dir", options.persistentDirectory,
-                   "Where SNMPv3 engine state and interface indices are kept across restarts")
+                   "Where SNMPv3 engine state and the indices of interfaces and entities are kept")
         ->type_name("DIR");
     app.add_option("--enterprise-oid", enterprise, "The arc above KVL-OAM-MIB")
         ->type_name("OID")

@@ -7,7 +7,6 @@
 #include <variant>
 #include <vector>
 
-#include "agent/InterfaceIndices.h"
 #include "agent/Log.h"
 #include "agent/Value.h"
 
@@ -21,7 +20,7 @@ struct Options {
     std::string snmpConfig;          ///< empty: where Net-SNMP looks by itself
     std::string persistentDirectory; ///< empty: Net-SNMP's own
     Oid enterprise{1, 3, 6, 1, 4, 1, 32473};
-    std::uint32_t interfaceBase = InterfaceIndices::kDefaultBase;
+    std::uint32_t interfaceBase = 1000;
     LogLevel logLevel = LogLevel::Info;
     bool checkConfig = false;
 

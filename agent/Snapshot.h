@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "agent/BoardRow.h"
+#include "agent/EntityRows.h"
 #include "agent/InterfaceRows.h"
 #include "agent/PlatformReader.h"
 #include "agent/ProcessRow.h"
@@ -28,6 +29,7 @@ struct Snapshot {
     std::vector<ProcessRow> processes;
     std::shared_ptr<PlatformRecords const> records = std::make_shared<PlatformRecords>(); ///< set
     InterfaceRows interfaces;
+    EntityRows entities;
     Clock::time_point begun;      ///< when reading began: what happened before is in it
     std::uint32_t lastChange = 0; ///< of the boards: hundredths of a second since the agent's start
 };

@@ -12,7 +12,10 @@
 
 namespace {
 using RecordPool = KVL::RecyclingPool<ReferenceInfo>;
-}
+
+/// Its address tells threads apart.
+[[gnu::tls_model("initial-exec")]] thread_local char t_thread;
+} // namespace
 
 ReferenceTable* ReferenceTable::m_referenceTable = nullptr;
 
@@ -42,8 +45,16 @@ ReferenceInfo* ReferenceTable::get_refinfo(Object* object) {
 
 ReferenceInfo* ReferenceTable::create_refinfo(Object* object) {
     if (object == nullptr) return nullptr;
-    KVL::BriefGuard const guard(m_records->get_impl_mutex());
-    return m_records->map.find_or_insert(object, [] { return RecordPool::take(); });
+    bool inStep = false;
+    ReferenceInfo* record = nullptr;
+    {
+        KVL::BriefGuard const guard(m_records->get_impl_mutex());
+        record = m_records->map.find_or_insert(object, [] { return RecordPool::take(); });
+        inStep = m_records->turns.note(&t_thread);
+    }
+    if (inStep) [[unlikely]]
+        KVL::stay_away();
+    return record;
 }
 
 void ReferenceTable::destroy_refcount(Object* object) {

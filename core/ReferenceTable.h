@@ -7,6 +7,7 @@
 
 #include "core/AddressMap.h"
 #include "core/Object.h"
+#include "core/Turns.h"
 
 /// The count of one object's handles. Changed only under its lock; readable at any time.
 class KVLOAM_API ReferenceInfo {
@@ -72,6 +73,7 @@ class KVLOAM_API ReferenceTable : public Object {
     struct alignas(64) Records final : KVLLockable_pthread {
         Records() : KVLLockable_pthread(RecursiveLock) {}
         KVL::AddressMap<ReferenceInfo*> map;
+        KVL::Turns turns;
     };
 
     explicit ReferenceTable(Records* records);

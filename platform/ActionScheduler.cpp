@@ -11,16 +11,13 @@ namespace {
 /// How many entries ahead a pass looks.
 constexpr std::ptrdiff_t kAhead = 16;
 
-bool earlier(SchedItem const* a, SchedItem const* b) {
-    return a->due < b->due;
+bool earlier(SchedItem const& a, SchedItem const& b) {
+    return a.due < b.due;
 }
 
 } // namespace
 
-ActionScheduler::~ActionScheduler() {
-    for (SchedItem const* item : m_list)
-        delete item;
-}
+ActionScheduler::~ActionScheduler() = default;
 
 int ActionScheduler::AddPeriodic(Schedulable* target, long period) {
     lock_list();
@@ -44,24 +41,24 @@ bool ActionScheduler::check_on_list(Schedulable* target) {
 
 ActionScheduler::List::iterator ActionScheduler::find_item_on_list(Schedulable* target) {
     return std::find_if(m_list.begin(), m_list.end(),
-                        [=](SchedItem const* item) { return item->target == target; });
+                        [=](SchedItem const& item) { return item.target == target; });
 }
 
-void ActionScheduler::insert(SchedItem* item) {
-    m_list.insert(firstAfter(item->due), item);
+void ActionScheduler::insert(SchedItem const& item) {
+    m_list.insert(firstAfter(item.due), item);
 }
 
 void ActionScheduler::run_pass(long now) {
     if (now >= m_nextWakeUp)
         callDue(now);
     else if (!m_list.empty())
-        m_nextWakeUp = m_list.front()->due;
+        m_nextWakeUp = m_list.front().due;
     if (m_list.empty()) m_nextWakeUp = kNever;
 }
 
 ActionScheduler::List::iterator ActionScheduler::firstAfter(long time) {
     return std::upper_bound(m_list.begin(), m_list.end(), time,
-                            [](long limit, SchedItem const* item) { return limit < item->due; });
+                            [](long limit, SchedItem const& item) { return limit < item.due; });
 }
 
 void ActionScheduler::callDue(long now) {
@@ -72,26 +69,20 @@ void ActionScheduler::callDue(long now) {
     long latest = std::numeric_limits<long>::min();
     bool inOrder = true;
     for (auto entry = m_list.begin(); entry != notDue; ++entry) {
-        // Items and targets lie all over memory; the next ones are fetched while this one works.
-        if (notDue - entry > kAhead) {
-            __builtin_prefetch(entry[kAhead]);
-            __builtin_prefetch(entry[kAhead / 2]->target, 1);
-        }
-        SchedItem* const item = *entry;
-        item->target->ScheduledAction();
-        if (item->period <= 0) {
-            delete item;
-            continue;
-        }
-        item->due = add_saturated(item->due, item->period);
-        next = std::min(next, item->due);
-        inOrder = inOrder && latest <= item->due;
-        latest = std::max(latest, item->due);
-        *kept++ = item;
+        // Targets lie all over memory; the next ones are fetched while this one works.
+        if (notDue - entry > kAhead) __builtin_prefetch(entry[kAhead].target, 1);
+        entry->target->ScheduledAction();
+        if (entry->period <= 0) continue;
+        entry->due = add_saturated(entry->due, entry->period);
+        next = std::min(next, entry->due);
+        inOrder = inOrder && latest <= entry->due;
+        latest = std::max(latest, entry->due);
+        if (kept != entry) *kept = *entry;
+        ++kept;
     }
     auto const rest = m_list.erase(kept, notDue);
     if (!inOrder) std::stable_sort(m_list.begin(), rest, earlier);
-    if (rest != m_list.end() && latest >= (*rest)->due) {
+    if (rest != m_list.end() && latest >= rest->due) {
         // Behind those that are due at the same time and were not called.
         auto const called = std::rotate(m_list.begin(), rest, m_list.end());
         std::inplace_merge(m_list.begin(), called, m_list.end(), earlier);

@@ -36,7 +36,7 @@ class KVLOAM_API ActionScheduler : public Runnable {
   protected:
     ActionScheduler() = default;
 
-    using List = std::vector<SchedItem*>;
+    using List = std::vector<SchedItem>;
 
     /// What "nothing to wait for" is written as.
     static constexpr long kNever = 0x7FFFFFFF;
@@ -64,7 +64,7 @@ class KVLOAM_API ActionScheduler : public Runnable {
     /// The first entry of `target` in the order of due times, or the list's end.
     List::iterator find_item_on_list(Schedulable* target);
     /// Enters an item behind those that are due at the same time.
-    void insert(SchedItem* item);
+    void insert(SchedItem const& item);
 
     /// What the loop does when it wakes at `now`: calls everything that is due, earliest first, and
     /// sets the next wake-up time. Woken before that time it calls nothing.
@@ -78,7 +78,7 @@ class KVLOAM_API ActionScheduler : public Runnable {
     static long add_saturated(long time, long seconds);
 
     long m_nextWakeUp = kNever;
-    List m_list; ///< owned items by due time; those due at the same time as they were entered
+    List m_list; ///< by due time; items due at the same time as they were entered
 
   private:
     void callDue(long now);

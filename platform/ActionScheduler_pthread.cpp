@@ -2,7 +2,6 @@
 #include "platform/ActionScheduler_pthread.h"
 
 #include <cstdio>
-#include <memory>
 
 ActionScheduler_pthread* ActionScheduler_pthread::s_actionScheduler = nullptr;
 
@@ -60,9 +59,7 @@ int ActionScheduler_pthread::Remove(Schedulable* target) {
     auto const found = find_item_on_list(target);
     bool const known = found != m_list.end();
     if (known) {
-        SchedItem const* const item = *found;
         m_list.erase(found);
-        delete item;
         pthread_cond_signal(&m_listChanged);
     }
     unlock_list();
@@ -72,13 +69,12 @@ int ActionScheduler_pthread::Remove(Schedulable* target) {
 int ActionScheduler_pthread::ChangePeriod(Schedulable* target, long period) {
     lock_list();
     auto const found = find_item_on_list(target);
-    bool const changes =
-        found != m_list.end() && (*found)->period >= 1 && (*found)->period != period;
+    bool const changes = found != m_list.end() && found->period >= 1 && found->period != period;
     if (changes) {
-        SchedItem* const item = *found;
+        SchedItem item = *found;
         m_list.erase(found);
-        item->due = add_saturated(item->due, add_saturated(period, -item->period));
-        item->period = period;
+        item.due = add_saturated(item.due, add_saturated(period, -item.period));
+        item.period = period;
         insert(item);
         pthread_cond_signal(&m_listChanged);
     }
@@ -88,9 +84,7 @@ int ActionScheduler_pthread::ChangePeriod(Schedulable* target, long period) {
 
 int ActionScheduler_pthread::put_item_on_list(Schedulable* target, long period, long when) {
     long const due = period >= 1 ? add_saturated(m_clock(), period) : when;
-    auto item = std::make_unique<SchedItem>(SchedItem{target, due, period});
-    insert(item.get());
-    item.release(); // NOLINT(bugprone-unused-return-value): the list owns it now
+    insert({target, due, period});
     if (due < m_nextWakeUp) pthread_cond_signal(&m_listChanged);
     return 0;
 }

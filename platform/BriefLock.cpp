@@ -17,12 +17,22 @@ void pauseBriefly() {
 #endif
 }
 
+constexpr int kFirstPauses = 256;
+
+void pauses(int count) {
+    for (int i = 0; i < count; ++i)
+        pauseBriefly();
+}
+
 } // namespace
 
+void stay_away() {
+    pauses(kFirstPauses);
+}
+
 void lock_contended(pthread_mutex_t* mutex) {
-    for (int pauses = 256; pauses <= 2048; pauses *= 2) {
-        for (int i = 0; i < pauses; ++i)
-            pauseBriefly();
+    for (int count = kFirstPauses; count <= 8 * kFirstPauses; count *= 2) {
+        pauses(count);
         if (pthread_mutex_trylock(mutex) == 0) return;
     }
     pthread_mutex_lock(mutex);

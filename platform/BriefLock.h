@@ -31,4 +31,7 @@ class BriefGuard {
     pthread_mutex_t* m_mutex;
 };
 
+/// Leaves a lock to others for a while.
+void stay_away();
+
 } // namespace KVL

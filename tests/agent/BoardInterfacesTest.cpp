@@ -43,17 +43,27 @@ TEST_F(BoardInterfacesTest, LinesAreReadOnceThoughTheyAreInterfacesToo) {
     addLine("one");
     addLine("two");
     auto const found = readInterfaces(*m_board.get(), m_toTicks);
-    EXPECT_THAT(found.keys, ElementsAre(InterfaceKey{InterfaceKind::Line, "one"},
-                                        InterfaceKey{InterfaceKind::Line, "two"}));
+    EXPECT_THAT(found.keys,
+                ElementsAre(IndexKey{IndexKind::Line, "one"}, IndexKey{IndexKind::Line, "two"}));
     EXPECT_THAT(found.rows.interfaces, SizeIs(2));
+}
+
+TEST_F(BoardInterfacesTest, LinesArePortsAndChannelsAreNot) {
+    addLine("one");
+    add(new FakeISDNFeature({new FakeDChannel("D", 1, 1, "one")}, {new FakeBChannel("B", 1)}));
+    auto const rows = read();
+    EXPECT_THAT(rows.interfaces, SizeIs(3));
+    ASSERT_THAT(rows.ports, SizeIs(1));
+    EXPECT_EQ(rows.ports[0].ifIndex, rows.lines[0].ifIndex);
+    EXPECT_EQ(rows.ports[0].key, (IndexKey{IndexKind::Line, "one"}));
 }
 
 TEST_F(BoardInterfacesTest, LinesOfOneNameAreToldApart) {
     addLine("same");
     addLine("same");
-    EXPECT_THAT(readInterfaces(*m_board.get(), m_toTicks).keys,
-                ElementsAre(InterfaceKey{InterfaceKind::Line, "same"},
-                            InterfaceKey{InterfaceKind::Line, "same#2"}));
+    EXPECT_THAT(
+        readInterfaces(*m_board.get(), m_toTicks).keys,
+        ElementsAre(IndexKey{IndexKind::Line, "same"}, IndexKey{IndexKind::Line, "same#2"}));
 }
 
 TEST_F(BoardInterfacesTest, WhatALineDoesNotSupportIsNotKnown) {

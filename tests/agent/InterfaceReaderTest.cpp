@@ -41,7 +41,7 @@ class InterfaceReaderTest : public ::testing::Test {
 
     FakeChassis m_chassis;
     BoardSource m_source{*m_chassis.manager.get()};
-    InterfaceIndices m_indices{"", 1000};
+    StableIndices m_indices{"", 1000, "interfaces"};
     // Long ago, so that what happens now is told by a time that is not 0.
     InterfaceReader m_reader{*m_chassis.manager.get(), m_indices,
                              InterfaceReader::Clock::now() - std::chrono::hours(1)};
@@ -173,6 +173,16 @@ TEST_F(InterfaceReaderTest, ComingAndGoingIsTimedAndStayingIsNot) {
     EXPECT_GE(changed.lastChange, 360000U);
     EXPECT_GE(changed.stackLastChange, 360000U);
     EXPECT_EQ(read().lastChange, changed.lastChange);
+}
+
+TEST_F(InterfaceReaderTest, EthernetIsAPortOfItsBoard) {
+    m_chassis.insert("A");
+    addPort(m_chassis.insert("B"));
+    auto const ports = read().ports;
+    ASSERT_THAT(ports, SizeIs(1));
+    EXPECT_EQ(ports[0].ifIndex, 1000U);
+    EXPECT_EQ(ports[0].boardIndex, 2U);
+    EXPECT_EQ(ports[0].key, (IndexKey{IndexKind::Ethernet, "1"}));
 }
 
 TEST_F(InterfaceReaderTest, InterfaceWithNothingAboveOrBelowStandsAlone) {

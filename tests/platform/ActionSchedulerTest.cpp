@@ -34,7 +34,7 @@ class DrivenScheduler final : public ActionScheduler_pthread {
     }
     long nextWakeUp() const { return m_nextWakeUp; }
     std::size_t size() const { return m_list.size(); }
-    SchedItem item(Schedulable* target) { return **find_item_on_list(target); }
+    SchedItem item(Schedulable* target) { return *find_item_on_list(target); }
 };
 
 /// Notes its name and the time in the test's record when it is called.

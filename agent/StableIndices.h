@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Gives every interface an ifIndex that it keeps.
+// Gives every interface, or every physical entity, an index that it keeps.
 #pragma once
 
 #include <cstdint>
@@ -12,24 +12,23 @@
 
 namespace kvloamd {
 
-/// An interface is known by its board's serial number, its kind and its name. It keeps its index
-/// while its board is away, and across restarts as far as the file can be used.
+/// A thing is known by its board's serial number, its kind and its name; what belongs to no board,
+/// by an empty serial number. It keeps its index while its board is away, and across restarts as
+/// far as the file can be used.
 ///
-/// The interfaces that a board has when it first comes get neighbouring indices, in a block whose
+/// The things that a board has when it first comes get neighbouring indices, in a block whose
 /// size is a power of two, with room for some more; a board that outgrows its blocks gets another.
 /// Not synchronised.
-class InterfaceIndices {
+class StableIndices {
   public:
-    static constexpr std::uint32_t kDefaultBase = 1000;
-
     /// `file`: where indices are kept; empty: nowhere. `base`: the lowest index that is given to
-    /// whoever has none yet, above 0.
-    InterfaceIndices(std::string file, std::uint32_t base);
+    /// whatever has none yet, above 0. `things`: what is numbered, for the log.
+    StableIndices(std::string file, std::uint32_t base, std::string things);
 
-    /// The indices of a board's interfaces, in the order of `keys`, which are all different. 0 for
-    /// an interface that there is no index left for.
+    /// The indices of a board's things, in the order of `keys`, which are all different. 0 where
+    /// there is no index left.
     std::vector<std::uint32_t> indicesOf(std::string const& serialNumber,
-                                         std::span<InterfaceKey const> keys);
+                                         std::span<IndexKey const> keys);
     /// Writes what has been given since the last time to the file, in one piece.
     void save();
 
@@ -45,7 +44,7 @@ class InterfaceIndices {
         std::uint32_t end;
     };
     struct Board {
-        std::map<InterfaceKey, std::uint32_t> indices;
+        std::map<IndexKey, std::uint32_t> indices;
         std::vector<Room> rooms;
     };
 

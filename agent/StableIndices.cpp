@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-#include "agent/InterfaceIndices.h"
+#include "agent/StableIndices.h"
 
 #include <algorithm>
 #include <bit>
@@ -18,27 +18,26 @@ std::uint64_t blockSize(std::uint64_t count) {
 
 } // namespace
 
-InterfaceIndices::InterfaceIndices(std::string file, std::uint32_t base)
-    : m_file(std::move(file)), m_free(base) {
+StableIndices::StableIndices(std::string file, std::uint32_t base, std::string things)
+    : m_file(std::move(file), std::move(things)), m_free(base) {
     load(m_file.records());
 }
 
-void InterfaceIndices::load(IndexRecords const& records) {
+void StableIndices::load(IndexRecords const& records) {
     for (IndexBlock const& block : records.blocks) {
         m_boards[block.serialNumber].rooms.push_back({block.first, block.first + block.size});
         m_free = std::max(m_free, std::uint64_t{block.first} + block.size);
     }
     for (IndexEntry const& entry : records.entries) {
         Board& board = m_boards[entry.serialNumber];
-        board.indices.emplace(entry.key, entry.ifIndex);
+        board.indices.emplace(entry.key, entry.index);
         for (Room& room : board.rooms)
-            if (entry.ifIndex >= room.next && entry.ifIndex < room.end)
-                room.next = entry.ifIndex + 1;
+            if (entry.index >= room.next && entry.index < room.end) room.next = entry.index + 1;
     }
 }
 
-std::vector<std::uint32_t> InterfaceIndices::indicesOf(std::string const& serialNumber,
-                                                       std::span<InterfaceKey const> keys) {
+std::vector<std::uint32_t> StableIndices::indicesOf(std::string const& serialNumber,
+                                                    std::span<IndexKey const> keys) {
     if (keys.empty()) return {};
     Board& board = m_boards[serialNumber];
     std::vector<std::uint32_t> indices(keys.size(), 0);
@@ -64,20 +63,20 @@ std::vector<std::uint32_t> InterfaceIndices::indicesOf(std::string const& serial
     return indices;
 }
 
-void InterfaceIndices::save() {
+void StableIndices::save() {
     if (m_unsaved.blocks.empty() && m_unsaved.entries.empty()) return;
     m_file.add(m_unsaved);
     m_unsaved = {};
 }
 
-void InterfaceIndices::save(std::vector<SettingEntry> settings) {
+void StableIndices::save(std::vector<SettingEntry> settings) {
     if (settings.empty()) return;
     IndexRecords changed;
     changed.settings = std::move(settings);
     m_file.add(changed);
 }
 
-void InterfaceIndices::makeRoom(std::string const& serialNumber, Board& board, std::size_t count) {
+void StableIndices::makeRoom(std::string const& serialNumber, Board& board, std::size_t count) {
     std::uint64_t room = 0;
     for (Room const& block : board.rooms)
         room += block.end - block.next;

@@ -9,7 +9,7 @@
 #include <gmock/gmock.h>
 #include <sqlite3.h>
 
-#include "agent/InterfaceIndices.h"
+#include "agent/StableIndices.h"
 
 namespace kvloamd {
 namespace {
@@ -39,28 +39,28 @@ class LogCapture {
     bool m_taken = false;
 };
 
-class InterfaceIndicesTest : public ::testing::Test {
+class StableIndicesTest : public ::testing::Test {
   protected:
-    InterfaceIndicesTest() {
+    StableIndicesTest() {
         std::string folder = ::testing::TempDir() + "ifindex-XXXXXX";
         if (mkdtemp(folder.data()) == nullptr) throw std::runtime_error("no temporary folder");
         m_folder = folder;
     }
-    ~InterfaceIndicesTest() override {
+    ~StableIndicesTest() override {
         chmod(m_folder.c_str(), S_IRWXU);
         std::filesystem::remove_all(m_folder);
     }
 
     std::string file() const { return m_folder + "/ifindex.sqlite"; }
-    InterfaceIndices open(std::uint32_t base = 1000) const { return {file(), base}; }
-    static std::vector<InterfaceKey> lines(int count) {
-        std::vector<InterfaceKey> keys;
+    StableIndices open(std::uint32_t base = 1000) const { return {file(), base, "interfaces"}; }
+    static std::vector<IndexKey> lines(int count) {
+        std::vector<IndexKey> keys;
         for (int i = 1; i <= count; ++i)
-            keys.push_back({InterfaceKind::Line, "line" + std::to_string(i)});
+            keys.push_back({IndexKind::Line, "line" + std::to_string(i)});
         return keys;
     }
-    static std::vector<std::uint32_t> ask(InterfaceIndices& indices, std::string const& board,
-                                          std::vector<InterfaceKey> const& keys) {
+    static std::vector<std::uint32_t> ask(StableIndices& indices, std::string const& board,
+                                          std::vector<IndexKey> const& keys) {
         auto const given = indices.indicesOf(board, keys);
         indices.save();
         return given;
@@ -87,18 +87,18 @@ class InterfaceIndicesTest : public ::testing::Test {
     std::string m_folder;
 };
 
-TEST_F(InterfaceIndicesTest, FirstBoardBeginsAtTheBase) {
+TEST_F(StableIndicesTest, FirstBoardBeginsAtTheBase) {
     auto indices = open(500);
     EXPECT_THAT(ask(indices, "A", lines(3)), ElementsAre(500, 501, 502));
 }
 
-TEST_F(InterfaceIndicesTest, SameInterfaceHasTheSameIndexWheneverItIsAsked) {
+TEST_F(StableIndicesTest, SameInterfaceHasTheSameIndexWheneverItIsAsked) {
     auto indices = open();
     ask(indices, "A", lines(3));
     EXPECT_THAT(ask(indices, "A", {lines(3)[2], lines(3)[0]}), ElementsAre(1002, 1000));
 }
 
-TEST_F(InterfaceIndicesTest, IndicesAreTheSameAfterARestart) {
+TEST_F(StableIndicesTest, IndicesAreTheSameAfterARestart) {
     {
         auto indices = open();
         ask(indices, "A", lines(3));
@@ -109,7 +109,7 @@ TEST_F(InterfaceIndicesTest, IndicesAreTheSameAfterARestart) {
     EXPECT_THAT(ask(indices, "A", lines(3)), ElementsAre(1000, 1001, 1002));
 }
 
-TEST_F(InterfaceIndicesTest, BoardThatWasAwayDuringARestartHasItsIndicesAgain) {
+TEST_F(StableIndicesTest, BoardThatWasAwayDuringARestartHasItsIndicesAgain) {
     {
         auto indices = open();
         ask(indices, "A", lines(1));
@@ -125,25 +125,25 @@ TEST_F(InterfaceIndicesTest, BoardThatWasAwayDuringARestartHasItsIndicesAgain) {
     EXPECT_THAT(ask(indices, "C", lines(1)), ElementsAre(1032));
 }
 
-TEST_F(InterfaceIndicesTest, BoardOfAnotherSerialNumberHasItsOwnIndices) {
+TEST_F(StableIndicesTest, BoardOfAnotherSerialNumberHasItsOwnIndices) {
     auto indices = open();
     ask(indices, "A", lines(2));
     EXPECT_THAT(ask(indices, "A2", lines(2)), ElementsAre(1016, 1017));
 }
 
-TEST_F(InterfaceIndicesTest, InterfacesOfOneNameAndSeveralKindsAreDifferent) {
+TEST_F(StableIndicesTest, InterfacesOfOneNameAndSeveralKindsAreDifferent) {
     auto indices = open();
-    EXPECT_THAT(ask(indices, "A", {{InterfaceKind::Ethernet, "1"}, {InterfaceKind::Ip, "1"}}),
+    EXPECT_THAT(ask(indices, "A", {{IndexKind::Ethernet, "1"}, {IndexKind::Ip, "1"}}),
                 ElementsAre(1000, 1001));
 }
 
-TEST_F(InterfaceIndicesTest, BlockHasThePowerOfTwoThatLeavesRoom) {
+TEST_F(StableIndicesTest, BlockHasThePowerOfTwoThatLeavesRoom) {
     auto indices = open();
     ask(indices, "A", lines(32)); // with room for more: 64
     EXPECT_THAT(ask(indices, "B", lines(1)), ElementsAre(1064));
 }
 
-TEST_F(InterfaceIndicesTest, TwoBoardsThatGrowStayApart) {
+TEST_F(StableIndicesTest, TwoBoardsThatGrowStayApart) {
     auto indices = open();
     ask(indices, "A", lines(10));
     ask(indices, "B", lines(10));
@@ -155,7 +155,7 @@ TEST_F(InterfaceIndicesTest, TwoBoardsThatGrowStayApart) {
     EXPECT_EQ(b[16], 1048U);
 }
 
-TEST_F(InterfaceIndicesTest, GrownBoardIsTheSameAfterARestart) {
+TEST_F(StableIndicesTest, GrownBoardIsTheSameAfterARestart) {
     std::vector<std::uint32_t> before;
     {
         auto indices = open();
@@ -168,14 +168,13 @@ TEST_F(InterfaceIndicesTest, GrownBoardIsTheSameAfterARestart) {
     EXPECT_EQ(ask(indices, "A", lines(21)).back(), before.back() + 1);
 }
 
-TEST_F(InterfaceIndicesTest, InterfaceThatGoesLeavesNoRoomForAnother) {
+TEST_F(StableIndicesTest, InterfaceThatGoesLeavesNoRoomForAnother) {
     auto indices = open();
     ask(indices, "A", lines(2));
-    EXPECT_THAT(ask(indices, "A", {lines(2)[0], {InterfaceKind::Ip, "1"}}),
-                ElementsAre(1000, 1002));
+    EXPECT_THAT(ask(indices, "A", {lines(2)[0], {IndexKind::Ip, "1"}}), ElementsAre(1000, 1002));
 }
 
-TEST_F(InterfaceIndicesTest, AnotherBaseLeavesOldIndicesAlone) {
+TEST_F(StableIndicesTest, AnotherBaseLeavesOldIndicesAlone) {
     {
         auto indices = open(1000);
         ask(indices, "A", lines(1));
@@ -185,13 +184,13 @@ TEST_F(InterfaceIndicesTest, AnotherBaseLeavesOldIndicesAlone) {
     EXPECT_THAT(ask(indices, "B", lines(1)), ElementsAre(5000));
 }
 
-TEST_F(InterfaceIndicesTest, InterfacesBeyondTheLastIndexHaveNone) {
-    InterfaceIndices indices("", kLastIndex - 15);
+TEST_F(StableIndicesTest, InterfacesBeyondTheLastIndexHaveNone) {
+    StableIndices indices("", kLastIndex - 15, "interfaces");
     EXPECT_THAT(ask(indices, "A", lines(1)), ElementsAre(kLastIndex - 15));
     EXPECT_THAT(ask(indices, "B", lines(1)), ElementsAre(0));
 }
 
-TEST_F(InterfaceIndicesTest, FileThatIsNoDatabaseIsSetAsideWithOneMessage) {
+TEST_F(StableIndicesTest, FileThatIsNoDatabaseIsSetAsideWithOneMessage) {
     write("this is no database, and long enough to be taken for one if nobody looks into it");
     LogCapture logged;
     auto indices = open();
@@ -202,7 +201,7 @@ TEST_F(InterfaceIndicesTest, FileThatIsNoDatabaseIsSetAsideWithOneMessage) {
     EXPECT_THAT(ask(indices, "A", lines(1)), ElementsAre(1000));
 }
 
-TEST_F(InterfaceIndicesTest, RebuiltFileIsKept) {
+TEST_F(StableIndicesTest, RebuiltFileIsKept) {
     write("this is no database, and long enough to be taken for one if nobody looks into it");
     {
         LogCapture logged;
@@ -214,7 +213,7 @@ TEST_F(InterfaceIndicesTest, RebuiltFileIsKept) {
     EXPECT_THAT(damagedFiles(), SizeIs(1));
 }
 
-TEST_F(InterfaceIndicesTest, DatabaseWithABrokenPageIsSetAside) {
+TEST_F(StableIndicesTest, DatabaseWithABrokenPageIsSetAside) {
     {
         auto indices = open();
         ask(indices, "A", lines(500));
@@ -229,7 +228,7 @@ TEST_F(InterfaceIndicesTest, DatabaseWithABrokenPageIsSetAside) {
     EXPECT_THAT(damagedFiles(), SizeIs(1));
 }
 
-TEST_F(InterfaceIndicesTest, EmptyFileIsBegun) {
+TEST_F(StableIndicesTest, EmptyFileIsBegun) {
     write("");
     LogCapture logged;
     auto indices = open();
@@ -237,11 +236,11 @@ TEST_F(InterfaceIndicesTest, EmptyFileIsBegun) {
     EXPECT_THAT(damagedFiles(), IsEmpty());
 }
 
-TEST_F(InterfaceIndicesTest, PlaceThatCanNotBeWrittenIsWarnedOfOnce) {
+TEST_F(StableIndicesTest, PlaceThatCanNotBeWrittenIsWarnedOfOnce) {
     write("");
     // Below a file there is no directory, whoever asks.
     LogCapture logged;
-    InterfaceIndices indices(file() + "/state/ifindex.sqlite", 1000);
+    StableIndices indices(file() + "/state/ifindex.sqlite", 1000, "interfaces");
     EXPECT_THAT(ask(indices, "A", lines(1)), ElementsAre(1000));
     EXPECT_THAT(ask(indices, "B", lines(1)), ElementsAre(1016));
     std::string const message = logged.take();
@@ -249,7 +248,7 @@ TEST_F(InterfaceIndicesTest, PlaceThatCanNotBeWrittenIsWarnedOfOnce) {
     EXPECT_THAT(message, HasSubstr("--persistent-dir"));
 }
 
-TEST_F(InterfaceIndicesTest, FileThatIsInUseIsLeftAlone) {
+TEST_F(StableIndicesTest, FileThatIsInUseIsLeftAlone) {
     auto first = open();
     ask(first, "A", lines(1));
     LogCapture logged;
@@ -259,9 +258,9 @@ TEST_F(InterfaceIndicesTest, FileThatIsInUseIsLeftAlone) {
     EXPECT_THAT(ask(first, "B", lines(1)), ElementsAre(1016));
 }
 
-TEST_F(InterfaceIndicesTest, MissingDirectoryIsMadeForItsOwnerOnly) {
+TEST_F(StableIndicesTest, MissingDirectoryIsMadeForItsOwnerOnly) {
     std::string const folder = m_folder + "/state";
-    InterfaceIndices const indices(folder + "/ifindex.sqlite", 1000);
+    StableIndices const indices(folder + "/ifindex.sqlite", 1000, "interfaces");
     struct stat status {};
     ASSERT_EQ(stat(folder.c_str(), &status), 0);
     EXPECT_EQ(status.st_mode & 0777, 0700U);
@@ -270,7 +269,7 @@ TEST_F(InterfaceIndicesTest, MissingDirectoryIsMadeForItsOwnerOnly) {
 constexpr SettingKey kFirst{Setting::LineStatusChangeTraps, 1000};
 constexpr SettingKey kSecond{Setting::LinkUpDownTraps, 1001};
 
-TEST_F(InterfaceIndicesTest, SettingsAreTheSameAfterARestart) {
+TEST_F(StableIndicesTest, SettingsAreTheSameAfterARestart) {
     {
         auto indices = open();
         EXPECT_THAT(indices.settings(), IsEmpty());
@@ -280,7 +279,7 @@ TEST_F(InterfaceIndicesTest, SettingsAreTheSameAfterARestart) {
     EXPECT_THAT(open().settings(), ElementsAre(SettingEntry{kFirst, 1}, SettingEntry{kSecond, 2}));
 }
 
-TEST_F(InterfaceIndicesTest, ForgottenSettingIsGoneAfterARestart) {
+TEST_F(StableIndicesTest, ForgottenSettingIsGoneAfterARestart) {
     {
         auto indices = open();
         indices.save({{kFirst, 1}, {kSecond, 1}});
@@ -289,7 +288,7 @@ TEST_F(InterfaceIndicesTest, ForgottenSettingIsGoneAfterARestart) {
     EXPECT_THAT(open().settings(), ElementsAre(SettingEntry{kSecond, 1}));
 }
 
-TEST_F(InterfaceIndicesTest, FileFromBeforeThereWereSettingsKeepsItsIndicesAndTakesSettings) {
+TEST_F(StableIndicesTest, FileFromBeforeThereWereSettingsKeepsItsIndicesAndTakesSettings) {
     {
         auto indices = open();
         ask(indices, "A", lines(3));
@@ -304,9 +303,9 @@ TEST_F(InterfaceIndicesTest, FileFromBeforeThereWereSettingsKeepsItsIndicesAndTa
     EXPECT_THAT(open().settings(), ElementsAre(SettingEntry{kFirst, 1}));
 }
 
-TEST_F(InterfaceIndicesTest, SettingsWithoutAFileAreNotKeptAndNothingIsSaid) {
+TEST_F(StableIndicesTest, SettingsWithoutAFileAreNotKeptAndNothingIsSaid) {
     LogCapture log;
-    InterfaceIndices indices("", 1000);
+    StableIndices indices("", 1000, "interfaces");
     indices.save({{kFirst, 1}});
     EXPECT_EQ(log.take(), "");
 }
