@@ -40,7 +40,7 @@ class LineStormTest : public ::testing::Test {
 
     FakeChassis m_chassis;
     BoardSource m_source{*m_chassis.manager.get()};
-    InterfaceIndices m_indices{"", 1000};
+    StableIndices m_indices{"", 1000, "interfaces"};
     InterfaceReader m_reader{*m_chassis.manager.get(), m_indices, Uptime::Clock::now()};
     Settings m_settings;
     Counters m_counters;
