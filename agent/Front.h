@@ -24,7 +24,7 @@ struct ServedTree {
 /// What a front serves. Outlives `run`.
 struct Served {
     std::vector<ServedTree> trees; ///< the agent's own MIB module first
-    Counters const& counters;
+    Counters& counters;
     std::function<std::shared_ptr<Snapshot const>()> takeSnapshot;
     Settings& settings;
 };

@@ -32,10 +32,13 @@ void Subagent::serve(Served served) {
         roots.back().insert(roots.back().end(), place.begin(), place.end());
     }
     m_answers.emplace(own.tree, served.counters, own.arc, std::move(served.takeSnapshot));
-    m_session.emplace(m_address, std::move(roots),
-                      [this](AgentxHeader const& header, std::string_view payload) {
-                          return m_answers->answer(header, payload);
-                      });
+    m_session.emplace(
+        m_address, std::move(roots),
+        [this, &counters = served.counters](AgentxHeader const& header, std::string_view payload) {
+            counters.master = m_session->isConnected() ? Master::Connected : Master::Lost;
+            counters.masterLosses = m_session->timesLost();
+            return m_answers->answer(header, payload);
+        });
 }
 
 void Subagent::watch(int descriptor, std::function<void()> readable) {
