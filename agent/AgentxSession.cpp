@@ -322,6 +322,7 @@ void AgentxSession::tellLost(std::string const& why) {
     }
     bool const had = m_told == Told::Connected;
     m_told = Told::Lost;
+    if (had) ++m_timesLost;
     log(LogLevel::Warning,
         (had ? "lost the SNMP master at " : "no connection to the SNMP master at ") +
             m_address.text + ": " + why + "; trying again until " +

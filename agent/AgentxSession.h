@@ -61,6 +61,8 @@ class AgentxSession final : public NotificationSink {
 
     /// Whether the master serves our names, the rows apart, and answers.
     bool isConnected() const { return m_told == Told::Connected; }
+    /// How often the master has been lost after it was connected.
+    std::uint32_t timesLost() const { return m_timesLost; }
 
     bool ready() const override { return isConnected() && !m_taken; }
     void send(Notification const& notification, std::function<void()> taken) override;
@@ -100,6 +102,7 @@ class AgentxSession final : public NotificationSink {
     int m_socket = -1;
     Stage m_stage = Stage::Away;
     Told m_told = Told::Nothing;
+    std::uint32_t m_timesLost = 0;
     std::uint32_t m_session = 0;
     std::uint32_t m_lastPacket = 0;
     std::vector<Awaited> m_awaited;

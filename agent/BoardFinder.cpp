@@ -41,10 +41,15 @@ BoardFinder::BoardFinder() {
     m_good = boards.has_value();
     if (!m_good) return;
     for (long const board : *boards) {
-        auto const [place, isNew] =
-            m_handles.emplace(printable(DevMapBoardIf(board).SerialNumber()), board);
+        DevMapBoardIf const record(board);
+        std::string const serialNumber = printable(record.SerialNumber());
+        auto const [place, isNew] = m_handles.emplace(serialNumber, board);
         if (!isNew) place->second.reset();
+        auto const [driver, isNewDriver] =
+            m_driverBoards.emplace(record.VORNDriverBoardID(), serialNumber);
+        if (!isNewDriver) driver->second.clear();
     }
+    m_driverBoards.erase(-1);
     // These are no serial numbers, even when only one board is without.
     m_handles.erase("unknown");
     m_handles.erase("");
@@ -53,6 +58,13 @@ BoardFinder::BoardFinder() {
 std::optional<long> BoardFinder::find(std::string const& serialNumber) const {
     auto const found = m_handles.find(serialNumber);
     return found == m_handles.end() ? std::nullopt : found->second;
+}
+
+std::optional<std::string> BoardFinder::serialNumberOfDriverBoard(long driverBoard) const {
+    auto const found = m_driverBoards.find(driverBoard);
+    // One that is that of several boards, or of none, is no serial number either.
+    if (found == m_driverBoards.end() || !find(found->second)) return std::nullopt;
+    return found->second;
 }
 
 } // namespace kvloamd

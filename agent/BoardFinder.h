@@ -20,10 +20,14 @@ class BoardFinder {
     /// The handle of the board with this serial number, as `readSerialNumber` gives it. Nothing
     /// when there is none, or several, or the serial number is not known.
     std::optional<long> find(std::string const& serialNumber) const;
+    /// The serial number of the board that its driver knows by this number; nothing when there is
+    /// none, or several, or the serial number is not known.
+    std::optional<std::string> serialNumberOfDriverBoard(long driverBoard) const;
 
   private:
     bool m_good = false;
     std::map<std::string, std::optional<long>> m_handles; ///< nothing: of several boards
+    std::map<long, std::string> m_driverBoards;           ///< empty: of several boards
 };
 
 } // namespace kvloamd

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/Collector.h"
 
+#include <algorithm>
 #include <utility>
 
 namespace kvloamd {
@@ -93,7 +94,12 @@ std::shared_ptr<Snapshot const> Collector::collect(Snapshot const* former) {
     auto snapshot = std::make_shared<Snapshot>();
     snapshot->begun = Clock::now();
     m_readRows(*snapshot);
+    snapshot->refreshTime =
+        std::chrono::duration_cast<std::chrono::milliseconds>(Clock::now() - snapshot->begun);
+    snapshot->longestRefreshTime = snapshot->refreshTime;
     if (former == nullptr) return snapshot;
+    snapshot->number = former->number + 1;
+    snapshot->longestRefreshTime = std::max(snapshot->refreshTime, former->longestRefreshTime);
     using Hundredths = std::chrono::duration<std::uint32_t, std::centi>;
     snapshot->lastChange =
         snapshot->boards == former->boards

@@ -17,6 +17,7 @@
 #include "agent/Collector.h"
 #include "agent/EntityNotices.h"
 #include "agent/EntityReader.h"
+#include "agent/FaultListener.h"
 #include "agent/Front.h"
 #include "agent/InterfaceReader.h"
 #include "agent/LineListener.h"
@@ -46,16 +47,19 @@ constexpr std::uint32_t kFirstEntity = 1;
 
 /// What the library's threads may reach until the process ends. Never destroyed.
 struct Boards {
-    explicit Boards(Oid enterprise)
-        : listener(*manager.get(), source, queue, counters, std::move(enterprise)) {}
+    explicit Boards(Oid const& enterprise)
+        : listener(*manager.get(), source, queue, counters, enterprise),
+          faultListener(*manager.get(), faults, queue, enterprise) {}
 
     ReferenceCounter<BoardManager> manager{new BoardManager};
     Counters counters;
     Settings settings;
     BoardSource source{*manager.get()};
     NotificationQueue queue{counters};
+    FaultLog faults;
     StatusListener listener;
     LineListener lines{*manager.get(), settings, queue, counters};
+    FaultListener faultListener;
 };
 
 /// Makes the first calls of the library's singletons, which belong to one thread, and asks the
@@ -91,25 +95,34 @@ void attachModules(std::vector<LoadedModule> const& modules, Boards& boards) {
     for (LoadedModule const& module : modules)
         factories.push_back(module.createFactory());
     boards.manager->AddBoardStatusListener(&boards.listener);
+    boards.manager->AddBoardStatusListener(&boards.faultListener);
+    ExternalFaultEventAdaptor::get_instance()->AddExternalFaultEventListener(&boards.faultListener);
     for (ReferenceCounter<BoardFactory> const& factory : factories)
         boards.manager->Attach(factory);
     for (LoadedModule const& module : modules)
         ServiceManager::GetInstance()->AddModule(module.name().c_str());
 }
 
-/// Has a listener tell of changes for a scope.
-template <class Listener>
+/// Has the listeners tell of changes for a scope.
 class ListeningScope {
   public:
-    ListeningScope(Listener& listener, std::function<void()> changed) : m_listener(listener) {
-        m_listener.start(std::move(changed));
+    ListeningScope(Boards& boards, std::function<void()> const& changed) : m_boards(boards) {
+        m_boards.listener.start(changed);
+        m_boards.faultListener.start(changed);
+        m_boards.lines.start(changed);
     }
-    ~ListeningScope() { m_listener.stop(); }
+    ~ListeningScope() { stop(); }
     ListeningScope(ListeningScope const&) = delete;
     ListeningScope& operator=(ListeningScope const&) = delete;
 
+    void stop() {
+        m_boards.listener.stop();
+        m_boards.faultListener.stop();
+        m_boards.lines.stop();
+    }
+
   private:
-    Listener& m_listener;
+    Boards& m_boards;
 };
 
 /// A folder for a scope.
@@ -198,7 +211,8 @@ class KeptSettings {
 };
 
 void serve(Options const& options, ReadOptions const& readAgain, Front& front,
-           Signals const& signals, Boards& boards, Clock::time_point started) {
+           Signals const& signals, Boards& boards) {
+    Clock::time_point const started = boards.counters.started;
     Wakeup wakeup;
     ServiceManager& services = *ServiceManager::GetInstance();
     KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
@@ -218,6 +232,8 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             snapshot.services = readServices(services);
             snapshot.platformService = readPlatformService(services);
             snapshot.processes = readProcesses(statistics);
+            snapshot.faults = boards.faults.read(started);
+            snapshot.resources = readResources(*boards.manager.get(), snapshot.boards);
             snapshot.records = platform.read(snapshot.boards);
             boards.lines.listen(snapshot.boards, interfaces.uptime());
             snapshot.interfaces = interfaces.read(snapshot.boards);
@@ -235,7 +251,10 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     front.serve({{{tree, options.enterprise, {{kObjectsPlace, "KVL-OAM-MIB"}}},
                   {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}}},
                  boards.counters,
-                 [&] { return collector.snapshot(); },
+                 [&] {
+                     ++boards.counters.requests;
+                     return collector.snapshot();
+                 },
                  [&] { return collector.newest(); },
                  boards.settings});
     Notifier notifier(boards.queue, front.notifications());
@@ -258,16 +277,14 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
         return earliest(entityNews,
                         earliest(notifier.announce(collector.newest()->begun), notice.beat()));
     });
-    ListeningScope const listening(boards.listener, [&] { collector.renew(); });
-    ListeningScope const listeningToLines(boards.lines, [&] { collector.renew(); });
+    ListeningScope listening(boards, [&] { collector.renew(); });
     log(LogLevel::Info, serving);
     notice.ready(serving);
     front.run();
     signals.letStopThrough();
     notice.stopping();
     log(LogLevel::Info, "stopping");
-    boards.listener.stop();
-    boards.lines.stop();
+    listening.stop();
     announceLast(notifier, boards.queue, front);
 }
 
@@ -285,9 +302,9 @@ int runDaemon(Options const& options, ReadOptions const& readAgain) {
                                    "with --module");
         std::unique_ptr<Front> const front = makeFront(options);
         if (!front->open() || !platformAnswers()) return kExitFailure;
-        Clock::time_point const started = Clock::now();
+        boards->counters.started = Clock::now();
         attachModules(modules, *boards);
-        serve(options, readAgain, *front, signals, *boards, started);
+        serve(options, readAgain, *front, signals, *boards);
         log(LogLevel::Info, "stopped");
     } catch (std::exception const& error) {
         log(LogLevel::Error, error.what());

@@ -18,7 +18,7 @@ namespace kvloamd {
 /// What a front serves. Outlives `run`.
 struct Served {
     std::vector<ServedTree> trees; ///< the agent's own MIB module first
-    Counters const& counters;
+    Counters& counters;
     std::function<std::shared_ptr<Snapshot const>()> takeSnapshot;   ///< for a request
     std::function<std::shared_ptr<Snapshot const>()> newestSnapshot; ///< as it is
     Settings& settings;

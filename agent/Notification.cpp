@@ -7,6 +7,25 @@
 
 namespace kvloamd {
 
+namespace {
+
+/// An object that is sent only.
+NotifiedObject sent(Oid const& enterprise, std::uint32_t number, ValueType type,
+                    decltype(NotifiedObject::value) value) {
+    return {joined(enterprise, joined(kNotifyObjectsPlace, Oid{number, 0})), type,
+            std::move(value)};
+}
+
+NotifiedObject sent(Oid const& enterprise, std::uint32_t number, std::int64_t value) {
+    return sent(enterprise, number, ValueType::Integer, value);
+}
+
+NotifiedObject sent(Oid const& enterprise, std::uint32_t number, std::string value) {
+    return sent(enterprise, number, ValueType::Text, std::move(value));
+}
+
+} // namespace
+
 Value NotifiedObject::view() const {
     if (auto const* const number = std::get_if<std::int64_t>(&value)) return *number;
     if (auto const* const octets = std::get_if<std::string>(&value))
@@ -16,13 +35,17 @@ Value NotifiedObject::view() const {
 
 Notification boardStatusChange(Oid const& enterprise, int boardIndex, std::string serialNumber,
                                int status) {
-    auto const object = [&](std::uint32_t number) {
-        return joined(enterprise, joined(kNotifyObjectsPlace, Oid{number, 0}));
-    };
     return {joined(enterprise, kBoardStatusChangePlace),
-            {{object(1), ValueType::Integer, std::int64_t{boardIndex}},
-             {object(2), ValueType::Text, std::move(serialNumber)},
-             {object(3), ValueType::Integer, std::int64_t{status}}},
+            {sent(enterprise, 1, boardIndex), sent(enterprise, 2, std::move(serialNumber)),
+             sent(enterprise, 3, status)},
+            Clock::now()};
+}
+
+Notification faultChange(Oid const& enterprise, FaultNews const& news) {
+    return {joined(enterprise, news.raised ? kFaultRaisedPlace : kFaultClearedPlace),
+            {sent(enterprise, 1, news.boardIndex), sent(enterprise, 2, news.serialNumber),
+             sent(enterprise, 4, ValueType::Gauge, std::int64_t{news.value}),
+             sent(enterprise, 5, news.platformBoard)},
             Clock::now()};
 }
 

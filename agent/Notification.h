@@ -33,4 +33,16 @@ struct Notification {
 Notification boardStatusChange(Oid const& enterprise, int boardIndex, std::string serialNumber,
                                int status);
 
+/// A fault has been raised or cleared.
+struct FaultNews {
+    bool raised = true;
+    int boardIndex = 0; ///< 0: of a board that the agent does not know
+    std::string serialNumber;
+    std::uint16_t value = 0;
+    int platformBoard = 0; ///< the number by which the platform speaks of the board
+};
+
+/// kvlFaultRaised or kvlFaultCleared.
+Notification faultChange(Oid const& enterprise, FaultNews const& news);
+
 } // namespace kvloamd

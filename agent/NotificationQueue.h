@@ -12,8 +12,8 @@
 
 namespace kvloamd {
 
-/// First in, first out, bounded: a notification that finds the queue full is dropped and counted.
-/// All operations may be called from any thread.
+/// First in, first out, bounded: a notification that finds the queue full is dropped. Counts those
+/// that wait, have been taken out, or were dropped. All operations may be called from any thread.
 class NotificationQueue {
   public:
     static constexpr std::size_t kCapacity = 4096;
@@ -28,6 +28,7 @@ class NotificationQueue {
             m_notifications.push_back(std::move(notification));
         else
             ++m_counters.notificationsDropped;
+        countWaiting();
     }
 
     /// The oldest one, which stays; nothing when the queue is empty.
@@ -37,12 +38,15 @@ class NotificationQueue {
         return m_notifications.front();
     }
 
-    /// Takes the oldest one out; nothing when the queue is empty. There is one consumer only.
+    /// Takes the oldest one out, which has been sent; nothing when the queue is empty. There is one
+    /// consumer only.
     std::optional<Notification> pop() {
         std::scoped_lock const guard(m_mutex);
         if (m_notifications.empty()) return std::nullopt;
         Notification notification = std::move(m_notifications.front());
         m_notifications.pop_front();
+        ++m_counters.notificationsSent;
+        countWaiting();
         return notification;
     }
 
@@ -52,6 +56,10 @@ class NotificationQueue {
     }
 
   private:
+    void countWaiting() {
+        m_counters.notificationsWaiting = static_cast<std::uint32_t>(m_notifications.size());
+    }
+
     Counters& m_counters;
     std::size_t m_capacity;
     std::mutex m_mutex;

@@ -13,6 +13,8 @@ namespace kvloamd {
 inline Oid const kObjectsPlace{1, 1};
 inline Oid const kNotifyObjectsPlace{1, 1, 3};
 inline Oid const kBoardStatusChangePlace{1, 0, 1};
+inline Oid const kFaultRaisedPlace{1, 0, 2};
+inline Oid const kFaultClearedPlace{1, 0, 3};
 
 std::span<Scalar const> scalars();
 
@@ -24,6 +26,8 @@ Table const& subDeviceTable();
 Table const& processorTable();
 Table const& storeTable();
 Table const& processTable();
+Table const& resourceDeviceTable();
+Table const& faultTable();
 
 /// Every table.
 std::vector<Table const*> tables();

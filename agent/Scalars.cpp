@@ -1,5 +1,9 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The objects of KVL-OAM-MIB that have one instance.
+#include <algorithm>
+#include <chrono>
+#include <limits>
+
 #include "agent/Objects.h"
 #include "agent/RowValues.h"
 #include "services/oam.h"
@@ -7,6 +11,22 @@
 namespace kvloamd {
 
 namespace {
+
+// What kvlAgentFront says.
+constexpr std::int64_t kStandAlone = 1;
+constexpr std::int64_t kSubagent = 2;
+
+Value milliseconds(Clock::duration time) {
+    // What does not fit shows as the most that does.
+    return std::clamp<std::int64_t>(
+        std::chrono::duration_cast<std::chrono::milliseconds>(time).count(), 0,
+        std::numeric_limits<std::uint32_t>::max());
+}
+
+template <class Row>
+Value size(std::vector<Row> const& rows) {
+    return static_cast<std::int64_t>(rows.size());
+}
 
 Value count(std::atomic<std::uint32_t> const& counter) {
     return std::int64_t{counter.load(std::memory_order_relaxed)};
@@ -31,9 +51,7 @@ std::span<Scalar const> scalars() {
         {"kvlBoardCount",
          {1, 1, 2, 1},
          ValueType::Gauge,
-         [](Facts const& facts) -> Value {
-             return static_cast<std::int64_t>(facts.snapshot.boards.size());
-         }},
+         [](Facts const& facts) { return size(facts.snapshot.boards); }},
         {"kvlBoardTableLastChange",
          {1, 1, 2, 2},
          ValueType::TimeTicks,
@@ -54,13 +72,99 @@ std::span<Scalar const> scalars() {
          [](Facts const& facts) {
              return textIfKnown<&PlatformService::changeDate>(facts.snapshot.platformService);
          }},
+        {"kvlFaultCount",
+         {1, 1, 8, 1},
+         ValueType::Gauge,
+         [](Facts const& facts) { return size(facts.snapshot.faults.rows); }},
+        {"kvlFaultsRaised",
+         {1, 1, 8, 2},
+         ValueType::Counter,
+         [](Facts const& facts) -> Value { return std::int64_t{facts.snapshot.faults.raised}; }},
+        {"kvlFaultTableLastChange",
+         {1, 1, 8, 3},
+         ValueType::TimeTicks,
+         [](Facts const& facts) -> Value {
+             return std::int64_t{facts.snapshot.faults.lastChange};
+         }},
+        {"kvlFaultsUnlisted",
+         {1, 1, 8, 4},
+         ValueType::Counter,
+         [](Facts const& facts) -> Value { return std::int64_t{facts.snapshot.faults.unlisted}; }},
+        {"kvlAgentUpTime",
+         {1, 1, 9, 1},
+         ValueType::TimeTicks,
+         [](Facts const& facts) -> Value {
+             using Hundredths = std::chrono::duration<std::int64_t, std::centi>;
+             auto const up = Clock::now() - facts.counters.started;
+             // They begin anew after 497 days, as all time ticks.
+             return std::int64_t{
+                 static_cast<std::uint32_t>(std::chrono::duration_cast<Hundredths>(up).count())};
+         }},
+        {"kvlNotificationsSent",
+         {1, 1, 9, 2},
+         ValueType::Counter,
+         [](Facts const& facts) { return count(facts.counters.notificationsSent); }},
+        {"kvlNotificationsWaiting",
+         {1, 1, 9, 3},
+         ValueType::Gauge,
+         [](Facts const& facts) { return count(facts.counters.notificationsWaiting); }},
+        {"kvlRequests",
+         {1, 1, 9, 4},
+         ValueType::Counter,
+         [](Facts const& facts) { return count(facts.counters.requests); }},
+        {"kvlSnapshots",
+         {1, 1, 9, 5},
+         ValueType::Counter,
+         [](Facts const& facts) -> Value { return std::int64_t{facts.snapshot.number}; }},
+        {"kvlSnapshotAge",
+         {1, 1, 9, 6},
+         ValueType::Gauge,
+         [](Facts const& facts) { return milliseconds(Clock::now() - facts.snapshot.begun); }},
+        {"kvlRefreshTime",
+         {1, 1, 9, 7},
+         ValueType::Gauge,
+         [](Facts const& facts) { return milliseconds(facts.snapshot.refreshTime); }},
+        {"kvlLongestRefreshTime",
+         {1, 1, 9, 8},
+         ValueType::Gauge,
+         [](Facts const& facts) { return milliseconds(facts.snapshot.longestRefreshTime); }},
+        {"kvlInterfaceCount",
+         {1, 1, 9, 9},
+         ValueType::Gauge,
+         [](Facts const& facts) { return size(facts.snapshot.interfaces.interfaces); }},
+        {"kvlLineCount",
+         {1, 1, 9, 10},
+         ValueType::Gauge,
+         [](Facts const& facts) { return size(facts.snapshot.interfaces.lines); }},
+        {"kvlAgentFront",
+         {1, 1, 9, 11},
+         ValueType::Integer,
+         [](Facts const& facts) -> Value {
+             return facts.counters.master == Master::None ? kStandAlone : kSubagent;
+         }},
+        {"kvlMasterState",
+         {1, 1, 9, 12},
+         ValueType::Integer,
+         [](Facts const& facts) -> Value {
+             Master const master = facts.counters.master;
+             if (master == Master::None) return {};
+             return static_cast<std::int64_t>(master);
+         }},
+        {"kvlMasterLosses",
+         {1, 1, 9, 13},
+         ValueType::Counter,
+         [](Facts const& facts) {
+             return facts.counters.master == Master::None ? Value{}
+                                                          : count(facts.counters.masterLosses);
+         }},
     };
     return described;
 }
 
 std::vector<Table const*> tables() {
-    return {&boardTable(),     &moduleTable(),    &serviceTable(), &deviceTable(),
-            &subDeviceTable(), &processorTable(), &storeTable(),   &processTable()};
+    return {&boardTable(),          &moduleTable(),    &serviceTable(), &deviceTable(),
+            &subDeviceTable(),      &processorTable(), &storeTable(),   &processTable(),
+            &resourceDeviceTable(), &faultTable()};
 }
 
 } // namespace kvloamd

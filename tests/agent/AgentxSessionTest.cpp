@@ -492,6 +492,25 @@ TEST_F(AgentxSessionTest, NotificationOfALostConnectionIsNotTaken) {
     EXPECT_EQ(m_taken, 0);
 }
 
+TEST_F(AgentxSessionTest, LossesOfAMasterThatWasConnectedAreCounted) {
+    startMaster();
+    startSession();
+    connectSession();
+    EXPECT_EQ(m_session->timesLost(), 0U);
+    m_master->hangUp();
+    EXPECT_TRUE(runUntil([this] { return !m_session->isConnected(); }));
+    EXPECT_EQ(m_session->timesLost(), 1U);
+}
+
+TEST_F(AgentxSessionTest, MasterThatWasNeverConnectedIsNotLost) {
+    startMaster();
+    startSession();
+    EXPECT_EQ(next().header.kind, AgentxKind::Open);
+    m_master->hangUp();
+    EXPECT_TRUE(runUntil([this] { return m_session->descriptor() < 0; }));
+    EXPECT_EQ(m_session->timesLost(), 0U);
+}
+
 TEST_F(AgentxSessionTest, RefusedNotificationIsNotSentAgain) {
     startMaster();
     startSession();

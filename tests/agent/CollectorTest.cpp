@@ -154,6 +154,32 @@ TEST_F(CollectorTest, HeldSnapshotStaysAsItIs) {
     EXPECT_EQ(held->boards.at(0).name, "first");
 }
 
+TEST_F(CollectorTest, SnapshotsAreNumbered) {
+    start(kByEventOnly);
+    EXPECT_EQ(m_collector->newest()->number, 1U);
+    m_collector->renew();
+    awaitRenewal();
+    EXPECT_EQ(m_collector->newest()->number, 2U);
+}
+
+TEST_F(CollectorTest, LongestReadingIsRemembered) {
+    // Longer than the resolution, however fast the clock.
+    m_whileReading = [] {
+        auto const begun = Clock::now();
+        while (Clock::now() - begun < 5ms) {
+        }
+    };
+    start(kByEventOnly);
+    std::shared_ptr<Snapshot const> const first = m_collector->newest();
+    EXPECT_GE(first->refreshTime, 5ms);
+    EXPECT_EQ(first->longestRefreshTime, first->refreshTime);
+    m_whileReading = [] {};
+    m_collector->renew();
+    awaitRenewal();
+    EXPECT_GE(m_collector->newest()->longestRefreshTime, first->refreshTime);
+    EXPECT_GE(m_collector->newest()->longestRefreshTime, m_collector->newest()->refreshTime);
+}
+
 TEST_F(CollectorTest, TimeOfChangeIsZeroUntilSomethingChanges) {
     start(kByEventOnly);
     m_collector->renew();

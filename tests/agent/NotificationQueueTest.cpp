@@ -46,5 +46,15 @@ TEST_F(NotificationQueueTest, QueueTakesNotificationsAgainOnceItHasRoom) {
     EXPECT_EQ(m_counters.notificationsDropped, 1U);
 }
 
+TEST_F(NotificationQueueTest, ThoseThatWaitAndThoseThatHaveLeftAreCounted) {
+    for (std::uint32_t number = 1; number <= 3; ++number)
+        push(number);
+    EXPECT_EQ(m_counters.notificationsWaiting, 2U);
+    EXPECT_EQ(m_counters.notificationsSent, 0U);
+    pop();
+    EXPECT_EQ(m_counters.notificationsWaiting, 1U);
+    EXPECT_EQ(m_counters.notificationsSent, 1U);
+}
+
 } // namespace
 } // namespace kvloamd

@@ -85,6 +85,26 @@ TEST_F(MasterAwayTest, MasterThatIsKilledAndComesBackServesAgain) {
     EXPECT_THAT(statesTold(), ElementsAre("connected", "lost", "connected"));
 }
 
+TEST_F(MasterAwayTest, LossesOfTheMasterAreCounted) {
+    start();
+    EXPECT_EQ(get("kvlAgentFront.0"), "INTEGER: subagent(2)");
+    EXPECT_EQ(get("kvlMasterState.0"), "INTEGER: connected(1)");
+    EXPECT_EQ(get("kvlMasterLosses.0"), "Counter32: 0 times");
+    killMaster();
+    ASSERT_TRUE(isLost()) << agent().output();
+    startMaster();
+    ASSERT_TRUE(isConnected(2)) << agent().output();
+    EXPECT_EQ(get("kvlMasterLosses.0"), "Counter32: 1 times");
+}
+
+TEST_F(MasterAwayTest, FaultIsAnnouncedThroughTheMaster) {
+    start();
+    sim({"fault", "2", "17"});
+    EXPECT_TRUE(trapReceiver().waitFor("\tKVL-OAM-MIB::kvlNotifyFaultValue.0 = 17\t"))
+        << trapReceiver().output();
+    EXPECT_EQ(get("kvlFaultTimesRaised.2.17"), "Counter32: 1 times");
+}
+
 TEST_F(MasterAwayTest, MasterThatRestartsFiveTimesQuicklyServesInTheEnd) {
     start();
     for (int round = 0; round < 5; ++round) {

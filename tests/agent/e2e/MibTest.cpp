@@ -5,6 +5,7 @@
 
 #include <gmock/gmock.h>
 
+#include "agent/Notification.h"
 #include "agent/Objects.h"
 #include "tests/agent/e2e/AgentFixture.h"
 
@@ -53,7 +54,7 @@ class MibTest : public AgentFixture {
         case ValueType::Counter64:
             return ::testing::Eq("Counter64");
         case ValueType::Gauge:
-            return ::testing::Eq("Gauge32");
+            return ::testing::AnyOf("Gauge32", "Unsigned32");
         case ValueType::TimeTicks:
             return ::testing::Eq("TimeTicks");
         case ValueType::ObjectId:
@@ -68,6 +69,15 @@ class MibTest : public AgentFixture {
     void expectDescribed(std::string const& name, Oid const& relative, ValueType type) {
         EXPECT_EQ(numberOf(name), place(relative)) << name;
         EXPECT_THAT(syntaxOf(name), syntaxFor(type)) << name;
+    }
+    /// `notification`: below no arc.
+    void expectCarried(Notification const& notification, std::vector<std::string> const& names) {
+        ASSERT_EQ(notification.objects.size(), names.size());
+        for (std::size_t i = 0; i < names.size(); ++i) {
+            NotifiedObject const& object = notification.objects[i];
+            ASSERT_EQ(object.name.back(), 0U);
+            expectDescribed(names[i], {object.name.begin(), object.name.end() - 1}, object.type);
+        }
     }
 };
 
@@ -105,9 +115,19 @@ TEST_F(MibTest, ColumnsAreWhereTheModuleSays) {
     }
 }
 
-TEST_F(MibTest, NotificationIsWhereTheModuleSays) {
+TEST_F(MibTest, NotificationsAreWhereTheModuleSays) {
     EXPECT_EQ(numberOf("kvlBoardStatusChange"), place(kBoardStatusChangePlace));
+    EXPECT_EQ(numberOf("kvlFaultRaised"), place(kFaultRaisedPlace));
+    EXPECT_EQ(numberOf("kvlFaultCleared"), place(kFaultClearedPlace));
     EXPECT_EQ(numberOf("kvlNotifyObjects"), place(kNotifyObjectsPlace));
+}
+
+TEST_F(MibTest, NotificationsCarryWhatTheModuleSays) {
+    expectCarried(boardStatusChange({}, 1, "A", BoardStatusAdded),
+                  {"kvlNotifyBoardIndex", "kvlNotifyBoardSerialNumber", "kvlNotifyBoardStatus"});
+    expectCarried(faultChange({}, FaultNews{}),
+                  {"kvlNotifyBoardIndex", "kvlNotifyBoardSerialNumber", "kvlNotifyFaultValue",
+                   "kvlNotifyFaultPlatformBoard"});
 }
 
 TEST_F(MibTest, EveryReadableObjectOfTheModuleIsDescribed) {
