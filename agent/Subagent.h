@@ -41,7 +41,7 @@ class Subagent final : public Front {
 
     AgentxAddress m_address;
     std::function<std::shared_ptr<Snapshot const>()> m_newestSnapshot;
-    Counters const* m_counters = nullptr;
+    Counters* m_counters = nullptr;
     std::optional<AgentxAnswers> m_answers;
     std::optional<SharedRows> m_rows;
     std::shared_ptr<Snapshot const> m_seen; ///< by the rows

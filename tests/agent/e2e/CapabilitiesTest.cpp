@@ -126,6 +126,18 @@ TEST_F(CapabilitiesTest, ObjectsThatAreNotServedAreStatedAsNotImplemented) {
     EXPECT_EQ(stated("not-implemented"), missing);
 }
 
+TEST_F(CapabilitiesTest, ColumnsThatCanBeSetAreNotStatedAsReadOnly) {
+    auto const readOnly = stated("read-only");
+    std::set<std::string> settable;
+    for (Table const* const table : standardTables())
+        for (std::size_t column = 0; column < table->columnCount(); ++column)
+            if (ColumnHead const head = table->column(column); head.writable)
+                settable.insert(head.name);
+    EXPECT_THAT(settable, Not(IsEmpty()));
+    for (std::string const& name : settable)
+        EXPECT_FALSE(readOnly.contains(name)) << name;
+}
+
 TEST_F(CapabilitiesTest, EveryGroupOfTheOwnModuleIsIncluded) {
     auto const groups =
         found(contentOf(MIB_DIR "/KVL-OAM-MIB.txt"), "\n(\\w+) (?:OBJECT|NOTIFICATION)-GROUP\n");

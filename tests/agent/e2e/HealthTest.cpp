@@ -60,8 +60,8 @@ TEST_F(HealthTest, InterfacesAndLinesAreThoseOfTheStandardTables) {
 
 TEST_F(HealthTest, NotificationsThatWereSentAreCounted) {
     startAgent();
-    sim({"stop", "1"});
     sim({"fault", "2", "17"});
+    sim({"fault", "2", "17", "--clear"});
     EXPECT_TRUE(eventually([this] { return number("kvlNotificationsSent.0") == 2; }));
     EXPECT_EQ(number("kvlNotificationsWaiting.0"), 0U);
 }
