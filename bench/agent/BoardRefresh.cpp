@@ -41,7 +41,7 @@ ReferenceCounter<BoardManager> managerOf(int boards) {
 BoardRefresh::BoardRefresh(int boards)
     : m_manager(managerOf(boards)),
       m_source(*m_manager.get()),
-      m_indices("", kvloamd::InterfaceIndices::kDefaultBase),
+      m_indices("", kvloamd::StableIndices::kDefaultBase),
       m_interfaces(*m_manager.get(), m_indices, kvloamd::Clock::now()) {}
 
 void BoardRefresh::read(kvloamd::Snapshot& snapshot) {

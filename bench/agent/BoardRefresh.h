@@ -5,7 +5,7 @@
 #include <optional>
 
 #include "agent/BoardSource.h"
-#include "agent/InterfaceIndices.h"
+#include "agent/StableIndices.h"
 #include "agent/InterfaceReader.h"
 #include "agent/Snapshot.h"
 #include "board/BoardManager.h"
@@ -21,6 +21,6 @@ class BoardRefresh {
   private:
     ReferenceCounter<BoardManager> m_manager;
     kvloamd::BoardSource m_source;
-    kvloamd::InterfaceIndices m_indices;
+    kvloamd::StableIndices m_indices;
     kvloamd::InterfaceReader m_interfaces;
 };
