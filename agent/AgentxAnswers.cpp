@@ -76,14 +76,15 @@ bool AgentxAnswers::next(Facts const& facts, AgentxName const& start, Instance& 
 }
 
 std::string AgentxAnswers::set(AgentxHeader const& header, AgentxReader reader) {
-    auto const snapshot = m_takeSnapshot();
-    Facts const facts{*snapshot, m_counters, &m_settings};
+    // Only a test looks at the rows.
+    std::shared_ptr<Snapshot const> snapshot;
     return m_sets.answer(
         header, reader,
         [&](OidView name, std::optional<std::int64_t> integer, std::optional<Change>& change) {
             ObjectTree const* const tree = treeOf(name);
-            return tree == nullptr ? SetFault::NotWritable
-                                   : tree->test(facts, name, integer, change);
+            if (tree == nullptr) return SetFault::NotWritable;
+            if (!snapshot) snapshot = m_takeSnapshot();
+            return tree->test({*snapshot, m_counters, &m_settings}, name, integer, change);
         });
 }
 
