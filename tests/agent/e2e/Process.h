@@ -34,6 +34,7 @@ class Process {
     int wait();
     void signal(int number) const;
 
+    pid_t pid() const { return m_pid; }
     std::string const& output() const { return m_output; }
 
   private:
