@@ -220,7 +220,9 @@ EntityRows EntityReader::read(Snapshot const& snapshot) {
         if (m_physical) m_lastChange = sinceStart();
         m_physical = std::make_shared<PhysicalEntities const>(std::move(found));
     }
-    return {m_physical, m_states.read(m_physical->entities, snapshot.boards, snapshot.interfaces),
+    return {m_physical,
+            m_states.read(m_physical->entities, snapshot.boards, snapshot.interfaces,
+                          snapshot.faults.rows),
             m_lastChange};
 }
 

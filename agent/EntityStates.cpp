@@ -71,13 +71,15 @@ Row const* find(std::vector<Row> const& rows, std::uint32_t index) {
 
 } // namespace
 
-EntityState boardState(BoardRow const& board) {
+EntityState boardState(BoardRow const& board, bool hasFault) {
     EntityState state;
-    state.alarm = 0;
+    // The platform tells no severity.
+    unsigned const faults = hasFault ? unsigned{kAlarmIndeterminate} : 0U;
+    state.alarm = static_cast<char>(faults);
     if (board.secondaryStatus == BoardStatusFailed) {
         // A failed board is a stopped one too, but nobody has locked it.
         state.oper = OperState::Disabled;
-        state.alarm = static_cast<char>(kAlarmCritical);
+        state.alarm = static_cast<char>(faults | kAlarmCritical);
         return state;
     }
     switch (board.status) {
@@ -155,14 +157,15 @@ EntityStates::EntityStates(Now now) : m_now(std::move(now)), m_started(dateOctet
 
 std::vector<EntityStateRow> EntityStates::read(std::vector<PhysicalRow> const& entities,
                                                std::vector<BoardRow> const& boards,
-                                               InterfaceRows const& interfaces) {
+                                               InterfaceRows const& interfaces,
+                                               std::vector<FaultRow> const& faults) {
     std::map<std::uint32_t, UsageState> const usage = lineUsage(interfaces);
     std::vector<EntityStateRow> rows;
     std::string const now = m_read ? dateOctets(m_now()) : m_started;
     for (PhysicalRow const& entity : entities) {
         EntityState state;
         if (BoardRow const* const board = find(boards, entity.boardIndex)) {
-            state = boardState(*board);
+            state = boardState(*board, find(faults, entity.boardIndex) != nullptr);
         } else if (InterfaceRow const* const interface =
                        find(interfaces.interfaces, entity.ifIndex)) {
             auto const used = usage.find(entity.ifIndex);

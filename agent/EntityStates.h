@@ -9,12 +9,13 @@
 
 #include "agent/BoardRow.h"
 #include "agent/EntityRows.h"
+#include "agent/FaultRow.h"
 #include "agent/InterfaceRows.h"
 
 namespace kvloamd {
 
-/// What the board's status says of it.
-EntityState boardState(BoardRow const& board);
+/// What the board's status says of it, and whether it has a fault.
+EntityState boardState(BoardRow const& board, bool hasFault);
 
 /// What the interface's status, the line's alarms (`line` is null for an Ethernet interface) and
 /// the use of its channels say of a port.
@@ -36,7 +37,8 @@ class EntityStates {
     /// reading has been as it is since the states were made.
     std::vector<EntityStateRow> read(std::vector<PhysicalRow> const& entities,
                                      std::vector<BoardRow> const& boards,
-                                     InterfaceRows const& interfaces);
+                                     InterfaceRows const& interfaces,
+                                     std::vector<FaultRow> const& faults);
 
   private:
     Now m_now;

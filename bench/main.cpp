@@ -1,26 +1,11 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // Runs the library's benchmarks and prints the ratios to their peers.
-#include <unistd.h>
-
-#include <cstdlib>
 #include <thread>
 
 #include <benchmark/benchmark.h>
 
+#include "HugePages.h"
 #include "RatioReporter.h"
-
-namespace {
-
-/// Both sides get their memory as an agent that runs as a service does (debian/kvloamd.service): in
-/// huge pages where the system has them for who asks. The C library reads this once, at a program's
-/// start. A value that is set already counts.
-void startWithHugePages(char** argv) {
-    if (getenv("GLIBC_TUNABLES") == nullptr &&
-        setenv("GLIBC_TUNABLES", "glibc.malloc.hugetlb=1", 1) == 0)
-        execv("/proc/self/exe", argv);
-}
-
-} // namespace
 
 int main(int argc, char** argv) {
     startWithHugePages(argv);

@@ -3,13 +3,22 @@
 
 #include <algorithm>
 #include <cstddef>
+#include <cstdint>
 #include <limits>
 #include <utility>
 
 namespace {
 
 /// How many entries ahead a pass looks.
-constexpr std::ptrdiff_t kAhead = 16;
+constexpr std::ptrdiff_t kAhead = 6;
+
+/// Where an action's first fields are: three cache lines have an interval table's running interval.
+/// Nothing is read, so that an object that is smaller, or gone, does no harm.
+void fetch(Schedulable const* target) {
+    auto const address = reinterpret_cast<std::uintptr_t>(target);
+    for (std::uintptr_t offset = 0; offset <= 128; offset += 64)
+        __builtin_prefetch(reinterpret_cast<void const*>(address + offset), 1);
+}
 
 bool earlier(SchedItem const& a, SchedItem const& b) {
     return a.due < b.due;
@@ -70,7 +79,7 @@ void ActionScheduler::callDue(long now) {
     bool inOrder = true;
     for (auto entry = m_list.begin(); entry != notDue; ++entry) {
         // Targets lie all over memory; the next ones are fetched while this one works.
-        if (notDue - entry > kAhead) __builtin_prefetch(entry[kAhead].target, 1);
+        if (notDue - entry > kAhead) fetch(entry[kAhead].target);
         entry->target->ScheduledAction();
         if (entry->period <= 0) continue;
         entry->due = add_saturated(entry->due, entry->period);

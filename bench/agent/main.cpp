@@ -17,6 +17,7 @@
 #include "Agents.h"
 #include "Child.h"
 #include "DelayReport.h"
+#include "HugePages.h"
 #include "IntervalRows.h"
 #include "LeanClient.h"
 #include "RatioReporter.h"
@@ -202,6 +203,7 @@ int run(int argc, char** argv) {
 } // namespace
 
 int main(int argc, char** argv) {
+    startWithHugePages(argv);
     try {
         return run(argc, argv);
     } catch (std::exception const& error) {

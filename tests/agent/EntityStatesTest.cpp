@@ -16,7 +16,7 @@ EntityState stateOf(int status, int secondaryStatus = BoardStatusNone) {
     BoardRow board;
     board.status = status;
     board.secondaryStatus = secondaryStatus;
-    return boardState(board);
+    return boardState(board, false);
 }
 
 EntityState portOf(std::optional<int> operStatus, std::optional<int> lineStatus = std::nullopt) {
@@ -46,6 +46,20 @@ TEST(BoardStateTest, StoppedBoardIsLocked) {
     EXPECT_EQ(state.oper, OperState::Disabled);
     EXPECT_EQ(state.standby, StandbyState::Unknown);
     EXPECT_EQ(state.alarm, 0);
+}
+
+TEST(BoardStateTest, FaultIsAnAlarmOfNoKnownSeverity) {
+    BoardRow board;
+    board.status = BoardStatusStarted;
+    EntityState const state = boardState(board, true);
+    EXPECT_EQ(state.alarm, '\x02');
+    EXPECT_EQ(state.oper, OperState::Enabled);
+}
+
+TEST(BoardStateTest, FailedBoardWithAFaultHasBothAlarms) {
+    BoardRow board;
+    board.secondaryStatus = BoardStatusFailed;
+    EXPECT_EQ(boardState(board, true).alarm, '\x22');
 }
 
 TEST(BoardStateTest, BoardThatIsToStopWorksYet) {
@@ -190,7 +204,9 @@ class EntityStatesTest : public ::testing::Test {
         m_board.boardIndex = 1;
         m_board.status = BoardStatusStarted;
     }
-    std::vector<EntityStateRow> read() { return m_states.read({m_entity}, {m_board}, {}); }
+    std::vector<EntityStateRow> read() {
+        return m_states.read({m_entity}, {m_board}, {}, m_faults);
+    }
     std::string readChanged() {
         auto const rows = read();
         EXPECT_THAT(rows, SizeIs(1));
@@ -200,6 +216,7 @@ class EntityStatesTest : public ::testing::Test {
     long m_now = 1'000'000'000;
     PhysicalRow m_entity;
     BoardRow m_board;
+    std::vector<FaultRow> m_faults;
     EntityStates m_states{[this] { return m_now; }};
 };
 
@@ -219,9 +236,16 @@ TEST_F(EntityStatesTest, ChangeOfStateIsDated) {
     EXPECT_EQ(readChanged(), dateOctets(1'000'000'060));
 }
 
+TEST_F(EntityStatesTest, FaultOfABoardIsItsAlarmAndNoOthers) {
+    m_faults.push_back({2, 17, 2, 0, "", 1});
+    EXPECT_EQ(read().at(0).state.alarm, 0);
+    m_faults.insert(m_faults.begin(), {1, 17, 1, 0, "", 1});
+    EXPECT_EQ(read().at(0).state.alarm, '\x02');
+}
+
 TEST_F(EntityStatesTest, EntityThatComesIsInItsStateSinceThen) {
     read();
-    EXPECT_THAT(m_states.read({}, {}, {}), IsEmpty());
+    EXPECT_THAT(m_states.read({}, {}, {}, {}), IsEmpty());
     m_now += 60;
     EXPECT_EQ(readChanged(), dateOctets(1'000'000'060));
 }
