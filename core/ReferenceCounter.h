@@ -20,7 +20,8 @@ class ReferenceCounter : public Object {
     /// A handle of `object`; null makes an empty handle.
     ReferenceCounter(T* object = nullptr)
         : Object(false),
-          m_record(ReferenceTable::get_instance()->create_refinfo(object)),
+          // The one table is no derived one: no need to ask it which function that is.
+          m_record(ReferenceTable::get_instance()->ReferenceTable::create_refinfo(object)),
           m_object(object) {
         if (m_record != nullptr) {
             m_record->lock();
@@ -60,7 +61,7 @@ class ReferenceCounter : public Object {
         if (record == nullptr || record->lower() != 0) return;
         m_record = nullptr;
         record->unlock();
-        ReferenceTable::get_instance()->destroy_refcount(m_object);
+        ReferenceTable::get_instance()->ReferenceTable::destroy_refcount(m_object);
         delete m_object;
         m_object = nullptr;
     }

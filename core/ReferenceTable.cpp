@@ -49,8 +49,10 @@ ReferenceInfo* ReferenceTable::create_refinfo(Object* object) {
     ReferenceInfo* record = nullptr;
     {
         KVL::BriefGuard const guard(m_records->get_impl_mutex());
-        record = m_records->map.find_or_insert(object, [] { return RecordPool::take(); });
-        inStep = m_records->turns.note(&t_thread);
+        record = m_records->map.find_or_insert(object, [&] {
+            inStep = m_records->turns.note(&t_thread);
+            return RecordPool::take();
+        });
     }
     if (inStep) [[unlikely]]
         KVL::stay_away();

@@ -4,6 +4,7 @@
 
 #include <atomic>
 #include <cstdint>
+#include <new>
 
 #include "core/AddressMap.h"
 #include "core/Object.h"
@@ -17,8 +18,8 @@ class KVLOAM_API ReferenceInfo {
     ReferenceInfo(ReferenceInfo const&) = delete;
     ReferenceInfo& operator=(ReferenceInfo const&) = delete;
 
-    void lock() { KVL::lock_briefly(m_lock->get_impl_mutex()); }
-    void unlock() { pthread_mutex_unlock(m_lock->get_impl_mutex()); }
+    void lock() { KVL::lock_briefly(mutex()); }
+    void unlock() { pthread_mutex_unlock(mutex()); }
 
     std::int32_t count() const { return m_count.load(std::memory_order_relaxed); }
     /// Requires the lock.
@@ -33,6 +34,12 @@ class KVLOAM_API ReferenceInfo {
     }
 
   private:
+    /// The lock's, found without a look at the pointer: every copy of a handle asks twice.
+    pthread_mutex_t* mutex() {
+        return std::launder(reinterpret_cast<KVLLockable_pthread*>(m_lockStorage))
+            ->get_impl_mutex();
+    }
+
     std::atomic<std::int32_t> m_count{0};
     KVLLockable_pthread* m_lock; ///< recursive; lives in the storage below
     alignas(KVLLockable_pthread) unsigned char m_lockStorage[sizeof(KVLLockable_pthread)];

@@ -27,7 +27,7 @@ void pauses(int count) {
 } // namespace
 
 void stay_away() {
-    pauses(kFirstPauses);
+    pauses(4 * kFirstPauses);
 }
 
 void lock_contended(pthread_mutex_t* mutex) {
