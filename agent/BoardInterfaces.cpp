@@ -20,15 +20,12 @@ namespace kvloamd {
 
 namespace {
 
-// IF-MIB's names of types and states.
+// IF-MIB's names of types.
 constexpr int kTypeLoopback = 24;
 constexpr int kTypeIsdn = 63;
 constexpr int kTypeDs0 = 81;
 constexpr int kTrue = 1;
 constexpr int kFalse = 2;
-constexpr int kUp = 1;
-constexpr int kDown = 2;
-constexpr int kDormant = 5;
 
 /// What any DS0 carries.
 constexpr std::uint32_t kBearerSpeed = 64000;

@@ -12,14 +12,6 @@ namespace kvloamd {
 
 namespace {
 
-// IF-MIB's ifAdminStatus and ifOperStatus.
-constexpr int kUp = 1;
-constexpr int kDown = 2;
-constexpr int kTesting = 3;
-constexpr int kDormant = 5;
-constexpr int kNotPresent = 6;
-constexpr int kLowerLayerDown = 7;
-
 AdminState adminOf(std::optional<int> status) {
     if (status == kUp) return AdminState::Unlocked;
     return status == kDown ? AdminState::Locked : AdminState::Unknown;

@@ -13,6 +13,17 @@
 
 namespace kvloamd {
 
+/// IF-MIB's ifOperStatus; the first three are ifAdminStatus's too.
+enum InterfaceStatus : int {
+    kUp = 1,
+    kDown = 2,
+    kTesting = 3,
+    kUnknownStatus = 4,
+    kDormant = 5,
+    kNotPresent = 6,
+    kLowerLayerDown = 7
+};
+
 /// The counters of an interface, in the order of IF-MIB's ifTable.
 enum InterfaceCounter : std::size_t {
     kInOctets,

@@ -11,10 +11,6 @@ namespace {
 
 constexpr int kEnabled = 1;
 
-// ifOperStatus's.
-constexpr int kDown = 2;
-constexpr int kNotPresent = 6;
-
 bool hasChanged(std::optional<int> former, std::optional<int> now) {
     if (!former || !now || former == now) return false;
     if (former == kNotPresent || now == kNotPresent) return false;

@@ -8,14 +8,6 @@
 namespace kvloamd {
 namespace {
 
-constexpr int kUp = 1;
-constexpr int kDown = 2;
-constexpr int kTesting = 3;
-constexpr int kUnknown = 4;
-constexpr int kDormant = 5;
-constexpr int kNotPresent = 6;
-constexpr int kLowerLayerDown = 7;
-
 InterfaceRow interface(std::uint32_t ifIndex, std::optional<int> operStatus,
                        std::uint32_t boardIndex = 1) {
     InterfaceRow row;
@@ -59,12 +51,12 @@ TEST_F(LinkWatchTest, FirstSnapshotTellsNothing) {
 }
 
 TEST_F(LinkWatchTest, LinkThatBecomesDownIsTold) {
-    for (int const former : {kUp, kTesting, kUnknown, kDormant, kLowerLayerDown})
+    for (int const former : {kUp, kTesting, kUnknownStatus, kDormant, kLowerLayerDown})
         EXPECT_EQ(toldOf(former, kDown), "down 7 ") << former;
 }
 
 TEST_F(LinkWatchTest, LinkThatIsDownNoLongerIsTold) {
-    for (int const now : {kUp, kTesting, kUnknown, kDormant, kLowerLayerDown})
+    for (int const now : {kUp, kTesting, kUnknownStatus, kDormant, kLowerLayerDown})
         EXPECT_EQ(toldOf(kDown, now), "up 7 ") << now;
 }
 
