@@ -173,6 +173,12 @@ bool AgentFixture::eventually(std::function<bool()> const& condition) {
     return true;
 }
 
+void AgentFixture::startWithReceiver(std::string const& access) {
+    startTrapReceiver("authCommunity log public\n");
+    configureSnmp(access + " public 127.0.0.1\ntrap2sink " + trapAddress() + " public\n");
+    startAgent();
+}
+
 void AgentFixture::startTrapReceiver(std::string const& config) {
     write(path("trapd.conf"), config);
     for (int attempt = 0; attempt < 10; ++attempt) {

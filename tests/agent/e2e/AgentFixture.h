@@ -69,6 +69,9 @@ class AgentFixture : public ::testing::Test {
     /// Starts to receive notifications. Before `startAgent`, whose configuration names the port.
     void startTrapReceiver(std::string const& config);
     Process& trapReceiver() { return *m_trapReceiver; }
+    /// Starts a receiver of notifications of version 2c and the agent, which sends them there;
+    /// `access` is what the community public gets.
+    void startWithReceiver(std::string const& access = "rocommunity");
 
     static int freePort();
     /// Whether somebody on this host has bound the UDP port, as the kernel lists it.

@@ -30,14 +30,6 @@ constexpr char kOperDisabled[] = "SNMPv2-SMI::mib-2.131.0.2";
 
 class EntityTest : public AgentFixture {
   protected:
-    /// Starts receiver and agent.
-    void startWithReceiver() {
-        startTrapReceiver("authCommunity log public\n");
-        configureSnmp("rocommunity public 127.0.0.1\n"
-                      "trap2sink " +
-                      trapAddress() + " public\n");
-        startAgent();
-    }
     /// The values of a column by what follows its number, "17".
     std::map<std::string, std::string> column(std::string const& name) const {
         std::map<std::string, std::string> values;

@@ -13,14 +13,6 @@ using ::testing::SizeIs;
 
 class FaultTest : public AgentFixture {
   protected:
-    /// Starts receiver and agent.
-    void start() {
-        startTrapReceiver("authCommunity log public\n");
-        configureSnmp("rocommunity public 127.0.0.1\n"
-                      "trap2sink " +
-                      trapAddress() + " public\n");
-        startAgent();
-    }
     void expectAnnounced(std::string const& which, int index, std::string const& serialNumber,
                          int fault, int platformBoard) {
         std::string const text =
@@ -41,7 +33,7 @@ class FaultTest : public AgentFixture {
 };
 
 TEST_F(FaultTest, RaisedFaultIsInTheTableWhenItsNotificationArrives) {
-    start();
+    startWithReceiver();
     sim({"fault", "2", "17"});
     expectAnnounced("kvlFaultRaised", 2, "QL-77-0420", 17, 1);
     EXPECT_EQ(get("kvlFaultTimesRaised.2.17"), "Counter32: 1 times");
@@ -53,7 +45,7 @@ TEST_F(FaultTest, RaisedFaultIsInTheTableWhenItsNotificationArrives) {
 }
 
 TEST_F(FaultTest, ClearedFaultIsOutOfTheTableWhenItsNotificationArrives) {
-    start();
+    startWithReceiver();
     sim({"fault", "2", "17"});
     sim({"fault", "2", "17", "--clear"});
     expectAnnounced("kvlFaultCleared", 2, "QL-77-0420", 17, 1);
@@ -82,13 +74,13 @@ TEST_F(FaultTest, LinesAlarmIsAFaultOfItsBoard) {
 TEST_F(FaultTest, BoardWithoutLogicalIdentifierIsKnownByItsDrivers) {
     useChassis("boards:\n"
                "  - {handle: 7, attributes: {SERIAL_NUMBER: \"S7\", VORN_DRIVER_BOARD_ID: 70}}\n");
-    start();
+    startWithReceiver();
     sim({"fault", "7", "5"});
     expectAnnounced("kvlFaultRaised", 1, "S7", 5, 70);
 }
 
 TEST_F(FaultTest, FaultThatComesWithABoardIsTheBoards) {
-    start();
+    startWithReceiver();
     sim({"insert", "--handle", "9", "--serial", "NEW-9"});
     sim({"fault", "9", "5"});
     expectAnnounced("kvlFaultRaised", 4, "NEW-9", 5, 8);
@@ -96,7 +88,7 @@ TEST_F(FaultTest, FaultThatComesWithABoardIsTheBoards) {
 }
 
 TEST_F(FaultTest, FaultOfABoardThatNobodyKnowsIsUnderBoardZero) {
-    start();
+    startWithReceiver();
     sim({"event", "0x30001", "--board", "4711", "--value", "9"});
     expectAnnounced("kvlFaultRaised", 0, "", 9, -1);
     EXPECT_EQ(get("kvlFaultPlatformBoard.0.9"), "INTEGER: -1");

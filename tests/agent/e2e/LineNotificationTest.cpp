@@ -23,15 +23,7 @@ constexpr char kAnyLinkDown[] = "snmpModules.1.1.5.3";
 
 class LineNotificationTest : public AgentFixture {
   protected:
-    /// Starts receiver and agent, with notifications of version 2c.
-    void start() {
-        startTrapReceiver("authCommunity log public\n");
-        configureSnmp("rwcommunity public 127.0.0.1\n"
-                      "trap2sink " +
-                      trapAddress() + " public\n");
-        startAgent();
-    }
-    /// The same with those of version 3.
+    /// Starts receiver and agent, with notifications of version 3.
     void startWithUser() {
         startTrapReceiver("createUser -e 0x8000000001020304 op SHA authpass1 AES privpass1\n"
                           "authUser log op priv\n");
@@ -75,7 +67,7 @@ class LineNotificationTest : public AgentFixture {
 };
 
 TEST_F(LineNotificationTest, LineForWhichItIsEnabledIsToldCutAndWhole) {
-    start();
+    startWithReceiver("rwcommunity");
     set(kLineTraps, "1");
     cut();
     expectLineTold(kCut);
@@ -92,7 +84,7 @@ TEST_F(LineNotificationTest, ThirdVersionCarriesLinesAndLinks) {
 }
 
 TEST_F(LineNotificationTest, LineForWhichItIsNotEnabledIsNotTold) {
-    start();
+    startWithReceiver("rwcommunity");
     cut();
     expectLinkTold(3, "1000", 2);
     mend();
@@ -102,7 +94,7 @@ TEST_F(LineNotificationTest, LineForWhichItIsNotEnabledIsNotTold) {
 }
 
 TEST_F(LineNotificationTest, LineForWhichItIsDisabledAgainIsNotTold) {
-    start();
+    startWithReceiver("rwcommunity");
     set(kLineTraps, "1");
     cut();
     expectLineTold(kCut);
@@ -113,7 +105,7 @@ TEST_F(LineNotificationTest, LineForWhichItIsDisabledAgainIsNotTold) {
 }
 
 TEST_F(LineNotificationTest, LinkIsToldDownAndUp) {
-    start();
+    startWithReceiver("rwcommunity");
     cut();
     expectLinkTold(3, "1000", 2);
     mend();
@@ -121,7 +113,7 @@ TEST_F(LineNotificationTest, LinkIsToldDownAndUp) {
 }
 
 TEST_F(LineNotificationTest, LinkForWhichItIsDisabledIsNotTold) {
-    start();
+    startWithReceiver("rwcommunity");
     set(kLineTraps, "1");
     set(kLinkTraps, "2");
     cut();
@@ -132,7 +124,7 @@ TEST_F(LineNotificationTest, LinkForWhichItIsDisabledIsNotTold) {
 }
 
 TEST_F(LineNotificationTest, ChannelIsToldWhenItIsEnabled) {
-    start();
+    startWithReceiver("rwcommunity");
     std::string const channel = indexOf("D1");
     ASSERT_NE(channel, "none");
     sim({"call", "signalling", "301", "l2"});
@@ -143,7 +135,7 @@ TEST_F(LineNotificationTest, ChannelIsToldWhenItIsEnabled) {
 }
 
 TEST_F(LineNotificationTest, TablesShowTheChangeWhenItsNotificationArrives) {
-    start();
+    startWithReceiver("rwcommunity");
     set(kLineTraps, "1");
     cut();
     expectLineTold(kCut);
@@ -152,7 +144,7 @@ TEST_F(LineNotificationTest, TablesShowTheChangeWhenItsNotificationArrives) {
 }
 
 TEST_F(LineNotificationTest, LineIsToldAfterARestartToo) {
-    start();
+    startWithReceiver("rwcommunity");
     set(kLineTraps, "1");
     EXPECT_EQ(stopAgent(), 0) << agent().output();
     startAgent();
@@ -166,7 +158,7 @@ TEST_F(LineNotificationTest, LineOfABoardThatHasComeBackIsToldAndItsComingIsNot)
                "    attributes: {SERIAL_NUMBER: ONE}\n"
                "    devices: [{handle: 101, type: 501, attributes: {NAME: trunk}, "
                "line: {type: esf}}]\n");
-    start();
+    startWithReceiver("rwcommunity");
     set(kLineTraps, "1");
     sim({"remove", "1"});
     ASSERT_TRUE(eventually([&] { return get(kLineTraps).starts_with("No Such"); }));

@@ -11,14 +11,6 @@ using ::testing::HasSubstr;
 
 class NotificationTest : public AgentFixture {
   protected:
-    /// Starts receiver and agent, with notifications of version 2c.
-    void start() {
-        startTrapReceiver("authCommunity log public\n");
-        configureSnmp("rocommunity public 127.0.0.1\n"
-                      "trap2sink " +
-                      trapAddress() + " public\n");
-        startAgent();
-    }
     /// Starts receiver and agent, with notifications of version 3; `kind` is "" or "-Ci".
     void startWithUser(std::string const& kind) {
         startTrapReceiver("createUser -e 0x8000000001020304 op SHA authpass1 AES privpass1\n"
@@ -50,13 +42,13 @@ class NotificationTest : public AgentFixture {
 };
 
 TEST_F(NotificationTest, RemovedBoardIsAnnounced) {
-    start();
+    startWithReceiver();
     sim({"remove", "2"});
     expectAnnounced(2, "QL-77-0420", "removed");
 }
 
 TEST_F(NotificationTest, InsertedBoardIsAnnouncedAsAddedThenStarted) {
-    start();
+    startWithReceiver();
     sim({"insert", "--handle", "9", "--serial", "NEW-9"});
     expectAnnounced(4, "NEW-9", "added");
     expectAnnounced(4, "NEW-9", "started");
@@ -66,14 +58,14 @@ TEST_F(NotificationTest, InsertedBoardIsAnnouncedAsAddedThenStarted) {
 }
 
 TEST_F(NotificationTest, ReplacedBoardIsAnnouncedAsAnotherBoard) {
-    start();
+    startWithReceiver();
     sim({"replace", "3", "--serial", "SWAPPED"});
     expectAnnounced(3, "V0003-E", "removed");
     expectAnnounced(4, "SWAPPED", "added");
 }
 
 TEST_F(NotificationTest, StoppedAndStartedBoardIsAnnounced) {
-    start();
+    startWithReceiver();
     sim({"stop", "1"});
     expectAnnounced(1, "NX50001", "stopped");
     sim({"start", "1"});
@@ -81,13 +73,13 @@ TEST_F(NotificationTest, StoppedAndStartedBoardIsAnnounced) {
 }
 
 TEST_F(NotificationTest, FailedBoardIsAnnounced) {
-    start();
+    startWithReceiver();
     sim({"fail", "1"});
     expectAnnounced(1, "NX50001", "failed");
 }
 
 TEST_F(NotificationTest, TableShowsTheChangeWhenItsNotificationArrives) {
-    start();
+    startWithReceiver();
     sim({"remove", "2"});
     expectAnnounced(2, "QL-77-0420", "removed");
     EXPECT_THAT(get("kvlBoardName.2"), HasSubstr("No Such Instance"));
@@ -100,7 +92,7 @@ TEST_F(NotificationTest, TableShowsTheChangeWhenItsNotificationArrives) {
 }
 
 TEST_F(NotificationTest, BoardsThatAreThereAtTheStartAreNotAnnounced) {
-    start();
+    startWithReceiver();
     sim({"remove", "2"});
     expectAnnounced(2, "QL-77-0420", "removed");
     EXPECT_EQ(get("kvlBoardStatusChanges.0"), "Counter32: 1 changes");
@@ -109,7 +101,7 @@ TEST_F(NotificationTest, BoardsThatAreThereAtTheStartAreNotAnnounced) {
 }
 
 TEST_F(NotificationTest, ManyChangesArriveEachOnceAndInOrder) {
-    start();
+    startWithReceiver();
     for (int round = 0; round < 20; ++round) {
         sim({"stop", "1"});
         sim({"start", "1"});
@@ -129,7 +121,7 @@ TEST_F(NotificationTest, ManyChangesArriveEachOnceAndInOrder) {
 }
 
 TEST_F(NotificationTest, TimeOfChangeMovesWithTheTable) {
-    start();
+    startWithReceiver();
     EXPECT_EQ(get("kvlBoardTableLastChange.0"), "Timeticks: (0) 0:00:00.00");
     sim({"stop", "1"});
     expectAnnounced(1, "NX50001", "stopped");
