@@ -92,12 +92,13 @@ class LinePerformance {
     bool completesDegradedMinute(LineCounts const& counts);
     void breakRun();
 
+    // What every second touches lies together.
+    Minute m_minute;
     LineFormat m_format;
     bool m_unavailable = false;
     /// How many seconds in a row, up to now, speak for the line's being what it is not yet
     /// (unavailable or available), and what changes once they are ten.
     std::int32_t m_runLength = 0;
     Change m_correction;
-    Minute m_minute;
     Minute m_minuteBeforeRun; ///< to go back to when a run in unavailable time is broken
 };

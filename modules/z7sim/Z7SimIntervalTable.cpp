@@ -26,7 +26,7 @@ void add(LineCounts const& counts, DS1Interval& interval) {
 Z7SimIntervalTable::Z7SimIntervalTable(LineFormat format, std::shared_ptr<LineSource> source,
                                        std::shared_ptr<LineState> state,
                                        std::vector<DS1LineCounters> const& past)
-    : m_performance(format), m_source(std::move(source)), m_state(std::move(state)) {
+    : m_source(std::move(source)), m_state(std::move(state)), m_performance(format) {
     // The base has the table ticking already. A day of past takes a while: no tick may come
     // between.
     ActionScheduler_pthread* const scheduler = ActionScheduler_pthread::GetScheduler();

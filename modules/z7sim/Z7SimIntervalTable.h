@@ -31,8 +31,8 @@ class Z7SimIntervalTable final : public DS1IntervalTable {
     void count(DS1LineCounters const& now);
     void close();
 
-    LinePerformance m_performance;
     std::shared_ptr<LineSource> m_source;
     std::shared_ptr<LineState> m_state;
     DS1LineCounters m_last{}; ///< as read a second ago
+    LinePerformance m_performance;
 };
