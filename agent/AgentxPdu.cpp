@@ -1,8 +1,10 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/AgentxPdu.h"
 
-#include <algorithm>
+#include <endian.h>
+
 #include <array>
+#include <cstring>
 #include <utility>
 
 namespace kvloamd {
@@ -82,25 +84,24 @@ std::string_view AgentxReader::take(std::size_t size) {
     return taken;
 }
 
-std::uint32_t AgentxReader::unsignedOf(std::size_t size) {
-    std::string_view const octets = take(size);
-    std::uint32_t value = 0;
-    for (std::size_t i = 0; i < size; ++i)
-        value =
-            (value << 8U) | static_cast<std::uint8_t>(octets[m_networkOrder ? i : size - 1 - i]);
-    return value;
-}
-
 std::uint8_t AgentxReader::octet() {
-    return static_cast<std::uint8_t>(unsignedOf(1));
+    return static_cast<std::uint8_t>(take(1)[0]);
 }
 
 std::uint16_t AgentxReader::number16() {
-    return static_cast<std::uint16_t>(unsignedOf(2));
+    std::uint16_t value = 0;
+    std::memcpy(&value, take(sizeof value).data(), sizeof value);
+    return m_networkOrder ? be16toh(value) : le16toh(value);
 }
 
 std::uint32_t AgentxReader::number() {
-    return unsignedOf(4);
+    return numberAt(take(sizeof(std::uint32_t)).data());
+}
+
+std::uint32_t AgentxReader::numberAt(char const* octets) const {
+    std::uint32_t value = 0;
+    std::memcpy(&value, octets, sizeof value);
+    return m_networkOrder ? be32toh(value) : le32toh(value);
 }
 
 AgentxName AgentxReader::name() {
@@ -114,8 +115,9 @@ AgentxName AgentxReader::name() {
         result.name.assign(kInternet.begin(), kInternet.end());
         result.name.push_back(prefix);
     }
-    for (std::size_t i = 0; i < count; ++i)
-        result.name.push_back(number());
+    std::string_view const parts = take(count * sizeof(std::uint32_t));
+    for (std::size_t at = 0; at < parts.size(); at += sizeof(std::uint32_t))
+        result.name.push_back(numberAt(parts.data() + at));
     return result;
 }
 
@@ -174,13 +176,13 @@ void AgentxWriter::number16(std::uint16_t value) {
 }
 
 void AgentxWriter::number(std::uint32_t value) {
-    m_octets.append(4, '\0');
-    putNumber(m_octets.size() - 4, value);
+    m_octets.append(sizeof value, '\0');
+    putNumber(m_octets.size() - sizeof value, value);
 }
 
 void AgentxWriter::putNumber(std::size_t at, std::uint32_t value) {
-    for (std::size_t i = 0; i < 4; ++i)
-        m_octets[at + i] = static_cast<char>(static_cast<std::uint8_t>(value >> (24 - 8 * i)));
+    std::uint32_t const octets = htobe32(value);
+    std::memcpy(m_octets.data() + at, &octets, sizeof octets);
 }
 
 void AgentxWriter::name(OidView name) {
@@ -194,8 +196,12 @@ void AgentxWriter::name(OidView name) {
     octet(static_cast<std::uint8_t>(prefix));
     octet(0);
     octet(0);
-    for (std::uint32_t const part : name)
-        number(part);
+    std::size_t at = m_octets.size();
+    m_octets.resize(at + name.size_bytes());
+    for (std::uint32_t const part : name) {
+        putNumber(at, part);
+        at += sizeof part;
+    }
 }
 
 void AgentxWriter::text(std::string_view value) {

@@ -96,7 +96,7 @@ class AgentxReader {
 
   private:
     std::string_view take(std::size_t size);
-    std::uint32_t unsignedOf(std::size_t size);
+    std::uint32_t numberAt(char const* octets) const;
 
     std::string_view m_rest;
     bool m_networkOrder;

@@ -10,8 +10,8 @@ namespace {
 /// A scalar's one instance.
 constexpr std::uint32_t kScalarIndex[] = {0};
 
-/// Longer ones have to be made room for.
-constexpr std::size_t kUsualIndex = 3;
+/// An instance's whole name, from the root on; longer ones have to be made room for.
+constexpr std::size_t kUsualName = 20;
 
 } // namespace
 
@@ -110,7 +110,7 @@ bool ObjectTree::firstIn(Node const& node, Facts const& facts, OidView index, bo
     for (std::size_t row = node.table->firstRow(facts, index, orEqual); row < rows; ++row) {
         found.value = node.table->value(facts, node.column, row);
         if (!isKnown(found.value)) continue;
-        found.name.reserve(node.place.size() + kUsualIndex);
+        found.name.reserve(kUsualName);
         found.name = node.place;
         node.table->appendIndex(facts, row, found.name);
         found.type = node.type;
