@@ -3,6 +3,8 @@
 
 #include <algorithm>
 
+#include "agent/Courtesy.h"
+
 namespace kvloamd {
 
 std::vector<BoardRow> BoardSource::read() {
@@ -14,6 +16,7 @@ std::vector<BoardRow> BoardSource::read() {
         ReferenceCounter<Board> const board = m_manager.GetBoardByIndex(index);
         if (Board* const asked = board.get(); asked != nullptr)
             rows.push_back(readBoard(*asked, index));
+        giveWay();
     }
     std::erase_if(
         rows, [this](BoardRow const& row) { return hasGone(static_cast<int>(row.boardIndex)); });

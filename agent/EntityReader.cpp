@@ -9,6 +9,8 @@
 #include <utility>
 #include <vector>
 
+#include "agent/Courtesy.h"
+
 namespace kvloamd {
 
 namespace {
@@ -83,8 +85,10 @@ class Building {
 PhysicalEntities Building::build() {
     addChassisAndSlots();
     std::vector<std::string> const names = keptNames(m_snapshot.boards);
-    for (std::size_t i = 0; i < names.size(); ++i)
+    for (std::size_t i = 0; i < names.size(); ++i) {
         addBoard(m_snapshot.boards[i], names[i]);
+        giveWay();
+    }
     std::ranges::sort(m_built.entities, {}, &PhysicalRow::entity);
     std::ranges::sort(m_built.contains);
     std::ranges::sort(m_built.aliases, {}, &AliasRow::entity);

@@ -7,6 +7,8 @@
 #include <set>
 #include <utility>
 
+#include "agent/Courtesy.h"
+
 namespace kvloamd {
 
 namespace {
@@ -75,6 +77,7 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
         BoardInterfaces found = readInterfaces(*asked, toTicks, m_histories);
         auto const indices = m_indices.indicesOf(names[i], found.keys);
         append(all, std::move(found), indices, boardIndex);
+        giveWay();
     }
     m_indices.save();
     if (m_counted.size() > all.interfaces.size())

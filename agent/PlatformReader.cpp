@@ -4,6 +4,7 @@
 #include <algorithm>
 
 #include "agent/BoardFinder.h"
+#include "agent/Courtesy.h"
 #include "agent/Log.h"
 
 namespace kvloamd {
@@ -66,6 +67,7 @@ void PlatformReader::readObjects(Wanted const& wanted) {
         auto const handle = finder.find(board->serialNumber);
         m_boards[board->boardIndex].objects =
             handle ? readDevices(*handle, board->boardIndex) : DeviceRows{};
+        giveWay();
     }
 }
 

@@ -4,6 +4,7 @@
 #include <cstring>
 #include <string_view>
 
+#include "agent/Courtesy.h"
 #include "agent/RowValues.h"
 #include "board/ISDNChannel.h"
 #include "z7/Z7ResourceFeature.h"
@@ -83,6 +84,7 @@ std::vector<ResourceRow> readResources(BoardManager& manager, std::vector<BoardR
     for (BoardRow const& row : boards) {
         auto const board = manager.GetBoardByIndex(static_cast<int>(row.boardIndex));
         if (Board* const asked = board.get()) readBoardResources(*asked, row.boardIndex, rows);
+        giveWay();
     }
     return rows;
 }
