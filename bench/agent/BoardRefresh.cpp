@@ -1,9 +1,12 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "BoardRefresh.h"
 
+#include <ctime>
 #include <string>
 
 #include "Z7SimBoardFactory.h"
+#include "agent/ResourceRows.h"
+#include "platform/ActionScheduler_pthread.h"
 #include "simulator/Control.h"
 
 namespace {
@@ -42,9 +45,22 @@ BoardRefresh::BoardRefresh(int boards)
     : m_manager(managerOf(boards)),
       m_source(*m_manager.get()),
       m_indices("", 1000, "interfaces"),
-      m_interfaces(*m_manager.get(), m_indices, kvloamd::Clock::now()) {}
+      m_interfaces(*m_manager.get(), m_indices, kvloamd::Clock::now()),
+      m_entityIndices("", 1, "physical entities"),
+      m_entities(m_entityIndices, kvloamd::Clock::now(), [] { return std::time(nullptr); }) {}
+
+void BoardRefresh::stopLines() {
+    auto* const scheduler = ActionScheduler_pthread::GetScheduler();
+    kvloamd::Snapshot snapshot;
+    read(snapshot);
+    for (kvloamd::PlacedLine const& line : m_interfaces.takeLines())
+        scheduler->Remove(line.line.get()->GetIntervalTable().get());
+}
 
 void BoardRefresh::read(kvloamd::Snapshot& snapshot) {
     snapshot.boards = m_source.read();
+    snapshot.resources = kvloamd::readResources(*m_manager.get(), snapshot.boards);
+    snapshot.records = m_platform.read(snapshot.boards);
     snapshot.interfaces = m_interfaces.read(snapshot.boards);
+    snapshot.entities = m_entities.read(snapshot);
 }

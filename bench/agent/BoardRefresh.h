@@ -1,11 +1,13 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// What a refresh of the agent's snapshot reads of boards and their lines.
+// What a refresh of the agent's snapshot reads of boards, and makes of them.
 #pragma once
 
 #include <optional>
 
 #include "agent/BoardSource.h"
+#include "agent/EntityReader.h"
 #include "agent/InterfaceReader.h"
+#include "agent/PlatformReader.h"
 #include "agent/Snapshot.h"
 #include "agent/StableIndices.h"
 #include "board/BoardManager.h"
@@ -16,6 +18,9 @@ class BoardRefresh {
   public:
     explicit BoardRefresh(int boards);
 
+    /// Has the lines count no more seconds.
+    void stopLines();
+
     void read(kvloamd::Snapshot& snapshot);
 
   private:
@@ -23,4 +28,7 @@ class BoardRefresh {
     kvloamd::BoardSource m_source;
     kvloamd::StableIndices m_indices;
     kvloamd::InterfaceReader m_interfaces;
+    kvloamd::PlatformReader m_platform;
+    kvloamd::StableIndices m_entityIndices;
+    kvloamd::EntityReader m_entities;
 };

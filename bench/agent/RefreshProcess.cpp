@@ -11,6 +11,7 @@
 #include <utility>
 
 #include "BoardRefresh.h"
+#include "agent/Log.h"
 
 namespace {
 
@@ -24,6 +25,8 @@ double processorSeconds() {
 
 /// Refreshes for every message, and answers how long it took.
 int refreshWhenAsked(int socket, int boards) {
+    // There is no attribute store.
+    kvloamd::setLogLevel(kvloamd::LogLevel::Error);
     BoardRefresh refresh(boards);
     // As in the agent, the former snapshot goes once the new one is there.
     kvloamd::Snapshot former;

@@ -1,12 +1,9 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // Compares the agent with Net-SNMP's own table helpers, and with itself at other sizes.
-#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
 #include <exception>
 #include <functional>
-#include <iterator>
-#include <map>
 #include <memory>
 #include <string>
 #include <utility>
@@ -17,18 +14,17 @@
 #include "Agents.h"
 #include "Child.h"
 #include "DelayReport.h"
+#include "GrowthReport.h"
 #include "HugePages.h"
 #include "IntervalRows.h"
 #include "LeanClient.h"
 #include "RatioReporter.h"
-#include "RefreshProcess.h"
 #include "Requests.h"
 
 namespace {
 
 constexpr std::uint32_t kFewLines = 28;
 constexpr std::uint32_t kManyLines = 280;
-constexpr int kBoards[] = {125, 250, 500, 1000};
 
 // Each process is started when the first benchmark needs it.
 
@@ -45,13 +41,6 @@ Agent const& many() {
 Agent const& master() {
     static MasterAgent const agent(kFewLines);
     return agent;
-}
-
-RefreshProcess const& refreshOf(int boards) {
-    static std::map<int, std::unique_ptr<RefreshProcess>> processes;
-    auto& process = processes[boards];
-    if (process == nullptr) process = std::make_unique<RefreshProcess>(boards);
-    return *process;
 }
 
 /// A table somewhere.
@@ -132,25 +121,6 @@ void addWalk(std::string const& name, Target const& target) {
     });
 }
 
-/// What else runs on the machine makes a refresh slower, never faster.
-double fastestOf(RefreshProcess const& process) {
-    double fastest = process.refresh();
-    for (int more = 0; more < 9; ++more)
-        fastest = std::min(fastest, process.refresh());
-    return fastest;
-}
-
-void addRefresh(std::string const& name, int boards) {
-    benchmark::RegisterBenchmark(name.c_str(),
-                                 [=](benchmark::State& state) {
-                                     RefreshProcess const& process = refreshOf(boards);
-                                     for (auto _ : state)
-                                         state.SetIterationTime(fastestOf(process));
-                                 })
-        ->UseManualTime()
-        ->Unit(benchmark::kMicrosecond);
-}
-
 int run(int argc, char** argv) {
     useOneProcessor();
     // Neither the tools nor the agents look for MIB files.
@@ -174,12 +144,6 @@ int run(int argc, char** argv) {
     addColumns("a column through a master, table_data/peer", tableDataThroughMaster);
     addRows("through a master, ten columns at once or singly/ours", ourThroughMaster);
     addColumns("through a master, ten columns at once or singly/peer", ourThroughMaster);
-    for (std::size_t i = 1; i < std::size(kBoards); ++i) {
-        std::string const topic = "a refresh, from " + std::to_string(kBoards[i - 1]) + " to " +
-                                  std::to_string(kBoards[i]) + " boards";
-        addRefresh(topic + "/ours", kBoards[i]);
-        addRefresh(topic + "/peer", kBoards[i - 1]);
-    }
     benchmark::Initialize(&argc, argv);
     if (benchmark::ReportUnrecognizedArguments(argc, argv)) return 2;
     RatioReporter reporter({
@@ -189,15 +153,13 @@ int run(int argc, char** argv) {
         {"a column, from 28 to 280 lines/real_time", 1.15},
         {"a column through a master, table_data/real_time", 1.0},
         {"through a master, ten columns at once or singly/real_time", 1 / 4.0},
-        {"a refresh, from 125 to 250 boards/manual_time", 2.2},
-        {"a refresh, from 250 to 500 boards/manual_time", 2.2},
-        {"a refresh, from 500 to 1000 boards/manual_time", 2.2},
     });
     benchmark::RunSpecifiedBenchmarks(&reporter);
     benchmark::Shutdown();
     bool const ratiosKept = reporter.printRatios();
+    bool const growthKept = reportGrowth();
     bool const delaysKept = reportDelays(1000);
-    return ratiosKept && delaysKept ? 0 : 1;
+    return ratiosKept && growthKept && delaysKept ? 0 : 1;
 }
 
 } // namespace
