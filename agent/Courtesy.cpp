@@ -10,7 +10,7 @@ namespace {
 
 using Clock = std::chrono::steady_clock;
 
-/// Shorter than the shortest slice that the system gives.
+/// Work between two times: short enough for requests, long enough for a busy processor.
 constexpr std::chrono::microseconds kTurn{1000};
 
 } // namespace

@@ -5,10 +5,10 @@
 namespace kvloamd {
 
 /// Called between two boards by whoever reads many of them: gives the processor to who waits for
-/// it, once a millisecond. A thread that works to the end of its slice of time, nice as it may be,
-/// is left alone by the system there, and a request would wait for up to five milliseconds.
+/// it, once a millisecond. Without it a few requests in ten thousand waited for five milliseconds
+/// while a single processor read boards, although the reading thread is nice.
 ///
-/// Not at every board: on a processor that others never leave, each time can cost a turn of theirs.
+/// Not at every board: on a processor that another program never leaves, readings then do not end.
 void giveWay();
 
 } // namespace kvloamd

@@ -2,8 +2,6 @@
 // What a refresh of the agent's snapshot reads of boards, and makes of them.
 #pragma once
 
-#include <optional>
-
 #include "agent/BoardSource.h"
 #include "agent/EntityReader.h"
 #include "agent/InterfaceReader.h"
