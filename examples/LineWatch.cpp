@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Watches the DS1 lines of a board module: prints every change of a line's status, on an empty line
-// of standard input what the lines count now, and on a line's name its closed intervals.
+// Watches the DS1 lines of a board module. Prints every change of a line's status. For an empty
+// line of standard input it prints the running interval of every line, and for a line's name that
+// line's closed intervals.
 #include <dlfcn.h>
 
 #include <cstdio>
@@ -13,14 +14,14 @@
 
 namespace {
 
-/// The bits of a line's status by name, from the lowest.
+/// The names of the bits of a line's status, lowest first.
 constexpr char const* kStatusNames[] = {
     "NoAlarm",       "RcvFarEndLOF",    "XmtFarEndLOF",  "RcvAIS",          "XmtAIS",
     "LossOfFrame",   "LossOfSignal",    "LoopbackState", "T16AIS",          "RcvFarEndLOMF",
     "XmtFarEndLOMF", "RcvTestCode",     "OtherFailure",  "UnavailSigState", "NetEquipOOS",
     "RcvPayloadAIS", "Ds2PerfThreshold"};
 
-/// Called on a thread of the board module.
+/// Prints line status changes. Called on a thread of the board module.
 class Printer final : public DS1LineStatusListener {
   public:
     int ProcessLineStatusEvent(ReferenceCounter<DS1LineStatusEvent> event) override {
@@ -113,5 +114,5 @@ int main(int argc, char** argv) {
         else
             printHistory(*manager.get(), name);
     }
-    std::_Exit(0); // without tearing anything down: a change may be on its way on another thread
+    std::_Exit(0); // destroys nothing: another thread may be delivering a change
 }

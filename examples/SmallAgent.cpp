@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The smallest agent: loads a board module, lists the boards, and prints what happens to them until
-// a line or the end of standard input.
+// The smallest agent: loads a board module, lists its boards, and prints their status changes until
+// it reads a line, or the end, of standard input.
 #include <dlfcn.h>
 
 #include <cstdio>
@@ -10,7 +10,7 @@
 
 namespace {
 
-/// Called on the thread that delivers the change, so it only prints.
+/// Prints status changes. Called on the thread that delivers the change, so it returns quickly.
 class Printer final : public BoardStatusListener {
   public:
     int ProcessBoardStatusEvent(ReferenceCounter<BoardStatusEvent> event) override {
@@ -35,12 +35,13 @@ int main(int argc, char** argv) {
     auto* const create = reinterpret_cast<KVLCreateBoardFactory*>(entry);
     ReferenceCounter<BoardFactory> const factory(create(KVL_BOARD_MODULE_ABI_VERSION));
     if (factory.get() == nullptr) {
-        std::fprintf(stderr, "%s is of another version; build it anew\n", file);
+        std::fprintf(
+            stderr, "%s was built for another version of the module interface; rebuild it\n", file);
         return 1;
     }
     Printer printer;
     ReferenceCounter<BoardManager> const manager(new BoardManager);
-    manager->AddBoardStatusListener(&printer); // first, so that it hears of the boards found now
+    manager->AddBoardStatusListener(&printer); // before Attach, to be notified of its boards too
     manager->Attach(factory);
     for (auto board = manager->GetFirstBoard(); board.get() != nullptr;
          board = manager->GetNextBoard(board)) {
@@ -50,5 +51,5 @@ int main(int argc, char** argv) {
     }
     std::fflush(stdout);
     std::getchar();
-    std::_Exit(0); // without tearing anything down: a change may be on its way on another thread
+    std::_Exit(0); // destroys nothing: another thread may be delivering a change
 }

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The board's T1 line, what it counts, and the feature by which it is found.
+// The board's T1 line, its interval table, and the feature that contains it.
 #pragma once
 
 #include <cstring>
@@ -8,7 +8,7 @@
 #include "boardplatform/ds1_line.h"
 #include "kvloam.h"
 
-// Most operations put their answer somewhere and return 0.
+// Most operations store their answer in a variable of the caller's and return 0.
 template <class Value, class Place>
 int put(Value const& value, Place& place) {
     place = value;
@@ -19,8 +19,8 @@ inline int putText(std::string const& text, char* place) {
     return 0;
 }
 
-/// Asks the card for its counters once a second, on the scheduler's thread. A real table counts
-/// more than errored seconds.
+/// An interval table that reads the card's counters once a second, on the scheduler thread. It
+/// counts errored seconds only; a real one counts more.
 class SpanIntervalTable final : public DS1IntervalTable {
   public:
     explicit SpanIntervalTable(long device) : m_device(device) {
@@ -43,11 +43,11 @@ class SpanIntervalTable final : public DS1IntervalTable {
     int CloseInterval() override {
         ArchiveInterval(m_current);
         m_current = DS1Interval();
-        return CollectSecond(); // the tick that closes an interval is a second, too
+        return CollectSecond(); // the tick that closes an interval also counts a second
     }
 
   private:
-    /// A card that does not answer leaves the counters as they were.
+    /// If the card does not answer, the counters keep their values.
     void read() {
         DMAttribute request{kDS1LineCounters, &m_last, 0, 0, sizeof m_last};
         DeviceMapperIf::get_interface()->GetDMClient()->GetAttributes(m_device, 1, &request);
@@ -57,7 +57,8 @@ class SpanIntervalTable final : public DS1IntervalTable {
     DS1LineCounters m_last{};
 };
 
-/// The numbers are those of IF-MIB and DS1-MIB. Every query answers at once, on any thread.
+/// A T1 line. The values are those of IF-MIB and DS1-MIB. Every query is thread-safe and answers at
+/// once.
 class SpanLine final : public DS1LineDevice {
   public:
     explicit SpanLine(long device)
@@ -109,7 +110,7 @@ class SpanLine final : public DS1LineDevice {
     ReferenceCounter<DS1IntervalTable> m_intervals;
 };
 
-/// Filled before the board has it, and left alone afterwards.
+/// The board's lines. Filled before it is added to the board, and not changed afterwards.
 class SpanLineFeature final : public DS1LineFeatureZ7 {
   public:
     explicit SpanLineFeature(long device) { m_lines.emplace_back(new SpanLine(device)); }

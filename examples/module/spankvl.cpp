@@ -4,8 +4,9 @@
 
 #include "SpanLine.h"
 
-/// Most answers come from the board's device mapper record, which the base keeps. The base also
-/// calls what starts and stops the board, on the platform's delivery thread.
+/// A board with one T1 line. Most answers come from the board's device mapper record, which the
+/// base keeps. The base also calls the operations that start and stop the board, on the platform's
+/// delivery thread.
 class SpanBoard final : public Z7Board {
   public:
     explicit SpanBoard(long id) : Z7Board(id) {
@@ -37,7 +38,7 @@ class SpanBoard final : public Z7Board {
     std::atomic<BoardStatusEnum> m_secondary{BoardStatusNone};
 };
 
-/// The boards of one platform of the chassis; the others are some other module's. The base keeps
+/// The factory for the boards of platform "NX5"; other modules handle the others. The base keeps
 /// the board table current.
 class SpanBoardFactory final : public Z7BoardFactory {
   protected:
@@ -47,7 +48,7 @@ class SpanBoardFactory final : public Z7BoardFactory {
     int RefreshBoardData() override { return 0; }
     Z7Board* MakeBoard(long id) override {
         auto* const board = new SpanBoard(id);
-        // A board that runs already tells of that only when it changes.
+        // A board that runs already sends no message about it.
         if (DevMapBoardIf(id).BoardCondition() == BoardStatusStarted)
             board->SetStatus(BoardStatusStarted);
         return board;
