@@ -18,12 +18,7 @@ bool QSBAccessor::m_QSBOpened = false;
 int QSBAccessor::m_QSBAccessorInstances = 0;
 char QSBAccessor::m_rootType[kQSBTypeNameSize] = {};
 int QSBAccessor::m_rootInstance = 0;
-
-std::map<std::string, int>& QSBAccessor::serialNumberToInstance() {
-    // Never destroyed: an accessor may be the last thing that a process destroys.
-    static auto* const map = new std::map<std::string, int>;
-    return *map;
-}
+std::map<std::string, int> QSBAccessor::m_SNtoInstance;
 
 QSBAccessor::QSBAccessor() {
     if (!m_QSBOpened && OpenStorage()) CreateSerialNumberToInstanceIDMap();
@@ -32,7 +27,7 @@ QSBAccessor::QSBAccessor() {
 
 QSBAccessor::~QSBAccessor() {
     if (--m_QSBAccessorInstances > 0) return;
-    serialNumberToInstance().clear();
+    m_SNtoInstance.clear();
     QSBCloseStorage();
     m_QSBOpened = false;
 }
@@ -52,8 +47,7 @@ void QSBAccessor::Update() {
 }
 
 void QSBAccessor::CreateSerialNumberToInstanceIDMap() {
-    auto& map = serialNumberToInstance();
-    map.clear();
+    m_SNtoInstance.clear();
     for (std::size_t family = 1; family < std::size(KVL::kQSBFamilies); ++family) {
         int familyInstance = -1;
         if (FindFamilyID(const_cast<char*>(KVL::kQSBFamilies[family]), &familyInstance) != 0)
@@ -64,14 +58,14 @@ void QSBAccessor::CreateSerialNumberToInstanceIDMap() {
             char serialNumber[kTextSize] = {};
             if (QSBGetDataValue(kBoardType, board, kSerialNumberOffset, kTextSize, serialNumber) ==
                 QSB_SUCCESS)
-                map[std::string(serialNumber, strnlen(serialNumber, kTextSize))] = board;
+                m_SNtoInstance[std::string(serialNumber, strnlen(serialNumber, kTextSize))] = board;
         }
     }
 }
 
 int QSBAccessor::GetBoardInstance(std::string const& serialNumber) {
-    auto const found = serialNumberToInstance().find(serialNumber);
-    return found == serialNumberToInstance().end() ? -1 : found->second;
+    auto const found = m_SNtoInstance.find(serialNumber);
+    return found == m_SNtoInstance.end() ? -1 : found->second;
 }
 
 int QSBAccessor::FindFamilyID(char* familyName, int* familyInstance) {

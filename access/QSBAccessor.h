@@ -64,5 +64,5 @@ class KVLOAM_API QSBAccessor {
     static int m_QSBAccessorInstances;
     static char m_rootType[kQSBTypeNameSize];
     static int m_rootInstance;
-    static std::map<std::string, int>& serialNumberToInstance();
+    static std::map<std::string, int> m_SNtoInstance; ///< by serial number
 };

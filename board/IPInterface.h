@@ -14,10 +14,10 @@ namespace KVL {
 class KVLOAM_API IPAddress {
   public:
     /// The octets of `address` from its most significant byte down.
-    explicit IPAddress(int address);
+    IPAddress(int address);
     /// Dotted decimal; the text is only read. Deliberate: octets are taken as they are written, 300
     /// stays 300, and what follows the fourth is ignored. An octet that is missing is 0.
-    explicit IPAddress(char* text);
+    IPAddress(char* text);
     IPAddress& operator=(int address);
     IPAddress& operator=(char* text);
 
@@ -41,7 +41,7 @@ class KVLOAM_API IPAddressConfig : public Object {
     IPAddressConfig();
     IPAddressConfig(int address, int mask, int broadcast);
     /// The address in dotted decimal; mask and broadcast address 0.0.0.0.
-    explicit IPAddressConfig(char* text);
+    IPAddressConfig(char* text);
     ~IPAddressConfig() override;
 
     IPAddress GetAddress() const { return m_address; }

@@ -26,11 +26,11 @@ bool IID::operator==(IID const& other) const {
     return std::strcmp(m_name, other.m_name) == 0;
 }
 
-void IIDList::add(IID const& id) {
+void IIDList::add(IID id) {
     if (m_count < kCapacity && !is_element(id)) m_entries[m_count++] = id;
 }
 
-bool IIDList::is_element(IID const& id) const {
+bool IIDList::is_element(IID id) const {
     for (std::int32_t i = 0; i < m_count; ++i)
         if (m_entries[i] == id) return true;
     return false;

@@ -19,7 +19,7 @@ class KVLOAM_API IID {
     /// The empty name.
     IID() { m_name[0] = '\0'; }
     /// A name of more than `kMaxLength` characters becomes "<<unknown>>".
-    explicit IID(char const* name);
+    IID(char const* name);
     IID(IID const& other);
     IID& operator=(IID const& other);
 
@@ -43,8 +43,8 @@ class KVLOAM_API IIDList {
     IIDList& operator=(IIDList const&) = delete;
 
     /// Appends `id` unless it is an element already. A full list drops it silently.
-    void add(IID const& id);
-    bool is_element(IID const& id) const;
+    void add(IID id);
+    bool is_element(IID id) const;
     /// An independent copy; the caller owns it.
     IIDList* clone() const;
 

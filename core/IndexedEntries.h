@@ -2,69 +2,100 @@
 // The ordered entries of an indexed table.
 #pragma once
 
-#include <cstddef>
+#include <iterator>
 #include <map>
-#include <utility>
 
 namespace KVL {
 
-/// An ordered map that remembers where it was asked last: walks ask for one index after the other,
-/// and find the next one without a search. Not synchronised, not even for reading: the table's lock
-/// is held around every call.
+/// An ordered map from indices to values, with the operations of `std::map`, that remembers the
+/// entry found last: a walk asks for one index after the other and finds the next one without a
+/// search. Unsynchronised, also for reading: the table's lock is held around every call.
+///
+/// Not copyable: `auto entries = table.entries()` would fill a copy. Take a reference.
 template <class Index, class Value>
-class IndexedEntries {
+class IndexedEntries : private std::map<Index, Value> {
     using Map = std::map<Index, Value>;
 
   public:
-    using iterator = typename Map::iterator;
-    using node_type = typename Map::node_type;
+    using typename Map::const_iterator;
+    using typename Map::insert_return_type;
+    using typename Map::iterator;
+    using typename Map::key_type;
+    using typename Map::mapped_type;
+    using typename Map::node_type;
+    using typename Map::size_type;
+    using typename Map::value_type;
 
-    iterator begin() { return m_map.begin(); }
-    iterator end() { return m_map.end(); }
-    std::size_t size() const { return m_map.size(); }
-    bool empty() const { return m_map.empty(); }
+    IndexedEntries() = default;
+    ~IndexedEntries() = default;
+    IndexedEntries(IndexedEntries const&) = delete;
+    IndexedEntries& operator=(IndexedEntries const&) = delete;
+
+    using Map::begin;
+    using Map::cbegin;
+    using Map::cend;
+    using Map::end;
+    using Map::rbegin;
+    using Map::rend;
+
+    using Map::empty;
+    using Map::size;
+
+    using Map::at;
+    using Map::contains;
+    using Map::count;
+    using Map::equal_range;
+    using Map::lower_bound;
+    using Map::upper_bound;
+
+    using Map::emplace;
+    using Map::emplace_hint;
+    using Map::insert;
+    using Map::insert_or_assign;
+    using Map::try_emplace;
+    using Map::operator[];
 
     iterator find(Index index) {
-        if (m_last != m_map.end()) {
+        if (m_last != end()) {
             if (m_last->first == index) return m_last;
             auto const next = std::next(m_last);
-            if (next != m_map.end() && next->first == index) return m_last = next;
+            if (next != end() && next->first == index) return m_last = next;
         }
-        auto const found = m_map.find(index);
-        if (found != m_map.end()) m_last = found;
+        auto const found = Map::find(index);
+        if (found != end()) m_last = found;
         return found;
     }
+    const_iterator find(Index index) const { return Map::find(index); }
 
-    /// Puts `value` at `index`, in place of a former one.
-    iterator insert_or_assign(Index index, Value value) {
-        return m_map.insert_or_assign(index, std::move(value)).first;
-    }
     iterator erase(iterator entry) {
         forget(entry);
-        return m_map.erase(entry);
+        return Map::erase(entry);
     }
-    std::size_t erase(Index index) {
-        auto const entry = m_map.find(index);
-        if (entry == m_map.end()) return 0;
+    iterator erase(iterator first, iterator last) {
+        m_last = end();
+        return Map::erase(first, last);
+    }
+    size_type erase(Index index) {
+        auto const entry = Map::find(index);
+        if (entry == end()) return 0;
         erase(entry);
         return 1;
     }
     node_type extract(iterator entry) {
         forget(entry);
-        return m_map.extract(entry);
+        return Map::extract(entry);
     }
     void clear() {
-        m_map.clear();
-        m_last = m_map.end();
+        m_last = end();
+        Map::clear();
     }
 
   private:
     void forget(iterator entry) {
-        if (m_last == entry) m_last = m_map.end();
+        if (m_last == entry) m_last = end();
     }
 
-    Map m_map;
-    iterator m_last = m_map.end();
+    iterator m_last = end();
 };
 
 } // namespace KVL

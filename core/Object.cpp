@@ -18,9 +18,13 @@ using ListPool = KVL::RecyclingPool<RootedIIDList>;
 } // namespace
 
 Object::Object(bool lockable)
-    : Object(lockable ? new KVLLockable_pthread(RecursiveLock) : nullptr) {}
+    : Object(Adopt(), lockable ? new KVLLockable_pthread(RecursiveLock) : nullptr) {}
 
-Object::Object(KVLLockable_pthread* lock) : m_lock(lock), m_interfaces(ListPool::take()) {}
+Object::Object(Adopt, KVLLockable_pthread* lock) try
+    : m_lock(lock), m_interfaces(ListPool::take()) {
+} catch (...) {
+    delete lock;
+}
 
 Object::~Object() {
     m_interfaces->shrink(1);

@@ -31,8 +31,10 @@ class KVLOAM_API Object {
     KVL::IIDList* interfaces() const { return m_interfaces; }
 
   protected:
-    /// An object with a lock of its own making, which the object owns and deletes.
-    explicit Object(KVLLockable_pthread* lock);
+    /// Selects the constructor below, so that `Object(0)` means "not lockable".
+    struct Adopt {};
+    /// An object with the given lock, which it owns from here on, even if the construction fails.
+    Object(Adopt, KVLLockable_pthread* lock);
 
     /// The lock itself; null when the object was made without one.
     KVLLockable* lockable() const { return m_lock; }

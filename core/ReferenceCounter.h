@@ -20,8 +20,8 @@ class ReferenceCounter : public Object {
     /// A handle of `object`; null makes an empty handle.
     ReferenceCounter(T* object = nullptr)
         : Object(false),
-          // The one table is no derived one: no need to ask it which function that is.
-          m_record(ReferenceTable::get_instance()->ReferenceTable::create_refinfo(object)),
+          m_record(object == nullptr ? nullptr
+                                     : ReferenceTable::get_instance()->find_or_make(object)),
           m_object(object) {
         if (m_record != nullptr) {
             m_record->lock();

@@ -8,7 +8,9 @@
 #include <new>
 #include <typeinfo>
 
+#include "core/AddressMap.h"
 #include "core/RecyclingPool.h"
+#include "core/Turns.h"
 
 namespace {
 using RecordPool = KVL::RecyclingPool<ReferenceInfo>;
@@ -16,6 +18,14 @@ using RecordPool = KVL::RecyclingPool<ReferenceInfo>;
 /// Its address tells threads apart.
 [[gnu::tls_model("initial-exec")]] thread_local char t_thread;
 } // namespace
+
+/// The table's lock and behind it, on the same cache line, what changes with every entry: two
+/// threads that alternate at the table then exchange one line.
+struct alignas(64) ReferenceTable::Records final : KVLLockable_pthread {
+    Records() : KVLLockable_pthread(RecursiveLock) {}
+    KVL::AddressMap<ReferenceInfo*> map;
+    KVL::Turns turns;
+};
 
 ReferenceTable* ReferenceTable::m_referenceTable = nullptr;
 
@@ -29,7 +39,7 @@ ReferenceInfo::~ReferenceInfo() {
 
 ReferenceTable::ReferenceTable() : ReferenceTable(new Records) {}
 
-ReferenceTable::ReferenceTable(Records* records) : Object(records), m_records(records) {}
+ReferenceTable::ReferenceTable(Records* records) : Object(Adopt(), records), m_records(records) {}
 
 ReferenceTable::~ReferenceTable() {
     lock();
@@ -45,6 +55,11 @@ ReferenceInfo* ReferenceTable::get_refinfo(Object* object) {
 
 ReferenceInfo* ReferenceTable::create_refinfo(Object* object) {
     if (object == nullptr) return nullptr;
+    ReferenceInfo* const record = get_refinfo(object);
+    return record == nullptr ? find_or_make(object) : record;
+}
+
+ReferenceInfo* ReferenceTable::find_or_make(Object* object) {
     bool inStep = false;
     ReferenceInfo* record = nullptr;
     {

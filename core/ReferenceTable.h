@@ -6,9 +6,7 @@
 #include <cstdint>
 #include <new>
 
-#include "core/AddressMap.h"
 #include "core/Object.h"
-#include "core/Turns.h"
 
 /// The count of one object's handles. Changed only under its lock; readable at any time.
 class KVLOAM_API ReferenceInfo {
@@ -61,7 +59,8 @@ class KVLOAM_API ReferenceTable : public Object {
 
     /// The record of `object`; null when it has none, also for an address of no object.
     virtual ReferenceInfo* get_refinfo(Object* object);
-    /// The record of `object`, made with count 0 when it has none. Null for null.
+    /// The record of `object`, as `get_refinfo` answers it; made with count 0 when it has none.
+    /// Null for null.
     virtual ReferenceInfo* create_refinfo(Object* object);
     /// Takes the record of `object` out and destroys it; nothing when it has none. The record's
     /// lock must not be held.
@@ -75,15 +74,15 @@ class KVLOAM_API ReferenceTable : public Object {
     ReferenceTable();
 
   private:
-    /// The table's lock and behind it, on the same cache line, what changes with every entry: two
-    /// threads that take turns at the table hand each other one line.
-    struct alignas(64) Records final : KVLLockable_pthread {
-        Records() : KVLLockable_pthread(RecursiveLock) {}
-        KVL::AddressMap<ReferenceInfo*> map;
-        KVL::Turns turns;
-    };
+    template <class T>
+    friend class ReferenceCounter;
+    struct Records;
 
     explicit ReferenceTable(Records* records);
+
+    /// The record of `object`, made with count 0 when it has none, by one search. Handles call this
+    /// instead of `create_refinfo`, whose two virtual calls they can do without. Not null.
+    ReferenceInfo* find_or_make(Object* object);
 
     static ReferenceTable* m_referenceTable;
 

@@ -5,7 +5,7 @@
 
 ActionScheduler_pthread* ActionScheduler_pthread::s_actionScheduler = nullptr;
 
-ActionScheduler_pthread* ActionScheduler_pthread::GetScheduler() {
+ActionScheduler* ActionScheduler_pthread::GetScheduler() {
     if (s_actionScheduler == nullptr) s_actionScheduler = new ActionScheduler_pthread;
     return s_actionScheduler;
 }

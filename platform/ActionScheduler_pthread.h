@@ -14,7 +14,7 @@ class KVLOAM_API ActionScheduler_pthread : public ActionScheduler, public KVLThr
   public:
     /// Makes the scheduler and its thread at the first call, which must return before other threads
     /// call it. Never destroyed.
-    static ActionScheduler_pthread* GetScheduler();
+    static ActionScheduler* GetScheduler();
 
     /// The thread's body. Does not return.
     void Run() override;

@@ -29,7 +29,7 @@ Z7SimIntervalTable::Z7SimIntervalTable(LineFormat format, std::shared_ptr<LineSo
     : m_source(std::move(source)), m_state(std::move(state)), m_performance(format) {
     // The base has the table ticking already. A day of past takes a while: no tick may come
     // between.
-    ActionScheduler_pthread* const scheduler = ActionScheduler_pthread::GetScheduler();
+    ActionScheduler* const scheduler = ActionScheduler_pthread::GetScheduler();
     scheduler->Remove(this);
     replay(past);
     m_source->read(m_last);

@@ -15,7 +15,7 @@
 
 namespace {
 
-ActionScheduler_pthread& scheduler() {
+ActionScheduler& scheduler() {
     return *ActionScheduler_pthread::GetScheduler();
 }
 

@@ -117,6 +117,19 @@ TEST_F(ReferenceTableTest, RecordIsMadeOnceWithCountZero) {
     EXPECT_EQ(m_table.get_refinfo(&object), nullptr);
 }
 
+TEST_F(ReferenceTableTest, RecordIsMadeOnlyWhenTheDerivedTableKnowsNone) {
+    /// A table whose objects all share one record.
+    class SharedRecord : public OwnTable {
+      public:
+        ReferenceInfo* get_refinfo(Object* /*object*/) override { return &m_record; }
+        ReferenceInfo m_record;
+    };
+    SharedRecord table;
+    ReferenceTableTestObject object;
+    EXPECT_EQ(table.create_refinfo(&object), &table.m_record);
+    EXPECT_EQ(table.referenced_objects(), 0);
+}
+
 TEST_F(ReferenceTableTest, RecordOfALaterObjectStartsAtZero) {
     ReferenceTableTestObject object;
     ReferenceInfo* const record = m_table.create_refinfo(&object);

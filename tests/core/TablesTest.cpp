@@ -144,6 +144,32 @@ TEST_F(IndexedTableTest, WalkMeetsEntriesThatTheHolderOfTheLockErasesAndEnters) 
     EXPECT_EQ(m_table.first_index(), 0);
 }
 
+TEST_F(IndexedTableTest, HolderOfTheLockEntersByTheMapsOwnOperations) {
+    Handle const thing(new Thing);
+    ObjectGuard const guard(m_table);
+    auto& entries = m_table.entries();
+    entries[4] = thing;
+    EXPECT_TRUE(entries.emplace(2, thing).second);
+    EXPECT_FALSE(entries.insert({2, Handle()}).second);
+    EXPECT_TRUE(entries.insert({7, thing}).second);
+    EXPECT_EQ(walk(), (std::vector{2, 4, 7}));
+    EXPECT_EQ(entries.lower_bound(3)->first, 4);
+    EXPECT_EQ(entries.upper_bound(4)->first, 7);
+    EXPECT_EQ(m_table[2].get(), thing.get());
+}
+
+TEST_F(IndexedTableTest, RangeThatTheHolderOfTheLockErasesIsNotFoundAgain) {
+    for (int i = 0; i < 5; ++i)
+        enter();
+    ObjectGuard const guard(m_table);
+    auto& entries = m_table.entries();
+    EXPECT_EQ(m_table.next_index(2), 3); // the table remembers where it found 2
+    entries.erase(entries.lower_bound(2), entries.lower_bound(4));
+    EXPECT_EQ(m_table[2].get(), nullptr);
+    EXPECT_EQ(m_table[3].get(), nullptr);
+    EXPECT_EQ(walk(), (std::vector{1, 4, 5}));
+}
+
 TEST_F(IndexedTableTest, DestructorOfARemovedObjectMayUseTheTable) {
     class Asking : public Object {
       public:

@@ -14,7 +14,7 @@ namespace {
 
 constexpr std::chrono::seconds kPatience{30};
 
-ActionScheduler_pthread& scheduler() {
+ActionScheduler& scheduler() {
     return *ActionScheduler_pthread::GetScheduler();
 }
 
@@ -92,7 +92,8 @@ class LastingAction final : public Schedulable {
 
 TEST(ActionSchedulerThreadTest, ThereIsOneSchedulerAndItRuns) {
     EXPECT_EQ(ActionScheduler_pthread::GetScheduler(), ActionScheduler_pthread::GetScheduler());
-    EXPECT_EQ(scheduler().GetThreadState(), KVLThreadRunning);
+    auto& thread = dynamic_cast<KVLThread_pthread&>(scheduler());
+    EXPECT_EQ(thread.GetThreadState(), KVLThreadRunning);
 }
 
 TEST(ActionSchedulerThreadTest, PeriodicActionIsCalledAgainAndAgain) {
