@@ -29,21 +29,3 @@ function(kvloam_target target)
         target_link_options(${target} PRIVATE -fsanitize=${KVLOAM_SANITIZE})
     endif()
 endfunction()
-
-# kvloam_test(<name> SOURCES <files> [LIBRARIES <libs>] [LABELS <labels>] [ENVIRONMENT <VAR=value>]):
-# a GoogleTest program; every test case becomes one ctest test.
-function(kvloam_test name)
-    cmake_parse_arguments(arg "" "" "SOURCES;LIBRARIES;LABELS;ENVIRONMENT" ${ARGN})
-    add_executable(${name} ${arg_SOURCES})
-    kvloam_target(${name})
-    set_target_properties(${name} PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/tests)
-    target_link_libraries(${name} PRIVATE ${arg_LIBRARIES} GTest::gtest GTest::gmock GTest::gtest_main)
-    set(properties TIMEOUT 300)
-    if(arg_LABELS)
-        list(APPEND properties LABELS "${arg_LABELS}")
-    endif()
-    list(APPEND arg_ENVIRONMENT
-        "TSAN_OPTIONS=suppressions=${PROJECT_SOURCE_DIR}/tests/sanitizers/tsan.supp")
-    list(APPEND properties ENVIRONMENT "${arg_ENVIRONMENT}")
-    gtest_discover_tests(${name} DISCOVERY_TIMEOUT 60 PROPERTIES ${properties})
-endfunction()

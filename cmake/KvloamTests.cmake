@@ -1,0 +1,70 @@
+# SPDX-License-Identifier: BSD-2-Clause
+# Test programs, and what makes them quick to build.
+find_package(GTest REQUIRED)
+include(GoogleTest)
+
+set(KVLOAM_TEST_DEBUG 1 CACHE STRING
+    "Level of debug information in tests: 1 is enough for backtraces, 2 shows variables in a debugger")
+
+# What every test program is compiled with.
+function(kvloam_test_options target)
+    kvloam_target(${target})
+    target_compile_options(${target} PRIVATE $<$<CONFIG:Debug>:-g${KVLOAM_TEST_DEBUG}>)
+    target_link_libraries(${target} PRIVATE GTest::gtest GTest::gmock)
+endfunction()
+
+# The headers that most tests include, compiled once for all test programs. A test still includes what
+# it uses: the presets `release` and `ilp32` compile without. Test programs are compiled with -fPIE.
+file(CONFIGURE OUTPUT ${CMAKE_CURRENT_BINARY_DIR}/precompiled.cpp CONTENT "")
+add_library(kvloam_test_headers OBJECT ${CMAKE_CURRENT_BINARY_DIR}/precompiled.cpp)
+kvloam_test_options(kvloam_test_headers)
+set_target_properties(kvloam_test_headers PROPERTIES POSITION_INDEPENDENT_CODE OFF)
+target_compile_options(kvloam_test_headers PRIVATE
+    -fPIE
+    # Or a cached object would not be found after the headers are compiled again.
+    $<$<CXX_COMPILER_ID:Clang>:SHELL:-Xclang -fno-pch-timestamp>)
+target_precompile_headers(kvloam_test_headers PRIVATE
+    <gmock/gmock.h>
+    <gtest/gtest.h>
+    <algorithm>
+    <array>
+    <atomic>
+    <chrono>
+    <condition_variable>
+    <filesystem>
+    <fstream>
+    <functional>
+    <map>
+    <memory>
+    <mutex>
+    <optional>
+    <set>
+    <sstream>
+    <string>
+    <thread>
+    <vector>)
+
+# kvloam_test(<name> SOURCES <files> [LIBRARIES <libs>] [LABELS <labels>] [ENVIRONMENT <VAR=value>]):
+# a GoogleTest program; every test case becomes one ctest test.
+function(kvloam_test name)
+    cmake_parse_arguments(arg "" "" "SOURCES;LIBRARIES;LABELS;ENVIRONMENT" ${ARGN})
+    add_executable(${name} ${arg_SOURCES})
+    kvloam_test_options(${name})
+    set_target_properties(${name} PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/tests)
+    target_link_libraries(${name} PRIVATE ${arg_LIBRARIES} GTest::gtest_main)
+    target_precompile_headers(${name} REUSE_FROM kvloam_test_headers)
+    set(properties TIMEOUT 300)
+    if(arg_LABELS)
+        list(APPEND properties LABELS "${arg_LABELS}")
+    endif()
+    # What waits for threads and programs starts first, so that short tests fill the time.
+    if("e2e" IN_LIST arg_LABELS)
+        list(APPEND properties COST 20)
+    elseif("threaded" IN_LIST arg_LABELS)
+        list(APPEND properties COST 10)
+    endif()
+    list(APPEND arg_ENVIRONMENT
+        "TSAN_OPTIONS=suppressions=${PROJECT_SOURCE_DIR}/tests/sanitizers/tsan.supp")
+    list(APPEND properties ENVIRONMENT "${arg_ENVIRONMENT}")
+    gtest_discover_tests(${name} DISCOVERY_TIMEOUT 60 PROPERTIES ${properties})
+endfunction()
