@@ -1,11 +1,12 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "board/DS1IntervalTable.h"
 
-#include <typeinfo>
-
+#include "core/ReferenceTable.h"
 #include "platform/ActionScheduler_pthread.h"
 
 DS1IntervalTable::DS1IntervalTable() {
+    // Every tick looks into the reference table, which must be made before another thread does so.
+    ReferenceTable::get_instance();
     ActionScheduler_pthread::GetScheduler()->AddPeriodic(this, 1);
 }
 
@@ -56,7 +57,9 @@ int DS1IntervalTable::GetLineCodeViolations(int n) {
 }
 
 int DS1IntervalTable::ScheduledAction() {
-    if (typeid(*this) == typeid(DS1IntervalTable)) return 0;
+    // Neither its dynamic type nor a field of its own tells whether the table is complete: both are
+    // those of the complete table while members are being built or destroyed.
+    if (ReferenceTable::get_instance()->ReferenceTable::get_refinfo(this) == nullptr) return 0;
     if (m_timeElapsed < kIntervalLength)
         CollectSecond();
     else

@@ -48,16 +48,18 @@ struct DS1Interval {
 
 static_assert(sizeof(DS1Interval) == 40);
 
-/// The running interval of a line and a ring of the 96 that were closed before it, 24 hours. What a
-/// second counts is the concrete table's: the process's scheduler calls it once a second.
+/// A `DS1IntervalTable` is the performance history of one line: the running interval and a ring of
+/// the 96 intervals that were closed before it, 24 hours. The process's scheduler ticks it once a
+/// second. The concrete table decides what a second counts.
 ///
-/// Threads: `ScheduledAction` comes on the scheduler's thread, readers on any. A reader sees the
-/// old or the new value of each counter; a row read while an interval is closed may mix both.
+/// Threads: the scheduler's thread ticks; any thread may read. A reader sees the old or the new
+/// value of each counter; a row read while an interval is closed may mix both.
 ///
-/// The table is on the scheduler's list before its derived part exists. A concrete table's
-/// constructor must therefore end with `ChangePeriod(this, 1)` of the scheduler, which changes
-/// nothing and waits for a tick under way, and its destructor must begin with `Remove(this)`. A
-/// table must be neither made nor destroyed in a scheduled action.
+/// Lifetime: the table is on the scheduler's list from the base's construction to the base's
+/// destruction, but ticks reach it only while it has a handle. A constructor may therefore take its
+/// time and needs no call of the scheduler. A tick may be under way when the last handle goes: the
+/// destructor of a table whose ticks use members must begin with `Remove(this)` of the scheduler,
+/// which waits for that tick. A table must be neither made nor destroyed in a scheduled action.
 class KVLOAM_API DS1IntervalTable : public Object, public Schedulable {
   public:
     static constexpr int kIntervals = 96;
@@ -90,8 +92,8 @@ class KVLOAM_API DS1IntervalTable : public Object, public Schedulable {
     virtual int GetControlledSlipSeconds(int n) = 0;
     virtual int GetDegradedMinutes(int n) = 0;
 
-    /// One second: `CollectSecond`, or `CloseInterval` when the running interval is complete.
-    /// Nothing while the concrete table is not built yet or no longer there. Returns 0.
+    /// The tick: calls `CollectSecond`, or `CloseInterval` when the running interval is complete.
+    /// Does nothing while the table has no handle, because it is not complete then. Returns 0.
     int ScheduledAction() override;
     /// Counts a second into the running interval and adds 1 to the time elapsed.
     virtual int CollectSecond() = 0;

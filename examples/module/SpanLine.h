@@ -23,12 +23,9 @@ inline int putText(std::string const& text, char* place) {
 /// counts errored seconds only; a real one counts more.
 class SpanIntervalTable final : public DS1IntervalTable {
   public:
-    explicit SpanIntervalTable(long device) : m_device(device) {
-        // The base has the table ticking already, and it is not complete yet.
-        ActionScheduler_pthread::GetScheduler()->Remove(this);
-        read();
-        ActionScheduler_pthread::GetScheduler()->AddPeriodic(this, 1);
-    }
+    explicit SpanIntervalTable(long device) : m_device(device) { read(); }
+    /// Waits for a tick under way before any member goes.
+    /// Waits for a tick under way before any member goes.
     ~SpanIntervalTable() override { ActionScheduler_pthread::GetScheduler()->Remove(this); }
 
     int GetControlledSlipSeconds(int) override { return 0; }

@@ -1,27 +1,21 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // A line's performance history, ticked by the test alone.
-#include <optional>
+#include <memory>
 #include <string>
-#include <utility>
 #include <vector>
 
 #include <gtest/gtest.h>
 
 #include "board/DS1IntervalTable.h"
-#include "platform/ActionScheduler_pthread.h"
+#include "core/ReferenceCounter.h"
+#include "tests/board/DrivenScheduler.h"
 #include "tests/support/Slots.h"
 
 namespace {
 
-int removeFromScheduler(Schedulable* target) {
-    return ActionScheduler_pthread::GetScheduler()->Remove(target);
-}
-
-/// Off the scheduler's list from the start. Notes what a tick asks of it.
+/// Records which operations a tick calls.
 class Table final : public DS1IntervalTable {
   public:
-    Table() : m_wasOnTheList(removeFromScheduler(this) == 0) {}
-
     int GetControlledSlipSeconds(int n) override { return interval(n)->ControlledSlipSeconds; }
     int GetDegradedMinutes(int n) override { return interval(n)->DegradedMinutes; }
     int CollectSecond() override {
@@ -47,11 +41,9 @@ class Table final : public DS1IntervalTable {
     void archive(DS1Interval const& closed) { ArchiveInterval(closed); }
     void setTimeElapsed(int seconds) { m_timeElapsed = seconds; }
     DS1Interval& current() { return m_current; }
-    bool wasOnTheList() const { return m_wasOnTheList; }
     std::string const& asked() const { return m_asked; }
 
   private:
-    bool m_wasOnTheList;
     int m_archived = 0;
     std::string m_asked;
 };
@@ -74,7 +66,9 @@ class DS1IntervalTableTest : public testing::Test {
         return seconds;
     }
 
-    Table m_table;
+    DrivenScheduler& m_scheduler = DrivenScheduler::install();
+    ReferenceCounter<Table> m_handle{new Table};
+    Table& m_table = *m_handle.get();
 };
 
 using Reader = int (DS1IntervalTable::*)(int);
@@ -203,17 +197,26 @@ TEST_F(DS1IntervalTableTest, EveryReaderReadsItsOwnFieldOfAClosedInterval) {
 }
 
 TEST_F(DS1IntervalTableTest, TableIsOnTheSchedulersListFromItsConstruction) {
-    EXPECT_TRUE(m_table.wasOnTheList());
-    EXPECT_EQ(removeFromScheduler(&m_table), 1);
+    EXPECT_EQ(m_scheduler.AddPeriodic(&m_table, 1), 1);
+    EXPECT_EQ(m_scheduler.Remove(&m_table), 0);
 }
 
 TEST_F(DS1IntervalTableTest, TableIsOffTheSchedulersListOnceItIsGone) {
-    std::optional<Table> table(std::in_place);
-    Schedulable* const entry = &*table;
-    // Nobody ticks it for as long as this takes.
-    ASSERT_EQ(ActionScheduler_pthread::GetScheduler()->AddPeriodic(entry, 100000), 0);
-    table.reset();
-    EXPECT_EQ(removeFromScheduler(entry), 1);
+    Schedulable* const entry = &m_table;
+    m_handle = {};
+    EXPECT_EQ(m_scheduler.Remove(entry), 1);
+}
+
+TEST_F(DS1IntervalTableTest, SchedulerTicksTheTableEverySecond) {
+    m_scheduler.passSeconds(3);
+    EXPECT_EQ(m_table.asked(), "collect collect collect ");
+}
+
+TEST_F(DS1IntervalTableTest, TableWithoutAHandleIsNotTicked) {
+    Table table;
+    table.ScheduledAction();
+    m_scheduler.passSeconds(1);
+    EXPECT_EQ(table.asked(), "");
 }
 
 TEST_F(DS1IntervalTableTest, RecordIsTenCountersOfFourBytes) {

@@ -3,7 +3,6 @@
 #include <atomic>
 #include <chrono>
 #include <condition_variable>
-#include <memory>
 #include <mutex>
 #include <thread>
 #include <vector>
@@ -11,6 +10,7 @@
 #include <gtest/gtest.h>
 
 #include "board/DS1IntervalTable.h"
+#include "core/ReferenceCounter.h"
 #include "platform/ActionScheduler_pthread.h"
 
 namespace {
@@ -25,10 +25,7 @@ constexpr int kSecondsAnInterval = 5;
 /// were collected in it.
 class ShortTable : public DS1IntervalTable {
   public:
-    ShortTable() {
-        begin();
-        scheduler().ChangePeriod(this, 1);
-    }
+    ShortTable() { begin(); }
     ~ShortTable() override { scheduler().Remove(this); }
 
     int GetControlledSlipSeconds(int n) override { return interval(n)->ControlledSlipSeconds; }
@@ -55,6 +52,8 @@ class ShortTable : public DS1IntervalTable {
 
     int m_number = 0;
 };
+
+using Handle = ReferenceCounter<ShortTable>;
 
 /// Counts the scheduler's passes.
 class Passes final : public Schedulable {
@@ -91,9 +90,9 @@ class Passes final : public Schedulable {
 TEST(DS1IntervalTableThreadTest, ReadersSeeOldOrNewValuesWhileTablesTickAndWrapAround) {
     constexpr int kTables = 200;
     constexpr int kIntervals = 110;
-    std::vector<std::unique_ptr<ShortTable>> tables;
+    std::vector<Handle> tables;
     for (int i = 0; i < kTables; ++i) {
-        tables.push_back(std::make_unique<ShortTable>());
+        tables.emplace_back(new ShortTable);
         ASSERT_EQ(scheduler().Remove(tables.back().get()), 0);
     }
 
@@ -121,7 +120,7 @@ TEST(DS1IntervalTableThreadTest, ReadersSeeOldOrNewValuesWhileTablesTickAndWrapA
         std::vector<int> lastValid(kTables, 0), lastNumber(kTables, 0);
         do
             for (std::size_t i = 0; i < tables.size(); ++i)
-                readTable(*tables[i], lastValid[i], lastNumber[i]);
+                readTable(*tables[i].get(), lastValid[i], lastNumber[i]);
         while (!end);
     };
     std::vector<std::thread> readers;
@@ -144,9 +143,9 @@ TEST(DS1IntervalTableThreadTest, ReadersSeeOldOrNewValuesWhileTablesTickAndWrapA
 
 TEST(DS1IntervalTableThreadTest, NumberOfValidIntervalsNeverFallsWhileTheRingFills) {
     constexpr int kTables = 2000;
-    std::vector<std::unique_ptr<ShortTable>> tables;
+    std::vector<Handle> tables;
     for (int i = 0; i < kTables; ++i) {
-        tables.push_back(std::make_unique<ShortTable>());
+        tables.emplace_back(new ShortTable);
         ASSERT_EQ(scheduler().Remove(tables.back().get()), 0);
     }
 
@@ -171,65 +170,28 @@ TEST(DS1IntervalTableThreadTest, NumberOfValidIntervalsNeverFallsWhileTheRingFil
 
 TEST(DS1IntervalTableThreadTest, TablesComeAndGoWhileTheSchedulerTicks) {
     Passes passes;
-    ShortTable kept;
+    Handle const kept(new ShortTable);
     int made = 0;
     while (passes.count() < 3) {
-        std::vector<std::unique_ptr<ShortTable>> tables;
+        std::vector<Handle> tables;
         for (int i = 0; i < 20; ++i, ++made)
-            tables.push_back(std::make_unique<ShortTable>());
+            tables.emplace_back(new ShortTable);
         std::this_thread::yield();
     }
     EXPECT_GT(made, 0);
-    EXPECT_GT(kept.GetErrorSeconds(0), 1000);
+    EXPECT_GT(kept->GetErrorSeconds(0), 1000);
 }
 
 TEST(DS1IntervalTableThreadTest, SchedulerTicksATableForAsLongAsItLives) {
     Passes passes;
-    auto table = std::make_unique<ShortTable>();
+    Handle table(new ShortTable);
     ASSERT_TRUE(passes.waitForMore(2));
     int const seconds = table->GetErrorSeconds(0) - 1000;
     EXPECT_GE(seconds, 1);
     ASSERT_TRUE(passes.waitForMore(2));
     EXPECT_GT(table->GetErrorSeconds(0) - 1000, seconds);
-    table.reset();
+    table = {};
     EXPECT_TRUE(passes.waitForMore(2));
-}
-
-/// A base behind the table, during whose construction the scheduler passes by the unfinished table.
-class Hesitation {
-  protected:
-    Hesitation(Schedulable* table, Passes& passes)
-        : m_passed(passes.waitForMore(3)), m_wasOnTheList(scheduler().Remove(table) == 0) {}
-    ~Hesitation() = default;
-
-    bool m_passed;
-    bool m_wasOnTheList;
-};
-
-/// Counts what the scheduler asks of it.
-class SlowlyBuiltTable final : public DS1IntervalTable, private Hesitation {
-  public:
-    explicit SlowlyBuiltTable(Passes& passes) : Hesitation(this, passes) {}
-
-    int GetControlledSlipSeconds(int /*n*/) override { return 0; }
-    int GetDegradedMinutes(int /*n*/) override { return 0; }
-    int CollectSecond() override { return ++m_asked; }
-    int CloseInterval() override { return ++m_asked; }
-
-    /// Whether the scheduler has called the table that was not built yet.
-    bool wasTicked() const { return m_passed && m_wasOnTheList; }
-    int asked() const { return m_asked; }
-
-  private:
-    int m_asked = 0;
-};
-
-TEST(DS1IntervalTableThreadTest, TickBeforeTheConcreteTableIsBuiltDoesNothing) {
-    Passes passes;
-    SlowlyBuiltTable table(passes);
-    EXPECT_TRUE(table.wasTicked());
-    EXPECT_EQ(table.asked(), 0);
-    EXPECT_EQ(table.GetTimeElapsed(), 0);
 }
 
 } // namespace
