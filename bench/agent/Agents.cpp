@@ -15,13 +15,13 @@
 #include "IntervalRows.h"
 #include "LeanClient.h"
 #include "PeerTables.h"
-#include "agent/Collector.h"
-#include "agent/Log.h"
-#include "agent/ObjectTree.h"
-#include "agent/Settings.h"
-#include "agent/StandAlone.h"
-#include "agent/StandardObjects.h"
-#include "agent/Subagent.h"
+#include "agent/fronts/agentx/Subagent.h"
+#include "agent/fronts/snmp/StandAlone.h"
+#include "agent/log/Log.h"
+#include "agent/objects/ObjectTree.h"
+#include "agent/objects/StandardObjects.h"
+#include "agent/readers/Collector.h"
+#include "agent/rows/Settings.h"
 
 namespace {
 
@@ -42,19 +42,15 @@ void serveFrom(Front& front, Oid const& arc,
     front.run();
 }
 
-Options standAloneOptions(Folder const& folder, std::string const& address) {
+/// Files of the SNMP library in `folder`, which let everybody on this machine read.
+SnmpFiles readableByAll(Folder const& folder) {
     setLogLevel(LogLevel::Error);
     folder.write("snmp.conf", "rocommunity public 127.0.0.1\n");
-    Options options;
-    options.listen = {address};
-    options.snmpConfig = folder.path("snmp.conf");
-    options.persistentDirectory = folder.path("state");
-    return options;
+    return {folder.path("snmp.conf"), folder.path("state")};
 }
 
 int runIntervalAgent(Folder const& folder, std::string const& address, std::uint32_t lines) {
-    Options const options = standAloneOptions(folder, address);
-    StandAlone front(options);
+    StandAlone front({address}, readableByAll(folder));
     auto const snapshot = std::make_shared<Snapshot const>(makeIntervals(lines));
     if (!front.open()) return 1;
     serveByTableData(snapshot->interfaces);
@@ -96,8 +92,7 @@ std::vector<std::string> masterCommand(Folder const& folder, std::string const& 
 }
 
 int runChassisAgent(Folder const& folder, std::string const& address, int boards, bool refreshes) {
-    Options const options = standAloneOptions(folder, address);
-    StandAlone front(options);
+    StandAlone front({address}, readableByAll(folder));
     if (!front.open()) return 1;
     BoardRefresh refresh(boards);
     // Their seconds, not readings, would be what delays requests most.

@@ -5,7 +5,8 @@
 #include <string>
 
 #include "Z7SimBoardFactory.h"
-#include "agent/ResourceRows.h"
+#include "agent/readers/ResourceReader.h"
+#include "agent/rows/ResourceRow.h"
 #include "platform/ActionScheduler_pthread.h"
 #include "simulator/Control.h"
 

@@ -2,12 +2,12 @@
 // What a refresh of the agent's snapshot reads of boards, and makes of them.
 #pragma once
 
-#include "agent/BoardSource.h"
-#include "agent/EntityReader.h"
-#include "agent/InterfaceReader.h"
-#include "agent/PlatformReader.h"
-#include "agent/Snapshot.h"
-#include "agent/StableIndices.h"
+#include "agent/readers/BoardSource.h"
+#include "agent/readers/EntityReader.h"
+#include "agent/readers/InterfaceReader.h"
+#include "agent/readers/PlatformReader.h"
+#include "agent/readers/StableIndices.h"
+#include "agent/rows/Snapshot.h"
 #include "board/BoardManager.h"
 
 /// Boards of the reference module on the simulated platform, each with four lines that have a full

@@ -4,8 +4,8 @@
 
 #include <cstdint>
 
-#include "agent/Snapshot.h"
-#include "agent/Value.h"
+#include "agent/objects/Value.h"
+#include "agent/rows/Snapshot.h"
 
 inline constexpr std::uint32_t kIntervalsOfALine = 96;
 inline constexpr std::uint32_t kCounters = 10;

@@ -8,7 +8,7 @@
 #include <string_view>
 #include <vector>
 
-#include "agent/Value.h"
+#include "agent/objects/Value.h"
 
 /// The names of a response and the octets of their values, as they came.
 struct Answered {

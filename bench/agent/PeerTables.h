@@ -2,7 +2,7 @@
 // The interval table as Net-SNMP's own helpers serve it.
 #pragma once
 
-#include "agent/InterfaceRows.h"
+#include "agent/rows/InterfaceRows.h"
 
 /// Registers the closed intervals of `lines`, which outlive the SNMP library, with the helper that
 /// keeps a table's rows in a list of its own. Throws std::runtime_error.

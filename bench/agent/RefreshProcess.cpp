@@ -11,7 +11,7 @@
 #include <utility>
 
 #include "BoardRefresh.h"
-#include "agent/Log.h"
+#include "agent/log/Log.h"
 
 namespace {
 

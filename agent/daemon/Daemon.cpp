@@ -1,0 +1,335 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/daemon/Daemon.h"
+
+#include <algorithm>
+#include <cerrno>
+#include <cstdlib>
+#include <ctime>
+#include <filesystem>
+#include <memory>
+#include <system_error>
+#include <utility>
+
+#include "access/DeviceMapperIf.h"
+#include "access/ExternalEventAdaptor.h"
+#include "access/ExternalFaultEventAdaptor.h"
+#include "agent/daemon/FrontChoice.h"
+#include "agent/daemon/ModuleLoader.h"
+#include "agent/daemon/ServiceNotice.h"
+#include "agent/daemon/Signals.h"
+#include "agent/daemon/Wakeup.h"
+#include "agent/log/Log.h"
+#include "agent/notifications/EntityNotices.h"
+#include "agent/notifications/FaultListener.h"
+#include "agent/notifications/LineListener.h"
+#include "agent/notifications/LinkWatch.h"
+#include "agent/notifications/Notifier.h"
+#include "agent/notifications/StatusListener.h"
+#include "agent/objects/ObjectTree.h"
+#include "agent/objects/OwnObjects.h"
+#include "agent/objects/StandardObjects.h"
+#include "agent/readers/BoardSource.h"
+#include "agent/readers/Collector.h"
+#include "agent/readers/EntityReader.h"
+#include "agent/readers/InterfaceReader.h"
+#include "agent/readers/PlatformReader.h"
+#include "agent/readers/ProcessReader.h"
+#include "agent/readers/ResourceReader.h"
+#include "agent/readers/ServiceReader.h"
+#include "agent/readers/StableIndices.h"
+
+namespace kvloamd {
+
+namespace {
+
+/// How long a stop may be held up by notifications that a master does not take.
+constexpr std::chrono::seconds kLastWords{1};
+
+/// The lowest entPhysicalIndex, which is the chassis's.
+constexpr std::uint32_t kFirstEntity = 1;
+
+/// What the library's threads may reach until the process ends. Never destroyed.
+struct Boards {
+    explicit Boards(Oid const& enterprise)
+        : listener(*manager.get(), source, queue, counters, enterprise),
+          faultListener(*manager.get(), faults, queue, enterprise) {}
+
+    ReferenceCounter<BoardManager> manager{new BoardManager};
+    Counters counters;
+    Settings settings;
+    BoardSource source{*manager.get()};
+    NotificationQueue queue{counters};
+    FaultLog faults;
+    StatusListener listener;
+    LineListener lines{*manager.get(), settings, queue, counters};
+    FaultListener faultListener;
+};
+
+/// Makes the first calls of the library's singletons, which belong to one thread, and asks the
+/// platform for its root object.
+bool platformAnswers() {
+    ReferenceTable::get_instance();
+    DeviceMapperClient* const client = DeviceMapperIf::get_interface()->GetDMClient();
+    long root = -1;
+    int const result = client == nullptr ? -1 : client->GetRootObject(&root);
+    if (result != 0) {
+        log(LogLevel::Error, "the board platform does not answer: its device mapper gives no root "
+                             "object (result " +
+                                 std::to_string(result) + "); check that the platform runs");
+        return false;
+    }
+    ExternalEventAdaptor::get_instance();
+    ExternalFaultEventAdaptor::get_instance();
+    return true;
+}
+
+std::vector<LoadedModule> loadModules(Options const& options) {
+    std::vector<LoadedModule> modules;
+    for (std::string const& name : options.modules)
+        modules.emplace_back(name, options.moduleDirectory);
+    return modules;
+}
+
+/// Every module's factory is made before the first is attached: a bad module leaves nothing half
+/// started.
+void attachModules(std::vector<LoadedModule> const& modules, Boards& boards) {
+    std::vector<ReferenceCounter<BoardFactory>> factories;
+    factories.reserve(modules.size());
+    for (LoadedModule const& module : modules)
+        factories.push_back(module.createFactory());
+    boards.manager->AddBoardStatusListener(&boards.listener);
+    boards.manager->AddBoardStatusListener(&boards.faultListener);
+    ExternalFaultEventAdaptor::get_instance()->AddExternalFaultEventListener(&boards.faultListener);
+    for (ReferenceCounter<BoardFactory> const& factory : factories)
+        boards.manager->Attach(factory);
+    for (LoadedModule const& module : modules)
+        ServiceManager::GetInstance()->AddModule(module.name().c_str());
+}
+
+/// Has the listeners tell of changes for a scope.
+class ListeningScope {
+  public:
+    ListeningScope(Boards& boards, std::function<void()> const& changed) : m_boards(boards) {
+        m_boards.listener.start(changed);
+        m_boards.faultListener.start(changed);
+        m_boards.lines.start(changed);
+    }
+    ~ListeningScope() { stop(); }
+    ListeningScope(ListeningScope const&) = delete;
+    ListeningScope& operator=(ListeningScope const&) = delete;
+
+    void stop() {
+        m_boards.listener.stop();
+        m_boards.faultListener.stop();
+        m_boards.lines.stop();
+    }
+
+  private:
+    Boards& m_boards;
+};
+
+/// A folder for a scope.
+class TemporaryFolder {
+  public:
+    TemporaryFolder() {
+        m_path = (std::filesystem::temp_directory_path() / "kvloamd-XXXXXX").string();
+        if (mkdtemp(m_path.data()) == nullptr)
+            throw std::system_error(errno, std::generic_category(), m_path);
+    }
+    ~TemporaryFolder() {
+        std::error_code ignored;
+        std::filesystem::remove_all(m_path, ignored);
+    }
+    TemporaryFolder(TemporaryFolder const&) = delete;
+    TemporaryFolder& operator=(TemporaryFolder const&) = delete;
+
+    std::string const& path() const { return m_path; }
+
+  private:
+    std::string m_path;
+};
+
+bool checkSnmpConfig(Options const& options) {
+    // The SNMP library keeps its state as it goes; a check leaves no trace.
+    TemporaryFolder const folder;
+    Options withoutTrace = options;
+    withoutTrace.persistentDirectory = folder.path();
+    std::vector<std::string> const faults = startSnmp(snmpFiles(withoutTrace));
+    for (std::string const& fault : faults)
+        log(LogLevel::Error, fault);
+    stopSnmp();
+    return faults.empty();
+}
+
+using Deadline = std::optional<Clock::time_point>;
+
+Deadline earliest(Deadline const& one, Deadline const& other) {
+    return one && other ? std::min(*one, *other) : one ? one : other;
+}
+
+/// Reads the options again. What can change while the agent runs changes; the rest waits for the
+/// next start.
+void reload(Options const& started, ReadOptions const& readAgain) {
+    auto const read = readAgain();
+    auto const* const options = std::get_if<Options>(&read);
+    if (options == nullptr) {
+        log(LogLevel::Error, std::get<Exit>(read).text + "; going on as before");
+        return;
+    }
+    setLogLevel(options->logLevel);
+    Options now = *options;
+    now.logLevel = started.logLevel;
+    log(LogLevel::Info, now == started ? "the configuration has been read again"
+                                       : "the configuration has been read again; what has changed "
+                                         "beside the log level counts from the next start on");
+}
+
+/// Has the last notifications leave, if they can soon.
+void announceLast(Notifier& notifier, NotificationQueue& queue, Front& front) {
+    front.beforeSleep([&]() -> std::optional<Clock::time_point> {
+        if (notifier.announceAll()) front.stop();
+        return std::nullopt;
+    });
+    front.run(Clock::now() + kLastWords);
+    if (std::size_t const left = queue.size(); left > 0)
+        log(LogLevel::Warning,
+            "notifications that could not be sent before the stop: " + std::to_string(left));
+}
+
+/// Has the settings of former runs, and keeps those of this one in the same file.
+class KeptSettings {
+  public:
+    KeptSettings(Settings& settings, StableIndices& file) : m_settings(settings), m_file(file) {
+        m_settings.load(m_file.settings());
+    }
+    ~KeptSettings() { save(); }
+    KeptSettings(KeptSettings const&) = delete;
+    KeptSettings& operator=(KeptSettings const&) = delete;
+
+    void save() { m_file.save(m_settings.takeUnsaved()); }
+
+  private:
+    Settings& m_settings;
+    StableIndices& m_file;
+};
+
+void serve(Options const& options, ReadOptions const& readAgain, Front& front,
+           Signals const& signals, Boards& boards) {
+    Clock::time_point const started = boards.counters.started;
+    Wakeup wakeup;
+    ServiceManager& services = *ServiceManager::GetInstance();
+    KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
+    PlatformReader platform;
+    std::string const directory = persistentDirectory(snmpFiles(options));
+    StableIndices indices(directory + "/ifindex.sqlite", options.interfaceBase, "interfaces");
+    KeptSettings keptSettings(boards.settings, indices);
+    InterfaceReader interfaces(*boards.manager.get(), indices, started);
+    StableIndices entityIndices(directory + "/entity.sqlite", kFirstEntity, "physical entities");
+    EntityReader entities(entityIndices, started, [] { return std::time(nullptr); });
+    LinkWatch links(boards.settings, boards.queue);
+    Collector collector(
+        [&](Snapshot& snapshot) {
+            keptSettings.save();
+            snapshot.boards = boards.source.read();
+            snapshot.modules = readModules(services);
+            snapshot.services = readServices(services);
+            snapshot.platformService = readPlatformService(services);
+            snapshot.processes = readProcesses(statistics);
+            snapshot.faults = boards.faults.read(started);
+            snapshot.resources = readResources(*boards.manager.get(), snapshot.boards);
+            snapshot.records = platform.read(snapshot.boards);
+            boards.lines.listen(snapshot.boards, interfaces.uptime());
+            snapshot.interfaces = interfaces.read(snapshot.boards);
+            std::vector<PlacedLine> const lines = interfaces.takeLines();
+            boards.lines.place(lines);
+            handOn(boards.settings, lines);
+            links.note(snapshot.interfaces.interfaces, snapshot.begun);
+            snapshot.entities = entities.read(snapshot);
+        },
+        started, [&] { wakeup.wake(); });
+    std::vector<Table const*> const allTables = tables();
+    ObjectTree const tree(scalars(), allTables);
+    std::vector<Table const*> const allStandardTables = standardTables();
+    ObjectTree const standardTree(standardScalars(), allStandardTables);
+    front.serve({{{tree, options.enterprise, {{kObjectsPlace, "KVL-OAM-MIB"}}},
+                  {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}}},
+                 boards.counters,
+                 [&] {
+                     ++boards.counters.requests;
+                     return collector.snapshot();
+                 },
+                 [&] { return collector.newest(); },
+                 boards.settings});
+    Notifier notifier(boards.queue, front.notifications());
+    EntityNotices entityNotices(boards.queue);
+    ServiceNotice notice;
+    std::string const serving =
+        "serving " + std::to_string(collector.newest()->boards.size()) + " boards " + front.place();
+    front.watch(wakeup.descriptor(), [&] { wakeup.clear(); });
+    front.watch(signals.descriptor(), [&] {
+        while (auto const signal = signals.next()) {
+            if (*signal == Signal::Stop) return front.stop();
+            notice.reloading();
+            reload(options, readAgain);
+            notice.ready(serving);
+        }
+    });
+    front.beforeSleep([&] {
+        if (boards.settings.hasUnsaved()) collector.renew();
+        auto const entityNews = entityNotices.tell(collector.newest(), Clock::now());
+        return earliest(entityNews,
+                        earliest(notifier.announce(collector.newest()->begun), notice.beat()));
+    });
+    ListeningScope listening(boards, [&] { collector.renew(); });
+    log(LogLevel::Info, serving);
+    notice.ready(serving);
+    front.run();
+    signals.letStopThrough();
+    notice.stopping();
+    log(LogLevel::Info, "stopping");
+    listening.stop();
+    announceLast(notifier, boards.queue, front);
+}
+
+} // namespace
+
+int runDaemon(Options const& options, ReadOptions const& readAgain) {
+    Signals const signals;
+    tzset();
+    // The library's threads reach these until the process ends.
+    static auto* const boards = new Boards(options.enterprise);
+    try {
+        std::vector<LoadedModule> const modules = loadModules(options);
+        if (modules.empty())
+            log(LogLevel::Warning, "no board module is named, so there will be no boards; name one "
+                                   "with --module");
+        std::unique_ptr<Front> const front = makeFront(options);
+        if (!front->open() || !platformAnswers()) return kExitFailure;
+        boards->counters.started = Clock::now();
+        attachModules(modules, *boards);
+        serve(options, readAgain, *front, signals, *boards);
+        log(LogLevel::Info, "stopped");
+    } catch (std::exception const& error) {
+        log(LogLevel::Error, error.what());
+        return kExitFailure;
+    }
+    return 0;
+}
+
+int checkConfiguration(Options const& options) {
+    bool good = true;
+    for (std::string const& name : options.modules) {
+        try {
+            LoadedModule(name, options.moduleDirectory);
+        } catch (ModuleError const& error) {
+            log(LogLevel::Error, error.what());
+            good = false;
+        }
+    }
+    // Beside a master, who may ask is the master's concern.
+    if (options.agentx.empty()) good = checkSnmpConfig(options) && good;
+    if (good) log(LogLevel::Info, "the configuration is good");
+    return good ? 0 : kExitFailure;
+}
+
+} // namespace kvloamd

@@ -1,0 +1,164 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/daemon/Options.h"
+
+#include <charconv>
+#include <cstdlib>
+#include <map>
+#include <sstream>
+
+#include <CLI/CLI.hpp>
+
+#include "agent/fronts/agentx/AgentxAddress.h"
+#include "services/oam.h"
+
+namespace kvloamd {
+
+namespace {
+
+std::map<std::string, LogLevel> const kLogLevels{{"error", LogLevel::Error},
+                                                 {"warning", LogLevel::Warning},
+                                                 {"info", LogLevel::Info},
+                                                 {"debug", LogLevel::Debug}};
+
+std::string checkOid(std::string const& text) {
+    return parseOid(text) ? std::string()
+                          : "'" + text + "' is no object identifier; write it as 1.3.6.1.4.1.32473";
+}
+
+/// The SNMP library reads an empty address as its port of every network.
+std::string checkAddress(std::string const& text) {
+    return text.empty() ? "the address is empty; write it as udp:127.0.0.1:1161" : std::string();
+}
+
+std::string defaultModuleDirectory() {
+    char const* const directory = std::getenv("KVLOAM_MODULE_DIR");
+    return directory != nullptr && *directory != '\0' ? directory : KVLOAM_MODULE_DIRECTORY;
+}
+
+/// What is wrong with options that are good each by itself; empty: nothing.
+std::string checkTogether(Options const& options, bool listens) {
+    if (options.agentx.empty()) return {};
+    if (listens)
+        return "--agentx excludes --port and --listen: beside an SNMP master the agent has no port "
+               "of its own; leave one of them out";
+    if (!options.snmpConfig.empty())
+        return "--agentx excludes --snmp-config: beside an SNMP master, who may ask and who is "
+               "notified stands in the master's configuration; leave one of them out";
+    if (!parseAgentxAddress(options.agentx))
+        return "--agentx: '" + options.agentx +
+               "' is no address; write it as unix:/var/agentx/master or tcp:127.0.0.1:705";
+    return {};
+}
+
+/// The parser's messages may have several lines; ours have one.
+std::string oneLine(std::string text) {
+    while (!text.empty() && text.back() == '\n')
+        text.pop_back();
+    for (char& character : text)
+        if (character == '\n') character = ' ';
+    return text;
+}
+
+} // namespace
+
+std::optional<Oid> parseOid(std::string_view text) {
+    if (text.starts_with('.')) text.remove_prefix(1);
+    Oid oid;
+    for (;;) {
+        std::uint32_t number = 0;
+        auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+        if (error != std::errc()) return std::nullopt;
+        oid.push_back(number);
+        text.remove_prefix(static_cast<std::size_t>(end - text.data()));
+        if (text.empty()) break;
+        if (!text.starts_with('.')) return std::nullopt;
+        text.remove_prefix(1);
+    }
+    // An encoded name begins with two numbers in one octet; the library takes 128 at most, and an
+    // instance needs room for its own.
+    if (oid.size() < 2 || oid.size() > 100 || oid[0] > 2 || (oid[0] < 2 && oid[1] > 39))
+        return std::nullopt;
+    return oid;
+}
+
+std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
+    Options options;
+    options.moduleDirectory = defaultModuleDirectory();
+    int port = 0;
+    std::string enterprise = "1.3.6.1.4.1.32473";
+    std::vector<std::string> listen;
+
+    CLI::App app("Tells of the host's telephony boards over SNMP.", "kvloamd");
+    app.set_version_flag("--version",
+                         std::string("kvloamd " KVLOAM_VERSION " (") + OAM_VersionString() + ")");
+    auto* const portOption =
+        app.add_option("--port", port, "Listen on this UDP port of the loopback address")
+            ->check(CLI::Range(1, 65535));
+    app.add_option("--listen", listen,
+                   "Listen here, as in udp:127.0.0.1:1161, which is the default; repeatable")
+        ->type_name("ADDRESS")
+        ->check(checkAddress)
+        ->excludes(portOption);
+    auto* const agentxOption =
+        app.add_option(
+               "--agentx", options.agentx,
+               "Serve through the SNMP master here, as in unix:/var/agentx/master, which is "
+               "the default, instead of a port of our own")
+            ->type_name("[ADDRESS]")
+            ->expected(0, 1);
+    app.add_option("--module", options.modules, "Load the board module <name>kvl.so; repeatable")
+        ->type_name("NAME");
+    app.add_option("--module-dir", options.moduleDirectory,
+                   "Where board modules are (environment: KVLOAM_MODULE_DIR)")
+        ->type_name("DIR")
+        ->capture_default_str();
+    app.add_option("--snmp-config", options.snmpConfig,
+                   "Communities, users, views and trap destinations, in Net-SNMP's own syntax; "
+                   "without it kvloamd.conf is looked for where Net-SNMP looks")
+        ->type_name("FILE");
+    app.add_option("--persistent-dir", options.persistentDirectory,
+                   "Where SNMPv3 engine state and the indices of interfaces and entities are kept")
+        ->type_name("DIR");
+    app.add_option("--enterprise-oid", enterprise, "The arc above KVL-OAM-MIB")
+        ->type_name("OID")
+        ->check(checkOid)
+        ->capture_default_str();
+    app.add_option("--interface-base", options.interfaceBase,
+                   "The lowest ifIndex that is given to an interface that has none yet")
+        ->check(CLI::Range(1, 1000000000))
+        ->capture_default_str();
+    app.add_option("--log-level", options.logLevel, "error, warning, info or debug")
+        ->transform(CLI::CheckedTransformer(kLogLevels, CLI::ignore_case))
+        ->option_text("LEVEL");
+    app.add_flag("--check-config", options.checkConfig,
+                 "Check options, modules and configuration, and exit")
+        ->configurable(false);
+    app.set_config("--config", "", "Read options from this file, as in module=[\"z7sim\"]")
+        ->type_name("FILE");
+    app.allow_config_extras(CLI::config_extras_mode::error);
+
+    try {
+        app.parse(argc, argv);
+    } catch (CLI::FileError const& error) {
+        return Exit{kExitFailure, oneLine(error.what()) + "; check --config"};
+    } catch (CLI::ConfigError const& error) {
+        return Exit{kExitFailure, "the file that --config names: " + oneLine(error.what()) +
+                                      "; its keys are the long options' names, as in port=1161"};
+    } catch (CLI::ParseError const& error) {
+        if (error.get_exit_code() == 0) {
+            std::ostringstream text;
+            app.exit(error, text, text);
+            return Exit{0, text.str()};
+        }
+        return Exit{kExitUsage, oneLine(error.what()) + "; try kvloamd --help"};
+    }
+    if (agentxOption->count() > 0 && options.agentx.empty()) options.agentx = kMasterAddress;
+    if (std::string fault = checkTogether(options, !listen.empty() || port != 0); !fault.empty())
+        return Exit{kExitUsage, std::move(fault) + "; try kvloamd --help"};
+    if (!listen.empty()) options.listen = listen;
+    if (port != 0) options.listen = {"udp:127.0.0.1:" + std::to_string(port)};
+    options.enterprise = *parseOid(enterprise);
+    return options;
+}
+
+} // namespace kvloamd

@@ -1,0 +1,332 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/fronts/agentx/AgentxSession.h"
+
+#include <poll.h>
+#include <sys/socket.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <cstring>
+#include <optional>
+#include <utility>
+
+#include "agent/log/Log.h"
+
+namespace kvloamd {
+
+namespace {
+
+/// snmpTrapOID.0, whose value says which notification it is.
+Oid const kTrapOid{1, 3, 6, 1, 6, 3, 1, 1, 4, 1, 0};
+
+constexpr std::uint8_t kReasonShutdown = 5;
+constexpr std::uint8_t kPriority = 127;
+
+/// A master that asks on and never reads is given up at this many octets.
+constexpr std::size_t kMaxUnread = 4 * 1024 * 1024;
+
+std::string nameOf(AgentxFault fault) {
+    switch (fault) {
+    case AgentxFault::DuplicateRegistration:
+        return "another agent serves them already";
+    case AgentxFault::RequestDenied:
+        return "it does not allow it";
+    default:
+        return "fault " + std::to_string(static_cast<int>(fault));
+    }
+}
+
+/// `nameOf`, and what to do.
+std::string adviceOn(AgentxFault fault) {
+    return nameOf(fault) + (fault == AgentxFault::DuplicateRegistration
+                                ? "; stop it, then restart the master or this agent"
+                                : "; see the master's configuration");
+}
+
+/// The rest of a Register or Unregister packet. `last`, if any: of the range that the name's last
+/// number begins.
+void writeRegion(AgentxWriter& packet, OidView name, std::optional<std::uint32_t> last) {
+    packet.octet(0); // the session's timeout
+    packet.octet(kPriority);
+    packet.octet(last ? static_cast<std::uint8_t>(name.size()) : 0);
+    packet.octet(0);
+    packet.name(name);
+    if (last) packet.number(*last);
+}
+
+} // namespace
+
+AgentxSession::AgentxSession(AgentxAddress address, std::vector<AgentxRoot> roots, SharedRows& rows,
+                             Answer answer, AgentxPace pace)
+    : m_address(std::move(address)),
+      m_roots(std::move(roots)),
+      m_rows(rows),
+      m_answer(std::move(answer)),
+      m_pace(pace) {
+    connectNow();
+}
+
+AgentxSession::~AgentxSession() {
+    if (m_stage == Stage::Registering || m_stage == Stage::Serving) {
+        AgentxWriter close = request(AgentxKind::Close);
+        close.octet(kReasonShutdown);
+        for (int i = 0; i < 3; ++i)
+            close.octet(0);
+        queue(close.take());
+    }
+    disconnect();
+}
+
+short AgentxSession::events() const {
+    bool const writes = m_stage == Stage::Connecting || !m_out.empty();
+    return static_cast<short>(writes ? POLLIN | POLLOUT : POLLIN);
+}
+
+Clock::time_point AgentxSession::deadline() const {
+    if (m_stage == Stage::Away) return m_retryAt;
+    if (m_stage == Stage::Serving && m_awaited.empty()) return m_heard + m_pace.ping;
+    return m_heard + (m_told == Told::Lost ? m_pace.surrender : m_pace.patience);
+}
+
+void AgentxSession::advance(short happened) {
+    if (m_socket >= 0 && m_stage == Stage::Connecting && happened != 0) {
+        int fault = 0;
+        socklen_t size = sizeof fault;
+        getsockopt(m_socket, SOL_SOCKET, SO_ERROR, &fault, &size);
+        if (fault == 0)
+            connected();
+        else
+            drop(std::strerror(fault));
+    } else if (m_socket >= 0) {
+        if ((happened & POLLOUT) != 0) flush();
+        if (m_socket >= 0 && (happened & (POLLIN | POLLHUP | POLLERR)) != 0) receive();
+    }
+    checkTime();
+}
+
+void AgentxSession::checkTime() {
+    auto const now = Clock::now();
+    if (now < deadline()) return;
+    if (m_stage == Stage::Away) {
+        connectNow();
+    } else if (m_stage == Stage::Serving && m_awaited.empty()) {
+        queue(request(AgentxKind::Ping).take());
+    } else if (m_told != Told::Lost) {
+        tellLost("it does not answer");
+    } else {
+        drop("it does not answer");
+    }
+}
+
+void AgentxSession::connectNow() {
+    m_socket = socket(m_address.socket.ss_family, SOCK_STREAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0);
+    if (m_socket < 0) return drop(std::strerror(errno));
+    m_stage = Stage::Connecting;
+    m_heard = Clock::now();
+    if (connect(m_socket, reinterpret_cast<sockaddr const*>(&m_address.socket), m_address.size) ==
+        0)
+        connected();
+    else if (errno == EAGAIN)
+        drop("it does not answer"); // those who wait to be let in are too many already
+    else if (errno != EINPROGRESS)
+        drop(std::strerror(errno));
+}
+
+void AgentxSession::connected() {
+    m_stage = Stage::Opening;
+    AgentxWriter packet = request(AgentxKind::Open);
+    for (int i = 0; i < 4; ++i)
+        packet.octet(0); // the master's own timeout
+    packet.name({});
+    packet.text("kvloamd");
+    queue(packet.take());
+}
+
+void AgentxSession::registerRoots() {
+    m_stage = Stage::Registering;
+    m_rows.restart();
+    for (std::size_t root = 0; root < m_roots.size(); ++root) {
+        AgentxWriter packet = request(AgentxKind::Register);
+        m_awaited.back().root = root;
+        writeRegion(packet, m_roots[root].name, std::nullopt);
+        queue(packet.take());
+        if (m_socket < 0) return;
+    }
+}
+
+void AgentxSession::registerRows() {
+    if (m_stage != Stage::Serving) return;
+    auto const step = m_rows.next();
+    if (!step) return;
+    AgentxWriter packet = request(step->enters ? AgentxKind::Register : AgentxKind::Unregister);
+    Oid name = step->range.column;
+    name.push_back(step->range.first);
+    writeRegion(packet, name, step->range.last);
+    queue(packet.take());
+}
+
+void AgentxSession::takeRegistered(std::size_t root, AgentxFault fault) {
+    if (m_stage == Stage::Serving) {
+        if (fault == AgentxFault::None)
+            m_rows.done();
+        else
+            m_rows.refused(adviceOn(fault));
+        return registerRows();
+    }
+    std::string const& what = m_roots[root].what;
+    auto const told = std::ranges::find(m_refused, what);
+    if (fault == AgentxFault::None) {
+        if (told != m_refused.end()) m_refused.erase(told);
+    } else if (m_roots[root].needed) {
+        return drop("it refuses the agent's names: " + nameOf(fault));
+    } else if (told == m_refused.end()) {
+        m_refused.push_back(what);
+        log(LogLevel::Warning,
+            "the SNMP master refuses " + what + ": " + adviceOn(fault) + "; the rest is served");
+    }
+    if (!m_awaited.empty()) return;
+    m_stage = Stage::Serving;
+    registerRows();
+}
+
+void AgentxSession::send(Notification const& notification, std::function<void()> taken) {
+    AgentxWriter packet = request(AgentxKind::Notify);
+    packet.variable(kTrapOid, ValueType::ObjectId, NameView{notification.name});
+    for (NotifiedObject const& object : notification.objects)
+        packet.variable(object.name, object.type, object.view());
+    m_taken = std::move(taken);
+    queue(packet.take());
+}
+
+AgentxWriter AgentxSession::request(AgentxKind kind) {
+    if (m_awaited.empty()) m_heard = Clock::now();
+    m_awaited.push_back({++m_lastPacket, kind, 0});
+    return {kind, m_session, 0, m_lastPacket};
+}
+
+void AgentxSession::queue(std::string packet) {
+    m_out += packet;
+    flush();
+}
+
+void AgentxSession::flush() {
+    while (!m_out.empty()) {
+        ssize_t const sent =
+            ::send(m_socket, m_out.data(), m_out.size(), MSG_DONTWAIT | MSG_NOSIGNAL);
+        if (sent < 0) {
+            if (errno == EINTR) continue;
+            if (errno != EAGAIN) return drop(std::strerror(errno));
+            if (m_out.size() > kMaxUnread) drop("it does not read our answers");
+            return;
+        }
+        m_out.erase(0, static_cast<std::size_t>(sent));
+    }
+}
+
+void AgentxSession::receive() {
+    char buffer[16384];
+    ssize_t const got = recv(m_socket, buffer, sizeof buffer, MSG_DONTWAIT);
+    if (got == 0) return drop("it has closed the connection");
+    if (got < 0) {
+        if (errno != EAGAIN && errno != EINTR) drop(std::strerror(errno));
+        return;
+    }
+    m_in.append(buffer, static_cast<std::size_t>(got));
+    try {
+        while (m_in.size() >= AgentxHeader::kSize) {
+            AgentxHeader const header = parseAgentxHeader(m_in);
+            std::size_t const size = AgentxHeader::kSize + header.payload;
+            if (m_in.size() < size) break;
+            std::string const packet = m_in.substr(0, size);
+            m_in.erase(0, size);
+            takePacket(header, std::string_view(packet).substr(AgentxHeader::kSize));
+            if (m_socket < 0) return;
+        }
+    } catch (AgentxError const& error) {
+        drop(std::string("it has sent ") + error.what());
+    }
+}
+
+void AgentxSession::takePacket(AgentxHeader const& header, std::string_view payload) {
+    m_heard = Clock::now();
+    if (header.kind == AgentxKind::Response) {
+        takeResponse(header, payload);
+    } else if (header.kind == AgentxKind::Close) {
+        drop("it has closed the session");
+    } else if (std::string answer = m_answer(header, payload); !answer.empty()) {
+        queue(std::move(answer));
+    }
+    // It may be back after a silence.
+    if (m_stage == Stage::Serving) tellConnected();
+}
+
+void AgentxSession::takeResponse(AgentxHeader const& header, std::string_view payload) {
+    auto const awaited = std::ranges::find(m_awaited, header.packet, &Awaited::packet);
+    if (awaited == m_awaited.end()) return;
+    AgentxKind const kind = awaited->kind;
+    std::size_t const root = awaited->root;
+    m_awaited.erase(awaited);
+    AgentxReader reader(payload, header.networkOrder);
+    reader.number(); // the master's time
+    auto const fault = static_cast<AgentxFault>(reader.number16());
+    if (fault == AgentxFault::NotOpen) return drop("it has forgotten the session");
+    switch (kind) {
+    case AgentxKind::Open:
+        if (fault != AgentxFault::None) return drop("it refuses the session: " + nameOf(fault));
+        m_session = header.session;
+        registerRoots();
+        break;
+    case AgentxKind::Register:
+    case AgentxKind::Unregister:
+        takeRegistered(root, fault);
+        break;
+    case AgentxKind::Notify:
+        // Refused, it would be refused again.
+        if (fault != AgentxFault::None)
+            log(LogLevel::Warning, "the SNMP master refuses a notification: " + nameOf(fault));
+        std::exchange(m_taken, nullptr)();
+        break;
+    default:
+        break;
+    }
+}
+
+void AgentxSession::drop(std::string const& why) {
+    disconnect();
+    m_retryAt = Clock::now() + m_pace.retry;
+    tellLost(why);
+}
+
+void AgentxSession::disconnect() {
+    if (m_socket >= 0) close(m_socket);
+    m_socket = -1;
+    m_stage = Stage::Away;
+    m_session = 0;
+    m_awaited.clear();
+    m_taken = nullptr;
+    m_in.clear();
+    m_out.clear();
+}
+
+void AgentxSession::tellConnected() {
+    if (m_told == Told::Connected) return;
+    m_told = Told::Connected;
+    log(LogLevel::Info, "connected to the SNMP master at " + m_address.text);
+}
+
+void AgentxSession::tellLost(std::string const& why) {
+    if (m_told == Told::Lost) {
+        log(LogLevel::Debug, "the SNMP master at " + m_address.text + ": " + why);
+        return;
+    }
+    bool const had = m_told == Told::Connected;
+    m_told = Told::Lost;
+    if (had) ++m_timesLost;
+    log(LogLevel::Warning,
+        (had ? "lost the SNMP master at " : "no connection to the SNMP master at ") +
+            m_address.text + ": " + why + "; trying again until " +
+            (had ? "it is back" : "there is one"));
+}
+
+} // namespace kvloamd

@@ -1,0 +1,261 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/fronts/snmp/SnmpHandler.h"
+
+#include <algorithm>
+#include <limits>
+#include <span>
+#include <utility>
+
+// The SNMP library's headers build on each other.
+// clang-format off
+#include <net-snmp/net-snmp-config.h>
+#include <net-snmp/net-snmp-includes.h>
+#include <net-snmp/agent/net-snmp-agent-includes.h>
+// clang-format on
+
+#include "agent/fronts/snmp/SnmpValues.h"
+
+namespace kvloamd {
+
+namespace {
+
+constexpr oid kHighest = std::numeric_limits<std::uint32_t>::max();
+
+constexpr char kSnapshotKey[] = "kvloam_snapshot";
+constexpr char kSetKey[] = "kvloam_set";
+
+using HeldSnapshot = std::shared_ptr<Snapshot const>;
+
+void freeSnapshot(void* held) {
+    delete static_cast<HeldSnapshot*>(held);
+}
+
+/// What a variable of a SET is to change, and how it was.
+struct HeldChange {
+    Change change;
+    bool made = false; ///< not yet, when another variable can not be set after all
+    std::optional<int> former;
+};
+
+void freeChange(void* held) {
+    delete static_cast<HeldChange*>(held);
+}
+
+int errorOf(SetFault fault) {
+    switch (fault) {
+    case SetFault::None:
+        return SNMP_ERR_NOERROR;
+    case SetFault::NotWritable:
+        return SNMP_ERR_NOTWRITABLE;
+    case SetFault::WrongType:
+        return SNMP_ERR_WRONGTYPE;
+    case SetFault::WrongValue:
+        return SNMP_ERR_WRONGVALUE;
+    case SetFault::NoCreation:
+        return SNMP_ERR_NOCREATION;
+    }
+    return SNMP_ERR_GENERR;
+}
+
+} // namespace
+
+/// One call of the library: one PDU's variables that concern us.
+struct SnmpHandler::Call {
+    SnmpHandler const& handler;
+    Facts facts;
+    netsnmp_pdu* pdu;
+    Instance instance;
+    std::vector<oid> name;
+
+    static int answer(netsnmp_mib_handler* library, netsnmp_handler_registration* /*place*/,
+                      netsnmp_agent_request_info* info, netsnmp_request_info* requests);
+
+    static Snapshot const& snapshotOf(SnmpHandler const& handler, netsnmp_agent_request_info* info);
+    /// The part of the variable's name below the arc. A name outside of the arc reads as
+    /// one before or after all of ours.
+    Oid relative(netsnmp_variable_list const* variable, bool& orEqual) const;
+    void get(netsnmp_request_info* request);
+    void getNext(netsnmp_request_info* request);
+    void getBulk(netsnmp_request_info* request);
+    /// Whether it can be set; the library asks that of all variables before any is.
+    void testSet(netsnmp_request_info* request);
+    static HeldChange* heldChange(netsnmp_request_info* request);
+    void commitSet(netsnmp_request_info* request);
+    /// Undoes the last first: one instance may be set twice.
+    void undoSets(netsnmp_request_info* requests);
+};
+
+int SnmpHandler::Call::answer(netsnmp_mib_handler* library, netsnmp_handler_registration* /*place*/,
+                              netsnmp_agent_request_info* info, netsnmp_request_info* requests) {
+    auto const& handler = *static_cast<SnmpHandler const*>(library->myvoid);
+    Call call{handler,
+              {snapshotOf(handler, info), handler.m_counters, &handler.m_settings},
+              info->asp->pdu,
+              {},
+              {}};
+    if (info->mode == MODE_SET_UNDO) {
+        call.undoSets(requests);
+        return SNMP_ERR_NOERROR;
+    }
+    for (netsnmp_request_info* request = requests; request != nullptr; request = request->next) {
+        if (request->processed != 0) continue;
+        switch (info->mode) {
+        case MODE_GET:
+            call.get(request);
+            break;
+        case MODE_GETNEXT:
+            call.getNext(request);
+            break;
+        case MODE_GETBULK:
+            call.getBulk(request);
+            break;
+        case MODE_SET_RESERVE1:
+            call.testSet(request);
+            break;
+        case MODE_SET_ACTION:
+            call.commitSet(request);
+            break;
+        default: // the other steps of a SET need nothing
+            break;
+        }
+    }
+    return SNMP_ERR_NOERROR;
+}
+
+Snapshot const& SnmpHandler::Call::snapshotOf(SnmpHandler const& handler,
+                                              netsnmp_agent_request_info* info) {
+    // The library may call several times for one PDU: all of its variables come from one snapshot.
+    auto* held = static_cast<HeldSnapshot*>(netsnmp_agent_get_list_data(info, kSnapshotKey));
+    if (held == nullptr) {
+        held = new HeldSnapshot(handler.m_takeSnapshot());
+        netsnmp_agent_add_list_data(info,
+                                    netsnmp_create_data_list(kSnapshotKey, held, freeSnapshot));
+    }
+    return **held;
+}
+
+Oid SnmpHandler::Call::relative(netsnmp_variable_list const* variable, bool& orEqual) const {
+    Oid const& arc = handler.m_arc;
+    std::span<oid const> const asked(variable->name, variable->name_length);
+    auto const [differs, differsFrom] = std::ranges::mismatch(asked, arc);
+    if (differsFrom == arc.end()) {
+        Oid rest(static_cast<std::size_t>(asked.end() - differs));
+        std::transform(differs, asked.end(), rest.begin(), [](oid number) {
+            return static_cast<std::uint32_t>(std::min(number, kHighest));
+        });
+        return rest;
+    }
+    orEqual = true;
+    bool const before = differs == asked.end() || *differs < *differsFrom;
+    return before ? Oid{} : Oid{static_cast<std::uint32_t>(kHighest)};
+}
+
+void SnmpHandler::Call::get(netsnmp_request_info* request) {
+    bool orEqual = false;
+    switch (handler.m_tree.find(facts, relative(request->requestvb, orEqual), instance)) {
+    case Lookup::Found:
+        setVariable(request->requestvb, instance.type, instance.value);
+        break;
+    case Lookup::NoSuchObject:
+        netsnmp_request_set_error(request, SNMP_NOSUCHOBJECT);
+        break;
+    case Lookup::NoSuchInstance:
+        netsnmp_request_set_error(request, SNMP_NOSUCHINSTANCE);
+        break;
+    }
+}
+
+void SnmpHandler::Call::getNext(netsnmp_request_info* request) {
+    bool orEqual = request->inclusive != 0;
+    Oid after = relative(request->requestvb, orEqual);
+    // A variable that is left alone goes to whoever serves the names after ours.
+    while (handler.m_tree.next(facts, after, orEqual, instance)) {
+        name.assign(handler.m_arc.begin(), handler.m_arc.end());
+        name.insert(name.end(), instance.name.begin(), instance.name.end());
+        if (snmp_oid_compare(name.data(), name.size(), request->range_end,
+                             request->range_end_len) >= 0)
+            return;
+        // The library looks at the first answer of a GETBULK only when it compares answers with
+        // what the asker may see; so what he may not see is passed over here.
+        std::size_t length = name.size();
+        if (in_a_view(name.data(), &length, pdu, asnTypeOf(instance.type)) == VACM_SUCCESS) {
+            snmp_set_var_objid(request->requestvb, name.data(), name.size());
+            setVariable(request->requestvb, instance.type, instance.value);
+            return;
+        }
+        after.swap(instance.name);
+        orEqual = false;
+    }
+}
+
+void SnmpHandler::Call::getBulk(netsnmp_request_info* request) {
+    for (;;) {
+        getNext(request);
+        if (request->requestvb->type == ASN_NULL || request->requestvb->type == ASN_PRIV_RETRY)
+            return;
+        if (request->repeat <= 0 || request->requestvb->next_variable == nullptr) return;
+        --request->repeat;
+        netsnmp_variable_list const* const answered = request->requestvb;
+        request->requestvb = request->requestvb->next_variable;
+        snmp_set_var_objid(request->requestvb, answered->name, answered->name_length);
+        request->requestvb->type = ASN_PRIV_RETRY;
+        request->inclusive = 0;
+    }
+}
+
+void SnmpHandler::Call::testSet(netsnmp_request_info* request) {
+    netsnmp_variable_list const& variable = *request->requestvb;
+    std::optional<std::int64_t> integer;
+    if (variable.type == ASN_INTEGER) integer = *variable.val.integer;
+    bool orEqual = false;
+    std::optional<Change> change;
+    SetFault const fault =
+        handler.m_tree.test(facts, relative(&variable, orEqual), integer, change);
+    if (fault != SetFault::None || !change) {
+        netsnmp_request_set_error(request, errorOf(fault));
+        return;
+    }
+    netsnmp_request_add_list_data(
+        request, netsnmp_create_data_list(kSetKey, new HeldChange{*change, false, {}}, freeChange));
+}
+
+HeldChange* SnmpHandler::Call::heldChange(netsnmp_request_info* request) {
+    return static_cast<HeldChange*>(netsnmp_request_get_list_data(request, kSetKey));
+}
+
+void SnmpHandler::Call::commitSet(netsnmp_request_info* request) {
+    HeldChange* const held = heldChange(request);
+    if (held == nullptr) return;
+    held->former = handler.m_settings.exchange(held->change.key, held->change.value);
+    held->made = true;
+}
+
+void SnmpHandler::Call::undoSets(netsnmp_request_info* requests) {
+    netsnmp_request_info* last = requests;
+    while (last->next != nullptr)
+        last = last->next;
+    for (netsnmp_request_info* request = last; request != nullptr; request = request->prev)
+        if (HeldChange const* const held = heldChange(request); held != nullptr && held->made)
+            handler.m_settings.exchange(held->change.key, held->former);
+}
+
+SnmpHandler::SnmpHandler(ObjectTree const& tree, Counters const& counters, Oid arc,
+                         TakeSnapshot takeSnapshot, Settings& settings)
+    : m_tree(tree),
+      m_counters(counters),
+      m_arc(std::move(arc)),
+      m_takeSnapshot(std::move(takeSnapshot)),
+      m_settings(settings) {}
+
+bool SnmpHandler::serve(Oid const& place) {
+    std::vector<oid> root(m_arc.begin(), m_arc.end());
+    root.insert(root.end(), place.begin(), place.end());
+    netsnmp_handler_registration* const registration =
+        netsnmp_create_handler_registration("kvloam", &Call::answer, root.data(), root.size(),
+                                            HANDLER_CAN_RWRITE | HANDLER_CAN_GETBULK);
+    if (registration == nullptr) return false;
+    registration->handler->myvoid = this;
+    return netsnmp_register_handler(registration) == MIB_REGISTERED_OK;
+}
+
+} // namespace kvloamd

@@ -1,0 +1,46 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/fronts/snmp/SnmpNotifications.h"
+
+#include <vector>
+
+// The SNMP library's headers build on each other.
+// clang-format off
+#include <net-snmp/net-snmp-config.h>
+#include <net-snmp/net-snmp-includes.h>
+#include <net-snmp/agent/net-snmp-agent-includes.h>
+// clang-format on
+
+#include "agent/fronts/snmp/SnmpValues.h"
+
+namespace kvloamd {
+
+namespace {
+
+/// snmpTrapOID.0, whose value says which notification it is.
+Oid const kTrapOid{1, 3, 6, 1, 6, 3, 1, 1, 4, 1, 0};
+
+void addVariable(netsnmp_variable_list*& variables, Oid const& name, ValueType type,
+                 Value const& value) {
+    std::vector<oid> const wide(name.begin(), name.end());
+    setVariable(
+        snmp_varlist_add_variable(&variables, wide.data(), wide.size(), ASN_NULL, nullptr, 0), type,
+        value);
+}
+
+} // namespace
+
+void SnmpNotifications::sendStart() {
+    send_easy_trap(SNMP_TRAP_COLDSTART, 0);
+}
+
+void SnmpNotifications::send(Notification const& notification, std::function<void()> taken) {
+    netsnmp_variable_list* variables = nullptr;
+    addVariable(variables, kTrapOid, ValueType::ObjectId, NameView{notification.name});
+    for (NotifiedObject const& object : notification.objects)
+        addVariable(variables, object.name, object.type, object.view());
+    send_v2trap(variables);
+    snmp_free_varbind(variables);
+    taken();
+}
+
+} // namespace kvloamd

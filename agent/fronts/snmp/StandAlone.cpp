@@ -1,0 +1,39 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/fronts/snmp/StandAlone.h"
+
+#include <stdexcept>
+#include <utility>
+
+#include "agent/log/Log.h"
+
+namespace kvloamd {
+
+StandAlone::~StandAlone() {
+    stopSnmp();
+}
+
+bool StandAlone::open() {
+    std::vector<std::string> faults = startSnmp(m_files);
+    if (faults.empty()) {
+        for (std::string const& address : m_listen)
+            if (std::string fault = SnmpLoop::listen(address); !fault.empty())
+                faults.push_back(std::move(fault));
+    }
+    for (std::string const& fault : faults)
+        log(LogLevel::Error, fault);
+    return faults.empty();
+}
+
+void StandAlone::serve(Served served) {
+    for (ServedTree const& each : served.trees) {
+        SnmpHandler& handler = m_handlers.emplace_back(each.tree, served.counters, each.arc,
+                                                       served.takeSnapshot, served.settings);
+        for (Place const& place : each.places)
+            if (!handler.serve(place.place))
+                throw std::runtime_error("the SNMP library does not let the agent serve its "
+                                         "objects; check --enterprise-oid");
+    }
+    SnmpNotifications::sendStart();
+}
+
+} // namespace kvloamd

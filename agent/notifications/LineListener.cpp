@@ -1,0 +1,98 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/notifications/LineListener.h"
+
+#include "agent/notifications/StandardNotifications.h"
+#include "agent/readers/BoardFeatures.h"
+
+namespace kvloamd {
+
+namespace {
+constexpr int kEnabled = 1;
+}
+
+int LineListener::ProcessLineStatusEvent(ReferenceCounter<DS1LineStatusEvent> event) {
+    DS1LineStatusEvent* const told = event.get();
+    if (told == nullptr) return 0;
+    ReferenceCounter<DS1LineDevice> line = told->GetLine();
+    DS1LineDevice* const changed = line.get();
+    if (changed == nullptr) return 0;
+    Change change{std::move(line), told->GetLineStatus(), changed->GetLineStatusLastChange(),
+                  changed->GetLineStatusChangeTrapEnable(), Clock::now()};
+    std::scoped_lock const guard(m_mutex);
+    if (m_stopped) return 0;
+    auto const place = m_places.find(changed);
+    if (place != m_places.end())
+        announce(place->second, change);
+    else if (m_waiting.size() < kMostWaiting)
+        m_waiting.push_back(std::move(change));
+    else
+        ++m_counters.notificationsDropped;
+    if (m_changed) m_changed();
+    return 0;
+}
+
+void LineListener::listen(std::vector<BoardRow> const& boards, Uptime const& uptime) {
+    {
+        std::scoped_lock const guard(m_mutex);
+        m_uptime = uptime;
+    }
+    decltype(m_features) present;
+    for (BoardRow const& row : boards) {
+        auto const board = m_manager.GetBoardByIndex(static_cast<int>(row.boardIndex));
+        Board* const asked = board.get();
+        if (asked == nullptr) continue;
+        forEachFeature<DS1LineFeature>(*asked, [&](DS1LineFeature& feature) {
+            present.emplace(row.boardIndex, &feature);
+            if (!m_features.contains({row.boardIndex, &feature}))
+                feature.AddLineStatusListener(this);
+        });
+    }
+    m_features = std::move(present);
+}
+
+void LineListener::place(std::vector<PlacedLine> const& lines) {
+    decltype(m_places) places;
+    for (PlacedLine const& placed : lines)
+        places.emplace(placed.line.get(), placed.ifIndex);
+    // The last handle of a line may go with a change, which must not happen under the lock.
+    std::vector<Change> waiting;
+    std::scoped_lock const guard(m_mutex);
+    m_places = std::move(places);
+    waiting.swap(m_waiting);
+    for (Change const& change : waiting)
+        if (auto const place = m_places.find(change.line.get()); place != m_places.end())
+            announce(place->second, change);
+}
+
+void LineListener::announce(std::uint32_t ifIndex, Change const& change) {
+    int const enable =
+        m_settings.find({Setting::LineStatusChangeTraps, ifIndex}).value_or(change.enable);
+    if (enable != kEnabled) return;
+    std::uint32_t const lastChange =
+        change.lastChange < 0 ? m_uptime->now() : m_uptime->of(change.lastChange);
+    m_queue.push(lineStatusChange(ifIndex, change.status, lastChange, change.when));
+}
+
+void LineListener::start(std::function<void()> changed) {
+    std::scoped_lock const guard(m_mutex);
+    m_stopped = false;
+    m_changed = std::move(changed);
+}
+
+void LineListener::stop() {
+    std::scoped_lock const guard(m_mutex);
+    m_stopped = true;
+    m_changed = nullptr;
+}
+
+void handOn(Settings const& settings, std::vector<PlacedLine> const& lines) {
+    for (PlacedLine const& placed : lines) {
+        auto const set = settings.find({Setting::LineStatusChangeTraps, placed.ifIndex});
+        DS1LineDevice* const line = placed.line.get();
+        // What the line answers does not matter: what is set counts.
+        if (set && line->GetLineStatusChangeTrapEnable() != *set)
+            line->SetLineStatusChangeTrapEnable(*set);
+    }
+}
+
+} // namespace kvloamd

@@ -1,0 +1,69 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Notifications on their way from the threads that have news to the one that sends them.
+#pragma once
+
+#include <cstddef>
+#include <deque>
+#include <mutex>
+#include <optional>
+#include <utility>
+
+#include "agent/notifications/Notification.h"
+
+namespace kvloamd {
+
+/// First in, first out, bounded: a notification that finds the queue full is dropped. Counts those
+/// that wait, have been taken out, or were dropped. All operations may be called from any thread.
+class NotificationQueue {
+  public:
+    static constexpr std::size_t kCapacity = 4096;
+
+    /// `counters` outlives the queue.
+    explicit NotificationQueue(Counters& counters, std::size_t capacity = kCapacity)
+        : m_counters(counters), m_capacity(capacity) {}
+
+    void push(Notification notification) {
+        std::scoped_lock const guard(m_mutex);
+        if (m_notifications.size() < m_capacity)
+            m_notifications.push_back(std::move(notification));
+        else
+            ++m_counters.notificationsDropped;
+        countWaiting();
+    }
+
+    /// The oldest one, which stays; nothing when the queue is empty.
+    std::optional<Notification> oldest() {
+        std::scoped_lock const guard(m_mutex);
+        if (m_notifications.empty()) return std::nullopt;
+        return m_notifications.front();
+    }
+
+    /// Takes the oldest one out, which has been sent; nothing when the queue is empty. There is one
+    /// consumer only.
+    std::optional<Notification> pop() {
+        std::scoped_lock const guard(m_mutex);
+        if (m_notifications.empty()) return std::nullopt;
+        Notification notification = std::move(m_notifications.front());
+        m_notifications.pop_front();
+        ++m_counters.notificationsSent;
+        countWaiting();
+        return notification;
+    }
+
+    std::size_t size() {
+        std::scoped_lock const guard(m_mutex);
+        return m_notifications.size();
+    }
+
+  private:
+    void countWaiting() {
+        m_counters.notificationsWaiting = static_cast<std::uint32_t>(m_notifications.size());
+    }
+
+    Counters& m_counters;
+    std::size_t m_capacity;
+    std::mutex m_mutex;
+    std::deque<Notification> m_notifications;
+};
+
+} // namespace kvloamd

@@ -1,0 +1,19 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The notifications of IF-MIB and DS1-MIB.
+#pragma once
+
+#include <cstdint>
+
+#include "agent/notifications/Notification.h"
+#include "agent/rows/InterfaceRows.h"
+
+namespace kvloamd {
+
+/// dsx1LineStatusChange. `lastChange`: hundredths of a second since the agent's start.
+Notification lineStatusChange(std::uint32_t ifIndex, int status, std::uint32_t lastChange,
+                              Clock::time_point when);
+
+/// linkDown or linkUp, as `row` says.
+Notification linkChange(InterfaceRow const& row, Clock::time_point when);
+
+} // namespace kvloamd

@@ -1,0 +1,35 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// kvlFaultTable.
+#include "agent/objects/OwnObjects.h"
+#include "agent/objects/RowValues.h"
+
+namespace kvloamd {
+
+namespace {
+
+using enum ValueType;
+
+template <auto Field>
+Value plain(FaultRow const& row) {
+    return std::int64_t{row.*Field};
+}
+
+constexpr Column<FaultRow> kColumns[] = {
+    {"kvlFaultTime", 3, TimeTicks, plain<&FaultRow::time>},
+    {"kvlFaultDate", 4, Date, textIfKnown<&FaultRow::date>},
+    {"kvlFaultTimesRaised", 5, Counter, plain<&FaultRow::times>},
+    {"kvlFaultPlatformBoard", 6, Integer, plain<&FaultRow::platformBoard>},
+};
+
+std::vector<FaultRow> const& rows(Snapshot const& snapshot) {
+    return snapshot.faults.rows;
+}
+
+} // namespace
+
+Table const& faultTable() {
+    static RowTable<FaultRow, rows> const table("kvlFaultTable", {1, 1, 8, 5, 1}, kColumns);
+    return table;
+}
+
+} // namespace kvloamd

@@ -1,0 +1,122 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/objects/ObjectTree.h"
+
+#include <algorithm>
+
+namespace kvloamd {
+
+namespace {
+
+/// A scalar's one instance.
+constexpr std::uint32_t kScalarIndex[] = {0};
+
+/// An instance's whole name, from the root on; longer ones have to be made room for.
+constexpr std::size_t kUsualName = 20;
+
+} // namespace
+
+ObjectTree::ObjectTree(std::span<Scalar const> scalars, std::span<Table const* const> tables) {
+    for (Scalar const& scalar : scalars)
+        m_nodes.push_back({scalar.place, scalar.type, &scalar, nullptr, 0});
+    for (Table const* const table : tables) {
+        for (std::size_t column = 0; column < table->columnCount(); ++column) {
+            ColumnHead const head = table->column(column);
+            Oid place = table->entry();
+            place.push_back(head.number);
+            m_nodes.push_back({std::move(place), head.type, nullptr, table, column});
+        }
+    }
+    std::ranges::sort(m_nodes, [](Node const& a, Node const& b) { return a.place < b.place; });
+}
+
+std::vector<ObjectTree::Node>::const_iterator ObjectTree::nodeAbove(OidView name) const {
+    return std::ranges::partition_point(
+        m_nodes, [&](Node const& node) { return std::is_lteq(compare(node.place, name)); });
+}
+
+ObjectTree::Node const* ObjectTree::nodeOf(OidView name) const {
+    auto const above = nodeAbove(name);
+    if (above == m_nodes.begin()) return nullptr;
+    Node const& node = *std::prev(above);
+    return startsWith(name, node.place) ? &node : nullptr;
+}
+
+Lookup ObjectTree::find(Facts const& facts, OidView name, Instance& found) const {
+    Node const* const around = nodeOf(name);
+    if (around == nullptr) return Lookup::NoSuchObject;
+    Node const& node = *around;
+    OidView const index = name.subspan(node.place.size());
+    if (node.scalar != nullptr) {
+        if (std::is_neq(compare(index, kScalarIndex))) return Lookup::NoSuchInstance;
+        found.value = node.scalar->get(facts);
+    } else {
+        std::size_t const row = node.table->firstRow(facts, index, true);
+        if (row == node.table->rowCount(facts) || node.table->firstRow(facts, index, false) == row)
+            return Lookup::NoSuchInstance;
+        found.value = node.table->value(facts, node.column, row);
+    }
+    found.type = node.type;
+    return isKnown(found.value) ? Lookup::Found : Lookup::NoSuchInstance;
+}
+
+bool ObjectTree::next(Facts const& facts, OidView name, bool orEqual, Instance& found) const {
+    auto node = nodeAbove(name);
+    if (node != m_nodes.begin()) {
+        Node const& around = *std::prev(node);
+        if (startsWith(name, around.place) &&
+            firstIn(around, facts, name.subspan(around.place.size()), orEqual, found))
+            return true;
+    }
+    for (; node != m_nodes.end(); ++node)
+        if (firstIn(*node, facts, {}, true, found)) return true;
+    return false;
+}
+
+std::vector<TableColumn> ObjectTree::columnsBelow(OidView place) const {
+    std::vector<TableColumn> columns;
+    for (Node const& node : m_nodes)
+        if (node.table != nullptr && startsWith(node.place, place))
+            columns.push_back({node.place, node.table, node.column});
+    return columns;
+}
+
+SetFault ObjectTree::test(Facts const& facts, OidView name, std::optional<std::int64_t> integer,
+                          std::optional<Change>& change) const {
+    Node const* const node = nodeOf(name);
+    if (node == nullptr || node->table == nullptr) return SetFault::NotWritable;
+    auto const writable = node->table->column(node->column).writable;
+    if (!writable) return SetFault::NotWritable;
+    if (!integer) return SetFault::WrongType;
+    if (*integer < writable->lowest || *integer > writable->highest) return SetFault::WrongValue;
+    Instance present;
+    if (find(facts, name, present) != Lookup::Found) return SetFault::NoCreation;
+    change = {{writable->setting, name[node->place.size()]}, static_cast<int>(*integer)};
+    return SetFault::None;
+}
+
+bool ObjectTree::firstIn(Node const& node, Facts const& facts, OidView index, bool orEqual,
+                         Instance& found) {
+    if (node.scalar != nullptr) {
+        auto const order = compare(index, kScalarIndex);
+        if (std::is_gt(order) || (std::is_eq(order) && !orEqual)) return false;
+        found.value = node.scalar->get(facts);
+        if (!isKnown(found.value)) return false;
+        found.name = node.place;
+        found.name.push_back(kScalarIndex[0]);
+        found.type = node.type;
+        return true;
+    }
+    std::size_t const rows = node.table->rowCount(facts);
+    for (std::size_t row = node.table->firstRow(facts, index, orEqual); row < rows; ++row) {
+        found.value = node.table->value(facts, node.column, row);
+        if (!isKnown(found.value)) continue;
+        found.name.reserve(kUsualName);
+        found.name = node.place;
+        node.table->appendIndex(facts, row, found.name);
+        found.type = node.type;
+        return true;
+    }
+    return false;
+}
+
+} // namespace kvloamd

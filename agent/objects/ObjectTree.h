@@ -1,0 +1,90 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Finds instances of managed objects by name, and the next one in order.
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <span>
+#include <vector>
+
+#include "agent/objects/Description.h"
+
+namespace kvloamd {
+
+/// One instance and its value. The value is good while the facts that it came from are.
+struct Instance {
+    Oid name; ///< relative
+    ValueType type = ValueType::Integer;
+    Value value;
+};
+
+/// A table's column and its place.
+struct TableColumn {
+    Oid place; ///< relative
+    Table const* table;
+    std::size_t column;
+};
+
+enum class Lookup {
+    Found,
+    NoSuchObject,  ///< no object has this name
+    NoSuchInstance ///< the object has no such instance, or its value is not known
+};
+
+/// Why an instance can not be set, in the order in which it is looked at.
+enum class SetFault {
+    None,
+    NotWritable, ///< no such object, or nobody can set it
+    WrongType,   ///< the object takes integers
+    WrongValue,  ///< none that the object takes
+    NoCreation   ///< there is no such instance, and setting it would not make one
+};
+
+/// A setting and what it is to be. `Settings::exchange` makes the change, and undoes it.
+struct Change {
+    SettingKey key;
+    int value;
+};
+
+/// All scalars and columns in the order of their places. Never changed once made; every search is
+/// binary, over the objects and then over a table's rows.
+class ObjectTree {
+  public:
+    /// `scalars` and `tables` outlive the tree.
+    ObjectTree(std::span<Scalar const> scalars, std::span<Table const* const> tables);
+
+    /// The value of the instance `name`; `found.name` stays as it is.
+    Lookup find(Facts const& facts, OidView name, Instance& found) const;
+
+    /// The first instance after `name`, or at `name` if `orEqual`. False when there is none.
+    bool next(Facts const& facts, OidView name, bool orEqual, Instance& found) const;
+
+    /// Whether the instance `name` can be set to `integer`; nothing when the value is no integer.
+    /// `change` is what to do, if it can.
+    SetFault test(Facts const& facts, OidView name, std::optional<std::int64_t> integer,
+                  std::optional<Change>& change) const;
+
+    /// The columns of tables that are at `place` or below, ascending.
+    std::vector<TableColumn> columnsBelow(OidView place) const;
+
+  private:
+    /// A scalar, or one column of a table.
+    struct Node {
+        Oid place;
+        ValueType type;
+        Scalar const* scalar;
+        Table const* table;
+        std::size_t column;
+    };
+
+    /// The first node whose place is above `name`.
+    std::vector<Node>::const_iterator nodeAbove(OidView name) const;
+    /// The node whose place `name` begins with; null when there is none.
+    Node const* nodeOf(OidView name) const;
+    static bool firstIn(Node const& node, Facts const& facts, OidView index, bool orEqual,
+                        Instance& found);
+
+    std::vector<Node> m_nodes; ///< ascending; no place is the beginning of another
+};
+
+} // namespace kvloamd

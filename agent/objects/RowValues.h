@@ -1,0 +1,30 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Getters of columns: a row's field as a value, or nothing when the field is not known.
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string>
+
+#include "agent/objects/Value.h"
+
+namespace kvloamd {
+
+template <auto Field, class Row>
+Value text(Row const& row) {
+    return std::string_view(row.*Field);
+}
+
+/// A text or octets that are empty when they are not known.
+template <auto Field, class Row>
+Value textIfKnown(Row const& row) {
+    return (row.*Field).empty() ? Value{} : Value{std::string_view(row.*Field)};
+}
+
+/// A number in an `std::optional`.
+template <auto Field, class Row>
+Value number(Row const& row) {
+    return (row.*Field).has_value() ? Value{std::int64_t{*(row.*Field)}} : Value{};
+}
+
+} // namespace kvloamd

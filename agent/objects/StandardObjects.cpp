@@ -1,0 +1,54 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/objects/StandardObjects.h"
+
+namespace kvloamd {
+
+std::span<Scalar const> standardScalars() {
+    static Scalar const described[] = {
+        {"ifNumber",
+         {2, 1},
+         ValueType::Integer,
+         [](Facts const& facts) -> Value {
+             return static_cast<std::int64_t>(facts.snapshot.interfaces.interfaces.size());
+         }},
+        {"ifTableLastChange",
+         {31, 1, 5},
+         ValueType::TimeTicks,
+         [](Facts const& facts) -> Value {
+             return std::int64_t{facts.snapshot.interfaces.lastChange};
+         }},
+        {"ifStackLastChange",
+         {31, 1, 6},
+         ValueType::TimeTicks,
+         [](Facts const& facts) -> Value {
+             return std::int64_t{facts.snapshot.interfaces.stackLastChange};
+         }},
+        {"entLastChangeTime",
+         {47, 1, 4, 1},
+         ValueType::TimeTicks,
+         [](Facts const& facts) -> Value {
+             return std::int64_t{facts.snapshot.entities.lastChange};
+         }},
+    };
+    return described;
+}
+
+std::vector<Table const*> standardTables() {
+    return {&ifTable(),
+            &ifXTable(),
+            &ifStackTable(),
+            &dsx1ConfigTable(),
+            &dsx1CurrentTable(),
+            &dsx1IntervalTable(),
+            &dsx1TotalTable(),
+            &isdnBearerTable(),
+            &isdnSignalingTable(),
+            &isdnLapdTable(),
+            &dot3StatsTable(),
+            &entPhysicalTable(),
+            &entAliasMappingTable(),
+            &entPhysicalContainsTable(),
+            &entStateTable()};
+}
+
+} // namespace kvloamd

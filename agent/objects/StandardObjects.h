@@ -1,0 +1,58 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The objects of the standard MIB modules: lines, channels, interfaces and physical entities.
+#pragma once
+
+#include <array>
+#include <span>
+#include <vector>
+
+#include "agent/objects/ServedTree.h"
+
+namespace kvloamd {
+
+/// The arc above them: their places are relative to it.
+inline Oid const kStandardArc{1, 3, 6, 1, 2, 1};
+
+/// The places that the agent takes over, relative, and no others below the arc.
+inline std::array<Place, 11> const kStandardPlaces{{
+    {{2, 1}, "ifNumber", HostHas::All},
+    {{2, 2}, "ifTable", HostHas::Rows},
+    {{10, 7, 2}, "dot3StatsTable", HostHas::Rows},
+    {{10, 18}, "DS1-MIB"},
+    {{10, 20}, "ISDN-MIB"},
+    {{31, 1, 1}, "ifXTable", HostHas::Rows},
+    {{31, 1, 2}, "ifStackTable"},
+    {{31, 1, 5}, "ifTableLastChange", HostHas::All},
+    {{31, 1, 6}, "ifStackLastChange"},
+    {{47, 1}, "ENTITY-MIB"},
+    {{131, 1}, "ENTITY-STATE-MIB"},
+}};
+
+std::span<Scalar const> standardScalars();
+
+Table const& ifTable();
+Table const& ifXTable();
+Table const& ifStackTable();
+Table const& dsx1ConfigTable();
+Table const& dsx1CurrentTable();
+Table const& dsx1IntervalTable();
+Table const& dsx1TotalTable();
+Table const& isdnBearerTable();
+Table const& isdnSignalingTable();
+Table const& isdnLapdTable();
+Table const& dot3StatsTable();
+Table const& entPhysicalTable();
+Table const& entAliasMappingTable();
+Table const& entPhysicalContainsTable();
+Table const& entStateTable();
+
+/// Every table.
+std::vector<Table const*> standardTables();
+
+/// The rows of one kind among the interfaces.
+template <auto Rows>
+auto const& interfaceRows(Snapshot const& snapshot) {
+    return snapshot.interfaces.*Rows;
+}
+
+} // namespace kvloamd

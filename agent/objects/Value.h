@@ -1,0 +1,42 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// What a managed object's value is, independent of any protocol.
+#pragma once
+
+#include <cstdint>
+#include <string_view>
+#include <variant>
+
+#include "agent/rows/Oid.h"
+
+namespace kvloamd {
+
+enum class ValueType {
+    Integer,   ///< signed, 32 bits
+    Counter,   ///< 32 bits, wraps
+    Counter64, ///< 64 bits
+    Gauge,     ///< unsigned, 32 bits
+    TimeTicks, ///< hundredths of a second since the agent's start
+    Text,      ///< printable characters
+    Octets,    ///< any
+    Date,      ///< 11 octets: date, time of day, offset from UTC
+    ObjectId,  ///< a place in the tree of names, absolute
+};
+
+/// A name that is a value.
+struct NameView {
+    OidView name;
+
+    friend bool operator==(NameView const& a, NameView const& b) {
+        return std::is_eq(compare(a.name, b.name));
+    }
+};
+
+/// A number (an unsigned one of 64 bits as the same bits), octets or a name that the snapshot
+/// behind them holds, or nothing: the value is not known.
+using Value = std::variant<std::monostate, std::int64_t, std::string_view, NameView>;
+
+inline bool isKnown(Value const& value) {
+    return !std::holds_alternative<std::monostate>(value);
+}
+
+} // namespace kvloamd

@@ -1,0 +1,291 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/readers/BoardInterfaces.h"
+
+#include <algorithm>
+#include <map>
+#include <set>
+#include <string>
+#include <utility>
+
+#include "agent/readers/Answers.h"
+#include "agent/readers/BoardFeatures.h"
+#include "agent/rows/BoardRow.h"
+#include "agent/rows/IndexKey.h"
+#include "board/DS1LineFeature.h"
+#include "board/EthernetFeature.h"
+#include "board/IPInterface.h"
+#include "board/ISDNFeature.h"
+#include "board/InterfaceFeature.h"
+
+namespace kvloamd {
+
+namespace {
+
+// IF-MIB's names of types.
+constexpr int kTypeLoopback = 24;
+constexpr int kTypeIsdn = 63;
+constexpr int kTypeDs0 = 81;
+constexpr int kTrue = 1;
+constexpr int kFalse = 2;
+
+/// What any DS0 carries.
+constexpr std::uint32_t kBearerSpeed = 64000;
+
+/// Of one signalling channel, whatever it says.
+constexpr int kMostBearers = 1024;
+
+/// Texts of the model have 256 bytes at most; a concrete class may answer longer ones.
+constexpr std::size_t kTextCapacity = 4096;
+
+template <class Asked>
+std::string text(Asked& asked, int (Asked::*query)(char*)) {
+    char answer[kTextCapacity];
+    answer[0] = '\0';
+    answer[kTextCapacity - 1] = '\0';
+    if ((asked.*query)(answer) == KVL::kNotSupported) return {};
+    return printable(answer);
+}
+
+/// A number that uses all 32 bits; one value of them says that it is not supported.
+std::optional<std::uint32_t> unsignedNumber(int answer) {
+    if (answer == KVL::kNotSupported) return std::nullopt;
+    return static_cast<std::uint32_t>(answer);
+}
+
+class Reading {
+  public:
+    Reading(ToTicks const& toTicks, LineHistories& histories)
+        : m_toTicks(toTicks), m_histories(histories) {}
+
+    void readLines(DS1LineFeature& feature);
+    void readChannels(ISDNFeature& feature);
+    void readEthernets(KVL::EthernetFeature& feature);
+    void readOthers(KVL::InterfaceFeature& feature);
+
+    BoardInterfaces take() { return std::move(m_found); }
+
+  private:
+    /// Enters an interface under a name that no other of its kind has. The row is good until the
+    /// next one is entered.
+    InterfaceRow& enter(IndexKind kind, std::string const& name);
+    /// An interface that has no name of its own is known by its place among those of its kind.
+    InterfaceRow& enterNameless(IndexKind kind);
+    void readInterface(KVL::Interface& interface, InterfaceRow& row) const;
+    void readLine(DS1LineDevice& line);
+    std::uint32_t readSignalling(ISDNDChannel& channel);
+    std::uint32_t readBearer(ISDNBChannel& channel);
+    void stack(std::uint32_t channel, std::uint32_t line);
+    /// The line that is called `name`, or whose circuit is; 0 when there is none.
+    std::uint32_t findLine(std::string const& name) const;
+
+    ToTicks const& m_toTicks;
+    LineHistories& m_histories;
+    BoardInterfaces m_found;
+    std::set<IndexKey> m_taken;
+    std::map<IndexKind, int> m_nameless;
+    std::map<std::string, std::uint32_t> m_lines; ///< by name and by circuit
+};
+
+InterfaceRow& Reading::enter(IndexKind kind, std::string const& name) {
+    IndexKey key{kind, name};
+    for (int copy = 2; !m_taken.insert(key).second; ++copy)
+        key.name = name + "#" + std::to_string(copy);
+    m_found.keys.push_back(std::move(key));
+    InterfaceRow& row = m_found.rows.interfaces.emplace_back();
+    row.ifIndex = static_cast<std::uint32_t>(m_found.keys.size());
+    return row;
+}
+
+InterfaceRow& Reading::enterNameless(IndexKind kind) {
+    return enter(kind, std::to_string(++m_nameless[kind]));
+}
+
+void Reading::readInterface(KVL::Interface& interface, InterfaceRow& row) const {
+    std::string description;
+    if (interface.GetDescription(description) != KVL::kNotSupported)
+        row.description = printable(description);
+    row.type = unlessNegative(interface.GetType());
+    row.mtu = unlessNegative(interface.GetMTU());
+    row.speed = unsignedNumber(interface.GetSpeed());
+    char address[kTextCapacity];
+    int length = 0;
+    if (interface.GetPhysAddress(address, length) == 0 && length > 0)
+        row.physAddress.assign(address, std::min(static_cast<std::size_t>(length), kLongestText));
+    row.adminStatus = unlessNegative(interface.GetAdminStatus());
+    row.operStatus = unlessNegative(interface.GetOperStatus());
+    int seconds = 0;
+    int microseconds = 0;
+    if (interface.GetLastChange(seconds, microseconds) != KVL::kNotSupported)
+        row.lastChange = m_toTicks(seconds);
+    row.counters = {
+        unsignedNumber(interface.GetInOctets()),        unsignedNumber(interface.GetInUcastPkts()),
+        unsignedNumber(interface.GetInDiscards()),      unsignedNumber(interface.GetInErrors()),
+        unsignedNumber(interface.GetInUnknownProtos()), unsignedNumber(interface.GetOutOctets()),
+        unsignedNumber(interface.GetOutUcastPkts()),    unsignedNumber(interface.GetOutDiscards()),
+        unsignedNumber(interface.GetOutErrors())};
+}
+
+void Reading::readLine(DS1LineDevice& line) {
+    std::string const name = text(line, &DS1LineDevice::GetName);
+    LineRow row;
+    row.circuitIdentifier = text(line, &DS1LineDevice::GetCircuitIdentifier);
+    InterfaceRow& interface = enter(IndexKind::Line, name);
+    readInterface(line, interface);
+    interface.name = name;
+    interface.alias = row.circuitIdentifier;
+    interface.connectorPresent = kTrue;
+    row.ifIndex = interface.ifIndex;
+    m_found.rows.ports.push_back({row.ifIndex, 0, m_found.keys.back()});
+    row.lineType = unlessNegative(line.GetLineType());
+    row.lineCoding = unlessNegative(line.GetLineCoding());
+    row.sendCode = unlessNegative(line.GetSendCode());
+    row.loopbackConfig = unlessNegative(line.GetLoopbackConfig());
+    row.lineStatus = unlessNegative(line.GetLineStatus());
+    row.signalMode = unlessNegative(line.GetSignalMode());
+    row.transmitClockSource = unlessNegative(line.GetTransmitClockSource());
+    row.fdl = unlessNegative(line.GetFdl());
+    row.lineLength = unlessNegative(line.GetLineLength());
+    if (long const change = line.GetLineStatusLastChange(); change >= 0)
+        row.statusLastChange = m_toTicks(change);
+    row.statusChangeTrapEnable = unlessNegative(line.GetLineStatusChangeTrapEnable());
+    row.loopbackStatus = unlessNegative(line.GetLoopbackStatus());
+    row.ds1ChannelNumber = unlessNegative(line.GetDs1ChannelNumber());
+    row.channelization = unlessNegative(line.GetChannelization());
+    row.lineMode = unlessNegative(line.GetLineMode());
+    row.lineBuildOut = unlessNegative(line.GetLineBuildOut());
+    auto const history = line.GetIntervalTable();
+    if (history.get() != nullptr) m_histories.read(history, row);
+    m_lines.emplace(name, row.ifIndex);
+    m_lines.emplace(row.circuitIdentifier, row.ifIndex);
+    m_found.rows.lines.push_back(std::move(row));
+}
+
+void Reading::readLines(DS1LineFeature& feature) {
+    for (auto line = feature.GetFirstDevice(); line.get() != nullptr;
+         line = feature.GetNextDevice(line)) {
+        readLine(*line.get());
+        m_found.lines.push_back(line);
+    }
+}
+
+std::uint32_t Reading::readSignalling(ISDNDChannel& channel) {
+    std::string const name = text(channel, &ISDNDChannel::GetName);
+    InterfaceRow& interface = enter(IndexKind::SignallingChannel, name);
+    SignallingRow row;
+    row.ifIndex = interface.ifIndex;
+    row.protocol = unlessNegative(channel.GetProtocol());
+    row.callingAddress = text(channel, &ISDNDChannel::GetCallingAddress);
+    row.bearerCount = unlessNegative(channel.GetBChannelCount());
+    if (int const status = channel.GetOperStatus(); status > 0) row.operStatus = status;
+    interface.description = "signalling channel " + name;
+    interface.name = name;
+    interface.type = kTypeIsdn;
+    interface.connectorPresent = kFalse;
+    if (row.operStatus)
+        interface.operStatus = *row.operStatus == ISDNDChannelStatusL2Active ? kUp : kDown;
+    m_found.rows.signalling.push_back(std::move(row));
+    return m_found.rows.signalling.back().ifIndex;
+}
+
+std::uint32_t Reading::readBearer(ISDNBChannel& channel) {
+    std::string const name = text(channel, &ISDNBChannel::GetName);
+    InterfaceRow& interface = enter(IndexKind::BearerChannel, name);
+    BearerRow row;
+    row.ifIndex = interface.ifIndex;
+    row.channelType = unlessNegative(channel.GetChannelType());
+    if (int const status = channel.GetOperStatus(); status > 0) row.operStatus = status;
+    row.channelNumber = unlessNegative(channel.GetChannelNumber());
+    interface.description = "bearer channel " + name;
+    interface.name = name;
+    interface.type = kTypeDs0;
+    interface.connectorPresent = kFalse;
+    interface.speed = kBearerSpeed;
+    if (row.operStatus)
+        interface.operStatus = *row.operStatus >= ISDNBChannelStatusConnected ? kUp : kDormant;
+    m_found.rows.bearers.push_back(row);
+    return row.ifIndex;
+}
+
+void Reading::readChannels(ISDNFeature& feature) {
+    std::vector<std::uint32_t> lineOfBearer;
+    for (auto channel = feature.GetFirstDChannel(); channel.get() != nullptr;
+         channel = feature.GetNextDChannel(channel)) {
+        std::uint32_t const index = readSignalling(*channel.get());
+        SignallingRow const& row = m_found.rows.signalling.back();
+        std::uint32_t const line = findLine(row.callingAddress);
+        stack(index, line);
+        int const bearers = std::min(row.bearerCount.value_or(0), kMostBearers);
+        lineOfBearer.insert(lineOfBearer.end(), static_cast<std::size_t>(bearers), line);
+    }
+    std::vector<std::uint32_t> bearers;
+    for (auto channel = feature.GetFirstBChannel(); channel.get() != nullptr;
+         channel = feature.GetNextBChannel(channel))
+        bearers.push_back(readBearer(*channel.get()));
+    // Bearer channels come in the order of the signalling channels that they belong to. Where the
+    // counts do not agree, nobody knows which is whose.
+    if (lineOfBearer.size() != bearers.size()) return;
+    for (std::size_t i = 0; i < bearers.size(); ++i)
+        stack(bearers[i], lineOfBearer[i]);
+}
+
+void Reading::stack(std::uint32_t channel, std::uint32_t line) {
+    if (line != 0) m_found.rows.stack.push_back({channel, line});
+}
+
+std::uint32_t Reading::findLine(std::string const& name) const {
+    auto const found = m_lines.find(name);
+    return name.empty() || found == m_lines.end() ? 0 : found->second;
+}
+
+void Reading::readEthernets(KVL::EthernetFeature& feature) {
+    for (auto handle = feature.GetFirstEthernet(); handle.get() != nullptr;
+         handle = feature.GetNextEthernet(handle)) {
+        KVL::Ethernet& ethernet = *handle.get();
+        InterfaceRow& interface = enterNameless(IndexKind::Ethernet);
+        readInterface(ethernet, interface);
+        interface.connectorPresent = interface.type == kTypeLoopback ? kFalse : kTrue;
+        m_found.rows.ports.push_back({interface.ifIndex, 0, m_found.keys.back()});
+        m_found.rows.ethernets.push_back({interface.ifIndex,
+                                          unsignedNumber(ethernet.GetAlignmentErrors()),
+                                          unsignedNumber(ethernet.GetFCSErrors()),
+                                          unsignedNumber(ethernet.GetSingleCollisionFrames()),
+                                          unsignedNumber(ethernet.GetMultipleCollisionFrames()),
+                                          unsignedNumber(ethernet.GetSQETestErrors()),
+                                          unsignedNumber(ethernet.GetDeferredTransmissions()),
+                                          unsignedNumber(ethernet.GetLateCollisions()),
+                                          unsignedNumber(ethernet.GetExcessiveCollisions()),
+                                          unsignedNumber(ethernet.GetInternalMacTransmitErrors()),
+                                          unsignedNumber(ethernet.GetCarrierSenseErrors()),
+                                          unsignedNumber(ethernet.GetFrameTooLongs()),
+                                          unsignedNumber(ethernet.GetInternalMacReceiveErrors()),
+                                          unsignedNumber(ethernet.GetSymbolErrors()),
+                                          unlessNegative(ethernet.GetDuplexStatus())});
+    }
+}
+
+void Reading::readOthers(KVL::InterfaceFeature& feature) {
+    // Lines are interfaces too, and have been read as lines.
+    if (dynamic_cast<DS1LineFeature*>(&feature) != nullptr) return;
+    for (auto handle = feature.GetFirstInterface(); handle.get() != nullptr;
+         handle = feature.GetNextInterface(handle)) {
+        bool const ip = dynamic_cast<KVL::IPInterface*>(handle.get()) != nullptr;
+        InterfaceRow& row = enterNameless(ip ? IndexKind::Ip : IndexKind::Other);
+        readInterface(*handle.get(), row);
+        if (ip) row.connectorPresent = kFalse;
+    }
+}
+
+} // namespace
+
+BoardInterfaces readInterfaces(Board& board, ToTicks const& toTicks, LineHistories& histories) {
+    Reading reading(toTicks, histories);
+    forEachFeature<DS1LineFeature>(board, [&](auto& feature) { reading.readLines(feature); });
+    forEachFeature<ISDNFeature>(board, [&](auto& feature) { reading.readChannels(feature); });
+    forEachFeature<KVL::EthernetFeature>(board,
+                                         [&](auto& feature) { reading.readEthernets(feature); });
+    forEachFeature<KVL::InterfaceFeature>(board,
+                                          [&](auto& feature) { reading.readOthers(feature); });
+    return reading.take();
+}
+
+} // namespace kvloamd

@@ -1,0 +1,38 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Makes physical entities of the boards, their processors and their ports.
+#pragma once
+
+#include <chrono>
+#include <cstdint>
+#include <memory>
+
+#include "agent/readers/EntityStates.h"
+#include "agent/readers/StableIndices.h"
+#include "agent/rows/EntityRows.h"
+#include "agent/rows/Snapshot.h"
+
+namespace kvloamd {
+
+/// There is one chassis. It contains a slot for every board that knows its slot, the slot contains
+/// the board; other boards are in the chassis. A board contains its processors and its ports.
+///
+/// Belongs to one thread.
+class EntityReader {
+  public:
+    /// `indices` outlive the reader. `started`: the agent's start. `now`: the time of day.
+    EntityReader(StableIndices& indices, Clock::time_point started, EntityStates::Now now);
+
+    /// The entities of what is in `snapshot` already.
+    EntityRows read(Snapshot const& snapshot);
+
+  private:
+    std::uint32_t sinceStart() const;
+
+    StableIndices& m_indices;
+    Clock::time_point m_started;
+    EntityStates m_states;
+    std::shared_ptr<PhysicalEntities const> m_physical; ///< null before the first reading
+    std::uint32_t m_lastChange = 0;
+};
+
+} // namespace kvloamd

@@ -1,0 +1,180 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/readers/EntityStates.h"
+
+#include <algorithm>
+#include <optional>
+#include <utility>
+
+#include "agent/readers/Answers.h"
+#include "board/Board.h"
+#include "board/DS1LineDevice.h"
+#include "board/ISDNChannel.h"
+
+namespace kvloamd {
+
+namespace {
+
+AdminState adminOf(std::optional<int> status) {
+    if (status == kUp) return AdminState::Unlocked;
+    return status == kDown ? AdminState::Locked : AdminState::Unknown;
+}
+
+OperState operOf(std::optional<int> status) {
+    switch (status.value_or(0)) {
+    case kUp:
+    case kDormant: // it waits for work
+        return OperState::Enabled;
+    case kDown:
+    case kNotPresent:
+    case kLowerLayerDown:
+        return OperState::Disabled;
+    case kTesting:
+        return OperState::Testing;
+    default:
+        return OperState::Unknown;
+    }
+}
+
+bool has(int lineStatus, unsigned bits) {
+    return (static_cast<unsigned>(lineStatus) & bits) != 0;
+}
+
+/// What a line sends is the echo of what it receives, and loopbacks and test codes are somebody's
+/// wish: neither is an alarm.
+unsigned alarmsOf(int lineStatus) {
+    unsigned alarms = 0;
+    if (has(lineStatus, DS1LineStatusLossOfSignal | DS1LineStatusLossOfFrame))
+        alarms |= kAlarmCritical;
+    if (has(lineStatus, DS1LineStatusRcvAIS | DS1LineStatusT16AIS | DS1LineStatusRcvPayloadAIS |
+                            DS1LineStatusUnavailSigState))
+        alarms |= kAlarmMajor;
+    if (has(lineStatus, DS1LineStatusRcvFarEndLOF | DS1LineStatusRcvFarEndLOMF))
+        alarms |= kAlarmMinor;
+    if (has(lineStatus, DS1LineStatusDs2PerfThreshold)) alarms |= kAlarmWarning;
+    if (has(lineStatus, DS1LineStatusOtherFailure | DS1LineStatusNetEquipOOS))
+        alarms |= kAlarmIndeterminate;
+    return alarms;
+}
+
+template <class Row>
+Row const* find(std::vector<Row> const& rows, std::uint32_t index) {
+    auto const found =
+        std::ranges::partition_point(rows, [&](Row const& row) { return row.index()[0] < index; });
+    return found == rows.end() || found->index()[0] != index ? nullptr : &*found;
+}
+
+} // namespace
+
+EntityState boardState(BoardRow const& board, bool hasFault) {
+    EntityState state;
+    // The platform tells no severity.
+    unsigned const faults = hasFault ? unsigned{kAlarmIndeterminate} : 0U;
+    state.alarm = static_cast<char>(faults);
+    if (board.secondaryStatus == BoardStatusFailed) {
+        // A failed board is a stopped one too, but nobody has locked it.
+        state.oper = OperState::Disabled;
+        state.alarm = static_cast<char>(faults | kAlarmCritical);
+        return state;
+    }
+    switch (board.status) {
+    case BoardStatusStarted:
+        state.admin = AdminState::Unlocked;
+        state.oper = OperState::Enabled;
+        state.standby = StandbyState::ProvidingService;
+        break;
+    case BoardStatusStartPending:
+        state.admin = AdminState::Unlocked;
+        state.oper = OperState::Disabled;
+        break;
+    case BoardStatusStopped:
+        state.admin = AdminState::Locked;
+        state.oper = OperState::Disabled;
+        break;
+    case BoardStatusStopPending:
+        // It works until it has stopped.
+        state.admin = AdminState::ShuttingDown;
+        state.oper = OperState::Enabled;
+        break;
+    default:
+        break;
+    }
+    return state;
+}
+
+EntityState portState(InterfaceRow const& interface, LineRow const* line, UsageState usage) {
+    EntityState state;
+    state.admin = adminOf(interface.adminStatus);
+    state.oper = operOf(interface.operStatus);
+    state.usage = usage;
+    // A status without any bit, not even that of no alarm, says nothing.
+    if (int const status = line == nullptr ? 0 : line->lineStatus.value_or(0); status > 0) {
+        unsigned const alarms = alarmsOf(status);
+        state.alarm = static_cast<char>(alarms);
+        if (state.oper == OperState::Unknown) {
+            if ((alarms & (kAlarmCritical | kAlarmMajor)) != 0)
+                state.oper = OperState::Disabled;
+            else if (status == DS1LineStatusNoAlarm)
+                state.oper = OperState::Enabled;
+        }
+    }
+    if (interface.operStatus == kUp) state.standby = StandbyState::ProvidingService;
+    return state;
+}
+
+std::map<std::uint32_t, UsageState> lineUsage(InterfaceRows const& interfaces) {
+    struct Bearers {
+        int all = 0;
+        int idle = 0;
+        int unknown = 0;
+    };
+    std::map<std::uint32_t, Bearers> lines;
+    for (StackRow const& row : interfaces.stack) {
+        BearerRow const* const bearer = find(interfaces.bearers, row.higher);
+        if (bearer == nullptr || row.lower == 0) continue;
+        Bearers& counted = lines[row.lower];
+        ++counted.all;
+        if (!bearer->operStatus)
+            ++counted.unknown;
+        else if (*bearer->operStatus == ISDNBChannelStatusIdle)
+            ++counted.idle;
+    }
+    std::map<std::uint32_t, UsageState> usage;
+    for (auto const& [line, bearers] : lines)
+        if (bearers.unknown == 0)
+            usage[line] = bearers.idle == bearers.all ? UsageState::Idle
+                          : bearers.idle == 0         ? UsageState::Busy
+                                                      : UsageState::Active;
+    return usage;
+}
+
+EntityStates::EntityStates(Now now) : m_now(std::move(now)), m_started(dateOctets(m_now())) {}
+
+std::vector<EntityStateRow> EntityStates::read(std::vector<PhysicalRow> const& entities,
+                                               std::vector<BoardRow> const& boards,
+                                               InterfaceRows const& interfaces,
+                                               std::vector<FaultRow> const& faults) {
+    std::map<std::uint32_t, UsageState> const usage = lineUsage(interfaces);
+    std::vector<EntityStateRow> rows;
+    std::string const now = m_read ? dateOctets(m_now()) : m_started;
+    for (PhysicalRow const& entity : entities) {
+        EntityState state;
+        if (BoardRow const* const board = find(boards, entity.boardIndex)) {
+            state = boardState(*board, find(faults, entity.boardIndex) != nullptr);
+        } else if (InterfaceRow const* const interface =
+                       find(interfaces.interfaces, entity.ifIndex)) {
+            auto const used = usage.find(entity.ifIndex);
+            state = portState(*interface, find(interfaces.lines, entity.ifIndex),
+                              used == usage.end() ? UsageState::Unknown : used->second);
+        } else {
+            continue;
+        }
+        EntityStateRow const* const former = find(m_former, entity.entity);
+        bool const same = former != nullptr && former->state == state;
+        rows.push_back({entity.entity, state, same ? former->changed : now});
+    }
+    m_former = rows;
+    m_read = true;
+    return rows;
+}
+
+} // namespace kvloamd

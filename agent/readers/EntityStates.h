@@ -1,0 +1,50 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The states of boards and ports in the words of ENTITY-STATE-MIB.
+#pragma once
+
+#include <functional>
+#include <map>
+#include <string>
+#include <vector>
+
+#include "agent/rows/BoardRow.h"
+#include "agent/rows/EntityRows.h"
+#include "agent/rows/FaultRow.h"
+#include "agent/rows/InterfaceRows.h"
+
+namespace kvloamd {
+
+/// What the board's status says of it, and whether it has a fault.
+EntityState boardState(BoardRow const& board, bool hasFault);
+
+/// What the interface's status, the line's alarms (`line` is null for an Ethernet interface) and
+/// the use of its channels say of a port.
+EntityState portState(InterfaceRow const& interface, LineRow const* line, UsageState usage);
+
+/// How far the bearer channels of every line are in use, by the line's ifIndex. Lines that nobody
+/// knows the channels of, or the state of one channel of, are left out.
+std::map<std::uint32_t, UsageState> lineUsage(InterfaceRows const& interfaces);
+
+/// Remembers since when every entity has been in its state. Belongs to one thread.
+class EntityStates {
+  public:
+    /// Seconds since the epoch.
+    using Now = std::function<long()>;
+
+    explicit EntityStates(Now now);
+
+    /// The states of those `entities` that have one: modules and ports. What is found in the first
+    /// reading has been as it is since the states were made.
+    std::vector<EntityStateRow> read(std::vector<PhysicalRow> const& entities,
+                                     std::vector<BoardRow> const& boards,
+                                     InterfaceRows const& interfaces,
+                                     std::vector<FaultRow> const& faults);
+
+  private:
+    Now m_now;
+    std::string m_started; ///< when, as `dateOctets`
+    bool m_read = false;
+    std::vector<EntityStateRow> m_former;
+};
+
+} // namespace kvloamd

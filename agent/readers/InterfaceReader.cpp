@@ -1,0 +1,160 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/readers/InterfaceReader.h"
+
+#include <algorithm>
+#include <functional>
+#include <iterator>
+#include <set>
+#include <utility>
+
+#include "agent/readers/BoardReader.h"
+#include "agent/readers/Courtesy.h"
+
+namespace kvloamd {
+
+namespace {
+
+// ifLinkUpDownTrapEnable's.
+constexpr int kEnabled = 1;
+constexpr int kDisabled = 2;
+
+/// Moves rows over, with their numbers on the board made indices; rows without one are left out.
+template <class Row>
+void moveRows(std::vector<Row>& all, std::vector<Row>& rows,
+              std::vector<std::uint32_t> const& indices) {
+    for (Row& row : rows) {
+        row.ifIndex = indices[row.ifIndex - 1];
+        if (row.ifIndex != 0) all.push_back(std::move(row));
+    }
+}
+
+/// Rows mostly come in order: boards do, and so do the indices that they were given.
+template <class Row, class Index = std::identity>
+void sortBy(std::vector<Row>& rows, Index index = {}) {
+    if (!std::ranges::is_sorted(rows, {}, index)) std::ranges::sort(rows, {}, index);
+}
+
+/// Each interface and what is below it, with nothing above the topmost and below the lowest.
+void completeStack(InterfaceRows& all) {
+    std::set<std::uint32_t> higher;
+    std::set<std::uint32_t> lower;
+    for (StackRow const& row : all.stack) {
+        higher.insert(row.higher);
+        lower.insert(row.lower);
+    }
+    for (InterfaceRow const& row : all.interfaces)
+        if (!lower.contains(row.ifIndex)) all.stack.push_back({0, row.ifIndex});
+    for (InterfaceRow& row : all.interfaces) {
+        bool const stacked = higher.contains(row.ifIndex);
+        if (!stacked) all.stack.push_back({row.ifIndex, 0});
+        // One broken line is told of once, not once more for each of its channels.
+        row.linkUpDownTraps = stacked ? kDisabled : kEnabled;
+    }
+    sortBy(all.stack);
+}
+
+} // namespace
+
+InterfaceReader::InterfaceReader(BoardManager& manager, StableIndices& indices,
+                                 Clock::time_point started)
+    : m_manager(manager), m_indices(indices), m_uptime(started) {}
+
+InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
+    InterfaceRows all;
+    // Hardly ever do interfaces come or go.
+    all.interfaces.reserve(m_formerIndices.size());
+    all.lines.reserve(m_formerLines);
+    all.stack.reserve(m_formerStack.size());
+    m_lines.clear();
+    ++m_reading;
+    m_histories.begin(Clock::now());
+    ToTicks const toTicks = [this](long seconds) { return m_uptime.of(seconds); };
+    std::vector<std::string> const names = keptNames(boards);
+    for (std::size_t i = 0; i < boards.size(); ++i) {
+        std::uint32_t const boardIndex = boards[i].boardIndex;
+        auto const board = m_manager.GetBoardByIndex(static_cast<int>(boardIndex));
+        Board* const asked = board.get();
+        if (asked == nullptr) continue;
+        BoardInterfaces found = readInterfaces(*asked, toTicks, m_histories);
+        auto const indices = m_indices.indicesOf(names[i], found.keys);
+        append(all, std::move(found), indices, boardIndex);
+        giveWay();
+    }
+    m_indices.save();
+    if (m_counted.size() > all.interfaces.size())
+        std::erase_if(m_counted,
+                      [this](auto const& entry) { return entry.second.reading != m_reading; });
+    sortBy(all.interfaces, &InterfaceRow::ifIndex);
+    sortBy(all.lines, &LineRow::ifIndex);
+    sortBy(all.bearers, &BearerRow::ifIndex);
+    sortBy(all.signalling, &SignallingRow::ifIndex);
+    sortBy(all.ethernets, &EthernetRow::ifIndex);
+    sortBy(all.ports, &PortRow::ifIndex);
+    completeStack(all);
+    std::size_t before = 0;
+    for (LineRow& line : all.lines) {
+        line.intervalsBefore = before;
+        before += line.closedIntervals();
+    }
+    noteChanges(all);
+    m_read = true;
+    return all;
+}
+
+void InterfaceReader::append(InterfaceRows& all, BoardInterfaces&& board,
+                             std::vector<std::uint32_t> const& indices, std::uint32_t boardIndex) {
+    auto const begin = std::ssize(all.interfaces);
+    moveRows(all.interfaces, board.rows.interfaces, indices);
+    std::for_each(all.interfaces.begin() + begin, all.interfaces.end(),
+                  [&](InterfaceRow& row) { countOn(row, boardIndex); });
+    for (std::size_t i = 0; i < board.lines.size(); ++i)
+        if (auto const index = indices[board.rows.lines[i].ifIndex - 1]; index != 0)
+            m_lines.push_back({index, std::move(board.lines[i])});
+    moveRows(all.lines, board.rows.lines, indices);
+    moveRows(all.bearers, board.rows.bearers, indices);
+    moveRows(all.signalling, board.rows.signalling, indices);
+    moveRows(all.ethernets, board.rows.ethernets, indices);
+    for (PortRow& port : board.rows.ports)
+        port.boardIndex = boardIndex;
+    moveRows(all.ports, board.rows.ports, indices);
+    for (StackRow const& row : board.rows.stack) {
+        StackRow const placed{indices[row.higher - 1], indices[row.lower - 1]};
+        if (placed.higher != 0 && placed.lower != 0) all.stack.push_back(placed);
+    }
+}
+
+void InterfaceReader::countOn(InterfaceRow& row, std::uint32_t boardIndex) {
+    auto const [place, isNew] = m_counted.try_emplace(row.ifIndex);
+    Counted& counted = place->second;
+    if (isNew || counted.boardIndex != boardIndex)
+        counted = {boardIndex, m_read ? m_uptime.now() : 0, row.counters, m_reading};
+    counted.reading = m_reading;
+    for (std::size_t i = 0; i < row.counters.size(); ++i) {
+        if (!row.counters[i]) continue;
+        if (!counted.counters[i]) {
+            counted.counters[i] = row.counters[i];
+            continue;
+        }
+        std::uint64_t& total = *counted.counters[i];
+        total += static_cast<std::uint32_t>(*row.counters[i] - total);
+        row.counters[i] = total;
+    }
+    row.discontinuity = counted.since;
+    row.boardIndex = boardIndex;
+}
+
+void InterfaceReader::noteChanges(InterfaceRows& all) {
+    std::vector<std::uint32_t> indices;
+    indices.reserve(all.interfaces.size());
+    for (InterfaceRow const& row : all.interfaces)
+        indices.push_back(row.ifIndex);
+    if (m_read && indices != m_formerIndices) m_lastChange = m_uptime.now();
+    if (m_read && all.stack != m_formerStack) m_stackLastChange = m_uptime.now();
+    m_formerIndices = std::move(indices);
+    m_formerStack = all.stack;
+    m_formerLines = all.lines.size();
+    all.lastChange = m_lastChange;
+    all.stackLastChange = m_stackLastChange;
+}
+
+} // namespace kvloamd

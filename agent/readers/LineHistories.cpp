@@ -1,0 +1,92 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/readers/LineHistories.h"
+
+#include <algorithm>
+
+#include "board/Interface.h"
+
+namespace kvloamd {
+
+namespace {
+
+/// When a table was not read for so long, the time elapsed does not tell whether it closed an
+/// interval.
+constexpr std::chrono::seconds kLongestGap{DS1IntervalTable::kIntervalLength / 2};
+
+/// How far into the running interval the newest closed one may still be corrected: what makes time
+/// unavailable shows after ten seconds of it.
+constexpr int kCorrected = 60;
+
+/// Interval `n`; 0 is the running one.
+LineCounts readInterval(DS1IntervalTable& table, int n) {
+    return {table.GetErrorSeconds(n),
+            table.GetSeverelyErrorSeconds(n),
+            table.GetSeverelyErrorFramingSeconds(n),
+            table.GetUnavailableSeconds(n),
+            table.GetControlledSlipSeconds(n),
+            table.GetPathCodingViolations(n),
+            table.GetLineErrorSeconds(n),
+            table.GetBurstyErrorSeconds(n),
+            table.GetDegradedMinutes(n),
+            table.GetLineCodeViolations(n)};
+}
+
+int closedOf(DS1IntervalTable& table) {
+    return std::clamp(table.GetValidIntervals(), 0, DS1IntervalTable::kIntervals);
+}
+
+std::shared_ptr<ClosedIntervals const> readClosed(DS1IntervalTable& table) {
+    auto closed = std::make_shared<ClosedIntervals>();
+    int const count = closedOf(table);
+    closed->counts.reserve(static_cast<std::size_t>(count));
+    for (int n = 1; n <= count; ++n)
+        closed->counts.push_back(readInterval(table, n));
+    for (LineCounts const& counts : closed->counts)
+        for (std::size_t counter = 0; counter < counts.size(); ++counter) {
+            std::int32_t& total = closed->total[counter];
+            // What one interval does not know, the sum does not.
+            if (counts[counter] < 0 || total < 0)
+                total = KVL::kNotSupported;
+            else
+                total += counts[counter];
+        }
+    return closed;
+}
+
+} // namespace
+
+void LineHistories::begin(Clock::time_point now) {
+    if (m_kept.size() > m_readSince)
+        std::erase_if(m_kept, [this](auto const& kept) { return kept.second.readAt != m_now; });
+    m_now = now;
+    m_readSince = 0;
+}
+
+void LineHistories::read(ReferenceCounter<DS1IntervalTable> const& handle, LineRow& row) {
+    DS1IntervalTable& table = *handle.get();
+    int const elapsed = table.GetTimeElapsed();
+    // The running interval lasts 900 seconds for the moment in which it is closed.
+    row.timeElapsed = std::clamp(elapsed, 0, DS1IntervalTable::kIntervalLength - 1);
+    row.running = readInterval(table, 0);
+    auto const [place, isNew] = m_kept.try_emplace(&table);
+    Kept& kept = place->second;
+    if (isNew) kept.table = handle;
+    if (isNew || !isUnchanged(kept, table, elapsed)) kept.closed = readClosed(table);
+    row.closed = kept.closed;
+    // An interval that was closed during the reading may be there in part.
+    kept.elapsed = table.GetTimeElapsed() < elapsed ? 0 : elapsed;
+    kept.readAt = m_now;
+    ++m_readSince;
+}
+
+bool LineHistories::isUnchanged(Kept const& kept, DS1IntervalTable& table, int elapsed) const {
+    // A table that is closing an interval, or does not tell the time, tells nothing either.
+    if (kept.elapsed <= 0 || elapsed < kept.elapsed || m_now - kept.readAt > kLongestGap)
+        return false;
+    auto const& counts = kept.closed->counts;
+    return counts.size() == static_cast<std::size_t>(closedOf(table)) &&
+           (counts.empty() || kept.elapsed > kCorrected ||
+            counts.front() == readInterval(table, 1));
+}
+
+} // namespace kvloamd

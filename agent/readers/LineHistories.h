@@ -1,0 +1,42 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Reads the histories of lines, and of a day of closed intervals only what can have changed.
+#pragma once
+
+#include <chrono>
+#include <memory>
+#include <unordered_map>
+
+#include "agent/rows/Clock.h"
+#include "agent/rows/InterfaceRows.h"
+#include "board/DS1IntervalTable.h"
+#include "core/ReferenceCounter.h"
+
+namespace kvloamd {
+
+/// A closed interval stays what it is, except that the newest one may still be corrected for a
+/// minute: so all are read when the table is new, when an interval has been closed and when the
+/// newest is another than before. Keeps a table until the second `begin` after it was read last.
+/// Not synchronised.
+class LineHistories {
+  public:
+    /// Begins to read all lines once more.
+    void begin(Clock::time_point now);
+    /// Fills what `row` tells of its line's intervals.
+    void read(ReferenceCounter<DS1IntervalTable> const& table, LineRow& row);
+
+  private:
+    struct Kept {
+        ReferenceCounter<DS1IntervalTable> table; ///< so that no other has its address
+        std::shared_ptr<ClosedIntervals const> closed;
+        int elapsed = 0; ///< 0: an interval may have been closed meanwhile
+        Clock::time_point readAt;
+    };
+
+    bool isUnchanged(Kept const& kept, DS1IntervalTable& table, int elapsed) const;
+
+    Clock::time_point m_now;
+    std::size_t m_readSince = 0; ///< tables, each once
+    std::unordered_map<DS1IntervalTable*, Kept> m_kept;
+};
+
+} // namespace kvloamd

@@ -1,0 +1,57 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// What the platform keeps of the boards, and when it is read again.
+#pragma once
+
+#include <chrono>
+#include <cstdint>
+#include <map>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "agent/rows/BoardRow.h"
+#include "agent/rows/PlatformRecords.h"
+
+namespace kvloamd {
+
+/// Reads the records of the boards in the board table: a board's when it comes, all when the last
+/// such reading is old. A board is found by its serial number.
+///
+/// While the device mapper does not answer, what it answered last stays; while the attribute store
+/// can not be read, there are no records of it. Each is logged when it begins and when it ends.
+///
+/// Belongs to one thread, the only one that uses the attribute store.
+class PlatformReader {
+  public:
+    /// The age at which all is read anew.
+    static constexpr std::chrono::milliseconds kMaxAge{10000};
+
+    explicit PlatformReader(std::chrono::milliseconds maxAge = kMaxAge) : m_maxAge(maxAge) {}
+
+    /// The records of `boards`, which are ascending by index.
+    std::shared_ptr<PlatformRecords const> read(std::vector<BoardRow> const& boards);
+
+  private:
+    struct BoardRecords {
+        std::string serialNumber;
+        DeviceRows objects;
+        std::optional<StoreRow> store;
+    };
+    using Wanted = std::vector<BoardRow const*>;
+
+    /// Whether anything has been taken out.
+    bool dropGoneBoards(std::vector<BoardRow> const& boards);
+    void readObjects(Wanted const& wanted);
+    void readStore(Wanted const& wanted);
+    std::shared_ptr<PlatformRecords const> joined() const;
+
+    std::chrono::milliseconds m_maxAge;
+    std::optional<std::chrono::steady_clock::time_point> m_allRead; ///< when
+    std::map<std::uint32_t, BoardRecords> m_boards;                 ///< by board index
+    std::shared_ptr<PlatformRecords const> m_records = std::make_shared<PlatformRecords>();
+    bool m_mapperAnswers = true;
+    bool m_storeReadable = true;
+};
+
+} // namespace kvloamd

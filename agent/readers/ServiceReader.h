@@ -1,0 +1,17 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Reads the modules and services of the service manager.
+#pragma once
+
+#include <vector>
+
+#include "agent/rows/ServiceRows.h"
+#include "services/ServiceManager.h"
+
+namespace kvloamd {
+
+/// Both ascending by index. Callable from any thread.
+std::vector<ModuleRow> readModules(ServiceManager& manager);
+std::vector<ServiceRow> readServices(ServiceManager& manager);
+PlatformService readPlatformService(ServiceManager& manager);
+
+} // namespace kvloamd

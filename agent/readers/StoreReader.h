@@ -1,0 +1,26 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Reads the records of boards in the attribute store.
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string>
+
+#include "access/QSBBoard.h"
+#include "agent/rows/StoreRow.h"
+
+namespace kvloamd {
+
+/// The attribute store, open while this lives. All of them belong to one thread.
+class StoreReading {
+  public:
+    /// Whether the store can be read: it is open and has a family of boards.
+    bool good();
+    /// The board's record; nothing when there is none.
+    std::optional<StoreRow> read(std::string const& serialNumber, std::uint32_t boardIndex);
+
+  private:
+    QSBAccessor m_accessor;
+};
+
+} // namespace kvloamd

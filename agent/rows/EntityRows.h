@@ -1,0 +1,107 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The physical entities and their states as the agent tells of them.
+#pragma once
+
+#include <array>
+#include <cstdint>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "agent/rows/Oid.h"
+
+namespace kvloamd {
+
+/// ENTITY-MIB's PhysicalClass, as far as there are such entities.
+enum class PhysicalClass : int { Chassis = 3, Container = 5, Module = 9, Port = 10, Cpu = 12 };
+
+/// Texts are empty when they are not known, which is how ENTITY-MIB says so.
+struct PhysicalRow {
+    std::uint32_t entity = 0;
+    std::uint32_t containedIn = 0; ///< 0: in nothing
+    PhysicalClass physicalClass = PhysicalClass::Chassis;
+    int position = -1; ///< among those of its class in the same container; -1: not known
+    std::string description;
+    std::string name;
+    std::string firmware;
+    std::string software;
+    std::string serialNumber;
+    std::string model;
+    bool replaceable = false;
+    // Where its state comes from.
+    std::uint32_t boardIndex = 0; ///< of a module
+    std::uint32_t ifIndex = 0;    ///< of a port
+
+    std::array<std::uint32_t, 1> index() const { return {entity}; }
+    bool operator==(PhysicalRow const&) const = default;
+};
+
+/// One entity directly in another.
+struct ContainsRow {
+    std::uint32_t container = 0;
+    std::uint32_t child = 0;
+
+    std::array<std::uint32_t, 2> index() const { return {container, child}; }
+    auto operator<=>(ContainsRow const&) const = default;
+};
+
+/// A port, and the interface that it is.
+struct AliasRow {
+    std::uint32_t entity = 0;
+    Oid interface; ///< absolute: its ifIndex in ifTable
+
+    std::array<std::uint32_t, 2> index() const { return {entity, 0}; }
+    bool operator==(AliasRow const&) const = default;
+};
+
+/// What seldom changes. All ascending by index.
+struct PhysicalEntities {
+    std::vector<PhysicalRow> entities;
+    std::vector<ContainsRow> contains;
+    std::vector<AliasRow> aliases;
+
+    bool operator==(PhysicalEntities const&) const = default;
+};
+
+// ENTITY-STATE-MIB's states, in its numbers.
+enum class AdminState : int { Unknown = 1, Locked = 2, ShuttingDown = 3, Unlocked = 4 };
+enum class OperState : int { Unknown = 1, Disabled = 2, Enabled = 3, Testing = 4 };
+enum class UsageState : int { Unknown = 1, Idle = 2, Active = 3, Busy = 4 };
+enum class StandbyState : int { Unknown = 1, ProvidingService = 4 };
+
+/// Alarms are a set, the first bit is the highest; none: nothing is wrong.
+enum AlarmBits : unsigned {
+    kAlarmUnknown = 0x80, ///< whether there is an alarm can not be told
+    kAlarmCritical = 0x20,
+    kAlarmMajor = 0x10,
+    kAlarmMinor = 0x08,
+    kAlarmWarning = 0x04,
+    kAlarmIndeterminate = 0x02
+};
+
+struct EntityState {
+    AdminState admin = AdminState::Unknown;
+    OperState oper = OperState::Unknown;
+    UsageState usage = UsageState::Unknown;
+    char alarm = static_cast<char>(kAlarmUnknown); ///< of `AlarmBits`
+    StandbyState standby = StandbyState::Unknown;
+
+    bool operator==(EntityState const&) const = default;
+};
+
+struct EntityStateRow {
+    std::uint32_t entity = 0;
+    EntityState state;
+    std::string changed; ///< when, as `dateOctets`
+
+    std::array<std::uint32_t, 1> index() const { return {entity}; }
+};
+
+struct EntityRows {
+    std::shared_ptr<PhysicalEntities const> physical =
+        std::make_shared<PhysicalEntities>(); ///< set
+    std::vector<EntityStateRow> states;
+    std::uint32_t lastChange = 0; ///< of `physical`: hundredths of a second since the agent's start
+};
+
+} // namespace kvloamd

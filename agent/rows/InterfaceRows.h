@@ -1,0 +1,176 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The boards' lines, channels and interfaces as the agent tells of them.
+#pragma once
+
+#include <array>
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "agent/rows/IndexKey.h"
+
+namespace kvloamd {
+
+/// IF-MIB's ifOperStatus; the first three are ifAdminStatus's too.
+enum InterfaceStatus : int {
+    kUp = 1,
+    kDown = 2,
+    kTesting = 3,
+    kUnknownStatus = 4,
+    kDormant = 5,
+    kNotPresent = 6,
+    kLowerLayerDown = 7
+};
+
+/// The counters of an interface, in the order of IF-MIB's ifTable.
+enum InterfaceCounter : std::size_t {
+    kInOctets,
+    kInUcastPkts,
+    kInDiscards,
+    kInErrors,
+    kInUnknownProtos,
+    kOutOctets,
+    kOutUcastPkts,
+    kOutDiscards,
+    kOutErrors,
+    kInterfaceCounters ///< how many
+};
+
+/// Texts are empty and numbers none when they are not known. Every kind of interface has a row of
+/// this one; what only its kind has is in another, of the same index.
+struct InterfaceRow {
+    std::uint32_t ifIndex = 0;
+    std::uint32_t boardIndex = 0;
+    std::string description;
+    std::string name;
+    std::string alias;
+    std::optional<int> type;
+    std::optional<int> mtu;
+    std::optional<std::uint32_t> speed; ///< bit/s
+    std::string physAddress;
+    std::optional<int> adminStatus;
+    std::optional<int> operStatus;
+    std::optional<std::uint32_t> lastChange; ///< hundredths of a second since the agent's start
+    /// The low 32 bits are the interface's own; the rest counts how often they have wrapped.
+    std::array<std::optional<std::uint64_t>, kInterfaceCounters> counters;
+    /// Since when the counters have counted on, as `lastChange`; 0: since the agent's start.
+    std::uint32_t discontinuity = 0;
+    std::optional<int> connectorPresent; ///< 1: yes, 2: no
+    /// Whether it is told when the link goes up or down, unless that has been set: 1 enabled, 2
+    /// disabled.
+    int linkUpDownTraps = 1;
+
+    std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
+};
+
+/// One interface above another; 0 is none.
+struct StackRow {
+    std::uint32_t higher = 0;
+    std::uint32_t lower = 0;
+
+    std::array<std::uint32_t, 2> index() const { return {higher, lower}; }
+    auto operator<=>(StackRow const&) const = default;
+};
+
+/// The counters of a line's interval, in the order of DS1-MIB's tables; negative: not known.
+using LineCounts = std::array<std::int32_t, 10>;
+
+/// Never changed once a row has them: snapshots share them.
+struct ClosedIntervals {
+    std::vector<LineCounts> counts; ///< from the newest
+    LineCounts total{};             ///< of all of them
+};
+
+struct LineRow {
+    std::uint32_t ifIndex = 0;
+    std::optional<int> lineType;
+    std::optional<int> lineCoding;
+    std::optional<int> sendCode;
+    std::string circuitIdentifier;
+    std::optional<int> loopbackConfig;
+    std::optional<int> lineStatus;
+    std::optional<int> signalMode;
+    std::optional<int> transmitClockSource;
+    std::optional<int> fdl;
+    std::optional<int> lineLength;
+    std::optional<std::uint32_t> statusLastChange; ///< as `InterfaceRow::lastChange`
+    std::optional<int> statusChangeTrapEnable;
+    std::optional<int> loopbackStatus;
+    std::optional<int> ds1ChannelNumber;
+    std::optional<int> channelization;
+    std::optional<int> lineMode;
+    std::optional<int> lineBuildOut;
+
+    std::optional<int> timeElapsed;                ///< of the running interval, in seconds
+    LineCounts running{};                          ///< good when the line keeps a history
+    std::shared_ptr<ClosedIntervals const> closed; ///< none: the line keeps no history
+    std::size_t intervalsBefore = 0;               ///< closed ones of all lines before this one
+
+    bool keepsHistory() const { return closed != nullptr; }
+    std::size_t closedIntervals() const { return keepsHistory() ? closed->counts.size() : 0; }
+    std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
+};
+
+struct BearerRow {
+    std::uint32_t ifIndex = 0;
+    std::optional<int> channelType;
+    std::optional<int> operStatus;
+    std::optional<int> channelNumber;
+
+    std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
+};
+
+struct SignallingRow {
+    std::uint32_t ifIndex = 0;
+    std::optional<int> protocol;
+    std::string callingAddress;
+    std::optional<int> bearerCount;
+    std::optional<int> operStatus;
+
+    std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
+};
+
+struct EthernetRow {
+    std::uint32_t ifIndex = 0;
+    std::optional<std::uint32_t> alignmentErrors;
+    std::optional<std::uint32_t> fcsErrors;
+    std::optional<std::uint32_t> singleCollisionFrames;
+    std::optional<std::uint32_t> multipleCollisionFrames;
+    std::optional<std::uint32_t> sqeTestErrors;
+    std::optional<std::uint32_t> deferredTransmissions;
+    std::optional<std::uint32_t> lateCollisions;
+    std::optional<std::uint32_t> excessiveCollisions;
+    std::optional<std::uint32_t> internalMacTransmitErrors;
+    std::optional<std::uint32_t> carrierSenseErrors;
+    std::optional<std::uint32_t> frameTooLongs;
+    std::optional<std::uint32_t> internalMacReceiveErrors;
+    std::optional<std::uint32_t> symbolErrors;
+    std::optional<int> duplexStatus;
+
+    std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
+};
+
+/// A line or an Ethernet interface: where a board has a cable.
+struct PortRow {
+    std::uint32_t ifIndex = 0;
+    std::uint32_t boardIndex = 0;
+    IndexKey key; ///< on its board
+};
+
+/// All ascending by index.
+struct InterfaceRows {
+    std::vector<InterfaceRow> interfaces;
+    std::vector<StackRow> stack;
+    std::vector<LineRow> lines;
+    std::vector<BearerRow> bearers;
+    std::vector<SignallingRow> signalling;
+    std::vector<EthernetRow> ethernets;
+    std::vector<PortRow> ports;
+    // When interfaces last came or went: hundredths of a second since the agent's start.
+    std::uint32_t lastChange = 0;
+    std::uint32_t stackLastChange = 0;
+};
+
+} // namespace kvloamd

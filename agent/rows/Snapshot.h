@@ -1,0 +1,56 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// What the agent answers from: all rows as they were at one time, and its own running counts.
+#pragma once
+
+#include <chrono>
+#include <cstdint>
+#include <memory>
+#include <vector>
+
+#include "agent/rows/BoardRow.h"
+#include "agent/rows/Clock.h"
+#include "agent/rows/Counters.h"
+#include "agent/rows/EntityRows.h"
+#include "agent/rows/FaultRow.h"
+#include "agent/rows/InterfaceRows.h"
+#include "agent/rows/PlatformRecords.h"
+#include "agent/rows/ProcessRow.h"
+#include "agent/rows/ResourceRow.h"
+#include "agent/rows/ServiceRows.h"
+#include "agent/rows/Settings.h"
+
+namespace kvloamd {
+
+/// Never changed once it is published; shared by whoever answers from it.
+struct Snapshot {
+    std::vector<BoardRow> boards; ///< ascending by index, as all rows
+    std::vector<ModuleRow> modules;
+    std::vector<ServiceRow> services;
+    PlatformService platformService;
+    std::vector<ProcessRow> processes;
+    std::vector<ResourceRow> resources;
+    Faults faults;
+    std::shared_ptr<PlatformRecords const> records = std::make_shared<PlatformRecords>(); ///< set
+    InterfaceRows interfaces;
+    EntityRows entities;
+    Clock::time_point begun;                  ///< when reading began: what happened before is in it
+    std::uint32_t number = 1;                 ///< how many have been made, this one included
+    std::chrono::milliseconds refreshTime{0}; ///< how long reading took
+    std::chrono::milliseconds longestRefreshTime{0}; ///< the longest so far
+    std::uint32_t lastChange = 0; ///< of the boards: hundredths of a second since the agent's start
+};
+
+/// The rows of one kind among the platform's records.
+template <auto Rows>
+auto const& recorded(Snapshot const& snapshot) {
+    return (*snapshot.records).*Rows;
+}
+
+/// What one request is answered from.
+struct Facts {
+    Snapshot const& snapshot;
+    Counters const& counters;
+    Settings const* settings = nullptr; ///< come before what the snapshot says; null: none
+};
+
+} // namespace kvloamd

@@ -1,0 +1,196 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/daemon/Options.h"
+
+#include <unistd.h>
+
+#include <cstdlib>
+#include <fstream>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace kvloamd {
+namespace {
+
+using ::testing::ElementsAre;
+using ::testing::HasSubstr;
+using ::testing::IsEmpty;
+using ::testing::Not;
+
+class OptionsTest : public ::testing::Test {
+  protected:
+    OptionsTest() { unsetenv("KVLOAM_MODULE_DIR"); }
+    ~OptionsTest() override { unlink(m_file.c_str()); }
+
+    static std::variant<Options, Exit> parse(std::vector<char const*> arguments) {
+        arguments.insert(arguments.begin(), "kvloamd");
+        return parseOptions(static_cast<int>(arguments.size()), arguments.data());
+    }
+    static Options options(std::vector<char const*> const& arguments) {
+        return std::get<Options>(parse(arguments));
+    }
+    static Exit refusal(std::vector<char const*> const& arguments) {
+        return std::get<Exit>(parse(arguments));
+    }
+    /// Writes the configuration file; returns its name.
+    char const* file(std::string const& text) {
+        std::ofstream(m_file) << text;
+        return m_file.c_str();
+    }
+
+    std::string const m_file =
+        ::testing::TempDir() + "kvloamd-options-" + std::to_string(getpid()) + ".toml";
+};
+
+TEST_F(OptionsTest, DefaultListensOnLoopbackOnly) {
+    EXPECT_THAT(options({}).listen, ElementsAre("udp:127.0.0.1:1161"));
+}
+
+TEST_F(OptionsTest, PortIsOneOfTheLoopbackAddress) {
+    EXPECT_THAT(options({"--port", "4711"}).listen, ElementsAre("udp:127.0.0.1:4711"));
+}
+
+TEST_F(OptionsTest, ListenReplacesTheDefaultAndRepeats) {
+    EXPECT_THAT(options({"--listen", "udp:127.0.0.1:1", "--listen", "tcp:127.0.0.1:2"}).listen,
+                ElementsAre("udp:127.0.0.1:1", "tcp:127.0.0.1:2"));
+}
+
+TEST_F(OptionsTest, EmptyAddressIsRefused) {
+    EXPECT_EQ(refusal({"--listen", ""}).status, kExitUsage);
+}
+
+TEST_F(OptionsTest, PortAndListenExcludeEachOther) {
+    EXPECT_EQ(refusal({"--port", "4711", "--listen", "udp:127.0.0.1:1"}).status, kExitUsage);
+}
+
+TEST_F(OptionsTest, PortOutOfRangeIsRefused) {
+    Exit const exit = refusal({"--port", "65536"});
+    EXPECT_EQ(exit.status, kExitUsage);
+    EXPECT_THAT(exit.text, HasSubstr("65536"));
+}
+
+TEST_F(OptionsTest, AgentStandsAloneUnlessAskedOtherwise) {
+    EXPECT_EQ(options({}).agentx, "");
+}
+
+TEST_F(OptionsTest, MasterIsWhereMastersAreUnlessAnAddressIsGiven) {
+    EXPECT_EQ(options({"--agentx"}).agentx, "/var/agentx/master");
+    EXPECT_EQ(options({"--agentx", "--module", "a"}).agentx, "/var/agentx/master");
+    EXPECT_EQ(options({"--agentx", "tcp:127.0.0.1:705"}).agentx, "tcp:127.0.0.1:705");
+}
+
+TEST_F(OptionsTest, FileNamesTheMasterToo) {
+    EXPECT_EQ(options({"--config", file("agentx=\"unix:/run/master\"\n")}).agentx,
+              "unix:/run/master");
+}
+
+TEST_F(OptionsTest, MasterThatIsNoAddressIsRefused) {
+    Exit const exit = refusal({"--agentx", "here"});
+    EXPECT_EQ(exit.status, kExitUsage);
+    EXPECT_THAT(exit.text, HasSubstr("'here' is no address; write it as unix:"));
+}
+
+TEST_F(OptionsTest, MasterAndWhatIsTheMastersOwnExcludeEachOther) {
+    EXPECT_THAT(refusal({"--agentx", "--port", "4711"}).text, HasSubstr("excludes --port"));
+    EXPECT_THAT(refusal({"--agentx", "--listen", "udp:127.0.0.1:1"}).text,
+                HasSubstr("excludes --port and --listen"));
+    EXPECT_THAT(refusal({"--agentx", "--snmp-config", "file"}).text,
+                HasSubstr("excludes --snmp-config"));
+    EXPECT_EQ(refusal({"--agentx", "--port", "4711"}).status, kExitUsage);
+}
+
+TEST_F(OptionsTest, ModulesRepeat) {
+    EXPECT_THAT(options({"--module", "a", "--module", "b"}).modules, ElementsAre("a", "b"));
+}
+
+TEST_F(OptionsTest, ModuleDirectoryComesFromTheEnvironment) {
+    setenv("KVLOAM_MODULE_DIR", "/somewhere", 1);
+    EXPECT_EQ(options({}).moduleDirectory, "/somewhere");
+}
+
+TEST_F(OptionsTest, ModuleDirectoryOptionWinsOverTheEnvironment) {
+    setenv("KVLOAM_MODULE_DIR", "/somewhere", 1);
+    EXPECT_EQ(options({"--module-dir", "/elsewhere"}).moduleDirectory, "/elsewhere");
+}
+
+TEST_F(OptionsTest, UnknownOptionIsNamedInOneLine) {
+    Exit const exit = refusal({"--prot", "4711"});
+    EXPECT_EQ(exit.status, kExitUsage);
+    EXPECT_THAT(exit.text, HasSubstr("--prot"));
+    EXPECT_THAT(exit.text, Not(HasSubstr("\n")));
+}
+
+TEST_F(OptionsTest, EnterpriseArcIsRead) {
+    EXPECT_EQ(options({"--enterprise-oid", ".1.3.6.1.4.1.99"}).enterprise,
+              (Oid{1, 3, 6, 1, 4, 1, 99}));
+}
+
+TEST_F(OptionsTest, EnterpriseArcThatIsNoNameIsRefused) {
+    for (char const* const text :
+         {"", "1", "1.3.", "1..3", "a.b", "1.3.x", "3.1", "1.40", "1.3.4294967296", "-1.3"}) {
+        EXPECT_FALSE(parseOid(text).has_value()) << text;
+        EXPECT_EQ(refusal({"--enterprise-oid", text}).status, kExitUsage) << text;
+    }
+}
+
+TEST_F(OptionsTest, InterfaceBaseIsRead) {
+    EXPECT_EQ(options({}).interfaceBase, 1000U);
+    EXPECT_EQ(options({"--interface-base", "1"}).interfaceBase, 1U);
+}
+
+TEST_F(OptionsTest, InterfaceBaseOutOfRangeIsRefused) {
+    for (char const* const base : {"0", "-1", "1000000001", "many"})
+        EXPECT_EQ(refusal({"--interface-base", base}).status, kExitUsage) << base;
+}
+
+TEST_F(OptionsTest, LogLevelIsRead) {
+    EXPECT_EQ(options({"--log-level", "debug"}).logLevel, LogLevel::Debug);
+}
+
+TEST_F(OptionsTest, UnknownLogLevelIsRefused) {
+    EXPECT_EQ(refusal({"--log-level", "loud"}).status, kExitUsage);
+}
+
+TEST_F(OptionsTest, FileSetsOptions) {
+    Options const read =
+        options({"--config", file("port=4711\nmodule=[\"a\", \"b\"]\nlog-level=\"error\"\n")});
+    EXPECT_THAT(read.listen, ElementsAre("udp:127.0.0.1:4711"));
+    EXPECT_THAT(read.modules, ElementsAre("a", "b"));
+    EXPECT_EQ(read.logLevel, LogLevel::Error);
+}
+
+TEST_F(OptionsTest, CommandLineWinsOverTheFile) {
+    EXPECT_THAT(options({"--config", file("port=4711\n"), "--port", "4712"}).listen,
+                ElementsAre("udp:127.0.0.1:4712"));
+}
+
+TEST_F(OptionsTest, UnknownKeyInTheFileIsNamed) {
+    Exit const exit = refusal({"--config", file("prot=4711\n")});
+    EXPECT_EQ(exit.status, kExitFailure);
+    EXPECT_THAT(exit.text, HasSubstr("prot"));
+}
+
+TEST_F(OptionsTest, FileThatIsNotThereIsNamed) {
+    Exit const exit = refusal({"--config", "/nowhere/kvloamd.toml"});
+    EXPECT_EQ(exit.status, kExitFailure);
+    EXPECT_THAT(exit.text, HasSubstr("/nowhere/kvloamd.toml"));
+}
+
+TEST_F(OptionsTest, HelpNamesEveryOption) {
+    Exit const exit = refusal({"--help"});
+    EXPECT_EQ(exit.status, 0);
+    for (char const* const option :
+         {"--port", "--listen", "--module", "--module-dir", "--config", "--snmp-config",
+          "--persistent-dir", "--enterprise-oid", "--check-config", "--version", "--log-level"})
+        EXPECT_THAT(exit.text, HasSubstr(option));
+}
+
+TEST_F(OptionsTest, VersionNamesAgentAndLibrary) {
+    Exit const exit = refusal({"--version"});
+    EXPECT_EQ(exit.status, 0);
+    EXPECT_THAT(exit.text, HasSubstr("kvloamd 0."));
+    EXPECT_THAT(exit.text, HasSubstr("VQcid 01010000-164 OAM"));
+}
+
+} // namespace
+} // namespace kvloamd

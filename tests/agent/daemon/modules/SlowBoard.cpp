@@ -1,0 +1,41 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// A board module whose one board answers once, and from then on never: a platform that hangs. It
+// says so by making the file that the environment's SLOW_BOARD_MARK names.
+#include <unistd.h>
+
+#include <cstdlib>
+#include <fstream>
+
+#include "board/BoardModule.h"
+#include "tests/support/FakeBoards.h"
+
+namespace {
+
+class SlowFactory final : public BoardFactory {
+  public:
+    int Initialize(ReferenceCounter<BoardTable> table) override {
+        auto* const board = new FakeBoard;
+        ReferenceCounter<Board> const handle(board);
+        board->whenAsked = [asked = false]() mutable {
+            if (asked) hang();
+            asked = true;
+        };
+        enter_at_next_index(*table.get(), handle);
+        return 0;
+    }
+    int AttachBoardTable(ReferenceCounter<BoardTable>) override { return 0; }
+
+  private:
+    [[noreturn]] static void hang() {
+        if (char const* const mark = std::getenv("SLOW_BOARD_MARK"); mark != nullptr)
+            std::ofstream(mark) << "hanging\n";
+        for (;;)
+            pause();
+    }
+};
+
+} // namespace
+
+extern "C" BoardFactory* kvl_create_board_factory(int) {
+    return new SlowFactory;
+}

@@ -1,0 +1,217 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/notifications/LineListener.h"
+
+#include <chrono>
+#include <string>
+
+#include <gtest/gtest.h>
+
+#include "agent/readers/BoardSource.h"
+#include "agent/readers/InterfaceReader.h"
+#include "tests/support/FakeBoards.h"
+#include "tests/support/FakeLines.h"
+
+namespace kvloamd {
+namespace {
+
+long secondsNow() {
+    return std::chrono::duration_cast<std::chrono::seconds>(
+               std::chrono::system_clock::now().time_since_epoch())
+        .count();
+}
+
+/// Boards with a line each, and a listener that is never taken out of their features.
+class LineListenerTest : public ::testing::Test {
+  protected:
+    struct LineOfBoard {
+        ReferenceCounter<Board> board;
+        FakeLine* line;
+        FakeLineFeature* feature;
+    };
+
+    LineOfBoard insert(std::string const& serialNumber) {
+        auto const board = m_chassis.insert(serialNumber);
+        auto* const line = new FakeLine("line-" + serialNumber, "");
+        line->trapEnable = 1;
+        auto* const feature = new FakeLineFeature({line});
+        board->AddFeature(ReferenceCounter<Feature>(feature));
+        return {board, line, feature};
+    }
+    static void change(LineOfBoard const& of, DS1LineStatusEnum status) {
+        of.feature->NotifyLineStatusListeners(of.feature->GetFirstDevice(), status);
+    }
+    /// As the agent reads; `meanwhile` happens when the listener listens, before lines are placed.
+    void read(std::function<void()> const& meanwhile = [] {}) {
+        auto const boards = m_source.read();
+        m_listener.listen(boards, m_reader.uptime());
+        m_reader.read(boards);
+        meanwhile();
+        auto const lines = m_reader.takeLines();
+        m_listener.place(lines);
+        handOn(m_settings, lines);
+    }
+    /// What has been told since the last time: "1000:64 " for each.
+    std::string told() {
+        std::string all;
+        while (auto const notification = m_queue.pop())
+            all += std::to_string(notification->objects.at(0).name.back()) + ":" +
+                   std::to_string(std::get<std::int64_t>(notification->objects.at(0).value)) + " ";
+        return all;
+    }
+
+    FakeChassis m_chassis;
+    BoardSource m_source{*m_chassis.manager.get()};
+    StableIndices m_indices{"", 1000, "interfaces"};
+    InterfaceReader m_reader{*m_chassis.manager.get(), m_indices,
+                             Clock::now() - std::chrono::hours(1)};
+    Settings m_settings;
+    Counters m_counters;
+    NotificationQueue m_queue{m_counters};
+    LineListener m_listener{*m_chassis.manager.get(), m_settings, m_queue, m_counters};
+};
+
+TEST_F(LineListenerTest, EveryChangeIsToldUnderTheLinesIndexInOrder) {
+    auto const a = insert("A");
+    auto const b = insert("B");
+    read();
+    change(b, DS1LineStatusLossOfSignal);
+    change(a, DS1LineStatusLossOfFrame);
+    change(b, DS1LineStatusNoAlarm);
+    EXPECT_EQ(told(), "1016:64 1000:32 1016:1 ");
+}
+
+TEST_F(LineListenerTest, NotificationCarriesStatusAndTimeOfChange) {
+    auto const a = insert("A");
+    read();
+    long const changed = secondsNow() - 60;
+    a.line->statusLastChange = changed;
+    auto const before = Clock::now();
+    change(a, DS1LineStatusLossOfSignal);
+    auto const told = m_queue.pop();
+    ASSERT_TRUE(told);
+    EXPECT_GE(told->when, before);
+    EXPECT_EQ(told->name, (Oid{1, 3, 6, 1, 2, 1, 10, 18, 15, 0, 1}));
+    ASSERT_EQ(told->objects.size(), 2U);
+    EXPECT_EQ(told->objects[0].name, (Oid{1, 3, 6, 1, 2, 1, 10, 18, 6, 1, 10, 1000}));
+    EXPECT_EQ(told->objects[0].type, ValueType::Integer);
+    EXPECT_EQ(std::get<std::int64_t>(told->objects[0].value), 64);
+    EXPECT_EQ(told->objects[1].name, (Oid{1, 3, 6, 1, 2, 1, 10, 18, 6, 1, 16, 1000}));
+    EXPECT_EQ(told->objects[1].type, ValueType::TimeTicks);
+    EXPECT_EQ(std::get<std::int64_t>(told->objects[1].value), m_reader.uptime().of(changed));
+}
+
+TEST_F(LineListenerTest, LineThatDoesNotKnowWhenItChangedHasChangedNow) {
+    auto const a = insert("A");
+    read();
+    auto const before = m_reader.uptime().now();
+    change(a, DS1LineStatusLossOfSignal);
+    auto const told = m_queue.pop();
+    ASSERT_TRUE(told);
+    EXPECT_GE(std::get<std::int64_t>(told->objects.at(1).value), before);
+}
+
+TEST_F(LineListenerTest, LineForWhichItIsNotEnabledIsNotTold) {
+    auto const a = insert("A");
+    for (int const enable : {2, KVL::kNotSupported}) {
+        a.line->trapEnable = enable;
+        read();
+        change(a, DS1LineStatusLossOfSignal);
+        EXPECT_EQ(told(), "") << enable;
+    }
+}
+
+TEST_F(LineListenerTest, WhatIsSetCountsAtOnceWhateverTheLineSays) {
+    auto const a = insert("A");
+    read();
+    m_settings.exchange({Setting::LineStatusChangeTraps, 1000}, 2);
+    change(a, DS1LineStatusLossOfSignal);
+    EXPECT_EQ(told(), "");
+    a.line->trapEnable = 2;
+    m_settings.exchange({Setting::LineStatusChangeTraps, 1000}, 1);
+    change(a, DS1LineStatusNoAlarm);
+    EXPECT_EQ(told(), "1000:1 ");
+}
+
+TEST_F(LineListenerTest, WhatIsSetIsHandedToTheLineAtTheNextReading) {
+    auto const a = insert("A");
+    auto const b = insert("B");
+    read();
+    m_settings.exchange({Setting::LineStatusChangeTraps, 1000}, 2);
+    EXPECT_EQ(a.line->trapEnable, 1);
+    read();
+    EXPECT_EQ(a.line->trapEnable, 2);
+    EXPECT_EQ(b.line->trapEnable, 1);
+}
+
+TEST_F(LineListenerTest, BoardThatComesBackIsToldWhatIsSet) {
+    auto const first = insert("A");
+    read();
+    m_settings.exchange({Setting::LineStatusChangeTraps, 1000}, 2);
+    m_chassis.factory->takeOut(first.board);
+    read();
+    auto const again = insert("A");
+    read();
+    EXPECT_EQ(again.line->trapEnable, 2);
+}
+
+TEST_F(LineListenerTest, ChangeDuringTheFirstReadingOfALineIsToldAfterIt) {
+    auto const a = insert("A");
+    read([&] {
+        change(a, DS1LineStatusLossOfSignal);
+        change(a, DS1LineStatusNoAlarm);
+        EXPECT_EQ(told(), "");
+    });
+    EXPECT_EQ(told(), "1000:64 1000:1 ");
+}
+
+TEST_F(LineListenerTest, ChangeOfALineWithoutAnIndexIsForgotten) {
+    auto const a = insert("A");
+    read();
+    m_chassis.factory->takeOut(a.board);
+    read();
+    change(a, DS1LineStatusLossOfSignal);
+    read();
+    EXPECT_EQ(told(), "");
+}
+
+TEST_F(LineListenerTest, ListensOnceAtEveryFeature) {
+    auto const a = insert("A");
+    read();
+    auto const b = insert("B");
+    read();
+    read();
+    EXPECT_EQ(a.feature->listenerCount(), 1);
+    EXPECT_EQ(b.feature->listenerCount(), 1);
+}
+
+TEST_F(LineListenerTest, EveryChangeAsksForASnapshotWhetherItIsEnabledOrNot) {
+    auto const a = insert("A");
+    a.line->trapEnable = 2;
+    read();
+    int asked = 0;
+    m_listener.start([&] { ++asked; });
+    change(a, DS1LineStatusLossOfSignal);
+    EXPECT_EQ(asked, 1);
+}
+
+TEST_F(LineListenerTest, NothingIsToldOnceItHasStopped) {
+    auto const a = insert("A");
+    read();
+    int asked = 0;
+    m_listener.start([&] { ++asked; });
+    m_listener.stop();
+    change(a, DS1LineStatusLossOfSignal);
+    EXPECT_EQ(told(), "");
+    EXPECT_EQ(asked, 0);
+}
+
+TEST_F(LineListenerTest, EventWithoutALineIsPassedOver) {
+    ReferenceCounter<DS1LineStatusEvent> const event(
+        new DS1LineStatusEvent(DS1LineStatusLossOfSignal, {}));
+    m_listener.ProcessLineStatusEvent(event);
+    m_listener.ProcessLineStatusEvent({});
+    EXPECT_EQ(told(), "");
+}
+
+} // namespace
+} // namespace kvloamd

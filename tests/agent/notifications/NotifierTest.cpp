@@ -1,0 +1,105 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/notifications/Notifier.h"
+
+#include <gtest/gtest.h>
+
+namespace kvloamd {
+namespace {
+
+/// Takes notifications when the test says so.
+class ScriptedSink final : public NotificationSink {
+  public:
+    bool ready() const override { return isReady; }
+    void send(Notification const& notification, std::function<void()> taken) override {
+        sent.push_back(notification.name.back());
+        if (takesAtOnce)
+            taken();
+        else
+            isReady = false;
+        underWay = std::move(taken);
+    }
+
+    bool isReady = true;
+    bool takesAtOnce = true;
+    std::function<void()> underWay;
+    std::vector<std::uint32_t> sent;
+};
+
+class NotifierTest : public ::testing::Test {
+  protected:
+    void change(std::uint32_t number) { m_queue.push({{1, 3, number}, {}, Clock::now()}); }
+    std::optional<Clock::time_point> announceShown() { return m_notifier.announce(Clock::now()); }
+
+    Counters m_counters;
+    NotificationQueue m_queue{m_counters};
+    ScriptedSink m_sink;
+    Notifier m_notifier{m_queue, m_sink};
+};
+
+TEST_F(NotifierTest, ChangesThatTheSnapshotShowsAreSentInOrder) {
+    change(1);
+    change(2);
+    EXPECT_EQ(announceShown(), std::nullopt);
+    EXPECT_EQ(m_sink.sent, (std::vector<std::uint32_t>{1, 2}));
+    EXPECT_EQ(m_queue.size(), 0U);
+}
+
+TEST_F(NotifierTest, ChangeThatTheSnapshotDoesNotShowWaits) {
+    auto const before = Clock::now() - std::chrono::milliseconds(1);
+    change(1);
+    auto const again = m_notifier.announce(before);
+    ASSERT_TRUE(again.has_value());
+    EXPECT_GE(*again, before + Notifier::kPatience);
+    EXPECT_TRUE(m_sink.sent.empty());
+}
+
+TEST_F(NotifierTest, ChangeStaysUntilItIsTaken) {
+    m_sink.takesAtOnce = false;
+    change(1);
+    change(2);
+    announceShown();
+    EXPECT_EQ(m_sink.sent, (std::vector<std::uint32_t>{1}));
+    EXPECT_EQ(m_queue.size(), 2U);
+    m_sink.underWay();
+    EXPECT_EQ(m_queue.size(), 1U);
+    m_sink.isReady = true;
+    announceShown();
+    EXPECT_EQ(m_sink.sent, (std::vector<std::uint32_t>{1, 2}));
+}
+
+TEST_F(NotifierTest, ChangeThatWasLostOnItsWayIsSentAgain) {
+    m_sink.takesAtOnce = false;
+    change(1);
+    announceShown();
+    m_sink.isReady = true;
+    announceShown();
+    EXPECT_EQ(m_sink.sent, (std::vector<std::uint32_t>{1, 1}));
+    EXPECT_EQ(m_queue.size(), 1U);
+}
+
+TEST_F(NotifierTest, NothingIsSentWhileTheSinkIsNotReady) {
+    m_sink.isReady = false;
+    change(1);
+    EXPECT_EQ(announceShown(), std::nullopt);
+    EXPECT_FALSE(m_notifier.announceAll());
+    EXPECT_TRUE(m_sink.sent.empty());
+    EXPECT_EQ(m_queue.size(), 1U);
+}
+
+TEST_F(NotifierTest, LastWordsWaitForNoSnapshot) {
+    auto const before = Clock::now();
+    change(1);
+    m_notifier.announce(before);
+    EXPECT_TRUE(m_notifier.announceAll());
+    EXPECT_EQ(m_sink.sent, (std::vector<std::uint32_t>{1}));
+}
+
+TEST_F(NotifierTest, LastWordsThatAreNotTakenAreLeft) {
+    m_sink.takesAtOnce = false;
+    change(1);
+    EXPECT_FALSE(m_notifier.announceAll());
+    EXPECT_EQ(m_queue.size(), 1U);
+}
+
+} // namespace
+} // namespace kvloamd

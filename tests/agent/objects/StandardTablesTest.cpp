@@ -1,0 +1,263 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The standard MIB modules' tables over rows that a test makes.
+#include <gmock/gmock.h>
+
+#include "agent/objects/ObjectTree.h"
+#include "agent/objects/StandardObjects.h"
+
+namespace kvloamd {
+namespace {
+
+/// Lines 10 with two closed intervals, 20 without history, 30 with a full one, 40 with none closed.
+class StandardTablesTest : public ::testing::Test {
+  protected:
+    StandardTablesTest() {
+        std::size_t before = 0;
+        for (auto const& [index, records] :
+             {std::pair{10U, 3U}, std::pair{20U, 0U}, std::pair{30U, 97U}, std::pair{40U, 1U}}) {
+            LineRow line;
+            line.ifIndex = index;
+            auto const closed = std::make_shared<ClosedIntervals>();
+            for (std::uint32_t n = 0; n < records; ++n) {
+                LineCounts counts{};
+                for (std::size_t i = 0; i < counts.size(); ++i)
+                    counts[i] = static_cast<std::int32_t>(index * 10000 + n * 100 + i);
+                if (n == 0)
+                    line.running = counts;
+                else
+                    closed->counts.push_back(counts);
+            }
+            if (records > 0) line.closed = closed;
+            line.intervalsBefore = before;
+            before += line.closedIntervals();
+            m_snapshot.interfaces.lines.push_back(std::move(line));
+        }
+    }
+
+    Lookup find(Oid const& name) { return m_tree.find(m_facts, name, m_found); }
+    Oid next(Oid const& name, bool orEqual = false) {
+        return m_tree.next(m_facts, name, orEqual, m_found) ? m_found.name : Oid{};
+    }
+    std::int64_t numberAt(Oid const& name) {
+        return find(name) == Lookup::Found ? std::get<std::int64_t>(m_found.value) : -1;
+    }
+
+    std::vector<Table const*> const m_tables = standardTables();
+    ObjectTree const m_tree{standardScalars(), m_tables};
+    Snapshot m_snapshot;
+    Counters m_counters;
+    Facts const m_facts{m_snapshot, m_counters};
+    Instance m_found;
+};
+
+TEST_F(StandardTablesTest, EveryTableIsBelowAPlaceThatIsServed) {
+    for (Table const* const table : m_tables)
+        EXPECT_TRUE(std::ranges::any_of(kStandardPlaces, [&](Place const& place) {
+            return startsWith(table->entry(), place.place);
+        })) << table->name();
+}
+
+TEST_F(StandardTablesTest, ColumnsAscendInEveryTable) {
+    for (Table const* const table : m_tables)
+        for (std::size_t column = 1; column < table->columnCount(); ++column)
+            EXPECT_LT(table->column(column - 1).number, table->column(column).number)
+                << table->name();
+}
+
+TEST_F(StandardTablesTest, CounterHasItsLow32BitsInTheTableAndAllInTheOther) {
+    InterfaceRow row;
+    row.ifIndex = 7;
+    row.counters[kInOctets] = 0x8000000000000005U;
+    m_snapshot.interfaces.interfaces = {row};
+    EXPECT_EQ(numberAt({2, 2, 1, 10, 7}), 5);
+    ASSERT_EQ(find({31, 1, 1, 1, 6, 7}), Lookup::Found);
+    EXPECT_EQ(m_found.type, ValueType::Counter64);
+    EXPECT_EQ(static_cast<std::uint64_t>(std::get<std::int64_t>(m_found.value)),
+              0x8000000000000005U);
+    EXPECT_EQ(find({31, 1, 1, 1, 10, 7}), Lookup::NoSuchInstance); // never told
+}
+
+TEST_F(StandardTablesTest, HighSpeedIsRounded) {
+    for (auto const& [speed, rounded] :
+         {std::pair{64000U, 0}, {1544000U, 2}, {1499999U, 1}, {4294967295U, 4295}}) {
+        InterfaceRow row;
+        row.ifIndex = 7;
+        row.speed = speed;
+        m_snapshot.interfaces.interfaces = {row};
+        EXPECT_EQ(numberAt({31, 1, 1, 1, 15, 7}), rounded);
+    }
+}
+
+TEST_F(StandardTablesTest, InterfaceCountIsThatOfTheRows) {
+    EXPECT_EQ(numberAt({2, 1, 0}), 0);
+    m_snapshot.interfaces.interfaces.resize(3);
+    EXPECT_EQ(numberAt({2, 1, 0}), 3);
+}
+
+Oid const kErroredSeconds{10, 18, 8, 1, 3};
+Oid const kLineCodeViolations{10, 18, 8, 1, 12};
+Oid const kValidData{10, 18, 8, 1, 13};
+
+Oid with(Oid column, std::initializer_list<std::uint32_t> index) {
+    column.insert(column.end(), index);
+    return column;
+}
+
+TEST_F(StandardTablesTest, IntervalIsFoundByLineAndNumber) {
+    EXPECT_EQ(numberAt(with(kErroredSeconds, {10, 2})), 100200);
+    EXPECT_EQ(numberAt(with(kLineCodeViolations, {30, 96})), 309609);
+    EXPECT_EQ(numberAt({10, 18, 8, 1, 1, 30, 5}), 30);
+    EXPECT_EQ(numberAt({10, 18, 8, 1, 2, 30, 5}), 5);
+}
+
+TEST_F(StandardTablesTest, IntervalsThatWereNeverClosedHaveNoInstance) {
+    for (auto const& index : std::initializer_list<std::initializer_list<std::uint32_t>>{
+             {10, 0}, {10, 3}, {20, 1}, {30, 97}, {40, 1}, {50, 1}, {10}, {10, 1, 1}, {}})
+        EXPECT_EQ(find(with(kErroredSeconds, index)), Lookup::NoSuchInstance);
+}
+
+TEST_F(StandardTablesTest, NextIntervalIsOfTheSameLineThenOfTheNextWithAny) {
+    EXPECT_EQ(next(kErroredSeconds), with(kErroredSeconds, {10, 1}));
+    EXPECT_EQ(next(with(kErroredSeconds, {10})), with(kErroredSeconds, {10, 1}));
+    EXPECT_EQ(next(with(kErroredSeconds, {10, 1})), with(kErroredSeconds, {10, 2}));
+    EXPECT_EQ(next(with(kErroredSeconds, {10, 1, 9})), with(kErroredSeconds, {10, 2}));
+    EXPECT_EQ(next(with(kErroredSeconds, {10, 2})), with(kErroredSeconds, {30, 1}));
+    EXPECT_EQ(next(with(kErroredSeconds, {11})), with(kErroredSeconds, {30, 1}));
+    EXPECT_EQ(next(with(kErroredSeconds, {20, 4294967295U})), with(kErroredSeconds, {30, 1}));
+    EXPECT_EQ(next(with(kErroredSeconds, {30, 96})), with({10, 18, 8, 1, 4}, {10, 1}));
+}
+
+TEST_F(StandardTablesTest, NextOrEqualIntervalIsTheIntervalItself) {
+    EXPECT_EQ(next(with(kErroredSeconds, {10, 2}), true), with(kErroredSeconds, {10, 2}));
+    EXPECT_EQ(next(with(kErroredSeconds, {10, 0}), true), with(kErroredSeconds, {10, 1}));
+    EXPECT_EQ(next(with(kErroredSeconds, {10, 3}), true), with(kErroredSeconds, {30, 1}));
+}
+
+TEST_F(StandardTablesTest, WalkOfTheIntervalsIsStrictlyIncreasingAndFindsEveryStep) {
+    Oid name{10, 18, 8};
+    int steps = 0;
+    for (Oid after = next(name); startsWith(after, Oid{10, 18, 8}); after = next(name), ++steps) {
+        ASSERT_TRUE(compare(name, after) < 0);
+        name = after;
+        EXPECT_EQ(find(name), Lookup::Found);
+    }
+    EXPECT_EQ(steps, 13 * (2 + 96));
+}
+
+TEST_F(StandardTablesTest, OldestIntervalOfAFullHistoryHasNoValidData) {
+    EXPECT_EQ(numberAt(with(kValidData, {30, 95})), 1);
+    EXPECT_EQ(numberAt(with(kValidData, {30, 96})), 2);
+    EXPECT_EQ(numberAt({10, 18, 6, 1, 4, 30}), 96); // dsx1ValidIntervals
+    EXPECT_EQ(numberAt({10, 18, 6, 1, 14, 30}), 1); // dsx1InvalidIntervals
+    EXPECT_EQ(numberAt({10, 18, 6, 1, 14, 10}), 0);
+}
+
+TEST_F(StandardTablesTest, LineWithoutHistoryIsInTheTableOfLinesOnly) {
+    EXPECT_EQ(numberAt({10, 18, 6, 1, 1, 20}), 20);
+    EXPECT_EQ(find({10, 18, 6, 1, 4, 20}), Lookup::NoSuchInstance);
+    EXPECT_EQ(find({10, 18, 7, 1, 1, 20}), Lookup::NoSuchInstance);
+    EXPECT_EQ(find({10, 18, 9, 1, 2, 20}), Lookup::NoSuchInstance);
+}
+
+TEST_F(StandardTablesTest, RunningIntervalIsTheFirstRecord) {
+    EXPECT_EQ(numberAt({10, 18, 7, 1, 2, 40}), 400000);
+    EXPECT_EQ(numberAt({10, 18, 7, 1, 11, 10}), 100009);
+}
+
+TEST_F(StandardTablesTest, CountThatALineDoesNotKnowHasNoInstance) {
+    LineRow& line = m_snapshot.interfaces.lines[0];
+    auto const closed = std::make_shared<ClosedIntervals>(*line.closed);
+    closed->counts[0][9] = -2;
+    line.closed = closed;
+    EXPECT_EQ(find(with(kLineCodeViolations, {10, 1})), Lookup::NoSuchInstance);
+    EXPECT_EQ(find(with(kErroredSeconds, {10, 1})), Lookup::Found);
+    EXPECT_EQ(next(kLineCodeViolations), with(kLineCodeViolations, {10, 2}));
+}
+
+Oid const kLineTraps{10, 18, 6, 1, 17};
+Oid const kLinkTraps{31, 1, 1, 1, 14};
+
+/// Lines 10, 20, 30 and 40, of which all but 20 know whether they tell; interfaces 10 and 50, the
+/// latter stacked.
+class StandardSetTest : public StandardTablesTest {
+  protected:
+    StandardSetTest() {
+        for (LineRow& line : m_snapshot.interfaces.lines)
+            if (line.ifIndex != 20) line.statusChangeTrapEnable = 2;
+        m_snapshot.interfaces.interfaces.resize(2);
+        m_snapshot.interfaces.interfaces[0].ifIndex = 10;
+        m_snapshot.interfaces.interfaces[1].ifIndex = 50;
+        m_snapshot.interfaces.interfaces[1].linkUpDownTraps = 2;
+    }
+
+    SetFault test(Oid const& name, std::optional<std::int64_t> integer) {
+        return m_tree.test(m_withSettings, name, integer, m_change);
+    }
+    std::int64_t setNumberAt(Oid const& name) {
+        Instance found;
+        return m_tree.find(m_withSettings, name, found) == Lookup::Found
+                   ? std::get<std::int64_t>(found.value)
+                   : -1;
+    }
+
+    Settings m_settings;
+    Facts const m_withSettings{m_snapshot, m_counters, &m_settings};
+    std::optional<Change> m_change;
+};
+
+TEST_F(StandardSetTest, WritableColumnTakesItsValues) {
+    EXPECT_EQ(test(with(kLineTraps, {10}), 1), SetFault::None);
+    ASSERT_TRUE(m_change);
+    EXPECT_EQ(m_change->key, (SettingKey{Setting::LineStatusChangeTraps, 10}));
+    EXPECT_EQ(m_change->value, 1);
+    EXPECT_EQ(test(with(kLinkTraps, {50}), 2), SetFault::None);
+    EXPECT_EQ(m_change->key, (SettingKey{Setting::LinkUpDownTraps, 50}));
+}
+
+TEST_F(StandardSetTest, TestChangesNothing) {
+    test(with(kLineTraps, {10}), 1);
+    EXPECT_EQ(setNumberAt(with(kLineTraps, {10})), 2);
+}
+
+TEST_F(StandardSetTest, WhatIsSetShowsAtOnceAndInItsRowOnly) {
+    m_settings.exchange({Setting::LineStatusChangeTraps, 10}, 1);
+    EXPECT_EQ(setNumberAt(with(kLineTraps, {10})), 1);
+    EXPECT_EQ(setNumberAt(with(kLineTraps, {30})), 2);
+    EXPECT_EQ(setNumberAt(with(kLinkTraps, {10})), 1);
+}
+
+TEST_F(StandardSetTest, ValueThatIsNoIntegerIsOfTheWrongType) {
+    EXPECT_EQ(test(with(kLineTraps, {10}), std::nullopt), SetFault::WrongType);
+}
+
+TEST_F(StandardSetTest, NumbersBesideTheRangeAreWrongValues) {
+    for (std::int64_t const number : {0, 3, -1, 2147483647})
+        EXPECT_EQ(test(with(kLinkTraps, {10}), number), SetFault::WrongValue) << number;
+}
+
+TEST_F(StandardSetTest, RowThatIsNotThereIsNotMade) {
+    for (auto const& index : std::initializer_list<std::initializer_list<std::uint32_t>>{
+             {11}, {}, {10, 0}, {4294967295U}})
+        EXPECT_EQ(test(with(kLineTraps, index), 1), SetFault::NoCreation);
+}
+
+TEST_F(StandardSetTest, LineThatDoesNotKnowWhetherItTellsHasNothingToSet) {
+    EXPECT_EQ(test(with(kLineTraps, {20}), 1), SetFault::NoCreation);
+    m_settings.exchange({Setting::LineStatusChangeTraps, 20}, 1);
+    EXPECT_EQ(setNumberAt(with(kLineTraps, {20})), -1);
+}
+
+TEST_F(StandardSetTest, WhatIsWrongWithTheObjectIsToldBeforeWhatIsWrongWithTheValue) {
+    EXPECT_EQ(test(with(kLineTraps, {11}), std::nullopt), SetFault::WrongType);
+    EXPECT_EQ(test(with(kLineTraps, {11}), 7), SetFault::WrongValue);
+    EXPECT_EQ(test({10, 18, 6, 1, 10, 11}, std::nullopt), SetFault::NotWritable);
+}
+
+TEST_F(StandardSetTest, OtherObjectsAndUnknownOnesAreNotWritable) {
+    for (Oid const& name : {Oid{10, 18, 6, 1, 10, 10}, Oid{10, 18, 8, 1, 3, 10, 1}, Oid{2, 1, 0},
+                            Oid{10, 18, 6, 1, 99, 10}, Oid{10, 18, 6}, Oid{}, Oid{99}})
+        EXPECT_EQ(test(name, 1), SetFault::NotWritable);
+}
+
+} // namespace
+} // namespace kvloamd

@@ -1,0 +1,160 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/readers/BoardInterfaces.h"
+
+#include <gmock/gmock.h>
+
+#include "agent/rows/IndexKey.h"
+#include "tests/support/FakeBoards.h"
+#include "tests/support/FakeLines.h"
+
+namespace kvloamd {
+namespace {
+
+using ::testing::ElementsAre;
+using ::testing::IsEmpty;
+using ::testing::SizeIs;
+using ::testing::UnorderedElementsAre;
+
+class BoardInterfacesTest : public ::testing::Test {
+  protected:
+    /// Gives the board a feature, which it keeps.
+    void add(Feature* feature) { m_board->AddFeature(ReferenceCounter<Feature>(feature)); }
+    FakeLine& addLine(std::string name, std::string circuit = "") {
+        auto* const line = new FakeLine(std::move(name), std::move(circuit));
+        add(new FakeLineFeature({line}));
+        return *line;
+    }
+    FakeHistory& addHistory(FakeLine& line) {
+        auto* const history = new FakeHistory;
+        line.history = ReferenceCounter<DS1IntervalTable>(history);
+        return *history;
+    }
+    InterfaceRows read() { return readInterfaces(*m_board.get(), m_toTicks, m_histories).rows; }
+    LineRow readLine() {
+        auto rows = read();
+        EXPECT_THAT(rows.lines, SizeIs(1));
+        return rows.lines.empty() ? LineRow{} : rows.lines.front();
+    }
+
+    ToTicks const m_toTicks = [](long seconds) { return static_cast<std::uint32_t>(seconds); };
+    LineHistories m_histories;
+    ReferenceCounter<Board> m_board{new FakeBoard};
+};
+
+TEST_F(BoardInterfacesTest, LinesAreReadOnceThoughTheyAreInterfacesToo) {
+    addLine("one");
+    addLine("two");
+    auto const found = readInterfaces(*m_board.get(), m_toTicks, m_histories);
+    EXPECT_THAT(found.keys,
+                ElementsAre(IndexKey{IndexKind::Line, "one"}, IndexKey{IndexKind::Line, "two"}));
+    EXPECT_THAT(found.rows.interfaces, SizeIs(2));
+}
+
+TEST_F(BoardInterfacesTest, LinesArePortsAndChannelsAreNot) {
+    addLine("one");
+    add(new FakeISDNFeature({new FakeDChannel("D", 1, 1, "one")}, {new FakeBChannel("B", 1)}));
+    auto const rows = read();
+    EXPECT_THAT(rows.interfaces, SizeIs(3));
+    ASSERT_THAT(rows.ports, SizeIs(1));
+    EXPECT_EQ(rows.ports[0].ifIndex, rows.lines[0].ifIndex);
+    EXPECT_EQ(rows.ports[0].key, (IndexKey{IndexKind::Line, "one"}));
+}
+
+TEST_F(BoardInterfacesTest, LinesOfOneNameAreToldApart) {
+    addLine("same");
+    addLine("same");
+    EXPECT_THAT(
+        readInterfaces(*m_board.get(), m_toTicks, m_histories).keys,
+        ElementsAre(IndexKey{IndexKind::Line, "same"}, IndexKey{IndexKind::Line, "same#2"}));
+}
+
+TEST_F(BoardInterfacesTest, WhatALineDoesNotSupportIsNotKnown) {
+    addLine("one");
+    LineRow const line = readLine();
+    EXPECT_EQ(line.lineStatus, std::nullopt);
+    EXPECT_EQ(line.lineLength, std::nullopt);
+    EXPECT_EQ(line.statusLastChange, std::nullopt);
+    EXPECT_EQ(line.timeElapsed, std::nullopt);
+    EXPECT_FALSE(line.keepsHistory());
+}
+
+TEST_F(BoardInterfacesTest, HistoryIsReadFromTheRunningIntervalBackwards) {
+    FakeHistory& history = addHistory(addLine("one"));
+    history.close(5);
+    history.close(7);
+    history.run(1, 300);
+    LineRow const line = readLine();
+    EXPECT_EQ(line.timeElapsed, 300);
+    ASSERT_EQ(line.closedIntervals(), 2U);
+    EXPECT_EQ(line.running[0], 1);
+    EXPECT_EQ(line.closed->counts[0][0], 7);
+    EXPECT_EQ(line.closed->counts[1][0], 5);
+}
+
+TEST_F(BoardInterfacesTest, TotalLeavesOutTheRunningInterval) {
+    FakeHistory& history = addHistory(addLine("one"));
+    history.close(5);
+    history.close(7);
+    history.run(100, 300);
+    EXPECT_EQ(readLine().closed->total[0], 12);
+}
+
+TEST_F(BoardInterfacesTest, TotalOfWhatIsNotSupportedIsNotKnown) {
+    FakeHistory& history = addHistory(addLine("one"));
+    history.knowsDegradedMinutes = false;
+    history.close(5);
+    history.close(7);
+    LineRow const line = readLine();
+    EXPECT_LT(line.closed->total[8], 0);
+    EXPECT_EQ(line.closed->total[0], 12);
+}
+
+TEST_F(BoardInterfacesTest, IntervalThatIsAboutToBeClosedHasLasted899Seconds) {
+    addHistory(addLine("one")).run(0, 900);
+    EXPECT_EQ(readLine().timeElapsed, 899);
+}
+
+TEST_F(BoardInterfacesTest, ChannelsLieAboveTheLineThatTheirSignallingNames) {
+    addLine("one");
+    addLine("two", "circuit 2");
+    add(new FakeISDNFeature(
+        {new FakeDChannel("D1", 3, 1, "one"), new FakeDChannel("D2", 3, 2, "circuit 2")},
+        {new FakeBChannel("B1", 1), new FakeBChannel("B2", 1), new FakeBChannel("B3", 1)}));
+    // Numbers on the board: lines 1 and 2, signalling 3 and 4, bearers 5 to 7.
+    EXPECT_THAT(read().stack, UnorderedElementsAre(StackRow{3, 1}, StackRow{4, 2}, StackRow{5, 1},
+                                                   StackRow{6, 2}, StackRow{7, 2}));
+}
+
+TEST_F(BoardInterfacesTest, BearersThatDoNotAddUpLieAboveNothing) {
+    addLine("one");
+    add(new FakeISDNFeature({new FakeDChannel("D1", 3, 5, "one")}, {new FakeBChannel("B1", 1)}));
+    EXPECT_THAT(read().stack, ElementsAre(StackRow{2, 1}));
+}
+
+TEST_F(BoardInterfacesTest, ChannelsOfAnUnknownLineLieAboveNothing) {
+    addLine("one");
+    add(new FakeISDNFeature({new FakeDChannel("D1", 3, 1, "other")}, {new FakeBChannel("B1", 1)}));
+    EXPECT_THAT(read().stack, IsEmpty());
+}
+
+TEST_F(BoardInterfacesTest, NonsensicalNumberOfBearersIsSurvived) {
+    addLine("one");
+    add(new FakeISDNFeature({new FakeDChannel("D1", 3, 2147483647, "one")},
+                            {new FakeBChannel("B1", 1)}));
+    EXPECT_THAT(read().bearers, SizeIs(1));
+}
+
+TEST_F(BoardInterfacesTest, ChannelIsUpWhenItCarriesSomething) {
+    add(new FakeISDNFeature({new FakeDChannel("D1", ISDNDChannelStatusL1Active, 0, ""),
+                             new FakeDChannel("D2", ISDNDChannelStatusL2Active, 0, "")},
+                            {new FakeBChannel("B1", ISDNBChannelStatusConnecting),
+                             new FakeBChannel("B2", ISDNBChannelStatusConnected),
+                             new FakeBChannel("B3", 0)}));
+    std::vector<std::optional<int>> states;
+    for (InterfaceRow const& row : read().interfaces)
+        states.push_back(row.operStatus);
+    EXPECT_THAT(states, ElementsAre(2, 1, 5, 1, std::nullopt));
+}
+
+} // namespace
+} // namespace kvloamd

@@ -1,0 +1,256 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/readers/EntityStates.h"
+
+#include <gmock/gmock.h>
+
+#include "agent/readers/Answers.h"
+#include "board/Board.h"
+#include "board/DS1LineDevice.h"
+#include "board/ISDNChannel.h"
+
+namespace kvloamd {
+namespace {
+
+using ::testing::IsEmpty;
+using ::testing::SizeIs;
+
+EntityState stateOf(int status, int secondaryStatus = BoardStatusNone) {
+    BoardRow board;
+    board.status = status;
+    board.secondaryStatus = secondaryStatus;
+    return boardState(board, false);
+}
+
+EntityState portOf(std::optional<int> operStatus, std::optional<int> lineStatus = std::nullopt) {
+    InterfaceRow interface;
+    interface.operStatus = operStatus;
+    LineRow line;
+    line.lineStatus = lineStatus;
+    return portState(interface, &line, UsageState::Unknown);
+}
+
+unsigned alarmOf(int lineStatus) {
+    return static_cast<unsigned char>(portOf(1, lineStatus).alarm);
+}
+
+TEST(BoardStateTest, StartedBoardProvidesService) {
+    EntityState const state = stateOf(BoardStatusStarted);
+    EXPECT_EQ(state.admin, AdminState::Unlocked);
+    EXPECT_EQ(state.oper, OperState::Enabled);
+    EXPECT_EQ(state.standby, StandbyState::ProvidingService);
+    EXPECT_EQ(state.usage, UsageState::Unknown);
+    EXPECT_EQ(state.alarm, 0);
+}
+
+TEST(BoardStateTest, StoppedBoardIsLocked) {
+    EntityState const state = stateOf(BoardStatusStopped);
+    EXPECT_EQ(state.admin, AdminState::Locked);
+    EXPECT_EQ(state.oper, OperState::Disabled);
+    EXPECT_EQ(state.standby, StandbyState::Unknown);
+    EXPECT_EQ(state.alarm, 0);
+}
+
+TEST(BoardStateTest, FaultIsAnAlarmOfNoKnownSeverity) {
+    BoardRow board;
+    board.status = BoardStatusStarted;
+    EntityState const state = boardState(board, true);
+    EXPECT_EQ(state.alarm, '\x02');
+    EXPECT_EQ(state.oper, OperState::Enabled);
+}
+
+TEST(BoardStateTest, FailedBoardWithAFaultHasBothAlarms) {
+    BoardRow board;
+    board.secondaryStatus = BoardStatusFailed;
+    EXPECT_EQ(boardState(board, true).alarm, '\x22');
+}
+
+TEST(BoardStateTest, BoardThatIsToStopWorksYet) {
+    EntityState const state = stateOf(BoardStatusStopPending);
+    EXPECT_EQ(state.admin, AdminState::ShuttingDown);
+    EXPECT_EQ(state.oper, OperState::Enabled);
+}
+
+TEST(BoardStateTest, BoardThatIsToStartDoesNotWorkYet) {
+    EntityState const state = stateOf(BoardStatusStartPending);
+    EXPECT_EQ(state.admin, AdminState::Unlocked);
+    EXPECT_EQ(state.oper, OperState::Disabled);
+}
+
+TEST(BoardStateTest, FailedBoardIsCriticalAndNobodyHasLockedIt) {
+    EntityState const state = stateOf(BoardStatusStopped, BoardStatusFailed);
+    EXPECT_EQ(state.admin, AdminState::Unknown);
+    EXPECT_EQ(state.oper, OperState::Disabled);
+    EXPECT_EQ(static_cast<unsigned char>(state.alarm), kAlarmCritical);
+    EXPECT_EQ(state.standby, StandbyState::Unknown);
+}
+
+TEST(BoardStateTest, BoardWithoutStatusIsUnknown) {
+    EntityState const state = stateOf(BoardStatusNone);
+    EXPECT_EQ(state.admin, AdminState::Unknown);
+    EXPECT_EQ(state.oper, OperState::Unknown);
+}
+
+TEST(PortStateTest, OperStateIsThatOfTheInterface) {
+    for (auto const& [status, state] : {std::pair{1, OperState::Enabled},
+                                        {2, OperState::Disabled},
+                                        {3, OperState::Testing},
+                                        {4, OperState::Unknown},
+                                        {5, OperState::Enabled},
+                                        {6, OperState::Disabled},
+                                        {7, OperState::Disabled}})
+        EXPECT_EQ(portOf(status).oper, state) << status;
+    EXPECT_EQ(portOf(std::nullopt).oper, OperState::Unknown);
+}
+
+TEST(PortStateTest, LineStatusTellsWhatTheInterfaceDoesNot) {
+    EXPECT_EQ(portOf(std::nullopt, DS1LineStatusNoAlarm).oper, OperState::Enabled);
+    EXPECT_EQ(portOf(std::nullopt, DS1LineStatusRcvAIS).oper, OperState::Disabled);
+    EXPECT_EQ(portOf(std::nullopt, DS1LineStatusLossOfSignal).oper, OperState::Disabled);
+    EXPECT_EQ(portOf(std::nullopt, DS1LineStatusLoopbackState).oper, OperState::Unknown);
+    EXPECT_EQ(portOf(1, DS1LineStatusLossOfSignal).oper, OperState::Enabled);
+}
+
+TEST(PortStateTest, OnlyAPortThatIsUpProvidesService) {
+    EXPECT_EQ(portOf(1).standby, StandbyState::ProvidingService);
+    for (int const status : {2, 3, 4, 5, 6, 7})
+        EXPECT_EQ(portOf(status).standby, StandbyState::Unknown) << status;
+}
+
+TEST(PortStateTest, AdminStateIsThatOfTheInterface) {
+    InterfaceRow interface;
+    EXPECT_EQ(portState(interface, nullptr, UsageState::Unknown).admin, AdminState::Unknown);
+    for (auto const& [status, state] :
+         {std::pair{1, AdminState::Unlocked}, {2, AdminState::Locked}, {3, AdminState::Unknown}}) {
+        interface.adminStatus = status;
+        EXPECT_EQ(portState(interface, nullptr, UsageState::Unknown).admin, state);
+    }
+}
+
+TEST(PortStateTest, AlarmsAreOfTheSeverityOfTheirCause) {
+    EXPECT_EQ(alarmOf(DS1LineStatusNoAlarm), 0U);
+    EXPECT_EQ(alarmOf(DS1LineStatusLossOfSignal), kAlarmCritical);
+    EXPECT_EQ(alarmOf(DS1LineStatusLossOfFrame), kAlarmCritical);
+    EXPECT_EQ(alarmOf(DS1LineStatusRcvAIS), kAlarmMajor);
+    EXPECT_EQ(alarmOf(DS1LineStatusT16AIS), kAlarmMajor);
+    EXPECT_EQ(alarmOf(DS1LineStatusRcvPayloadAIS), kAlarmMajor);
+    EXPECT_EQ(alarmOf(DS1LineStatusUnavailSigState), kAlarmMajor);
+    EXPECT_EQ(alarmOf(DS1LineStatusRcvFarEndLOF), kAlarmMinor);
+    EXPECT_EQ(alarmOf(DS1LineStatusRcvFarEndLOMF), kAlarmMinor);
+    EXPECT_EQ(alarmOf(DS1LineStatusDs2PerfThreshold), kAlarmWarning);
+    EXPECT_EQ(alarmOf(DS1LineStatusOtherFailure), kAlarmIndeterminate);
+    EXPECT_EQ(alarmOf(DS1LineStatusNetEquipOOS), kAlarmIndeterminate);
+    EXPECT_EQ(alarmOf(DS1LineStatusRcvFarEndLOF | DS1LineStatusLossOfSignal),
+              kAlarmMinor | kAlarmCritical);
+}
+
+TEST(PortStateTest, WhatALineSendsOrIsTestedWithIsNoAlarm) {
+    EXPECT_EQ(alarmOf(DS1LineStatusXmtFarEndLOF | DS1LineStatusXmtAIS | DS1LineStatusLoopbackState |
+                      DS1LineStatusXmtFarEndLOMF | DS1LineStatusRcvTestCode),
+              0U);
+}
+
+TEST(PortStateTest, PortThatTellsOfNoAlarmsMayHaveSome) {
+    InterfaceRow const ethernet;
+    EXPECT_EQ(static_cast<unsigned char>(portState(ethernet, nullptr, UsageState::Unknown).alarm),
+              kAlarmUnknown);
+    EXPECT_EQ(static_cast<unsigned char>(portOf(1, std::nullopt).alarm), kAlarmUnknown);
+    EXPECT_EQ(alarmOf(0), kAlarmUnknown);
+}
+
+class LineUsageTest : public ::testing::Test {
+  protected:
+    /// Line 10 with bearer channels in these states.
+    UsageState usageOf(std::initializer_list<std::optional<int>> states) {
+        InterfaceRows rows;
+        std::uint32_t index = 100;
+        for (auto const& state : states) {
+            rows.bearers.push_back({index, std::nullopt, state, std::nullopt});
+            rows.stack.push_back({index++, 10});
+        }
+        rows.stack.push_back({index, 10}); // a signalling channel does not count
+        auto const usage = lineUsage(rows);
+        auto const found = usage.find(10);
+        return found == usage.end() ? UsageState::Unknown : found->second;
+    }
+};
+
+TEST_F(LineUsageTest, LineWithoutACallIsIdle) {
+    EXPECT_EQ(usageOf({ISDNBChannelStatusIdle, ISDNBChannelStatusIdle}), UsageState::Idle);
+}
+
+TEST_F(LineUsageTest, LineWithRoomForACallIsActive) {
+    EXPECT_EQ(usageOf({ISDNBChannelStatusIdle, ISDNBChannelStatusActive}), UsageState::Active);
+}
+
+TEST_F(LineUsageTest, LineWhoseChannelsAreAllInUseIsBusy) {
+    EXPECT_EQ(usageOf({ISDNBChannelStatusConnecting, ISDNBChannelStatusActive}), UsageState::Busy);
+}
+
+TEST_F(LineUsageTest, UseOfChannelsThatDoNotTellIsUnknown) {
+    EXPECT_EQ(usageOf({ISDNBChannelStatusActive, std::nullopt}), UsageState::Unknown);
+    EXPECT_EQ(usageOf({}), UsageState::Unknown);
+}
+
+TEST_F(LineUsageTest, ChannelThatLiesAboveNothingIsOfNoLine) {
+    InterfaceRows rows;
+    rows.bearers.push_back({100, std::nullopt, ISDNBChannelStatusIdle, std::nullopt});
+    rows.stack = {{0, 100}, {100, 0}};
+    EXPECT_THAT(lineUsage(rows), IsEmpty());
+}
+
+class EntityStatesTest : public ::testing::Test {
+  protected:
+    EntityStatesTest() {
+        m_entity.entity = 17;
+        m_entity.boardIndex = 1;
+        m_board.boardIndex = 1;
+        m_board.status = BoardStatusStarted;
+    }
+    std::vector<EntityStateRow> read() {
+        return m_states.read({m_entity}, {m_board}, {}, m_faults);
+    }
+    std::string readChanged() {
+        auto const rows = read();
+        EXPECT_THAT(rows, SizeIs(1));
+        return rows.empty() ? "" : rows[0].changed;
+    }
+
+    long m_now = 1'000'000'000;
+    PhysicalRow m_entity;
+    BoardRow m_board;
+    std::vector<FaultRow> m_faults;
+    EntityStates m_states{[this] { return m_now; }};
+};
+
+TEST_F(EntityStatesTest, StateThatNeverChangedIsSinceTheStart) {
+    m_now += 5;
+    EXPECT_EQ(readChanged(), dateOctets(1'000'000'000));
+    m_now += 5;
+    EXPECT_EQ(readChanged(), dateOctets(1'000'000'000));
+}
+
+TEST_F(EntityStatesTest, ChangeOfStateIsDated) {
+    read();
+    m_now += 60;
+    m_board.status = BoardStatusStopped;
+    EXPECT_EQ(readChanged(), dateOctets(1'000'000'060));
+    m_now += 60;
+    EXPECT_EQ(readChanged(), dateOctets(1'000'000'060));
+}
+
+TEST_F(EntityStatesTest, FaultOfABoardIsItsAlarmAndNoOthers) {
+    m_faults.push_back({2, 17, 2, 0, "", 1});
+    EXPECT_EQ(read().at(0).state.alarm, 0);
+    m_faults.insert(m_faults.begin(), {1, 17, 1, 0, "", 1});
+    EXPECT_EQ(read().at(0).state.alarm, '\x02');
+}
+
+TEST_F(EntityStatesTest, EntityThatComesIsInItsStateSinceThen) {
+    read();
+    EXPECT_THAT(m_states.read({}, {}, {}, {}), IsEmpty());
+    m_now += 60;
+    EXPECT_EQ(readChanged(), dateOctets(1'000'000'060));
+}
+
+} // namespace
+} // namespace kvloamd

@@ -1,0 +1,195 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/readers/InterfaceReader.h"
+
+#include <ctime>
+#include <limits>
+
+#include <gmock/gmock.h>
+
+#include "agent/readers/BoardSource.h"
+#include "agent/rows/IndexKey.h"
+#include "tests/support/FakeBoards.h"
+#include "tests/support/FakeEthernet.h"
+
+namespace kvloamd {
+namespace {
+
+using ::testing::ElementsAre;
+using ::testing::IsEmpty;
+using ::testing::SizeIs;
+
+class InterfaceReaderTest : public ::testing::Test {
+  protected:
+    /// Gives the board an Ethernet port, which the board keeps.
+    static FakeEthernet& addPort(ReferenceCounter<Board> const& board) {
+        auto* const port = new FakeEthernet;
+        board->AddFeature(ReferenceCounter<Feature>(
+            new FakeEthernetFeature({ReferenceCounter<KVL::Ethernet>(port)})));
+        return *port;
+    }
+    InterfaceRows read() { return m_reader.read(m_source.read()); }
+    InterfaceRow readOne() {
+        auto const rows = read();
+        EXPECT_THAT(rows.interfaces, SizeIs(1));
+        return rows.interfaces.empty() ? InterfaceRow{} : rows.interfaces.front();
+    }
+    std::vector<std::uint32_t> readIndices() {
+        std::vector<std::uint32_t> indices;
+        for (InterfaceRow const& row : read().interfaces)
+            indices.push_back(row.ifIndex);
+        return indices;
+    }
+
+    FakeChassis m_chassis;
+    BoardSource m_source{*m_chassis.manager.get()};
+    StableIndices m_indices{"", 1000, "interfaces"};
+    // Long ago, so that what happens now is told by a time that is not 0.
+    InterfaceReader m_reader{*m_chassis.manager.get(), m_indices,
+                             Clock::now() - std::chrono::hours(1)};
+};
+
+TEST_F(InterfaceReaderTest, BoardWithoutFeaturesHasNoInterfaces) {
+    m_chassis.insert("A");
+    auto const rows = read();
+    EXPECT_THAT(rows.interfaces, IsEmpty());
+    EXPECT_THAT(rows.stack, IsEmpty());
+}
+
+TEST_F(InterfaceReaderTest, WhatAnInterfaceDoesNotSupportIsNotKnown) {
+    addPort(m_chassis.insert("A"));
+    InterfaceRow const row = readOne();
+    EXPECT_EQ(row.type, 6);
+    EXPECT_EQ(row.mtu, std::nullopt);
+    EXPECT_EQ(row.speed, std::nullopt);
+    EXPECT_EQ(row.adminStatus, std::nullopt);
+    EXPECT_EQ(row.lastChange, std::nullopt);
+    EXPECT_EQ(row.counters[kInOctets], std::nullopt);
+    EXPECT_EQ(row.physAddress, "");
+}
+
+TEST_F(InterfaceReaderTest, DescriptionIsMadePrintable) {
+    addPort(m_chassis.insert("A"));
+    EXPECT_EQ(readOne().description, "fake?port");
+}
+
+TEST_F(InterfaceReaderTest, AddressKeepsItsBytes) {
+    addPort(m_chassis.insert("A")).address = std::string("\x02\0\xff", 3);
+    EXPECT_EQ(readOne().physAddress, std::string("\x02\0\xff", 3));
+}
+
+TEST_F(InterfaceReaderTest, SpeedUsesAllBits) {
+    addPort(m_chassis.insert("A")).speed = -1;
+    EXPECT_EQ(readOne().speed, 4294967295U);
+}
+
+TEST_F(InterfaceReaderTest, StatisticsOfEthernetAreReadUnderTheSameIndex) {
+    addPort(m_chassis.insert("A")).fcsErrors = -5;
+    auto const rows = read();
+    ASSERT_THAT(rows.ethernets, SizeIs(1));
+    EXPECT_EQ(rows.ethernets[0].ifIndex, rows.interfaces[0].ifIndex);
+    EXPECT_EQ(rows.ethernets[0].fcsErrors, 4294967291U);
+    EXPECT_EQ(rows.ethernets[0].symbolErrors, std::nullopt);
+}
+
+TEST_F(InterfaceReaderTest, CounterCountsOnWhenItWraps) {
+    FakeEthernet& port = addPort(m_chassis.insert("A"));
+    port.inOctets = -10; // 2^32 - 10
+    EXPECT_EQ(readOne().counters[kInOctets], 4294967286U);
+    port.inOctets = 5;
+    EXPECT_EQ(readOne().counters[kInOctets], 4294967301U);
+    port.inOctets = 4;
+    EXPECT_EQ(readOne().counters[kInOctets], 8589934596U);
+}
+
+TEST_F(InterfaceReaderTest, CounterThatIsNotKnownForAWhileCountsOn) {
+    FakeEthernet& port = addPort(m_chassis.insert("A"));
+    port.outErrors = -1;
+    read();
+    port.outErrors = KVL::kNotSupported;
+    EXPECT_EQ(readOne().counters[kOutErrors], std::nullopt);
+    port.outErrors = 0;
+    EXPECT_EQ(readOne().counters[kOutErrors], 4294967296U);
+}
+
+TEST_F(InterfaceReaderTest, CounterOfABoardThatComesBackBeginsAnew) {
+    auto const board = m_chassis.insert("A");
+    addPort(board).inOctets = 7;
+    EXPECT_EQ(readOne().discontinuity, 0U);
+    m_chassis.factory->takeOut(board);
+    EXPECT_THAT(read().interfaces, IsEmpty());
+    addPort(m_chassis.insert("A")).inOctets = 3;
+    InterfaceRow const row = readOne();
+    EXPECT_EQ(row.counters[kInOctets], 3U);
+    EXPECT_GE(row.discontinuity, 360000U);
+}
+
+TEST_F(InterfaceReaderTest, BoardThatIsExchangedBetweenReadingsBeginsAnew) {
+    auto const board = m_chassis.insert("A");
+    addPort(board).inOctets = 7;
+    read();
+    m_chassis.factory->takeOut(board);
+    addPort(m_chassis.insert("A")).inOctets = 3;
+    InterfaceRow const row = readOne();
+    EXPECT_EQ(row.counters[kInOctets], 3U);
+    EXPECT_GE(row.discontinuity, 360000U);
+}
+
+TEST_F(InterfaceReaderTest, BoardThatComesBackHasItsIndicesAgain) {
+    auto const first = m_chassis.insert("A");
+    auto const second = m_chassis.insert("B");
+    addPort(first);
+    addPort(second);
+    EXPECT_THAT(readIndices(), ElementsAre(1000, 1016));
+    m_chassis.factory->takeOut(first);
+    EXPECT_THAT(readIndices(), ElementsAre(1016));
+    addPort(m_chassis.insert("A"));
+    EXPECT_THAT(readIndices(), ElementsAre(1000, 1016));
+}
+
+TEST_F(InterfaceReaderTest, BoardsWithoutSerialNumberOfTheirOwnHaveDifferentIndices) {
+    for (char const* const serialNumber : {"unknown", "unknown", "", "A", "A"})
+        addPort(m_chassis.insert(serialNumber));
+    EXPECT_THAT(readIndices(), ElementsAre(1000, 1016, 1032, 1048, 1064));
+}
+
+TEST_F(InterfaceReaderTest, ChangeBeforeTheStartIsAtZero) {
+    addPort(m_chassis.insert("A")).lastChange = 1;
+    EXPECT_EQ(readOne().lastChange, 0U);
+}
+
+TEST_F(InterfaceReaderTest, ChangeAfterTheStartIsTimedFromThere) {
+    addPort(m_chassis.insert("A")).lastChange = static_cast<int>(std::time(nullptr));
+    auto const change = readOne().lastChange;
+    ASSERT_TRUE(change.has_value());
+    EXPECT_GT(*change, 350000U); // an hour
+    EXPECT_LT(*change, 370000U);
+}
+
+TEST_F(InterfaceReaderTest, ComingAndGoingIsTimedAndStayingIsNot) {
+    addPort(m_chassis.insert("A"));
+    EXPECT_EQ(read().lastChange, 0U);
+    EXPECT_EQ(read().lastChange, 0U);
+    addPort(m_chassis.insert("B"));
+    auto const changed = read();
+    EXPECT_GE(changed.lastChange, 360000U);
+    EXPECT_GE(changed.stackLastChange, 360000U);
+    EXPECT_EQ(read().lastChange, changed.lastChange);
+}
+
+TEST_F(InterfaceReaderTest, EthernetIsAPortOfItsBoard) {
+    m_chassis.insert("A");
+    addPort(m_chassis.insert("B"));
+    auto const ports = read().ports;
+    ASSERT_THAT(ports, SizeIs(1));
+    EXPECT_EQ(ports[0].ifIndex, 1000U);
+    EXPECT_EQ(ports[0].boardIndex, 2U);
+    EXPECT_EQ(ports[0].key, (IndexKey{IndexKind::Ethernet, "1"}));
+}
+
+TEST_F(InterfaceReaderTest, InterfaceWithNothingAboveOrBelowStandsAlone) {
+    addPort(m_chassis.insert("A"));
+    EXPECT_THAT(read().stack, ElementsAre(StackRow{0, 1000}, StackRow{1000, 0}));
+}
+
+} // namespace
+} // namespace kvloamd

@@ -1,0 +1,118 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/readers/LineHistories.h"
+
+#include <memory>
+
+#include <gmock/gmock.h>
+
+#include "tests/support/FakeLines.h"
+
+namespace kvloamd {
+namespace {
+
+using ::testing::IsEmpty;
+using ::testing::SizeIs;
+
+class LineHistoriesTest : public ::testing::Test {
+  protected:
+    /// What the line tells a while after the last reading.
+    LineRow read(std::chrono::seconds later = std::chrono::seconds(1)) {
+        m_now += later;
+        m_histories.begin(m_now);
+        LineRow row;
+        m_histories.read(m_table, row);
+        return row;
+    }
+
+    FakeHistory* m_history = new FakeHistory;
+    ReferenceCounter<DS1IntervalTable> m_table{m_history};
+    LineHistories m_histories;
+    Clock::time_point m_now{std::chrono::hours(1)};
+};
+
+TEST_F(LineHistoriesTest, RunningIntervalIsReadEveryTime) {
+    m_history->run(1, 100);
+    EXPECT_EQ(read().running[0], 1);
+    m_history->run(2, 101);
+    LineRow const row = read();
+    EXPECT_EQ(row.running[0], 2);
+    EXPECT_EQ(row.timeElapsed, 101);
+    EXPECT_THAT(row.closed->counts, IsEmpty());
+}
+
+TEST_F(LineHistoriesTest, ClosedIntervalsAreSharedWhileNoneIsClosed) {
+    m_history->close(5);
+    m_history->run(0, 100);
+    LineRow const before = read();
+    m_history->run(0, 101);
+    LineRow const after = read();
+    ASSERT_THAT(after.closed->counts, SizeIs(1));
+    EXPECT_EQ(after.closed, before.closed);
+}
+
+TEST_F(LineHistoriesTest, IntervalThatHasBeenClosedIsRead) {
+    m_history->close(5);
+    m_history->run(0, 899);
+    read();
+    m_history->close(7);
+    m_history->run(0, 1);
+    LineRow const row = read();
+    ASSERT_THAT(row.closed->counts, SizeIs(2));
+    EXPECT_EQ(row.closed->counts[0][0], 7);
+    EXPECT_EQ(row.closed->counts[1][0], 5);
+    EXPECT_EQ(row.closed->total[0], 12);
+}
+
+TEST_F(LineHistoriesTest, IntervalThatIsClosedWhileTheHistoryIsFullIsRead) {
+    for (int n = 0; n <= DS1IntervalTable::kIntervals; ++n)
+        m_history->close(5);
+    m_history->run(0, 899);
+    read();
+    m_history->close(7);
+    m_history->run(0, 1);
+    LineRow const row = read();
+    ASSERT_THAT(row.closed->counts, SizeIs(DS1IntervalTable::kIntervals));
+    EXPECT_EQ(row.closed->counts[0][0], 7);
+    EXPECT_EQ(row.closed->counts[1][0], 5);
+}
+
+TEST_F(LineHistoriesTest, NewestClosedIntervalMayBeCorrectedForAWhile) {
+    m_history->close(5);
+    m_history->run(0, 5);
+    read();
+    m_history->correctNewest(3);
+    m_history->run(0, 6);
+    LineRow const row = read();
+    EXPECT_EQ(row.closed->counts[0][0], 3);
+    EXPECT_EQ(row.closed->total[0], 3);
+}
+
+TEST_F(LineHistoriesTest, EverythingIsReadAfterALongPause) {
+    for (int n = 0; n <= DS1IntervalTable::kIntervals; ++n)
+        m_history->close(5);
+    m_history->run(0, 100);
+    read();
+    // An interval later the time elapsed looks as if none had been closed.
+    m_history->close(7);
+    m_history->run(0, 101);
+    EXPECT_EQ(read(std::chrono::seconds(901)).closed->counts[0][0], 7);
+}
+
+TEST_F(LineHistoriesTest, TableThatDoesNotTellTheTimeIsReadEveryTime) {
+    m_history->close(5);
+    read();
+    m_history->correctNewest(3);
+    EXPECT_EQ(read().closed->counts[0][0], 3);
+}
+
+TEST_F(LineHistoriesTest, TableThatIsReadNoMoreIsLetGo) {
+    read();
+    m_histories.begin(m_now += std::chrono::seconds(1));
+    m_histories.begin(m_now += std::chrono::seconds(1));
+    std::weak_ptr<int> const alive = m_history->alive;
+    m_table = ReferenceCounter<DS1IntervalTable>();
+    EXPECT_TRUE(alive.expired());
+}
+
+} // namespace
+} // namespace kvloamd

@@ -1,0 +1,230 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "tests/e2e/AgentFixture.h"
+
+#include <arpa/inet.h>
+#include <sys/socket.h>
+#include <unistd.h>
+
+#include <csignal>
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <sstream>
+#include <thread>
+
+#include "agent/daemon/Options.h"
+
+namespace kvloamd::e2e {
+
+namespace {
+
+std::string inherited(char const* name) {
+    char const* const value = std::getenv(name);
+    return value == nullptr ? std::string() : value;
+}
+
+} // namespace
+
+std::vector<Answer> parseAnswers(std::string const& output) {
+    std::vector<Answer> answers;
+    for (std::string const& line : linesOf(output)) {
+        // The end of what there is, not an answer.
+        if (line.find("No more variables left in this MIB View") != std::string::npos) continue;
+        auto const equals = line.find(" = ");
+        auto name = parseOid(line.substr(0, equals));
+        if (equals != std::string::npos && name.has_value())
+            answers.push_back({std::move(*name), line.substr(equals + 3)});
+        else if (!answers.empty())
+            answers.back().value += "\n" + line; // a value of several lines
+    }
+    return answers;
+}
+
+AgentFixture::AgentFixture() {
+    std::string folder = ::testing::TempDir() + "kvloamd-XXXXXX";
+    if (mkdtemp(folder.data()) == nullptr) throw std::runtime_error("no temporary folder");
+    m_folder = folder;
+    m_snmpConfig = path("snmp.conf");
+    // The tools say so when they make it themselves.
+    std::filesystem::create_directories(path("client/cert_indexes"));
+    std::filesystem::create_directories(path("store"));
+    configureSnmp("rocommunity public 127.0.0.1\n");
+}
+
+AgentFixture::~AgentFixture() {
+    m_agent.reset();
+    m_trapReceiver.reset();
+    std::error_code ignored;
+    std::filesystem::remove_all(m_folder, ignored);
+}
+
+Process::Environment AgentFixture::environment() const {
+    Process::Environment variables{
+        {"PATH", inherited("PATH")},
+        {"HOME", m_folder},
+        {"SNMPCONFPATH", m_folder + "/none"},
+        {"SNMP_PERSISTENT_DIR", m_folder + "/client"},
+        {"KVLSIM_SOCKET", path("sim.sock")},
+        {"VQRXCFGPATH", m_folder + "/store"},
+        // The SNMP library's own leak is named in the file.
+        {"LSAN_OPTIONS", "print_suppressions=0:suppressions=" LSAN_SUPPRESSIONS},
+    };
+    for (char const* const name :
+         {"ASAN_OPTIONS", "TSAN_OPTIONS", "UBSAN_OPTIONS", "LD_LIBRARY_PATH"})
+        if (std::string value = inherited(name); !value.empty()) variables[name] = value;
+    if (m_chassis) variables["KVLSIM_CHASSIS"] = *m_chassis;
+    for (auto const& [name, value] : m_variables)
+        variables[name] = value;
+    return variables;
+}
+
+void AgentFixture::useChassis(std::string const& yaml) {
+    m_chassis = path("chassis.yaml");
+    write(*m_chassis, yaml);
+}
+
+void AgentFixture::startAgent(std::vector<std::string> const& arguments) {
+    for (int attempt = 0; attempt < 10; ++attempt) {
+        m_port = freePort();
+        std::vector<std::string> command{
+            KVLOAMD,      "--port",           std::to_string(m_port), "--module",
+            "z7sim",      "--module-dir",     moduleDirectory(),      "--snmp-config",
+            m_snmpConfig, "--persistent-dir", path("persistent")};
+        command.insert(command.end(), arguments.begin(), arguments.end());
+        m_agent = std::make_unique<Process>(command, environment());
+        if (m_agent->waitFor("kvloamd: serving ")) return;
+        // Somebody else took the port between the choice and the start.
+        if (m_agent->output().find("port is in use") == std::string::npos) break;
+    }
+    FAIL() << "the agent does not start: " << m_agent->output();
+}
+
+void AgentFixture::launchAgent(std::vector<std::string> const& arguments) {
+    std::vector<std::string> command{KVLOAMD};
+    command.insert(command.end(), arguments.begin(), arguments.end());
+    m_agent = std::make_unique<Process>(command, environment());
+}
+
+Result AgentFixture::runAgent(std::vector<std::string> const& arguments) {
+    std::vector<std::string> command{KVLOAMD};
+    command.insert(command.end(), arguments.begin(), arguments.end());
+    return run(command);
+}
+
+int AgentFixture::stopAgent() {
+    m_agent->signal(SIGTERM);
+    return m_agent->wait();
+}
+
+Result AgentFixture::run(std::vector<std::string> const& command) const {
+    Process process(command, environment());
+    int const status = process.wait();
+    return {status, process.output()};
+}
+
+Result AgentFixture::snmp(std::string const& tool,
+                          std::vector<std::string> const& arguments) const {
+    std::vector<std::string> command{tool, "-M", MIB_PATH, "-m", "KVL-OAM-MIB"};
+    command.insert(command.end(), arguments.begin(), arguments.end());
+    return run(command);
+}
+
+Result AgentFixture::ask(std::string const& tool, std::vector<std::string> const& arguments) const {
+    std::vector<std::string> all{"-v2c", "-c", "public", "-t", "30", "-r", "2", "-On", address()};
+    // The tool's own options come before the address.
+    std::size_t options = 0;
+    while (options < arguments.size() && arguments[options].starts_with("-"))
+        ++options;
+    auto const split = arguments.begin() + static_cast<std::ptrdiff_t>(options);
+    all.insert(all.end() - 1, arguments.begin(), split);
+    all.insert(all.end(), split, arguments.end());
+    return snmp(tool, all);
+}
+
+std::vector<Answer> AgentFixture::answers(std::string const& tool,
+                                          std::vector<std::string> const& arguments) const {
+    Result const result = ask(tool, arguments);
+    EXPECT_EQ(result.status, 0) << result.output;
+    return parseAnswers(result.output);
+}
+
+std::vector<Answer> AgentFixture::walk(std::string const& from) const {
+    return answers("snmpwalk", {from});
+}
+
+std::string AgentFixture::get(std::string const& name) const {
+    auto const answered = answers("snmpget", {name});
+    return answered.empty() ? "nothing" : answered.front().value;
+}
+
+void AgentFixture::sim(std::vector<std::string> const& arguments) const {
+    std::vector<std::string> command{KVLSIM};
+    command.insert(command.end(), arguments.begin(), arguments.end());
+    Result const result = run(command);
+    EXPECT_EQ(result.status, 0) << result.output;
+}
+
+bool AgentFixture::eventually(std::function<bool()> const& condition) {
+    auto const deadline = std::chrono::steady_clock::now() + kPatience;
+    while (!condition()) {
+        if (std::chrono::steady_clock::now() > deadline) return false;
+        std::this_thread::sleep_for(std::chrono::milliseconds(20));
+    }
+    return true;
+}
+
+void AgentFixture::startWithReceiver(std::string const& access) {
+    startTrapReceiver("authCommunity log public\n");
+    configureSnmp(access + " public 127.0.0.1\ntrap2sink " + trapAddress() + " public\n");
+    startAgent();
+}
+
+void AgentFixture::startTrapReceiver(std::string const& config) {
+    write(path("trapd.conf"), config);
+    for (int attempt = 0; attempt < 10; ++attempt) {
+        m_trapPort = freePort();
+        std::vector<std::string> const command{
+            "snmptrapd", "-f",     "-Lo", "-C",          "-c",  path("trapd.conf"),
+            "-M",        MIB_PATH, "-m",  "KVL-OAM-MIB", "-OQ", "udp:" + trapAddress()};
+        m_trapReceiver = std::make_unique<Process>(command, environment());
+        if (m_trapReceiver->waitFor("NET-SNMP version") &&
+            eventually([this] { return udpPortIsBound(m_trapPort); }))
+            return;
+    }
+    FAIL() << "snmptrapd does not start: " << m_trapReceiver->output();
+}
+
+bool AgentFixture::udpPortIsBound(int port) {
+    char wanted[16];
+    std::snprintf(wanted, sizeof wanted, ":%04X ", static_cast<unsigned>(port));
+    std::ifstream table("/proc/net/udp");
+    for (std::string line; std::getline(table, line);)
+        if (line.find(wanted) != std::string::npos) return true;
+    return false;
+}
+
+int AgentFixture::freePort() {
+    int const probe = socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0);
+    sockaddr_in address{};
+    address.sin_family = AF_INET;
+    address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+    socklen_t size = sizeof address;
+    bool const bound = bind(probe, reinterpret_cast<sockaddr*>(&address), size) == 0 &&
+                       getsockname(probe, reinterpret_cast<sockaddr*>(&address), &size) == 0;
+    close(probe);
+    if (!bound) throw std::runtime_error("no free port on loopback");
+    return ntohs(address.sin_port);
+}
+
+std::string AgentFixture::moduleDirectory() const {
+    return MODULE_DIR;
+}
+
+void AgentFixture::write(std::string const& file, std::string const& text) {
+    std::ofstream stream(file);
+    stream << text;
+    stream.close();
+    ASSERT_TRUE(stream.good()) << file;
+}
+
+} // namespace kvloamd::e2e

@@ -1,0 +1,114 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Tests of the real agent with the real SNMP tools, over loopback.
+#pragma once
+
+#include <functional>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include <gtest/gtest.h>
+
+#include "agent/objects/Value.h"
+#include "tests/e2e/Process.h"
+
+namespace kvloamd::e2e {
+
+struct Result {
+    int status = 0;
+    std::string output;
+};
+
+/// One line of a walk: "1.3.6.1 ... = STRING: x".
+struct Answer {
+    Oid name;
+    std::string value;
+
+    bool operator==(Answer const&) const = default;
+};
+
+/// Each test has a folder and a platform of its own; everything that it starts ends with it.
+class AgentFixture : public ::testing::Test {
+  protected:
+    AgentFixture();
+    ~AgentFixture() override;
+
+    /// What the SNMP configuration file of agents started later says. Anybody on loopback may read
+    /// by default.
+    void configureSnmp(std::string const& text) { write(m_snmpConfig, text); }
+    /// The chassis of agents started later; without it, the simulator's own of three boards.
+    void useChassis(std::string const& yaml);
+
+    /// Starts the agent on a free port and waits until it serves.
+    void startAgent(std::vector<std::string> const& arguments = {});
+    /// Starts the agent with these arguments only; it need not serve yet.
+    void launchAgent(std::vector<std::string> const& arguments);
+    /// Starts the agent with these arguments only, waits for its end.
+    Result runAgent(std::vector<std::string> const& arguments);
+    Process& agent() { return *m_agent; }
+    /// Ends the agent with SIGTERM. Returns its exit status.
+    int stopAgent();
+
+    /// Runs one of the SNMP tools against the agent. The names of KVL-OAM-MIB may be used.
+    Result snmp(std::string const& tool, std::vector<std::string> const& arguments) const;
+    /// As reader of version 2c, printing names as numbers.
+    Result ask(std::string const& tool, std::vector<std::string> const& arguments) const;
+    /// The same, with the answers read; expects success.
+    std::vector<Answer> answers(std::string const& tool,
+                                std::vector<std::string> const& arguments) const;
+    std::vector<Answer> walk(std::string const& from = kObjects) const;
+    /// The value of one instance, with names; such as "INTEGER: started(3)".
+    std::string get(std::string const& name) const;
+
+    /// Runs the simulator's control tool on the agent's platform; expects success.
+    void sim(std::vector<std::string> const& arguments) const;
+    /// Waits until `condition` holds.
+    static bool eventually(std::function<bool()> const& condition);
+
+    /// Starts to receive notifications. Before `startAgent`, whose configuration names the port.
+    void startTrapReceiver(std::string const& config);
+    Process& trapReceiver() { return *m_trapReceiver; }
+    /// Starts a receiver of notifications of version 2c and the agent, which sends them there;
+    /// `access` is what the community public gets.
+    void startWithReceiver(std::string const& access = "rocommunity");
+
+    static int freePort();
+    /// Whether somebody on this host has bound the UDP port, as the kernel lists it.
+    static bool udpPortIsBound(int port);
+    /// Has the SNMP tools ask whoever serves this port of loopback.
+    void askPort(int port) { m_port = port; }
+    /// What children started later see beside the fixture's own variables.
+    void setVariable(std::string const& name, std::string const& value) {
+        m_variables[name] = value;
+    }
+    std::string address() const { return "127.0.0.1:" + std::to_string(m_port); }
+    std::string trapAddress() const { return "127.0.0.1:" + std::to_string(m_trapPort); }
+    std::string path(std::string const& name) const { return m_folder + "/" + name; }
+    std::string moduleDirectory() const;
+    static void write(std::string const& file, std::string const& text);
+    /// Runs any program; waits for its end.
+    Result run(std::vector<std::string> const& command) const;
+
+    static constexpr char kObjects[] = "1.3.6.1.4.1.32473.1";
+    static constexpr char kBoards[] = "1.3.6.1.4.1.32473.1.1.2";
+    static constexpr char kTable[] = "1.3.6.1.4.1.32473.1.1.2.4";
+
+    /// What children see of the environment.
+    Process::Environment environment() const;
+
+  private:
+    std::string m_folder;
+    std::string m_snmpConfig;
+    std::optional<std::string> m_chassis;
+    Process::Environment m_variables;
+    int m_port = 0;
+    int m_trapPort = 0;
+    std::unique_ptr<Process> m_trapReceiver;
+    std::unique_ptr<Process> m_agent;
+};
+
+/// The lines of a tool that printed names as numbers.
+std::vector<Answer> parseAnswers(std::string const& output);
+
+} // namespace kvloamd::e2e

@@ -1,0 +1,292 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The physical entities and their states, asked of the real agent by number.
+#include <algorithm>
+#include <cstdio>
+#include <map>
+
+#include <gmock/gmock.h>
+
+#include "agent/daemon/Options.h"
+#include "tests/e2e/AgentFixture.h"
+
+namespace kvloamd::e2e {
+namespace {
+
+using ::testing::HasSubstr;
+using ::testing::Not;
+using ::testing::SizeIs;
+
+constexpr char kEntity[] = "1.3.6.1.2.1.47";
+constexpr char kPhysical[] = "1.3.6.1.2.1.47.1.1.1.1.";
+constexpr char kAlias[] = "1.3.6.1.2.1.47.1.3.2.1.2";
+constexpr char kContains[] = "1.3.6.1.2.1.47.1.3.3.1.1";
+constexpr char kLastChange[] = "1.3.6.1.2.1.47.1.4.1.0";
+constexpr char kState[] = "1.3.6.1.2.1.131.1.1.1.";
+
+// As a receiver that has no files of the standard MIB modules prints them.
+constexpr char kConfigChange[] = "SNMPv2-SMI::mib-2.47.2.0.1";
+constexpr char kOperEnabled[] = "SNMPv2-SMI::mib-2.131.0.1";
+constexpr char kOperDisabled[] = "SNMPv2-SMI::mib-2.131.0.2";
+
+class EntityTest : public AgentFixture {
+  protected:
+    /// The values of a column by what follows its number, "17".
+    std::map<std::string, std::string> column(std::string const& name) const {
+        std::map<std::string, std::string> values;
+        for (Answer const& answer : answers("snmpbulkwalk", {"-Oe", "-Cr50", name})) {
+            if (answer.value.starts_with("No Such")) continue;
+            std::string index;
+            for (std::size_t i = parseOid(name)->size(); i < answer.name.size(); ++i)
+                index += (index.empty() ? "" : ".") + std::to_string(answer.name[i]);
+            values[index] = answer.value;
+        }
+        return values;
+    }
+    std::map<std::string, std::string> physical(int number) const {
+        return column(kPhysical + std::to_string(number));
+    }
+    std::string state(int number, std::string const& entity) const {
+        return get(kState + std::to_string(number) + "." + entity);
+    }
+    /// The index in which a column has a text; "none" when there is none.
+    std::string entityWith(int number, std::string const& text) const {
+        for (auto const& [index, value] : physical(number))
+            if (value == "STRING: \"" + text + "\"") return index;
+        return "none";
+    }
+    std::string boardOf(std::string const& serialNumber) const {
+        return entityWith(11, serialNumber);
+    }
+    std::string portNamed(std::string const& name) const { return entityWith(7, name); }
+    long lastChange() const {
+        std::string const value = get(kLastChange);
+        auto const open = value.find('(');
+        return open == std::string::npos ? -1 : std::stol(value.substr(open + 1));
+    }
+    std::string containerOf(std::string const& entity) const {
+        return get(kPhysical + ("4." + entity)).substr(std::string("INTEGER: ").size());
+    }
+    /// The agent's uptime, in seconds, in every notification of that name.
+    std::vector<double> uptimesOf(std::string const& notification) {
+        std::vector<double> times;
+        for (std::string const& line : linesOf(trapReceiver().output())) {
+            int hours = 0;
+            int minutes = 0;
+            double seconds = 0;
+            if (line.find(notification) != std::string::npos &&
+                std::sscanf(line.c_str(), "%*s = 0:%d:%d:%lf", &hours, &minutes, &seconds) == 3)
+                times.push_back(hours * 3600 + minutes * 60 + seconds);
+        }
+        return times;
+    }
+    /// A board of a chassis in the slot of its handle, with a processor and a line.
+    static std::string boardInSlot(int handle, std::string const& serialNumber) {
+        std::string const number = std::to_string(handle);
+        return "  - handle: " + number + "\n    attributes: {SERIAL_NUMBER: " + serialNumber +
+               ", PCI_SLOT_NUMBER: " + number + "}\n    devices: [{handle: " + number +
+               "0, type: 501, attributes: {NAME: line-" + serialNumber +
+               "}, line: {type: esf}}]\n    processors: [{handle: " + number + "1}]\n";
+    }
+};
+
+TEST_F(EntityTest, ExampleChassisHasAnEntityForEveryPart) {
+    startAgent();
+    std::map<std::string, int> classes;
+    for (auto const& [index, value] : physical(5))
+        ++classes[value];
+    EXPECT_EQ(classes["INTEGER: 3"], 1);  // the chassis
+    EXPECT_EQ(classes["INTEGER: 5"], 3);  // slots
+    EXPECT_EQ(classes["INTEGER: 9"], 3);  // boards
+    EXPECT_EQ(classes["INTEGER: 12"], 4); // processors
+    EXPECT_EQ(classes["INTEGER: 10"], 7); // ports
+    EXPECT_THAT(classes, SizeIs(5));
+    EXPECT_EQ(get(kLastChange), "Timeticks: (0) 0:00:00.00");
+}
+
+TEST_F(EntityTest, EveryEntityLeadsToTheChassis) {
+    startAgent();
+    auto const containers = physical(4);
+    EXPECT_THAT(containers, SizeIs(18));
+    for (auto const& [entity, container] : containers) {
+        std::string at = entity;
+        for (int steps = 0; containers.contains(at) && steps < 5; ++steps)
+            at = containers.at(at).substr(std::string("INTEGER: ").size());
+        EXPECT_EQ(at, "0") << entity;
+    }
+    // The table of contents says the same.
+    auto const contains = column(kContains);
+    EXPECT_THAT(contains, SizeIs(17));
+    for (auto const& [pair, child] : contains) {
+        auto const dot = pair.find('.');
+        EXPECT_EQ(containers.at(pair.substr(dot + 1)), "INTEGER: " + pair.substr(0, dot));
+        EXPECT_EQ(child, "INTEGER: " + pair.substr(dot + 1));
+    }
+}
+
+TEST_F(EntityTest, BoardIsDescribed) {
+    startAgent();
+    std::string const board = boardOf("NX50001");
+    EXPECT_EQ(physical(2).at(board), "STRING: \"Dual-span T1 trunk board\"");
+    EXPECT_EQ(get(kPhysical + ("3." + board)), "OID: .0.0");
+    EXPECT_EQ(physical(7).at(board), "STRING: \"NX5-T1\"");
+    EXPECT_EQ(physical(9).at(board), "STRING: \"4.2.117\"");
+    EXPECT_EQ(physical(16).at(board), "INTEGER: 1");
+    std::string const slot = containerOf(board);
+    EXPECT_EQ(physical(7).at(slot), "STRING: \"shelf 1 bus 2 slot 4\"");
+    EXPECT_EQ(physical(6).at(slot), "INTEGER: 4");
+}
+
+TEST_F(EntityTest, PortIsMappedToTheInterfaceOfItsName) {
+    startAgent();
+    auto const aliases = column(kAlias);
+    EXPECT_THAT(aliases, SizeIs(7));
+    std::string const alias = aliases.at(portNamed("quillon-span-1") + ".0");
+    // "OID: .1.3.6.1.2.1.2.2.1.1.1032"
+    ASSERT_THAT(alias, HasSubstr("1.3.6.1.2.1.2.2.1.1."));
+    std::string const index = alias.substr(alias.rfind('.') + 1);
+    EXPECT_EQ(get("1.3.6.1.2.1.31.1.1.1.1." + index), "STRING: \"quillon-span-1\"");
+}
+
+TEST_F(EntityTest, WalkIsInOrderAndEveryInstanceCanBeAsked) {
+    startAgent();
+    for (char const* const from : {kEntity, "1.3.6.1.2.1.131"}) {
+        auto const walked = walk(from);
+        EXPECT_GT(walked.size(), 50U);
+        EXPECT_EQ(std::ranges::adjacent_find(walked,
+                                             [](Answer const& a, Answer const& b) {
+                                                 return compare(a.name, b.name) >= 0;
+                                             }),
+                  walked.end());
+        EXPECT_EQ(answers("snmpbulkwalk", {"-Cr50", from}), walked);
+        for (std::size_t i = 0; i < walked.size(); i += 17) {
+            std::string name;
+            for (std::uint32_t const number : walked[i].name)
+                name += "." + std::to_string(number);
+            EXPECT_EQ(get(name), walked[i].value) << name;
+        }
+    }
+}
+
+TEST_F(EntityTest, PulledBoardIsGoneAndComesBackUnderItsIndices) {
+    useChassis("boards:\n" + boardInSlot(1, "ONE") + boardInSlot(2, "TWO"));
+    startWithReceiver();
+    auto const before = physical(7);
+    ASSERT_THAT(before, SizeIs(9)); // the chassis, and twice slot, board, processor and port
+    std::string const board = boardOf("TWO");
+    std::string const port = portNamed("line-TWO");
+
+    sim({"remove", "2"});
+    EXPECT_TRUE(trapReceiver().waitFor(kConfigChange)) << trapReceiver().output();
+    auto const without = physical(7);
+    EXPECT_THAT(without, SizeIs(5));
+    EXPECT_FALSE(without.contains(board));
+    EXPECT_EQ(state(3, board), "No Such Instance currently exists at this OID");
+    long const removed = lastChange();
+    EXPECT_GT(removed, 0);
+
+    // In another slot, which is an entity of its own; the board is the same.
+    write(path("board.yaml"), "boards:\n" + boardInSlot(5, "TWO"));
+    sim({"insert", path("board.yaml")});
+    EXPECT_TRUE(eventually([&] { return portNamed("line-TWO") == port; }));
+    EXPECT_EQ(boardOf("TWO"), board);
+    EXPECT_THAT(physical(7).at(containerOf(board)), HasSubstr("slot 5"));
+    EXPECT_GT(lastChange(), removed);
+    EXPECT_TRUE(trapReceiver().waitFor(kConfigChange, 2)) << trapReceiver().output();
+    EXPECT_THAT(trapReceiver().output(), Not(HasSubstr(kOperDisabled)));
+    EXPECT_THAT(trapReceiver().output(), Not(HasSubstr(kOperEnabled)));
+}
+
+TEST_F(EntityTest, ChangesWithinThePauseAreToldAtItsEnd) {
+    startWithReceiver();
+    sim({"remove", "1"});
+    EXPECT_TRUE(trapReceiver().waitFor(kConfigChange)) << trapReceiver().output();
+    sim({"remove", "2"});
+    sim({"remove", "3"});
+    EXPECT_TRUE(eventually([&] { return physical(5).size() == 1; }));
+    EXPECT_TRUE(trapReceiver().waitFor(kConfigChange, 2)) << trapReceiver().output();
+    auto const times = uptimesOf(kConfigChange);
+    ASSERT_GE(times.size(), 2U);
+    // The second that is missing to the pause is for a machine that is busy.
+    for (std::size_t i = 1; i < times.size(); ++i)
+        EXPECT_GE(times[i] - times[i - 1], 4.0);
+}
+
+TEST_F(EntityTest, StoppedBoardIsToldAsDisabledAndStartedOneAsEnabled) {
+    startWithReceiver();
+    std::string const board = boardOf("NX50001");
+    EXPECT_EQ(state(3, board), "INTEGER: 3");
+    sim({"stop", "1"});
+    std::string const objects = "\tSNMPv2-SMI::mib-2.131.1.1.1.2." + board + " = ";
+    EXPECT_TRUE(trapReceiver().waitFor(kOperDisabled + objects + "2")) << trapReceiver().output();
+    EXPECT_EQ(state(2, board), "INTEGER: 2");
+    EXPECT_EQ(state(3, board), "INTEGER: 2");
+    EXPECT_EQ(state(6, board), "INTEGER: 1");
+    sim({"start", "1"});
+    EXPECT_TRUE(trapReceiver().waitFor(kOperEnabled + objects + "4")) << trapReceiver().output();
+    EXPECT_EQ(state(2, board), "INTEGER: 4");
+    EXPECT_EQ(state(6, board), "INTEGER: 4");
+}
+
+TEST_F(EntityTest, FailedBoardHasACriticalAlarm) {
+    startWithReceiver();
+    std::string const board = boardOf("NX50001");
+    EXPECT_EQ(state(5, board), "Hex-STRING: 00 ");
+    sim({"fail", "1"});
+    EXPECT_TRUE(trapReceiver().waitFor(kOperDisabled)) << trapReceiver().output();
+    EXPECT_THAT(trapReceiver().output(), HasSubstr("mib-2.131.1.1.1.5." + board + " = \" \""));
+    EXPECT_EQ(state(2, board), "INTEGER: 1");
+    EXPECT_EQ(state(3, board), "INTEGER: 2");
+}
+
+TEST_F(EntityTest, BrokenLineIsADisabledPortWithAnAlarm) {
+    startWithReceiver();
+    std::string const port = portNamed("nx5-trunk-2");
+    EXPECT_EQ(state(3, port), "INTEGER: 3");
+    EXPECT_EQ(state(5, port), "Hex-STRING: 00 ");
+    sim({"line", "alarm", "102", "ais"});
+    EXPECT_TRUE(eventually([&] { return state(5, port) == "Hex-STRING: 10 "; }));
+    EXPECT_EQ(state(3, port), "INTEGER: 2");
+    EXPECT_TRUE(trapReceiver().waitFor(std::string(kOperDisabled) +
+                                       "\tSNMPv2-SMI::mib-2.131.1.1.1.2." + port + " = 4"))
+        << trapReceiver().output();
+    sim({"line", "mend", "102"});
+    EXPECT_TRUE(eventually([&] { return state(3, port) == "INTEGER: 3"; }));
+}
+
+TEST_F(EntityTest, PortWithCallsIsActive) {
+    startAgent();
+    std::string const port = portNamed("vorn-primary-rate-1");
+    EXPECT_EQ(state(4, port), "INTEGER: 2"); // idle
+    sim({"call", "setup", "301"});
+    EXPECT_TRUE(eventually([&] { return state(4, port) == "INTEGER: 3"; })); // active
+    EXPECT_EQ(state(4, portNamed("vorn-primary-rate-2")), "INTEGER: 2");
+    EXPECT_EQ(state(4, portNamed("nx5-trunk-1")), "INTEGER: 1"); // nobody knows
+}
+
+TEST_F(EntityTest, IndicesAreTheSameAfterARestart) {
+    startAgent();
+    sim({"remove", "1"});
+    EXPECT_TRUE(eventually([&] { return boardOf("NX50001") == "none"; }));
+    auto const before = physical(7);
+    EXPECT_EQ(stopAgent(), 0);
+    // The chassis of the start again: what was there before is where it was.
+    startAgent();
+    auto const after = physical(7);
+    EXPECT_GT(after.size(), before.size());
+    EXPECT_TRUE(std::ranges::all_of(before, [&](auto const& entity) {
+        auto const found = after.find(entity.first);
+        return found != after.end() && found->second == entity.second;
+    }));
+}
+
+TEST_F(EntityTest, NothingCanBeWritten) {
+    configureSnmp("rwcommunity public 127.0.0.1\n");
+    startAgent();
+    Result const set = ask("snmpset", {kState + ("2." + boardOf("NX50001")), "i", "2"});
+    EXPECT_NE(set.status, 0);
+    EXPECT_THAT(set.output, HasSubstr("notWritable"));
+    EXPECT_EQ(state(2, boardOf("NX50001")), "INTEGER: 4");
+}
+
+} // namespace
+} // namespace kvloamd::e2e

@@ -1,0 +1,174 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Lines and links that change, as a notification receiver prints them.
+#include <gmock/gmock.h>
+
+#include "tests/e2e/AgentFixture.h"
+
+namespace kvloamd::e2e {
+namespace {
+
+using ::testing::HasSubstr;
+using ::testing::Not;
+
+/// Of the line of index 1000, which is device 101, and its link.
+constexpr char kLineTraps[] = "1.3.6.1.2.1.10.18.6.1.17.1000";
+constexpr char kLinkTraps[] = "1.3.6.1.2.1.31.1.1.1.14.1000";
+
+/// A cut line has no signal, and tells its far end.
+constexpr char kCut[] = "68";
+constexpr char kWhole[] = "1";
+
+constexpr char kAnyLine[] = "mib-2.10.18.15.0.1";
+constexpr char kAnyLinkDown[] = "snmpModules.1.1.5.3";
+
+class LineNotificationTest : public AgentFixture {
+  protected:
+    /// Starts receiver and agent, with notifications of version 3.
+    void startWithUser() {
+        startTrapReceiver("createUser -e 0x8000000001020304 op SHA authpass1 AES privpass1\n"
+                          "authUser log op priv\n");
+        configureSnmp("exactEngineID 0x8000000001020304\n"
+                      "rwcommunity public 127.0.0.1\n"
+                      "createUser op SHA authpass1 AES privpass1\n"
+                      "trapsess -v 3 -u op -l authPriv -a SHA -A authpass1 -x AES -X privpass1 " +
+                      trapAddress() + "\n");
+        startAgent();
+    }
+    void set(std::string const& name, std::string const& value) const {
+        Result const result = ask("snmpset", {name, "i", value});
+        EXPECT_EQ(result.status, 0) << result.output;
+    }
+    void cut() const { sim({"line", "alarm", "101", "los"}); }
+    void mend() const { sim({"line", "mend", "101"}); }
+
+    void expectTold(std::string const& text) {
+        EXPECT_TRUE(trapReceiver().waitFor(text)) << text << " not in:\n"
+                                                  << trapReceiver().output();
+    }
+    void expectLineTold(std::string const& status) {
+        expectTold("1.1.4.1.0 = SNMPv2-SMI::mib-2.10.18.15.0.1\tSNMPv2-SMI::mib-2.10.18.6.1.10."
+                   "1000 = " +
+                   status + "\tSNMPv2-SMI::mib-2.10.18.6.1.16.1000 = ");
+    }
+    /// `number`: 3 for linkDown, 4 for linkUp.
+    void expectLinkTold(int number, std::string const& index, int operStatus) {
+        expectTold("1.1.4.1.0 = SNMPv2-SMI::snmpModules.1.1.5." + std::to_string(number) +
+                   "\tSNMPv2-SMI::mib-2.2.2.1.1." + index + " = " + index +
+                   "\tSNMPv2-SMI::mib-2.2.2.1.7." + index + " = 1\tSNMPv2-SMI::mib-2.2.2.1.8." +
+                   index + " = " + std::to_string(operStatus));
+    }
+    /// The ifIndex of the interface of that name.
+    std::string indexOf(std::string const& name) const {
+        for (Answer const& answer : walk("1.3.6.1.2.1.31.1.1.1.1"))
+            if (answer.value == "STRING: \"" + name + "\"")
+                return std::to_string(answer.name.back());
+        return "none";
+    }
+};
+
+TEST_F(LineNotificationTest, LineForWhichItIsEnabledIsToldCutAndWhole) {
+    startWithReceiver("rwcommunity");
+    set(kLineTraps, "1");
+    cut();
+    expectLineTold(kCut);
+    mend();
+    expectLineTold(kWhole);
+}
+
+TEST_F(LineNotificationTest, ThirdVersionCarriesLinesAndLinks) {
+    startWithUser();
+    set(kLineTraps, "1");
+    cut();
+    expectLineTold(kCut);
+    expectLinkTold(3, "1000", 2);
+}
+
+TEST_F(LineNotificationTest, LineForWhichItIsNotEnabledIsNotTold) {
+    startWithReceiver("rwcommunity");
+    cut();
+    expectLinkTold(3, "1000", 2);
+    mend();
+    // What the line had to tell would have come before this.
+    expectLinkTold(4, "1000", 1);
+    EXPECT_THAT(trapReceiver().output(), Not(HasSubstr(kAnyLine)));
+}
+
+TEST_F(LineNotificationTest, LineForWhichItIsDisabledAgainIsNotTold) {
+    startWithReceiver("rwcommunity");
+    set(kLineTraps, "1");
+    cut();
+    expectLineTold(kCut);
+    set(kLineTraps, "2");
+    mend();
+    expectLinkTold(4, "1000", 1);
+    EXPECT_EQ(trapReceiver().output().find(kAnyLine), trapReceiver().output().rfind(kAnyLine));
+}
+
+TEST_F(LineNotificationTest, LinkIsToldDownAndUp) {
+    startWithReceiver("rwcommunity");
+    cut();
+    expectLinkTold(3, "1000", 2);
+    mend();
+    expectLinkTold(4, "1000", 1);
+}
+
+TEST_F(LineNotificationTest, LinkForWhichItIsDisabledIsNotTold) {
+    startWithReceiver("rwcommunity");
+    set(kLineTraps, "1");
+    set(kLinkTraps, "2");
+    cut();
+    expectLineTold(kCut);
+    mend();
+    expectLineTold(kWhole);
+    EXPECT_THAT(trapReceiver().output(), Not(HasSubstr(kAnyLinkDown)));
+}
+
+TEST_F(LineNotificationTest, ChannelIsToldWhenItIsEnabled) {
+    startWithReceiver("rwcommunity");
+    std::string const channel = indexOf("D1");
+    ASSERT_NE(channel, "none");
+    sim({"call", "signalling", "301", "l2"});
+    ASSERT_TRUE(eventually([&] { return get("1.3.6.1.2.1.2.2.1.8." + channel) == "INTEGER: 1"; }));
+    set("1.3.6.1.2.1.31.1.1.1.14." + channel, "1");
+    sim({"call", "signalling", "301", "l1"});
+    expectLinkTold(3, channel, 2);
+}
+
+TEST_F(LineNotificationTest, TablesShowTheChangeWhenItsNotificationArrives) {
+    startWithReceiver("rwcommunity");
+    set(kLineTraps, "1");
+    cut();
+    expectLineTold(kCut);
+    EXPECT_EQ(get("1.3.6.1.2.1.10.18.6.1.10.1000"), "INTEGER: 68");
+    EXPECT_EQ(get("1.3.6.1.2.1.2.2.1.8.1000"), "INTEGER: 2");
+}
+
+TEST_F(LineNotificationTest, LineIsToldAfterARestartToo) {
+    startWithReceiver("rwcommunity");
+    set(kLineTraps, "1");
+    EXPECT_EQ(stopAgent(), 0) << agent().output();
+    startAgent();
+    cut();
+    expectLineTold(kCut);
+}
+
+TEST_F(LineNotificationTest, LineOfABoardThatHasComeBackIsToldAndItsComingIsNot) {
+    useChassis("boards:\n"
+               "  - handle: 1\n"
+               "    attributes: {SERIAL_NUMBER: ONE}\n"
+               "    devices: [{handle: 101, type: 501, attributes: {NAME: trunk}, "
+               "line: {type: esf}}]\n");
+    startWithReceiver("rwcommunity");
+    set(kLineTraps, "1");
+    sim({"remove", "1"});
+    ASSERT_TRUE(eventually([&] { return get(kLineTraps).starts_with("No Such"); }));
+    sim({"insert", path("chassis.yaml")});
+    ASSERT_TRUE(eventually([&] { return get(kLineTraps) == "INTEGER: 1"; }));
+    EXPECT_THAT(trapReceiver().output(), Not(HasSubstr(kAnyLinkDown)));
+    cut();
+    expectLineTold(kCut);
+    expectLinkTold(3, "1000", 2);
+}
+
+} // namespace
+} // namespace kvloamd::e2e

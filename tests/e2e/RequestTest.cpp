@@ -1,0 +1,138 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Single requests: what is not there, what may not be written, who may see what.
+#include <gmock/gmock.h>
+
+#include "tests/e2e/AgentFixture.h"
+
+namespace kvloamd::e2e {
+namespace {
+
+using ::testing::Each;
+using ::testing::ElementsAre;
+using ::testing::EndsWith;
+using ::testing::HasSubstr;
+using ::testing::IsEmpty;
+using ::testing::Not;
+using ::testing::SizeIs;
+
+class RequestTest : public AgentFixture {
+  protected:
+    Result set(std::string const& name, std::string const& type, std::string const& value) {
+        return snmp("snmpset", {"-v2c", "-c", "private", address(), name, type, value});
+    }
+};
+
+TEST_F(RequestTest, RowThatIsNotThereIsNoInstance) {
+    startAgent();
+    EXPECT_THAT(get("kvlBoardName.99"), HasSubstr("No Such Instance"));
+}
+
+TEST_F(RequestTest, ColumnThatIsNotThereIsNoObject) {
+    startAgent();
+    EXPECT_THAT(get(std::string(kTable) + ".1.21.1"), HasSubstr("No Such Object"));
+}
+
+TEST_F(RequestTest, IndexIsNotAccessible) {
+    startAgent();
+    EXPECT_THAT(get("kvlBoardIndex.1"), HasSubstr("No Such Object"));
+}
+
+TEST_F(RequestTest, FirstVersionAnswersAnUnknownRowWithItsError) {
+    startAgent();
+    Result const result =
+        snmp("snmpget", {"-v1", "-c", "public", "-r", "0", address(), "kvlBoardName.99"});
+    EXPECT_EQ(result.status, 2);
+    EXPECT_THAT(result.output, HasSubstr("noSuchName"));
+}
+
+TEST_F(RequestTest, FirstVersionReadsTheTable) {
+    startAgent();
+    Result const result = snmp("snmpwalk", {"-v1", "-c", "public", "-On", address(), kTable});
+    EXPECT_EQ(result.status, 0);
+    EXPECT_EQ(parseAnswers(result.output), walk(kTable));
+}
+
+TEST_F(RequestTest, ScalarCanNotBeWritten) {
+    configureSnmp("rwcommunity private 127.0.0.1\n");
+    startAgent();
+    Result const result = set("kvlAgentVersion.0", "s", "mine");
+    EXPECT_EQ(result.status, 2);
+    EXPECT_THAT(result.output, HasSubstr("notWritable"));
+}
+
+TEST_F(RequestTest, CellCanNotBeWritten) {
+    configureSnmp("rwcommunity private 127.0.0.1\nrocommunity public 127.0.0.1\n");
+    startAgent();
+    EXPECT_THAT(set("kvlBoardName.1", "s", "mine").output, HasSubstr("notWritable"));
+    EXPECT_EQ(get("kvlBoardName.1"), "STRING: NX5-T1");
+}
+
+TEST_F(RequestTest, ObjectsMoveWithTheEnterpriseArc) {
+    startAgent({"--enterprise-oid", "1.3.6.1.4.1.55555.7"});
+    EXPECT_THAT(walk("1.3.6.1.4.1.55555.7.1.1.2"), SizeIs(3 + 3 * 19));
+    EXPECT_THAT(ask("snmpgetnext", {kObjects}).output, Not(HasSubstr(".32473.")));
+}
+
+TEST_F(RequestTest, AgentListensOnSeveralAddresses) {
+    std::string const second = "127.0.0.1:" + std::to_string(freePort());
+    std::string const third = "tcp:127.0.0.1:" + std::to_string(freePort());
+    write(path("kvloamd.toml"),
+          "module=[\"z7sim\"]\nlisten=[\"udp:" + second + "\", \"" + third + "\"]\n");
+    Process agent({KVLOAMD, "--config", path("kvloamd.toml"), "--module-dir", moduleDirectory(),
+                   "--snmp-config", path("snmp.conf"), "--persistent-dir", path("persistent")},
+                  environment());
+    ASSERT_TRUE(agent.waitFor("kvloamd: serving "));
+    for (std::string const& place : {second, third}) {
+        Result const result =
+            snmp("snmpget", {"-v2c", "-c", "public", "-t", "30", place, "kvlBoardCount.0"});
+        EXPECT_THAT(result.output, HasSubstr("Gauge32: 3")) << place;
+    }
+}
+
+/// A reader who may see the boards' names, and the status of the second board.
+class RestrictedViewTest : public AgentFixture {
+  protected:
+    RestrictedViewTest() {
+        configureSnmp("com2sec reader 127.0.0.1 public\n"
+                      "group readers v2c reader\n"
+                      "view some included .1.3.6.1.4.1.32473.1.1.2.4.1.4\n"
+                      "view some included .1.3.6.1.4.1.32473.1.1.2.4.1.2.2\n"
+                      "access readers \"\" any noauth exact some none none\n");
+    }
+    static std::vector<std::string> values(std::vector<Answer> const& answers) {
+        std::vector<std::string> result;
+        for (Answer const& answer : answers)
+            result.push_back(answer.value);
+        return result;
+    }
+};
+
+TEST_F(RestrictedViewTest, WalkShowsWhatTheReaderMaySee) {
+    startAgent();
+    EXPECT_THAT(values(walk()), ElementsAre("INTEGER: started(3)", "STRING: NX5-T1",
+                                            "STRING: QUILLON-E1", "STRING: VORN-E1"));
+}
+
+TEST_F(RestrictedViewTest, BulkWalkShowsNoMore) {
+    startAgent();
+    for (char const* const repetitions : {"-Cr1", "-Cr3", "-Cr50"})
+        EXPECT_EQ(values(answers("snmpbulkwalk", {repetitions, kObjects})), values(walk()))
+            << repetitions;
+}
+
+TEST_F(RestrictedViewTest, BulkRequestForSeveralColumnsShowsNoMore) {
+    startAgent();
+    auto const shown = values(
+        answers("snmpbulkget", {"-Cr9", "kvlBoardStatus", "kvlBoardName", "kvlBoardSerialNumber"}));
+    EXPECT_THAT(shown, Not(IsEmpty()));
+    EXPECT_THAT(shown, Each(::testing::AnyOf("INTEGER: started(3)", "STRING: NX5-T1",
+                                             "STRING: QUILLON-E1", "STRING: VORN-E1")));
+}
+
+TEST_F(RestrictedViewTest, GetOfWhatTheReaderMayNotSeeIsNoObject) {
+    startAgent();
+    EXPECT_THAT(get("kvlBoardSerialNumber.1"), HasSubstr("No Such Object"));
+}
+
+} // namespace
+} // namespace kvloamd::e2e

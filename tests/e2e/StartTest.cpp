@@ -1,0 +1,157 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// What the agent says when it can not start, and what it checks without starting.
+#include <sys/stat.h>
+
+#include <algorithm>
+
+#include <gmock/gmock.h>
+
+#include "agent/daemon/Options.h"
+#include "tests/e2e/AgentFixture.h"
+
+namespace kvloamd::e2e {
+namespace {
+
+using ::testing::AllOf;
+using ::testing::HasSubstr;
+using ::testing::Not;
+using ::testing::SizeIs;
+
+class StartTest : public AgentFixture {
+  protected:
+    /// Arguments of a start that would succeed, and those of the test, which come last and win.
+    Result start(std::vector<std::string> arguments, std::string const& moduleFolder = {}) {
+        std::vector<std::string> all{
+            "--snmp-config",    path("snmp.conf"),
+            "--persistent-dir", path("persistent"),
+            "--module-dir",     moduleFolder.empty() ? moduleDirectory() : moduleFolder};
+        if (std::ranges::find(arguments, "--port") == arguments.end()) {
+            all.emplace_back("--port");
+            all.push_back(std::to_string(freePort()));
+        }
+        all.insert(all.end(), arguments.begin(), arguments.end());
+        return runAgent(all);
+    }
+    /// The start fails with one line that says all of this.
+    static void expectOneLine(Result const& result, int status,
+                              ::testing::Matcher<std::string> const& text) {
+        EXPECT_EQ(result.status, status) << result.output;
+        EXPECT_THAT(linesOf(result.output), SizeIs(1)) << result.output;
+        EXPECT_THAT(result.output, AllOf(HasSubstr("kvloamd: "), text));
+    }
+};
+
+TEST_F(StartTest, PortInUseIsNamedWithTheRemedy) {
+    startAgent();
+    std::string const port = address().substr(address().find(':') + 1);
+    expectOneLine(start({"--module", "z7sim", "--port", port}), kExitFailure,
+                  AllOf(HasSubstr(address()), HasSubstr("in use"), HasSubstr("--port")));
+    EXPECT_EQ(get("kvlBoardCount.0"), "Gauge32: 3 boards");
+}
+
+TEST_F(StartTest, AddressOfAnotherHostIsRefused) {
+    Result const result = runAgent({"--module", "z7sim", "--module-dir", moduleDirectory(),
+                                    "--snmp-config", path("snmp.conf"), "--persistent-dir",
+                                    path("persistent"), "--listen", "udp:192.0.2.1:1161"});
+    EXPECT_EQ(result.status, kExitFailure);
+    EXPECT_THAT(result.output, HasSubstr("can not listen on udp:192.0.2.1:1161"));
+}
+
+TEST_F(StartTest, UnknownOptionIsNamed) {
+    expectOneLine(runAgent({"--prot", "1161"}), kExitUsage, HasSubstr("--prot"));
+}
+
+TEST_F(StartTest, UnknownModuleIsNamedWithTheFileThatWasTried) {
+    expectOneLine(start({"--module", "nothing"}), kExitFailure,
+                  AllOf(HasSubstr("'nothing'"), HasSubstr(moduleDirectory() + "/nothingkvl.so")));
+}
+
+TEST_F(StartTest, BrokenModulesAreNamed) {
+    for (char const* const module :
+         {"noentry", "refusing", "older", "newer", "throwing", "throwing-odd", "text"})
+        expectOneLine(start({"--module", module}, BROKEN_MODULE_DIR), kExitFailure,
+                      HasSubstr("'" + std::string(module) + "'"));
+}
+
+TEST_F(StartTest, BadChassisIsReportedByThePlatformThenByTheAgent) {
+    useChassis("boards:\n  - handle: 1\n");
+    Result const result = start({"--module", "z7sim"});
+    EXPECT_EQ(result.status, kExitFailure);
+    auto const lines = linesOf(result.output);
+    ASSERT_THAT(lines, SizeIs(2)) << result.output;
+    EXPECT_THAT(lines[0], AllOf(HasSubstr("chassis.yaml"), HasSubstr("SERIAL_NUMBER")));
+    EXPECT_THAT(lines[1], HasSubstr("kvloamd: the board platform does not answer"));
+}
+
+TEST_F(StartTest, UnknownDirectiveIsNamedWithItsLine) {
+    configureSnmp("rocommunity public 127.0.0.1\nrouserr op\n");
+    expectOneLine(start({"--module", "z7sim"}), kExitFailure,
+                  AllOf(HasSubstr("snmp.conf: line 2"), HasSubstr("rouserr")));
+}
+
+TEST_F(StartTest, MissingSnmpConfigurationIsNamed) {
+    expectOneLine(runAgent({"--module", "z7sim", "--module-dir", moduleDirectory(), "--snmp-config",
+                            path("none.conf")}),
+                  kExitFailure, HasSubstr(path("none.conf")));
+}
+
+TEST_F(StartTest, UnknownKeyOfTheConfigurationFileIsNamed) {
+    write(path("kvloamd.toml"), "prot=1161\n");
+    expectOneLine(start({"--config", path("kvloamd.toml")}), kExitFailure, HasSubstr("prot"));
+}
+
+TEST_F(StartTest, CheckOfAGoodConfigurationSucceedsAndLeavesNothingBehind) {
+    Result const result = start({"--module", "z7sim", "--check-config"});
+    EXPECT_EQ(result.status, 0) << result.output;
+    EXPECT_THAT(result.output, HasSubstr("the configuration is good"));
+    struct stat file {};
+    EXPECT_NE(stat(path("persistent/kvloamd.conf").c_str(), &file), 0);
+}
+
+TEST_F(StartTest, SampleConfigurationsAreGood) {
+    Result const result =
+        runAgent({"--config", CONFIG_DIR "/kvloamd.toml", "--snmp-config", CONFIG_DIR "/snmp.conf",
+                  "--module-dir", moduleDirectory(), "--check-config"});
+    EXPECT_EQ(result.status, 0) << result.output;
+}
+
+TEST_F(StartTest, CheckNamesEveryFault) {
+    configureSnmp("rouserr op\nrocommunityy public\n");
+    Result const result = start({"--module", "nothing", "--check-config"});
+    EXPECT_EQ(result.status, kExitFailure);
+    EXPECT_THAT(result.output, AllOf(HasSubstr("'nothing'"), HasSubstr("rouserr"),
+                                     HasSubstr("rocommunityy"), Not(HasSubstr("is good"))));
+}
+
+TEST_F(StartTest, ConfigurationThatIsFoundByItselfIsCheckedToo) {
+    write(path("kvloamd.conf"), "rouserr op\n");
+    auto variables = environment();
+    variables["SNMPCONFPATH"] = path("");
+    Process agent({KVLOAMD, "--check-config"}, variables);
+    EXPECT_EQ(agent.wait(), kExitFailure);
+    EXPECT_THAT(agent.output(), HasSubstr("kvloamd.conf: line 1"));
+}
+
+TEST_F(StartTest, CheckDoesNotNeedThePort) {
+    startAgent();
+    std::string const port = address().substr(address().find(':') + 1);
+    EXPECT_EQ(start({"--module", "z7sim", "--port", port, "--check-config"}).status, 0);
+}
+
+TEST_F(StartTest, HelpAndVersionSucceed) {
+    EXPECT_EQ(runAgent({"--help"}).status, 0);
+    Result const version = runAgent({"--version"});
+    EXPECT_EQ(version.status, 0);
+    EXPECT_THAT(linesOf(version.output), SizeIs(1));
+}
+
+TEST_F(StartTest, AgentWithoutModuleSaysThatThereWillBeNoBoards) {
+    Process agent({KVLOAMD, "--port", std::to_string(freePort()), "--snmp-config",
+                   path("snmp.conf"), "--persistent-dir", path("persistent")},
+                  environment());
+    ASSERT_TRUE(agent.waitFor("serving 0 boards"));
+    EXPECT_THAT(agent.output(), HasSubstr("--module"));
+}
+
+} // namespace
+} // namespace kvloamd::e2e

@@ -1,0 +1,161 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// What clients see of the agent through a master.
+#include <algorithm>
+#include <csignal>
+#include <iterator>
+#include <regex>
+
+#include <gmock/gmock.h>
+
+#include "agent/daemon/Options.h"
+#include "tests/e2e/MasterFixture.h"
+
+namespace kvloamd::e2e {
+namespace {
+
+using ::testing::ElementsAre;
+using ::testing::HasSubstr;
+using ::testing::IsEmpty;
+using ::testing::Not;
+using ::testing::SizeIs;
+
+constexpr char kAll[] = "1.3.6.1.4.1.32473";
+constexpr char kProcesses[] = "1.3.6.1.4.1.32473.1.1.7";
+constexpr char kSystemContact[] = "1.3.6.1.2.1.1.4.0";
+
+class SubagentTest : public MasterFixture {
+  protected:
+    /// The lines of a walk, sorted; without what is another at each start: the dates, and the
+    /// processes, which come last.
+    std::vector<std::string> walkedLines() const {
+        static std::regex const date("[0-9]+-[0-9]+-[0-9]+,[0-9]+:[0-9]+:[0-9.]+");
+        std::vector<std::string> lines;
+        for (Answer const& answer : walk(kAll)) {
+            if (std::is_gteq(compare(answer.name, *parseOid(kProcesses)))) break;
+            std::string line;
+            for (std::uint32_t const number : answer.name)
+                line += "." + std::to_string(number);
+            lines.push_back(line + " = " + std::regex_replace(answer.value, date, "a date"));
+        }
+        std::ranges::sort(lines);
+        return lines;
+    }
+    /// What is in one of two sorted lists only.
+    static std::vector<std::string> differences(std::vector<std::string> const& one,
+                                                std::vector<std::string> const& other) {
+        std::vector<std::string> found;
+        std::ranges::set_symmetric_difference(one, other, std::back_inserter(found));
+        return found;
+    }
+    void start() {
+        configureMaster("sysContact the host's own\n");
+        startMaster();
+        startSubagent();
+        ASSERT_TRUE(isConnected()) << agent().output();
+    }
+    /// Whether the master serves none of our names.
+    bool namesAreGone() const {
+        auto const answered = walk(kObjects);
+        return answered.empty() || answered.front().value.starts_with("No Such");
+    }
+};
+
+TEST_F(SubagentTest, WalkThroughTheMasterEqualsTheWalkOfAStandAloneAgent) {
+    startAgent();
+    auto const alone = walkedLines();
+    ASSERT_THAT(alone, SizeIs(::testing::Gt(100)));
+    ASSERT_EQ(stopAgent(), 0) << agent().output();
+    startMaster();
+    askMaster();
+    startSubagent();
+    ASSERT_TRUE(isConnected()) << agent().output();
+    EXPECT_THAT(differences(walkedLines(), alone), IsEmpty());
+}
+
+TEST_F(SubagentTest, FirstOfOurNamesComesAfterAllThatAreBefore) {
+    start();
+    auto const walked = walk(kObjects);
+    ASSERT_THAT(walked, Not(IsEmpty()));
+    for (char const* const before : {"1.3.6.1.4.1.32472.9", kAll, kObjects})
+        EXPECT_THAT(answers("snmpgetnext", {before}), ElementsAre(walked.front())) << before;
+}
+
+TEST_F(SubagentTest, BulkWalkEqualsTheWalk) {
+    start();
+    EXPECT_EQ(answers("snmpbulkwalk", {"-Cr20", kBoards}), walk(kBoards));
+}
+
+TEST_F(SubagentTest, SingleRequestsAnswerByName) {
+    start();
+    EXPECT_EQ(get("kvlBoardSerialNumber.2"), "STRING: QL-77-0420");
+    EXPECT_THAT(get("kvlBoardSerialNumber.77"), HasSubstr("No Such Instance"));
+    EXPECT_EQ(get("kvlBoardStatus.1"), "INTEGER: started(3)");
+}
+
+TEST_F(SubagentTest, WritingIsRefused) {
+    configureMaster("rwcommunity private 127.0.0.1\n");
+    startMaster();
+    startSubagent();
+    ASSERT_TRUE(isConnected());
+    Result const result = snmp(
+        "snmpset", {"-v2c", "-c", "private", "-t", "30", address(), "kvlBoardStatus.1", "i", "4"});
+    EXPECT_THAT(result.output, HasSubstr("notWritable"));
+    EXPECT_EQ(get("kvlBoardStatus.1"), "INTEGER: started(3)");
+}
+
+TEST_F(SubagentTest, ObjectsOfTheMasterRemain) {
+    start();
+    EXPECT_THAT(get(kSystemContact), HasSubstr("the host's own"));
+    EXPECT_THAT(walk("1.3.6.1.2.1.1"), Not(IsEmpty()));
+}
+
+TEST_F(SubagentTest, ChangesOfBoardsShow) {
+    start();
+    sim({"remove", "2"});
+    EXPECT_TRUE(eventually(
+        [this] { return get("kvlBoardName.2").find("No Such Instance") != std::string::npos; }));
+}
+
+TEST_F(SubagentTest, NamesVanishWhenTheAgentStops) {
+    start();
+    ASSERT_FALSE(namesAreGone());
+    EXPECT_EQ(stopAgent(), 0) << agent().output();
+    EXPECT_TRUE(eventually([this] { return namesAreGone(); }));
+    EXPECT_THAT(get(kSystemContact), HasSubstr("the host's own"));
+}
+
+TEST_F(SubagentTest, NamesVanishWhenTheAgentIsKilled) {
+    start();
+    agent().signal(SIGKILL);
+    agent().wait();
+    EXPECT_TRUE(eventually([this] { return namesAreGone(); }));
+}
+
+TEST_F(SubagentTest, SocketOfTheLoopbackNetworkServesToo) {
+    useMasterAddress("tcp:127.0.0.1:" + std::to_string(freePort()));
+    start();
+    EXPECT_EQ(get("kvlBoardCount.0"), "Gauge32: 3 boards");
+}
+
+TEST_F(SubagentTest, SecondAgentIsRefusedAndSaysSoOnce) {
+    start();
+    setVariable("KVLSIM_SOCKET", path("second.sock"));
+    Process second({KVLOAMD, "--agentx", path("master.sock"), "--module", "z7sim", "--module-dir",
+                    moduleDirectory(), "--log-level", "debug"},
+                   environment());
+    ASSERT_TRUE(second.waitFor("no connection to the SNMP master at")) << second.output();
+    EXPECT_THAT(second.output(), HasSubstr("another agent serves them already"));
+    // It tries again, which only the debug level tells.
+    ASSERT_TRUE(second.waitFor("refuses the agent's names", 2)) << second.output();
+    EXPECT_EQ(count(second.output(), "no connection to the SNMP master at"), 1);
+    EXPECT_EQ(get("kvlBoardCount.0"), "Gauge32: 3 boards");
+}
+
+TEST_F(SubagentTest, PortOfItsOwnIsRefused) {
+    Result const result = runAgent({"--agentx", path("master.sock"), "--port", "1161"});
+    EXPECT_EQ(result.status, kExitUsage);
+    EXPECT_THAT(linesOf(result.output), ElementsAre(HasSubstr("--agentx excludes --port")));
+}
+
+} // namespace
+} // namespace kvloamd::e2e
