@@ -24,6 +24,7 @@
 #include "board/Feature.h"
 #include "board/IPInterface.h"
 #include "board/ISDNChannel.h"
+#include "board/ISDNChannelOnLine.h"
 #include "board/ISDNFeature.h"
 #include "board/Interface.h"
 #include "board/InterfaceFeature.h"

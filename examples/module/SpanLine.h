@@ -24,8 +24,7 @@ inline int putText(std::string const& text, char* place) {
 class SpanIntervalTable final : public DS1IntervalTable {
   public:
     explicit SpanIntervalTable(long device) : m_device(device) { read(); }
-    /// Waits for a tick under way before any member goes.
-    /// Waits for a tick under way before any member goes.
+    /// Waits for a tick under way before any member is destroyed.
     ~SpanIntervalTable() override { ActionScheduler_pthread::GetScheduler()->Remove(this); }
 
     int GetControlledSlipSeconds(int) override { return 0; }

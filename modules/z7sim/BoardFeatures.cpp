@@ -22,7 +22,7 @@ FeatureList makeExtendedFeatures(long board) {
     std::vector<long> const devices = DevMapBoardIf(board).ListAllDevices();
     FeatureList features;
     auto const lines = Z7SimLineFeature::make(board);
-    auto const isdn = makeISDNFeature(board, devices);
+    auto const isdn = makeISDNFeature(board, devices, lines);
     append(features, lines);
     append(features, isdn);
     append(features, makeResourceFeature(board, devices, lines, isdn));

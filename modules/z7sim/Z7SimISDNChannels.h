@@ -5,6 +5,7 @@
 #include <atomic>
 #include <string>
 
+#include "board/ISDNChannelOnLine.h"
 #include "z7/ISDNChannelZ7.h"
 
 /// A channel's state, told by messages and, before the first of them, read from the platform. Any
@@ -28,29 +29,34 @@ class ChannelState {
 };
 
 /// A bearer channel of a trunk.
-class Z7SimBChannel final : public ISDNBChannelZ7 {
+class Z7SimBChannel final : public ISDNBChannelZ7, public ISDNChannelOnLine {
   public:
-    /// `timeSlot`: from 1. `board`: the board's index.
-    Z7SimBChannel(std::string const& name, int timeSlot, int board);
+    /// `timeSlot`: from 1. `board`: the board's handle in the device mapper. `line`: the trunk's
+    /// line, may be empty.
+    Z7SimBChannel(std::string const& name, int timeSlot, int board,
+                  ReferenceCounter<DS1LineDevice> line);
     ~Z7SimBChannel() override;
 
     /// All calls are dialled.
     int GetChannelType() override;
     int GetOperStatus() override { return m_state.get(); }
     int GetChannelNumber() override { return m_timeSlot; }
+    ReferenceCounter<DS1LineDevice> GetLine() override { return m_line; }
 
     ChannelState<ISDNBChannelStatusEnum>& state() { return m_state; }
 
   private:
     int const m_timeSlot;
+    ReferenceCounter<DS1LineDevice> const m_line;
     ChannelState<ISDNBChannelStatusEnum> m_state;
 };
 
 /// The signalling channel of a trunk.
-class Z7SimDChannel final : public ISDNDChannelZ7 {
+class Z7SimDChannel final : public ISDNDChannelZ7, public ISDNChannelOnLine {
   public:
     /// `device`: the trunk's handle in the device mapper; its protocol and name are read now.
-    Z7SimDChannel(std::string const& name, long device, int bearers, int board);
+    Z7SimDChannel(std::string const& name, long device, int bearers, int board,
+                  ReferenceCounter<DS1LineDevice> line);
     ~Z7SimDChannel() override;
 
     /// `KVL::kNotSupported` when the platform knows no protocol.
@@ -59,6 +65,7 @@ class Z7SimDChannel final : public ISDNDChannelZ7 {
     int GetBChannelCount() override { return m_bearers; }
     /// The trunk's name.
     int GetCallingAddress(char* address) override;
+    ReferenceCounter<DS1LineDevice> GetLine() override { return m_line; }
 
     ChannelState<ISDNDChannelStatusEnum>& state() { return m_state; }
 
@@ -66,5 +73,6 @@ class Z7SimDChannel final : public ISDNDChannelZ7 {
     int const m_protocol;
     int const m_bearers;
     std::string const m_trunkName;
+    ReferenceCounter<DS1LineDevice> const m_line;
     ChannelState<ISDNDChannelStatusEnum> m_state;
 };

@@ -26,6 +26,12 @@ int timeSlot(int channel, int bearers) {
     return skips && channel >= kSignallingSlotOfE1 ? channel + 1 : channel;
 }
 
+ReferenceCounter<DS1LineDevice> lineOf(long device,
+                                       ReferenceCounter<Z7SimLineFeature> const& lines) {
+    if (lines.get() == nullptr) return {};
+    return lines->lineOfDevice(device);
+}
+
 bool isBearerState(int state) {
     return state >= ISDNBChannelStatusIdle && state <= ISDNBChannelStatusActive;
 }
@@ -36,26 +42,28 @@ bool isSignallingState(int state) {
 
 } // namespace
 
-Z7SimISDNFeature::Z7SimISDNFeature(long board, std::vector<long> const& devices) {
+Z7SimISDNFeature::Z7SimISDNFeature(long board, std::vector<long> const& devices,
+                                   ReferenceCounter<Z7SimLineFeature> const& lines) {
     SetFeatureName("ISDN");
     for (long const device : devices) {
         auto const bearers = static_cast<int>(readBearerStates(device).size());
-        if (bearers > 0 && numberAttribute(device, kISDNSignallingState))
-            addTrunk(board, device, bearers);
+        if (bearers == 0 || !numberAttribute(device, kISDNSignallingState)) continue;
+        addTrunk(board, device, bearers, lineOf(device, lines));
     }
 }
 
 Z7SimISDNFeature::~Z7SimISDNFeature() = default;
 
-void Z7SimISDNFeature::addTrunk(long board, long device, int bearers) {
+void Z7SimISDNFeature::addTrunk(long board, long device, int bearers,
+                                ReferenceCounter<DS1LineDevice> const& line) {
     std::string const number = std::to_string(m_trunks.size() + 1);
     int const index = static_cast<int>(board);
-    Trunk trunk{device, {}, new Z7SimDChannel("D" + number, device, bearers, index)};
+    Trunk trunk{device, {}, new Z7SimDChannel("D" + number, device, bearers, index, line)};
     m_signallingChannels.emplace_back(trunk.signalling.get());
     for (int channel = 1; channel <= bearers; ++channel) {
         int const slot = timeSlot(channel, bearers);
         std::string const name = "B" + number + "." + std::to_string(slot);
-        trunk.bearers.emplace_back(new Z7SimBChannel(name, slot, index));
+        trunk.bearers.emplace_back(new Z7SimBChannel(name, slot, index, line));
         m_bearerChannels.emplace_back(trunk.bearers.back().get());
     }
     m_trunks.push_back(std::move(trunk));
@@ -126,8 +134,10 @@ Z7SimISDNFeature::Trunk const* Z7SimISDNFeature::find(long device) const {
     return found == m_trunks.end() ? nullptr : &*found;
 }
 
-ReferenceCounter<Z7SimISDNFeature> makeISDNFeature(long board, std::vector<long> const& devices) {
-    ReferenceCounter<Z7SimISDNFeature> feature(new Z7SimISDNFeature(board, devices));
+ReferenceCounter<Z7SimISDNFeature>
+makeISDNFeature(long board, std::vector<long> const& devices,
+                ReferenceCounter<Z7SimLineFeature> const& lines) {
+    ReferenceCounter<Z7SimISDNFeature> feature(new Z7SimISDNFeature(board, devices, lines));
     if (feature->trunks().empty()) return {};
     ISDNMonitor::instance().add(feature);
     feature->readStates();

@@ -6,6 +6,7 @@
 
 #include "Withdrawable.h"
 #include "Z7SimISDNChannels.h"
+#include "Z7SimLineFeature.h"
 #include "boardplatform/isdn_channels.h"
 #include "z7/ISDNFeatureZ7.h"
 
@@ -17,9 +18,10 @@
 /// the channel's own.
 class Z7SimISDNFeature final : public ISDNFeatureZ7, public Withdrawable {
   public:
-    /// Asks `devices` of the board for their channels. The channels' states are not known before
-    /// `readStates`.
-    Z7SimISDNFeature(long board, std::vector<long> const& devices);
+    /// Asks `devices` of the board for their channels, and `lines`, which may be empty, for the
+    /// lines that carry them. The channels' states are not known before `readStates`.
+    Z7SimISDNFeature(long board, std::vector<long> const& devices,
+                     ReferenceCounter<Z7SimLineFeature> const& lines);
     ~Z7SimISDNFeature() override;
 
     /// Asks the platform for the state of every channel. Follow the messages first: a change is
@@ -42,7 +44,8 @@ class Z7SimISDNFeature final : public ISDNFeatureZ7, public Withdrawable {
         ReferenceCounter<Z7SimDChannel> signalling;
     };
 
-    void addTrunk(long board, long device, int bearers);
+    void addTrunk(long board, long device, int bearers,
+                  ReferenceCounter<DS1LineDevice> const& line);
     Trunk const* find(long device) const;
     void applyToBearer(Trunk const& trunk, ISDNChannelMsg const& message);
     void applyToSignalling(Trunk const& trunk, ISDNChannelMsg const& message);
@@ -52,4 +55,5 @@ class Z7SimISDNFeature final : public ISDNFeatureZ7, public Withdrawable {
 
 /// The feature of the board's trunks among `devices`, which follows the platform until it is
 /// withdrawn; an empty handle when there is no trunk.
-ReferenceCounter<Z7SimISDNFeature> makeISDNFeature(long board, std::vector<long> const& devices);
+ReferenceCounter<Z7SimISDNFeature> makeISDNFeature(long board, std::vector<long> const& devices,
+                                                   ReferenceCounter<Z7SimLineFeature> const& lines);

@@ -7,6 +7,7 @@
 
 #include "ISDNMonitor.h"
 #include "Z7SimBoard.h"
+#include "board/ISDNChannelOnLine.h"
 #include "board/Interface.h"
 #include "core/ReferenceTable.h"
 #include "tests/modules/z7sim/ChannelLog.h"
@@ -67,6 +68,18 @@ class Z7SimISDNFeatureTest : public PluggedBoard {
         char name[64];
         EXPECT_EQ(channel.GetName(name), 0);
         return name;
+    }
+    /// A trunk with a line and one bearer channel.
+    static std::string trunkOnLine(int handle, std::string const& attributes) {
+        return device(handle, 514, attributes, "line: {type: esf}, channels: {bearers: 1}");
+    }
+    /// The index of the line that a channel of either kind names; -1 when it names none.
+    template <class Channel>
+    static int lineIndexOf(ReferenceCounter<Channel> const& channel) {
+        auto* const onLine = dynamic_cast<ISDNChannelOnLine*>(channel.get());
+        if (onLine == nullptr) return -1;
+        auto const line = onLine->GetLine();
+        return line.get() == nullptr ? -1 : line->GetLineIndex();
     }
     /// Listens to the feature, and to the first channel of each kind.
     void listen() {
@@ -151,6 +164,22 @@ TEST_F(Z7SimISDNFeatureTest, SignallingChannelAnswersEveryQuery) {
     EXPECT_EQ(channel->GetCallingAddress(address), 0);
     EXPECT_STREQ(address, "primary-rate");
     EXPECT_EQ(channel->GetBoardIndex(), 5);
+}
+
+TEST_F(Z7SimISDNFeatureTest, ChannelsKnowTheLineOfTheirTrunkEvenIfTrunksHaveOneName) {
+    plugIn("", trunkOnLine(301, "NAME: same") + trunkOnLine(302, "NAME: same"));
+    EXPECT_EQ(lineIndexOf(bearer("B1.1")), 1);
+    EXPECT_EQ(lineIndexOf(bearer("B2.1")), 2);
+    auto const first = isdn()->GetFirstDChannel();
+    EXPECT_EQ(lineIndexOf(first), 1);
+    EXPECT_EQ(lineIndexOf(isdn()->GetNextDChannel(first)), 2);
+}
+
+TEST_F(Z7SimISDNFeatureTest, ChannelsOfATrunkWithoutALineKnowNone) {
+    plugIn("", trunkOnLine(301, "") + trunk(302, 1));
+    EXPECT_EQ(lineIndexOf(bearer("B1.1")), 1);
+    EXPECT_EQ(lineIndexOf(bearer("B2.1")), -1);
+    EXPECT_EQ(lineIndexOf(isdn()->GetNextDChannel(isdn()->GetFirstDChannel())), -1);
 }
 
 TEST_F(Z7SimISDNFeatureTest, TrunkWithoutProtocolAndNameSaysSo) {
