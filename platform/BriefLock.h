@@ -8,18 +8,19 @@
 
 namespace KVL {
 
-/// Waits for a mutex that was not free: looks again at growing intervals, then sleeps.
+/// Locks a mutex that was not free: retries at growing intervals, then sleeps. On a single
+/// processor it sleeps at once.
 KVLOAM_API void lock_contended(pthread_mutex_t* mutex);
 
-/// Locks `mutex`. The locks of the reference table are held for some nanoseconds each and taken for
-/// every handle; a thread that went to sleep for one would cost both threads a hundred times that,
-/// and one that asks too eagerly takes the cache line from the thread that works.
+/// Locks `mutex`. Every handle takes the locks of the reference table, and each is held for a few
+/// instructions only. Sleeping and waking takes both threads far longer than that; retrying without
+/// a pause takes the cache line away from the thread that holds the lock.
 inline void lock_briefly(pthread_mutex_t* mutex) {
     if (pthread_mutex_trylock(mutex) != 0) [[unlikely]]
         lock_contended(mutex);
 }
 
-/// Holds a mutex for a scope, taken by `lock_briefly`.
+/// A `BriefGuard` holds a mutex for a scope, taken by `lock_briefly`.
 class BriefGuard {
   public:
     explicit BriefGuard(pthread_mutex_t* mutex) : m_mutex(mutex) { lock_briefly(mutex); }
@@ -31,7 +32,7 @@ class BriefGuard {
     pthread_mutex_t* m_mutex;
 };
 
-/// Leaves a lock to others for a while.
+/// Lets other threads use a lock for a few microseconds. Returns at once on a single processor.
 void stay_away();
 
 } // namespace KVL
