@@ -1,8 +1,9 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "board/Board.h"
 
-#include <algorithm>
 #include <utility>
+
+#include "core/FindObject.h"
 
 Board::Board() : Object(true) {}
 
@@ -39,10 +40,9 @@ int Board::AddFeature(ReferenceCounter<Feature> feature) {
 }
 
 int Board::RemoveFeature(ReferenceCounter<Feature> feature) {
+    Feature const* const wanted = feature.get();
     ObjectGuard const guard(*this);
-    auto const found = std::find_if(m_features.begin(), m_features.end(), [&](auto const& entry) {
-        return entry.get() == feature.get();
-    });
+    auto const found = KVL::find_object(m_features, wanted);
     if (found == m_features.end()) return 0;
     m_features.erase(found);
     return 1;
@@ -56,10 +56,9 @@ ReferenceCounter<Feature> Board::GetFirstFeature(KVL::IID iid) {
 }
 
 ReferenceCounter<Feature> Board::GetNextFeature(ReferenceCounter<Feature> previous, KVL::IID iid) {
+    Feature const* const wanted = previous.get();
     ObjectGuard const guard(*this);
-    auto entry = std::find_if(m_features.begin(), m_features.end(), [&](auto const& candidate) {
-        return candidate.get() == previous.get();
-    });
+    auto entry = KVL::find_object(m_features, wanted);
     if (entry == m_features.end()) return {};
     for (++entry; entry != m_features.end(); ++entry)
         if (answersTo(*entry, iid)) return *entry;

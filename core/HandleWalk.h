@@ -1,12 +1,11 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Walks over handles by first and next: in a vector, and by name.
+// First and next steps over a vector of handles, and the search by name.
 #pragma once
 
-#include <algorithm>
 #include <cstring>
 #include <vector>
 
-#include "core/ReferenceCounter.h"
+#include "core/FindObject.h"
 
 namespace KVL {
 
@@ -17,23 +16,21 @@ ReferenceCounter<T> first_in(std::vector<ReferenceCounter<T>> const& handles) {
     return handles.front();
 }
 
-/// The handle behind the first one that refers to the object of `previous`; an empty one when that
-/// is the last, or is not among them.
+/// The handle after the first one that refers to the object of `previous`; an empty handle when
+/// that is the last one or is not in the vector.
 template <class T>
 ReferenceCounter<T> next_in(std::vector<ReferenceCounter<T>> const& handles,
                             ReferenceCounter<T> const& previous) {
-    auto const found = std::find_if(handles.begin(), handles.end(), [&](auto const& handle) {
-        return handle.get() == previous.get();
-    });
+    auto const found = find_object(handles, previous.get());
     if (found == handles.end() || found + 1 == handles.end()) return {};
     return found[1];
 }
 
-/// The longest name that a search reads, with its terminator.
+/// The longest name that a search can read, with its terminator.
 inline constexpr int kNameSize = 256;
 
-/// The first object of a walk whose `GetName(char*)` is `name`, byte by byte; an empty handle when
-/// there is none. `next(handle)` answers the handle after `handle`.
+/// The first object of a walk whose `GetName(char*)` gives exactly `wanted`; an empty handle when
+/// there is none. The walk begins at `handle`; `next(handle)` returns the handle after `handle`.
 template <class T, class Next>
 ReferenceCounter<T> find_named(ReferenceCounter<T> handle, Next const& next, char const* wanted) {
     for (; handle.get() != nullptr; handle = next(handle)) {
@@ -44,7 +41,7 @@ ReferenceCounter<T> find_named(ReferenceCounter<T> handle, Next const& next, cha
     return handle;
 }
 
-/// Goes past all objects of a walk. Returns its end, an empty handle.
+/// Calls `next` until the walk ends. Returns the end, an empty handle.
 template <class T, class Next>
 ReferenceCounter<T> past_all(ReferenceCounter<T> handle, Next const& next) {
     while (handle.get() != nullptr)

@@ -4,11 +4,13 @@
 
 #include <utility>
 
+#include "core/FindObject.h"
 #include "core/IndexedEntries.h"
 #include "core/Object.h"
 
-/// Maps indices to handles `Value`, ascending by index. Index 0 is no index: it ends every walk.
-/// Callable from any thread; whoever needs several steps in one piece holds `lock()` around them.
+/// An `IndexedTable` maps indices to handles `Value`, in ascending order of indices. Index 0 is
+/// never used: it ends every walk. Thread-safe, except where an operation requires the lock; a
+/// caller that combines several steps takes the table's `lock()` around them.
 template <class Index, class Value>
 class IndexedTable : public Object {
   public:
@@ -23,7 +25,7 @@ class IndexedTable : public Object {
         return m_entries.empty() ? m_endIndex : m_entries.begin()->first;
     }
 
-    /// The next index above `index`; 0 when it is the last one or is not in the table.
+    /// The next higher index; 0 when `index` is the highest or is not in the table.
     Index next_index(Index index) {
         ObjectGuard const guard(*this);
         auto entry = m_entries.find(index);
@@ -31,8 +33,8 @@ class IndexedTable : public Object {
         return entry->first;
     }
 
-    /// The value at `index`, or the table's empty value; nothing is inserted. The reference is good
-    /// while the caller keeps the entry from being removed.
+    /// The value at `index`, or the table's empty value; nothing is inserted. The reference is
+    /// valid until the entry is removed; a caller that cannot rule that out holds the lock.
     Value& operator[](Index index) {
         ObjectGuard const guard(*this);
         auto const entry = m_entries.find(index);
@@ -40,36 +42,36 @@ class IndexedTable : public Object {
     }
 
     /// Removes the first entry that refers to the same object as `value`. Returns whether there was
-    /// one. Its handle is dropped after the lock is given back.
+    /// one. The entry's handle is dropped after the lock is released.
     bool remove(Value value) {
+        auto const* const wanted = value.get();
         typename Entries::node_type removed;
         ObjectGuard const guard(*this);
-        for (auto entry = m_entries.begin(); entry != m_entries.end(); ++entry) {
-            if (entry->second.get() != value.get()) continue;
-            removed = m_entries.extract(entry);
-            return true;
-        }
-        return false;
+        auto const entry = KVL::find_object(m_entries, wanted);
+        if (entry == m_entries.end()) return false;
+        removed = m_entries.extract(entry);
+        return true;
     }
 
-    /// The entries themselves, for whoever holds the lock.
+    /// The entries themselves. Requires the lock.
     Entries& entries() { return m_entries; }
-    /// The index handed out last, for whoever holds the lock. Indices are never handed out twice.
+    /// The index assigned last; each index is assigned once. Requires the lock.
     Index& last_index() { return m_lastIndex; }
 
   private:
     Entries m_entries;
-    Index m_reserved = 1; ///< keeps the fields' places; nothing reads it
+    Index m_reserved = 1; ///< not read; keeps the later fields at their offsets
     Index m_lastIndex = 0;
     Index m_endIndex = 0;
     Value m_emptyValue;
 };
 
-/// Enters `value` under the table's next index, and returns that index.
+/// Enters `value` under the table's next index and returns that index. When memory runs out, the
+/// table and its next index stay as they are.
 template <class Index, class Value>
 Index enter_at_next_index(IndexedTable<Index, Value>& table, Value value) {
     ObjectGuard const guard(table);
-    Index const index = ++table.last_index();
+    Index const index = table.last_index() + 1;
     table.entries().insert_or_assign(index, std::move(value));
-    return index;
+    return table.last_index() = index;
 }

@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The steps of a walk over an indexed table of handles, each in one piece under the table's lock.
+// The steps of a walk over an indexed table of handles, each under one hold of the table's lock.
+// All are thread-safe.
 #pragma once
 
 #include "core/IndexedTable.h"
@@ -13,7 +14,7 @@ Value first_entry(IndexedTable<int, Value>& table) {
     return table[table.first_index()];
 }
 
-/// A copy of the entry at `index`, or an empty handle. The lock keeps the entry until it is copied.
+/// A copy of the entry at `index`, or an empty handle.
 template <class Value>
 Value entry_at(IndexedTable<int, Value>& table, int index) {
     ObjectGuard const guard(table);
@@ -39,9 +40,8 @@ template <class Value>
 int index_of(IndexedTable<int, Value>& table, Value const& value) {
     auto* const wanted = value.get();
     ObjectGuard const guard(table);
-    for (auto const& [index, entry] : table.entries())
-        if (entry.get() == wanted) return index;
-    return 0;
+    auto const found = find_object(table.entries(), wanted);
+    return found == table.entries().end() ? 0 : found->first;
 }
 
 } // namespace KVL

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // Walks over handles in a vector, and the search by name.
 #include <cstring>
+#include <map>
 #include <string>
 #include <utility>
 #include <vector>
@@ -96,6 +97,27 @@ TEST_F(HandleWalkTest, WalkPastAllEndsWithAnEmptyHandle) {
                                      [this](Handle const& handle) { return next(handle); });
     EXPECT_EQ(end.get(), nullptr);
     EXPECT_EQ(m_steps, 3);
+}
+
+TEST_F(HandleWalkTest, ObjectIsFoundAtTheFirstHandleThatRefersToIt) {
+    named("a");
+    Handle const twice = named("b");
+    m_handles.push_back(twice);
+    EXPECT_EQ(KVL::find_object(m_handles, twice.get()), m_handles.begin() + 1);
+}
+
+TEST_F(HandleWalkTest, ObjectWithoutAHandleThereIsNotFound) {
+    named("a");
+    Handle const other(new Named("a"));
+    EXPECT_EQ(KVL::find_object(m_handles, other.get()), m_handles.end());
+}
+
+TEST_F(HandleWalkTest, ObjectIsFoundAmongTheEntriesOfAMap) {
+    std::map<int, Handle> entries;
+    entries[3] = named("a");
+    entries[5] = named("b");
+    EXPECT_EQ(KVL::find_object(entries, entries[5].get())->first, 5);
+    EXPECT_EQ(KVL::find_object(entries, Handle(new Named("b")).get()), entries.end());
 }
 
 } // namespace
