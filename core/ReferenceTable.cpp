@@ -6,6 +6,7 @@
 #include <functional>
 #include <iostream>
 #include <new>
+#include <sstream>
 #include <typeinfo>
 
 #include "core/AddressMap.h"
@@ -15,12 +16,12 @@
 namespace {
 using RecordPool = KVL::RecyclingPool<ReferenceInfo>;
 
-/// Its address tells threads apart.
+/// Its address identifies the thread.
 [[gnu::tls_model("initial-exec")]] thread_local char t_thread;
 } // namespace
 
-/// The table's lock and behind it, on the same cache line, what changes with every entry: two
-/// threads that alternate at the table then exchange one line.
+/// The table's lock, followed on the same cache line by what changes with every entry, so that two
+/// threads that use the table alternately exchange one line.
 struct alignas(64) ReferenceTable::Records final : KVLLockable_pthread {
     Records() : KVLLockable_pthread(RecursiveLock) {}
     KVL::AddressMap<ReferenceInfo*> map;
@@ -29,7 +30,7 @@ struct alignas(64) ReferenceTable::Records final : KVLLockable_pthread {
 
 ReferenceTable* ReferenceTable::m_referenceTable = nullptr;
 
-// The lock shares the record's cache lines: both are touched by every copy of a handle.
+// The lock lies in the record's cache lines: every copy of a handle uses both.
 ReferenceInfo::ReferenceInfo() : m_lock(new (m_lockStorage) KVLLockable_pthread(RecursiveLock)) {}
 
 ReferenceInfo::~ReferenceInfo() {
@@ -87,23 +88,33 @@ void ReferenceTable::destroy_refcount(Object* object) {
 }
 
 void ReferenceTable::dump() {
-    KVL::BriefGuard const guard(m_records->get_impl_mutex());
-    auto entries = m_records->map.entries();
-    std::sort(entries.begin(), entries.end(), [](auto const& a, auto const& b) {
-        return std::less<void const*>()(a.first, b.first);
-    });
-    std::cout << '\n' << "##Start of ReferenceTable:" << '\n';
-    for (auto const& [address, record] : entries) {
-        char count[32];
-        std::snprintf(count, sizeof count, "   RefCount %4d", record->count());
-        auto const* object = static_cast<Object const*>(address);
-        // Deliberate: the address is written in the stream's own base, decimal unless the caller
-        // has changed it, in spite of the "0x"; scripts that read the dump expect that.
-        std::cout << count << "    obj: "
-                  << "Object pointer address is 0x" << reinterpret_cast<std::uintptr_t>(address)
-                  << '[' << typeid(*object).name() << ']' << '\n';
+    std::ostringstream text;
+    text.exceptions(std::ios::badbit); // when memory runs out, say so and write nothing
+    text.imbue(std::cout.getloc());
+    text.flags(std::cout.flags());
+    text << '\n' << "##Start of ReferenceTable:" << '\n';
+    {
+        // An object outlives its entry, so that its type can be asked for under the lock.
+        KVL::BriefGuard const guard(m_records->get_impl_mutex());
+        auto entries = m_records->map.entries();
+        std::sort(entries.begin(), entries.end(), [](auto const& a, auto const& b) {
+            return std::less<void const*>()(a.first, b.first);
+        });
+        for (auto const& [address, record] : entries) {
+            char count[32];
+            std::snprintf(count, sizeof count, "   RefCount %4d", record->count());
+            auto const* object = static_cast<Object const*>(address);
+            // Deliberate: the address is written in the stream's own base, decimal unless the
+            // caller has changed it, in spite of the "0x"; scripts that read the dump expect that.
+            text << count << "    obj: "
+                 << "Object pointer address is 0x" << reinterpret_cast<std::uintptr_t>(address)
+                 << '[' << typeid(*object).name() << ']' << '\n';
+        }
     }
-    std::cout << "##End of ReferenceTable" << std::endl;
+    text << "##End of ReferenceTable" << '\n';
+    // Written without the lock: standard output may be a pipe that nobody reads, and every handle
+    // of the process needs the lock.
+    std::cout << text.str() << std::flush;
 }
 
 int ReferenceTable::referenced_objects() {

@@ -8,7 +8,8 @@
 
 #include "core/Object.h"
 
-/// The count of one object's handles. Changed only under its lock; readable at any time.
+/// A `ReferenceInfo` is the record of one object's handles: their number, and the lock under which
+/// it changes. `lock()`, `unlock()` and `count()` are thread-safe.
 class KVLOAM_API ReferenceInfo {
   public:
     ReferenceInfo();
@@ -20,11 +21,11 @@ class KVLOAM_API ReferenceInfo {
     void unlock() { pthread_mutex_unlock(mutex()); }
 
     std::int32_t count() const { return m_count.load(std::memory_order_relaxed); }
-    /// Requires the lock.
+    /// Adds a handle. Requires the lock.
     void raise() { m_count.store(count() + 1, std::memory_order_relaxed); }
-    /// Back to no handles, for the next object.
+    /// Sets the count to 0, for the next object.
     void reset() { m_count.store(0, std::memory_order_relaxed); }
-    /// Requires the lock. Returns the count that is left.
+    /// Removes a handle. Requires the lock. Returns the remaining count.
     std::int32_t lower() {
         std::int32_t const left = count() - 1;
         m_count.store(left, std::memory_order_relaxed);
@@ -32,7 +33,8 @@ class KVLOAM_API ReferenceInfo {
     }
 
   private:
-    /// The lock's, found without a look at the pointer: every copy of a handle asks twice.
+    /// The mutex of the lock, found without reading `m_lock`: every copy of a handle needs it
+    /// twice.
     pthread_mutex_t* mutex() {
         return std::launder(reinterpret_cast<KVLLockable_pthread*>(m_lockStorage))
             ->get_impl_mutex();
@@ -43,8 +45,9 @@ class KVLOAM_API ReferenceInfo {
     alignas(KVLLockable_pthread) unsigned char m_lockStorage[sizeof(KVLLockable_pthread)];
 };
 
-/// Finds the one record that all handles of an object share. Callable from any thread, but the
-/// first `get_instance()` must return before threads share handles. Never destroyed.
+/// A `ReferenceTable` maps each object that has handles to the record that they share. The process
+/// has one, which is never destroyed. Thread-safe; only the first `get_instance()` must return
+/// before threads share handles.
 ///
 /// Lock order: a record's lock, then the table's.
 class KVLOAM_API ReferenceTable : public Object {
@@ -57,15 +60,16 @@ class KVLOAM_API ReferenceTable : public Object {
 
     ~ReferenceTable() override;
 
-    /// The record of `object`; null when it has none, also for an address of no object.
+    /// The record of `object`; null when it has none. `object` is not dereferenced.
     virtual ReferenceInfo* get_refinfo(Object* object);
     /// The record of `object`, as `get_refinfo` answers it; made with count 0 when it has none.
     /// Null for null.
     virtual ReferenceInfo* create_refinfo(Object* object);
-    /// Takes the record of `object` out and destroys it; nothing when it has none. The record's
-    /// lock must not be held.
+    /// Removes and destroys the record of `object`, if it has one. The record's lock must not be
+    /// held.
     virtual void destroy_refcount(Object* object);
-    /// Prints every entry, in the order of addresses, on standard output.
+    /// Prints every entry, in the order of addresses, on standard output. Handles are not blocked
+    /// while the text is written.
     virtual void dump();
     /// The number of objects that have handles.
     virtual int referenced_objects();
@@ -80,11 +84,11 @@ class KVLOAM_API ReferenceTable : public Object {
 
     explicit ReferenceTable(Records* records);
 
-    /// The record of `object`, made with count 0 when it has none, by one search. Handles call this
-    /// instead of `create_refinfo`, whose two virtual calls they can do without. Not null.
+    /// The record of `object`, which is not null, made with count 0 when it has none. Handles call
+    /// this instead of `create_refinfo`: one search, and no virtual call.
     ReferenceInfo* find_or_make(Object* object);
 
     static ReferenceTable* m_referenceTable;
 
-    Records* m_records; ///< owned as the object's lock
+    Records* m_records; ///< owned by `Object`, as its lock
 };

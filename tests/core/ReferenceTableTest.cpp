@@ -5,6 +5,7 @@
 #include <memory>
 #include <sstream>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include <gtest/gtest.h>
@@ -25,6 +26,7 @@ using Handle = ReferenceCounter<ReferenceTableTestObject>;
 class OwnTable : public ReferenceTable {
   public:
     OwnTable() = default;
+    using ReferenceTable::lockable;
 };
 
 class ReferenceTableTest : public testing::Test {
@@ -84,6 +86,51 @@ TEST_F(ReferenceTableTest, DumpIsInTheOrderOfAddresses) {
     }
     for (auto& object : objects)
         m_table.destroy_refcount(&object);
+}
+
+TEST_F(ReferenceTableTest, DumpDoesNotHoldTheLockWhileItWrites) {
+    /// A stream's buffer that tries the table's lock from another thread at every write.
+    class Trying : public std::stringbuf {
+      public:
+        explicit Trying(KVLLockable* lock) : m_lock(lock) {}
+        int writes() const { return m_writes; }
+        int refused() const { return m_refused; }
+
+      protected:
+        std::streamsize xsputn(char const* text, std::streamsize size) override {
+            tryLock();
+            return std::stringbuf::xsputn(text, size);
+        }
+        int_type overflow(int_type character) override {
+            tryLock();
+            return std::stringbuf::overflow(character);
+        }
+
+      private:
+        void tryLock() {
+            ++m_writes;
+            std::thread([this] {
+                if (m_lock->trylock() == KVLLockOk)
+                    m_lock->unlock();
+                else
+                    ++m_refused;
+            }).join();
+        }
+
+        KVLLockable* m_lock;
+        int m_writes = 0;
+        int m_refused = 0;
+    };
+    ReferenceTableTestObject object;
+    m_table.create_refinfo(&object);
+    Trying buffer(m_table.lockable());
+    auto* const before = std::cout.rdbuf(&buffer);
+    m_table.dump();
+    std::cout.rdbuf(before);
+    EXPECT_GT(buffer.writes(), 0);
+    EXPECT_EQ(buffer.refused(), 0);
+    EXPECT_NE(buffer.str().find("##End of ReferenceTable"), std::string::npos);
+    m_table.destroy_refcount(&object);
 }
 
 TEST_F(ReferenceTableTest, NumberOfObjectsIsZeroBeforeAnyHandleAndReturnsToItsFormerValue) {
