@@ -2,6 +2,7 @@
 // A hash map from object addresses, in one flat array.
 #pragma once
 
+#include <algorithm>
 #include <bit>
 #include <cstddef>
 #include <cstdint>
@@ -10,9 +11,9 @@
 
 namespace KVL {
 
-/// Maps addresses to `Value`s, which are pointers. The reference table is searched for every handle
-/// made from a plain pointer; linear probing in one array finds an entry in a cache line or two.
-/// Not synchronised. The null address is never a key.
+/// An `AddressMap` maps addresses to `Value`s, which are pointers. The reference table is searched
+/// for every handle made from a plain pointer; linear probing in one array finds an entry in a
+/// cache line or two. The null address is never a key. Unsynchronised.
 template <class Value>
 class AddressMap {
   public:
@@ -21,27 +22,25 @@ class AddressMap {
     std::size_t size() const { return m_size; }
 
     /// The value at `key`, or null.
-    Value find(void const* key) const {
-        std::size_t i = home(key);
-        while (m_slots[i].key != key && m_slots[i].key != nullptr)
-            i = (i + 1) & m_mask;
-        return m_slots[i].value;
-    }
+    Value find(void const* key) const { return m_slots[slotFor(key)].value; }
 
-    /// The value at `key`; when there is none, what `make()` returns, which is put there.
+    /// The value at `key`; when there is none, inserts what `make()` returns. When memory runs out
+    /// or `make()` throws, the entries are what they were.
     template <class Make>
     Value find_or_insert(void const* key, Make const& make) {
-        std::size_t i = home(key);
-        for (; m_slots[i].key != nullptr; i = (i + 1) & m_mask)
-            if (m_slots[i].key == key) return m_slots[i].value;
+        std::size_t i = slotFor(key);
+        if (m_slots[i].key == key) return m_slots[i].value;
+        if (m_size >= m_mask / 2) [[unlikely]] {
+            grow();
+            i = slotFor(key);
+        }
         Value const value = make();
         m_slots[i] = {key, value};
-        if (++m_size > m_mask / 2) [[unlikely]]
-            grow();
+        ++m_size;
         return value;
     }
 
-    /// Takes `key` out and returns its value; null when it is not in the map.
+    /// Removes `key` and returns its value; null when it is not in the map.
     Value erase(void const* key) {
         std::size_t hole = home(key);
         while (m_slots[hole].key != key) {
@@ -60,12 +59,13 @@ class AddressMap {
         return value;
     }
 
+    /// Removes all entries. Needs no memory.
     void clear() {
+        std::fill(m_slots.begin(), m_slots.end(), Slot());
         m_size = 0;
-        resize(kSmallest);
     }
 
-    /// All entries, in no order.
+    /// All entries, in no particular order.
     std::vector<std::pair<void const*, Value>> entries() const {
         std::vector<std::pair<void const*, Value>> all;
         all.reserve(m_size);
@@ -75,7 +75,7 @@ class AddressMap {
     }
 
   private:
-    /// Large enough that the few entries that two threads come and go with seldom share a line.
+    /// Large enough that the few entries that two threads add and remove seldom share a cache line.
     static constexpr std::size_t kSmallest = 1024;
 
     struct Slot {
@@ -89,24 +89,28 @@ class AddressMap {
         return static_cast<std::size_t>((address * 0x9E3779B97F4A7C15U) >> m_shift);
     }
 
-    /// An empty array of `capacity`, a power of two. Returns the former one.
+    /// The slot that holds `key`, or the free slot where it belongs.
+    std::size_t slotFor(void const* key) const {
+        std::size_t i = home(key);
+        while (m_slots[i].key != key && m_slots[i].key != nullptr)
+            i = (i + 1) & m_mask;
+        return i;
+    }
+
+    /// Replaces the array by an empty one of `capacity`, a power of two. Returns the former one.
     std::vector<Slot> resize(std::size_t capacity) {
+        std::vector<Slot> slots(capacity); // first: when this fails, nothing has changed
         m_mask = capacity - 1;
         m_shift = 64 - std::countr_zero(capacity);
-        return std::exchange(m_slots, std::vector<Slot>(capacity));
+        return std::exchange(m_slots, std::move(slots));
     }
 
     void grow() {
-        for (Slot const& slot : resize(2 * m_slots.size())) {
-            if (slot.key == nullptr) continue;
-            std::size_t i = home(slot.key);
-            while (m_slots[i].key != nullptr)
-                i = (i + 1) & m_mask;
-            m_slots[i] = slot;
-        }
+        for (Slot const& slot : resize(2 * m_slots.size()))
+            if (slot.key != nullptr) m_slots[slotFor(slot.key)] = slot;
     }
 
-    std::size_t m_size = 0; ///< first: an owner may put its lock on the same cache line, before it
+    std::size_t m_size = 0; ///< first, so that an owner's lock before it can share its cache line
     std::vector<Slot> m_slots;
     std::size_t m_mask = 0;
     int m_shift = 64;

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The handle through which every managed object is passed.
+// The handle by which every managed object is passed.
 #pragma once
 
 #include <cstdio>
@@ -8,16 +8,17 @@
 #include "core/Object.h"
 #include "core/ReferenceTable.h"
 
-/// A counted handle of a `T`, a class derived from `Object` (possibly through a virtual base). All
-/// handles of an object count together, however they were made; the last one that goes deletes it.
+/// A `ReferenceCounter` is a counted handle of a `T`, a class derived from `Object` (possibly
+/// through a virtual base). All handles of an object share one count, also those made independently
+/// from its pointer; the last one to be dropped deletes the object.
 ///
-/// Handles of one object may be copied and dropped by many threads at once. One handle is not
-/// synchronised: it must not be assigned in one thread while another uses it. A handle made from a
-/// plain pointer requires that the object is new or that another handle of it lives meanwhile.
+/// A handle is unsynchronised, but any threads may copy and drop different handles of one object at
+/// the same time.
 template <class T>
 class ReferenceCounter : public Object {
   public:
-    /// A handle of `object`; null makes an empty handle.
+    /// A handle of `object`; null makes an empty handle. Requires that the object is new or that
+    /// another handle keeps it meanwhile. When memory runs out, a new object is still the caller's.
     ReferenceCounter(T* object = nullptr)
         : Object(false),
           m_record(object == nullptr ? nullptr
@@ -32,11 +33,13 @@ class ReferenceCounter : public Object {
 
     ReferenceCounter(ReferenceCounter const& other) : Object(false) { share(other); }
 
-    /// Takes over what `other` holds; `other` ends empty.
-    ReferenceCounter(ReferenceCounter&& other) noexcept : Object(false) { takeOver(other); }
+    /// Takes over what `other` holds; `other` ends empty. Not `noexcept`: each handle is an
+    /// `Object` with an identifier list of its own, so making one allocates. When that fails,
+    /// `other` keeps what it holds.
+    ReferenceCounter(ReferenceCounter&& other) : Object(false) { takeOver(other); }
 
-    /// Deliberate: lets go of its own object before it takes on the other's, without a test for
-    /// self-assignment; assigning the only handle of an object to itself deletes the object and
+    /// Deliberate: releases its own object before it takes the other's, without a test for
+    /// self-assignment. Assigning the only handle of an object to itself deletes the object and
     /// leaves the handle empty.
     ReferenceCounter&
     operator=(ReferenceCounter const& other) { // NOLINT(bugprone-unhandled-self-assignment)
@@ -45,7 +48,7 @@ class ReferenceCounter : public Object {
         return *this;
     }
 
-    /// As the copying assignment, but `other` ends empty.
+    /// As the copying assignment, but `other` ends empty. Allocates nothing.
     ReferenceCounter& operator=(ReferenceCounter&& other) noexcept {
         letGo();
         takeOver(other);
@@ -54,8 +57,9 @@ class ReferenceCounter : public Object {
 
     ~ReferenceCounter() override { letGo(); }
 
-    /// Lowers the count; at 0 the handle ends empty and the object is deleted. Requires the
-    /// record's lock, which is given back before the record goes. Nothing on an empty handle.
+    /// Lowers the count; at 0 the handle becomes empty and the object is deleted. Requires the
+    /// record's lock, which is released before the record is destroyed. Does nothing to an empty
+    /// handle.
     void release() {
         ReferenceInfo* const record = m_record;
         if (record == nullptr || record->lower() != 0) return;
@@ -66,7 +70,7 @@ class ReferenceCounter : public Object {
         m_object = nullptr;
     }
 
-    /// The object. On an empty handle the process ends with a message on standard error.
+    /// The object. For an empty handle, aborts the process with a message on standard error.
     T* operator->() const {
         if (m_record == nullptr) [[unlikely]] {
             std::fprintf(stderr, "FATAL! ReferenceCounter operator-> returns NULL\n");
@@ -76,7 +80,7 @@ class ReferenceCounter : public Object {
         return locked();
     }
 
-    /// The object, or null for an empty handle. The pointer is good while a handle lives.
+    /// The object, or null for an empty handle. The pointer is valid while a handle of it exists.
     T* get() const { return m_record == nullptr ? nullptr : locked(); }
 
   private:

@@ -141,8 +141,16 @@ TEST_F(ReferenceCounterTest, MoveAssignmentLetsGoOfTheFormerObject) {
     EXPECT_EQ(count(handle.get()), 1);
 }
 
+TEST_F(ReferenceCounterTest, OnlyWhatAllocatesNothingPromisesNotToThrow) {
+    static_assert(!std::is_nothrow_move_constructible_v<Handle>);
+    static_assert(std::is_nothrow_move_assignable_v<Handle>);
+    Handle handle(new Tracked(m_deleted));
+    Handle other;
+    other = std::move(handle);
+    EXPECT_EQ(count(other.get()), 1);
+}
+
 TEST_F(ReferenceCounterTest, VectorOfHandlesGrowsWithoutChangingCounts) {
-    static_assert(std::is_nothrow_move_constructible_v<Handle>);
     Handle const handle(new Tracked(m_deleted));
     std::vector<Handle> handles;
     for (int i = 0; i < 100; ++i)

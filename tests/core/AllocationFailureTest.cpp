@@ -1,0 +1,291 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Every allocation of a storm of handles and tables fails once; the library stays usable.
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cstdlib>
+#include <iostream>
+#include <new>
+#include <sstream>
+#include <utility>
+#include <vector>
+
+#include <gtest/gtest.h>
+
+#include "core/AddressMap.h"
+#include "core/IndexedTable.h"
+#include "core/ListenerTable.h"
+#include "core/RecyclingPool.h"
+#include "core/ReferenceCounter.h"
+#include "core/kvlvector.h"
+
+namespace {
+
+constexpr long kNone = -1;
+long s_untilFailure = kNone; ///< allocations that succeed before one fails
+long s_blocks = 0;           ///< allocated and not freed
+
+/// While it lives, the allocation after `successes` others fails; those behind it succeed.
+class FailingAllocation {
+  public:
+    explicit FailingAllocation(long successes) { s_untilFailure = successes; }
+    ~FailingAllocation() { s_untilFailure = kNone; }
+    FailingAllocation(FailingAllocation const&) = delete;
+    FailingAllocation& operator=(FailingAllocation const&) = delete;
+};
+
+void* allocate(std::size_t size, std::size_t alignment) {
+    if (s_untilFailure != kNone && s_untilFailure-- == 0) throw std::bad_alloc();
+    void* block = nullptr;
+    if (posix_memalign(&block, alignment, size) != 0) throw std::bad_alloc();
+    ++s_blocks;
+    return block;
+}
+
+void release(void* block) noexcept {
+    if (block != nullptr) --s_blocks;
+    std::free(block); // NOLINT(cppcoreguidelines-no-malloc)
+}
+
+} // namespace
+
+void* operator new(std::size_t size) {
+    return allocate(size, alignof(std::max_align_t));
+}
+void* operator new(std::size_t size, std::align_val_t alignment) {
+    return allocate(size, static_cast<std::size_t>(alignment));
+}
+void operator delete(void* block) noexcept {
+    release(block);
+}
+void operator delete(void* block, std::size_t /*size*/) noexcept {
+    release(block);
+}
+void operator delete(void* block, std::align_val_t /*alignment*/) noexcept {
+    release(block);
+}
+void operator delete(void* block, std::size_t /*size*/, std::align_val_t /*alignment*/) noexcept {
+    release(block);
+}
+
+namespace {
+
+int s_alive = 0;
+
+class Counted : public Object {
+  public:
+    Counted() : Object(true) { ++s_alive; }
+    ~Counted() override { --s_alive; }
+};
+
+using Handle = ReferenceCounter<Counted>;
+
+/// A new object's handle. An object that could not be given to a handle is still ours.
+Handle made() {
+    auto* const object = new Counted;
+    try {
+        return {object};
+    } catch (...) {
+        delete object;
+        throw;
+    }
+}
+
+/// Handles of enough objects that the reference table grows with the next few.
+std::vector<Handle> almostTooMany() {
+    constexpr int kEnough = 506;
+    std::vector<Handle> handles;
+    handles.reserve(kEnough);
+    while (ReferenceTable::get_instance()->referenced_objects() < kEnough)
+        handles.push_back(made());
+    return handles;
+}
+
+bool isUsable(std::vector<Handle> const& kept) {
+    ReferenceTable& table = *ReferenceTable::get_instance();
+    auto const number = static_cast<int>(kept.size());
+    for (Handle const& handle : kept) {
+        ReferenceInfo const* const record = table.get_refinfo(handle.get());
+        if (record == nullptr || record->count() != 1) return false;
+    }
+    if (table.referenced_objects() != number || s_alive != number) return false;
+    {
+        std::vector<Handle> more;
+        for (int i = 0; i < 600; ++i)
+            more.push_back(made());
+        if (table.referenced_objects() != number + 600) return false;
+    }
+    return table.referenced_objects() == number && s_alive == number;
+}
+
+enum Outcome : int { NothingFailed, Failed, Unusable };
+
+/// What becomes of the process when the allocation after `successes` others of `storm` fails.
+template <class Storm>
+Outcome outcomeOf(Storm const& storm, long successes, std::vector<Handle> const& kept) {
+    long const blocks = s_blocks;
+    bool failed = false;
+    try {
+        FailingAllocation const failing(successes);
+        storm();
+    } catch (std::bad_alloc const&) {
+        failed = true;
+    }
+#ifdef KVLOAM_NO_POOL
+    if (s_blocks != blocks) return Unusable; // something has leaked
+#else
+    static_cast<void>(blocks); // what is recycled is not given back
+#endif
+    if (!isUsable(kept)) return Unusable;
+    return failed ? Failed : NothingFailed;
+}
+
+/// Each allocation of `storm` fails in a process of its own, so that nothing has been recycled and
+/// the reference table has not grown.
+template <class Storm>
+void failEachAllocationOf(Storm const& storm, long atLeast) {
+    std::vector<Handle> const kept = almostTooMany();
+    for (long successes = 0;; ++successes) {
+        pid_t const child = fork();
+        ASSERT_NE(child, -1);
+        if (child == 0) _exit(outcomeOf(storm, successes, kept));
+        int status = 0;
+        ASSERT_EQ(waitpid(child, &status, 0), child);
+        ASSERT_TRUE(WIFEXITED(status)) << "allocation " << successes << " ended the process";
+        ASSERT_NE(WEXITSTATUS(status), Unusable) << "allocation " << successes;
+        if (WEXITSTATUS(status) == NothingFailed) {
+            EXPECT_GE(successes, atLeast) << "the storm hardly allocates";
+            return;
+        }
+        ASSERT_EQ(WEXITSTATUS(status), Failed) << "allocation " << successes;
+    }
+}
+
+TEST(AllocationFailureTest, HandlesSurviveTheFailureOfAnyAllocation) {
+    failEachAllocationOf(
+        [] {
+            std::vector<Handle> handles;
+            for (int i = 0; i < 12; ++i)
+                handles.push_back(made());
+            std::vector<Handle> const copies = handles;
+            for (Handle const& handle : copies)
+                Handle const again(handle.get());
+            Handle moved(std::move(handles.back()));
+            handles.back() = moved;
+            handles.front() = std::move(moved);
+        },
+        60);
+}
+
+TEST(AllocationFailureTest, TablesSurviveTheFailureOfAnyAllocation) {
+    class Listener final : public EventListener {};
+    failEachAllocationOf(
+        [] {
+            ReferenceCounter<IndexedTable<int, Handle>> const table(new IndexedTable<int, Handle>);
+            ReferenceCounter<kvlvector<Handle>> const vector(new kvlvector<Handle>);
+            ListenerTable listeners;
+            Listener listener;
+            listeners.AddListener(&listener);
+            for (int i = 0; i < 8; ++i) {
+                enter_at_next_index(*table.get(), made());
+                vector->push_back(table->entries().begin()->second);
+            }
+            table->remove((*vector.get())[3]);
+        },
+        60);
+}
+
+TEST(AllocationFailureTest, IndexThatCouldNotBeEnteredIsHandedOutNext) {
+    IndexedTable<int, Handle> table;
+    Handle const thing = made();
+    EXPECT_EQ(enter_at_next_index(table, thing), 1);
+    Handle argument = thing;
+    EXPECT_THROW(
+        {
+            FailingAllocation const failing(0);
+            static_cast<void>(enter_at_next_index(table, std::move(argument)));
+        },
+        std::bad_alloc);
+    EXPECT_EQ(table.last_index(), 1);
+    EXPECT_EQ(enter_at_next_index(table, thing), 2);
+}
+
+TEST(AllocationFailureTest, DumpThatFindsNoMemoryWritesNothing) {
+    class OwnTable : public ReferenceTable {
+      public:
+        OwnTable() = default;
+    };
+    OwnTable table;
+    Counted object;
+    table.create_refinfo(&object);
+    long successes = 0;
+    for (bool fails = true; fails; ++successes) {
+        std::ostringstream text;
+        auto* const before = std::cout.rdbuf(text.rdbuf());
+        try {
+            FailingAllocation const failing(successes);
+            fails = false;
+            table.dump();
+        } catch (std::bad_alloc const&) {
+            fails = true;
+        }
+        std::cout.rdbuf(before);
+        if (fails) {
+            EXPECT_EQ(text.str(), "") << "allocation " << successes;
+        }
+        EXPECT_EQ(table.referenced_objects(), 1);
+    }
+    EXPECT_GT(successes, 3);
+    table.destroy_refcount(&object);
+}
+
+class AddressMapFailureTest : public testing::Test {
+  protected:
+    static constexpr std::size_t kBeforeGrowth = 511;
+
+    AddressMapFailureTest() : m_addresses(kBeforeGrowth + 1) {
+        for (std::size_t i = 0; i < kBeforeGrowth; ++i)
+            m_map.find_or_insert(&m_addresses[i], [&] { return &m_addresses[i]; });
+    }
+
+    void expectAsBefore() {
+        EXPECT_EQ(m_map.size(), kBeforeGrowth);
+        for (std::size_t i = 0; i < kBeforeGrowth; ++i)
+            EXPECT_EQ(m_map.find(&m_addresses[i]), &m_addresses[i]) << i;
+        EXPECT_EQ(m_map.find(&m_addresses.back()), nullptr);
+    }
+    char* insertLast() {
+        return m_map.find_or_insert(&m_addresses.back(), [this] { return &m_addresses.back(); });
+    }
+
+    std::vector<char> m_addresses;
+    KVL::AddressMap<char*> m_map;
+};
+
+TEST_F(AddressMapFailureTest, MapThatCannotGrowIsAsBefore) {
+    EXPECT_THROW(
+        {
+            FailingAllocation const failing(0);
+            insertLast();
+        },
+        std::bad_alloc);
+    expectAsBefore();
+    EXPECT_EQ(insertLast(), &m_addresses.back());
+    EXPECT_EQ(m_map.size(), kBeforeGrowth + 1);
+}
+
+TEST_F(AddressMapFailureTest, ValueThatCannotBeMadeIsNotEntered) {
+    EXPECT_THROW(
+        m_map.find_or_insert(&m_addresses.back(), []() -> char* { throw std::bad_alloc(); }),
+        std::bad_alloc);
+    expectAsBefore();
+}
+
+TEST_F(AddressMapFailureTest, ClearNeedsNoMemory) {
+    FailingAllocation const failing(0);
+    m_map.clear();
+    EXPECT_EQ(m_map.size(), 0U);
+    EXPECT_EQ(m_map.find(m_addresses.data()), nullptr);
+}
+
+} // namespace
