@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// All of the library's public headers.
+// Includes all public headers of the library.
 #pragma once
 
 #include "access/DevMapBoardIf.h"

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The listeners behind every pair of add-listener and notify-listeners operations.
+// The list of listeners behind add-listener and notify-listeners operations.
 #pragma once
 
 #include <array>
@@ -10,8 +10,8 @@
 
 #include "core/Event.h"
 
-/// Listeners in the order of addition, each once. They are not owned. Not synchronised: the table's
-/// owner guards it.
+/// A `ListenerTable` is a list of listeners in the order of addition, without duplicates. It does
+/// not own them. Unsynchronised, except for `version()`: the table's owner guards it.
 class KVLOAM_API ListenerTable {
   public:
     ListenerTable() = default;
@@ -19,17 +19,17 @@ class KVLOAM_API ListenerTable {
     ListenerTable(ListenerTable const&) = delete;
     ListenerTable& operator=(ListenerTable const&) = delete;
 
-    /// Appends `listener` unless it is in the table already. Returns 0.
+    /// Appends `listener` unless the table has it already. Returns 0.
     virtual int AddListener(EventListener* listener);
     /// Returns 0, or 1 when `listener` is not in the table.
     virtual int RemoveListener(EventListener* listener);
-    /// Null for an empty table.
+    /// The first listener; null when the table is empty.
     virtual EventListener* GetFirstListener();
-    /// Null when `listener` is the last one or is not in the table, so that a listener that removes
-    /// itself ends a walk.
+    /// The listener after `listener`; null when it is the last one or is not in the table. A
+    /// listener that removes itself therefore ends a walk.
     virtual EventListener* GetNextListener(EventListener* listener);
 
-    /// How often the table has changed. Readable without the owner's guard.
+    /// The number of changes so far. Thread-safe.
     std::uint32_t version() const { return m_version.load(std::memory_order_acquire); }
 
   private:
@@ -37,12 +37,13 @@ class KVLOAM_API ListenerTable {
     std::atomic<std::uint32_t> m_version{0};
 };
 
-/// Calls `call(listener)` for every listener, from first to last. The walk is live: a listener
-/// added meanwhile is called too, and a listener that removes itself ends it. `guard`, where there
-/// is one, is locked while the table is read, never during a call.
+/// Calls `call(listener)` for every listener, from first to last. The walk follows changes: a
+/// listener that is added meanwhile is called too, and a listener that removes itself ends the
+/// walk. `guard` may be null; otherwise it is locked while the table is read, and never during a
+/// call.
 template <class Listener, class Call>
 void for_each_listener(ListenerTable& table, Object* guard, Call const& call) {
-    // Read a few listeners at a time; while the table does not change they are the walk.
+    // Read a few listeners at a time; they stay valid as long as the table does not change.
     std::array<EventListener*, 8> ahead;
     std::size_t count = 0;
     std::uint32_t version = 0;

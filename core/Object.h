@@ -6,12 +6,13 @@
 #include "platform/BriefLock.h"
 #include "platform/KVLLockable_pthread.h"
 
-/// A managed object: made with `new`, handed at once to a `ReferenceCounter`, deleted with the last
-/// handle. It may carry a recursive lock of its own, and it carries the list of the interface
-/// identifiers that it answers to, from the root class down.
+/// An `Object` is a managed object: made with `new`, given at once to a `ReferenceCounter`, and
+/// deleted with its last handle. It has a recursive lock if it is made lockable, and a list of the
+/// interface identifiers that it answers to, from the root class down. `lock()` and `unlock()` are
+/// thread-safe; derived classes say what their own operations are.
 ///
-/// A handle of `this` must not be made in a constructor or a destructor: dropping it would delete
-/// the object.
+/// Do not make a handle of `this` in a constructor or destructor: dropping it would delete the
+/// object.
 class KVLOAM_API Object {
   public:
     /// `lockable`: whether the object gets a recursive lock. The default serves classes that have
@@ -21,25 +22,25 @@ class KVLOAM_API Object {
     Object(Object const&) = delete;
     Object& operator=(Object const&) = delete;
 
-    /// Takes the object's lock; its holder may take it again. Returns 0; without a lock: prints a
-    /// line on standard output and returns 99.
+    /// Takes the object's lock; the thread that holds it may take it again. Returns 0. An object
+    /// without a lock prints a line on standard output and returns 99.
     int lock();
-    /// Gives the lock back. Returns as `lock`; 4 when the calling thread does not hold it.
+    /// Releases the lock. Returns as `lock` does, and 4 when the calling thread does not hold it.
     int unlock();
 
     /// The identifiers that the object answers to; owned by the object, never null.
     KVL::IIDList* interfaces() const { return m_interfaces; }
 
   protected:
-    /// Selects the constructor below, so that `Object(0)` means "not lockable".
+    /// Selects the constructor that adopts a lock, so that `Object(0)` means "not lockable".
     struct Adopt {};
-    /// An object with the given lock, which it owns from here on, even if the construction fails.
+    /// An object with the lock `lock`, which it owns from the call on, even if construction fails.
     Object(Adopt, KVLLockable_pthread* lock);
 
     /// The lock itself; null when the object was made without one.
     KVLLockable* lockable() const { return m_lock; }
 
-    /// The mutex behind `lockable()`, for our own short critical sections; null without one.
+    /// The mutex of `lockable()`, for short critical sections; null without a lock.
     pthread_mutex_t* mutex() const { return m_lock ? m_lock->get_impl_mutex() : nullptr; }
 
   private:
@@ -49,8 +50,8 @@ class KVLOAM_API Object {
     KVL::IIDList* m_interfaces;
 };
 
-/// Holds an object's lock for a scope. On an object without one it prints what `lock()` prints and
-/// goes on.
+/// An `ObjectGuard` holds an object's lock for a scope. For an object without a lock it prints what
+/// `lock()` prints and continues.
 class ObjectGuard {
   public:
     explicit ObjectGuard(Object& object) : m_object(object) {

@@ -1,11 +1,12 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Recycles constructed blocks: a small cache per thread, exchanged in batches with a central stock.
+// Recycles constructed objects: a small cache in each thread, which exchanges batches with a
+// central stock.
 //
-// Handles are made and dropped by the million, and each owns an identifier list of 2.6 KB. Keeping
-// the blocks constructed makes that cost two pointer moves. The batches let a thread that only
-// drops what another one made (events, bulk copies) feed the maker.
+// Programs make and drop millions of handles, and each owns an identifier list of 2.6 KB. With
+// lists that stay constructed, that costs two pointer moves. The batches return objects to the
+// thread that makes handles when another thread drops them (events, bulk copies).
 //
-// Sanitizer builds go straight to the heap, so that a use after free is seen.
+// Sanitizer builds use the heap directly, so that a use after free is detected.
 #pragma once
 
 #include <cstddef>
@@ -23,9 +24,10 @@
 
 namespace KVL {
 
-/// A pool of `T`. One per type; its state is static and never destroyed, for threads may outlive
-/// every destructor of the process. `T` must be default-constructible; `give` hands back an object
-/// in the state in which `take` should find it.
+/// A `RecyclingPool` hands out objects of type `T` and takes them back. There is one for each type;
+/// its state is static and never destroyed, because threads may outlive all static destructors. `T`
+/// must be default-constructible. `give` requires an object in the state in which `take` returns
+/// it. Thread-safe.
 template <class T>
 class RecyclingPool {
   public:
@@ -44,7 +46,7 @@ class RecyclingPool {
             return refill();
         cache.head = block->next;
         --cache.count;
-        // Blocks that come from another thread are cold; the next one is asked for soon.
+        // Blocks from another thread are not in the cache; the next one is needed soon.
         __builtin_prefetch(cache.head, 1);
         return block->object();
     }
@@ -60,12 +62,12 @@ class RecyclingPool {
     }
 
   private:
-    /// Aligned so that the links and the head of the object share a cache line: that line is all
-    /// that a recycled list is touched at.
+    /// Aligned so that the links and the beginning of the object share a cache line: recycling a
+    /// list touches no other line.
     struct alignas(64) Block {
         Block* next = nullptr;
-        Block* nextBatch = nullptr; ///< of a batch's first block: the batch below it in the stock
-        std::int32_t batchSize = 0; ///< of a batch's first block
+        Block* nextBatch = nullptr; ///< in a batch's first block: the next batch in the stock
+        std::int32_t batchSize = 0; ///< in a batch's first block
         alignas(T) unsigned char storage[sizeof(T)];
 
         Block() { new (storage) T; }
@@ -77,13 +79,13 @@ class RecyclingPool {
 
     static constexpr std::int32_t kBatch = 64;
     static constexpr std::int32_t kCacheLimit = 2 * kBatch;
-    /// Beyond this many blocks the stock gives memory back to the heap.
+    /// The stock returns further blocks to the heap.
     static constexpr std::int32_t kStockLimit = 32768;
 
     struct Cache {
         Block* head = nullptr;
         std::int32_t count = 0;
-        std::int32_t limit = 0; ///< 0 before the thread's first use and after its end
+        std::int32_t limit = 0; ///< 0 before the thread's first use of it, and when the thread ends
         bool ended = false;
     };
 

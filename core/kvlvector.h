@@ -8,7 +8,8 @@
 
 #include "core/Object.h"
 
-/// A vector of `T` that is an `Object` of its own. Not lockable: its owner guards it.
+/// A `kvlvector` is a vector of `T` that is an `Object`, so that handles can share it. Without a
+/// lock; unsynchronised: its owner guards it.
 template <class T>
 class kvlvector : public Object {
   public:

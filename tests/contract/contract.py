@@ -6,21 +6,21 @@ import dataclasses
 from layouts import Base, Field
 
 HEAD = """\
-# The binary contract: what a program or a board module that was compiled before counts on.
+# The binary contract: what compiled programs and board modules rely on.
 #
-# One block a class of the public headers. Two numbers side by side are those of a 64-bit and of a
-# 32-bit program. Offsets and sizes are in bytes.
+# One block for each class of the public headers. Of two numbers, the first is that of 64-bit programs
+# and the second that of 32-bit programs. Offsets and sizes are in bytes.
 #
 #   size S64 S32
-#   base NAME O64 O32          a base class in the order of declaration, with its offset
-#   base virtual NAME          a virtual base; where it lies differs from class to class
-#   slot N RESULT OPERATION    a virtual operation that the class declares, by its slot in the
+#   base NAME O64 O32          a base class, in the order of declaration, with its offset
+#   base virtual NAME          a virtual base; its offset differs from class to class
+#   slot N RESULT OPERATION    a virtual operation that the class declares, with its slot in the
 #                              class's own table; a destructor takes two slots
-#   field NAME O64+S64 O32+S32 a data member by offset and size; private ones count, for inline
-#                              operations and derived classes are compiled into the modules
+#   field NAME O64+S64 O32+S32 a data member, with its offset and size; private ones are listed
+#                              because modules contain compiled inline operations and derived classes
 #
-# A class template stands here by one instance. Written by scripts/update-abi; CONTRIBUTING.md says
-# what may change.
+# A class template is represented by one instance. scripts/update-abi writes this file; CONTRIBUTING.md
+# says what may change.
 """
 
 
@@ -36,7 +36,7 @@ class Block:
 
 
 class FormatError(Exception):
-    """A line of the file can not be read."""
+    """A line of the file cannot be read."""
 
 
 def _pair(words):

@@ -14,12 +14,12 @@ SLOT = re.compile(r"\(DW_OP_constu: (\d+)\)|\(DW_OP_lit(\d+)\)")
 
 CLASSES = {"class_type", "structure_type"}
 SCOPES = CLASSES | {"namespace", "union_type"}
-# Nothing beneath these tells of a layout.
+# Nothing below these describes a layout.
 CLOSED = {"subprogram", "lexical_block", "inlined_subroutine", "subroutine_type", "call_site"}
 
 
 class UnreadableError(Exception):
-    """The debug information can not be had, or says what this reader does not know."""
+    """The debug information cannot be read."""
 
 
 @dataclasses.dataclass
