@@ -12,7 +12,7 @@
 #include "LineState.h"
 #include "Z7SimIntervalTable.h"
 #include "core/ReferenceCounter.h"
-#include "simulator/Control.h"
+#include "simulator/exports/Control.h"
 
 namespace {
 

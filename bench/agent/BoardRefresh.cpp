@@ -8,7 +8,7 @@
 #include "agent/readers/ResourceReader.h"
 #include "agent/rows/ResourceRow.h"
 #include "platform/ActionScheduler_pthread.h"
-#include "simulator/Control.h"
+#include "simulator/exports/Control.h"
 
 namespace {
 

@@ -5,6 +5,7 @@
 #include <string>
 #include <utility>
 
+#include "CopyText.h"
 #include "Withdrawable.h"
 
 namespace {
@@ -12,12 +13,6 @@ namespace {
 constexpr char const* kNoAnswer = "board does not answer";
 constexpr char const* kOtherBoard = "another board answers in its place";
 constexpr char const* kReportedFailed = "board is reported failed by the platform";
-
-/// Copies `text` with its terminator. A device mapper text fits every caller's buffer.
-int copyText(std::string const& text, char* buffer) {
-    std::memcpy(buffer, text.c_str(), text.size() + 1);
-    return 0;
-}
 
 } // namespace
 

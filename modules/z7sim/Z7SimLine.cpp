@@ -4,16 +4,12 @@
 #include <cstring>
 #include <utility>
 
+#include "CopyText.h"
+
 namespace {
 
 constexpr int kUp = 1;
 constexpr int kDown = 2;
-
-/// Texts of the device mapper have at most 128 bytes with their terminator.
-int copyText(std::string const& text, char* buffer) {
-    std::memcpy(buffer, text.c_str(), text.size() + 1);
-    return 0;
-}
 
 } // namespace
 

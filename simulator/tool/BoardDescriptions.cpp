@@ -6,10 +6,13 @@
 #include <set>
 #include <sstream>
 
-#include "simulator/AttributeSchema.h"
-#include "simulator/ChassisJson.h"
-#include "simulator/ChassisReader.h"
-#include "simulator/Generator.h"
+#include "simulator/base/Text.h"
+#include "simulator/chassis/AttributeSchema.h"
+#include "simulator/chassis/ChassisError.h"
+#include "simulator/description/ChassisJson.h"
+#include "simulator/description/ChassisReader.h"
+#include "simulator/description/Description.h"
+#include "simulator/description/Generator.h"
 #include "simulator/tool/ControlClient.h"
 
 namespace kvlsim {

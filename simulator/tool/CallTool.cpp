@@ -6,11 +6,12 @@
 #include <chrono>
 #include <fstream>
 #include <iostream>
-#include <memory>
 #include <sstream>
 #include <thread>
 
-#include "simulator/Channels.h"
+#include "simulator/base/Text.h"
+#include "simulator/chassis/Channels.h"
+#include "simulator/description/Description.h"
 #include "simulator/tool/CommandGroup.h"
 #include "simulator/tool/TextTable.h"
 

@@ -10,6 +10,8 @@
 #include <cerrno>
 #include <cstring>
 
+#include "simulator/base/Descriptor.h"
+
 namespace kvlsim {
 
 ControlClient::ControlClient(std::string path, std::chrono::seconds timeout)

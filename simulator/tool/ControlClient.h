@@ -3,12 +3,13 @@
 #pragma once
 
 #include <chrono>
+#include <functional>
 #include <stdexcept>
 #include <string>
 
 #include <nlohmann/json.hpp>
 
-#include "simulator/ControlSocket.h"
+#include "simulator/base/Descriptor.h"
 
 namespace kvlsim {
 
@@ -36,5 +37,8 @@ class ControlClient {
     Descriptor m_socket;
     std::string m_received;
 };
+
+/// Connects to the platform that the command line names. Throws ToolError.
+using Connect = std::function<ControlClient()>;
 
 } // namespace kvlsim

@@ -4,11 +4,10 @@
 
 #include <array>
 #include <iostream>
-#include <memory>
 #include <optional>
 
-#include "simulator/Description.h"
-#include "simulator/Line.h"
+#include "simulator/base/Text.h"
+#include "simulator/chassis/Line.h"
 #include "simulator/tool/CommandGroup.h"
 #include "simulator/tool/TextTable.h"
 

@@ -4,10 +4,9 @@
 
 #include <charconv>
 #include <iostream>
-#include <memory>
 
-#include "simulator/Description.h"
-#include "simulator/ProcessDraft.h"
+#include "simulator/base/Text.h"
+#include "simulator/chassis/ProcessDraft.h"
 #include "simulator/tool/CommandGroup.h"
 #include "simulator/tool/TextTable.h"
 

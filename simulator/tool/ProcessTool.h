@@ -6,7 +6,7 @@
 
 #include <CLI/CLI.hpp>
 
-#include "simulator/tool/StoreTool.h"
+#include "simulator/tool/ControlClient.h"
 
 namespace kvlsim {
 

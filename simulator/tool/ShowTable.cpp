@@ -6,8 +6,8 @@
 #include <string>
 #include <vector>
 
-#include "simulator/AttributeSchema.h"
-#include "simulator/Description.h"
+#include "simulator/base/Text.h"
+#include "simulator/chassis/AttributeSchema.h"
 #include "simulator/tool/TextTable.h"
 
 namespace kvlsim {

@@ -4,10 +4,9 @@
 
 #include <iomanip>
 #include <iostream>
-#include <memory>
 
-#include "simulator/Description.h"
-#include "simulator/StoreSchema.h"
+#include "simulator/base/Text.h"
+#include "simulator/chassis/StoreSchema.h"
 #include "simulator/tool/BoardDescriptions.h"
 #include "simulator/tool/CommandGroup.h"
 #include "simulator/tool/TextTable.h"

@@ -10,8 +10,6 @@
 
 namespace kvlsim {
 
-using Connect = std::function<ControlClient()>;
-
 /// Adds the commands; the one that is chosen puts what to do into `chosen`.
 void addStoreCommands(CLI::App& app, Connect connect, std::function<void()>& chosen);
 

@@ -6,9 +6,10 @@
 
 #include <CLI/CLI.hpp>
 
-#include "simulator/AttributeSchema.h"
-#include "simulator/ChassisReader.h"
-#include "simulator/Generator.h"
+#include "simulator/chassis/AttributeSchema.h"
+#include "simulator/chassis/ChassisError.h"
+#include "simulator/description/ChassisReader.h"
+#include "simulator/description/Generator.h"
 #include "simulator/tool/BoardDescriptions.h"
 #include "simulator/tool/CallTool.h"
 #include "simulator/tool/ControlClient.h"

@@ -15,9 +15,9 @@
 
 #include "boardplatform/isdn_channels.h"
 #include "boardplatform/vqx_event_service.h"
-#include "simulator/Control.h"
+#include "simulator/exports/Control.h"
 
-namespace kvlsim::testing {
+namespace support {
 
 class EventJournal final : public VqxEventService::CEventHandlerAdaptor {
   public:
@@ -67,4 +67,4 @@ class EventJournal final : public VqxEventService::CEventHandlerAdaptor {
     std::vector<std::unique_ptr<VqxEventService::VqxAdminConsumer>> m_consumers;
 };
 
-} // namespace kvlsim::testing
+} // namespace support

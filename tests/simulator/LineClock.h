@@ -7,9 +7,9 @@
 
 #include "boardplatform/dm_client.h"
 #include "boardplatform/ds1_line.h"
-#include "simulator/Control.h"
+#include "simulator/exports/Control.h"
 
-namespace kvlsim::testing {
+namespace support {
 
 /// The clock of the lines while this lives. One at a time.
 class LineClock {
@@ -36,4 +36,4 @@ inline DS1LineCounters readLine(long handle) {
     return counters;
 }
 
-} // namespace kvlsim::testing
+} // namespace support

@@ -21,7 +21,7 @@
 #include "boardplatform/dm_client.h"
 #include "boardplatform/qsb.h"
 #include "boardplatform/vqx_event_service.h"
-#include "simulator/Control.h"
+#include "simulator/exports/Control.h"
 
 namespace {
 

@@ -9,7 +9,7 @@
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 
-#include "simulator/Control.h"
+#include "simulator/exports/Control.h"
 
 namespace sim {
 

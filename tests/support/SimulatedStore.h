@@ -10,8 +10,8 @@
 #include <sqlite3.h>
 
 #include "boardplatform/qsb.h"
-#include "simulator/Control.h"
-#include "tests/simulator/TemporaryDirectory.h"
+#include "simulator/exports/Control.h"
+#include "tests/support/TemporaryDirectory.h"
 
 namespace sim {
 
@@ -52,7 +52,7 @@ class Store {
     }
 
   private:
-    kvlsim::testing::TemporaryDirectory m_around;
+    support::TemporaryDirectory m_around;
 };
 
 } // namespace sim

@@ -10,7 +10,7 @@
 
 #include "HostEthernet.h"
 #include "core/ReferenceCounter.h"
-#include "tests/simulator/TemporaryDirectory.h"
+#include "tests/support/TemporaryDirectory.h"
 
 namespace {
 
@@ -24,7 +24,7 @@ class HostEthernetTest : public testing::Test {
         std::ofstream(m_files / file) << text << '\n';
     }
 
-    kvlsim::testing::TemporaryDirectory m_directory;
+    support::TemporaryDirectory m_directory;
     std::filesystem::path m_files = m_directory.file("net0");
     HostEthernet* m_ethernet = new HostEthernet(HostDevice("net0", m_directory.file(".")));
     ReferenceCounter<KVL::Ethernet> m_handle{m_ethernet};

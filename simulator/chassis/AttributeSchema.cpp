@@ -1,0 +1,115 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// What the simulator knows of the platform's attributes and object types: the tables.
+#include "simulator/chassis/AttributeSchema.h"
+
+#include <algorithm>
+#include <array>
+#include <unordered_map>
+
+#include "boardplatform/ds1_line.h"
+#include "boardplatform/isdn_channels.h"
+
+namespace kvlsim {
+
+namespace {
+
+constexpr std::array<std::int32_t, 13> kDeviceTypes = {501, 503, 505, 507, 509, 514, 516,
+                                                       518, 520, 521, 511, 525, 527};
+constexpr std::array<std::int32_t, 11> kSubDeviceTypes = {502, 504, 506, 508, 510, 517,
+                                                          519, 522, 512, 526, 528};
+
+constexpr std::array<std::string_view, 5> kLiveAttributes = {
+    kDS1LineCounters, kDS1LinePastSeconds, kDS1LinePast, kISDNChannelStates, kISDNSignallingState};
+
+std::unordered_map<std::string_view, AttributeKind> const& knownAttributes() {
+    using enum AttributeKind;
+    static std::unordered_map<std::string_view, AttributeKind> const known = {
+        // Boards.
+        {"NAME", text},
+        {"SERIAL_NUMBER", text},
+        {"DESCRIPTION", text},
+        {"FAMILY", text},
+        {"CTPLATFORM", text},
+        {"FIRMWARE_NAME", text},
+        {"FIRMWARE_NAME1", text},
+        {"FIRMWARE_VERSION", text},
+        {"STATE_CHANGE_DATE", text},
+        {"BOARD_CONDITION", number},
+        {"BOARD_PRESENT", number},
+        {"PCI_SLOT_NUMBER", number},
+        {"PCI_BUS_NUMBER", number},
+        {"SHELF_ID", number},
+        {"CHASSIS_SLOT", number},
+        {"MEMBASEADDR", number},
+        {"IOBASEADDR", number},
+        {"IRQ", number},
+        {"VORN_DRIVER_BOARD_ID", number},
+        {"LOGICAL ID", number},
+        {"Board Id (BLT ID)", number},
+        {"ETHERNET_DEVICE", text},
+        {"ETHERNET_ADDRESS", text},
+        {"ETHERNET_SPEED", number},
+        {"ETHERNET_MTU", number},
+        {"ETHERNET_IN_OCTETS", number},
+        {"ETHERNET_OUT_OCTETS", number},
+        {"ETHERNET_FCS_ERRORS", number},
+        // Devices and sub-devices.
+        {"ChannelCount", number},
+        {"FrontEndType", number},
+        {"Out_Variant", byte},
+        {"LINEADMINADDR", descriptor},
+        {"TSCADDR", descriptor},
+        {"CLUSTERADDR", descriptor},
+        {"CTBUSADDR", descriptor},
+        {"IPVSCADDR", descriptor},
+        // Lines.
+        {kDS1LineType, number},
+        {"LINE_CODING", number},
+        {"LINE_LENGTH", number},
+        {"LINE_BUILD_OUT", number},
+        {"LINE_NUMBER", number},
+        {"SIGNAL_MODE", number},
+        {"CLOCK_SOURCE", number},
+        {"FDL", number},
+        {"CIRCUIT", text},
+        // Processors.
+        {"PROC_NUM", number},
+        {"BK_VERSION", text},
+        {"BK_FILE", text},
+        {"RTK_VERSION", text},
+        {"RTK_FILE", text},
+    };
+    return known;
+}
+
+/// Is it this stem and a number behind it?
+bool isNumbered(std::string_view attribute, std::string_view stem) {
+    if (!attribute.starts_with(stem) || attribute.size() == stem.size()) return false;
+    return std::ranges::all_of(attribute.substr(stem.size()),
+                               [](char c) { return c >= '0' && c <= '9'; });
+}
+
+} // namespace
+
+AttributeKind kindOf(std::string_view attribute) {
+    auto const& known = knownAttributes();
+    if (auto const found = known.find(attribute); found != known.end()) return found->second;
+    if (isNumbered(attribute, "Protocol_Type_")) return AttributeKind::byte;
+    for (char const* stem : {"IP_ADDRESS_", "IP_MASK_", "IP_BROADCAST_"})
+        if (isNumbered(attribute, stem)) return AttributeKind::text;
+    return AttributeKind::any;
+}
+
+bool isLiveAttribute(std::string_view attribute) {
+    return std::ranges::find(kLiveAttributes, attribute) != kLiveAttributes.end();
+}
+
+std::span<std::int32_t const> deviceTypes() {
+    return kDeviceTypes;
+}
+
+std::span<std::int32_t const> subDeviceTypes() {
+    return kSubDeviceTypes;
+}
+
+} // namespace kvlsim

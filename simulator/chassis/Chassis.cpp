@@ -1,0 +1,187 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The chassis: its objects and the indexes over them.
+#include "simulator/chassis/Chassis.h"
+
+#include <chrono>
+
+#include "simulator/base/Text.h"
+#include "simulator/chassis/ChassisError.h"
+
+namespace kvlsim {
+
+namespace {
+
+constexpr std::string_view kName = "NAME";
+constexpr std::string_view kSerialNumber = "SERIAL_NUMBER";
+
+/// The text of an attribute, or null when it is missing or no text.
+AttributeValue const* textAttribute(AttributeMap const& attributes, std::string_view name) {
+    auto const found = attributes.find(name);
+    if (found == attributes.end() || found->second.form() != ValueForm::text) return nullptr;
+    return &found->second;
+}
+
+} // namespace
+
+char const* nameOf(ObjectKind kind) {
+    switch (kind) {
+    case ObjectKind::root:
+        return "root";
+    case ObjectKind::board:
+        return "board";
+    case ObjectKind::device:
+        return "device";
+    case ObjectKind::subDevice:
+        return "sub-device";
+    case ObjectKind::processor:
+        return "processor";
+    }
+    return "object";
+}
+
+std::string textOf(ChassisObject const* object, std::string_view attribute) {
+    AttributeValue const* const value = object == nullptr ? nullptr : object->attribute(attribute);
+    return value != nullptr && value->form() == ValueForm::text ? std::string(value->asText()) : "";
+}
+
+Chassis::Chassis() {
+    ChassisObject root;
+    root.handle = kRootHandle;
+    m_objects.emplace(kRootHandle, std::move(root));
+}
+
+ChassisObject const* Chassis::find(long handle) const {
+    auto const narrow = static_cast<std::int32_t>(handle);
+    if (narrow != handle) return nullptr; // a long may have 8 bytes, no handle has
+    auto const found = m_objects.find(narrow);
+    return found == m_objects.end() ? nullptr : &found->second;
+}
+
+ChassisObject const* Chassis::firstNamed(std::string_view name) const {
+    auto const found = m_byName.find(name);
+    return found == m_byName.end() ? nullptr : find(found->second.begin()->second);
+}
+
+std::vector<ChassisObject const*> Chassis::named(std::string_view name) const {
+    std::vector<ChassisObject const*> objects;
+    if (auto const found = m_byName.find(name); found != m_byName.end())
+        for (auto const& [order, handle] : found->second)
+            objects.push_back(find(handle));
+    return objects;
+}
+
+ChassisObject const* Chassis::boardWithSerial(std::string_view serialNumber) const {
+    auto const found = m_bySerial.find(serialNumber);
+    return found == m_bySerial.end() ? nullptr : find(found->second);
+}
+
+void Chassis::insertBoard(ObjectDraft board) {
+    refuseTaken(board);
+    if (auto const* serial = textAttribute(board.attributes, kSerialNumber))
+        refuseSerial(serial->asText(), board.handle, board.line);
+    add(std::move(board), kRootHandle);
+}
+
+void Chassis::removeBoard(std::int32_t handle) {
+    std::erase(m_objects.at(kRootHandle).children, handle);
+    discard(handle);
+}
+
+void Chassis::setAttribute(std::int32_t handle, std::string const& name, AttributeValue value) {
+    ChassisObject& object = m_objects.at(handle);
+    if (object.kind == ObjectKind::board && name == kSerialNumber &&
+        value.form() == ValueForm::text)
+        refuseSerial(value.asText(), handle, 0);
+    unindex(object, name);
+    object.attributes.insert_or_assign(name, std::move(value));
+    index(object, name);
+}
+
+bool Chassis::unsetAttribute(std::int32_t handle, std::string_view name) {
+    ChassisObject& object = m_objects.at(handle);
+    auto const found = object.attributes.find(name);
+    if (found == object.attributes.end()) return false;
+    unindex(object, name);
+    object.attributes.erase(found);
+    return true;
+}
+
+void Chassis::setLineClock(LineClock* clock) {
+    m_lineClock = clock;
+    LiveLine::Time const now = lineTime();
+    for (auto& [handle, object] : m_objects)
+        if (object.ds1Line) object.ds1Line->restart(now);
+}
+
+LiveLine::Time Chassis::lineTime() const {
+    return m_lineClock != nullptr ? m_lineClock()
+                                  : std::chrono::steady_clock::now().time_since_epoch();
+}
+
+void Chassis::refuseTaken(ObjectDraft const& draft) const {
+    if (auto const* taken = find(draft.handle))
+        throw ChassisError(draft.line, "handle " + std::to_string(draft.handle) +
+                                           " is taken by another " + nameOf(taken->kind) +
+                                           "; choose a free one");
+    for (auto const& child : draft.children)
+        refuseTaken(child);
+}
+
+void Chassis::refuseSerial(std::string_view serialNumber, std::int32_t forBoard, int line) const {
+    ChassisObject const* const other = boardWithSerial(serialNumber);
+    if (other == nullptr || other->handle == forBoard) return;
+    throw ChassisError(line, "board " + std::to_string(forBoard) + " cannot have SERIAL_NUMBER " +
+                                 inQuotes(serialNumber) + ": board " +
+                                 std::to_string(other->handle) +
+                                 " has it; serial numbers must differ");
+}
+
+void Chassis::add(ObjectDraft draft, std::int32_t parent) {
+    ChassisObject object;
+    object.kind = draft.kind;
+    object.handle = draft.handle;
+    object.parent = parent;
+    object.order = m_nextOrder++;
+    object.attributes = std::move(draft.attributes);
+    if (draft.ds1Line)
+        object.ds1Line = std::make_unique<LiveLine>(std::move(*draft.ds1Line), lineTime());
+    if (draft.channels) object.channels = std::make_unique<Channels>(std::move(*draft.channels));
+    ChassisObject const& added = m_objects.emplace(draft.handle, std::move(object)).first->second;
+    m_objects.at(parent).children.push_back(draft.handle);
+    index(added, kName);
+    index(added, kSerialNumber);
+    for (auto& child : draft.children)
+        add(std::move(child), draft.handle);
+}
+
+void Chassis::discard(std::int32_t handle) {
+    ChassisObject const& object = m_objects.at(handle);
+    for (std::int32_t const child : object.children)
+        discard(child);
+    unindex(object, kName);
+    unindex(object, kSerialNumber);
+    m_objects.erase(handle);
+}
+
+void Chassis::index(ChassisObject const& object, std::string_view attribute) {
+    auto const* const text = textAttribute(object.attributes, attribute);
+    if (text == nullptr) return;
+    if (attribute == kName)
+        m_byName[std::string(text->asText())].emplace(object.order, object.handle);
+    else if (attribute == kSerialNumber && object.kind == ObjectKind::board)
+        m_bySerial.insert_or_assign(std::string(text->asText()), object.handle);
+}
+
+void Chassis::unindex(ChassisObject const& object, std::string_view attribute) {
+    auto const* const text = textAttribute(object.attributes, attribute);
+    if (text == nullptr) return;
+    if (attribute == kName) {
+        auto const found = m_byName.find(text->asText());
+        found->second.erase({object.order, object.handle});
+        if (found->second.empty()) m_byName.erase(found);
+    } else if (attribute == kSerialNumber && object.kind == ObjectKind::board) {
+        m_bySerial.erase(m_bySerial.find(text->asText()));
+    }
+}
+
+} // namespace kvlsim

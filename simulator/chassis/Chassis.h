@@ -1,0 +1,127 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The chassis: boards with their devices, sub-devices and processors, found by handle, name or
+// serial number; their lines and channels; what its attribute store and its processes are like.
+#pragma once
+
+#include <cstdint>
+#include <functional>
+#include <memory>
+#include <optional>
+#include <set>
+#include <string>
+#include <string_view>
+#include <unordered_map>
+#include <utility>
+#include <vector>
+
+#include "simulator/chassis/AttributeMap.h"
+#include "simulator/chassis/Channels.h"
+#include "simulator/chassis/LiveLine.h"
+#include "simulator/chassis/ProcessDraft.h"
+#include "simulator/chassis/StoreDraft.h"
+
+namespace kvlsim {
+
+enum class ObjectKind : std::uint8_t { root, board, device, subDevice, processor };
+
+/// "board", "device" and so on.
+char const* nameOf(ObjectKind kind);
+
+/// An object as it is described, with its children, before it enters a chassis.
+struct ObjectDraft {
+    ObjectKind kind = ObjectKind::board;
+    std::int32_t handle = 0;
+    std::int32_t type = 0;
+    int line = 0;            ///< where it was described; 0 when it came without lines
+    AttributeMap attributes; ///< TYPE included
+    std::optional<LineDraft> ds1Line;
+    std::optional<Channels> channels;
+    std::vector<ObjectDraft> children;
+};
+
+/// An object of the chassis.
+struct ChassisObject {
+    ObjectKind kind = ObjectKind::root;
+    std::int32_t handle = 0;
+    std::int32_t parent = 0;
+    std::uint64_t order = 0; ///< place in the chassis: objects found first have lower numbers
+    AttributeMap attributes;
+    std::vector<std::int32_t> children; ///< in the order of the chassis
+    std::unique_ptr<LiveLine> ds1Line;  ///< null: it is no line
+    std::unique_ptr<Channels> channels; ///< null: it has no ISDN channels
+
+    AttributeValue const* attribute(std::string_view name) const {
+        auto const found = attributes.find(name);
+        return found == attributes.end() ? nullptr : &found->second;
+    }
+};
+
+/// The text of an attribute; empty when there is no object or no such text.
+std::string textOf(ChassisObject const* object, std::string_view attribute);
+
+/// Not synchronised: the platform guards it with its lock. An operation that throws has changed
+/// nothing.
+class Chassis {
+  public:
+    /// The root object's handle. Objects have handles from 1 to just below it.
+    static constexpr std::int32_t kRootHandle = 0x7FFFFFFF;
+
+    using LineClock = LiveLine::Time();
+
+    Chassis();
+
+    ChassisObject const* find(long handle) const;
+    /// The first object of the chassis with this NAME, or null.
+    ChassisObject const* firstNamed(std::string_view name) const;
+    /// All objects with this NAME, in the order of the chassis.
+    std::vector<ChassisObject const*> named(std::string_view name) const;
+    ChassisObject const* boardWithSerial(std::string_view serialNumber) const;
+    ChassisObject const& root() const { return m_objects.at(kRootHandle); }
+    std::size_t boardCount() const { return root().children.size(); }
+
+    /// Adds a board behind the others. Throws ChassisError when a handle or the serial number is
+    /// taken.
+    void insertBoard(ObjectDraft board);
+    /// Requires: the board is there.
+    void removeBoard(std::int32_t handle);
+    /// Throws ChassisError when this gives a board the serial number of another.
+    /// Requires: the object is there.
+    void setAttribute(std::int32_t handle, std::string const& name, AttributeValue value);
+    /// Returns whether the object had the attribute. Requires: the object is there.
+    bool unsetAttribute(std::int32_t handle, std::string_view name);
+
+    /// The clock of the lines; null: the steady clock. All lines begin again as at loading.
+    void setLineClock(LineClock* clock);
+    /// What the clock of the lines tells now.
+    LiveLine::Time lineTime() const;
+    /// To change them. Require: the object has one.
+    LiveLine& line(std::int32_t handle) { return *m_objects.at(handle).ds1Line; }
+    Channels& channels(std::int32_t handle) { return *m_objects.at(handle).channels; }
+
+    /// What the attribute store holds when it is made.
+    StoreDraft const& store() const { return m_store; }
+    void setStore(StoreDraft store) { m_store = std::move(store); }
+    /// The processes of the runtime library; none: the process itself.
+    std::optional<std::vector<ProcessDraft>> const& processes() const { return m_processes; }
+    void setProcesses(std::vector<ProcessDraft> processes) { m_processes = std::move(processes); }
+
+  private:
+    void refuseTaken(ObjectDraft const& draft) const;
+    void refuseSerial(std::string_view serialNumber, std::int32_t forBoard, int line) const;
+    void add(ObjectDraft draft, std::int32_t parent);
+    void discard(std::int32_t handle);
+    void index(ChassisObject const& object, std::string_view attribute);
+    void unindex(ChassisObject const& object, std::string_view attribute);
+
+    using Named = std::set<std::pair<std::uint64_t, std::int32_t>>;
+
+    std::unordered_map<std::int32_t, ChassisObject> m_objects;
+    std::unordered_map<std::string, Named, TextHash, std::equal_to<>> m_byName;
+    std::unordered_map<std::string, std::int32_t, TextHash, std::equal_to<>> m_bySerial;
+    std::uint64_t m_nextOrder = 0;
+    LineClock* m_lineClock = nullptr;
+    StoreDraft m_store;
+    std::optional<std::vector<ProcessDraft>> m_processes;
+};
+
+} // namespace kvlsim

@@ -1,0 +1,99 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// A DS1 line's counters and alarms over time.
+#pragma once
+
+#include <array>
+#include <chrono>
+#include <cstdint>
+#include <string_view>
+
+#include "boardplatform/ds1_line.h"
+
+namespace kvlsim {
+
+/// What a line counts, in the order of DS1LineCounters, as descriptions and commands name it.
+inline constexpr std::array<std::string_view, 4> kLineErrorNames = {
+    "code-violations", "path-violations", "framing-errors", "slips"};
+
+using LineErrors = std::array<std::uint32_t, kLineErrorNames.size()>;
+/// Errors per second, in billionths: sums of them are exact.
+using LineRates = std::array<std::uint64_t, kLineErrorNames.size()>;
+
+inline constexpr std::uint64_t kLineRateUnit = 1'000'000'000;
+/// Errors per second; what many rates add up to still fits.
+inline constexpr std::uint64_t kMaxLineRate = 1'000'000;
+
+/// The alarms' names; alarm n is bit n of `DS1LineCounters::alarms`.
+inline constexpr std::array<std::string_view, 11> kLineAlarmNames = {"los",
+                                                                     "lof",
+                                                                     "ais",
+                                                                     "rai",
+                                                                     "sending-rai",
+                                                                     "sending-ais",
+                                                                     "loopback",
+                                                                     "ts16-ais",
+                                                                     "remote-multiframe",
+                                                                     "sending-remote-multiframe",
+                                                                     "test-code"};
+
+/// The types' names as descriptions and commands write them.
+struct LineTypeName {
+    std::string_view name;
+    DS1LineType type;
+};
+inline constexpr std::array<LineTypeName, 4> kLineTypeNames = {{{"esf", DS1LineType::esf},
+                                                                {"d4", DS1LineType::d4},
+                                                                {"e1", DS1LineType::e1},
+                                                                {"e1-crc", DS1LineType::e1Crc}}};
+
+/// "esf" and so on; empty for a number that is no type.
+std::string_view nameOf(DS1LineType type);
+
+/// Counts evenly and without chance: after t seconds at a rate r, floor(r * t). Times are the
+/// line's age and do not go back from one call to the next.
+class Line {
+  public:
+    using Time = std::chrono::nanoseconds;
+
+    DS1LineCounters counters(Time age) const;
+    LineRates const& rates() const { return m_rates; }
+    /// The alarms that were raised, without those that follow from them.
+    std::uint32_t raised() const { return m_raised; }
+
+    /// Counts these at once.
+    void add(LineErrors const& errors);
+    void setRates(LineRates const& rates, Time age);
+    /// Lets these alarms, and no others, be raised.
+    void setRaised(std::uint32_t alarms, Time age);
+
+  private:
+    /// An even count. `part` is what it has beyond the whole, in billionths.
+    struct Count {
+        std::uint32_t whole = 0;
+        std::uint64_t part = 0;
+
+        Count after(std::uint64_t rate, Time time) const;
+    };
+
+    /// The seconds that a defect has touched.
+    class TouchedSeconds {
+      public:
+        std::uint32_t at(Time age) const;
+        void set(bool present, Time age);
+
+      private:
+        std::uint32_t m_counted = 0;
+        std::int64_t m_next = 0; ///< the first second that may still be counted
+        bool m_present = false;
+    };
+
+    std::array<Count, kLineErrorNames.size()> m_counts; ///< at `m_since`
+    LineRates m_rates{};                                ///< since then
+    Time m_since{};
+    std::uint32_t m_raised = 0;
+    TouchedSeconds m_lossOfSignal;
+    TouchedSeconds m_outOfFrame;
+    TouchedSeconds m_alarmIndication;
+};
+
+} // namespace kvlsim

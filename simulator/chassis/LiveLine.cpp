@@ -1,0 +1,19 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// A line of the chassis: its beginning.
+#include "simulator/chassis/LiveLine.h"
+
+#include <utility>
+
+#include "simulator/chassis/LinePast.h"
+
+namespace kvlsim {
+
+LiveLine::LiveLine(LineDraft draft, Time now)
+    : m_draft(std::move(draft)), m_loaded(now), m_line(lineAtLoading(m_draft)) {}
+
+void LiveLine::restart(Time now) {
+    m_loaded = now;
+    m_line = lineAtLoading(m_draft);
+}
+
+} // namespace kvlsim

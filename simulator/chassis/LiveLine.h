@@ -1,0 +1,41 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// A line of the chassis: a described line that has been running since it was loaded.
+#pragma once
+
+#include <cstdint>
+
+#include "simulator/chassis/LineDraft.h"
+
+namespace kvlsim {
+
+/// `now` is what the clock of lines tells. Not synchronised: the platform guards it with its lock.
+class LiveLine {
+  public:
+    using Time = Line::Time;
+
+    LiveLine(LineDraft draft, Time now);
+
+    /// Begins again as at loading.
+    void restart(Time now);
+
+    DS1LineCounters counters(Time now) const { return m_line.counters(age(now)); }
+    /// As it was described.
+    LineDraft const& draft() const { return m_draft; }
+    LineRates const& rates() const { return m_line.rates(); }
+    std::uint32_t raised() const { return m_line.raised(); }
+
+    void add(LineErrors const& errors) { m_line.add(errors); }
+    void setRates(LineRates const& rates, Time now) { m_line.setRates(rates, age(now)); }
+    void setRaised(std::uint32_t alarms, Time now) { m_line.setRaised(alarms, age(now)); }
+
+  private:
+    Time age(Time now) const {
+        return std::chrono::seconds(m_draft.past.seconds) + (now - m_loaded);
+    }
+
+    LineDraft m_draft;
+    Time m_loaded;
+    Line m_line;
+};
+
+} // namespace kvlsim

@@ -1,0 +1,20 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The control socket: JSON lines over a Unix stream socket, served by one thread.
+#pragma once
+
+#include <string>
+
+#include "simulator/platform/Platform.h"
+
+namespace kvlsim {
+
+/// Longest request line, without its line end.
+inline constexpr std::size_t kMaxControlLine = std::size_t(64) << 10;
+/// Clients served at once.
+inline constexpr std::size_t kMaxControlClients = 64;
+
+/// Serves `platform` on a socket at `path` until the process ends. When that is not possible, says
+/// why on standard error and leaves the platform without control. Called once.
+void startControlServer(std::string const& path, Platform& platform);
+
+} // namespace kvlsim

@@ -1,0 +1,20 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Reads attributes from their description.
+#pragma once
+
+#include <string_view>
+
+#include "simulator/chassis/AttributeMap.h"
+#include "simulator/description/Description.h"
+
+namespace kvlsim {
+
+/// All throw ChassisError.
+/// The attributes of an object of any kind, as a map "name: value".
+AttributeMap readAttributes(Description const& attributes);
+AttributeValue readAttribute(std::string_view name, Description const& value);
+/// What cannot be an attribute's name or text.
+void refuseUnfitName(std::string_view name, int line);
+void refuseUnfitText(std::string_view name, std::string_view text, int line);
+
+} // namespace kvlsim

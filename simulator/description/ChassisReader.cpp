@@ -1,0 +1,251 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Reads chassis and boards from their description.
+#include "simulator/description/ChassisReader.h"
+
+#include <algorithm>
+#include <array>
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+#include <ctime>
+#include <memory>
+#include <optional>
+#include <span>
+
+#include "simulator/base/Text.h"
+#include "simulator/chassis/AttributeSchema.h"
+#include "simulator/chassis/ChassisError.h"
+#include "simulator/chassis/ProcessDraft.h"
+#include "simulator/description/AttributeReader.h"
+#include "simulator/description/ChannelsReader.h"
+#include "simulator/description/Description.h"
+#include "simulator/description/DescriptionChecks.h"
+#include "simulator/description/LineReader.h"
+#include "simulator/description/ProcessReader.h"
+#include "simulator/description/StoreReader.h"
+
+namespace kvlsim {
+
+namespace {
+
+using Form = Description::Form;
+using Keys = std::span<std::string_view const>;
+
+constexpr std::array<std::string_view, 3> kChassisKeys = {"boards", "store", "processes"};
+constexpr std::array<std::string_view, 4> kBoardKeys = {"handle", "attributes", "devices",
+                                                        "processors"};
+constexpr std::array<std::string_view, 6> kDeviceKeys = {"handle",     "type", "attributes",
+                                                         "subdevices", "line", "channels"};
+constexpr std::array<std::string_view, 3> kSubDeviceKeys = {"handle", "type", "attributes"};
+constexpr std::array<std::string_view, 2> kProcessorKeys = {"handle", "attributes"};
+
+constexpr std::size_t kMaxFileSize = std::size_t(256) << 20;
+
+std::int32_t readHandle(Description const& object, ObjectKind kind) {
+    std::string const what = nameOf(kind);
+    Description const* const handle = object.find("handle");
+    if (handle == nullptr)
+        throw ChassisError(object.line,
+                           what + " without handle; give it a \"handle:\" of its own, 1 or more");
+    auto const number = handle->integer();
+    if (!number || *number < 1 || *number >= Chassis::kRootHandle)
+        throw ChassisError(handle->line, "the handle of a " + what + " cannot be " +
+                                             handle->words() + "; write a number from 1 to " +
+                                             std::to_string(Chassis::kRootHandle - 1));
+    return static_cast<std::int32_t>(*number);
+}
+
+std::int32_t readType(Description const& object, std::string const& what,
+                      std::span<std::int32_t const> known) {
+    Description const* const type = object.find("type");
+    auto const number = type == nullptr ? std::nullopt : type->integer();
+    if (number && std::ranges::find(known, *number) != known.end())
+        return static_cast<std::int32_t>(*number);
+    std::string list;
+    for (std::int32_t const code : known)
+        appendToList(list, std::to_string(code));
+    if (type == nullptr)
+        throw ChassisError(object.line, what + " has no type; give it one of " + list);
+    throw ChassisError(type->line,
+                       what + " cannot be of type " + type->words() + "; choose one of " + list);
+}
+
+/// Handle, attributes and TYPE, which every kind of object has.
+ObjectDraft readObject(Description const& object, ObjectKind kind, Keys keys) {
+    requireMap(object, std::string("a ") + nameOf(kind), "handle:");
+    ObjectDraft draft;
+    draft.kind = kind;
+    draft.line = object.line;
+    draft.handle = readHandle(object, kind);
+    std::string const what = std::string(nameOf(kind)) + ' ' + std::to_string(draft.handle);
+    refuseUnknownKeys(object, what, keys);
+    switch (kind) {
+    case ObjectKind::device:
+        draft.type = readType(object, what, deviceTypes());
+        break;
+    case ObjectKind::subDevice:
+        draft.type = readType(object, what, subDeviceTypes());
+        break;
+    case ObjectKind::processor:
+        draft.type = kProcessorType;
+        break;
+    default:
+        draft.type = kBoardType;
+        break;
+    }
+    if (Description const* attributes = object.find("attributes"))
+        if (attributes->form != Form::nothing) draft.attributes = readAttributes(*attributes);
+    draft.attributes.emplace("TYPE", AttributeValue::number(draft.type));
+    return draft;
+}
+
+/// What a device may have beyond other objects.
+void readDeviceParts(Description const& item, ObjectDraft& device) {
+    std::string const what = "device " + std::to_string(device.handle);
+    Description const* const channels = item.find("channels");
+    if (channels != nullptr) device.channels = readChannels(*channels, what);
+    Description const* const line = item.find("line");
+    if (line == nullptr) return;
+    device.ds1Line = readLine(*line, what);
+    auto const type = AttributeValue::number(static_cast<std::int32_t>(device.ds1Line->type));
+    auto const [attribute, isNew] = device.attributes.emplace(kDS1LineType, type);
+    AttributeValue const& written = attribute->second;
+    if (isNew || written.form() == ValueForm::empty || written.asNumber() == type.asNumber())
+        return;
+    throw ChassisError(
+        line->line,
+        "the line of " + what + " is of type " + std::string(nameOf(device.ds1Line->type)) + " (" +
+            std::to_string(type.asNumber()) + "), but its LINE_TYPE is " +
+            std::to_string(written.asNumber()) + "; remove LINE_TYPE from the attributes");
+}
+
+void readChildren(Description const& parent, std::string_view key, ObjectKind kind, Keys keys,
+                  ObjectDraft& into) {
+    Description const* const list = parent.find(key);
+    if (list == nullptr || list->form == Form::nothing) return;
+    if (list->form != Form::list)
+        throw ChassisError(list->line,
+                           std::string(key) + " cannot be " + list->words() +
+                               "; write a list, each entry beginning with \"- handle:\"");
+    for (auto const& item : list->items) {
+        ObjectDraft child = readObject(item, kind, keys);
+        if (kind == ObjectKind::device) {
+            readDeviceParts(item, child);
+            readChildren(item, "subdevices", ObjectKind::subDevice, kSubDeviceKeys, child);
+        }
+        into.children.push_back(std::move(child));
+    }
+}
+
+/// Two objects of one description with one handle.
+void refuseSharedHandles(std::span<ObjectDraft const> objects,
+                         std::unordered_map<std::int32_t, ObjectDraft const*>& seen) {
+    for (auto const& object : objects) {
+        auto const [first, isNew] = seen.emplace(object.handle, &object);
+        if (!isNew) {
+            std::string const where =
+                first->second->line > 0 ? " of line " + std::to_string(first->second->line) : "";
+            throw ChassisError(object.line, "handle " + std::to_string(object.handle) +
+                                                " is already the " + nameOf(first->second->kind) +
+                                                where + "; give every object a handle of its own");
+        }
+        refuseSharedHandles(object.children, seen);
+    }
+}
+
+ObjectDraft readBoardOnly(Description const& description, std::string const& date) {
+    ObjectDraft board = readObject(description, ObjectKind::board, kBoardKeys);
+    auto const serial = board.attributes.find(std::string_view("SERIAL_NUMBER"));
+    if (serial == board.attributes.end() || serial->second.form() != ValueForm::text ||
+        serial->second.asText().empty())
+        throw ChassisError(description.line, "board " + std::to_string(board.handle) +
+                                                 " has no SERIAL_NUMBER; give it one under "
+                                                 "attributes");
+    board.attributes.emplace("BOARD_CONDITION", AttributeValue::number(static_cast<std::int32_t>(
+                                                    BoardCondition::started)));
+    board.attributes.emplace("BOARD_PRESENT", AttributeValue::number(1));
+    board.attributes.emplace("STATE_CHANGE_DATE", AttributeValue::text(date));
+    readChildren(description, "devices", ObjectKind::device, kDeviceKeys, board);
+    readChildren(description, "processors", ObjectKind::processor, kProcessorKeys, board);
+    return board;
+}
+
+} // namespace
+
+ObjectDraft readBoard(Description const& description) {
+    ObjectDraft board = readBoardOnly(description, currentDate());
+    std::unordered_map<std::int32_t, ObjectDraft const*> seen;
+    refuseSharedHandles({&board, 1}, seen);
+    return board;
+}
+
+Chassis readChassis(std::string const& yamlText) {
+    Description const file = describeYaml(yamlText);
+    if (file.form == Form::nothing)
+        throw ChassisError(1, "there is nothing in it; begin the chassis with \"boards:\"");
+    requireMap(file, "a chassis", "boards:");
+    refuseUnknownKeys(file, "the chassis", kChassisKeys);
+    Description const* const list = file.find("boards");
+    if (list == nullptr)
+        throw ChassisError(file.line, "no boards; begin the chassis with \"boards:\"");
+    std::vector<ObjectDraft> boards;
+    if (list->form != Form::nothing) {
+        if (list->form != Form::list)
+            throw ChassisError(list->line,
+                               "boards cannot be " + list->words() +
+                                   "; write a list, each board beginning with \"- handle:\"");
+        std::string const date = currentDate();
+        for (auto const& item : list->items)
+            boards.push_back(readBoardOnly(item, date));
+    }
+    std::unordered_map<std::int32_t, ObjectDraft const*> seen;
+    refuseSharedHandles(boards, seen);
+    Chassis chassis;
+    for (auto& board : boards)
+        chassis.insertBoard(std::move(board));
+    if (Description const* const store = file.find("store")) {
+        chassis.setStore(readStore(*store));
+        refuseHomelessBoards(chassis.store(), chassis);
+    }
+    if (Description const* const processes = file.find("processes"))
+        chassis.setProcesses(readProcesses(*processes));
+    return chassis;
+}
+
+std::string readChassisFile(std::string const& path) {
+    auto const fail = [](int error) {
+        throw ChassisError(0, std::string("cannot be read (") + std::strerror(error) +
+                                  "); name a chassis file that exists and is readable");
+    };
+    std::unique_ptr<std::FILE, int (*)(std::FILE*)> const file(std::fopen(path.c_str(), "re"),
+                                                               &std::fclose);
+    if (file == nullptr) fail(errno);
+    std::string text;
+    std::array<char, 65536> block{};
+    while (std::size_t const size = std::fread(block.data(), 1, block.size(), file.get())) {
+        text.append(block.data(), size);
+        if (text.size() > kMaxFileSize)
+            throw ChassisError(0, "too large; a chassis file has at most 256 MiB");
+    }
+    if (std::ferror(file.get()) != 0) fail(errno);
+    return text;
+}
+
+std::string currentDate() {
+    static constexpr std::array<char const*, 7> days = {"Sun", "Mon", "Tue", "Wed",
+                                                        "Thu", "Fri", "Sat"};
+    static constexpr std::array<char const*, 12> months = {
+        "Jan", "Feb", "Mar", "Apr", "May", "Jun", "Jul", "Aug", "Sep", "Oct", "Nov", "Dec"};
+    std::time_t const now = std::time(nullptr);
+    std::tm local{};
+    localtime_r(&now, &local);
+    // Not strftime: the platform's names are English whatever locale the process runs in.
+    std::array<char, 80> text{};
+    std::snprintf(text.data(), text.size(), "%s %s %2d %02d:%02d:%02d %d",
+                  days[static_cast<std::size_t>(local.tm_wday)],
+                  months[static_cast<std::size_t>(local.tm_mon)], local.tm_mday, local.tm_hour,
+                  local.tm_min, local.tm_sec, local.tm_year + 1900);
+    return text.data();
+}
+
+} // namespace kvlsim

@@ -1,0 +1,22 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Reads a chassis, a board or one attribute from its description and refuses what is wrong.
+#pragma once
+
+#include <string>
+
+#include "simulator/chassis/Chassis.h"
+#include "simulator/description/Description.h"
+
+namespace kvlsim {
+
+/// All throw ChassisError with the line and a message that says what to do.
+Chassis readChassis(std::string const& yamlText);
+/// Defaults (condition, presence, date) included.
+ObjectDraft readBoard(Description const& description);
+/// Reads a file; throws ChassisError (without line) when it cannot be read.
+std::string readChassisFile(std::string const& path);
+
+/// Now, in the format of STATE_CHANGE_DATE, local time.
+std::string currentDate();
+
+} // namespace kvlsim

@@ -1,0 +1,19 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Reads the part "processes" of a chassis.
+#pragma once
+
+#include <string_view>
+#include <vector>
+
+#include "simulator/chassis/ProcessDraft.h"
+#include "simulator/description/Description.h"
+
+namespace kvlsim {
+
+/// Both throw ChassisError.
+std::vector<ProcessDraft> readProcesses(Description const& processes);
+/// `counters` and `rates` are maps "name: number"; null: none.
+Counters readCounters(Description const* counters, Description const* rates);
+void refuseUnfitProcessName(std::string_view name, int line);
+
+} // namespace kvlsim

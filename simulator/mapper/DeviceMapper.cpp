@@ -1,0 +1,193 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The simulated device mapper client: searches and reads over the chassis.
+#include "simulator/mapper/DeviceMapper.h"
+
+#include <algorithm>
+#include <cstring>
+#include <optional>
+#include <span>
+
+#include "simulator/chassis/LinePast.h"
+
+namespace kvlsim {
+
+namespace {
+
+/// Equal when sizes and bytes are equal; a text's size counts its terminating NUL.
+bool matches(ChassisObject const& object, DMAttribute const& criterion) {
+    AttributeValue const* const value = object.attribute(criterion.name);
+    if (value == nullptr) return false;
+    std::string_view const bytes = value->bytes();
+    return bytes.size() == static_cast<std::size_t>(criterion.size) &&
+           (bytes.empty() || std::memcmp(bytes.data(), criterion.value, bytes.size()) == 0);
+}
+
+bool isSound(DMAttribute const& criterion) {
+    return criterion.name != nullptr && criterion.size >= 0 &&
+           (criterion.value != nullptr || criterion.size == 0);
+}
+
+/// The whole past of a line, or nothing.
+std::int32_t readPast(DMAttribute& request, std::int32_t capacity, LinePast const& past) {
+    std::int64_t const size = (past.seconds + 1) * std::int64_t(sizeof(DS1LineCounters));
+    if (size > capacity) return kBufferTooSmall;
+    auto* to = static_cast<unsigned char*>(request.value);
+    replayPast(past, [&to](DS1LineCounters const& counters) {
+        std::memcpy(to, &counters, sizeof counters);
+        to += sizeof counters;
+    });
+    request.size = static_cast<std::int32_t>(size);
+    return 0;
+}
+
+std::int32_t readBytes(DMAttribute& request, std::int32_t capacity, void const* bytes,
+                       std::size_t size) {
+    if (size > static_cast<std::size_t>(capacity)) return kBufferTooSmall;
+    std::memcpy(request.value, bytes, size);
+    request.size = static_cast<std::int32_t>(size);
+    return 0;
+}
+
+/// Answers what a line or ISDN channels tell of themselves; none: the attribute is no such one.
+std::optional<std::int32_t> readLive(DMAttribute& request, std::int32_t capacity,
+                                     ChassisObject const& object, Chassis const& chassis) {
+    std::string_view const name = request.name;
+    if (object.ds1Line) {
+        LinePast const& past = object.ds1Line->draft().past;
+        if (name == kDS1LineCounters) {
+            DS1LineCounters const counters = object.ds1Line->counters(chassis.lineTime());
+            return readBytes(request, capacity, &counters, sizeof counters);
+        }
+        if (past.seconds > 0 && name == kDS1LinePastSeconds) {
+            auto const seconds = static_cast<std::int32_t>(past.seconds);
+            return readBytes(request, capacity, &seconds, sizeof seconds);
+        }
+        if (past.seconds > 0 && name == kDS1LinePast) return readPast(request, capacity, past);
+    }
+    if (object.channels) {
+        std::string_view const states = object.channels->states();
+        if (name == kISDNChannelStates)
+            return readBytes(request, capacity, states.data(), states.size());
+        auto const signalling = object.channels->signalling();
+        if (name == kISDNSignallingState)
+            return readBytes(request, capacity, &signalling, sizeof signalling);
+    }
+    return std::nullopt;
+}
+
+/// Answers one attribute; leaves the buffer alone unless the status is 0.
+void readInto(DMAttribute& request, ChassisObject const& object, Chassis const& chassis) {
+    std::int32_t const capacity = request.size;
+    request.size = 0;
+    if (request.name == nullptr || capacity < 0 || (request.value == nullptr && capacity > 0)) {
+        request.status = kInvalidAttribute;
+        return;
+    }
+    if (auto const status = readLive(request, capacity, object, chassis)) {
+        request.status = *status;
+        return;
+    }
+    AttributeValue const* const value = object.attribute(request.name);
+    if (value == nullptr) {
+        request.status = kNoAttribute;
+        return;
+    }
+    std::string_view bytes = value->bytes();
+    // A text is cut to the buffer, without terminator when it fills it; half a number is useless.
+    if (value->form() == ValueForm::text)
+        bytes = bytes.substr(0, static_cast<std::size_t>(capacity));
+    if (bytes.size() > static_cast<std::size_t>(capacity)) {
+        request.status = kBufferTooSmall;
+        return;
+    }
+    if (!bytes.empty()) std::memcpy(request.value, bytes.data(), bytes.size());
+    request.size = static_cast<std::int32_t>(bytes.size());
+    request.status = 0;
+}
+
+void failAll(std::span<DMAttribute> requests) {
+    for (auto& request : requests) {
+        request.status = kInvalidAttribute;
+        request.size = 0;
+    }
+}
+
+class Client final : public DeviceMapperClient {
+  public:
+    explicit Client(GuardedChassis& chassis) : m_chassis(chassis) {}
+
+    int FindObjects(long parent, int count, DMAttribute* criteria, int* found,
+                    long* auids) override {
+        if (found == nullptr) return kInvalidRequest;
+        int const capacity = *found;
+        *found = 0;
+        if (count < 0 || capacity < 0 || (criteria == nullptr && count > 0) ||
+            (auids == nullptr && capacity > 0))
+            return kInvalidRequest;
+        std::span const wanted(criteria, static_cast<std::size_t>(count));
+        if (!std::ranges::all_of(wanted, isSound)) return kInvalidRequest;
+        return m_chassis.read([&](Chassis const* chassis) {
+            if (chassis == nullptr) return kNoChassis;
+            ChassisObject const* const object = chassis->find(parent);
+            if (object == nullptr) return kUnknownObject;
+            for (std::int32_t const handle : object->children) {
+                if (*found == capacity) break;
+                ChassisObject const& child = *chassis->find(handle);
+                auto const holds = [&child](auto const& each) { return matches(child, each); };
+                if (std::ranges::all_of(wanted, holds)) auids[(*found)++] = handle;
+            }
+            return 0;
+        });
+    }
+
+    int Reserved3() override { return kInvalidRequest; }
+
+    int GetRootObject(long* auid) override {
+        if (auid == nullptr) return kInvalidRequest;
+        return m_chassis.read([&](Chassis const* chassis) {
+            if (chassis == nullptr) return kNoChassis;
+            *auid = Chassis::kRootHandle;
+            return 0;
+        });
+    }
+
+    int FindObjectByName(char* name, long* auid) override {
+        if (name == nullptr || auid == nullptr) return kInvalidRequest;
+        return m_chassis.read([&](Chassis const* chassis) {
+            if (chassis == nullptr) return kNoChassis;
+            ChassisObject const* const object = chassis->firstNamed(name);
+            if (object == nullptr) return kUnknownObject;
+            *auid = object->handle;
+            return 0;
+        });
+    }
+
+    int GetAttributes(long auid, int count, DMAttribute* requests) override {
+        if (count < 0 || (requests == nullptr && count > 0)) return kInvalidRequest;
+        std::span const wanted(requests, static_cast<std::size_t>(count));
+        return m_chassis.read([&](Chassis const* chassis) {
+            ChassisObject const* const object = chassis == nullptr ? nullptr : chassis->find(auid);
+            if (object == nullptr) {
+                failAll(wanted);
+                return chassis == nullptr ? kNoChassis : kUnknownObject;
+            }
+            int result = 0;
+            for (auto& request : wanted) {
+                readInto(request, *object, *chassis);
+                if (request.status != 0) result = kDMSomeAttributesFailed;
+            }
+            return result;
+        });
+    }
+
+  private:
+    GuardedChassis& m_chassis;
+};
+
+} // namespace
+
+std::unique_ptr<DeviceMapperClient> makeDeviceMapper(GuardedChassis& chassis) {
+    return std::make_unique<Client>(chassis);
+}
+
+} // namespace kvlsim

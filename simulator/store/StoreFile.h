@@ -1,0 +1,30 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The file of an attribute store: its making and its recognition.
+#pragma once
+
+#include <cstdint>
+#include <functional>
+#include <string>
+#include <string_view>
+
+#include "simulator/store/Database.h"
+#include "simulator/store/StoreContents.h"
+
+namespace kvlsim {
+
+inline constexpr char const* kStoreFileName = "attributes.db";
+/// The root record's instance.
+inline constexpr int kRootInstance = 1;
+
+/// Makes the file, whole or not at all, where there is none; leaves one that is there alone.
+/// Throws what `contents` throws, and DatabaseError.
+void makeStoreFile(std::string const& path, std::function<StoreContents()> const& contents);
+
+/// Throws DatabaseError, also for a file that is no attribute store; that file stays as it is.
+Database openStoreFile(std::string const& path, DatabaseUse use);
+
+/// Adds a record and returns its instance.
+std::int64_t addRecord(Database& database, RecordType const& type, std::int64_t parent,
+                       std::string_view record);
+
+} // namespace kvlsim

@@ -1,0 +1,55 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The real kvlsim against a real process that holds a platform.
+#pragma once
+
+#include <fstream>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include "tests/support/ChildProcess.h"
+#include "tests/support/TemporaryDirectory.h"
+
+class ToolTest : public testing::Test {
+  protected:
+    /// Starts the process, in the place of an earlier one.
+    support::ChildProcess& hold(std::vector<std::string> environment = {}) {
+        holder.reset(); // an earlier one gives the socket up before the next wants it
+        environment.push_back("KVLSIM_SOCKET=" + socket());
+        holder = std::make_unique<support::ChildProcess>(
+            std::vector<std::string>{KVLSIM_PLATFORM_HOLDER}, environment);
+        EXPECT_EQ(holder->readLine(), "ready");
+        return *holder;
+    }
+    support::Finished kvlsim(std::vector<std::string> arguments) const {
+        arguments.insert(arguments.begin(), KVLSIM_TOOL);
+        return support::run(arguments, {"KVLSIM_SOCKET=" + socket()});
+    }
+    /// What the tool prints; it must succeed without a word of complaint.
+    std::string succeed(std::vector<std::string> const& arguments) const {
+        auto const finished = kvlsim(arguments);
+        EXPECT_EQ(finished.status, 0) << arguments.front() << ": " << finished.err;
+        EXPECT_EQ(finished.err, "");
+        return finished.out;
+    }
+    /// The tool must fail with `status` and say `words`.
+    void expectRefusal(std::vector<std::string> const& arguments, int status,
+                       std::string const& words) const {
+        auto const finished = kvlsim(arguments);
+        EXPECT_EQ(finished.status, status);
+        EXPECT_THAT(finished.err, testing::HasSubstr(words));
+        EXPECT_EQ(finished.out, "");
+    }
+    std::string write(char const* name, std::string const& text) const {
+        std::string const path = directory.file(name);
+        std::ofstream(path) << text;
+        return path;
+    }
+    std::string socket() const { return directory.file("socket"); }
+
+    support::TemporaryDirectory directory;
+    std::unique_ptr<support::ChildProcess> holder;
+};
