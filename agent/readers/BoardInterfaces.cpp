@@ -14,6 +14,7 @@
 #include "board/DS1LineFeature.h"
 #include "board/EthernetFeature.h"
 #include "board/IPInterface.h"
+#include "board/ISDNChannelOnLine.h"
 #include "board/ISDNFeature.h"
 #include "board/InterfaceFeature.h"
 
@@ -21,17 +22,17 @@ namespace kvloamd {
 
 namespace {
 
-// IF-MIB's names of types.
+// Values of ifType.
 constexpr int kTypeLoopback = 24;
 constexpr int kTypeIsdn = 63;
 constexpr int kTypeDs0 = 81;
 constexpr int kTrue = 1;
 constexpr int kFalse = 2;
 
-/// What any DS0 carries.
+/// The speed of a DS0, in bit/s.
 constexpr std::uint32_t kBearerSpeed = 64000;
 
-/// Of one signalling channel, whatever it says.
+/// The largest number of bearer channels that is believed of one signalling channel.
 constexpr int kMostBearers = 1024;
 
 /// Texts of the model have 256 bytes at most; a concrete class may answer longer ones.
@@ -77,6 +78,9 @@ class Reading {
     void stack(std::uint32_t channel, std::uint32_t line);
     /// The line that is called `name`, or whose circuit is; 0 when there is none.
     std::uint32_t findLine(std::string const& name) const;
+    /// The line that `channel` itself says; 0 if it says none of this board. Nothing if the channel
+    /// cannot say.
+    std::optional<std::uint32_t> ownLine(Object& channel) const;
 
     ToTicks const& m_toTicks;
     LineHistories& m_histories;
@@ -84,6 +88,7 @@ class Reading {
     std::set<IndexKey> m_taken;
     std::map<IndexKind, int> m_nameless;
     std::map<std::string, std::uint32_t> m_lines; ///< by name and by circuit
+    std::map<DS1LineDevice const*, std::uint32_t> m_lineObjects;
 };
 
 InterfaceRow& Reading::enter(IndexKind kind, std::string const& name) {
@@ -157,6 +162,7 @@ void Reading::readLine(DS1LineDevice& line) {
     if (history.get() != nullptr) m_histories.read(history, row);
     m_lines.emplace(name, row.ifIndex);
     m_lines.emplace(row.circuitIdentifier, row.ifIndex);
+    m_lineObjects.emplace(&line, row.ifIndex);
     m_found.rows.lines.push_back(std::move(row));
 }
 
@@ -212,20 +218,22 @@ void Reading::readChannels(ISDNFeature& feature) {
          channel = feature.GetNextDChannel(channel)) {
         std::uint32_t const index = readSignalling(*channel.get());
         SignallingRow const& row = m_found.rows.signalling.back();
-        std::uint32_t const line = findLine(row.callingAddress);
+        std::uint32_t const line = ownLine(*channel.get()).value_or(findLine(row.callingAddress));
         stack(index, line);
         int const bearers = std::min(row.bearerCount.value_or(0), kMostBearers);
         lineOfBearer.insert(lineOfBearer.end(), static_cast<std::size_t>(bearers), line);
     }
-    std::vector<std::uint32_t> bearers;
+    std::vector<std::pair<std::uint32_t, std::optional<std::uint32_t>>> bearers;
     for (auto channel = feature.GetFirstBChannel(); channel.get() != nullptr;
          channel = feature.GetNextBChannel(channel))
-        bearers.push_back(readBearer(*channel.get()));
-    // Bearer channels come in the order of the signalling channels that they belong to. Where the
-    // counts do not agree, nobody knows which is whose.
-    if (lineOfBearer.size() != bearers.size()) return;
-    for (std::size_t i = 0; i < bearers.size(); ++i)
-        stack(bearers[i], lineOfBearer[i]);
+        bearers.emplace_back(readBearer(*channel.get()), ownLine(*channel.get()));
+    // Bearer channels that cannot say their line come in the order of the signalling channels that
+    // they belong to. If the counts do not agree, their lines are not known.
+    bool const countsAgree = lineOfBearer.size() == bearers.size();
+    for (std::size_t i = 0; i < bearers.size(); ++i) {
+        auto const& [index, line] = bearers[i];
+        stack(index, line.value_or(countsAgree ? lineOfBearer[i] : 0));
+    }
 }
 
 void Reading::stack(std::uint32_t channel, std::uint32_t line) {
@@ -235,6 +243,14 @@ void Reading::stack(std::uint32_t channel, std::uint32_t line) {
 std::uint32_t Reading::findLine(std::string const& name) const {
     auto const found = m_lines.find(name);
     return name.empty() || found == m_lines.end() ? 0 : found->second;
+}
+
+std::optional<std::uint32_t> Reading::ownLine(Object& channel) const {
+    auto* const onLine = dynamic_cast<ISDNChannelOnLine*>(&channel);
+    if (onLine == nullptr) return std::nullopt;
+    ReferenceCounter<DS1LineDevice> const line = onLine->GetLine();
+    auto const found = m_lineObjects.find(line.get());
+    return found == m_lineObjects.end() ? 0 : found->second;
 }
 
 void Reading::readEthernets(KVL::EthernetFeature& feature) {

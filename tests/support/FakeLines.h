@@ -8,6 +8,7 @@
 #include <utility>
 #include <vector>
 
+#include "board/ISDNChannelOnLine.h"
 #include "platform/ActionScheduler_pthread.h"
 #include "z7/DS1LineFeatureZ7.h"
 #include "z7/ISDNChannelZ7.h"
@@ -136,7 +137,7 @@ class FakeLineFeature final : public DS1LineFeatureZ7 {
     }
 };
 
-class FakeBChannel final : public ISDNBChannelZ7 {
+class FakeBChannel : public ISDNBChannelZ7 {
   public:
     FakeBChannel(char const* name, int status) : ISDNBChannelZ7(name), m_status(status) {}
     int GetChannelType() override { return 1; }
@@ -147,7 +148,7 @@ class FakeBChannel final : public ISDNBChannelZ7 {
     int m_status;
 };
 
-class FakeDChannel final : public ISDNDChannelZ7 {
+class FakeDChannel : public ISDNDChannelZ7 {
   public:
     FakeDChannel(char const* name, int status, int bearers, std::string callingAddress)
         : ISDNDChannelZ7(name),
@@ -168,13 +169,26 @@ class FakeDChannel final : public ISDNDChannelZ7 {
     std::string m_callingAddress;
 };
 
+/// A fake channel of either kind that says its line.
+template <class FakeChannel>
+class OnLine final : public FakeChannel, public ISDNChannelOnLine {
+  public:
+    template <class... Arguments>
+    explicit OnLine(FakeLine* line, Arguments&&... arguments)
+        : FakeChannel(std::forward<Arguments>(arguments)...), m_line(line) {}
+    ReferenceCounter<DS1LineDevice> GetLine() override { return m_line; }
+
+  private:
+    ReferenceCounter<DS1LineDevice> m_line;
+};
+
 class FakeISDNFeature final : public ISDNFeatureZ7 {
   public:
-    FakeISDNFeature(std::vector<FakeDChannel*> const& signalling,
-                    std::vector<FakeBChannel*> const& bearers) {
-        for (FakeDChannel* const channel : signalling)
+    FakeISDNFeature(std::vector<ISDNDChannel*> const& signalling,
+                    std::vector<ISDNBChannel*> const& bearers) {
+        for (ISDNDChannel* const channel : signalling)
             m_signallingChannels.emplace_back(channel);
-        for (FakeBChannel* const channel : bearers)
+        for (ISDNBChannel* const channel : bearers)
             m_bearerChannels.emplace_back(channel);
     }
 };

@@ -137,6 +137,44 @@ TEST_F(BoardInterfacesTest, ChannelsOfAnUnknownLineLieAboveNothing) {
     EXPECT_THAT(read().stack, IsEmpty());
 }
 
+TEST_F(BoardInterfacesTest, ChannelsLieAboveTheLineThatTheySay) {
+    FakeLine& first = addLine("same");
+    FakeLine& second = addLine("same");
+    add(new FakeISDNFeature(
+        {new OnLine<FakeDChannel>(&second, "D1", 3, 1, "same"),
+         new OnLine<FakeDChannel>(&first, "D2", 3, 1, "same")},
+        {new OnLine<FakeBChannel>(&second, "B1", 1), new OnLine<FakeBChannel>(&first, "B2", 1)}));
+    EXPECT_THAT(read().stack, UnorderedElementsAre(StackRow{3, 2}, StackRow{4, 1}, StackRow{5, 2},
+                                                   StackRow{6, 1}));
+}
+
+TEST_F(BoardInterfacesTest, BearersThatSayTheirLineNeedNotAddUp) {
+    FakeLine& line = addLine("one");
+    add(new FakeISDNFeature({},
+                            {new OnLine<FakeBChannel>(&line, "B1", 1), new FakeBChannel("B2", 1)}));
+    EXPECT_THAT(read().stack, ElementsAre(StackRow{2, 1}));
+}
+
+TEST_F(BoardInterfacesTest, BearersThatCannotSayTheirLineFollowTheirSignallingChannel) {
+    FakeLine& line = addLine("one");
+    add(new FakeISDNFeature({new OnLine<FakeDChannel>(&line, "D1", 3, 1, "other")},
+                            {new FakeBChannel("B1", 1)}));
+    EXPECT_THAT(read().stack, UnorderedElementsAre(StackRow{2, 1}, StackRow{3, 1}));
+}
+
+TEST_F(BoardInterfacesTest, ChannelThatSaysNoLineLiesAboveNothing) {
+    addLine("one");
+    add(new FakeISDNFeature({new OnLine<FakeDChannel>(nullptr, "D1", 3, 1, "one")},
+                            {new OnLine<FakeBChannel>(nullptr, "B1", 1)}));
+    EXPECT_THAT(read().stack, IsEmpty());
+}
+
+TEST_F(BoardInterfacesTest, ChannelThatSaysALineOfAnotherBoardLiesAboveNothing) {
+    addLine("one");
+    add(new FakeISDNFeature({}, {new OnLine<FakeBChannel>(new FakeLine("one", ""), "B1", 1)}));
+    EXPECT_THAT(read().stack, IsEmpty());
+}
+
 TEST_F(BoardInterfacesTest, NonsensicalNumberOfBearersIsSurvived) {
     addLine("one");
     add(new FakeISDNFeature({new FakeDChannel("D1", 3, 2147483647, "one")},
