@@ -2,23 +2,11 @@
 #include "agent/notifications/FaultLog.h"
 
 #include <algorithm>
-#include <limits>
 
 #include "agent/readers/Answers.h"
-#include "agent/rows/BoardRow.h"
+#include "agent/rows/Uptime.h"
 
 namespace kvloamd {
-
-namespace {
-
-std::uint32_t ticks(Clock::time_point when, Clock::time_point started) {
-    using Hundredths = std::chrono::duration<std::int64_t, std::centi>;
-    if (when <= started) return 0;
-    return static_cast<std::uint32_t>(
-        std::chrono::duration_cast<Hundredths>(when - started).count());
-}
-
-} // namespace
 
 void FaultLog::raise(std::uint32_t boardIndex, int platformBoard, std::uint16_t value) {
     std::scoped_lock const guard(m_mutex);
@@ -66,10 +54,11 @@ void FaultLog::boardHasGone(std::uint32_t boardIndex) {
 
 Faults FaultLog::read(Clock::time_point started) const {
     std::scoped_lock const guard(m_mutex);
+    Uptime const uptime(started);
     Faults read;
     read.raised = m_raised;
     read.unlisted = m_unlisted;
-    read.lastChange = ticks(m_lastChange, started);
+    read.lastChange = uptime.at(m_lastChange);
     // One row for each board and value: the faults of unknown boards lie beside each other by
     // board, not by value.
     std::map<std::array<std::uint32_t, 2>, Fault> merged;
@@ -82,7 +71,7 @@ Faults FaultLog::read(Clock::time_point started) const {
     }
     read.rows.reserve(merged.size());
     for (auto const& [index, fault] : merged)
-        read.rows.push_back({index[0], index[1], fault.platformBoard, ticks(fault.when, started),
+        read.rows.push_back({index[0], index[1], fault.platformBoard, uptime.at(fault.when),
                              dateOctets(fault.date), fault.times});
     return read;
 }

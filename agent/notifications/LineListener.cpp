@@ -3,12 +3,9 @@
 
 #include "agent/notifications/StandardNotifications.h"
 #include "agent/readers/BoardFeatures.h"
+#include "agent/rows/StandardNumbers.h"
 
 namespace kvloamd {
-
-namespace {
-constexpr int kEnabled = 1;
-}
 
 int LineListener::ProcessLineStatusEvent(ReferenceCounter<DS1LineStatusEvent> event) {
     DS1LineStatusEvent* const told = event.get();

@@ -4,12 +4,11 @@
 #include <utility>
 
 #include "agent/notifications/StandardNotifications.h"
+#include "agent/rows/StandardNumbers.h"
 
 namespace kvloamd {
 
 namespace {
-
-constexpr int kEnabled = 1;
 
 bool hasChanged(std::optional<int> former, std::optional<int> now) {
     if (!former || !now || former == now) return false;

@@ -4,15 +4,12 @@
 
 #include "agent/objects/RowValues.h"
 #include "agent/objects/StandardObjects.h"
+#include "agent/rows/StandardNumbers.h"
 #include "board/DS1IntervalTable.h"
 
 namespace kvloamd {
 
 namespace {
-
-// TruthValue's.
-constexpr std::int64_t kTrue = 1;
-constexpr std::int64_t kFalse = 2;
 
 Value index(LineRow const& row) {
     return std::int64_t{row.ifIndex};
@@ -50,8 +47,7 @@ Value total(LineRow const& row) {
 using enum ValueType;
 using Row = LineRow;
 
-/// Enabled or disabled.
-constexpr Writable kTraps{Setting::LineStatusChangeTraps, 1, 2};
+constexpr Writable kTraps{Setting::LineStatusChangeTraps, kEnabled, kDisabled};
 
 constexpr Column<Row> kConfigColumns[] = {
     {"dsx1LineIndex", 1, Integer, index},
@@ -157,7 +153,7 @@ class IntervalTable final : public Table {
         Place const place = find(facts, row);
         if (column == 0) return std::int64_t{place.line.ifIndex};
         if (column == 1) return static_cast<std::int64_t>(place.interval);
-        if (column == kValidData) return isValid(place.interval) ? kTrue : kFalse;
+        if (column == kValidData) return std::int64_t{isValid(place.interval) ? kTrue : kFalse};
         return countValue(place.line.closed->counts[place.interval - 1][column - kFirstCounter]);
     }
 

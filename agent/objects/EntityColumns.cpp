@@ -2,13 +2,11 @@
 // ENTITY-MIB's tables: the physical entities, which interfaces they are, and what contains what.
 #include "agent/objects/RowValues.h"
 #include "agent/objects/StandardObjects.h"
+#include "agent/rows/StandardNumbers.h"
 
 namespace kvloamd {
 
 namespace {
-
-constexpr std::int64_t kTrue = 1;
-constexpr std::int64_t kFalse = 2;
 
 template <auto Rows>
 auto const& entityRows(Snapshot const& snapshot) {
@@ -39,7 +37,7 @@ Value notKnown(PhysicalRow const& /*row*/) {
 }
 
 Value isReplaceable(PhysicalRow const& row) {
-    return row.replaceable ? kTrue : kFalse;
+    return std::int64_t{row.replaceable ? kTrue : kFalse};
 }
 
 /// The eight octets that stand for no date.

@@ -2,6 +2,7 @@
 // IF-MIB's tables: the interfaces.
 #include "agent/objects/RowValues.h"
 #include "agent/objects/StandardObjects.h"
+#include "agent/rows/StandardNumbers.h"
 
 namespace kvloamd {
 
@@ -47,8 +48,7 @@ Value stackStatus(StackRow const& /*row*/) {
 using enum ValueType;
 using Row = InterfaceRow;
 
-/// Enabled or disabled.
-constexpr Writable kTraps{Setting::LinkUpDownTraps, 1, 2};
+constexpr Writable kTraps{Setting::LinkUpDownTraps, kEnabled, kDisabled};
 
 constexpr Column<Row> kColumns[] = {
     {"ifIndex", 1, Integer, index},

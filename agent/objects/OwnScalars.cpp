@@ -6,6 +6,7 @@
 
 #include "agent/objects/OwnObjects.h"
 #include "agent/objects/RowValues.h"
+#include "agent/rows/Uptime.h"
 #include "services/oam.h"
 
 namespace kvloamd {
@@ -94,11 +95,7 @@ std::span<Scalar const> scalars() {
          {1, 1, 9, 1},
          ValueType::TimeTicks,
          [](Facts const& facts) -> Value {
-             using Hundredths = std::chrono::duration<std::int64_t, std::centi>;
-             auto const up = Clock::now() - facts.counters.started;
-             // They begin anew after 497 days, as all time ticks.
-             return std::int64_t{
-                 static_cast<std::uint32_t>(std::chrono::duration_cast<Hundredths>(up).count())};
+             return std::int64_t{timeTicks(Clock::now() - facts.counters.started)};
          }},
         {"kvlNotificationsSent",
          {1, 1, 9, 2},

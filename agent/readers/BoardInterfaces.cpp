@@ -9,8 +9,8 @@
 
 #include "agent/readers/Answers.h"
 #include "agent/readers/BoardFeatures.h"
-#include "agent/rows/BoardRow.h"
 #include "agent/rows/IndexKey.h"
+#include "agent/rows/StandardNumbers.h"
 #include "board/DS1LineFeature.h"
 #include "board/EthernetFeature.h"
 #include "board/IPInterface.h"
@@ -26,8 +26,6 @@ namespace {
 constexpr int kTypeLoopback = 24;
 constexpr int kTypeIsdn = 63;
 constexpr int kTypeDs0 = 81;
-constexpr int kTrue = 1;
-constexpr int kFalse = 2;
 
 /// The speed of a DS0, in bit/s.
 constexpr std::uint32_t kBearerSpeed = 64000;

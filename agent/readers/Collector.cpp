@@ -20,7 +20,7 @@ constexpr int kNiceness = 15;
 Collector::Collector(ReadRows readRows, Clock::time_point started, std::function<void()> renewed,
                      CollectorPace pace)
     : m_readRows(std::move(readRows)),
-      m_started(started),
+      m_uptime(started),
       m_renewed(std::move(renewed)),
       m_pace(pace) {
     std::promise<void> first;
@@ -116,11 +116,8 @@ std::shared_ptr<Snapshot const> Collector::collect(Snapshot const* former) {
     if (former == nullptr) return snapshot;
     snapshot->number = former->number + 1;
     snapshot->longestRefreshTime = std::max(snapshot->refreshTime, former->longestRefreshTime);
-    using Hundredths = std::chrono::duration<std::uint32_t, std::centi>;
     snapshot->lastChange =
-        snapshot->boards == former->boards
-            ? former->lastChange
-            : std::chrono::duration_cast<Hundredths>(Clock::now() - m_started).count();
+        snapshot->boards == former->boards ? former->lastChange : m_uptime.now();
     return snapshot;
 }
 

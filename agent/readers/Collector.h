@@ -8,9 +8,9 @@
 #include <memory>
 #include <mutex>
 #include <thread>
-#include <vector>
 
 #include "agent/rows/Snapshot.h"
+#include "agent/rows/Uptime.h"
 
 namespace kvloamd {
 
@@ -51,7 +51,7 @@ class Collector {
     std::shared_ptr<Snapshot const> collect(Snapshot const* former);
 
     ReadRows m_readRows;
-    Clock::time_point m_started;
+    Uptime const m_uptime;
     std::function<void()> m_renewed;
     CollectorPace m_pace;
 

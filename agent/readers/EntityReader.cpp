@@ -217,25 +217,19 @@ void Building::addPort(PortRow const& port, std::uint32_t entity, std::uint32_t 
 } // namespace
 
 EntityReader::EntityReader(StableIndices& indices, Clock::time_point started, EntityStates::Now now)
-    : m_indices(indices), m_started(started), m_states(std::move(now)) {}
+    : m_indices(indices), m_uptime(started), m_states(std::move(now)) {}
 
 EntityRows EntityReader::read(Snapshot const& snapshot) {
     PhysicalEntities found = Building(m_indices, snapshot).build();
     m_indices.save();
     if (!m_physical || *m_physical != found) {
-        if (m_physical) m_lastChange = sinceStart();
+        if (m_physical) m_lastChange = m_uptime.now();
         m_physical = std::make_shared<PhysicalEntities const>(std::move(found));
     }
     return {m_physical,
             m_states.read(m_physical->entities, snapshot.boards, snapshot.interfaces,
                           snapshot.faults.rows),
             m_lastChange};
-}
-
-std::uint32_t EntityReader::sinceStart() const {
-    using Hundredths = std::chrono::duration<std::int64_t, std::centi>;
-    return static_cast<std::uint32_t>(
-        std::chrono::duration_cast<Hundredths>(Clock::now() - m_started).count());
 }
 
 } // namespace kvloamd

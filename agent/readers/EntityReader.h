@@ -2,7 +2,6 @@
 // Makes physical entities of the boards, their processors and their ports.
 #pragma once
 
-#include <chrono>
 #include <cstdint>
 #include <memory>
 
@@ -10,6 +9,7 @@
 #include "agent/readers/StableIndices.h"
 #include "agent/rows/EntityRows.h"
 #include "agent/rows/Snapshot.h"
+#include "agent/rows/Uptime.h"
 
 namespace kvloamd {
 
@@ -26,10 +26,8 @@ class EntityReader {
     EntityRows read(Snapshot const& snapshot);
 
   private:
-    std::uint32_t sinceStart() const;
-
     StableIndices& m_indices;
-    Clock::time_point m_started;
+    Uptime const m_uptime;
     EntityStates m_states;
     std::shared_ptr<PhysicalEntities const> m_physical; ///< null before the first reading
     std::uint32_t m_lastChange = 0;

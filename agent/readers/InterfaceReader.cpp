@@ -9,14 +9,11 @@
 
 #include "agent/readers/BoardReader.h"
 #include "agent/readers/Courtesy.h"
+#include "agent/rows/StandardNumbers.h"
 
 namespace kvloamd {
 
 namespace {
-
-// ifLinkUpDownTrapEnable's.
-constexpr int kEnabled = 1;
-constexpr int kDisabled = 2;
 
 /// Moves rows over, with their numbers on the board made indices; rows without one are left out.
 template <class Row>

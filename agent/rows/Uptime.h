@@ -9,6 +9,14 @@
 
 namespace kvloamd {
 
+/// `time` in hundredths of a second. The count begins again from 0 after 497 days, as SNMP's
+/// TimeTicks do.
+inline std::uint32_t timeTicks(Clock::duration time) {
+    using Hundredths = std::chrono::duration<std::int64_t, std::centi>;
+    return static_cast<std::uint32_t>(std::chrono::duration_cast<Hundredths>(time).count());
+}
+
+/// An `Uptime` converts times to hundredths of a second since the agent's start. Immutable.
 class Uptime {
   public:
     explicit Uptime(Clock::time_point started)
@@ -16,21 +24,18 @@ class Uptime {
           m_startDate(std::chrono::duration_cast<std::chrono::milliseconds>(
               std::chrono::system_clock::now().time_since_epoch() - (Clock::now() - started))) {}
 
-    std::uint32_t now() const { return ticks(Clock::now() - m_started); }
-    /// `seconds` since the epoch; 0 when that was before the agent's start.
+    std::uint32_t now() const { return at(Clock::now()); }
+    /// 0 for a time before the agent's start.
+    std::uint32_t at(Clock::time_point when) const {
+        return when <= m_started ? 0 : timeTicks(when - m_started);
+    }
+    /// `seconds` since the epoch; 0 for a time before the agent's start.
     std::uint32_t of(long seconds) const {
         auto const since = std::chrono::seconds(seconds) - m_startDate;
-        return since <= std::chrono::milliseconds::zero() ? 0 : ticks(since);
+        return since <= std::chrono::milliseconds::zero() ? 0 : timeTicks(since);
     }
 
   private:
-    using Ticks = std::chrono::duration<std::int64_t, std::centi>;
-
-    template <class Duration>
-    static std::uint32_t ticks(Duration duration) {
-        return static_cast<std::uint32_t>(std::chrono::duration_cast<Ticks>(duration).count());
-    }
-
     Clock::time_point m_started;
     std::chrono::milliseconds m_startDate; ///< since the epoch
 };
