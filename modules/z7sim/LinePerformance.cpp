@@ -9,6 +9,10 @@ constexpr std::int32_t kDecidingRun = 10;
 constexpr std::int32_t kMinute = 60;
 constexpr LineCounts kUnavailableSecond{.unavailableSeconds = 1};
 
+bool hasDefect(LineSecond const& second) {
+    return second.lossOfSignal || second.outOfFrame || second.alarmIndication;
+}
+
 } // namespace
 
 LineCounts& LineCounts::operator+=(LineCounts const& other) {
@@ -39,35 +43,130 @@ LineCounts& LineCounts::operator-=(LineCounts const& other) {
     return *this;
 }
 
-LinePerformance::LinePerformance(LineFormat format) : m_format(format) {}
+LinePerformance::LinePerformance(LineFormat format, FailureTimes const& times)
+    : m_format(format), m_times(times) {}
+
+void LinePerformance::begin(LineDefects const& defects) {
+    m_signal.begin(defects.lossOfSignal);
+    m_frame.begin(defects.lossOfSignal || defects.outOfFrame);
+    m_indication.begin(defects.alarmIndication);
+    m_unavailable = defects != LineDefects();
+}
 
 LinePerformance::Change LinePerformance::count(LineSecond const& second) {
-    LineCounts available = availableSecond(second);
-    bool const isSevere = available.severelyErrorSeconds != 0;
-    if (!isSevere) {
-        if (m_unavailable && m_runLength == 0) m_minuteBeforeRun = m_minute;
-        available.degradedMinutes = completesDegradedMinute(available) ? 1 : 0;
-    }
+    LineCounts counts = availableSecond(second);
+    if (m_unavailable || counts.severelyErrorSeconds != 0 || hasDefect(second) || !isQuiet())
+        return countClosely(second, counts);
+    // Nothing of this second will ever be corrected, nor of those before it.
+    m_run = 0;
+    m_remembered = 0;
+    counts.degradedMinutes = completesDegradedMinute(counts) ? 1 : 0;
+    return {counts, {}};
+}
+
+LinePerformance::Change LinePerformance::countClosely(LineSecond const& second, LineCounts counts) {
+    bool const isSevere = counts.severelyErrorSeconds != 0;
+    Minute const before = m_minute;
+    if (!isSevere) counts.degradedMinutes = completesDegradedMinute(counts) ? 1 : 0;
+    remember(counts, before);
+    countFailures(second);
     Change change;
-    change.running = m_unavailable ? kUnavailableSecond : available;
-    if (isSevere == m_unavailable) {
-        breakRun();
-        return change;
+    change.running = m_unavailable ? kUnavailableSecond : counts;
+    if (!m_unavailable) {
+        m_run = isSevere ? m_run + 1 : 0;
+        if (int const seconds = secondsToTakeBack(); seconds > 0)
+            becomeUnavailable(seconds, change);
+    } else if (isSevere || sustainsFailure(second)) {
+        m_minute = recent(m_run).before;
+        m_run = 0;
+    } else if (++m_run >= kDecidingRun && failures() == LineDefects()) {
+        becomeAvailable(change);
     }
-    m_correction.running += m_unavailable ? available : kUnavailableSecond;
-    m_correction.running -= change.running;
-    if (++m_runLength < kDecidingRun) return change;
-    change.running += m_correction.running;
-    change.previous = m_correction.previous;
-    m_unavailable = !m_unavailable;
-    m_runLength = 0;
-    m_correction = Change();
     return change;
 }
 
+void LinePerformance::interrupt() {
+    if (m_unavailable && m_run > 0) m_minute = recent(m_run - 1).before;
+    m_run = 0;
+    m_remembered = 0;
+    m_signal.interrupt();
+    m_frame.interrupt();
+    m_indication.interrupt();
+}
+
 void LinePerformance::closeInterval() {
-    m_correction.previous = m_correction.running;
-    m_correction.running = LineCounts();
+    for (int ago = 0; ago < m_remembered; ++ago)
+        ++recent(ago).intervalsAgo;
+}
+
+void LinePerformance::countFailures(LineSecond const& second) {
+    LineDefects const& ended = second.ended;
+    bool const noFrame = second.lossOfSignal || second.outOfFrame;
+    bool const signalLost = second.lossOfSignal && !ended.lossOfSignal;
+    bool const frameLost = second.outOfFrame && !ended.outOfFrame;
+    m_signal.count(second.lossOfSignal, signalLost, m_times);
+    m_frame.count(noFrame, signalLost || frameLost, m_times);
+    m_indication.count(second.alarmIndication, second.alarmIndication && !ended.alarmIndication,
+                       m_times);
+}
+
+/// How many of the last seconds of an available line have turned out to be unavailable.
+int LinePerformance::secondsToTakeBack() const {
+    int seconds = m_run >= kDecidingRun ? m_run : 0;
+    for (auto const* failure : {&m_signal, &m_frame, &m_indication})
+        if (failure->isDeclared())
+            seconds = std::max(seconds, withSevereBefore(failure->sinceOnset()));
+    return seconds;
+}
+
+/// So many of the last seconds, and the severely errored ones directly before them.
+int LinePerformance::withSevereBefore(int seconds) const {
+    while (seconds < m_remembered && recent(seconds).severe)
+        ++seconds;
+    return seconds;
+}
+
+/// Whether the second has the defect of a failure that is declared.
+bool LinePerformance::sustainsFailure(LineSecond const& second) const {
+    return (second.lossOfSignal && m_signal.isDeclared()) ||
+           ((second.lossOfSignal || second.outOfFrame) && m_frame.isDeclared()) ||
+           (second.alarmIndication && m_indication.isDeclared());
+}
+
+void LinePerformance::becomeUnavailable(int seconds, Change& change) {
+    for (int ago = 0; ago < seconds; ++ago) {
+        Recent const& each = recent(ago);
+        if (each.intervalsAgo > 1) continue;
+        LineCounts& interval = each.intervalsAgo == 0 ? change.running : change.previous;
+        interval -= each.counts;
+        interval += kUnavailableSecond;
+    }
+    m_minute = recent(seconds - 1).before;
+    m_unavailable = true;
+    m_run = 0;
+}
+
+void LinePerformance::becomeAvailable(Change& change) {
+    for (int ago = 0; ago < m_run; ++ago) {
+        Recent const& each = recent(ago);
+        if (each.intervalsAgo > 1) continue;
+        LineCounts& interval = each.intervalsAgo == 0 ? change.running : change.previous;
+        interval -= kUnavailableSecond;
+        interval += each.counts;
+    }
+    m_unavailable = false;
+    m_run = 0;
+}
+
+/// A second that is remembered; 0: the newest.
+LinePerformance::Recent& LinePerformance::recent(int ago) {
+    return m_recent[static_cast<std::size_t>((m_newest - ago + kRecent) % kRecent)];
+}
+
+void LinePerformance::remember(LineCounts const& counts, Minute const& before) {
+    m_newest = (m_newest + 1) % kRecent;
+    m_remembered = std::min(m_remembered + 1, kRecent);
+    recent(0) = {counts, before, counts.severelyErrorSeconds != 0, 0};
 }
 
 bool LinePerformance::hasCrc() const {
@@ -78,7 +177,7 @@ std::int32_t LinePerformance::bitsPerSecond() const {
     return m_format == LineFormat::esf || m_format == LineFormat::d4 ? 1'544'000 : 2'048'000;
 }
 
-/// What the second counts if the line is available in it, but for the minute it may complete.
+/// What the second counts if the line is available in it, except for a minute that it completes.
 LineCounts LinePerformance::availableSecond(LineSecond const& second) const {
     auto const limited = [this](std::uint64_t violations) {
         auto const most = static_cast<std::uint64_t>(bitsPerSecond());
@@ -107,24 +206,25 @@ LineCounts LinePerformance::availableSecond(LineSecond const& second) const {
     return counts;
 }
 
-/// `counts`: has the second's violations.
+/// `counts`: the second's, with its violations.
 bool LinePerformance::severe(LineSecond const& second, LineCounts const& counts) const {
-    if (second.outOfFrame || second.lossOfSignal) return true;
+    bool const noFrame = second.outOfFrame || second.lossOfSignal;
     switch (m_format) {
     case LineFormat::esf:
-        return counts.pathCodingViolations >= 320 || second.alarmIndication;
+        return noFrame || counts.pathCodingViolations >= 320 || second.alarmIndication;
     case LineFormat::d4:
-        return counts.pathCodingViolations >= 1 || counts.lineCodeViolations >= 1544;
+        return noFrame || counts.pathCodingViolations >= 1 || counts.lineCodeViolations >= 1544;
     case LineFormat::e1:
+        // Without a frame it has nothing that errors could be counted in; that is a failure.
         return counts.lineCodeViolations >= 2048;
     case LineFormat::e1Crc:
-        return counts.pathCodingViolations >= 832;
+        return noFrame || counts.pathCodingViolations >= 832;
     }
     return false;
 }
 
-/// Adds a second that is not severely errored to the minute; true when that makes it a degraded
-/// one. A full minute gives way to a new one.
+/// Adds a second that is not severely errored to the minute. Returns whether that completes a
+/// degraded one. After sixty seconds a new minute begins.
 bool LinePerformance::completesDegradedMinute(LineCounts const& counts) {
     m_minute.errors += counts.pathCodingViolations;
     if (!hasCrc()) m_minute.errors += counts.lineCodeViolations;
@@ -133,12 +233,4 @@ bool LinePerformance::completesDegradedMinute(LineCounts const& counts) {
     std::int64_t const errors = m_minute.errors;
     m_minute = Minute();
     return errors * 1'000'000 > bits && errors * 1'000 <= bits;
-}
-
-/// The line stays what it is, so nothing will be corrected.
-void LinePerformance::breakRun() {
-    if (m_runLength == 0) return;
-    if (m_unavailable) m_minute = m_minuteBeforeRun;
-    m_runLength = 0;
-    m_correction = Change();
 }

@@ -1,8 +1,12 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// What a DS1 line's performance counters make of what the line counts every second.
+// The performance counters of a DS1 line, derived from what the line counts every second.
 #pragma once
 
 #include <cstdint>
+
+#include <array>
+
+#include "LineFailures.h"
 
 /// How a line is framed, which decides what of its errors can be seen.
 enum class LineFormat {
@@ -12,15 +16,27 @@ enum class LineFormat {
     e1Crc ///< E1 with CRC
 };
 
+/// The defects that deprive a line of its frame.
+struct LineDefects {
+    bool lossOfSignal = false;
+    bool outOfFrame = false;
+    bool alarmIndication = false;
+
+    bool operator==(LineDefects const&) const = default;
+};
+
 /// What a line counted in one second.
 struct LineSecond {
     std::uint32_t lineCodeViolations = 0;
-    std::uint32_t pathCodeViolations = 0; ///< CRC errors; without meaning for a format without CRC
+    std::uint32_t pathCodeViolations = 0; ///< CRC errors; ignored for a format without CRC
     std::uint32_t framingErrors = 0;
     std::uint32_t controlledSlips = 0;
-    bool lossOfSignal = false; ///< a line without signal has no frame either
+    // The defects that were there at some time of the second. Without signal there is no frame.
+    bool lossOfSignal = false;
     bool outOfFrame = false;
     bool alarmIndication = false;
+    /// Those of them that were no longer there when the second ended.
+    LineDefects ended{};
 };
 
 /// Counts of an interval in the order of DS1-MIB's interval table, or changes of them.
@@ -41,23 +57,26 @@ struct LineCounts {
     bool operator==(LineCounts const&) const = default;
 };
 
-/// Derives the counters of one line by the definitions of RFC 4805 (and RFC 2495), section 3.
+/// A `LinePerformance` derives the counters of one line by the definitions of RFC 4805 (and RFC
+/// 2495), section 3.
 ///
-/// Ten severely errored seconds in a row make the line unavailable, ten others in a row available
-/// again, each time from the first of the ten on. The ten were counted before that was known, so
-/// the tenth second also corrects what the nine before it did. In unavailable time nothing but the
-/// unavailable seconds is counted.
+/// A line becomes unavailable in one of two ways: by ten severely errored seconds in a row, from
+/// the first of them; or by a failure (no signal, no frame, AIS), from the onset of its defect, or
+/// from the first of the severely errored seconds that lie in a row directly before it. The line is
+/// available again from the first of ten seconds in a row that were not severely errored and in
+/// which no failure's defect was there, once all failures have ended.
 ///
-/// The definition of a degraded minute goes by sixty seconds that were available and not severely
-/// errored, however much time, of whatever kind, lies between them; the minute belongs to the
-/// interval of its last second.
+/// All of these seconds were counted before that was known, so the second that decides also
+/// corrects what those before it counted. In unavailable time only unavailable seconds are counted.
 ///
-/// Where the definitions leave a choice: an E1 line without CRC that has no frame is severely
-/// errored, for it carries nothing. And a second has no more violations of a kind than the line
+/// A degraded minute is made of sixty seconds that were available and not severely errored, however
+/// much other time lies between them. It belongs to the interval of its last second.
+///
+/// Where the definitions leave a choice: a second has no more violations of a kind than the line
 /// has bits; a larger number counts as that many, which keeps the sums of an interval of 15 minutes
 /// within 32 bits.
 ///
-/// Threads: one at a time. Never allocates.
+/// Unsynchronised. Never allocates.
 class LinePerformance {
   public:
     /// By how much the running interval and the one closed before it change. A count is negative
@@ -68,15 +87,26 @@ class LinePerformance {
     };
 
     /// A new line is available, and no seconds lie before its first.
-    explicit LinePerformance(LineFormat format);
+    explicit LinePerformance(LineFormat format, FailureTimes const& times = {});
 
+    /// Takes the line as it is found, before its first second: with failures, and so unavailable,
+    /// where it has these defects.
+    void begin(LineDefects const& defects);
     /// Counts one second of the running interval.
     Change count(LineSecond const& second);
-    /// The running interval, of any number of seconds, becomes the previous one; the seconds that
-    /// follow count in a new one. What a row of ten would correct in a still older interval is
-    /// lost, which can happen only where an interval is shorter than ten seconds.
+    /// Some seconds were missed: nothing in a row goes on across them. The line stays available or
+    /// unavailable, with the failures that it has.
+    void interrupt();
+    /// Makes the running interval, of any number of seconds, the previous one; the seconds that
+    /// follow count in a new one. Corrections to an interval that is older still are lost, which
+    /// can happen only where intervals are shorter than 24 seconds.
     void closeInterval();
+
     bool unavailable() const { return m_unavailable; }
+    /// The failures. A line without signal has no frame either.
+    LineDefects failures() const {
+        return {m_signal.isDeclared(), m_frame.isDeclared(), m_indication.isDeclared()};
+    }
 
   private:
     /// The seconds so far of the sixty that may become a degraded minute.
@@ -84,21 +114,45 @@ class LinePerformance {
         std::int32_t seconds = 0;
         std::int64_t errors = 0;
     };
+    /// A second that may still be corrected.
+    struct Recent {
+        LineCounts counts; ///< if the line is available
+        Minute before;     ///< the minute without this second
+        bool severe = false;
+        int intervalsAgo = 0;
+    };
+    /// Corrections go back a failure's declaration or clearing and nine severely errored seconds.
+    static constexpr int kRecent = 24;
 
     bool hasCrc() const;
     std::int32_t bitsPerSecond() const;
     bool severe(LineSecond const& second, LineCounts const& counts) const;
     LineCounts availableSecond(LineSecond const& second) const;
     bool completesDegradedMinute(LineCounts const& counts);
-    void breakRun();
+    bool isQuiet() const { return m_signal.isIdle() && m_frame.isIdle() && m_indication.isIdle(); }
+    void countFailures(LineSecond const& second);
+    Change countClosely(LineSecond const& second, LineCounts counts);
+    int secondsToTakeBack() const;
+    int withSevereBefore(int seconds) const;
+    bool sustainsFailure(LineSecond const& second) const;
+    void becomeUnavailable(int seconds, Change& change);
+    void becomeAvailable(Change& change);
+    Recent& recent(int ago);
+    Recent const& recent(int ago) const { return const_cast<LinePerformance*>(this)->recent(ago); }
+    void remember(LineCounts const& counts, Minute const& before);
 
     // What every second touches lies together.
     Minute m_minute;
     LineFormat m_format;
     bool m_unavailable = false;
-    /// How many seconds in a row, up to now, speak for the line's being what it is not yet
-    /// (unavailable or available), and what changes once they are ten.
-    std::int32_t m_runLength = 0;
-    Change m_correction;
-    Minute m_minuteBeforeRun; ///< to go back to when a run in unavailable time is broken
+    /// Seconds in a row, up to now, that speak for the line's becoming the other: severely errored
+    /// while it is available, good while it is unavailable.
+    int m_run = 0;
+    int m_remembered = 0; ///< seconds in a row, up to now, that can be corrected
+    LineFailure m_signal;
+    LineFailure m_frame;
+    LineFailure m_indication;
+    FailureTimes m_times;
+    int m_newest = 0; ///< its place in `m_recent`
+    std::array<Recent, kRecent> m_recent;
 };

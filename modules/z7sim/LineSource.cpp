@@ -35,6 +35,13 @@ std::vector<DS1LineCounters> PlatformLine::past() {
     return records;
 }
 
+LineDefects defectsOf(DS1LineCounters const& now) {
+    constexpr std::uint32_t frameLosing =
+        kDS1AlarmLossOfSignal | kDS1AlarmLossOfFrame | kDS1AlarmIndication;
+    return {(now.alarms & kDS1AlarmLossOfSignal) != 0, (now.alarms & frameLosing) != 0,
+            (now.alarms & kDS1AlarmIndication) != 0};
+}
+
 LineSecond secondBetween(DS1LineCounters const& before, DS1LineCounters const& now) {
     // All counts grow modulo 2^32; the age does not come round within a century.
     if (now.seconds < before.seconds) return {};
@@ -43,8 +50,18 @@ LineSecond secondBetween(DS1LineCounters const& before, DS1LineCounters const& n
     second.pathCodeViolations = now.pathCodeViolations - before.pathCodeViolations;
     second.framingErrors = now.framingErrors - before.framingErrors;
     second.controlledSlips = now.controlledSlips - before.controlledSlips;
-    second.lossOfSignal = now.lossOfSignalSeconds != before.lossOfSignalSeconds;
-    second.outOfFrame = now.outOfFrameSeconds != before.outOfFrameSeconds;
-    second.alarmIndication = now.alarmIndicationSeconds != before.alarmIndicationSeconds;
+    // The line counts the seconds of its own clock: between two readings there may be none.
+    LineDefects const atEnd = defectsOf(now);
+    auto const wasThere = [](std::uint32_t secondsBefore, std::uint32_t secondsNow, bool isThere) {
+        return isThere || secondsNow != secondsBefore;
+    };
+    second.lossOfSignal =
+        wasThere(before.lossOfSignalSeconds, now.lossOfSignalSeconds, atEnd.lossOfSignal);
+    second.outOfFrame = wasThere(before.outOfFrameSeconds, now.outOfFrameSeconds, atEnd.outOfFrame);
+    second.alarmIndication =
+        wasThere(before.alarmIndicationSeconds, now.alarmIndicationSeconds, atEnd.alarmIndication);
+    second.ended = {second.lossOfSignal && !atEnd.lossOfSignal,
+                    second.outOfFrame && !atEnd.outOfFrame,
+                    second.alarmIndication && !atEnd.alarmIndication};
     return second;
 }

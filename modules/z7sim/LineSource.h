@@ -29,6 +29,9 @@ class PlatformLine final : public LineSource {
     long m_device;
 };
 
+/// The defects that are there at the moment of a reading.
+LineDefects defectsOf(DS1LineCounters const& now);
+
 /// What a line counted between two readings. Nothing when it has begun anew in between: its
 /// counters started over.
 LineSecond secondBetween(DS1LineCounters const& before, DS1LineCounters const& now);

@@ -13,10 +13,11 @@ struct AlarmStatus {
     DS1LineStatusEnum status;
 };
 
+constexpr std::uint32_t kFrameLosing =
+    kDS1AlarmLossOfSignal | kDS1AlarmLossOfFrame | kDS1AlarmIndication;
+
+/// The alarms that are a status as they are.
 constexpr AlarmStatus kStatuses[] = {
-    {kDS1AlarmLossOfSignal, DS1LineStatusLossOfSignal},
-    {kDS1AlarmLossOfFrame, DS1LineStatusLossOfFrame},
-    {kDS1AlarmIndication, DS1LineStatusRcvAIS},
     {kDS1AlarmRemote, DS1LineStatusRcvFarEndLOF},
     {kDS1AlarmSendingRemote, DS1LineStatusXmtFarEndLOF},
     {kDS1AlarmSendingIndication, DS1LineStatusXmtAIS},
@@ -29,19 +30,26 @@ constexpr AlarmStatus kStatuses[] = {
 
 } // namespace
 
-int lineStatusOf(std::uint32_t alarms, bool unavailable) {
-    int status = unavailable ? DS1LineStatusUnavailSigState : 0;
+int lineStatusOf(std::uint32_t alarms, LinePerformance const& performance) {
+    LineDefects const failures = performance.failures();
+    // What follows from a defect that is no failure yet is not shown either.
+    if ((alarms & kFrameLosing) != 0 && failures == LineDefects())
+        alarms &= ~kDS1AlarmSendingRemote;
+    int status = performance.unavailable() ? DS1LineStatusUnavailSigState : 0;
+    if (failures.lossOfSignal) status |= DS1LineStatusLossOfSignal;
+    if (failures.outOfFrame) status |= DS1LineStatusLossOfFrame;
+    if (failures.alarmIndication) status |= DS1LineStatusRcvAIS;
     for (auto const& each : kStatuses)
         if ((alarms & each.alarm) != 0) status |= each.status;
     return status == 0 ? static_cast<int>(DS1LineStatusNoAlarm) : status;
 }
 
-void LineState::begin(std::uint32_t alarms, bool unavailable) {
-    m_status.store(lineStatusOf(alarms, unavailable), std::memory_order_relaxed);
+void LineState::begin(std::uint32_t alarms, LinePerformance const& performance) {
+    m_status.store(lineStatusOf(alarms, performance), std::memory_order_relaxed);
 }
 
-void LineState::update(std::uint32_t alarms, bool unavailable) {
-    int const now = lineStatusOf(alarms, unavailable);
+void LineState::update(std::uint32_t alarms, LinePerformance const& performance) {
+    int const now = lineStatusOf(alarms, performance);
     if (now == status()) return;
     m_lastChange.store(static_cast<long>(std::time(nullptr)), std::memory_order_relaxed);
     m_status.store(now, std::memory_order_relaxed);

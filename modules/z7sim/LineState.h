@@ -1,11 +1,13 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A line's present status.
+// The present status of a DS1 line.
 #pragma once
 
 #include <atomic>
 #include <cstdint>
 
-/// Written by the line's tick, read by anyone.
+#include "LinePerformance.h"
+
+/// A `LineState` holds the status of a line. The line's tick writes it; any thread may read it.
 class LineState {
   public:
     /// `number` and `line`: under what changes are posted to the `LineStatusDelivery`.
@@ -16,10 +18,10 @@ class LineState {
     /// Seconds since the epoch; 0 until the status has changed.
     long lastChange() const { return m_lastChange.load(std::memory_order_relaxed); }
 
-    /// What the line is found like, which is no change.
-    void begin(std::uint32_t alarms, bool unavailable);
-    /// Takes on what a second ended with, and posts it when that is a change.
-    void update(std::uint32_t alarms, bool unavailable);
+    /// Sets the status that a line is found with; this is no change.
+    void begin(std::uint32_t alarms, LinePerformance const& performance);
+    /// Sets the status that a second ended with, and posts it when it differs from the last one.
+    void update(std::uint32_t alarms, LinePerformance const& performance);
 
   private:
     std::uint64_t m_number;
@@ -28,5 +30,6 @@ class LineState {
     std::atomic<long> m_lastChange{0};
 };
 
-/// The status bits of a line with these alarms (`kDS1Alarm...`).
-int lineStatusOf(std::uint32_t alarms, bool unavailable);
+/// The status bits of a line with these alarms (`kDS1Alarm...`) and failures. Loss of signal, loss
+/// of frame and AIS are shown as failures only, and so is that the line sends RAI because of them.
+int lineStatusOf(std::uint32_t alarms, LinePerformance const& performance);

@@ -33,7 +33,8 @@ Z7SimIntervalTable::Z7SimIntervalTable(LineFormat format, std::shared_ptr<LineSo
     scheduler->Remove(this);
     replay(past);
     m_source->read(m_last);
-    m_state->begin(m_last.alarms, m_performance.unavailable());
+    if (past.empty()) m_performance.begin(defectsOf(m_last));
+    m_state->begin(m_last.alarms, m_performance);
     scheduler->AddPeriodic(this, 1);
 }
 
@@ -55,7 +56,7 @@ int Z7SimIntervalTable::CollectSecond() {
     DS1LineCounters now = m_last;
     m_source->read(now);
     count(now);
-    m_state->update(now.alarms, m_performance.unavailable());
+    m_state->update(now.alarms, m_performance);
     return 0;
 }
 

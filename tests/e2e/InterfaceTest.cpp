@@ -178,7 +178,7 @@ TEST_F(InterfaceTest, BrokenLineShowsInItsStatusAndIsDown) {
     EXPECT_TRUE(eventually([&] { return at(c(kIf, 8), line) == "INTEGER: 2"; }));
     EXPECT_EQ(at(c(kIf, 8), lineNamed("nx5-trunk-1")), "INTEGER: 1");
     // It counts, and tells when it broke.
-    EXPECT_TRUE(eventually([&] { return numberIn(at(c(kCurrent, 3), line)) > 0; }));
+    EXPECT_TRUE(eventually([&] { return numberIn(at(c(kCurrent, 5), line)) > 0; }));
     EXPECT_THAT(at(c(kConfig, 16), line), HasSubstr("Timeticks: ("));
     sim({"line", "mend", "102"});
     EXPECT_TRUE(eventually([&] { return at(c(kConfig, 10), line) == "INTEGER: 1"; }));

@@ -14,8 +14,8 @@ using ::testing::Not;
 constexpr char kLineTraps[] = "1.3.6.1.2.1.10.18.6.1.17.1000";
 constexpr char kLinkTraps[] = "1.3.6.1.2.1.31.1.1.1.14.1000";
 
-/// A cut line has no signal, and tells its far end.
-constexpr char kCut[] = "68";
+/// A cut line has no signal and no frame, tells its far end, and is unavailable.
+constexpr char kCut[] = "8292";
 constexpr char kWhole[] = "1";
 
 constexpr char kAnyLine[] = "mib-2.10.18.15.0.1";
@@ -139,7 +139,7 @@ TEST_F(LineNotificationTest, TablesShowTheChangeWhenItsNotificationArrives) {
     set(kLineTraps, "1");
     cut();
     expectLineTold(kCut);
-    EXPECT_EQ(get("1.3.6.1.2.1.10.18.6.1.10.1000"), "INTEGER: 68");
+    EXPECT_EQ(get("1.3.6.1.2.1.10.18.6.1.10.1000"), "INTEGER: 8292");
     EXPECT_EQ(get("1.3.6.1.2.1.2.2.1.8.1000"), "INTEGER: 2");
 }
 

@@ -47,11 +47,12 @@ inline bool hasNegativeCount(LineCounts const& counts) {
     return false;
 }
 
-/// Any change that makes a count negative, or that falls into an interval there never was, fails
-/// the test.
+/// A `CountedLine` is a line whose intervals the test can look at. A change that makes a count
+/// negative, or that belongs to an interval that never was, fails the test.
 class CountedLine {
   public:
-    explicit CountedLine(LineFormat format) : m_line(format) {}
+    explicit CountedLine(LineFormat format, FailureTimes const& times = {})
+        : m_line(format, times) {}
 
     /// Answers what the (last) second changed.
     LinePerformance::Change count(LineSecond const& second, int times = 1) {
@@ -70,6 +71,9 @@ class CountedLine {
         m_line.closeInterval();
         m_intervals.emplace_back();
     }
+    void begin(LineDefects const& defects) { m_line.begin(defects); }
+    void interrupt() { m_line.interrupt(); }
+    LineDefects failures() const { return m_line.failures(); }
     bool unavailable() const { return m_line.unavailable(); }
     LineCounts const& running() const { return m_intervals.back(); }
     LineCounts const& previous() const { return m_intervals.at(m_intervals.size() - 2); }

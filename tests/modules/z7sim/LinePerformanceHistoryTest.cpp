@@ -1,9 +1,10 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Random histories of a line, against a reckoning that looks at each of them as a whole.
+// Random histories of a line, against a model that looks at each of them as a whole.
 #include <cstddef>
 #include <cstdint>
 
 #include <algorithm>
+#include <optional>
 #include <random>
 #include <vector>
 
@@ -17,6 +18,7 @@ namespace {
 struct History {
     std::vector<LineSecond> seconds;
     std::vector<std::size_t> intervals; ///< of each second
+    FailureTimes times;
 };
 
 std::int64_t pathViolations(LineFormat format, LineSecond const& second) {
@@ -35,7 +37,7 @@ bool modelSevere(LineFormat format, LineSecond const& second) {
     if (format == LineFormat::d4)
         return second.framingErrors > 0 || withoutFrame(second) ||
                second.lineCodeViolations >= 1544;
-    if (format == LineFormat::e1) return second.lineCodeViolations >= 2048 || withoutFrame(second);
+    if (format == LineFormat::e1) return second.lineCodeViolations >= 2048;
     return path >= 832 || withoutFrame(second);
 }
 
@@ -46,17 +48,109 @@ std::vector<bool> severeSeconds(LineFormat format, History const& history) {
     return severe;
 }
 
-/// Run by run: one of ten or more decides for all of its seconds.
-std::vector<bool> unavailableSeconds(std::vector<bool> const& severe) {
-    std::vector<bool> result;
-    bool unavailable = false;
-    for (std::size_t first = 0; first < severe.size();) {
-        std::size_t end = first;
-        while (end < severe.size() && severe[end] == severe[first])
-            ++end;
-        if (end - first >= 10) unavailable = severe[first];
-        result.insert(result.end(), end - first, unavailable);
-        first = end;
+/// What a line's seconds show of one defect.
+struct DefectSeconds {
+    std::vector<bool> present;
+    std::vector<bool> lasting; ///< still there at the second's end
+};
+
+std::vector<DefectSeconds> defectSeconds(History const& history) {
+    std::vector<DefectSeconds> defects(3);
+    for (auto const& second : history.seconds) {
+        bool const signal = second.lossOfSignal && !second.ended.lossOfSignal;
+        bool const frame = second.outOfFrame && !second.ended.outOfFrame;
+        defects[0].present.push_back(second.lossOfSignal);
+        defects[0].lasting.push_back(signal);
+        defects[1].present.push_back(withoutFrame(second));
+        defects[1].lasting.push_back(signal || frame);
+        defects[2].present.push_back(second.alarmIndication);
+        defects[2].lasting.push_back(second.alarmIndication && !second.ended.alarmIndication);
+    }
+    return defects;
+}
+
+/// A failure, from the second that declares it to the one that clears it; both are indices, and so
+/// is the second of its defect's onset.
+struct ModelFailure {
+    std::size_t onset;
+    std::size_t declared;
+    std::size_t cleared;
+};
+
+/// The failures of one defect: looks for each declaration, and from there for its end.
+std::vector<ModelFailure> modelFailures(DefectSeconds const& defect, FailureTimes const& times) {
+    auto const declaration = static_cast<std::size_t>(times.declaration);
+    auto const clearing = static_cast<std::size_t>(times.clearing);
+    std::size_t const size = defect.present.size();
+    std::vector<ModelFailure> failures;
+    for (std::size_t onset = 0; onset + declaration < size;) {
+        auto const at = [&](std::size_t i) {
+            return defect.lasting.begin() + static_cast<std::ptrdiff_t>(i);
+        };
+        if (std::find(at(onset), at(onset + declaration + 1), false) !=
+            at(onset + declaration + 1)) {
+            ++onset;
+            continue;
+        }
+        std::size_t const declared = onset + declaration;
+        std::size_t cleared = declared + 1;
+        for (std::size_t without = 0; cleared < size; ++cleared) {
+            without = defect.present[cleared] ? 0 : without + 1;
+            if (!defect.lasting[cleared] && without >= clearing) break;
+        }
+        failures.push_back({onset, declared, cleared});
+        onset = cleared + 1;
+    }
+    return failures;
+}
+
+/// Decision by decision: searches where the line becomes unavailable next, and where it is
+/// available again.
+std::vector<bool> unavailableSeconds(History const& history, std::vector<bool> const& severe) {
+    std::size_t const size = severe.size();
+    auto const defects = defectSeconds(history);
+    std::vector<std::vector<ModelFailure>> failures;
+    std::vector<bool> failing(size, false);   // a failure is declared
+    std::vector<bool> sustained(size, false); // and its defect is there
+    for (auto const& defect : defects) {
+        failures.push_back(modelFailures(defect, history.times));
+        for (auto const& failure : failures.back())
+            for (std::size_t i = failure.declared; i < failure.cleared; ++i) {
+                failing[i] = true;
+                if (defect.present[i]) sustained[i] = true;
+            }
+    }
+    // The first unavailable second, if the line turns out to be unavailable in second `i`.
+    auto const lostFrom = [&](std::size_t i) -> std::optional<std::size_t> {
+        std::optional<std::size_t> from;
+        if (i >= 9 && std::all_of(severe.begin() + static_cast<std::ptrdiff_t>(i) - 9,
+                                  severe.begin() + static_cast<std::ptrdiff_t>(i) + 1,
+                                  [](bool each) { return each; }))
+            from = i - 9;
+        for (auto const& kind : failures)
+            for (auto const& failure : kind) {
+                if (failure.declared != i) continue;
+                std::size_t first = failure.onset;
+                while (first > 0 && severe[first - 1])
+                    --first;
+                from = std::min(first, from.value_or(first));
+            }
+        return from;
+    };
+    std::vector<bool> result(size, false);
+    for (std::size_t i = 0; i < size; ++i) {
+        std::optional<std::size_t> const from = lostFrom(i);
+        if (!from) continue;
+        std::size_t good = 0; // seconds in a row
+        std::size_t end = i + 1;
+        for (; end < size; ++end) {
+            good = severe[end] || sustained[end] ? 0 : good + 1;
+            if (good >= 10 && !failing[end]) break;
+        }
+        std::size_t const until = end == size ? size : end + 1 - good;
+        for (std::size_t second = *from; second < until; ++second)
+            result[second] = true;
+        i = end;
     }
     return result;
 }
@@ -105,7 +199,7 @@ std::vector<std::size_t> degradedMinutes(LineFormat format, History const& histo
 /// The counts of the history's intervals.
 std::vector<LineCounts> modelCounts(LineFormat format, History const& history) {
     std::vector<bool> const severe = severeSeconds(format, history);
-    std::vector<bool> const unavailable = unavailableSeconds(severe);
+    std::vector<bool> const unavailable = unavailableSeconds(history, severe);
     std::vector<LineCounts> counts(history.intervals.back() + 1);
     for (std::size_t i = 0; i < severe.size(); ++i) {
         LineCounts& interval = counts[history.intervals[i]];
@@ -130,10 +224,12 @@ class Histories {
         while (history.seconds.size() < seconds)
             addRun(history.seconds);
         // Short intervals have the most borders, long ones are what a line has.
-        std::size_t const longest = one(4) == 0 ? 900 : 10 + one(50);
+        std::size_t const longest = one(4) == 0 ? 900 : 25 + one(50);
         for (std::size_t i = 0; history.intervals.size() < history.seconds.size(); ++i)
-            history.intervals.insert(history.intervals.end(), between(10, longest), i);
+            history.intervals.insert(history.intervals.end(), between(24, longest), i);
         history.intervals.resize(history.seconds.size());
+        if (one(2) == 0)
+            history.times = {static_cast<int>(between(2, 9)), static_cast<int>(one(20))};
         return history;
     }
 
@@ -149,7 +245,7 @@ class Histories {
     std::uint32_t runLength() {
         switch (one(4)) {
         case 0:
-            return between(1, 5);
+            return between(1, 6);
         case 1:
         case 2:
             return between(8, 12);
@@ -159,9 +255,15 @@ class Histories {
     }
 
     void addRun(std::vector<LineSecond>& seconds) {
-        std::uint32_t const kind = one(13);
-        for (std::uint32_t left = runLength(); left > 0; --left)
+        std::uint32_t const kind = one(15);
+        std::uint32_t const restless = one(3) == 0 ? 3 : 30; // how rarely a defect ends
+        for (std::uint32_t left = runLength(); left > 0; --left) {
             seconds.push_back(second(kind));
+            LineSecond& last = seconds.back();
+            last.ended = {last.lossOfSignal && one(restless) == 0,
+                          last.outOfFrame && one(restless) == 0,
+                          last.alarmIndication && one(restless) == 0};
+        }
     }
 
     LineSecond second(std::uint32_t kind) {
@@ -193,8 +295,12 @@ class Histories {
             return {.lineCodeViolations = between(1542, 1545), .pathCodeViolations = 319 + one(2)};
         case 10:
             return {.lineCodeViolations = between(2046, 2049), .pathCodeViolations = 831 + one(2)};
-        case 11: // severe in every format
-            return {.lineCodeViolations = 2048, .pathCodeViolations = 832};
+        case 11:
+            return {.outOfFrame = true};
+        case 12: // on and off
+            return {.pathCodeViolations = one(2), .outOfFrame = one(4) != 0};
+        case 13: // severe in every format
+            return {.lineCodeViolations = 2048, .pathCodeViolations = 832, .framingErrors = 1};
         default:
             return {.pathCodeViolations = one(20) == 0 ? 1U : 0U, .outOfFrame = one(10) == 0};
         }
@@ -210,6 +316,9 @@ struct Seen {
     int lostAcrossBorder = 0;     ///< times the line became unavailable from a previous interval on
     int returnedAcrossBorder = 0; ///< and available
     int minutesGivenByReturn = 0; ///< degraded minutes among ten seconds that were given back
+    int lostEarly = 0;            ///< times fewer than ten seconds made the line unavailable
+    int lostLate = 0;             ///< and more than ten
+    int minutesTakenByLoss = 0;   ///< degraded minutes that were none after all
 };
 
 void note(LinePerformance::Change const& change, Seen& seen) {
@@ -218,7 +327,12 @@ void note(LinePerformance::Change const& change, Seen& seen) {
     bool const returned =
         change.running.unavailableSeconds < 0 || change.previous.unavailableSeconds < 0;
     if (returned) seen.minutesGivenByReturn += change.running.degradedMinutes;
-    seen.minutesGivenByReturn += change.previous.degradedMinutes;
+    if (change.previous.degradedMinutes > 0) ++seen.minutesGivenByReturn;
+    if (change.running.degradedMinutes < 0 || change.previous.degradedMinutes < 0)
+        ++seen.minutesTakenByLoss;
+    int const lost = change.running.unavailableSeconds + change.previous.unavailableSeconds;
+    if (lost > 1 && lost < 10) ++seen.lostEarly;
+    if (lost > 10) ++seen.lostLate;
 }
 
 class LinePerformanceHistoryTest : public testing::TestWithParam<LineFormat> {};
@@ -229,7 +343,7 @@ TEST_P(LinePerformanceHistoryTest, ChangesAddUpToTheCountsOfTheWholeHistory) {
     for (int round = 0; round < 2000 && !HasFailure(); ++round) {
         SCOPED_TRACE(round);
         History const history = histories.next(200 + static_cast<std::size_t>(round % 1000));
-        CountedLine line(GetParam());
+        CountedLine line(GetParam(), history.times);
         for (std::size_t i = 0; i < history.seconds.size(); ++i) {
             if (history.intervals[i] == line.intervals().size()) line.closeInterval();
             note(line.count(history.seconds[i]), seen);
@@ -250,15 +364,26 @@ TEST_P(LinePerformanceHistoryTest, ChangesAddUpToTheCountsOfTheWholeHistory) {
     EXPECT_GT(seen.lostAcrossBorder, 100);
     EXPECT_GT(seen.returnedAcrossBorder, 100);
     EXPECT_GT(seen.minutesGivenByReturn, 100);
+    EXPECT_GT(seen.lostEarly, 100);
+    // A defect that is always severe makes the line unavailable with its tenth second at the
+    // latest.
+    if (GetParam() != LineFormat::esf) {
+        EXPECT_GT(seen.lostLate, 10);
+    }
+    // Only here has an available line defects for seconds that are not severely errored.
+    if (GetParam() == LineFormat::e1) {
+        EXPECT_GT(seen.minutesTakenByLoss, 10);
+    }
 }
 
 TEST_P(LinePerformanceHistoryTest, CountsAreRightAfterEverySecond) {
     Histories histories(2495 + static_cast<unsigned>(GetParam()));
-    for (int round = 0; round < 50 && !HasFailure(); ++round) {
+    for (int round = 0; round < 20 && !HasFailure(); ++round) {
         SCOPED_TRACE(round);
         History const history = histories.next(250);
-        CountedLine line(GetParam());
+        CountedLine line(GetParam(), history.times);
         History soFar;
+        soFar.times = history.times;
         for (std::size_t i = 0; i < history.seconds.size(); ++i) {
             soFar.seconds.push_back(history.seconds[i]);
             soFar.intervals.push_back(history.intervals[i]);
@@ -266,7 +391,7 @@ TEST_P(LinePerformanceHistoryTest, CountsAreRightAfterEverySecond) {
             line.count(history.seconds[i]);
             ASSERT_EQ(line.intervals(), modelCounts(GetParam(), soFar)) << "after second " << i;
             ASSERT_EQ(line.unavailable(),
-                      unavailableSeconds(severeSeconds(GetParam(), soFar)).back())
+                      unavailableSeconds(soFar, severeSeconds(GetParam(), soFar)).back())
                 << "after second " << i;
         }
     }

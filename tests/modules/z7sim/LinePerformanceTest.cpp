@@ -15,6 +15,9 @@ namespace {
 constexpr auto kFormats = {LineFormat::esf, LineFormat::d4, LineFormat::e1, LineFormat::e1Crc};
 constexpr LineSecond kClean;
 constexpr LineSecond kNoSignal{.lossOfSignal = true};
+/// Severely errored in every format, without a defect.
+constexpr LineSecond kSevere{
+    .lineCodeViolations = 2048, .pathCodeViolations = 832, .framingErrors = 1};
 
 /// What one second counts on a new line.
 LineCounts counted(LineFormat format, LineSecond const& second) {
@@ -28,6 +31,15 @@ bool isSevere(LineFormat format, LineSecond const& second) {
 /// What so many seconds without signal count while the line is available.
 LineCounts secondsWithoutSignal(int n) {
     return {.errorSeconds = n, .severelyErrorSeconds = n, .severelyErrorFramingSeconds = n};
+}
+
+/// What so many `kSevere` count on an available line with a CRC.
+LineCounts severeSeconds(int n) {
+    return {.errorSeconds = n,
+            .severelyErrorSeconds = n,
+            .pathCodingViolations = 833 * n,
+            .lineErrorSeconds = n,
+            .lineCodeViolations = 2048 * n};
 }
 
 LineCounts unavailableSeconds(int n) {
@@ -100,11 +112,14 @@ TEST(LinePerformanceTest, SecondsWithSlipsAreCountedAndAreErrorSeconds) {
     }
 }
 
-TEST(LinePerformanceTest, SignalOrFrameLostIsSevereInEveryFormat) {
-    for (auto format : kFormats) {
+TEST(LinePerformanceTest, SignalOrFrameLostIsSevereExceptForE1WithoutCrc) {
+    for (auto format : {LineFormat::esf, LineFormat::d4, LineFormat::e1Crc}) {
         EXPECT_EQ(counted(format, {.lossOfSignal = true}), secondsWithoutSignal(1));
         EXPECT_EQ(counted(format, {.outOfFrame = true}), secondsWithoutSignal(1));
     }
+    constexpr LineCounts kErrored{.errorSeconds = 1, .severelyErrorFramingSeconds = 1};
+    EXPECT_EQ(counted(LineFormat::e1, {.lossOfSignal = true}), kErrored);
+    EXPECT_EQ(counted(LineFormat::e1, {.outOfFrame = true}), kErrored);
 }
 
 TEST(LinePerformanceTest, AlarmIndicationIsSevereForExtendedSuperframesOnly) {
@@ -175,11 +190,11 @@ TEST(LinePerformanceTest, SecondHasNoMoreViolationsThanTheLineHasBits) {
 
 TEST(LinePerformanceTest, NineSevereSecondsLeaveTheLineAvailable) {
     CountedLine line(LineFormat::esf);
-    line.count(kNoSignal, 9);
+    line.count(kSevere, 9);
     line.count(kClean);
-    line.count(kNoSignal, 9);
+    line.count(kSevere, 9);
     EXPECT_FALSE(line.unavailable());
-    EXPECT_EQ(line.running(), secondsWithoutSignal(18));
+    EXPECT_EQ(line.running(), severeSeconds(18));
 }
 
 TEST(LinePerformanceTest, TenSevereSecondsAreTakenBackAsUnavailable) {
@@ -187,15 +202,13 @@ TEST(LinePerformanceTest, TenSevereSecondsAreTakenBackAsUnavailable) {
     constexpr LineSecond kFull{.lineCodeViolations = 3,
                                .pathCodeViolations = 400,
                                .framingErrors = 1,
-                               .controlledSlips = 1,
-                               .alarmIndication = true};
+                               .controlledSlips = 1};
     line.count({.pathCodeViolations = 2});
     LineCounts const before = line.running();
     line.count(kFull, 9);
     EXPECT_FALSE(line.unavailable());
     LineCounts expected{.errorSeconds = -9,
                         .severelyErrorSeconds = -9,
-                        .severelyErrorFramingSeconds = -9,
                         .unavailableSeconds = 10,
                         .controlledSlipSeconds = -9,
                         .pathCodingViolations = -9 * 401,
@@ -233,9 +246,9 @@ TEST(LinePerformanceTest, SlipsNeverMakeTheLineUnavailable) {
 
 TEST(LinePerformanceTest, NineGoodSecondsLeaveTheLineUnavailable) {
     CountedLine line(LineFormat::esf);
-    line.count(kNoSignal, 10);
+    line.count(kSevere, 10);
     line.count({.pathCodeViolations = 1}, 9);
-    line.count(kNoSignal);
+    line.count(kSevere);
     line.count({.pathCodeViolations = 1}, 9);
     EXPECT_TRUE(line.unavailable());
     EXPECT_EQ(line.running(), unavailableSeconds(29));
@@ -260,11 +273,11 @@ TEST(LinePerformanceTest, TenGoodSecondsCountAsTheAvailableSecondsTheyWere) {
 
 TEST(LinePerformanceTest, LineThatCameBackNeedsTenSevereSecondsAgain) {
     CountedLine line(LineFormat::e1);
-    line.count(kNoSignal, 10);
+    line.count(kSevere, 10);
     line.count(kClean, 10);
-    line.count(kNoSignal, 9);
+    line.count(kSevere, 9);
     EXPECT_FALSE(line.unavailable());
-    line.count(kNoSignal);
+    line.count(kSevere);
     EXPECT_TRUE(line.unavailable());
     EXPECT_EQ(line.running(), unavailableSeconds(20));
 }
@@ -274,11 +287,11 @@ TEST(LinePerformanceTest, RunAcrossTheBorderIsTakenBackFromBothIntervals) {
     line.count({.pathCodeViolations = 1}, 3);
     line.count({.pathCodeViolations = 900}, 4);
     line.closeInterval();
-    line.count(kNoSignal, 5);
+    line.count(kSevere, 5);
     EXPECT_EQ(line.previous().unavailableSeconds, 0);
-    LinePerformance::Change const change = line.count(kNoSignal);
+    LinePerformance::Change const change = line.count(kSevere);
     LineCounts running = unavailableSeconds(6);
-    running -= secondsWithoutSignal(5);
+    running -= severeSeconds(5);
     EXPECT_EQ(change.running, running);
     EXPECT_EQ(change.previous, (LineCounts{.errorSeconds = -4,
                                            .severelyErrorSeconds = -4,
@@ -291,7 +304,7 @@ TEST(LinePerformanceTest, RunAcrossTheBorderIsTakenBackFromBothIntervals) {
 
 TEST(LinePerformanceTest, ReturnAcrossTheBorderIsCountedInBothIntervals) {
     CountedLine line(LineFormat::d4);
-    line.count(kNoSignal, 20);
+    line.count(kSevere, 20);
     line.count({.lineCodeViolations = 5}, 7);
     line.closeInterval();
     line.count({.controlledSlips = 1}, 3);
@@ -305,38 +318,38 @@ TEST(LinePerformanceTest, ReturnAcrossTheBorderIsCountedInBothIntervals) {
 
 TEST(LinePerformanceTest, RunThatEndsAtTheBorderIsNotTakenBackLater) {
     CountedLine line(LineFormat::esf);
-    line.count(kNoSignal, 9);
+    line.count(kSevere, 9);
     line.closeInterval();
     line.count(kClean);
-    line.count(kNoSignal, 9);
-    EXPECT_EQ(line.previous(), secondsWithoutSignal(9));
-    LinePerformance::Change const change = line.count(kNoSignal);
+    line.count(kSevere, 9);
+    EXPECT_EQ(line.previous(), severeSeconds(9));
+    LinePerformance::Change const change = line.count(kSevere);
     EXPECT_EQ(change.previous, LineCounts());
     EXPECT_EQ(line.running(), unavailableSeconds(10));
 }
 
 TEST(LinePerformanceTest, CorrectionsOlderThanThePreviousIntervalAreLost) {
     CountedLine line(LineFormat::esf);
-    line.count(kNoSignal, 3);
+    line.count(kSevere, 3);
     line.closeInterval();
-    line.count(kNoSignal, 5);
+    line.count(kSevere, 5);
     line.closeInterval();
-    line.count(kNoSignal, 2);
+    line.count(kSevere, 2);
     EXPECT_TRUE(line.unavailable());
     EXPECT_EQ(line.intervals(),
-              (std::vector{secondsWithoutSignal(3), unavailableSeconds(5), unavailableSeconds(2)}));
+              (std::vector{severeSeconds(3), unavailableSeconds(5), unavailableSeconds(2)}));
 }
 
 TEST(LinePerformanceTest, IntervalsMayBeOneSecondOrNone) {
     CountedLine line(LineFormat::esf);
     for (int i = 0; i < 9; ++i) {
-        line.count(kNoSignal);
+        line.count(kSevere);
         line.closeInterval();
     }
-    line.count(kNoSignal);
+    line.count(kSevere);
     EXPECT_TRUE(line.unavailable());
     EXPECT_EQ(line.previous(), unavailableSeconds(1));
-    EXPECT_EQ(line.intervals()[7], secondsWithoutSignal(1));
+    EXPECT_EQ(line.intervals()[7], severeSeconds(1));
     line.closeInterval();
     line.closeInterval();
     line.count(kClean, 10);

@@ -31,6 +31,10 @@ class LineLog final : public DS1LineStatusListener {
     std::vector<std::pair<std::string, int>> m_told;
 };
 
+/// The status of a line without signal.
+constexpr int kCut = DS1LineStatusLossOfSignal | DS1LineStatusLossOfFrame |
+                     DS1LineStatusXmtFarEndLOF | DS1LineStatusUnavailSigState;
+
 using Told = std::vector<std::pair<std::string, int>>;
 
 std::string text(DS1LineDevice& line, int (DS1LineDevice::*query)(char*)) {
@@ -156,14 +160,14 @@ TEST_F(Z7SimLineTest, EveryKindOfErrorReachesItsCounters) {
 TEST_F(Z7SimLineTest, ALostSignalIsUnavailableFromItsFirstSecond) {
     plugIn("type: esf");
     alarm("los");
-    tick(9);
-    EXPECT_EQ(m_table->GetSeverelyErrorSeconds(0), 9);
-    EXPECT_EQ(m_table->GetSeverelyErrorFramingSeconds(0), 9);
+    tick(2);
+    EXPECT_EQ(m_table->GetSeverelyErrorSeconds(0), 2);
+    EXPECT_EQ(m_table->GetSeverelyErrorFramingSeconds(0), 2);
     EXPECT_EQ(m_table->GetUnavailableSeconds(0), 0);
     tick();
     EXPECT_EQ(m_table->GetSeverelyErrorSeconds(0), 0);
     EXPECT_EQ(m_table->GetErrorSeconds(0), 0);
-    EXPECT_EQ(m_table->GetUnavailableSeconds(0), 10);
+    EXPECT_EQ(m_table->GetUnavailableSeconds(0), 3);
 }
 
 TEST_F(Z7SimLineTest, AMendedLineIsAvailableFromItsFirstGoodSecond) {
@@ -180,12 +184,13 @@ TEST_F(Z7SimLineTest, AMendedLineIsAvailableFromItsFirstGoodSecond) {
 TEST_F(Z7SimLineTest, TenSevereSecondsAcrossABorderAreTakenBackOnBothSides) {
     plugIn("type: esf");
     tick(896);
-    alarm("los");
-    tick(4);
-    EXPECT_EQ(m_table->GetSeverelyErrorSeconds(0), 4);
-    tick(5);
+    for (int i = 0; i < 9; ++i) {
+        errors({{"path-violations", 400}});
+        tick();
+    }
     EXPECT_EQ(m_table->GetSeverelyErrorSeconds(1), 4);
     EXPECT_EQ(m_table->GetSeverelyErrorSeconds(0), 5);
+    errors({{"path-violations", 400}});
     tick();
     EXPECT_EQ(m_table->GetSeverelyErrorSeconds(1), 0);
     EXPECT_EQ(m_table->GetUnavailableSeconds(1), 4);
@@ -208,36 +213,76 @@ TEST_F(Z7SimLineTest, TheTickThatClosesAnIntervalCountsItsSecondInTheNext) {
     EXPECT_EQ(m_table->GetControlledSlipSeconds(1), 1);
 }
 
-TEST_F(Z7SimLineTest, StatusBitsFollowTheDefects) {
+TEST_F(Z7SimLineTest, DefectShowsInTheStatusOnceItIsAFailure) {
     plugIn("type: esf");
     alarm("los");
-    tick();
-    EXPECT_EQ(status(), DS1LineStatusLossOfSignal | DS1LineStatusXmtFarEndLOF);
-    EXPECT_EQ(m_line->GetOperStatus(), 2);
-    alarm("los", true);
-    alarm("rai");
-    tick();
-    EXPECT_EQ(status(), DS1LineStatusRcvFarEndLOF);
+    tick(2);
+    EXPECT_EQ(status(), DS1LineStatusNoAlarm);
     EXPECT_EQ(m_line->GetOperStatus(), 1);
-    alarm("ais");
+    tick();
+    EXPECT_EQ(status(), kCut);
+    EXPECT_EQ(m_line->GetOperStatus(), 2);
+}
+
+TEST_F(Z7SimLineTest, DefectThatIsNoFailureIsNoStatus) {
+    plugIn("type: e1");
+    LineLog log;
+    m_feature->AddLineStatusListener(&log);
+    alarm("lof");
+    tick(2);
+    mend();
+    tick(20);
+    EXPECT_EQ(log.told(), Told());
+    EXPECT_EQ(m_table->GetSeverelyErrorFramingSeconds(0), 2);
+}
+
+TEST_F(Z7SimLineTest, MendedLineHasItsFailureAndIsUnavailableForTenSeconds) {
+    plugIn("type: esf");
+    alarm("los");
+    tick(3);
+    mend();
+    tick(9);
+    EXPECT_EQ(status(), kCut & ~DS1LineStatusXmtFarEndLOF);
+    tick();
+    EXPECT_EQ(status(), DS1LineStatusNoAlarm);
+    EXPECT_EQ(m_line->GetOperStatus(), 1);
+}
+
+TEST_F(Z7SimLineTest, OtherAlarmsShowInTheStatusAtOnce) {
+    plugIn("type: esf");
+    alarm("rai");
     alarm("loopback");
     tick();
-    EXPECT_EQ(status(), DS1LineStatusRcvFarEndLOF | DS1LineStatusRcvAIS |
-                            DS1LineStatusXmtFarEndLOF | DS1LineStatusLoopbackState);
+    EXPECT_EQ(status(), DS1LineStatusRcvFarEndLOF | DS1LineStatusLoopbackState);
+    EXPECT_EQ(m_line->GetOperStatus(), 1);
     EXPECT_EQ(m_line->GetLoopbackStatus(), 4);
+    alarm("sending-rai");
+    tick();
+    EXPECT_EQ(status(),
+              DS1LineStatusRcvFarEndLOF | DS1LineStatusLoopbackState | DS1LineStatusXmtFarEndLOF);
     mend();
     tick();
     EXPECT_EQ(status(), DS1LineStatusNoAlarm);
 }
 
-TEST_F(Z7SimLineTest, UnavailabilityIsAStatusOfItsOwn) {
-    plugIn("type: esf");
-    alarm("lof");
-    tick(10);
-    mend();
+TEST_F(Z7SimLineTest, ReceivedAlarmIndicationIsALossOfFrameToo) {
+    plugIn("type: e1-crc");
+    alarm("ais");
+    tick(3);
+    EXPECT_EQ(status(), DS1LineStatusRcvAIS | DS1LineStatusLossOfFrame | DS1LineStatusXmtFarEndLOF |
+                            DS1LineStatusUnavailSigState);
+}
+
+TEST_F(Z7SimLineTest, UnavailabilityByErrorsIsAStatusOfItsOwn) {
+    plugIn("type: esf, errors: {path-violations: 400}");
+    tick(9);
+    EXPECT_EQ(status(), DS1LineStatusNoAlarm);
     tick();
     EXPECT_EQ(status(), DS1LineStatusUnavailSigState);
+    mend();
     tick(9);
+    EXPECT_EQ(status(), DS1LineStatusUnavailSigState);
+    tick();
     EXPECT_EQ(status(), DS1LineStatusNoAlarm);
 }
 
@@ -247,14 +292,12 @@ TEST_F(Z7SimLineTest, ListenersHearOfEveryChangeOnce) {
     EXPECT_EQ(m_feature->AddLineStatusListener(&log), 0);
     EXPECT_EQ(m_feature->AddLineStatusListener(&log), 0);
     tick();
-    alarm("lof");
+    alarm("los");
     tick(10);
     mend();
     tick(11);
-    int const lost = DS1LineStatusLossOfFrame | DS1LineStatusXmtFarEndLOF;
-    EXPECT_EQ(log.told(), (Told{{"span-1", lost},
-                                {"span-1", lost | DS1LineStatusUnavailSigState},
-                                {"span-1", DS1LineStatusUnavailSigState},
+    EXPECT_EQ(log.told(), (Told{{"span-1", kCut},
+                                {"span-1", kCut & ~DS1LineStatusXmtFarEndLOF},
                                 {"span-1", DS1LineStatusNoAlarm}}));
 }
 
@@ -262,7 +305,7 @@ TEST_F(Z7SimLineTest, AChangeLeavesItsDate) {
     plugIn("type: esf");
     auto const before = static_cast<long>(std::time(nullptr));
     alarm("los");
-    tick();
+    tick(3);
     EXPECT_GE(m_line->GetLineStatusLastChange(), before);
     int seconds = 0;
     int microseconds = -1;
@@ -275,8 +318,9 @@ TEST_F(Z7SimLineTest, AnAlarmFromTheStartIsAStatusAndNoChange) {
     plugIn("type: esf, alarms: [ais]");
     LineLog log;
     m_feature->AddLineStatusListener(&log);
-    EXPECT_EQ(status(), DS1LineStatusRcvAIS | DS1LineStatusXmtFarEndLOF);
-    tick();
+    EXPECT_EQ(status(), DS1LineStatusRcvAIS | DS1LineStatusLossOfFrame | DS1LineStatusXmtFarEndLOF |
+                            DS1LineStatusUnavailSigState);
+    tick(4);
     EXPECT_EQ(log.told(), Told());
     EXPECT_EQ(m_line->GetLineStatusLastChange(), 0);
 }
@@ -287,7 +331,7 @@ TEST_F(Z7SimLineTest, AWithdrawnFeatureTellsNothingMore) {
     m_feature->AddLineStatusListener(&log);
     m_feature->Withdraw();
     alarm("los");
-    tick();
+    tick(3);
     EXPECT_EQ(log.told(), Told());
     EXPECT_NE(status(), DS1LineStatusNoAlarm);
 }
