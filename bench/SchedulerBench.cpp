@@ -60,6 +60,19 @@ void oneSecondPeer(benchmark::State& state) {
             table->ScheduledAction();
 }
 
+/// All tables enter the list one after the other and leave it in the same order.
+template <std::size_t count>
+void enterAndRemove(benchmark::State& state) {
+    std::vector<Ticking> tables(count);
+    for (auto _ : state) {
+        DrivenScheduler scheduler;
+        for (Ticking& table : tables)
+            scheduler.AddPeriodic(&table, 1);
+        for (Ticking& table : tables)
+            scheduler.Remove(&table);
+    }
+}
+
 BENCHMARK(oneSecondOurs<1000>)->Name("one second of 1,000 tables/ours");
 BENCHMARK(oneSecondPeer<1000>)->Name("one second of 1,000 tables/peer");
 BENCHMARK(oneSecondOurs<10000>)->Name("one second of 10,000 tables/ours");
@@ -67,5 +80,12 @@ BENCHMARK(oneSecondPeer<10000>)->Name("one second of 10,000 tables/peer");
 // The same pass at two sizes: how it grows.
 BENCHMARK(oneSecondOurs<10000>)->Name("one second, from 1,000 to 10,000 tables/ours");
 BENCHMARK(oneSecondOurs<1000>)->Name("one second, from 1,000 to 10,000 tables/peer");
+// Entering and removing them: how it grows.
+BENCHMARK(enterAndRemove<100000>)
+    ->Name("entry and removal, from 10,000 to 100,000 tables/ours")
+    ->Unit(benchmark::kMillisecond);
+BENCHMARK(enterAndRemove<10000>)
+    ->Name("entry and removal, from 10,000 to 100,000 tables/peer")
+    ->Unit(benchmark::kMillisecond);
 
 } // namespace

@@ -31,6 +31,7 @@ int main(int argc, char** argv) {
         {"one second of 10,000 lines", 2.0},
         {"one second, from 1,000 to 10,000 lines", 12.0},
         {"one second, from 1,000 to 10,000 tables", 12.0},
+        {"entry and removal, from 10,000 to 100,000 tables", 15.0},
     });
     benchmark::RunSpecifiedBenchmarks(&reporter);
     benchmark::Shutdown();

@@ -1,24 +1,38 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The scheduler's bookkeeping: who is called back when.
+// The scheduler's bookkeeping: which object is called back when.
 #pragma once
 
-#include <vector>
+#include <limits>
+#include <memory>
 
 #include "platform/Runnable.h"
 #include "platform/Schedulable.h"
 
-/// One entry of the scheduler's list.
+namespace KVL {
+class ActionList;
+}
+
+/// A `SchedItem` is one entry of the scheduler's list.
 struct SchedItem {
     Schedulable* target; ///< not owned
     long due;            ///< seconds since the epoch
     long period;         ///< seconds; 0 or less: called once
 };
 
-/// Calls objects back, periodically or once. An object is on the list once at most. All times are
-/// whole seconds; times since the epoch are those of the system's clock.
+/// An `ActionScheduler` calls objects back, periodically or once. An object is on its list at most
+/// once. All times are whole seconds; times since the epoch are those of the system's clock.
 ///
-/// The public operations may be called from any thread but from no scheduled action: they wait
+/// The scheduler follows the system's clock, also when that is set: set back, it calls nothing
+/// until the clock has caught up; set forward, it makes up for all the calls of a periodic entry
+/// that it has missed, one after the other. An action that measures time takes it from a monotonic
+/// clock; the number of its calls is no measure.
+///
+/// Threads: the public operations are thread-safe, but no scheduled action may call them: they wait
 /// while an action runs. Locks that an action takes come after the list's lock.
+///
+/// Entering and removing an object takes a time that does not depend on the number of entries with
+/// its due time and period. If memory runs out, an operation throws `std::bad_alloc` and leaves the
+/// list as it was.
 class KVLOAM_API ActionScheduler : public Runnable {
   public:
     virtual ~ActionScheduler();
@@ -34,12 +48,10 @@ class KVLOAM_API ActionScheduler : public Runnable {
     virtual int ChangePeriod(Schedulable* target, long period) = 0;
 
   protected:
-    ActionScheduler() = default;
+    ActionScheduler();
 
-    using List = std::vector<SchedItem>;
-
-    /// What "nothing to wait for" is written as.
-    static constexpr long kNever = 0x7FFFFFFF;
+    /// The next wake-up time when there is nothing to wait for: the last time that fits.
+    static constexpr long kNever = std::numeric_limits<long>::max();
 
     // From here on: the list's lock is held.
 
@@ -60,28 +72,32 @@ class KVLOAM_API ActionScheduler : public Runnable {
     int AddOneTimeAction(Schedulable* target, long when);
 
   protected:
+    /// Holds the list's lock for a scope.
+    class ListLock {
+      public:
+        explicit ListLock(ActionScheduler& scheduler) : m_scheduler(scheduler) {
+            m_scheduler.lock_list();
+        }
+        ~ListLock() { m_scheduler.unlock_list(); }
+        ListLock(ListLock const&) = delete;
+        ListLock& operator=(ListLock const&) = delete;
+
+      private:
+        ActionScheduler& m_scheduler;
+    };
+
     bool check_on_list(Schedulable* target);
-    /// The first entry of `target` in the order of due times, or the list's end.
-    List::iterator find_item_on_list(Schedulable* target);
-    /// Enters an item behind those that are due at the same time.
-    void insert(SchedItem const& item);
+    /// The entry of `target`, valid until the list changes; null when it is not on the list.
+    SchedItem* find_item_on_list(Schedulable* target);
 
     /// What the loop does when it wakes at `now`: calls everything that is due, earliest first, and
-    /// sets the next wake-up time. Woken before that time it calls nothing.
+    /// sets the next wake-up time. Before that time it calls nothing.
     ///
     /// Deliberate: after a pass the next wake-up is that of the earliest entry that was just called
-    /// and will be called again; entries that were not due do not count. One of those that is due
-    /// earlier waits until then, or until a change of the list wakes the loop.
+    /// and will be called again; entries that were not due do not count. If one of those is due
+    /// earlier, it waits until then, or until a change of the list wakes the loop.
     void run_pass(long now);
 
-    /// Below zero or above what fits, a time stays at the last one that fits.
-    static long add_saturated(long time, long seconds);
-
     long m_nextWakeUp = kNever;
-    List m_list; ///< by due time; items due at the same time as they were entered
-
-  private:
-    void callDue(long now);
-    /// The first entry that is due after `time`.
-    List::iterator firstAfter(long time);
+    std::unique_ptr<KVL::ActionList> m_list;
 };

@@ -3,6 +3,8 @@
 
 #include <cstdio>
 
+#include "platform/ActionList.h"
+
 ActionScheduler_pthread* ActionScheduler_pthread::s_actionScheduler = nullptr;
 
 ActionScheduler* ActionScheduler_pthread::GetScheduler() {
@@ -47,44 +49,42 @@ void ActionScheduler_pthread::Run() {
     m_running = true;
     pthread_cond_signal(&m_started);
     for (;;) {
-        m_deadline.tv_sec = static_cast<std::time_t>(m_nextWakeUp);
-        m_deadline.tv_nsec = 0;
-        pthread_cond_timedwait(&m_listChanged, &m_listMutex, &m_deadline);
+        waitForChange();
         run_pass(m_clock());
     }
 }
 
-int ActionScheduler_pthread::Remove(Schedulable* target) {
-    lock_list();
-    auto const found = find_item_on_list(target);
-    bool const known = found != m_list.end();
-    if (known) {
-        m_list.erase(found);
-        pthread_cond_signal(&m_listChanged);
+void ActionScheduler_pthread::waitForChange() {
+    if (m_nextWakeUp == kNever) {
+        pthread_cond_wait(&m_listChanged, &m_listMutex);
+        return;
     }
-    unlock_list();
-    return known ? 0 : 1;
+    m_deadline.tv_sec = static_cast<std::time_t>(m_nextWakeUp);
+    m_deadline.tv_nsec = 0;
+    pthread_cond_timedwait(&m_listChanged, &m_listMutex, &m_deadline);
+}
+
+int ActionScheduler_pthread::Remove(Schedulable* target) {
+    ListLock const lock(*this);
+    if (!check_on_list(target)) return 1;
+    m_list->erase(target);
+    pthread_cond_signal(&m_listChanged);
+    return 0;
 }
 
 int ActionScheduler_pthread::ChangePeriod(Schedulable* target, long period) {
-    lock_list();
-    auto const found = find_item_on_list(target);
-    bool const changes = found != m_list.end() && found->period >= 1 && found->period != period;
-    if (changes) {
-        SchedItem item = *found;
-        m_list.erase(found);
-        item.due = add_saturated(item.due, add_saturated(period, -item.period));
-        item.period = period;
-        insert(item);
-        pthread_cond_signal(&m_listChanged);
-    }
-    unlock_list();
-    return changes ? 0 : 1;
+    ListLock const lock(*this);
+    SchedItem const* const item = find_item_on_list(target);
+    if (item == nullptr || item->period < 1 || item->period == period) return 1;
+    long const difference = KVL::add_saturated(period, -item->period);
+    m_list->change(target, KVL::add_saturated(item->due, difference), period);
+    pthread_cond_signal(&m_listChanged);
+    return 0;
 }
 
 int ActionScheduler_pthread::put_item_on_list(Schedulable* target, long period, long when) {
-    long const due = period >= 1 ? add_saturated(m_clock(), period) : when;
-    insert({target, due, period});
+    long const due = period >= 1 ? KVL::add_saturated(m_clock(), period) : when;
+    m_list->insert({target, due, period});
     if (due < m_nextWakeUp) pthread_cond_signal(&m_listChanged);
     return 0;
 }

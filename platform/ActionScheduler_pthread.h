@@ -47,6 +47,9 @@ class KVLOAM_API ActionScheduler_pthread : public ActionScheduler, public KVLThr
     static ActionScheduler_pthread* s_actionScheduler;
 
   private:
+    /// Waits until the next wake-up time or a change of the list.
+    void waitForChange();
+
     timespec m_deadline{};
     pthread_mutex_t m_listMutex;
     pthread_mutexattr_t m_listMutexAttributes;

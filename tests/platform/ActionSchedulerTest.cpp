@@ -7,14 +7,15 @@
 
 #include <gtest/gtest.h>
 
+#include "platform/ActionList.h"
 #include "platform/ActionScheduler_pthread.h"
 #include "tests/support/Slots.h"
 
 namespace {
 
 constexpr long kStart = 1000;
-constexpr long kNever = 2147483647;
 constexpr long kLast = std::numeric_limits<long>::max();
+constexpr long kNever = kLast;
 
 long s_now = kStart;
 
@@ -33,7 +34,7 @@ class DrivenScheduler final : public ActionScheduler_pthread {
         run_pass(time);
     }
     long nextWakeUp() const { return m_nextWakeUp; }
-    std::size_t size() const { return m_list.size(); }
+    std::size_t size() const { return m_list->size(); }
     SchedItem item(Schedulable* target) { return *find_item_on_list(target); }
 };
 
