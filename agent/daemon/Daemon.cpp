@@ -42,13 +42,13 @@ namespace kvloamd {
 
 namespace {
 
-/// How long a stop may be held up by notifications that a master does not take.
-constexpr std::chrono::seconds kLastWords{1};
+/// How long a stop waits for pending notifications.
+constexpr std::chrono::seconds kFlushTime{1};
 
-/// The lowest entPhysicalIndex, which is the chassis's.
+/// The lowest entPhysicalIndex: that of the chassis.
 constexpr std::uint32_t kFirstEntity = 1;
 
-/// What the library's threads may reach until the process ends. Never destroyed.
+/// Everything that the library's threads may access until the process ends. Never destroyed.
 struct Boards {
     explicit Boards(Oid const& enterprise)
         : listener(*manager.get(), source, queue, counters, enterprise),
@@ -65,8 +65,8 @@ struct Boards {
     FaultListener faultListener;
 };
 
-/// Makes the first calls of the library's singletons, which belong to one thread, and asks the
-/// platform for its root object.
+/// Creates the library's singletons, whose first calls must come from one thread, and asks the
+/// platform for its root object. Returns whether the platform answered.
 bool platformAnswers() {
     ReferenceTable::get_instance();
     DeviceMapperClient* const client = DeviceMapperIf::get_interface()->GetDMClient();
@@ -90,7 +90,7 @@ std::vector<LoadedModule> loadModules(Options const& options) {
     return modules;
 }
 
-/// Every module's factory is made before the first is attached: a bad module leaves nothing half
+/// Creates every factory before it attaches the first one, so that a bad module leaves nothing half
 /// started.
 void attachModules(std::vector<LoadedModule> const& modules, Boards& boards) {
     std::vector<ReferenceCounter<BoardFactory>> factories;
@@ -106,7 +106,7 @@ void attachModules(std::vector<LoadedModule> const& modules, Boards& boards) {
         ServiceManager::GetInstance()->AddModule(module.name().c_str());
 }
 
-/// Has the listeners tell of changes for a scope.
+/// A scope during which the listeners report changes.
 class ListeningScope {
   public:
     ListeningScope(Boards& boards, std::function<void()> const& changed) : m_boards(boards) {
@@ -128,7 +128,7 @@ class ListeningScope {
     Boards& m_boards;
 };
 
-/// A folder for a scope.
+/// A directory that exists for a scope.
 class TemporaryFolder {
   public:
     TemporaryFolder() {
@@ -150,7 +150,7 @@ class TemporaryFolder {
 };
 
 bool checkSnmpConfig(Options const& options) {
-    // The SNMP library keeps its state as it goes; a check leaves no trace.
+    // The SNMP library writes its state while it runs; a check must not leave any.
     TemporaryFolder const folder;
     Options withoutTrace = options;
     withoutTrace.persistentDirectory = folder.path();
@@ -167,36 +167,35 @@ Deadline earliest(Deadline const& one, Deadline const& other) {
     return one && other ? std::min(*one, *other) : one ? one : other;
 }
 
-/// Reads the options again. What can change while the agent runs changes; the rest waits for the
-/// next start.
+/// Reads the options again and applies those that can change while the agent runs. The others need
+/// a restart.
 void reload(Options const& started, ReadOptions const& readAgain) {
     auto const read = readAgain();
     auto const* const options = std::get_if<Options>(&read);
     if (options == nullptr) {
-        log(LogLevel::Error, std::get<Exit>(read).text + "; going on as before");
+        log(LogLevel::Error, std::get<Exit>(read).text + "; keeping the previous configuration");
         return;
     }
     setLogLevel(options->logLevel);
     Options now = *options;
     now.logLevel = started.logLevel;
     log(LogLevel::Info, now == started ? "the configuration has been read again"
-                                       : "the configuration has been read again; what has changed "
-                                         "beside the log level counts from the next start on");
+                                       : "the configuration has been read again; changes other "
+                                         "than the log level take effect at the next start");
 }
 
-/// Has the last notifications leave, if they can soon.
-void announceLast(Notifier& notifier, NotificationQueue& queue, Front& front) {
+/// Flushes pending notifications, waiting at most `kFlushTime`.
+void flushNotifications(Notifier& notifier, NotificationQueue& queue, Front& front) {
     front.beforeSleep([&]() -> std::optional<Clock::time_point> {
-        if (notifier.announceAll()) front.stop();
+        if (notifier.sendAll()) front.stop();
         return std::nullopt;
     });
-    front.run(Clock::now() + kLastWords);
+    front.run(Clock::now() + kFlushTime);
     if (std::size_t const left = queue.size(); left > 0)
-        log(LogLevel::Warning,
-            "notifications that could not be sent before the stop: " + std::to_string(left));
+        log(LogLevel::Warning, "notifications not sent before the stop: " + std::to_string(left));
 }
 
-/// Has the settings of former runs, and keeps those of this one in the same file.
+/// Loads saved settings and persists changes.
 class KeptSettings {
   public:
     KeptSettings(Settings& settings, StableIndices& file) : m_settings(settings), m_file(file) {
@@ -242,8 +241,8 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             snapshot.interfaces = interfaces.read(snapshot.boards);
             std::vector<PlacedLine> const lines = interfaces.takeLines();
             boards.lines.place(lines);
-            handOn(boards.settings, lines);
-            links.note(snapshot.interfaces.interfaces, snapshot.begun);
+            applySettings(boards.settings, lines);
+            links.update(snapshot.interfaces.interfaces, snapshot.begun);
             snapshot.entities = entities.read(snapshot);
         },
         started, [&] { wakeup.wake(); });
@@ -276,9 +275,9 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     });
     front.beforeSleep([&] {
         if (boards.settings.hasUnsaved()) collector.renew();
-        auto const entityNews = entityNotices.tell(collector.newest(), Clock::now());
-        return earliest(entityNews,
-                        earliest(notifier.announce(collector.newest()->begun), notice.beat()));
+        auto const nextEntityNotice = entityNotices.update(collector.newest(), Clock::now());
+        return earliest(nextEntityNotice,
+                        earliest(notifier.send(collector.newest()->begun), notice.beat()));
     });
     ListeningScope listening(boards, [&] { collector.renew(); });
     log(LogLevel::Info, serving);
@@ -288,7 +287,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     notice.stopping();
     log(LogLevel::Info, "stopping");
     listening.stop();
-    announceLast(notifier, boards.queue, front);
+    flushNotifications(notifier, boards.queue, front);
 }
 
 } // namespace
@@ -296,13 +295,14 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
 int runDaemon(Options const& options, ReadOptions const& readAgain) {
     Signals const signals;
     tzset();
-    // The library's threads reach these until the process ends.
+    // The library's threads access these until the process ends.
     static auto* const boards = new Boards(options.enterprise);
     try {
         std::vector<LoadedModule> const modules = loadModules(options);
         if (modules.empty())
-            log(LogLevel::Warning, "no board module is named, so there will be no boards; name one "
-                                   "with --module");
+            log(LogLevel::Warning,
+                "no board module is configured, so there will be no boards; name one "
+                "with --module");
         std::unique_ptr<Front> const front = makeFront(options);
         if (!front->open() || !platformAnswers()) return kExitFailure;
         boards->counters.started = Clock::now();
@@ -326,9 +326,9 @@ int checkConfiguration(Options const& options) {
             good = false;
         }
     }
-    // Beside a master, who may ask is the master's concern.
+    // A subagent's access control is the master's.
     if (options.agentx.empty()) good = checkSnmpConfig(options) && good;
-    if (good) log(LogLevel::Info, "the configuration is good");
+    if (good) log(LogLevel::Info, "the configuration is valid");
     return good ? 0 : kExitFailure;
 }
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The agent from its start to its end.
+// Runs the agent.
 #pragma once
 
 #include <functional>
@@ -9,16 +9,16 @@
 
 namespace kvloamd {
 
-/// Reads the options anew, from where the first ones came.
+/// Reads the options again from where they were read at the start.
 using ReadOptions = std::function<std::variant<Options, Exit>()>;
 
-/// Starts everything, serves until SIGTERM or SIGINT, stops. SIGHUP has the options read again.
-/// Returns the process's exit status; what went wrong has been logged. Called once, on the main
-/// thread, before any other thread is started.
+/// Starts the agent, serves until SIGTERM or SIGINT, and stops. SIGHUP reads the options again.
+/// Returns the exit status of the process; errors have been logged. Requires that it is called
+/// once, on the main thread, before any other thread is started.
 int runDaemon(Options const& options, ReadOptions const& readAgain);
 
-/// Checks what can be checked without starting: modules, configuration. Returns the exit status;
-/// what is wrong has been logged.
+/// Checks modules and configuration without starting the agent. Returns the exit status; errors
+/// have been logged.
 int checkConfiguration(Options const& options);
 
 } // namespace kvloamd

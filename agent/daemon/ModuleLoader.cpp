@@ -12,7 +12,8 @@ namespace kvloamd {
 LoadedModule::LoadedModule(std::string name, std::string const& directory)
     : m_name(std::move(name)) {
     if (m_name.empty() || m_name.find('/') != std::string::npos)
-        throw ModuleError("'" + m_name + "' is no module name; give the name without path, as in " +
+        throw ModuleError("'" + m_name +
+                          "' is not a module name; give the name without a path, as in " +
                           "--module z7sim, and the path with --module-dir");
     m_path = directory + "/" + m_name + "kvl.so";
     if (access(m_path.c_str(), F_OK) != 0)
@@ -20,11 +21,11 @@ LoadedModule::LoadedModule(std::string name, std::string const& directory)
                           "; check the name, or name its directory with --module-dir");
     void* const library = dlopen(m_path.c_str(), RTLD_NOW | RTLD_LOCAL);
     if (library == nullptr)
-        throw ModuleError("module '" + m_name + "' can not be loaded: " + dlerror());
+        throw ModuleError("module '" + m_name + "' cannot be loaded: " + dlerror());
     void* const entry = dlsym(library, KVL_BOARD_MODULE_ENTRY_POINT);
     if (entry == nullptr)
         throw ModuleError("module '" + m_name + "' has no entry point " +
-                          KVL_BOARD_MODULE_ENTRY_POINT + ": " + m_path + " is no board module");
+                          KVL_BOARD_MODULE_ENTRY_POINT + ": " + m_path + " is not a board module");
     m_createFactory = reinterpret_cast<KVLCreateBoardFactory*>(entry);
 }
 

@@ -9,20 +9,20 @@
 
 namespace kvloamd {
 
-/// One line: which module, what is wrong with it, what to do.
+/// Names the module, the fault and the remedy in one line.
 class ModuleError : public std::runtime_error {
   public:
     using std::runtime_error::runtime_error;
 };
 
-/// A board module, loaded. It stays loaded until the process ends: its boards, and the threads
-/// that its factory started, live in its code.
+/// A `LoadedModule` is a board module that has been loaded. It stays loaded until the process ends,
+/// because its boards and the threads of its factory run its code.
 class LoadedModule {
   public:
     /// Loads `<name>kvl.so` from `directory`. Throws ModuleError.
     LoadedModule(std::string name, std::string const& directory);
 
-    /// Has the module make its factory. Throws ModuleError.
+    /// Creates the factory of the module. Throws ModuleError.
     ReferenceCounter<BoardFactory> createFactory() const;
 
     std::string const& name() const { return m_name; }

@@ -21,13 +21,14 @@ std::map<std::string, LogLevel> const kLogLevels{{"error", LogLevel::Error},
                                                  {"debug", LogLevel::Debug}};
 
 std::string checkOid(std::string const& text) {
-    return parseOid(text) ? std::string()
-                          : "'" + text + "' is no object identifier; write it as 1.3.6.1.4.1.32473";
+    return parseOid(text)
+               ? std::string()
+               : "'" + text + "' is not an object identifier; write it like 1.3.6.1.4.1.32473";
 }
 
-/// The SNMP library reads an empty address as its port of every network.
+/// The SNMP library takes an empty address for port 161 on all interfaces.
 std::string checkAddress(std::string const& text) {
-    return text.empty() ? "the address is empty; write it as udp:127.0.0.1:1161" : std::string();
+    return text.empty() ? "the address is empty; write it like udp:127.0.0.1:1161" : std::string();
 }
 
 std::string defaultModuleDirectory() {
@@ -35,22 +36,24 @@ std::string defaultModuleDirectory() {
     return directory != nullptr && *directory != '\0' ? directory : KVLOAM_MODULE_DIRECTORY;
 }
 
-/// What is wrong with options that are good each by itself; empty: nothing.
+/// The conflict between options that are valid by themselves; empty: none.
 std::string checkTogether(Options const& options, bool listens) {
     if (options.agentx.empty()) return {};
     if (listens)
-        return "--agentx excludes --port and --listen: beside an SNMP master the agent has no port "
-               "of its own; leave one of them out";
+        return "--agentx excludes --port and --listen: a subagent has no port of its own; leave "
+               "out "
+               "one of them";
     if (!options.snmpConfig.empty())
-        return "--agentx excludes --snmp-config: beside an SNMP master, who may ask and who is "
-               "notified stands in the master's configuration; leave one of them out";
+        return "--agentx excludes --snmp-config: for a subagent, the master's configuration "
+               "controls "
+               "access and notification receivers; leave out one of them";
     if (!parseAgentxAddress(options.agentx))
         return "--agentx: '" + options.agentx +
-               "' is no address; write it as unix:/var/agentx/master or tcp:127.0.0.1:705";
+               "' is not an address; write it like unix:/var/agentx/master or tcp:127.0.0.1:705";
     return {};
 }
 
-/// The parser's messages may have several lines; ours have one.
+/// Joins the lines of the parser's messages, because ours have one line.
 std::string oneLine(std::string text) {
     while (!text.empty() && text.back() == '\n')
         text.pop_back();
@@ -74,8 +77,8 @@ std::optional<Oid> parseOid(std::string_view text) {
         if (!text.starts_with('.')) return std::nullopt;
         text.remove_prefix(1);
     }
-    // An encoded name begins with two numbers in one octet; the library takes 128 at most, and an
-    // instance needs room for its own.
+    // BER encodes the first two numbers in one octet. The library accepts 128 numbers at most, and
+    // the objects below need room for theirs.
     if (oid.size() < 2 || oid.size() > 100 || oid[0] > 2 || (oid[0] < 2 && oid[1] > 39))
         return std::nullopt;
     return oid;
@@ -88,50 +91,50 @@ std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
     std::string enterprise = "1.3.6.1.4.1.32473";
     std::vector<std::string> listen;
 
-    CLI::App app("Tells of the host's telephony boards over SNMP.", "kvloamd");
+    CLI::App app("Serves the telephony boards of this host over SNMP.", "kvloamd");
     app.set_version_flag("--version",
                          std::string("kvloamd " KVLOAM_VERSION " (") + OAM_VersionString() + ")");
     auto* const portOption =
         app.add_option("--port", port, "Listen on this UDP port of the loopback address")
             ->check(CLI::Range(1, 65535));
     app.add_option("--listen", listen,
-                   "Listen here, as in udp:127.0.0.1:1161, which is the default; repeatable")
+                   "Listen on this address, by default udp:127.0.0.1:1161; repeatable")
         ->type_name("ADDRESS")
         ->check(checkAddress)
         ->excludes(portOption);
     auto* const agentxOption =
-        app.add_option(
-               "--agentx", options.agentx,
-               "Serve through the SNMP master here, as in unix:/var/agentx/master, which is "
-               "the default, instead of a port of our own")
+        app.add_option("--agentx", options.agentx,
+                       "Serve as a subagent of the SNMP master at this address, by default "
+                       "unix:/var/agentx/master, instead of on a port")
             ->type_name("[ADDRESS]")
             ->expected(0, 1);
     app.add_option("--module", options.modules, "Load the board module <name>kvl.so; repeatable")
         ->type_name("NAME");
     app.add_option("--module-dir", options.moduleDirectory,
-                   "Where board modules are (environment: KVLOAM_MODULE_DIR)")
+                   "Directory of board modules (environment: KVLOAM_MODULE_DIR)")
         ->type_name("DIR")
         ->capture_default_str();
     app.add_option("--snmp-config", options.snmpConfig,
-                   "Communities, users, views and trap destinations, in Net-SNMP's own syntax; "
-                   "without it kvloamd.conf is looked for where Net-SNMP looks")
+                   "Communities, users, views and notification receivers, in the syntax of "
+                   "snmpd.conf(5); by default kvloamd.conf in Net-SNMP's directories")
         ->type_name("FILE");
     app.add_option("--persistent-dir", options.persistentDirectory,
-                   "Where SNMPv3 engine state and the indices of interfaces and entities are kept")
+                   "Directory for SNMPv3 engine state, settings and the indices of interfaces and "
+                   "entities")
         ->type_name("DIR");
     app.add_option("--enterprise-oid", enterprise, "The arc above KVL-OAM-MIB")
         ->type_name("OID")
         ->check(checkOid)
         ->capture_default_str();
     app.add_option("--interface-base", options.interfaceBase,
-                   "The lowest ifIndex that is given to an interface that has none yet")
+                   "The lowest ifIndex for new interfaces")
         ->check(CLI::Range(1, 1000000000))
         ->capture_default_str();
     app.add_option("--log-level", options.logLevel, "error, warning, info or debug")
         ->transform(CLI::CheckedTransformer(kLogLevels, CLI::ignore_case))
         ->option_text("LEVEL");
     app.add_flag("--check-config", options.checkConfig,
-                 "Check options, modules and configuration, and exit")
+                 "Check options, modules and configuration, then exit")
         ->configurable(false);
     app.set_config("--config", "", "Read options from this file, as in module=[\"z7sim\"]")
         ->type_name("FILE");

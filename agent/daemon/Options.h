@@ -14,11 +14,11 @@ namespace kvloamd {
 
 struct Options {
     std::vector<std::string> listen{"udp:127.0.0.1:1161"};
-    std::string agentx; ///< the SNMP master's address; empty: the agent stands alone
+    std::string agentx; ///< the address of the AgentX master; empty: stand-alone
     std::vector<std::string> modules;
     std::string moduleDirectory;
-    std::string snmpConfig;          ///< empty: where Net-SNMP looks by itself
-    std::string persistentDirectory; ///< empty: Net-SNMP's own
+    std::string snmpConfig;          ///< empty: Net-SNMP's default
+    std::string persistentDirectory; ///< empty: Net-SNMP's default
     Oid enterprise{1, 3, 6, 1, 4, 1, 32473};
     std::uint32_t interfaceBase = 1000;
     LogLevel logLevel = LogLevel::Info;
@@ -27,8 +27,8 @@ struct Options {
     bool operator==(Options const&) const = default;
 };
 
-/// Why there are no options: the text to print and the status to exit with. The text is help or
-/// the version when the status is 0, else one line of what is wrong.
+/// A request to exit instead of running. With status 0, `text` is the help or the version;
+/// otherwise it is an error message of one line.
 struct Exit {
     int status;
     std::string text;
@@ -37,11 +37,11 @@ struct Exit {
 inline constexpr int kExitFailure = 1;
 inline constexpr int kExitUsage = 2;
 
-/// Reads the command line, and the file that it names with --config. The command line wins.
+/// Reads the command line, and the file that its --config names. The command line takes precedence.
 std::variant<Options, Exit> parseOptions(int argc, char const* const* argv);
 
-/// "1.3.6.1.4.1.32473", with or without a leading dot; nothing when `text` is no such name of at
-/// least two numbers.
+/// Parses "1.3.6.1.4.1.32473", with or without a leading dot. Nothing when `text` is not an object
+/// identifier of at least two numbers.
 std::optional<Oid> parseOid(std::string_view text);
 
 } // namespace kvloamd

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Tells the service manager that started the agent how it is.
+// Reports the state of the agent to the service manager.
 #pragma once
 
 #include <optional>
@@ -9,22 +9,23 @@
 
 namespace kvloamd {
 
-/// Without a service manager, nothing happens. Used on one thread.
+/// A `ServiceNotice` notifies systemd. Without a service manager it does nothing. Thread-bound: the
+/// SNMP thread.
 class ServiceNotice {
   public:
-    /// Asks the environment whether the manager wants to hear that the agent lives.
+    /// Reads from the environment whether the service manager expects watchdog messages.
     ServiceNotice();
 
-    /// `status` is a line for whoever looks.
+    /// `status`: one line, which systemctl status shows.
     void ready(std::string const& status) const;
     void reloading() const;
     void stopping() const;
 
-    /// Says that the agent lives, if it is time. Returns when to come again at the latest.
+    /// Sends a watchdog message if it is due. Returns the time of the next call.
     std::optional<Clock::time_point> beat();
 
   private:
-    std::optional<Clock::duration> m_pause; ///< between two beats
+    std::optional<Clock::duration> m_pause; ///< between two watchdog messages
     Clock::time_point m_next;
 };
 

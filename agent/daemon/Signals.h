@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The signals that end the agent or have it read its configuration again, as a descriptor.
+// The signals that stop the agent or reload its configuration, as a descriptor.
 #pragma once
 
 #include <csignal>
@@ -9,8 +9,9 @@ namespace kvloamd {
 
 enum class Signal { Stop, Reload };
 
-/// SIGTERM, SIGINT and SIGHUP. They are blocked for the whole process: made before any other
-/// thread. Throws std::system_error when the system has no descriptor left.
+/// A `Signals` object blocks SIGTERM, SIGINT and SIGHUP and makes them readable on a descriptor.
+/// Requires that no other thread has been started, because threads inherit the blocked signals. The
+/// constructor throws std::system_error when no descriptor is available.
 class Signals {
   public:
     Signals();
@@ -19,9 +20,10 @@ class Signals {
     Signals& operator=(Signals const&) = delete;
 
     int descriptor() const { return m_descriptor; }
-    /// The next signal that has come; nothing when none has.
+    /// Removes the next pending signal; nothing when none is pending.
     std::optional<Signal> next() const;
-    /// From now on SIGTERM and SIGINT end the process at once, for whoever finds the stop too slow.
+    /// From now on SIGTERM and SIGINT end the process at once, so that a slow stop can be
+    /// interrupted.
     void letStopThrough() const;
 
   private:

@@ -17,15 +17,15 @@ Wakeup::~Wakeup() {
     close(m_descriptor);
 }
 
-// NOLINTNEXTLINE(readability-make-member-function-const): it changes what the descriptor tells
+// NOLINTNEXTLINE(readability-make-member-function-const): it changes the state of the descriptor
 void Wakeup::wake() {
-    // Fails only when the count is at its limit, and then the descriptor is readable already.
+    // Fails only when the counter is at its limit, and then the descriptor is readable.
     eventfd_write(m_descriptor, 1);
 }
 
 // NOLINTNEXTLINE(readability-make-member-function-const): the same
 void Wakeup::clear() {
-    // Fails only when nobody has woken, and then there is nothing to clear.
+    // Fails only when the descriptor is not readable.
     eventfd_t count = 0;
     eventfd_read(m_descriptor, &count);
 }

@@ -1,10 +1,11 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A descriptor that one thread sleeps on and others make readable.
+// A descriptor by which threads wake another thread.
 #pragma once
 
 namespace kvloamd {
 
-/// Throws std::system_error when the system has no descriptor left.
+/// A `Wakeup` is a descriptor on which one thread polls and which other threads make readable. The
+/// constructor throws std::system_error when no descriptor is available.
 class Wakeup {
   public:
     Wakeup();
@@ -13,7 +14,7 @@ class Wakeup {
     Wakeup& operator=(Wakeup const&) = delete;
 
     int descriptor() const { return m_descriptor; }
-    /// Makes the descriptor readable. Any thread.
+    /// Makes the descriptor readable. Thread-safe.
     void wake();
     /// Makes the descriptor unreadable until the next `wake`.
     void clear();

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Log lines on standard error: one line a fact.
+// The log on standard error: one line for each fact.
 #pragma once
 
 #include <string>
@@ -9,10 +9,10 @@ namespace kvloamd {
 
 enum class LogLevel { Error, Warning, Info, Debug };
 
-/// Lines above `level` are left out from now on. The level is `Info` until it is set. Any thread.
+/// Suppresses lines above `level` from now on. The initial level is `Info`. Thread-safe.
 void setLogLevel(LogLevel level);
 
-/// Writes "kvloamd: <text>" as one line, in one piece. Any thread.
+/// Writes the line "kvloamd: <text>" with one write operation. Thread-safe.
 void log(LogLevel level, std::string_view text);
 
 } // namespace kvloamd

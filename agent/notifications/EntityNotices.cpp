@@ -34,23 +34,24 @@ Notification stateNotice(EntityStateRow const& row, OidView which, Clock::time_p
 
 } // namespace
 
-std::optional<Clock::time_point> EntityNotices::tell(std::shared_ptr<Snapshot const> newest,
-                                                     Clock::time_point now) {
+std::optional<Clock::time_point> EntityNotices::update(std::shared_ptr<Snapshot const> newest,
+                                                       Clock::time_point now) {
     if (m_former && m_former != newest) {
         if (m_former->entities.lastChange != newest->entities.lastChange) m_changed = true;
-        tellStates(*m_former, *newest);
+        queueStateChanges(*m_former, *newest);
     }
     m_former = std::move(newest);
     if (!m_changed) return std::nullopt;
-    if (m_lastChangeTold && now < *m_lastChangeTold + kPause) return *m_lastChangeTold + kPause;
-    // The snapshot shows it: nothing is to be waited for.
+    if (m_lastConfigChange && now < *m_lastConfigChange + kPause)
+        return *m_lastConfigChange + kPause;
+    // The published snapshot already shows the change, so the notification need not wait.
     m_queue.push({joined(kStandardArc, kConfigChange), {}, m_former->begun});
-    m_lastChangeTold = now;
+    m_lastConfigChange = now;
     m_changed = false;
     return std::nullopt;
 }
 
-void EntityNotices::tellStates(Snapshot const& former, Snapshot const& newest) {
+void EntityNotices::queueStateChanges(Snapshot const& former, Snapshot const& newest) {
     auto before = former.entities.states.begin();
     auto const end = former.entities.states.end();
     for (EntityStateRow const& row : newest.entities.states) {

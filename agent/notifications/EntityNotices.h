@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Tells how the physical entities change from one snapshot to the next.
+// Queues the notifications of ENTITY-MIB and ENTITY-STATE-MIB.
 #pragma once
 
 #include <chrono>
@@ -10,31 +10,36 @@
 
 namespace kvloamd {
 
-/// entConfigChange when entities have come, gone or changed: at once, and then once at most in a
-/// pause, at whose end all that changed meanwhile is one notification. entStateOperEnabled and
-/// entStateOperDisabled when an entity has become so; one that comes, or goes, has not.
+/// An `EntityNotices` object compares each snapshot with the one before and queues
 ///
-/// Used on one thread.
+/// - entConfigChange when entities were added, removed or changed: the first one at once, then at
+///   most one in each `kPause`, which covers all changes of that time;
+/// - entStateOperEnabled and entStateOperDisabled when the operational state of an entity has
+/// become
+///   enabled or disabled. An entity that appears or disappears has not changed its state.
+///
+/// Thread-bound: the SNMP thread.
 class EntityNotices {
   public:
-    /// Between two entConfigChange, at least.
+    /// The shortest time between two entConfigChange notifications.
     static constexpr std::chrono::seconds kPause{5};
 
     /// `queue` outlives the notices.
     explicit EntityNotices(NotificationQueue& queue) : m_queue(queue) {}
 
-    /// Queues what `newest` has that the snapshot of the call before had not; nothing for the first
-    /// one. Returns when to come again at the latest, should something wait for the pause's end.
-    std::optional<Clock::time_point> tell(std::shared_ptr<Snapshot const> newest,
-                                          Clock::time_point now);
+    /// Queues the changes from the snapshot of the previous call to `newest`. The first call queues
+    /// nothing. Returns the time of the next call if an entConfigChange waits for the end of the
+    /// pause.
+    std::optional<Clock::time_point> update(std::shared_ptr<Snapshot const> newest,
+                                            Clock::time_point now);
 
   private:
-    void tellStates(Snapshot const& former, Snapshot const& newest);
+    void queueStateChanges(Snapshot const& former, Snapshot const& newest);
 
     NotificationQueue& m_queue;
     std::shared_ptr<Snapshot const> m_former;
-    bool m_changed = false; ///< since the last entConfigChange
-    std::optional<Clock::time_point> m_lastChangeTold;
+    bool m_changed = false;                              ///< since the last entConfigChange
+    std::optional<Clock::time_point> m_lastConfigChange; ///< when it was queued
 };
 
 } // namespace kvloamd

@@ -11,33 +11,33 @@
 namespace kvloamd {
 
 int FaultListener::ProcessExternalFaultEvent(ReferenceCounter<ExternalFaultEvent> event) {
-    ExternalFaultEvent* const told = event.get();
-    if (told == nullptr) return 0;
+    ExternalFaultEvent* const received = event.get();
+    if (received == nullptr) return 0;
     {
         std::scoped_lock const guard(m_mutex);
         if (m_stopped) return 0;
     }
-    FaultNews news;
-    news.raised = told->GetEventID() == FaultRaised;
-    news.platformBoard = told->GetBoardID();
-    news.value = told->GetFault();
-    enter(news);
-    m_queue.push(faultChange(m_enterprise, news));
-    tellChanged();
+    FaultChange change;
+    change.raised = received->GetEventID() == FaultRaised;
+    change.platformBoard = received->GetBoardID();
+    change.value = received->GetFault();
+    enter(change);
+    m_queue.push(faultNotification(m_enterprise, change));
+    notifyChanged();
     return 0;
 }
 
 int FaultListener::ProcessBoardStatusEvent(ReferenceCounter<BoardStatusEvent> event) {
-    BoardStatusEvent* const told = event.get();
-    if (told == nullptr) return 0;
-    ReferenceCounter<Board> const handle = told->GetBoard();
+    BoardStatusEvent* const received = event.get();
+    if (received == nullptr) return 0;
+    ReferenceCounter<Board> const handle = received->GetBoard();
     Board* const board = handle.get();
     if (board == nullptr) return 0;
     int const index = m_manager.GetIndexByBoard(handle);
     if (index == 0) return 0;
-    if (told->GetBoardStatus() == BoardStatusRemoved) {
+    if (received->GetBoardStatus() == BoardStatusRemoved) {
         forgetBoard(index);
-        tellChanged();
+        notifyChanged();
     } else {
         noteBoard({index, readSerialNumber(*board), unlessNegative(board->GetLogicalID())});
     }
@@ -55,17 +55,17 @@ void FaultListener::stop() {
     m_changed = nullptr;
 }
 
-void FaultListener::enter(FaultNews& news) {
+void FaultListener::enter(FaultChange& change) {
     std::scoped_lock const guard(m_boardsMutex);
-    if (KnownBoard const* const board = find(news.platformBoard)) {
-        news.boardIndex = board->index;
-        news.serialNumber = board->serialNumber;
+    if (KnownBoard const* const board = find(change.platformBoard)) {
+        change.boardIndex = board->index;
+        change.serialNumber = board->serialNumber;
     }
-    auto const index = static_cast<std::uint32_t>(news.boardIndex);
-    if (news.raised)
-        m_faults.raise(index, news.platformBoard, news.value);
+    auto const index = static_cast<std::uint32_t>(change.boardIndex);
+    if (change.raised)
+        m_faults.raise(index, change.platformBoard, change.value);
     else
-        m_faults.clear(index, news.platformBoard, news.value);
+        m_faults.clear(index, change.platformBoard, change.value);
 }
 
 void FaultListener::noteBoard(KnownBoard board) {
@@ -98,7 +98,7 @@ FaultListener::KnownBoard const* FaultListener::find(int platformBoard) {
     return nullptr;
 }
 
-void FaultListener::tellChanged() {
+void FaultListener::notifyChanged() {
     std::scoped_lock const guard(m_mutex);
     if (m_changed) m_changed();
 }

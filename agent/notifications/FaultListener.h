@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Takes the platform's faults off the threads that tell of them.
+// Receives the faults that the board platform reports.
 #pragma once
 
 #include <cstdint>
@@ -18,17 +18,19 @@
 
 namespace kvloamd {
 
-/// A fault names its board by a number: the board's logical identifier, or that of its driver when
-/// it has no logical one. Which board that is, is known from the boards' status changes, so that a
-/// fault is never another board's, which has come since, and no board is asked but the one that a
-/// change is about.
+/// A `FaultListener` enters the platform's faults in the fault log and queues a notification for
+/// each.
 ///
-/// The library's threads keep plain pointers to the listener until the process ends, so it is never
-/// destroyed.
+/// A fault names its board by a platform board number: the board's logical identifier, or the
+/// driver's number of a board that has none. The listener maps these numbers to boards seen in
+/// earlier status changes. A fault is therefore never assigned to a board that was inserted later,
+/// and no board is queried except the one whose status changed.
+///
+/// Never destroyed: the library's threads keep plain pointers to it until the process ends.
+/// Thread-safe.
 class FaultListener final : public ExternalFaultEventListener, public BoardStatusListener {
   public:
-    /// What is referred to lives as long as the process. `enterprise` is the arc above all names of
-    /// KVL-OAM-MIB.
+    /// All referenced objects live as long as the process. `enterprise`: the arc above KVL-OAM-MIB.
     FaultListener(BoardManager& manager, FaultLog& faults, NotificationQueue& queue, Oid enterprise)
         : m_manager(manager),
           m_faults(faults),
@@ -38,9 +40,9 @@ class FaultListener final : public ExternalFaultEventListener, public BoardStatu
     int ProcessExternalFaultEvent(ReferenceCounter<ExternalFaultEvent> event) override;
     int ProcessBoardStatusEvent(ReferenceCounter<BoardStatusEvent> event) override;
 
-    /// `changed` is called on the thread that tells of a fault, until `stop` returns.
+    /// From now on calls `changed` after each fault, on the thread that reported it.
     void start(std::function<void()> changed);
-    /// Faults are passed over from now on.
+    /// From now on faults are ignored. `changed` is not called any more when this returns.
     void stop();
 
   private:
@@ -50,25 +52,28 @@ class FaultListener final : public ExternalFaultEventListener, public BoardStatu
         std::optional<int> logicalId;
     };
 
-    /// Finds the board, and enters the fault before anybody can take the board out.
-    void enter(FaultNews& news);
+    /// Fills in the board and enters the fault in the log, both before the board can be removed.
+    void enter(FaultChange& change);
     void noteBoard(KnownBoard board);
     void forgetBoard(int index);
-    /// Null when no board is called by this number. With the lock of the boards held.
+    /// Null when no board has this number. Requires `m_boardsMutex`.
     KnownBoard const* find(int platformBoard);
-    void tellChanged();
+    void notifyChanged();
 
     BoardManager& m_manager;
     FaultLog& m_faults;
     NotificationQueue& m_queue;
     Oid const m_enterprise;
 
-    std::mutex m_boardsMutex; ///< guards what follows, and that the log has faults of them only
-    /// By index, the newest first: it has taken the place of one that is going.
+    /// Guards the next two fields, and that the log holds no fault of a board that has been
+    /// removed.
+    std::mutex m_boardsMutex;
+    /// By board index, highest first: of two boards with one number, the newer has replaced the
+    /// other.
     std::map<int, KnownBoard, std::greater<>> m_boards;
-    std::optional<BoardFinder> m_finder; ///< good until the next status change
+    std::optional<BoardFinder> m_finder; ///< valid until the next status change
 
-    std::mutex m_mutex; ///< guards what follows; held during `m_changed`
+    std::mutex m_mutex; ///< guards the next two fields; held while `m_changed` runs
     bool m_stopped = false;
     std::function<void()> m_changed;
 };

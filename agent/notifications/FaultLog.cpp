@@ -27,7 +27,7 @@ void FaultLog::raise(std::uint32_t boardIndex, int platformBoard, std::uint16_t 
 
 void FaultLog::clear(std::uint32_t boardIndex, int platformBoard, std::uint16_t value) {
     std::scoped_lock const guard(m_mutex);
-    // It may have been raised before its board was known.
+    // The fault may have been raised before its board was known.
     auto const erased = m_faults.erase(keyOf(boardIndex, platformBoard, value)) +
                         m_faults.erase(keyOf(0, platformBoard, value));
     if (erased > 0) m_lastChange = Clock::now();
@@ -59,8 +59,8 @@ Faults FaultLog::read(Clock::time_point started) const {
     read.raised = m_raised;
     read.unlisted = m_unlisted;
     read.lastChange = uptime.at(m_lastChange);
-    // One row for each board and value: the faults of unknown boards lie beside each other by
-    // board, not by value.
+    // One row for each board and value. The faults of unknown boards are sorted by platform board
+    // number first, so equal values are not adjacent.
     std::map<std::array<std::uint32_t, 2>, Fault> merged;
     for (auto const& [key, fault] : m_faults) {
         auto const [place, isNew] = merged.try_emplace({key.boardIndex, key.value}, fault);

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Keeps the faults that are raised now.
+// The faults that are raised at present.
 #pragma once
 
 #include <compare>
@@ -13,25 +13,25 @@
 
 namespace kvloamd {
 
-/// Bounded: when the list is full, a fault that is not in it is counted only. A fault is known by
-/// its board and its value; of a board that the agent does not know, by the platform's number of
-/// the board. All operations may be called from any thread; none calls out.
+/// A `FaultLog` is a bounded list of faults. A fault is identified by its board and its value, or
+/// by the platform board number and its value while the board is not known. When the list is full,
+/// new faults are counted but not listed. Thread-safe; no operation makes a callback.
 class FaultLog {
   public:
     static constexpr std::size_t kCapacity = 4096;
 
     explicit FaultLog(std::size_t capacity = kCapacity) : m_capacity(capacity) {}
 
-    /// `boardIndex`: 0 when the board is not known.
+    /// Enters a fault, or counts it once more. `boardIndex`: 0 when the board is not known.
     void raise(std::uint32_t boardIndex, int platformBoard, std::uint16_t value);
     void clear(std::uint32_t boardIndex, int platformBoard, std::uint16_t value);
-    /// The platform's number turns out to be this board's: its faults are the board's.
+    /// Moves the faults that were entered under the platform board number alone to the board.
     void boardIsKnown(std::uint32_t boardIndex, int platformBoard);
-    /// The board's faults have gone with it.
+    /// Removes the faults of a board that has been removed.
     void boardHasGone(std::uint32_t boardIndex);
 
-    /// `started`: the agent's start, from which times count. Faults of one value of several unknown
-    /// boards make one row.
+    /// The faults as rows, ascending by index. `started`: the agent's start, from which times
+    /// count. Faults of several unknown boards with one value share a row.
     Faults read(Clock::time_point started) const;
 
   private:
@@ -54,7 +54,7 @@ class FaultLog {
     }
 
     std::size_t m_capacity;
-    mutable std::mutex m_mutex; ///< guards what follows
+    mutable std::mutex m_mutex; ///< guards the fields below
     std::map<Key, Fault> m_faults;
     std::uint32_t m_raised = 0;
     std::uint32_t m_unlisted = 0;

@@ -8,18 +8,18 @@
 namespace kvloamd {
 
 int LineListener::ProcessLineStatusEvent(ReferenceCounter<DS1LineStatusEvent> event) {
-    DS1LineStatusEvent* const told = event.get();
-    if (told == nullptr) return 0;
-    ReferenceCounter<DS1LineDevice> line = told->GetLine();
+    DS1LineStatusEvent* const received = event.get();
+    if (received == nullptr) return 0;
+    ReferenceCounter<DS1LineDevice> line = received->GetLine();
     DS1LineDevice* const changed = line.get();
     if (changed == nullptr) return 0;
-    Change change{std::move(line), told->GetLineStatus(), changed->GetLineStatusLastChange(),
+    Change change{std::move(line), received->GetLineStatus(), changed->GetLineStatusLastChange(),
                   changed->GetLineStatusChangeTrapEnable(), Clock::now()};
     std::scoped_lock const guard(m_mutex);
     if (m_stopped) return 0;
     auto const place = m_places.find(changed);
     if (place != m_places.end())
-        announce(place->second, change);
+        enqueue(place->second, change);
     else if (m_waiting.size() < kMostWaiting)
         m_waiting.push_back(std::move(change));
     else
@@ -51,17 +51,17 @@ void LineListener::place(std::vector<PlacedLine> const& lines) {
     decltype(m_places) places;
     for (PlacedLine const& placed : lines)
         places.emplace(placed.line.get(), placed.ifIndex);
-    // The last handle of a line may go with a change, which must not happen under the lock.
+    // Dropping a change may destroy its line, which must not happen under the lock.
     std::vector<Change> waiting;
     std::scoped_lock const guard(m_mutex);
     m_places = std::move(places);
     waiting.swap(m_waiting);
     for (Change const& change : waiting)
         if (auto const place = m_places.find(change.line.get()); place != m_places.end())
-            announce(place->second, change);
+            enqueue(place->second, change);
 }
 
-void LineListener::announce(std::uint32_t ifIndex, Change const& change) {
+void LineListener::enqueue(std::uint32_t ifIndex, Change const& change) {
     int const enable =
         m_settings.find({Setting::LineStatusChangeTraps, ifIndex}).value_or(change.enable);
     if (enable != kEnabled) return;
@@ -82,11 +82,11 @@ void LineListener::stop() {
     m_changed = nullptr;
 }
 
-void handOn(Settings const& settings, std::vector<PlacedLine> const& lines) {
+void applySettings(Settings const& settings, std::vector<PlacedLine> const& lines) {
     for (PlacedLine const& placed : lines) {
         auto const set = settings.find({Setting::LineStatusChangeTraps, placed.ifIndex});
         DS1LineDevice* const line = placed.line.get();
-        // What the line answers does not matter: what is set counts.
+        // A line that refuses is not an error: the agent itself obeys the setting.
         if (set && line->GetLineStatusChangeTrapEnable() != *set)
             line->SetLineStatusChangeTrapEnable(*set);
     }

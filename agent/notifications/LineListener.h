@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Takes the lines' status changes off the threads that tell of them.
+// Receives the status changes of DS1 lines.
 #pragma once
 
 #include <cstdint>
@@ -21,12 +21,12 @@
 
 namespace kvloamd {
 
-/// Listens at the line features of all boards. Each change, of a line for which that is enabled,
-/// is queued with what it was at that time, however soon the next one follows. A change of a line
-/// that has no index yet waits for the end of the reading that is to give it one.
+/// A `LineListener` queues line status changes for the SNMP thread, one notification for each
+/// change of a line whose notifications are enabled. A change of a line that has no ifIndex yet
+/// waits until the next refresh has given it one.
 ///
-/// Features keep plain pointers to their listeners and have no way to take one out, so it is never
-/// destroyed.
+/// Never destroyed: features keep plain pointers to their listeners and cannot remove one.
+/// Thread-safe, apart from `listen` and `place`.
 class LineListener final : public DS1LineStatusListener {
   public:
     /// All arguments live as long as the process.
@@ -36,16 +36,16 @@ class LineListener final : public DS1LineStatusListener {
 
     int ProcessLineStatusEvent(ReferenceCounter<DS1LineStatusEvent> event) override;
 
-    // Around every reading of the lines, on the thread that reads them.
+    // Called before and after every refresh of the lines. Thread-bound: the collector.
 
-    /// The boards whose lines will be read: listens where it does not yet.
+    /// Subscribes to the line features of `boards` to which it is not subscribed yet.
     void listen(std::vector<BoardRow> const& boards, Uptime const& uptime);
-    /// All lines that have been read.
+    /// Takes over the ifIndex of every line, and queues the changes that waited for one.
     void place(std::vector<PlacedLine> const& lines);
 
-    /// `changed` is called on the thread that tells of a change, until `stop` returns.
+    /// From now on calls `changed` after each change, on the thread that reported it.
     void start(std::function<void()> changed);
-    /// Changes are passed over from now on.
+    /// From now on changes are ignored. `changed` is not called any more when this returns.
     void stop();
 
   private:
@@ -53,12 +53,12 @@ class LineListener final : public DS1LineStatusListener {
         ReferenceCounter<DS1LineDevice> line;
         int status;
         long lastChange; ///< seconds since the epoch; negative: not known
-        int enable;      ///< as the line says
+        int enable;      ///< the line's own dsx1LineStatusChangeTrapEnable
         Clock::time_point when;
     };
     static constexpr std::size_t kMostWaiting = 4096;
 
-    void announce(std::uint32_t ifIndex, Change const& change);
+    void enqueue(std::uint32_t ifIndex, Change const& change);
 
     BoardManager& m_manager;
     Settings const& m_settings;
@@ -77,7 +77,7 @@ class LineListener final : public DS1LineStatusListener {
     bool m_stopped = false;
 };
 
-/// Has the lines know what is set for them.
-void handOn(Settings const& settings, std::vector<PlacedLine> const& lines);
+/// Passes the settings of `lines` on to the line objects.
+void applySettings(Settings const& settings, std::vector<PlacedLine> const& lines);
 
 } // namespace kvloamd

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Notices links that go up and down.
+// Queues linkUp and linkDown notifications.
 #pragma once
 
 #include <cstdint>
@@ -12,23 +12,24 @@
 
 namespace kvloamd {
 
-/// Compares the interfaces of each snapshot with those of the one before: linkDown when one has
-/// become down, linkUp when one was down, where that is enabled. An interface that comes or goes,
-/// or has come back with its board, is no link that changes; nor is one that is not present or
-/// whose state is not known. Belongs to one thread.
+/// A `LinkWatch` compares the interfaces of each snapshot with those of the one before and queues
+/// linkDown when an interface has become down, linkUp when it was down, if its
+/// ifLinkUpDownTrapEnable is enabled. An interface that appears, disappears or returns with its
+/// board has not changed; nor has one whose state is notPresent or not known. Thread-bound: the
+/// collector.
 class LinkWatch {
   public:
     /// `settings` and `queue` outlive the watch.
     LinkWatch(Settings const& settings, NotificationQueue& queue)
         : m_settings(settings), m_queue(queue) {}
 
-    /// The interfaces of a snapshot begun at `begun`, ascending by index.
-    void note(std::vector<InterfaceRow> const& interfaces, Clock::time_point begun);
+    /// Compares with the interfaces of a snapshot that was begun at `begun`, ascending by index.
+    void update(std::vector<InterfaceRow> const& interfaces, Clock::time_point begun);
 
   private:
     struct Link {
         std::uint32_t ifIndex;
-        std::uint32_t boardIndex; ///< a board that comes back has another
+        std::uint32_t boardIndex; ///< a board that returns has another one
         std::optional<int> operStatus;
     };
 
@@ -36,7 +37,7 @@ class LinkWatch {
 
     Settings const& m_settings;
     NotificationQueue& m_queue;
-    std::vector<Link> m_links; ///< of the snapshot before, ascending by index
+    std::vector<Link> m_links; ///< of the previous snapshot, ascending by index
 };
 
 } // namespace kvloamd

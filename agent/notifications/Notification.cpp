@@ -9,7 +9,7 @@ namespace kvloamd {
 
 namespace {
 
-/// An object that is sent only.
+/// An object that is accessible-for-notify.
 NotifiedObject sent(Oid const& enterprise, std::uint32_t number, ValueType type,
                     decltype(NotifiedObject::value) value) {
     return {joined(enterprise, joined(kNotifyObjectsPlace, Oid{number, 0})), type,
@@ -33,19 +33,19 @@ Value NotifiedObject::view() const {
     return NameView{std::get<Oid>(value)};
 }
 
-Notification boardStatusChange(Oid const& enterprise, int boardIndex, std::string serialNumber,
-                               int status) {
+Notification boardStatusNotification(Oid const& enterprise, int boardIndex,
+                                     std::string serialNumber, int status) {
     return {joined(enterprise, kBoardStatusChangePlace),
             {sent(enterprise, 1, boardIndex), sent(enterprise, 2, std::move(serialNumber)),
              sent(enterprise, 3, status)},
             Clock::now()};
 }
 
-Notification faultChange(Oid const& enterprise, FaultNews const& news) {
-    return {joined(enterprise, news.raised ? kFaultRaisedPlace : kFaultClearedPlace),
-            {sent(enterprise, 1, news.boardIndex), sent(enterprise, 2, news.serialNumber),
-             sent(enterprise, 4, ValueType::Gauge, std::int64_t{news.value}),
-             sent(enterprise, 5, news.platformBoard)},
+Notification faultNotification(Oid const& enterprise, FaultChange const& change) {
+    return {joined(enterprise, change.raised ? kFaultRaisedPlace : kFaultClearedPlace),
+            {sent(enterprise, 1, change.boardIndex), sent(enterprise, 2, change.serialNumber),
+             sent(enterprise, 4, ValueType::Gauge, std::int64_t{change.value}),
+             sent(enterprise, 5, change.platformBoard)},
             Clock::now()};
 }
 

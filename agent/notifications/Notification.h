@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A notification: which one it is, and what it carries.
+// Notifications, independent of the protocol that carries them.
 #pragma once
 
 #include <cstdint>
@@ -12,37 +12,37 @@
 
 namespace kvloamd {
 
-/// An object that a notification carries, with a value of its own: no snapshot is behind it.
+/// An object in a notification. It owns its value, so it does not depend on a snapshot.
 struct NotifiedObject {
     Oid name; ///< absolute
     ValueType type = ValueType::Integer;
-    /// An unsigned number of 64 bits as the same bits.
+    /// An unsigned 64-bit number is stored with the same bits.
     std::variant<std::int64_t, std::string, Oid> value;
 
-    /// Good while the object is.
+    /// A view of `value`, valid as long as this object.
     Value view() const;
 };
 
 struct Notification {
     Oid name; ///< absolute
     std::vector<NotifiedObject> objects;
-    Clock::time_point when; ///< of what it tells of
+    Clock::time_point when; ///< the time of the event
 };
 
-/// kvlBoardStatusChange. `enterprise` is the arc above all names of KVL-OAM-MIB.
-Notification boardStatusChange(Oid const& enterprise, int boardIndex, std::string serialNumber,
-                               int status);
+/// Makes a kvlBoardStatusChange. `enterprise`: the arc above KVL-OAM-MIB.
+Notification boardStatusNotification(Oid const& enterprise, int boardIndex,
+                                     std::string serialNumber, int status);
 
-/// A fault has been raised or cleared.
-struct FaultNews {
+/// A fault that was raised or cleared.
+struct FaultChange {
     bool raised = true;
-    int boardIndex = 0; ///< 0: of a board that the agent does not know
+    int boardIndex = 0; ///< 0: the board is not known
     std::string serialNumber;
     std::uint16_t value = 0;
-    int platformBoard = 0; ///< the number by which the platform speaks of the board
+    int platformBoard = 0; ///< the platform board number
 };
 
-/// kvlFaultRaised or kvlFaultCleared.
-Notification faultChange(Oid const& enterprise, FaultNews const& news);
+/// Makes a kvlFaultRaised or kvlFaultCleared.
+Notification faultNotification(Oid const& enterprise, FaultChange const& change);
 
 } // namespace kvloamd

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Notifications on their way from the threads that have news to the one that sends them.
+// The queue between the threads that report changes and the thread that sends notifications.
 #pragma once
 
 #include <cstddef>
@@ -12,8 +12,8 @@
 
 namespace kvloamd {
 
-/// First in, first out, bounded: a notification that finds the queue full is dropped. Counts those
-/// that wait, have been taken out, or were dropped. All operations may be called from any thread.
+/// A `NotificationQueue` is a bounded first-in, first-out queue. When it is full, new notifications
+/// are dropped. It counts the notifications that wait, were sent, or were dropped. Thread-safe.
 class NotificationQueue {
   public:
     static constexpr std::size_t kCapacity = 4096;
@@ -31,15 +31,15 @@ class NotificationQueue {
         countWaiting();
     }
 
-    /// The oldest one, which stays; nothing when the queue is empty.
+    /// The oldest notification, which stays in the queue; nothing when the queue is empty.
     std::optional<Notification> oldest() {
         std::scoped_lock const guard(m_mutex);
         if (m_notifications.empty()) return std::nullopt;
         return m_notifications.front();
     }
 
-    /// Takes the oldest one out, which has been sent; nothing when the queue is empty. There is one
-    /// consumer only.
+    /// Removes the oldest notification and counts it as sent; nothing when the queue is empty.
+    /// Requires that only one thread consumes.
     std::optional<Notification> pop() {
         std::scoped_lock const guard(m_mutex);
         if (m_notifications.empty()) return std::nullopt;

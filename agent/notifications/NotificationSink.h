@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Where notifications leave the agent.
+// The interface through which notifications leave the agent.
 #pragma once
 
 #include <functional>
@@ -8,16 +8,17 @@
 
 namespace kvloamd {
 
-/// Used on the thread that does all SNMP only.
+/// Thread-bound: the SNMP thread.
 class NotificationSink {
   public:
     virtual ~NotificationSink() = default;
 
-    /// Whether a notification may be sent now.
+    /// Whether `send` may be called now.
     virtual bool ready() const = 0;
-    /// Sends. `taken` is called once somebody else answers for the notification, at once or later;
-    /// never, when the way is lost meanwhile: then it is to be sent again.
-    virtual void send(Notification const& notification, std::function<void()> taken) = 0;
+    /// Sends a notification. Calls `delivered`, during this call or later, when the notification
+    /// has been handed over and need not be sent again. If the connection is lost before,
+    /// `delivered` is never called, and the caller sends the notification again.
+    virtual void send(Notification const& notification, std::function<void()> delivered) = 0;
 };
 
 } // namespace kvloamd

@@ -3,25 +3,25 @@
 
 namespace kvloamd {
 
-std::optional<Clock::time_point> Notifier::announce(Clock::time_point snapshotBegun) {
+std::optional<Clock::time_point> Notifier::send(Clock::time_point snapshotBegun) {
     while (auto const oldest = m_queue.oldest()) {
         if (!m_sink.ready()) return std::nullopt;
         if (oldest->when > snapshotBegun && Clock::now() < oldest->when + kPatience)
             return oldest->when + kPatience;
-        send(*oldest);
+        handOver(*oldest);
     }
     return std::nullopt;
 }
 
-bool Notifier::announceAll() {
+bool Notifier::sendAll() {
     while (auto const oldest = m_queue.oldest()) {
         if (!m_sink.ready()) return false;
-        send(*oldest);
+        handOver(*oldest);
     }
     return true;
 }
 
-void Notifier::send(Notification const& notification) {
+void Notifier::handOver(Notification const& notification) {
     m_sink.send(notification, [this] { m_queue.pop(); });
 }
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Sends what the notification queue holds.
+// Sends the notifications in the queue.
 #pragma once
 
 #include <chrono>
@@ -10,27 +10,28 @@
 
 namespace kvloamd {
 
-/// Used on the thread that does all SNMP only.
+/// A `Notifier` moves notifications from the queue to a sink. Thread-bound: the SNMP thread.
 class Notifier {
   public:
-    /// How long a notification waits for a snapshot that shows its change. Whoever receives it and
-    /// asks at once should see the change; whoever waits for a slow platform should hear of it all
-    /// the same.
+    /// How long a notification waits for a snapshot that shows its change. A manager that polls as
+    /// soon as it receives the notification then sees the change. A slow platform must not delay
+    /// the notification longer than this.
     static constexpr std::chrono::milliseconds kPatience{1000};
 
     /// `queue` and `sink` outlive the notifier.
     Notifier(NotificationQueue& queue, NotificationSink& sink) : m_queue(queue), m_sink(sink) {}
 
-    /// Sends the notifications whose news a snapshot begun at `snapshotBegun` shows, and those that
-    /// have waited long enough, as far as the sink is ready. One stays in the queue until the sink
-    /// answers for it. Returns when to come again at the latest, if only time is missing.
-    std::optional<Clock::time_point> announce(Clock::time_point snapshotBegun);
+    /// Sends, while the sink is ready, the notifications whose change a snapshot that was begun at
+    /// `snapshotBegun` shows, and those that have waited for `kPatience`. A notification stays in
+    /// the queue until the sink has delivered it. Returns the time of the next call if a
+    /// notification only waits for time to pass.
+    std::optional<Clock::time_point> send(Clock::time_point snapshotBegun);
 
-    /// Sends without waiting for a snapshot. Whether nothing is left.
-    bool announceAll();
+    /// Sends without waiting for a snapshot. Returns whether the queue is empty.
+    bool sendAll();
 
   private:
-    void send(Notification const& notification);
+    void handOver(Notification const& notification);
 
     NotificationQueue& m_queue;
     NotificationSink& m_sink;

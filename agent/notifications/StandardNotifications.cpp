@@ -29,7 +29,8 @@ Notification lineStatusChange(std::uint32_t ifIndex, int status, std::uint32_t l
 
 Notification linkChange(InterfaceRow const& row, Clock::time_point when) {
     int const operStatus = row.operStatus.value_or(int{kUp});
-    // The notification needs every object. What can not be taken down by anybody is wanted up.
+    // The notification requires all three objects. An interface without ifAdminStatus cannot be
+    // taken down, so it is administratively up.
     return {
         operStatus == kDown ? kLinkDown : kLinkUp,
         {object(ifTable(), 1, row.ifIndex, ValueType::Integer, row.ifIndex),

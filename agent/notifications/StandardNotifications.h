@@ -9,11 +9,11 @@
 
 namespace kvloamd {
 
-/// dsx1LineStatusChange. `lastChange`: hundredths of a second since the agent's start.
+/// Makes a dsx1LineStatusChange. `lastChange`: hundredths of a second since the agent's start.
 Notification lineStatusChange(std::uint32_t ifIndex, int status, std::uint32_t lastChange,
                               Clock::time_point when);
 
-/// linkDown or linkUp, as `row` says.
+/// Makes a linkDown if `row` is down, else a linkUp.
 Notification linkChange(InterfaceRow const& row, Clock::time_point when);
 
 } // namespace kvloamd

@@ -1,17 +1,17 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/notifications/StatusListener.h"
 
+#include <utility>
+
 #include "agent/readers/BoardReader.h"
 #include "board/Board.h"
-
-#include <utility>
 
 namespace kvloamd {
 
 int StatusListener::ProcessBoardStatusEvent(ReferenceCounter<BoardStatusEvent> event) {
-    BoardStatusEvent* const told = event.get();
-    if (told == nullptr) return 0;
-    ReferenceCounter<Board> const board = told->GetBoard();
+    BoardStatusEvent* const received = event.get();
+    if (received == nullptr) return 0;
+    ReferenceCounter<Board> const board = received->GetBoard();
     Board* const changed = board.get();
     if (changed == nullptr) return 0;
     {
@@ -20,12 +20,12 @@ int StatusListener::ProcessBoardStatusEvent(ReferenceCounter<BoardStatusEvent> e
         if (m_phase == Phase::Starting && std::this_thread::get_id() == m_startingThread) return 0;
     }
     int const index = m_manager.GetIndexByBoard(board);
-    // Its removal has been told of before: what becomes of it afterwards is no news.
+    // The board has left the table; its removal was reported before.
     if (index == 0) return 0;
-    BoardStatusEnum const status = told->GetBoardStatus();
+    BoardStatusEnum const status = received->GetBoardStatus();
     if (status == BoardStatusRemoved) m_source.boardHasGone(index);
     ++m_counters.statusChanges;
-    m_queue.push(boardStatusChange(m_enterprise, index, readSerialNumber(*changed), status));
+    m_queue.push(boardStatusNotification(m_enterprise, index, readSerialNumber(*changed), status));
     std::scoped_lock const guard(m_mutex);
     if (m_phase == Phase::Running) m_changed();
     return 0;

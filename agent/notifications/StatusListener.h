@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Takes the board manager's status changes off the threads that tell of them.
+// Receives the status changes of boards.
 #pragma once
 
 #include <functional>
@@ -13,19 +13,18 @@
 
 namespace kvloamd {
 
-/// Reads what a change needs at once, on the thread that tells of it, and queues it: later the
-/// board may be gone or another one.
+/// A `StatusListener` queues a notification for each status change of a board. It reads the board's
+/// serial number at once, on the reporting thread, because the board may be gone later.
 ///
-/// While the agent starts, the factories announce the boards that they find on the agent's own
-/// thread; these are no changes and are passed over. A change that another thread tells of
-/// meanwhile is one.
+/// While the agent starts, the factories report the boards that they find on the starting thread.
+/// These are not changes and are ignored; changes that other threads report meanwhile are not.
 ///
-/// The board manager and the library's threads keep plain pointers to the listener until the
-/// process ends, so it is never destroyed.
+/// Never destroyed: the board manager and the library's threads keep plain pointers to it until the
+/// process ends. Thread-safe.
 class StatusListener final : public BoardStatusListener {
   public:
-    /// Made on the thread that attaches the factories. What is referred to lives as long as the
-    /// process. `enterprise` is the arc above all names of KVL-OAM-MIB.
+    /// Requires that the calling thread attaches the factories. All referenced objects live as long
+    /// as the process. `enterprise`: the arc above KVL-OAM-MIB.
     StatusListener(BoardManager& manager, BoardSource& source, NotificationQueue& queue,
                    Counters& counters, Oid enterprise)
         : m_manager(manager),
@@ -36,10 +35,10 @@ class StatusListener final : public BoardStatusListener {
 
     int ProcessBoardStatusEvent(ReferenceCounter<BoardStatusEvent> event) override;
 
-    /// All factories are attached. `changed` is called on the thread that tells of a change, until
-    /// `stop` returns.
+    /// Requires that all factories are attached. From now on calls `changed` after each status
+    /// change, on the thread that reported it.
     void start(std::function<void()> changed);
-    /// Changes are passed over from now on.
+    /// From now on changes are ignored. `changed` is not called any more when this returns.
     void stop();
 
   private:
@@ -51,7 +50,7 @@ class StatusListener final : public BoardStatusListener {
     Counters& m_counters;
     Oid const m_enterprise;
     std::thread::id const m_startingThread = std::this_thread::get_id();
-    std::mutex m_mutex; ///< guards what follows; held during `m_changed`
+    std::mutex m_mutex; ///< guards the next two fields; held while `m_changed` runs
     Phase m_phase = Phase::Starting;
     std::function<void()> m_changed;
 };

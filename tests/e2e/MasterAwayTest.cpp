@@ -196,7 +196,7 @@ TEST_F(MasterAwayTest, StopWithoutAMasterSaysWhatCouldNotBeSent) {
     EXPECT_EQ(stopAgent(), 0) << agent().output();
     // That of the board, and perhaps that of what it was to the chassis.
     EXPECT_THAT(agent().output(),
-                ::testing::ContainsRegex("could not be sent before the stop: [1-9]"));
+                ::testing::ContainsRegex("notifications not sent before the stop: [1-9]"));
 }
 
 } // namespace

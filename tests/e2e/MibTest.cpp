@@ -124,9 +124,9 @@ TEST_F(MibTest, NotificationsAreWhereTheModuleSays) {
 }
 
 TEST_F(MibTest, NotificationsCarryWhatTheModuleSays) {
-    expectCarried(boardStatusChange({}, 1, "A", BoardStatusAdded),
+    expectCarried(boardStatusNotification({}, 1, "A", BoardStatusAdded),
                   {"kvlNotifyBoardIndex", "kvlNotifyBoardSerialNumber", "kvlNotifyBoardStatus"});
-    expectCarried(faultChange({}, FaultNews{}),
+    expectCarried(faultNotification({}, FaultChange{}),
                   {"kvlNotifyBoardIndex", "kvlNotifyBoardSerialNumber", "kvlNotifyFaultValue",
                    "kvlNotifyFaultPlatformBoard"});
 }

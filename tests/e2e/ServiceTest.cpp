@@ -112,7 +112,7 @@ TEST_F(ServiceTest, HangupKeepsBoardsAndCounts) {
 TEST_F(ServiceTest, ChangeThatNeedsAStartSaysSo) {
     startConfigured("log-level=\"info\"\n");
     reload("enterprise-oid=\"1.3.6.1.4.1.99999\"\n");
-    EXPECT_TRUE(agent().waitFor("counts from the next start on")) << agent().output();
+    EXPECT_TRUE(agent().waitFor("take effect at the next start")) << agent().output();
     EXPECT_EQ(get("kvlBoardCount.0"), "Gauge32: 3 boards");
 }
 
@@ -125,7 +125,7 @@ TEST_F(ServiceTest, BadFileIsReportedInOneLineAndTheAgentGoesOn) {
     for (std::string const& line : linesOf(agent().output()))
         if (line.find("prot") != std::string::npos) {
             ++lines;
-            EXPECT_THAT(line, HasSubstr("going on as before"));
+            EXPECT_THAT(line, HasSubstr("keeping the previous configuration"));
         }
     EXPECT_EQ(lines, 1) << agent().output();
 }

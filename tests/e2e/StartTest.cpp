@@ -103,7 +103,7 @@ TEST_F(StartTest, UnknownKeyOfTheConfigurationFileIsNamed) {
 TEST_F(StartTest, CheckOfAGoodConfigurationSucceedsAndLeavesNothingBehind) {
     Result const result = start({"--module", "z7sim", "--check-config"});
     EXPECT_EQ(result.status, 0) << result.output;
-    EXPECT_THAT(result.output, HasSubstr("the configuration is good"));
+    EXPECT_THAT(result.output, HasSubstr("the configuration is valid"));
     struct stat file {};
     EXPECT_NE(stat(path("persistent/kvloamd.conf").c_str(), &file), 0);
 }

@@ -38,7 +38,7 @@ TEST_F(ModuleLoaderTest, UnknownModuleIsNamedWithThePathThatWasTried) {
 }
 
 TEST_F(ModuleLoaderTest, FileThatIsNoSharedObjectIsRefused) {
-    EXPECT_THAT(complaint("text"), AllOf(HasSubstr("'text'"), HasSubstr("can not be loaded"),
+    EXPECT_THAT(complaint("text"), AllOf(HasSubstr("'text'"), HasSubstr("cannot be loaded"),
                                          HasSubstr("textkvl.so")));
 }
 

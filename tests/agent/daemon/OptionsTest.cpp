@@ -87,7 +87,7 @@ TEST_F(OptionsTest, FileNamesTheMasterToo) {
 TEST_F(OptionsTest, MasterThatIsNoAddressIsRefused) {
     Exit const exit = refusal({"--agentx", "here"});
     EXPECT_EQ(exit.status, kExitUsage);
-    EXPECT_THAT(exit.text, HasSubstr("'here' is no address; write it as unix:"));
+    EXPECT_THAT(exit.text, HasSubstr("'here' is not an address; write it like unix:"));
 }
 
 TEST_F(OptionsTest, MasterAndWhatIsTheMastersOwnExcludeEachOther) {

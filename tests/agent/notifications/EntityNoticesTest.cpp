@@ -19,7 +19,7 @@ Oid const kDisabled{1, 3, 6, 1, 2, 1, 131, 0, 2};
 class EntityNoticesTest : public ::testing::Test {
   protected:
     /// The next snapshot, told of at `m_now`.
-    auto tell() { return m_notices.tell(std::make_shared<Snapshot>(m_next), m_now); }
+    auto tell() { return m_notices.update(std::make_shared<Snapshot>(m_next), m_now); }
     /// Entities have changed; told at once.
     auto tellChange() {
         ++m_next.entities.lastChange;
@@ -110,9 +110,9 @@ TEST_F(EntityNoticesTest, SnapshotThatIsTheSameIsNoNewsAndEndsThePauseAllTheSame
     tellChange();
     ++m_next.entities.lastChange;
     auto const newest = std::make_shared<Snapshot const>(m_next);
-    m_notices.tell(newest, m_now + 1s);
+    m_notices.update(newest, m_now + 1s);
     EXPECT_THAT(told(), SizeIs(1));
-    EXPECT_EQ(m_notices.tell(newest, m_now + EntityNotices::kPause), std::nullopt);
+    EXPECT_EQ(m_notices.update(newest, m_now + EntityNotices::kPause), std::nullopt);
     EXPECT_THAT(told(), SizeIs(1));
 }
 

@@ -48,7 +48,7 @@ class LineListenerTest : public ::testing::Test {
         meanwhile();
         auto const lines = m_reader.takeLines();
         m_listener.place(lines);
-        handOn(m_settings, lines);
+        applySettings(m_settings, lines);
     }
     /// What has been told since the last time: "1000:64 " for each.
     std::string told() {

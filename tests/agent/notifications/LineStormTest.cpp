@@ -35,7 +35,7 @@ class LineStormTest : public ::testing::Test {
         m_reader.read(boards);
         auto const lines = m_reader.takeLines();
         m_listener.place(lines);
-        handOn(m_settings, lines);
+        applySettings(m_settings, lines);
     }
 
     FakeChassis m_chassis;

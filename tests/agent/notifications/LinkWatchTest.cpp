@@ -20,7 +20,7 @@ InterfaceRow interface(std::uint32_t ifIndex, std::optional<int> operStatus,
 
 class LinkWatchTest : public ::testing::Test {
   protected:
-    void note(std::vector<InterfaceRow> const& rows) { m_watch.note(rows, Clock::now()); }
+    void note(std::vector<InterfaceRow> const& rows) { m_watch.update(rows, Clock::now()); }
     /// What has been told since the last time: "down 7 " for each.
     std::string told() {
         std::string all;
@@ -34,8 +34,8 @@ class LinkWatchTest : public ::testing::Test {
     /// What is told of an interface that goes from one state to another.
     std::string toldOf(std::optional<int> former, std::optional<int> now) {
         LinkWatch watch(m_settings, m_queue);
-        watch.note({interface(7, former)}, Clock::now());
-        watch.note({interface(7, now)}, Clock::now());
+        watch.update({interface(7, former)}, Clock::now());
+        watch.update({interface(7, now)}, Clock::now());
         return told();
     }
 
@@ -123,7 +123,7 @@ TEST_F(LinkWatchTest, NotificationCarriesIndexAndBothStates) {
     InterfaceRow row = interface(7, kDown);
     row.adminStatus = 2;
     auto const begun = Clock::now();
-    m_watch.note({row}, begun);
+    m_watch.update({row}, begun);
     auto const told = m_queue.pop();
     ASSERT_TRUE(told);
     EXPECT_EQ(told->when, begun);
@@ -151,8 +151,8 @@ TEST_F(LinkWatchTest, InterfaceThatNobodyCanTakeDownIsToldAsWantedUp) {
 TEST_F(LinkWatchTest, ChangesBeyondTheQueueAreCounted) {
     NotificationQueue queue(m_counters, 1);
     LinkWatch watch(m_settings, queue);
-    watch.note({interface(7, kUp), interface(8, kUp)}, Clock::now());
-    watch.note({interface(7, kDown), interface(8, kDown)}, Clock::now());
+    watch.update({interface(7, kUp), interface(8, kUp)}, Clock::now());
+    watch.update({interface(7, kDown), interface(8, kDown)}, Clock::now());
     EXPECT_EQ(queue.size(), 1U);
     EXPECT_EQ(m_counters.notificationsDropped, 1U);
 }

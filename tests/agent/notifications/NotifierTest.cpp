@@ -28,7 +28,7 @@ class ScriptedSink final : public NotificationSink {
 class NotifierTest : public ::testing::Test {
   protected:
     void change(std::uint32_t number) { m_queue.push({{1, 3, number}, {}, Clock::now()}); }
-    std::optional<Clock::time_point> announceShown() { return m_notifier.announce(Clock::now()); }
+    std::optional<Clock::time_point> announceShown() { return m_notifier.send(Clock::now()); }
 
     Counters m_counters;
     NotificationQueue m_queue{m_counters};
@@ -47,7 +47,7 @@ TEST_F(NotifierTest, ChangesThatTheSnapshotShowsAreSentInOrder) {
 TEST_F(NotifierTest, ChangeThatTheSnapshotDoesNotShowWaits) {
     auto const before = Clock::now() - std::chrono::milliseconds(1);
     change(1);
-    auto const again = m_notifier.announce(before);
+    auto const again = m_notifier.send(before);
     ASSERT_TRUE(again.has_value());
     EXPECT_GE(*again, before + Notifier::kPatience);
     EXPECT_TRUE(m_sink.sent.empty());
@@ -81,7 +81,7 @@ TEST_F(NotifierTest, NothingIsSentWhileTheSinkIsNotReady) {
     m_sink.isReady = false;
     change(1);
     EXPECT_EQ(announceShown(), std::nullopt);
-    EXPECT_FALSE(m_notifier.announceAll());
+    EXPECT_FALSE(m_notifier.sendAll());
     EXPECT_TRUE(m_sink.sent.empty());
     EXPECT_EQ(m_queue.size(), 1U);
 }
@@ -89,15 +89,15 @@ TEST_F(NotifierTest, NothingIsSentWhileTheSinkIsNotReady) {
 TEST_F(NotifierTest, LastWordsWaitForNoSnapshot) {
     auto const before = Clock::now();
     change(1);
-    m_notifier.announce(before);
-    EXPECT_TRUE(m_notifier.announceAll());
+    m_notifier.send(before);
+    EXPECT_TRUE(m_notifier.sendAll());
     EXPECT_EQ(m_sink.sent, (std::vector<std::uint32_t>{1}));
 }
 
 TEST_F(NotifierTest, LastWordsThatAreNotTakenAreLeft) {
     m_sink.takesAtOnce = false;
     change(1);
-    EXPECT_FALSE(m_notifier.announceAll());
+    EXPECT_FALSE(m_notifier.sendAll());
     EXPECT_EQ(m_queue.size(), 1U);
 }
 
