@@ -116,8 +116,7 @@ std::shared_ptr<Snapshot const> Collector::collect(Snapshot const* former) {
     if (former == nullptr) return snapshot;
     snapshot->number = former->number + 1;
     snapshot->longestRefreshTime = std::max(snapshot->refreshTime, former->longestRefreshTime);
-    snapshot->lastChange =
-        snapshot->boards == former->boards ? former->lastChange : m_uptime.now();
+    snapshot->lastChange = snapshot->boards == former->boards ? former->lastChange : m_uptime.now();
     return snapshot;
 }
 

@@ -16,8 +16,8 @@ struct CardReading {
 
 /// Reads the rack's cards by serial number. They stand in the text file that the environment
 /// variable `RACK_FILE` names, one line for each card: "<serial number> up|down <violations>
-/// <calls>". Returns nothing if the file cannot be read or has a bad line. The file must be replaced
-/// as a whole: a file that is half written has fewer cards.
+/// <calls>". Returns nothing if the file cannot be read or has a bad line. The file must be
+/// replaced as a whole: a file that is half written has fewer cards.
 std::optional<std::map<std::string, CardReading>> readRack();
 
 /// The last reading of a card. Thread-safe: the factory's thread writes, queries read.

@@ -38,8 +38,8 @@ TEST_F(ModuleLoaderTest, UnknownModuleIsNamedWithThePathThatWasTried) {
 }
 
 TEST_F(ModuleLoaderTest, FileThatIsNoSharedObjectIsRefused) {
-    EXPECT_THAT(complaint("text"), AllOf(HasSubstr("'text'"), HasSubstr("cannot be loaded"),
-                                         HasSubstr("textkvl.so")));
+    EXPECT_THAT(complaint("text"),
+                AllOf(HasSubstr("'text'"), HasSubstr("cannot be loaded"), HasSubstr("textkvl.so")));
 }
 
 TEST_F(ModuleLoaderTest, ModuleWithoutEntryPointIsRefused) {
