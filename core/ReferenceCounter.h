@@ -18,8 +18,8 @@ template <class T>
 class ReferenceCounter : public Object {
   public:
     /// A handle of `object`; null makes an empty handle. Requires that the object is new or that
-    /// another handle keeps it meanwhile. When memory runs out, a new object is still the caller's.
-    ReferenceCounter(T* object = nullptr)
+    /// another handle keeps it meanwhile. When memory runs out, a new object is deleted.
+    ReferenceCounter(T* object = nullptr) try
         : Object(false),
           m_record(object == nullptr ? nullptr
                                      : ReferenceTable::get_instance()->find_or_make(object)),
@@ -29,6 +29,9 @@ class ReferenceCounter : public Object {
             m_record->raise();
             m_record->unlock();
         }
+    } catch (...) {
+        if (ReferenceTable::get_instance()->ReferenceTable::get_refinfo(object) == nullptr)
+            delete object;
     }
 
     ReferenceCounter(ReferenceCounter const& other) : Object(false) { share(other); }

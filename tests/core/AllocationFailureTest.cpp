@@ -70,6 +70,9 @@ void operator delete(void* block, std::size_t /*size*/, std::align_val_t /*align
 
 namespace {
 
+/// More handles than identifier lists have been recycled before.
+constexpr int kMoreThanAreRecycled = 20000;
+
 int s_alive = 0;
 
 class Counted : public Object {
@@ -80,15 +83,8 @@ class Counted : public Object {
 
 using Handle = ReferenceCounter<Counted>;
 
-/// A new object's handle. An object that could not be given to a handle is still ours.
 Handle made() {
-    auto* const object = new Counted;
-    try {
-        return {object};
-    } catch (...) {
-        delete object;
-        throw;
-    }
+    return {new Counted};
 }
 
 /// Handles of enough objects that the reference table grows with the next few.
@@ -175,6 +171,37 @@ TEST(AllocationFailureTest, HandlesSurviveTheFailureOfAnyAllocation) {
             handles.front() = std::move(moved);
         },
         60);
+}
+
+TEST(AllocationFailureTest, NewObjectThatNoHandleCanTakeIsDeleted) {
+    std::vector<Handle> others;
+    others.reserve(kMoreThanAreRecycled);
+    EXPECT_THROW(
+        {
+            for (int i = 0; i < kMoreThanAreRecycled; ++i) {
+                auto* const object = new Counted;
+                FailingAllocation const failing(0);
+                others.emplace_back(object);
+            }
+        },
+        std::bad_alloc);
+    EXPECT_EQ(s_alive, static_cast<int>(others.size()));
+}
+
+TEST(AllocationFailureTest, ObjectWithAHandleOutlivesTheFailureToMakeAnother) {
+    Handle const handle = made();
+    std::vector<Handle> others;
+    others.reserve(kMoreThanAreRecycled);
+    EXPECT_THROW(
+        {
+            FailingAllocation const failing(0);
+            for (int i = 0; i < kMoreThanAreRecycled; ++i)
+                others.emplace_back(handle.get());
+        },
+        std::bad_alloc);
+    EXPECT_EQ(s_alive, 1);
+    EXPECT_EQ(ReferenceTable::get_instance()->get_refinfo(handle.get())->count(),
+              static_cast<int>(others.size()) + 1);
 }
 
 TEST(AllocationFailureTest, TablesSurviveTheFailureOfAnyAllocation) {
