@@ -32,7 +32,7 @@ ActionScheduler_pthread::ActionScheduler_pthread(Clock clock)
 ActionScheduler_pthread::ActionScheduler_pthread() : ActionScheduler_pthread(now) {
     ActionScheduler_pthread::lock_list();
     Start();
-    while (!m_running)
+    while (!m_running && HasThread())
         pthread_cond_wait(&m_started, &m_listMutex);
     ActionScheduler_pthread::unlock_list();
 }

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The one concrete action scheduler, over a POSIX thread.
+// The one concrete action scheduler, on a POSIX thread.
 #pragma once
 
 #include <pthread.h>
@@ -9,11 +9,13 @@
 #include "platform/ActionScheduler.h"
 #include "platform/KVLThread_pthread.h"
 
-/// The process's scheduler. Its thread sleeps until the next wake-up time and never ends.
+/// An `ActionScheduler_pthread` is the process's scheduler. Its thread sleeps until the next
+/// wake-up time and never ends.
 class KVLOAM_API ActionScheduler_pthread : public ActionScheduler, public KVLThread_pthread {
   public:
-    /// Makes the scheduler and its thread at the first call, which must return before other threads
-    /// call it. Never destroyed.
+    /// Returns the process's scheduler. The first call creates it with its thread, and must return
+    /// before other threads call this. Never destroyed. If the system refuses the thread, the
+    /// scheduler keeps its list but calls nothing (see `KVLThread_pthread::HasThread`).
     static ActionScheduler* GetScheduler();
 
     /// The thread's body. Does not return.

@@ -3,6 +3,9 @@
 
 #include <unistd.h>
 
+#include <cstdio>
+#include <system_error>
+
 void* kvl_thread_procedure(void* thread) {
     auto* self = static_cast<KVLThread_pthread*>(thread);
     self->m_body->Run();
@@ -19,7 +22,12 @@ int KVLThread_pthread::Start() {
     m_state = KVLThreadRunning;
     pthread_attr_init(&m_attributes);
     pthread_attr_setdetachstate(&m_attributes, PTHREAD_CREATE_DETACHED);
-    pthread_create(&m_thread, &m_attributes, kvl_thread_procedure, this);
+    int const result = pthread_create(&m_thread, &m_attributes, kvl_thread_procedure, this);
+    if (result != 0) {
+        m_thread = pthread_t{};
+        std::fprintf(stderr, "KVLThread_pthread: cannot create a thread: %s\n",
+                     std::system_category().message(result).c_str());
+    }
     return 0;
 }
 

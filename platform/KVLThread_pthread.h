@@ -9,7 +9,9 @@
 #include "platform/KVLThread.h"
 #include "platform/Runnable.h"
 
-/// The object must outlive its body's `Run()`: the thread is detached, nobody waits for it.
+/// A `KVLThread_pthread` is a detached POSIX thread that runs one body. It must outlive the body's
+/// `Run()`, because nothing waits for the thread. Thread-safe, except that only one thread may call
+/// `Start()` and `HasThread()`.
 class KVLOAM_API KVLThread_pthread : public KVLThread {
   public:
     /// `body` is not owned and may be null.
@@ -18,23 +20,28 @@ class KVLOAM_API KVLThread_pthread : public KVLThread {
     KVLThread_pthread(KVLThread_pthread const&) = delete;
     KVLThread_pthread& operator=(KVLThread_pthread const&) = delete;
 
-    /// The state reads `KVLThreadRunning` from here until the body returns.
-    /// Deliberate: a thread that the system refuses to create still answers 0 and reads as running.
+    /// Starts the body. The state is `KVLThreadRunning` from here until the body returns.
+    /// Deliberate: if the system refuses the thread, this returns 0 and the state is
+    /// `KVLThreadRunning` all the same. It then writes a line on standard error, and `HasThread()`
+    /// is false.
     int Start() override;
-    /// Does nothing; returns 0. A body ends by returning from `Run()`.
+    /// Does nothing and returns 0. A body ends by returning from `Run()`.
     int Stop() override;
-    /// Does nothing; returns 0.
+    /// Does nothing and returns 0.
     int Join() override;
-    /// Does nothing; returns 0.
+    /// Does nothing and returns 0.
     int TerminateAndWait() override;
     int Sleep(int seconds) override;
     int GetThreadState() override;
+
+    /// Whether the last `Start()` got a thread from the system.
+    bool HasThread() const { return m_thread != pthread_t{}; }
 
   private:
     friend void* kvl_thread_procedure(void* thread);
 
     Runnable* m_body;
     std::atomic<int> m_state{KVLThreadNotRunning};
-    pthread_t m_thread{};
+    pthread_t m_thread{}; ///< no thread has this value
     pthread_attr_t m_attributes{};
 };

@@ -7,6 +7,8 @@
 #include <ctime>
 #include <filesystem>
 #include <memory>
+#include <new>
+#include <string_view>
 #include <system_error>
 #include <utility>
 
@@ -37,6 +39,7 @@
 #include "agent/readers/ResourceReader.h"
 #include "agent/readers/ServiceReader.h"
 #include "agent/readers/StableIndices.h"
+#include "platform/ActionScheduler_pthread.h"
 
 namespace kvloamd {
 
@@ -81,6 +84,17 @@ bool platformAnswers() {
     ExternalEventAdaptor::get_instance();
     ExternalFaultEventAdaptor::get_instance();
     return true;
+}
+
+/// Creates the library's scheduler, which ticks the history of every line. Returns whether the
+/// system gave it a thread.
+bool schedulerRuns() {
+    auto const* const thread =
+        dynamic_cast<KVLThread_pthread*>(ActionScheduler_pthread::GetScheduler());
+    if (thread == nullptr || thread->HasThread()) return true;
+    log(LogLevel::Error, "the system refuses a thread for the scheduler of the lines' history; "
+                         "check the limits on processes, threads and memory");
+    return false;
 }
 
 std::vector<LoadedModule> loadModules(Options const& options) {
@@ -290,6 +304,12 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     flushNotifications(notifier, boards.queue, front);
 }
 
+/// Logs that the system refused `what` during `step`.
+void logLack(std::string_view what, std::string_view step) {
+    log(LogLevel::Error, "the system refused " + std::string(what) + " while " + std::string(step) +
+                             "; check the limits on processes, threads and memory");
+}
+
 } // namespace
 
 int runDaemon(Options const& options, ReadOptions const& readAgain) {
@@ -297,18 +317,33 @@ int runDaemon(Options const& options, ReadOptions const& readAgain) {
     tzset();
     // The library's threads access these until the process ends.
     static auto* const boards = new Boards(options.enterprise);
+    std::string_view step = "loading the board modules";
     try {
         std::vector<LoadedModule> const modules = loadModules(options);
         if (modules.empty())
             log(LogLevel::Warning,
                 "no board module is configured, so there will be no boards; name one "
                 "with --module");
+        step = "opening the SNMP side";
         std::unique_ptr<Front> const front = makeFront(options);
-        if (!front->open() || !platformAnswers()) return kExitFailure;
+        if (!front->open()) return kExitFailure;
+        step = "connecting to the board platform";
+        if (!schedulerRuns() || !platformAnswers()) return kExitFailure;
         boards->counters.started = Clock::now();
+        step = "reading the boards";
         attachModules(modules, *boards);
+        step = "serving";
         serve(options, readAgain, *front, signals, *boards);
         log(LogLevel::Info, "stopped");
+    } catch (std::bad_alloc const&) {
+        logLack("memory", step);
+        return kExitFailure;
+    } catch (std::system_error const& error) {
+        if (error.code() == std::errc::resource_unavailable_try_again)
+            logLack("a thread", step);
+        else
+            log(LogLevel::Error, error.what());
+        return kExitFailure;
     } catch (std::exception const& error) {
         log(LogLevel::Error, error.what());
         return kExitFailure;

@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // What the agent says when it can not start, and what it checks without starting.
+#include <sys/resource.h>
 #include <sys/stat.h>
 
 #include <algorithm>
@@ -47,6 +48,36 @@ TEST_F(StartTest, PortInUseIsNamedWithTheRemedy) {
     expectOneLine(start({"--module", "z7sim", "--port", port}), kExitFailure,
                   AllOf(HasSubstr(address()), HasSubstr("in use"), HasSubstr("--port")));
     EXPECT_EQ(get("kvlBoardCount.0"), "Gauge32: 3 boards");
+}
+
+/// Lets the programs that are started in a scope get no second thread: the stack limit, by which a
+/// program sizes the stacks of its threads, is larger than any address space.
+class NoThreadsScope {
+  public:
+    NoThreadsScope() {
+        getrlimit(RLIMIT_STACK, &m_limit);
+        rlimit huge = m_limit;
+        huge.rlim_cur = rlim_t{1} << 60;
+        m_set = setrlimit(RLIMIT_STACK, &huge) == 0;
+    }
+    ~NoThreadsScope() { setrlimit(RLIMIT_STACK, &m_limit); }
+    NoThreadsScope(NoThreadsScope const&) = delete;
+    NoThreadsScope& operator=(NoThreadsScope const&) = delete;
+
+    /// False where the hard limit forbids it.
+    bool isSet() const { return m_set; }
+
+  private:
+    rlimit m_limit{};
+    bool m_set = false;
+};
+
+TEST_F(StartTest, SystemThatRefusesThreadsEndsTheStartWithAClearLine) {
+    NoThreadsScope const scope;
+    if (!scope.isSet()) GTEST_SKIP() << "the stack limit cannot be raised here";
+    Result const result = start({"--module", "z7sim"});
+    EXPECT_EQ(result.status, kExitFailure);
+    EXPECT_THAT(result.output, HasSubstr("kvloamd: the system refuses a thread for the scheduler"));
 }
 
 TEST_F(StartTest, AddressOfAnotherHostIsRefused) {

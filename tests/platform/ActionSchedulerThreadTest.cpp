@@ -9,6 +9,7 @@
 #include <gtest/gtest.h>
 
 #include "platform/ActionScheduler_pthread.h"
+#include "tests/platform/NoNewThreads.h"
 
 namespace {
 
@@ -145,6 +146,21 @@ TEST(ActionSchedulerThreadTest, OneTimeActionsAndASlowerPeriodStarveOneAnotherNo
         ASSERT_LE(i, 30) << "the periodic action is not called";
     }
     EXPECT_GE(once.calls(), 3);
+}
+
+/// A scheduler with a thread of its own, besides the process's.
+class OwnScheduler final : public ActionScheduler_pthread {};
+
+TEST(ActionSchedulerThreadTest, SchedulerDoesNotWaitForAThreadThatTheSystemRefuses) {
+    testing::internal::CaptureStderr();
+    NoNewThreads const none;
+    OwnScheduler refused;
+    EXPECT_NE(testing::internal::GetCapturedStderr(), "");
+    EXPECT_FALSE(refused.HasThread());
+
+    CountingAction action;
+    EXPECT_EQ(refused.AddPeriodic(&action, 1), 0);
+    EXPECT_EQ(refused.Remove(&action), 0);
 }
 
 } // namespace

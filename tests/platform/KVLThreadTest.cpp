@@ -5,6 +5,7 @@
 #include <gtest/gtest.h>
 
 #include "platform/KVLThread_pthread.h"
+#include "tests/platform/NoNewThreads.h"
 
 namespace {
 
@@ -83,6 +84,28 @@ TEST(KVLThreadTest, StopJoinAndTerminateDoNotTouchARunningThread) {
 TEST(KVLThreadTest, SleepOfZeroReturnsAtOnce) {
     KVLThread_pthread thread(nullptr);
     EXPECT_EQ(thread.Sleep(0), 0);
+}
+
+TEST(KVLThreadTest, ThreadThatTheSystemRefusesReadsAsStartedAndIsReported) {
+    Body body;
+    KVLThread_pthread thread(&body);
+    testing::internal::CaptureStderr();
+    NoNewThreads const none;
+    EXPECT_EQ(thread.Start(), 0);
+    EXPECT_EQ(thread.GetThreadState(), 0);
+    EXPECT_FALSE(thread.HasThread());
+    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+              "KVLThread_pthread: cannot create a thread: Resource temporarily unavailable\n");
+}
+
+TEST(KVLThreadTest, ThreadOfTheSystemIsThereFromTheStartOn) {
+    Body body;
+    KVLThread_pthread thread(&body);
+    EXPECT_FALSE(thread.HasThread());
+    thread.Start();
+    EXPECT_TRUE(thread.HasThread());
+    body.letGo();
+    waitUntilNotRunning(thread);
 }
 
 } // namespace
