@@ -77,7 +77,7 @@ void PlatformReader::readStore(Wanted const& wanted) {
     StoreReading store;
     bool const readable = store.good();
     note(m_storeReadable, readable,
-         "the attribute store can not be read, or has no family of boards; its table stays empty "
+         "the attribute store cannot be read, or has no family of boards; its table stays empty "
          "(see VQRXCFGPATH)",
          "the attribute store can be read again");
     if (!readable) {

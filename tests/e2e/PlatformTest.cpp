@@ -239,7 +239,7 @@ TEST_F(PlatformTest, ProcessThatIsAddedShowsUpAndGoesWhenItEnds) {
 TEST_F(PlatformTest, TruncatedStoreLeavesTheAgentRunningWithAnEmptyTable) {
     write(storeFile(), "SQLite format 3");
     startAgent();
-    EXPECT_THAT(agent().output(), HasSubstr("the attribute store can not be read"));
+    EXPECT_THAT(agent().output(), HasSubstr("the attribute store cannot be read"));
     EXPECT_THAT(values("kvlStoreSerialNumber"), IsEmpty());
     EXPECT_THAT(rows("kvlDeviceTable"), SizeIs(14));
     EXPECT_EQ(std::filesystem::file_size(storeFile()), 15U);

@@ -211,7 +211,7 @@ TEST_F(PlatformReaderTest, StoresStateIsLoggedOncePerChange) {
     for (int reading = 0; reading < 3; ++reading)
         m_always.read(both());
     std::string const logged = testing::internal::GetCapturedStderr();
-    EXPECT_EQ(timesIn(logged, "the attribute store can not be read"), 1) << logged;
+    EXPECT_EQ(timesIn(logged, "the attribute store cannot be read"), 1) << logged;
     EXPECT_EQ(timesIn(logged, "the attribute store can be read again"), 1) << logged;
 }
 
