@@ -248,11 +248,12 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             snapshot.services = readServices(services);
             snapshot.platformService = readPlatformService(services);
             snapshot.processes = readProcesses(statistics);
-            snapshot.faults = boards.faults.read(started);
             snapshot.resources = readResources(*boards.manager.get(), snapshot.boards);
             snapshot.records = platform.read(snapshot.boards);
             boards.lines.listen(snapshot.boards, interfaces.uptime());
             snapshot.interfaces = interfaces.read(snapshot.boards);
+            boards.faults.compare(shownLineFaults(snapshot.interfaces), Clock::now());
+            snapshot.faults = boards.faults.read(started);
             std::vector<PlacedLine> const lines = interfaces.takeLines();
             boards.lines.place(lines);
             applySettings(boards.settings, lines);

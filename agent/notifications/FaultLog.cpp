@@ -8,29 +8,89 @@
 
 namespace kvloamd {
 
+namespace {
+
+/// The number of a board whose faults no report has named since the agent's start.
+constexpr int kUnknownPlatformBoard = -1;
+
+} // namespace
+
 void FaultLog::raise(std::uint32_t boardIndex, int platformBoard, std::uint16_t value) {
     std::scoped_lock const guard(m_mutex);
     ++m_raised;
     Key const key = keyOf(boardIndex, platformBoard, value);
+    auto const now = Clock::now();
     if (auto const found = m_faults.find(key); found != m_faults.end()) {
         ++found->second.times;
+        ++found->second.lines;
+        found->second.lastRaised = now;
         found->second.platformBoard = platformBoard;
         return;
     }
-    if (m_faults.size() >= m_capacity) {
-        ++m_unlisted;
-        return;
-    }
-    m_lastChange = Clock::now();
-    m_faults.emplace(key, Fault{platformBoard, m_lastChange, std::time(nullptr), 1});
+    enter(key, platformBoard, 1, now);
 }
 
 void FaultLog::clear(std::uint32_t boardIndex, int platformBoard, std::uint16_t value) {
     std::scoped_lock const guard(m_mutex);
+    if (auto const board = m_compared.find(boardIndex);
+        board != m_compared.end() && lineFault(value))
+        board->second.cleared.insert(value);
     // The fault may have been raised before its board was known.
-    auto const erased = m_faults.erase(keyOf(boardIndex, platformBoard, value)) +
-                        m_faults.erase(keyOf(0, platformBoard, value));
-    if (erased > 0) m_lastChange = Clock::now();
+    for (Key const& key :
+         {keyOf(boardIndex, platformBoard, value), keyOf(0, platformBoard, value)}) {
+        auto const found = m_faults.find(key);
+        if (found == m_faults.end()) continue;
+        if (lineFault(value)) {
+            Fault& fault = found->second;
+            if (fault.lines > 0) --fault.lines;
+            if (fault.lines > 0 || isShown(key)) return;
+        }
+        m_faults.erase(found);
+        m_lastChange = Clock::now();
+        return;
+    }
+}
+
+void FaultLog::compare(std::map<std::uint32_t, ShownLineFaults> const& shown,
+                       Clock::time_point now) {
+    std::scoped_lock const guard(m_mutex);
+    m_shown = shown;
+    for (auto const& [boardIndex, board] : shown) {
+        auto const& compared =
+            m_compared.try_emplace(boardIndex, ComparedBoard{now, {}}).first->second;
+        if (now - compared.compared >= kLineFaultGrace) continue;
+        for (std::size_t fault = 0; fault < kLineFaults; ++fault) {
+            auto const value = static_cast<std::uint16_t>(kFirstLineFault + fault);
+            Key const key{boardIndex, 0, value};
+            if (board.lines[fault] > 0 && impliesReport(fault) && !m_faults.contains(key) &&
+                !compared.cleared.contains(value))
+                enter(key, kUnknownPlatformBoard, board.lines[fault], now);
+        }
+    }
+    auto const erased = std::erase_if(m_faults, [&](auto const& entry) {
+        auto const& [key, fault] = entry;
+        auto const board = shown.find(key.boardIndex);
+        if (!lineFault(key.value) || board == shown.end() || isShown(key)) return false;
+        return fault.lines == 0 ||
+               (board->second.allClear && now - fault.lastRaised >= kLineFaultGrace);
+    });
+    if (erased > 0) m_lastChange = now;
+}
+
+bool FaultLog::isShown(Key const& key) const {
+    auto const board = m_shown.find(key.boardIndex);
+    auto const fault = lineFault(key.value);
+    return board != m_shown.end() && fault && board->second.lines[*fault] > 0;
+}
+
+void FaultLog::enter(Key const& key, int platformBoard, std::uint32_t lines,
+                     Clock::time_point now) {
+    if (m_faults.size() >= m_capacity) {
+        ++m_unlisted;
+        return;
+    }
+    m_lastChange = now;
+    m_faults.emplace(key, Fault{platformBoard, now, std::time(nullptr), 1, lines, now});
 }
 
 void FaultLog::boardIsKnown(std::uint32_t boardIndex, int platformBoard) {
@@ -47,6 +107,8 @@ void FaultLog::boardIsKnown(std::uint32_t boardIndex, int platformBoard) {
 
 void FaultLog::boardHasGone(std::uint32_t boardIndex) {
     std::scoped_lock const guard(m_mutex);
+    m_shown.erase(boardIndex);
+    m_compared.erase(boardIndex);
     auto const gone = std::erase_if(
         m_faults, [&](auto const& entry) { return entry.first.boardIndex == boardIndex; });
     if (gone > 0) m_lastChange = Clock::now();
@@ -58,7 +120,7 @@ Faults FaultLog::read(Clock::time_point started) const {
     Faults read;
     read.raised = m_raised;
     read.unlisted = m_unlisted;
-    read.lastChange = uptime.at(m_lastChange);
+    if (m_lastChange) read.lastChange = uptime.at(*m_lastChange);
     // One row for each board and value. The faults of unknown boards are sorted by platform board
     // number first, so equal values are not adjacent.
     std::map<std::array<std::uint32_t, 2>, Fault> merged;

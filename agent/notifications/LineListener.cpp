@@ -19,7 +19,7 @@ int LineListener::ProcessLineStatusEvent(ReferenceCounter<DS1LineStatusEvent> ev
     if (m_stopped) return 0;
     auto const place = m_places.find(changed);
     if (place != m_places.end())
-        enqueue(place->second, change);
+        enqueue(place->second.ifIndex, change);
     else if (m_waiting.size() < kMostWaiting)
         m_waiting.push_back(std::move(change));
     else
@@ -39,9 +39,8 @@ void LineListener::listen(std::vector<BoardRow> const& boards, Uptime const& upt
         Board* const asked = board.get();
         if (asked == nullptr) continue;
         forEachFeature<DS1LineFeature>(*asked, [&](DS1LineFeature& feature) {
-            present.emplace(row.boardIndex, &feature);
-            if (!m_features.contains({row.boardIndex, &feature}))
-                feature.AddLineStatusListener(this);
+            present.emplace(&feature, ReferenceCounter<DS1LineFeature>(&feature));
+            if (!m_features.contains(&feature)) feature.AddLineStatusListener(this);
         });
     }
     m_features = std::move(present);
@@ -50,15 +49,16 @@ void LineListener::listen(std::vector<BoardRow> const& boards, Uptime const& upt
 void LineListener::place(std::vector<PlacedLine> const& lines) {
     decltype(m_places) places;
     for (PlacedLine const& placed : lines)
-        places.emplace(placed.line.get(), placed.ifIndex);
-    // Dropping a change may destroy its line, which must not happen under the lock.
+        places.emplace(placed.line.get(), placed);
+    // Dropping a change or a former place may destroy its line, which must not happen under the
+    // lock.
     std::vector<Change> waiting;
     std::scoped_lock const guard(m_mutex);
-    m_places = std::move(places);
+    m_places.swap(places);
     waiting.swap(m_waiting);
     for (Change const& change : waiting)
         if (auto const place = m_places.find(change.line.get()); place != m_places.end())
-            enqueue(place->second, change);
+            enqueue(place->second.ifIndex, change);
 }
 
 void LineListener::enqueue(std::uint32_t ifIndex, Change const& change) {

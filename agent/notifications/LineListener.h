@@ -7,7 +7,6 @@
 #include <map>
 #include <mutex>
 #include <optional>
-#include <set>
 #include <utility>
 #include <vector>
 
@@ -64,13 +63,15 @@ class LineListener final : public DS1LineStatusListener {
     Settings const& m_settings;
     NotificationQueue& m_queue;
     Counters& m_counters;
-    /// Where it listens, by board index: a feature of a board that is there stays where it is. Of
-    /// the thread that reads the lines.
-    std::set<std::pair<std::uint32_t, DS1LineFeature const*>> m_features;
+    /// The features to which it is subscribed. The handles keep the addresses from being reused for
+    /// new features, which have no subscription. Of the collector.
+    std::map<DS1LineFeature const*, ReferenceCounter<DS1LineFeature>> m_features;
 
     std::mutex
         m_mutex; ///< guards what follows; held during `m_changed`, never while a line is asked
-    std::map<DS1LineDevice const*, std::uint32_t> m_places; ///< of the reading before
+    /// The lines of the latest refresh. The handles keep the addresses from being reused for new
+    /// lines, which may have another ifIndex.
+    std::map<DS1LineDevice const*, PlacedLine> m_places;
     std::vector<Change> m_waiting;
     std::optional<Uptime> m_uptime;
     std::function<void()> m_changed;

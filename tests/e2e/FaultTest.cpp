@@ -71,6 +71,32 @@ TEST_F(FaultTest, LinesAlarmIsAFaultOfItsBoard) {
         eventually([this] { return get("kvlFaultTimesRaised.1.256") == "Counter32: 1 times"; }));
 }
 
+TEST_F(FaultTest, FaultStaysWhileAnotherLineOfTheBoardHasTheAlarm) {
+    startWithReceiver();
+    sim({"line", "alarm", "101", "los"});
+    sim({"line", "alarm", "102", "los"});
+    EXPECT_TRUE(
+        eventually([this] { return get("kvlFaultTimesRaised.1.256") == "Counter32: 2 times"; }));
+    sim({"line", "mend", "101"});
+    expectAnnounced("kvlFaultCleared", 1, "NX50001", 256, 0);
+    EXPECT_THAT(faults(), SizeIs(1));
+}
+
+TEST_F(FaultTest, AlarmFromBeforeTheStartIsAFault) {
+    useChassis("boards:\n"
+               "  - handle: 7\n"
+               "    attributes: {SERIAL_NUMBER: \"S7\"}\n"
+               "    devices:\n"
+               "      - handle: 70\n"
+               "        type: 501\n"
+               "        attributes: {NAME: trunk}\n"
+               "        line: {type: esf, alarms: [rai]}\n");
+    startAgent();
+    EXPECT_TRUE(
+        eventually([this] { return get("kvlFaultTimesRaised.1.259") == "Counter32: 1 times"; }));
+    EXPECT_EQ(get("kvlFaultPlatformBoard.1.259"), "INTEGER: -1");
+}
+
 TEST_F(FaultTest, BoardWithoutLogicalIdentifierIsKnownByItsDrivers) {
     useChassis("boards:\n"
                "  - {handle: 7, attributes: {SERIAL_NUMBER: \"S7\", VORN_DRIVER_BOARD_ID: 70}}\n");

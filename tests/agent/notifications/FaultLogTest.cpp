@@ -157,5 +157,143 @@ TEST_F(FaultLogTest, ClearingOfAKnownBoardLeavesOtherUnknownBoardsAlone) {
     EXPECT_EQ(listed(), (std::vector<Index>{{0, 17}}));
 }
 
+constexpr std::uint16_t kLossOfSignal = kFirstLineFault;
+constexpr std::uint16_t kSendingRai = kFirstLineFault + 4;
+
+/// Boards of which lines show faults, and a refresh that finds them so.
+class LineFaultsInLogTest : public FaultLogTest {
+  protected:
+    /// `lines` lines of board 2 show `fault`.
+    void show(std::uint16_t fault, std::uint32_t lines) {
+        ShownLineFaults& board = m_shown[2];
+        board = {};
+        board.lines[*lineFault(fault)] = lines;
+        board.allClear = lines == 0;
+        m_log.compare(m_shown, m_now);
+    }
+    void showNothing() { show(kLossOfSignal, 0); }
+
+    Clock::time_point m_now = Clock::now();
+    std::map<std::uint32_t, ShownLineFaults> m_shown;
+};
+
+TEST_F(LineFaultsInLogTest, FaultStaysWhileAnotherLineOfTheBoardHasIt) {
+    m_log.raise(2, 10, kLossOfSignal);
+    m_log.raise(2, 10, kLossOfSignal);
+    m_log.clear(2, 10, kLossOfSignal);
+    EXPECT_EQ(listed(), (std::vector<Index>{{2, kLossOfSignal}}));
+    m_log.clear(2, 10, kLossOfSignal);
+    EXPECT_TRUE(listed().empty());
+}
+
+TEST_F(LineFaultsInLogTest, FaultOfUnknownBoardIsCountedByLineToo) {
+    m_log.raise(0, 10, kLossOfSignal);
+    m_log.raise(0, 10, kLossOfSignal);
+    m_log.clear(0, 10, kLossOfSignal);
+    EXPECT_EQ(listed(), (std::vector<Index>{{0, kLossOfSignal}}));
+    m_log.clear(2, 10, kLossOfSignal);
+    EXPECT_TRUE(listed().empty());
+}
+
+TEST_F(LineFaultsInLogTest, FaultThatLinesShowAtTheFirstRefreshIsListed) {
+    show(kLossOfSignal, 2);
+    ASSERT_EQ(listed(), (std::vector<Index>{{2, kLossOfSignal}}));
+    EXPECT_EQ(read().rows[0].platformBoard, -1);
+    EXPECT_EQ(read().raised, 0U);
+    m_log.clear(2, 10, kLossOfSignal);
+    m_log.clear(2, 10, kLossOfSignal);
+    showNothing();
+    EXPECT_TRUE(listed().empty());
+}
+
+TEST_F(LineFaultsInLogTest, FaultThatLinesShowLaterIsNotListedWithoutAReport) {
+    showNothing();
+    m_now += FaultLog::kLineFaultGrace;
+    show(kLossOfSignal, 1);
+    EXPECT_TRUE(listed().empty());
+}
+
+TEST_F(LineFaultsInLogTest, FaultThatBecomesAFailureSoonAfterTheStartIsListed) {
+    showNothing();
+    m_now += FaultLog::kLineFaultGrace / 2;
+    show(kLossOfSignal, 1);
+    EXPECT_EQ(listed(), (std::vector<Index>{{2, kLossOfSignal}}));
+}
+
+TEST_F(LineFaultsInLogTest, FaultThatIsClearedBeforeItShowsIsNotListedAgain) {
+    showNothing();
+    m_log.raise(2, 10, kLossOfSignal);
+    m_log.clear(2, 10, kLossOfSignal);
+    show(kLossOfSignal, 1); // a failure outlasts its defect
+    EXPECT_TRUE(listed().empty());
+}
+
+TEST_F(LineFaultsInLogTest, AlarmThatALineSendsByItselfIsNotListed) {
+    show(kSendingRai, 1);
+    EXPECT_TRUE(listed().empty());
+}
+
+TEST_F(LineFaultsInLogTest, ClearedFaultStaysUntilNoLineShowsIt) {
+    showNothing();
+    m_log.raise(2, 10, kLossOfSignal);
+    show(kLossOfSignal, 2); // one of them had it before the agent started, but not as a failure yet
+    m_log.clear(2, 10, kLossOfSignal);
+    EXPECT_EQ(listed(), (std::vector<Index>{{2, kLossOfSignal}}));
+    showNothing();
+    EXPECT_TRUE(listed().empty());
+}
+
+TEST_F(LineFaultsInLogTest, RaisedFaultMayTakeAWhileToShow) {
+    m_log.raise(2, 10, kLossOfSignal);
+    m_now += FaultLog::kLineFaultGrace / 2;
+    showNothing();
+    EXPECT_EQ(listed(), (std::vector<Index>{{2, kLossOfSignal}}));
+}
+
+TEST_F(LineFaultsInLogTest, FaultWhoseClearingWasLostGoesWhenAllLinesAreClear) {
+    m_log.raise(2, 10, kLossOfSignal);
+    m_now += 2 * FaultLog::kLineFaultGrace;
+    show(kSendingRai, 1);
+    EXPECT_EQ(listed(), (std::vector<Index>{{2, kLossOfSignal}}));
+    showNothing();
+    EXPECT_TRUE(listed().empty());
+}
+
+TEST_F(LineFaultsInLogTest, FaultThatIsNotOfALineIsLeftAlone) {
+    m_log.raise(2, 10, 17);
+    m_now += 2 * FaultLog::kLineFaultGrace;
+    showNothing();
+    EXPECT_EQ(listed(), (std::vector<Index>{{2, 17}}));
+}
+
+TEST_F(LineFaultsInLogTest, BoardThatReturnsIsComparedAnew) {
+    showNothing();
+    m_log.boardHasGone(2);
+    show(kLossOfSignal, 1);
+    EXPECT_EQ(listed(), (std::vector<Index>{{2, kLossOfSignal}}));
+}
+
+TEST(ShownLineFaultsTest, LinesAreCountedByBoardAndFault) {
+    InterfaceRows rows;
+    auto const add = [&](std::uint32_t ifIndex, std::uint32_t board, std::optional<int> status) {
+        rows.interfaces.emplace_back().ifIndex = ifIndex;
+        rows.interfaces.back().boardIndex = board;
+        rows.lines.emplace_back().ifIndex = ifIndex;
+        rows.lines.back().lineStatus = status;
+    };
+    add(1000, 1, 64 + 8192);
+    add(1001, 1, 64);
+    add(1002, 1, 2);
+    add(1016, 2, 1);
+    add(1032, 3, 64);
+    add(1033, 3, std::nullopt);
+    auto const shown = shownLineFaults(rows);
+    ASSERT_EQ(shown.size(), 2U) << "boards 1 and 2";
+    EXPECT_EQ(shown.at(1).lines[0], 2U);
+    EXPECT_EQ(shown.at(1).lines[3], 1U);
+    EXPECT_FALSE(shown.at(1).allClear);
+    EXPECT_TRUE(shown.at(2).allClear);
+}
+
 } // namespace
 } // namespace kvloamd

@@ -213,5 +213,21 @@ TEST_F(LineListenerTest, EventWithoutALineIsPassedOver) {
     EXPECT_EQ(told(), "");
 }
 
+TEST_F(LineListenerTest, FeatureThatReplacesAnotherIsListenedTo) {
+    auto const a = insert("A");
+    read();
+    // Freed memory is often given out again at once, so new features get the old ones' addresses.
+    for (int round = 0; round < 100; ++round) {
+        a.board->RemoveFeature(a.board->GetFirstFeature(DS1LineFeature::iid()));
+        auto* const line = new FakeLine("line-A", "");
+        line->trapEnable = 1;
+        auto* const feature = new FakeLineFeature({line});
+        a.board->AddFeature(ReferenceCounter<Feature>(feature));
+        read();
+        feature->NotifyLineStatusListeners(feature->GetFirstDevice(), DS1LineStatusLossOfSignal);
+        ASSERT_EQ(told(), "1000:64 ") << "round " << round;
+    }
+}
+
 } // namespace
 } // namespace kvloamd
