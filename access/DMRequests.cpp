@@ -9,7 +9,10 @@
 namespace KVL {
 
 long DMNumber::answer(DMAttribute const& request) const {
-    if (request.status != 0) return -1;
+    return request.status == 0 ? extended(request) : -1;
+}
+
+long DMNumber::extended(DMAttribute const& request) const {
     if (request.size != sizeof(std::int16_t)) return m_word;
     std::int16_t narrow = 0;
     std::memcpy(&narrow, &m_word, sizeof narrow);

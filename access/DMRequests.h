@@ -16,34 +16,36 @@ inline constexpr int kDMTextSize = 128;
 /// What a missing text reads as.
 inline constexpr char const* kDMUnknown = "unknown";
 
-/// A four-byte number as the client writes it. API numbers are `long`, which may be wider, so the
-/// client never writes into one.
+/// A `DMNumber` is a four-byte number as the client writes it. API numbers are `long`, which may be
+/// wider, so the client never writes into one.
 class DMNumber {
   public:
     explicit DMNumber(std::int32_t start = 0) : m_word(start) {}
 
     DMAttribute request(char const* name) { return {name, &m_word, 0, 0, sizeof m_word}; }
-    /// What the client wrote, or the start value.
+    /// The four bytes as the client left them: what it wrote, or the start value.
     long word() const { return m_word; }
-    /// The answer to `request` where the record takes what the client wrote, or the start value:
-    /// only a request that failed in part (`result`) makes a missing number -1.
+    /// What the client wrote, sign-extended if it wrote two bytes; otherwise the start value.
+    long extended(DMAttribute const& request) const;
+    /// The answer to `request` for a number that the record reads in place: the four bytes as they
+    /// are, and -1 only if the number is missing and the request failed in part (`result`).
     long inPlace(DMAttribute const& request, int result) const {
         return result == kDMSomeAttributesFailed && request.status != 0 ? -1 : word();
     }
-    /// The answer to `request`: a two-byte one is extended; -1 when there was none.
+    /// The answer to `request`, sign-extended if it has two bytes; -1 if there is none.
     long answer(DMAttribute const& request) const;
 
   private:
     std::int32_t m_word;
 };
 
-/// A text as the client writes it. A text that fills the buffer has no terminator.
+/// A `DMText` is a text as the client writes it. A text that fills the buffer has no terminator.
 class DMText {
   public:
     DMAttribute request(char const* name) { return {name, m_buffer, 0, 0, kDMTextSize}; }
     /// The text that the client wrote.
     std::string text() const;
-    /// The answer to `request`, or `missing` when there was none.
+    /// The answer to `request`, or `missing` if there is none.
     std::string answer(DMAttribute const& request, char const* missing) const;
 
   private:
@@ -56,11 +58,11 @@ inline DMAttribute descriptor_request(char const* name, QCompDesc& descriptor) {
 }
 
 /// Appends the objects under `parent` that match `criterion` to `found`, at most
-/// `kDMSearchCapacity`; nothing when the search fails.
+/// `kDMSearchCapacity`; nothing if the search fails.
 void append_matches(DeviceMapperClient& client, long parent, DMAttribute criterion,
                     std::vector<long>& found);
 
-/// The same of the objects whose "TYPE" is `type`.
+/// The same for the objects whose "TYPE" is `type`.
 void append_objects_of_type(DeviceMapperClient& client, long parent, int type,
                             std::vector<long>& found);
 

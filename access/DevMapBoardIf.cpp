@@ -89,18 +89,18 @@ long DevMapBoardIf::LogicalID() {
 }
 
 long DevMapBoardIf::BoardCondition() {
-    return readInPlace("BOARD_CONDITION");
+    return readLive("BOARD_CONDITION");
 }
 
 long DevMapBoardIf::BoardPresent() {
-    return readInPlace("BOARD_PRESENT");
+    return readLive("BOARD_PRESENT");
 }
 
-long DevMapBoardIf::readInPlace(char const* name) {
+long DevMapBoardIf::readLive(char const* name) {
     DMNumber number(-1);
     DMAttribute request = number.request(name);
     int const result = client().GetAttributes(m_auid, 1, &request);
-    return result == kDMSomeAttributesFailed ? -1 : number.word();
+    return result == kDMSomeAttributesFailed ? -1 : number.extended(request);
 }
 
 time_t DevMapBoardIf::StateChangeDate() {

@@ -9,14 +9,15 @@
 
 #include "access/DeviceMapperIf.h"
 
-/// A snapshot of one board's attributes, read in one request when it is made, and a few attributes
-/// that are read live at each call. A text that is missing is "unknown", a number -1.
+/// A `DevMapBoardIf` is a snapshot of one board's attributes, read in one request when it is made.
+/// A few more attributes are read live at each call. A missing text is "unknown", a missing number
+/// -1.
 ///
-/// The snapshot does not change, so several threads may read one record.
+/// Thread-safe: the snapshot does not change.
 class KVLOAM_API DevMapBoardIf {
   public:
-    /// `auid`: the board's handle in the device mapper. A handle of no board makes a record in
-    /// which everything is missing.
+    /// `auid`: the board's handle in the device mapper. If it is no board's, everything in the
+    /// record is missing.
     explicit DevMapBoardIf(long auid);
 
     std::string SerialNumber() const { return m_serialNumber; }
@@ -28,7 +29,7 @@ class KVLOAM_API DevMapBoardIf {
     std::string FirmwareVersion() const { return m_firmwareVersion; }
     long PciSlotNumber() const { return m_pciSlotNumber; }
     long PciBusNumber() const { return m_pciBusNumber; }
-    /// Deliberate: 0 where the platform answers with less than two bytes.
+    /// Deliberate: 0 if the platform answers with less than two bytes.
     long SharedMemoryBaseAddress() const { return m_sharedMemoryBaseAddress; }
     long IOBaseAddress() const { return m_ioBaseAddress; }
     long IRQ() const { return m_irq; }
@@ -37,14 +38,13 @@ class KVLOAM_API DevMapBoardIf {
     long VORNDriverBoardID() const { return m_vornDriverBoardID; }
     long ChassisSlot() const { return m_chassisSlot; }
 
-    /// Live. -1 when there is none.
+    /// Live; -1 if it is missing.
     long LogicalID();
-    /// Live. -1 when there is none.
+    /// Live; -1 if it is missing.
     long BoardCondition();
-    /// Live. -1 when there is none.
+    /// Live; -1 if it is missing.
     long BoardPresent();
-    /// Live. Seconds since the epoch; 0 when there is none, it is no date, or `time_t` cannot
-    /// hold it.
+    /// Live. Seconds since the epoch; 0 if it is missing, is not a date, or does not fit `time_t`.
     time_t StateChangeDate();
 
     /// The board's devices of one type, at most `kDMSearchCapacity`.
@@ -55,7 +55,7 @@ class KVLOAM_API DevMapBoardIf {
 
   private:
     DeviceMapperClient& client() const { return *m_dmIf->GetDMClient(); }
-    long readInPlace(char const* name);
+    long readLive(char const* name);
 
     long m_auid;
     DeviceMapperIf* m_dmIf;

@@ -7,33 +7,37 @@
 
 #include "access/DeviceMapperIf.h"
 
-/// A snapshot of one device's attributes, read in one request, and its sub-devices.
+/// A `DevMapDeviceIf` is a snapshot of one device's attributes, read in one request. It also lists
+/// the device's sub-devices.
+///
+/// Several threads may read one record while none calls `PopulateAttributes()`.
 class KVLOAM_API DevMapDeviceIf {
   public:
-    /// The device of that name; the name is only read. An unknown name makes a record in which
-    /// everything is missing.
+    /// The device with this name, which is only read. If there is none, everything in the record is
+    /// missing.
     explicit DevMapDeviceIf(char* name);
     explicit DevMapDeviceIf(long auid);
 
-    /// Reads the attributes anew.
+    /// Reads the attributes anew. Deliberate: a name that is missing now stays as it was, while
+    /// other missing attributes read as missing.
     void PopulateAttributes();
 
-    /// Empty when it is missing.
+    /// Empty if no reading found one.
     std::string Name() const { return m_name; }
     long Auid() const { return m_auid; }
-    /// -1 when it is missing.
+    /// -1 if it is missing.
     long DeviceType() const { return m_deviceType; }
-    /// -1 when it is missing.
+    /// -1 if it is missing.
     long ChannelCount() const { return m_channelCount; }
-    /// Copies the line administration address and returns true; without one, leaves `address` alone
-    /// and returns false.
+    /// Copies the line administration address and returns true. If there is none, leaves `address`
+    /// alone and returns false.
     bool LineAdminAddress(QCompDesc& address) const;
-    /// Live. The protocol of channel group `index`; 0 when there is none.
+    /// Live. The protocol of channel group `index`; 0 if it is missing.
     int ProtocolType(int index);
 
     /// At most `kDMSearchCapacity`.
     std::vector<long> ListSubDevicesByType(int type);
-    /// Those of all types, type by type.
+    /// The sub-devices of all types, type by type.
     std::vector<long> ListAllSubDevices();
     /// The names of all sub-devices; those without a name are left out.
     std::vector<std::string> ListAllSubDeviceNames();

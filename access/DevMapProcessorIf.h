@@ -6,20 +6,23 @@
 
 #include "access/DeviceMapperIf.h"
 
-/// A snapshot of one processor's attributes, read in one request.
+/// A `DevMapProcessorIf` is a snapshot of one processor's attributes, read in one request.
+///
+/// Several threads may read one record while none calls `PopulateAttributes()`.
 class KVLOAM_API DevMapProcessorIf {
   public:
     explicit DevMapProcessorIf(long auid);
 
-    /// Reads the attributes anew.
+    /// Reads the attributes anew. Deliberate: a name that is missing now stays as it was, while
+    /// other missing attributes read as missing.
     void PopulateAttributes();
 
-    /// Empty when it is missing.
+    /// Empty if no reading found one.
     std::string Name() const { return m_name; }
     long Auid() const { return m_auid; }
-    /// -1 when it is missing.
+    /// -1 if it is missing.
     long ProcessorNumber() const { return m_processorNumber; }
-    /// These four are "unknown" when missing.
+    /// These four are "unknown" if missing.
     std::string BootKernelVersion() const { return m_bootKernelVersion; }
     std::string BootKernelFilename() const { return m_bootKernelFilename; }
     std::string RealTimeKernelVersion() const { return m_realTimeKernelVersion; }

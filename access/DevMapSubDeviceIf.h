@@ -6,29 +6,33 @@
 
 #include "access/DeviceMapperIf.h"
 
-/// A snapshot of one sub-device's attributes (a time slot, a channel), read in one request.
+/// A `DevMapSubDeviceIf` is a snapshot of the attributes of one sub-device (a time slot, a
+/// channel), read in one request.
+///
+/// Several threads may read one record while none calls `PopulateAttributes()`.
 class KVLOAM_API DevMapSubDeviceIf {
   public:
-    /// The sub-device of that name; the name is only read. An unknown name makes a record in which
-    /// everything is missing.
+    /// The sub-device with this name, which is only read. If there is none, everything in the
+    /// record is missing.
     explicit DevMapSubDeviceIf(char* name);
     explicit DevMapSubDeviceIf(long auid);
 
-    /// Reads the attributes anew.
+    /// Reads the attributes anew. Deliberate: a name that is missing now stays as it was, while
+    /// other missing attributes read as missing.
     void PopulateAttributes();
 
-    /// Empty when it is missing.
+    /// Empty if no reading found one.
     std::string Name() const { return m_name; }
     long Auid() const { return m_auid; }
-    /// -1 when it is missing.
+    /// -1 if it is missing.
     long DeviceType() const { return m_deviceType; }
-    /// 0 when it is missing.
+    /// 0 if it is missing.
     long GetOutVariant() const { return m_outVariant; }
-    /// -1 when it is missing.
+    /// -1 if it is missing.
     long FrontEndType() const { return m_frontEndType; }
 
-    /// Each copies its descriptor and returns true; without one, leaves `address` alone and returns
-    /// false.
+    /// Each copies its descriptor and returns true. If there is none, it leaves `address` alone and
+    /// returns false.
     bool TSCAddress(QCompDesc& address) const;
     bool ClusterAddress(QCompDesc& address) const;
     bool CTBusAddress(QCompDesc& address) const;

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The device mapper: which boards there are.
+// The board platform's device mapper, and which boards it knows.
 #pragma once
 
 #include <string>
@@ -14,24 +14,28 @@ inline constexpr int kDMSearchCapacity = 100;
 /// The values of the attribute "TYPE".
 enum DMObjectType : int { DMObjectTypeBoard = 200, DMObjectTypeProcessor = 800 };
 
-/// The process's way to the board platform's device mapper. The first `get_interface()` must return
-/// before several threads use it; then all operations may be called from any thread.
+/// `DeviceMapperIf` is the process's access to the board platform's device mapper. Thread-safe once
+/// the first `get_interface()` has returned.
 class KVLOAM_API DeviceMapperIf {
   public:
     static std::string const NX5BoardPlatform;
     static std::string const QuillonBoardPlatform;
     static std::string const VORNBoardPlatform;
 
-    /// The single instance, made by the first call and never destroyed.
+    /// The single instance, created by the first call and never destroyed.
     static DeviceMapperIf* get_interface();
 
     DeviceMapperIf();
     ~DeviceMapperIf() = default;
 
-    /// The handles (AUIDs) of the boards, at most `kDMSearchCapacity`; empty when the search fails.
+    /// The handles (AUIDs) of the boards, at most `kDMSearchCapacity`; empty if the search fails.
     std::vector<long> ListAllBoards();
-    /// The same of the boards whose "CTPLATFORM" is `platform`.
+    /// The same for the boards whose "CTPLATFORM" is `platform`.
     std::vector<long> ListBoardsByPlatform(std::string const& platform);
+    /// Finds all boards, however many there are, and puts their handles into `boards`. Returns
+    /// whether the device mapper answered; if it did not, `boards` stays as it was, so that a
+    /// platform that is silent for a while is not taken for one without boards.
+    bool FindAllBoards(std::vector<long>& boards);
     /// The platform's client; owned by the platform.
     DeviceMapperClient* GetDMClient() { return m_client; }
 

@@ -1,8 +1,9 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "access/ExternalEventAdaptor.h"
 
-#include <cstdio>
 #include <cstring>
+
+#include "access/EventSubscription.h"
 
 ExternalEventAdaptor* ExternalEventAdaptor::m_eventAdaptor = nullptr;
 
@@ -24,27 +25,15 @@ ExternalEventAdaptor::~ExternalEventAdaptor() {
 }
 
 ReferenceCounter<ExternalEventAdaptor> ExternalEventAdaptor::get_instance() {
-    if (m_eventAdaptor == nullptr) {
-        m_eventAdaptor = new ExternalEventAdaptor;
-        // One handle that nobody drops keeps the instance.
-        static auto const* const keeper =
-            new ReferenceCounter<ExternalEventAdaptor>(m_eventAdaptor);
-        static_cast<void>(keeper);
-    }
-    return {m_eventAdaptor};
+    return KVL::only_adaptor(m_eventAdaptor, [] { return new ExternalEventAdaptor; });
 }
 
 void ExternalEventAdaptor::register_for_events() {
-    VqxEventService::AdminConsumer::FilterCallbackAssoc filters[] = {
-        {this, nullptr, AdminBoardStarted, 1},      {this, nullptr, AdminBoardStopped, 1},
-        {this, nullptr, AdminAllStarted, 1},        {this, nullptr, AdminAllStopped, 1},
-        {this, nullptr, AdminAllStartPending, 1},   {this, nullptr, AdminAllStopPending, 1},
-        {this, nullptr, AdminBoardGone, 1},         {this, nullptr, AdminBoardFailed, 1},
-        {this, nullptr, AdminBoardStartPending, 1}, {this, nullptr, AdminBoardStopPending, 1},
-    };
-    m_consumer = new VqxEventService::VqxAdminConsumer("ADMIN", L"SNMPMonitor", filters,
-                                                       std::size(filters), nullptr, 0);
-    m_consumer->Start();
+    m_consumer =
+        KVL::subscribe(*this, "ADMIN", L"SNMPMonitor",
+                       {AdminBoardStarted, AdminBoardStopped, AdminAllStarted, AdminAllStopped,
+                        AdminAllStartPending, AdminAllStopPending, AdminBoardGone, AdminBoardFailed,
+                        AdminBoardStartPending, AdminBoardStopPending});
 }
 
 void ExternalEventAdaptor::unregister_for_events() {}
@@ -64,10 +53,7 @@ int ExternalEventAdaptor::NotifyExternalEventListeners(ReferenceCounter<External
 
 int ExternalEventAdaptor::HandleEvent(AdminCallbackMsg* message, void* /*context*/) {
     std::uint32_t const id = message->id;
-    if (id < AdminAllStarted || id > AdminBoardStopPending) {
-        std::printf("UNKNOWN MSG:%u\n", id);
-        return 1;
-    }
+    if (id < AdminAllStarted || id > AdminBoardStopPending) return KVL::report_unknown_message(id);
     std::int32_t board = 0;
     if (id >= AdminBoardGone) std::memcpy(&board, message->payload, sizeof board);
     NotifyExternalEventListeners(ReferenceCounter<ExternalEvent>(new ExternalEvent(id, board)));

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Administrative messages of the board platform, turned into events for listeners.
+// The board platform's administrative messages, turned into events for listeners.
 #pragma once
 
 #include <cstdint>
@@ -23,7 +23,7 @@ enum AdminMessage : std::uint32_t {
     AdminBoardStopPending = 0x4000A
 };
 
-/// One administrative message.
+/// An `ExternalEvent` is one administrative message.
 class KVLOAM_API ExternalEvent : public Object {
   public:
     ExternalEvent(std::uint32_t id, std::int32_t data);
@@ -40,7 +40,7 @@ class KVLOAM_API ExternalEvent : public Object {
     std::int32_t m_data;
 };
 
-/// Told of administrative messages, on the platform's delivery thread.
+/// An `ExternalEventListener` receives administrative messages, on the platform's delivery thread.
 class KVLOAM_API ExternalEventListener : public EventListener {
   public:
     /// The result is ignored.
@@ -50,14 +50,14 @@ class KVLOAM_API ExternalEventListener : public EventListener {
     ~ExternalEventListener() = default;
 };
 
-/// Subscribes to the channel "ADMIN" and hands its messages to listeners, one after the other, on
-/// the platform's delivery thread. Listeners may be added from any thread; its lock is never held
-/// during a callback.
+/// The `ExternalEventAdaptor` subscribes to the channel "ADMIN" and passes its messages to the
+/// listeners, one after the other, on the platform's delivery thread. Thread-safe once the first
+/// `get_instance()` has returned. Its lock is never held during a callback.
 class KVLOAM_API ExternalEventAdaptor final : public Object,
                                               public VqxEventService::CEventHandlerAdaptor {
   public:
-    /// The single instance, made and subscribed by the first call, which must return before several
-    /// threads use it. It lives as long as the process, whatever becomes of the returned handles.
+    /// The single instance, created and subscribed by the first call. It lives as long as the
+    /// process, even if every returned handle is dropped.
     static ReferenceCounter<ExternalEventAdaptor> get_instance();
 
     ~ExternalEventAdaptor() override;
@@ -67,7 +67,7 @@ class KVLOAM_API ExternalEventAdaptor final : public Object,
     void register_for_events();
     /// Does nothing: the subscription lasts as long as the process.
     void unregister_for_events();
-    /// Adds `listener`, once. Returns 0. The listener is not owned and can not be removed.
+    /// Adds `listener`, once. Returns 0. The listener is not owned and cannot be removed.
     int AddExternalEventListener(ExternalEventListener* listener);
     /// Returns 0.
     int NotifyExternalEventListeners(ReferenceCounter<ExternalEvent> event);

@@ -1,10 +1,10 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "access/ExternalFaultEventAdaptor.h"
 
-#include <cstdio>
 #include <cstring>
 
 #include "access/DevMapBoardIf.h"
+#include "access/EventSubscription.h"
 
 ExternalFaultEventAdaptor* ExternalFaultEventAdaptor::m_faultEventAdaptor = nullptr;
 
@@ -26,24 +26,12 @@ ExternalFaultEventAdaptor::~ExternalFaultEventAdaptor() {
 }
 
 ReferenceCounter<ExternalFaultEventAdaptor> ExternalFaultEventAdaptor::get_instance() {
-    if (m_faultEventAdaptor == nullptr) {
-        m_faultEventAdaptor = new ExternalFaultEventAdaptor;
-        // One handle that nobody drops keeps the instance.
-        static auto const* const keeper =
-            new ReferenceCounter<ExternalFaultEventAdaptor>(m_faultEventAdaptor);
-        static_cast<void>(keeper);
-    }
-    return {m_faultEventAdaptor};
+    return KVL::only_adaptor(m_faultEventAdaptor, [] { return new ExternalFaultEventAdaptor; });
 }
 
 void ExternalFaultEventAdaptor::register_for_events() {
-    VqxEventService::AdminConsumer::FilterCallbackAssoc filters[] = {
-        {this, nullptr, FaultRaised, 1},
-        {this, nullptr, FaultCleared, 1},
-    };
-    m_consumer = new VqxEventService::VqxAdminConsumer("FAULT", L"SNMPFaultChannelMonitor", filters,
-                                                       std::size(filters), nullptr, 0);
-    m_consumer->Start();
+    m_consumer =
+        KVL::subscribe(*this, "FAULT", L"SNMPFaultChannelMonitor", {FaultRaised, FaultCleared});
 }
 
 void ExternalFaultEventAdaptor::unregister_for_events() {}
@@ -70,10 +58,7 @@ int ExternalFaultEventAdaptor::NotifyExternalFaultEventListeners(
 
 int ExternalFaultEventAdaptor::HandleEvent(AdminCallbackMsg* message, void* /*context*/) {
     std::uint32_t const id = message->id;
-    if (id != FaultRaised && id != FaultCleared) {
-        std::printf("UNKNOWN MSG:%u\n", id);
-        return 1;
-    }
+    if (id != FaultRaised && id != FaultCleared) return KVL::report_unknown_message(id);
     auto const* const payload = static_cast<unsigned char const*>(message->payload);
     std::int32_t auid = 0;
     std::uint16_t fault = 0;

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Fault messages of the board platform, turned into events for listeners.
+// The board platform's fault messages, turned into events for listeners.
 #pragma once
 
 #include <cstdint>
@@ -11,7 +11,7 @@
 /// The messages of the channel "FAULT".
 enum FaultMessage : std::uint32_t { FaultRaised = 0x30001, FaultCleared = 0x30002 };
 
-/// One fault message.
+/// An `ExternalFaultEvent` is one fault message.
 class KVLOAM_API ExternalFaultEvent : public Object {
   public:
     ExternalFaultEvent(std::uint32_t id, std::int32_t board, std::uint16_t fault);
@@ -20,7 +20,7 @@ class KVLOAM_API ExternalFaultEvent : public Object {
     /// The platform's message identifier.
     virtual std::uint32_t GetEventID();
 
-    /// The board's logical identifier, or its driver board identifier where it has no logical one.
+    /// The board's logical identifier, or its driver board identifier if it has no logical one.
     std::int32_t GetBoardID() const { return m_board; }
     /// The platform's fault value, unchanged.
     std::uint16_t GetFault() const { return m_fault; }
@@ -31,7 +31,7 @@ class KVLOAM_API ExternalFaultEvent : public Object {
     std::uint16_t m_fault;
 };
 
-/// Told of fault messages, on the platform's delivery thread.
+/// An `ExternalFaultEventListener` receives fault messages, on the platform's delivery thread.
 class KVLOAM_API ExternalFaultEventListener : public EventListener {
   public:
     /// The result is ignored.
@@ -41,14 +41,14 @@ class KVLOAM_API ExternalFaultEventListener : public EventListener {
     ~ExternalFaultEventListener() = default;
 };
 
-/// Subscribes to the channel "FAULT" and hands its messages to listeners, one after the other, on
-/// the platform's delivery thread. Listeners may be added and removed from any thread; its lock is
-/// never held during a callback.
+/// The `ExternalFaultEventAdaptor` subscribes to the channel "FAULT" and passes its messages to the
+/// listeners, one after the other, on the platform's delivery thread. Thread-safe once the first
+/// `get_instance()` has returned. Its lock is never held during a callback.
 class KVLOAM_API ExternalFaultEventAdaptor final : public Object,
                                                    public VqxEventService::CEventHandlerAdaptor {
   public:
-    /// The single instance, made and subscribed by the first call, which must return before several
-    /// threads use it. It lives as long as the process, whatever becomes of the returned handles.
+    /// The single instance, created and subscribed by the first call. It lives as long as the
+    /// process, even if every returned handle is dropped.
     static ReferenceCounter<ExternalFaultEventAdaptor> get_instance();
 
     ~ExternalFaultEventAdaptor() override;
@@ -60,7 +60,7 @@ class KVLOAM_API ExternalFaultEventAdaptor final : public Object,
     void unregister_for_events();
     /// Adds `listener`, once. Returns 0. The listener is not owned.
     int AddExternalFaultEventListener(ExternalFaultEventListener* listener);
-    /// Returns 0, or 1 when `listener` is not among the listeners. A notification under way on
+    /// Returns 0, or 1 if `listener` is not among the listeners. A notification under way on
     /// another thread may still reach it.
     int RemoveExternalFaultEventListener(ExternalFaultEventListener* listener);
     /// Returns 0.

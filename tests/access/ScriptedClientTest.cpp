@@ -3,6 +3,7 @@
 // program has a device mapper client of its own in the place of the platform's.
 #include <cstring>
 
+#include <algorithm>
 #include <functional>
 #include <set>
 #include <string>
@@ -11,6 +12,9 @@
 #include <gtest/gtest.h>
 
 #include "access/DevMapBoardIf.h"
+#include "access/DevMapDeviceIf.h"
+#include "access/DevMapProcessorIf.h"
+#include "access/DevMapSubDeviceIf.h"
 
 namespace {
 
@@ -29,7 +33,7 @@ class ScriptedClient final : public DeviceMapperClient {
     int Reserved3() override { return 1; }
     int GetRootObject(long* auid) override {
         *auid = 1;
-        return 0;
+        return rootResult;
     }
     int FindObjectByName(char* /*name*/, long* /*auid*/) override { return 1; }
     int GetAttributes(long /*auid*/, int count, DMAttribute* requests) override {
@@ -41,6 +45,7 @@ class ScriptedClient final : public DeviceMapperClient {
         return result;
     }
 
+    int rootResult = 0;
     int searches = 0;
     int lastCriteria = 0;
     int lastCapacity = 0;
@@ -146,6 +151,62 @@ TEST_F(ScriptedClientTest, ConditionKeepsWhatWasWrittenUnlessTheRequestFailsInPa
     EXPECT_EQ(board.BoardPresent(), -1);
 }
 
+TEST_F(ScriptedClientTest, ConditionOfTwoBytesIsSignExtended) {
+    std::int16_t written = 3;
+    s_client->onAttribute = [&](DMAttribute& request) {
+        if (request.size != 4) return;
+        std::memcpy(request.value, &written, sizeof written);
+        request.size = sizeof written;
+    };
+    DevMapBoardIf board(5);
+    EXPECT_EQ(board.BoardCondition(), 3);
+    EXPECT_EQ(board.BoardPresent(), 3);
+    EXPECT_EQ(board.LogicalID(), 3);
+    written = -7;
+    EXPECT_EQ(board.BoardCondition(), -7);
+    EXPECT_EQ(board.BoardPresent(), -7);
+    EXPECT_EQ(board.LogicalID(), -7);
+}
+
+/// Makes a record of an object that has a name, a kernel version and a descriptor, reads it again
+/// when they are gone, and returns it.
+template <class Record>
+Record readTwice() {
+    s_client->onAttribute = [](DMAttribute& request) {
+        if (request.size == 128) std::strcpy(static_cast<char*>(request.value), "former");
+    };
+    Record record(7L);
+    EXPECT_EQ(record.Name(), "former");
+    s_client->result = kDMSomeAttributesFailed;
+    s_client->onAttribute = ScriptedClient::missing;
+    record.PopulateAttributes();
+    return record;
+}
+
+TEST_F(ScriptedClientTest, NameThatIsGoneAtTheNextReadingStaysAsItWas) {
+    EXPECT_EQ(readTwice<DevMapDeviceIf>().Name(), "former");
+    EXPECT_EQ(readTwice<DevMapSubDeviceIf>().Name(), "former");
+    EXPECT_EQ(readTwice<DevMapProcessorIf>().Name(), "former");
+}
+
+TEST_F(ScriptedClientTest, OtherAttributesThatAreGoneAtTheNextReadingAreMissing) {
+    auto const device = readTwice<DevMapDeviceIf>();
+    QCompDesc address{};
+    EXPECT_EQ(device.DeviceType(), -1);
+    EXPECT_FALSE(device.LineAdminAddress(address));
+    EXPECT_EQ(readTwice<DevMapSubDeviceIf>().FrontEndType(), -1);
+    EXPECT_FALSE(readTwice<DevMapSubDeviceIf>().TSCAddress(address));
+    auto const processor = readTwice<DevMapProcessorIf>();
+    EXPECT_EQ(processor.ProcessorNumber(), -1);
+    EXPECT_EQ(processor.BootKernelVersion(), "unknown");
+}
+
+TEST_F(ScriptedClientTest, NameThatIsMissingFromTheStartIsEmpty) {
+    EXPECT_EQ(DevMapDeviceIf(7L).Name(), "");
+    EXPECT_EQ(DevMapSubDeviceIf(7L).Name(), "");
+    EXPECT_EQ(DevMapProcessorIf(7L).Name(), "");
+}
+
 TEST_F(ScriptedClientTest, DateOfAFailedRequestIsZero) {
     s_client->onAttribute = [](DMAttribute& request) {
         if (request.size == 128)
@@ -200,6 +261,38 @@ TEST_F(ScriptedClientTest, BoardSearchHasOneCriterionAndRoomForOneHundred) {
     EXPECT_EQ(s_client->lastCapacity, 100);
     EXPECT_EQ(s_client->lastCriterion,
               std::string(reinterpret_cast<char const*>(&type), sizeof type));
+}
+
+TEST_F(ScriptedClientTest, SearchForAllBoardsTakesMoreThanOneHundred) {
+    s_client->onFind = [](int* found, long* auids) {
+        *found = std::min(*found, 700);
+        for (int i = 0; i < *found; ++i)
+            auids[i] = i;
+        return 0;
+    };
+    std::vector<long> boards;
+    EXPECT_TRUE(mapper().FindAllBoards(boards));
+    ASSERT_EQ(boards.size(), 700U);
+    EXPECT_EQ(boards.back(), 699);
+}
+
+TEST_F(ScriptedClientTest, SearchForAllBoardsThatFailsLeavesWhatIsKnown) {
+    std::vector<long> boards{3, 5};
+    s_client->onFind = [](int* /*found*/, long* /*auids*/) { return 1; };
+    EXPECT_FALSE(mapper().FindAllBoards(boards));
+    s_client->onFind = [](int* found, long* /*auids*/) { return *found > 256 ? 1 : 0; };
+    EXPECT_FALSE(mapper().FindAllBoards(boards));
+    s_client->onFind = [](int* found, long* /*auids*/) { return *found = 0; };
+    s_client->rootResult = 1;
+    EXPECT_FALSE(mapper().FindAllBoards(boards));
+    EXPECT_EQ(boards, (std::vector<long>{3, 5}));
+}
+
+TEST_F(ScriptedClientTest, SearchForAllBoardsFindsNoneWhereThereAreNone) {
+    std::vector<long> boards{3, 5};
+    s_client->onFind = [](int* found, long* /*auids*/) { return *found = 0; };
+    EXPECT_TRUE(mapper().FindAllBoards(boards));
+    EXPECT_TRUE(boards.empty());
 }
 
 TEST_F(ScriptedClientTest, PlatformCriterionIncludesTheTerminator) {

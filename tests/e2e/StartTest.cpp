@@ -73,6 +73,9 @@ class NoThreadsScope {
 };
 
 TEST_F(StartTest, SystemThatRefusesThreadsEndsTheStartWithAClearLine) {
+#ifdef __SANITIZE_THREAD__
+    GTEST_SKIP() << "ThreadSanitizer takes no other stack limit";
+#endif
     NoThreadsScope const scope;
     if (!scope.isSet()) GTEST_SKIP() << "the stack limit cannot be raised here";
     Result const result = start({"--module", "z7sim"});

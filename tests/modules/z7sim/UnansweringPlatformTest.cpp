@@ -23,13 +23,14 @@ class SearchedClient final : public DeviceMapperClient {
     int Reserved3() override { return 1; }
     int GetRootObject(long* auid) override {
         *auid = 4711;
-        return 0;
+        return rootResult;
     }
     int FindObjectByName(char* /*name*/, long* /*auid*/) override { return 1; }
     int GetAttributes(long /*auid*/, int /*count*/, DMAttribute* /*requests*/) override {
         return 1;
     }
 
+    int rootResult = 0;
     long lastParent = 0;
     std::vector<int> capacities;
     std::function<int(int*, long*)> onFind;
@@ -72,6 +73,14 @@ TEST_F(UnansweringPlatformTest, FailedSearchDoesNotMakeTheBoardsGo) {
     EXPECT_EQ(boards(), (std::vector<long>{3, 5}));
     find({5});
     EXPECT_EQ(boards(), (std::vector<long>{5}));
+}
+
+TEST_F(UnansweringPlatformTest, MissingRootDoesNotMakeTheBoardsGo) {
+    find({3, 5});
+    boards();
+    client().rootResult = 1;
+    find({});
+    EXPECT_EQ(boards(), (std::vector<long>{3, 5}));
 }
 
 TEST_F(UnansweringPlatformTest, SearchThatNeverAnsweredFindsNoBoards) {
