@@ -18,7 +18,8 @@ class FaultLogTest : public ::testing::Test {
         return indices;
     }
 
-    Clock::time_point m_started = Clock::now() - std::chrono::hours(1);
+    /// An hour before the clock's zero: a time point that was never set does not count as long ago.
+    Clock::time_point m_started = Clock::time_point() - std::chrono::hours(1);
     FaultLog m_log{3};
 };
 
