@@ -16,6 +16,7 @@
 #include "access/ExternalEventAdaptor.h"
 #include "access/ExternalFaultEventAdaptor.h"
 #include "agent/daemon/FrontChoice.h"
+#include "agent/daemon/InterruptibleStart.h"
 #include "agent/daemon/ModuleLoader.h"
 #include "agent/daemon/ServiceNotice.h"
 #include "agent/daemon/Signals.h"
@@ -68,19 +69,23 @@ struct Boards {
     FaultListener faultListener;
 };
 
-/// Creates the library's singletons, whose first calls must come from one thread, and asks the
-/// platform for its root object. Returns whether the platform answered.
-bool platformAnswers() {
-    ReferenceTable::get_instance();
+/// Asks the platform for its root object. Returns whether it answered.
+bool rootObjectAnswers() {
     DeviceMapperClient* const client = DeviceMapperIf::get_interface()->GetDMClient();
     long root = -1;
     int const result = client == nullptr ? -1 : client->GetRootObject(&root);
-    if (result != 0) {
-        log(LogLevel::Error, "the board platform does not answer: its device mapper gives no root "
-                             "object (result " +
-                                 std::to_string(result) + "); check that the platform runs");
-        return false;
-    }
+    if (result == 0) return true;
+    log(LogLevel::Error, "the board platform does not answer: its device mapper gives no root "
+                         "object (result " +
+                             std::to_string(result) + "); check that the platform runs");
+    return false;
+}
+
+/// Creates the library's singletons, whose first calls must come from one thread. Returns whether
+/// the platform answers.
+bool platformAnswers() {
+    ReferenceTable::get_instance();
+    if (!rootObjectAnswers()) return false;
     ExternalEventAdaptor::get_instance();
     ExternalFaultEventAdaptor::get_instance();
     return true;
@@ -227,7 +232,7 @@ class KeptSettings {
 };
 
 void serve(Options const& options, ReadOptions const& readAgain, Front& front,
-           Signals const& signals, Boards& boards) {
+           Signals const& signals, InterruptibleStart& start, Boards& boards) {
     Clock::time_point const started = boards.counters.started;
     Wakeup wakeup;
     ServiceManager& services = *ServiceManager::GetInstance();
@@ -297,6 +302,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     ListeningScope listening(boards, [&] { collector.renew(); });
     log(LogLevel::Info, serving);
     notice.ready(serving);
+    start.end();
     front.run();
     signals.letStopThrough();
     notice.stopping();
@@ -318,8 +324,10 @@ int runDaemon(Options const& options, ReadOptions const& readAgain) {
     tzset();
     // The library's threads access these until the process ends.
     static auto* const boards = new Boards(options.enterprise);
-    std::string_view step = "loading the board modules";
+    std::string_view step = "starting";
     try {
+        InterruptibleStart start(signals);
+        step = "loading the board modules";
         std::vector<LoadedModule> const modules = loadModules(options);
         if (modules.empty())
             log(LogLevel::Warning,
@@ -334,7 +342,7 @@ int runDaemon(Options const& options, ReadOptions const& readAgain) {
         step = "reading the boards";
         attachModules(modules, *boards);
         step = "serving";
-        serve(options, readAgain, *front, signals, *boards);
+        serve(options, readAgain, *front, signals, start, *boards);
         log(LogLevel::Info, "stopped");
     } catch (std::bad_alloc const&) {
         logLack("memory", step);
@@ -353,7 +361,8 @@ int runDaemon(Options const& options, ReadOptions const& readAgain) {
 }
 
 int checkConfiguration(Options const& options) {
-    bool good = true;
+    // Reads the description of a simulated platform, for example.
+    bool good = rootObjectAnswers();
     for (std::string const& name : options.modules) {
         try {
             LoadedModule(name, options.moduleDirectory);

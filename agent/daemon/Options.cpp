@@ -3,11 +3,15 @@
 
 #include <charconv>
 #include <cstdlib>
+#include <filesystem>
 #include <map>
+#include <set>
 #include <sstream>
+#include <system_error>
 
 #include <CLI/CLI.hpp>
 
+#include "agent/daemon/ConfigFile.h"
 #include "agent/fronts/agentx/AgentxAddress.h"
 #include "services/oam.h"
 
@@ -26,15 +30,63 @@ std::string checkOid(std::string const& text) {
                : "'" + text + "' is not an object identifier; write it like 1.3.6.1.4.1.32473";
 }
 
+std::string checkLogLevel(std::string const& text) {
+    return kLogLevels.contains(CLI::detail::to_lower(text))
+               ? std::string()
+               : "'" + text + "' is not a log level; write error, warning, info or debug";
+}
+
 /// The SNMP library takes an empty address for port 161 on all interfaces.
 std::string checkAddress(std::string const& text) {
     return text.empty() ? "the address is empty; write it like udp:127.0.0.1:1161" : std::string();
 }
 
+/// Where the modules are: as the environment says; else beside the running program, in an
+/// installation or a build tree; else where they would be installed.
 std::string defaultModuleDirectory() {
     char const* const directory = std::getenv("KVLOAM_MODULE_DIR");
-    return directory != nullptr && *directory != '\0' ? directory : KVLOAM_MODULE_DIRECTORY;
+    if (directory != nullptr && *directory != '\0') return directory;
+    std::error_code error;
+    auto const program = std::filesystem::read_symlink("/proc/self/exe", error);
+    if (!error) {
+        for (char const* const libraries : {KVLOAM_LIBRARIES_FROM_PROGRAM, "../lib"}) {
+            auto const beside = (program.parent_path() / libraries / "kvloam").lexically_normal();
+            if (std::filesystem::is_directory(beside, error)) return beside;
+        }
+    }
+    return KVLOAM_MODULE_DIRECTORY;
 }
+
+/// The configuration file, checked line by line before CLI11 reads it.
+class CheckedConfig final : public CLI::ConfigTOML {
+  public:
+    explicit CheckedConfig(CLI::App const& app) : m_app(app) {}
+
+    std::vector<CLI::ConfigItem> from_config(std::istream& input) const override {
+        std::stringstream text;
+        text << input.rdbuf();
+        std::set<std::string> keys;
+        for (CLI::Option const* const option : m_app.get_options())
+            if (option->get_configurable() && !option->get_lnames().empty())
+                keys.insert(option->get_lnames().front());
+        m_lines = checkConfigFile(text, keys);
+        text.clear();
+        text.seekg(0);
+        return CLI::ConfigTOML::from_config(text);
+    }
+    /// The line that sets the option of which `message` complains, as CLI11 writes it:
+    /// "--port: ..."; 0 if there is none.
+    int lineOf(std::string const& message) const {
+        for (auto const& [key, line] : m_lines)
+            if (message.starts_with("--" + key + ":") || message.starts_with("--" + key + " "))
+                return line;
+        return 0;
+    }
+
+  private:
+    CLI::App const& m_app;
+    mutable std::map<std::string, int> m_lines;
+};
 
 /// The conflict between options that are valid by themselves; empty: none.
 std::string checkTogether(Options const& options, bool listens) {
@@ -130,31 +182,43 @@ std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
                    "The lowest ifIndex for new interfaces")
         ->check(CLI::Range(1, 1000000000))
         ->capture_default_str();
-    app.add_option("--log-level", options.logLevel, "error, warning, info or debug")
-        ->transform(CLI::CheckedTransformer(kLogLevels, CLI::ignore_case))
-        ->option_text("LEVEL");
+    std::string logLevel = "info";
+    app.add_option("--log-level", logLevel, "The least severe messages to write")
+        ->type_name("error|warning|info|debug")
+        ->check(checkLogLevel)
+        ->capture_default_str();
     app.add_flag("--check-config", options.checkConfig,
                  "Check options, modules and configuration, then exit")
         ->configurable(false);
     app.set_config("--config", "", "Read options from this file, as in module=[\"z7sim\"]")
         ->type_name("FILE");
     app.allow_config_extras(CLI::config_extras_mode::error);
+    auto const config = std::make_shared<CheckedConfig>(app);
+    app.config_formatter(config);
+    // Where the fault is: "kvloamd.toml:3: ".
+    auto const inFile = [&](int line) {
+        return app.get_config_ptr()->as<std::string>() + ':' + std::to_string(line) + ": ";
+    };
 
     try {
         app.parse(argc, argv);
     } catch (CLI::FileError const& error) {
         return Exit{kExitFailure, oneLine(error.what()) + "; check --config"};
-    } catch (CLI::ConfigError const& error) {
-        return Exit{kExitFailure, "the file that --config names: " + oneLine(error.what()) +
-                                      "; its keys are the long options' names, as in port=1161"};
+    } catch (ConfigFault const& fault) {
+        return Exit{kExitFailure, inFile(fault.line()) + fault.what()};
     } catch (CLI::ParseError const& error) {
         if (error.get_exit_code() == 0) {
             std::ostringstream text;
             app.exit(error, text, text);
             return Exit{0, text.str()};
         }
-        return Exit{kExitUsage, oneLine(error.what()) + "; try kvloamd --help"};
+        std::string text = oneLine(error.what());
+        // An option of the command line replaces that of the file, which is then not read.
+        if (int const line = config->lineOf(text); line > 0)
+            return Exit{kExitFailure, inFile(line) + text};
+        return Exit{kExitUsage, std::move(text) + "; try kvloamd --help"};
     }
+    options.logLevel = kLogLevels.at(CLI::detail::to_lower(logLevel));
     if (agentxOption->count() > 0 && options.agentx.empty()) options.agentx = kMasterAddress;
     if (std::string fault = checkTogether(options, !listen.empty() || port != 0); !fault.empty())
         return Exit{kExitUsage, std::move(fault) + "; try kvloamd --help"};

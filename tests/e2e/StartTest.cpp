@@ -80,7 +80,7 @@ TEST_F(StartTest, SystemThatRefusesThreadsEndsTheStartWithAClearLine) {
     if (!scope.isSet()) GTEST_SKIP() << "the stack limit cannot be raised here";
     Result const result = start({"--module", "z7sim"});
     EXPECT_EQ(result.status, kExitFailure);
-    EXPECT_THAT(result.output, HasSubstr("kvloamd: the system refuses a thread for the scheduler"));
+    EXPECT_THAT(result.output, HasSubstr("kvloamd: the system refused a thread while starting"));
 }
 
 TEST_F(StartTest, AddressOfAnotherHostIsRefused) {
@@ -154,7 +154,20 @@ TEST_F(StartTest, CheckNamesEveryFault) {
     Result const result = start({"--module", "nothing", "--check-config"});
     EXPECT_EQ(result.status, kExitFailure);
     EXPECT_THAT(result.output, AllOf(HasSubstr("'nothing'"), HasSubstr("rouserr"),
-                                     HasSubstr("rocommunityy"), Not(HasSubstr("is good"))));
+                                     HasSubstr("rocommunityy"), Not(HasSubstr("is valid"))));
+}
+
+TEST_F(StartTest, CheckNamesTheFaultOfABrokenChassis) {
+    useChassis("boards:\n  - {handle: many}\n");
+    Result const result = start({"--module", "z7sim", "--check-config"});
+    EXPECT_EQ(result.status, kExitFailure);
+    EXPECT_THAT(result.output, AllOf(HasSubstr("yaml:2"), HasSubstr("does not answer")));
+}
+
+TEST_F(StartTest, ModulesAreFoundBesideTheProgram) {
+    Result const result =
+        runAgent({"--module", "z7sim", "--snmp-config", path("snmp.conf"), "--check-config"});
+    EXPECT_EQ(result.status, 0) << result.output;
 }
 
 TEST_F(StartTest, ConfigurationThatIsFoundByItselfIsCheckedToo) {

@@ -57,6 +57,37 @@ TEST_F(StopTest, TerminationWhileBoardsComeAndGoEndsTheAgent) {
     operating.join();
 }
 
+/// A module that never returns keeps the agent from starting.
+class StopDuringStartTest : public AgentFixture {
+  protected:
+    void launchHangingAgent() {
+        launchAgent({"--port", std::to_string(freePort()), "--module", "hanging", "--module-dir",
+                     BROKEN_MODULE_DIR, "--snmp-config", path("snmp.conf"), "--persistent-dir",
+                     path("persistent")});
+        ASSERT_TRUE(agent().waitFor("the module hangs")) << agent().output();
+    }
+};
+
+TEST_F(StopDuringStartTest, TerminationEndsAStartThatHangs) {
+    launchHangingAgent();
+    agent().signal(SIGTERM);
+    EXPECT_EQ(agent().wait(), 128 + SIGTERM);
+    EXPECT_THAT(agent().output(), HasSubstr("kvloamd: stopped during the start"));
+}
+
+TEST_F(StopDuringStartTest, InterruptEndsAStartThatHangs) {
+    launchHangingAgent();
+    agent().signal(SIGINT);
+    EXPECT_GE(agent().wait(), 128);
+}
+
+TEST_F(StopDuringStartTest, HangUpDoesNotEndTheStart) {
+    launchHangingAgent();
+    agent().signal(SIGHUP);
+    agent().signal(SIGTERM);
+    EXPECT_EQ(agent().wait(), 128 + SIGTERM);
+}
+
 TEST_F(StopTest, AgentStartsAgainOnTheSamePortAfterwards) {
     startAgent();
     std::string const port = address().substr(address().find(':') + 1);

@@ -164,10 +164,33 @@ TEST_F(OptionsTest, CommandLineWinsOverTheFile) {
                 ElementsAre("udp:127.0.0.1:4712"));
 }
 
-TEST_F(OptionsTest, UnknownKeyInTheFileIsNamed) {
-    Exit const exit = refusal({"--config", file("prot=4711\n")});
+TEST_F(OptionsTest, UnknownKeyInTheFileIsNamedWithFileAndLine) {
+    std::string const name = file("port=4711\n\nprot=4711\n");
+    Exit const exit = refusal({"--config", name.c_str()});
     EXPECT_EQ(exit.status, kExitFailure);
-    EXPECT_THAT(exit.text, HasSubstr("prot"));
+    EXPECT_THAT(exit.text, HasSubstr(name + ":3: unknown key 'prot'"));
+}
+
+TEST_F(OptionsTest, ValueThatTheOptionRefusesIsNamedWithFileAndLine) {
+    std::string const name = file("# the port\nport=many\n");
+    Exit const exit = refusal({"--config", name.c_str()});
+    EXPECT_EQ(exit.status, kExitFailure);
+    EXPECT_THAT(exit.text, HasSubstr(name + ":2: --port"));
+}
+
+TEST_F(OptionsTest, LogLevelOfTheFileThatDoesNotExistIsNamedWithTheOnesThatDo) {
+    std::string const name = file("log-level=\"loud\"\n");
+    EXPECT_THAT(refusal({"--config", name.c_str()}).text,
+                AllOf(HasSubstr(name + ":1: "), HasSubstr("'loud'"),
+                      HasSubstr("error, warning, info or debug")));
+}
+
+TEST_F(OptionsTest, ModulesAreFoundBesideTheProgram) {
+    unsetenv("KVLOAM_MODULE_DIR");
+    auto const program = std::filesystem::read_symlink("/proc/self/exe");
+    auto const beside = program.parent_path().parent_path() / "lib" / "kvloam";
+    ASSERT_TRUE(std::filesystem::is_directory(beside)) << beside;
+    EXPECT_EQ(options({}).moduleDirectory, beside);
 }
 
 TEST_F(OptionsTest, FileThatIsNotThereIsNamed) {
