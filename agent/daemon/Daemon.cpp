@@ -300,9 +300,9 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
                         earliest(notifier.send(collector.newest()->begun), notice.beat()));
     });
     ListeningScope listening(boards, [&] { collector.renew(); });
+    start.end();
     log(LogLevel::Info, serving);
     notice.ready(serving);
-    start.end();
     front.run();
     signals.letStopThrough();
     notice.stopping();
