@@ -46,7 +46,7 @@ void DevMapSubDeviceIf::PopulateAttributes() {
     if (requests[0].status == 0) m_name = name.text();
     m_deviceType = type.inPlace(requests[1], result);
     m_hasTSCAddress = requests[2].status == 0;
-    m_outVariant = outVariant;
+    m_outVariant = outVariant; // NOLINT(bugprone-signed-char-misuse): it has a sign
     if (result == kDMSomeAttributesFailed && requests[3].status != 0) m_outVariant = 0;
     m_hasClusterAddress = requests[4].status == 0;
     m_hasCTBusAddress = requests[5].status == 0;

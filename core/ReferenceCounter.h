@@ -39,7 +39,10 @@ class ReferenceCounter : public Object {
     /// Takes over what `other` holds; `other` ends empty. Not `noexcept`: each handle is an
     /// `Object` with an identifier list of its own, so making one allocates. When that fails,
     /// `other` keeps what it holds.
-    ReferenceCounter(ReferenceCounter&& other) : Object(false) { takeOver(other); }
+    ReferenceCounter(ReferenceCounter&& other) // NOLINT(performance-noexcept-move-constructor)
+        : Object(false) {
+        takeOver(other);
+    }
 
     /// Deliberate: releases its own object before it takes the other's, without a test for
     /// self-assignment. Assigning the only handle of an object to itself deletes the object and

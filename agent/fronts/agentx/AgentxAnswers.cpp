@@ -9,7 +9,7 @@ namespace kvloamd {
 namespace {
 
 /// A longer answer to one request is cut; the master asks for the rest.
-constexpr std::size_t kLongAnswer = 32 * 1024;
+constexpr std::size_t kLongAnswer = std::size_t{32} * 1024;
 
 } // namespace
 

@@ -54,7 +54,7 @@ class AgentxError : public std::runtime_error {
 struct AgentxHeader {
     static constexpr std::size_t kSize = 20;
     /// No packet of a master comes near it.
-    static constexpr std::size_t kMaxPayload = 1024 * 1024;
+    static constexpr std::size_t kMaxPayload = std::size_t{1024} * 1024;
 
     AgentxKind kind = AgentxKind::Ping;
     bool hasContext = false;

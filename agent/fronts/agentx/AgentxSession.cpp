@@ -24,7 +24,7 @@ constexpr std::uint8_t kReasonShutdown = 5;
 constexpr std::uint8_t kPriority = 127;
 
 /// A master that asks on and never reads is given up at this many octets.
-constexpr std::size_t kMaxUnread = 4 * 1024 * 1024;
+constexpr std::size_t kMaxUnread = std::size_t{4} * 1024 * 1024;
 
 std::string nameOf(AgentxFault fault) {
     switch (fault) {
