@@ -56,10 +56,10 @@ static_assert(sizeof(DS1Interval) == 40);
 /// value of each counter; a row read while an interval is closed may mix both.
 ///
 /// Lifetime: the table is on the scheduler's list from the base's construction to the base's
-/// destruction, but ticks reach it only while it has a handle. A constructor may therefore take its
-/// time and needs no call of the scheduler. A tick may be under way when the last handle goes: the
-/// destructor of a table whose ticks use members must begin with `Remove(this)` of the scheduler,
-/// which waits for that tick. A table must be neither made nor destroyed in a scheduled action.
+/// destruction, but ticks reach it only while it has a handle. A constructor may take its time and
+/// ends with `ChangePeriod(this, 1)` of the scheduler, which orders its writes before later ticks.
+/// The destructor of a table whose ticks use members begins with `Remove(this)`, which waits for a
+/// tick under way. A table must be neither made nor destroyed in a scheduled action.
 class KVLOAM_API DS1IntervalTable : public Object, public Schedulable {
   public:
     static constexpr int kIntervals = 96;
