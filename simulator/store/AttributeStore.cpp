@@ -42,19 +42,15 @@ struct AttributeStore::Reading {
     }
 };
 
-namespace {
-
-/// Runs a call of the storage library: whatever the file does to it is QSB_EGENERAL.
+/// Runs a call of the storage library. What is wrong with the file is QSB_EGENERAL.
 template <typename Call>
-QSBResult guarded(Call call) {
+QSBResult AttributeStore::guarded(Call call) const {
     try {
-        return call();
+        return undoingUnfinished(call);
     } catch (std::exception const&) {
         return QSB_EGENERAL;
     }
 }
-
-} // namespace
 
 AttributeStore::AttributeStore(std::function<StoreContents()> contents)
     : m_contents(std::move(contents)) {}

@@ -16,6 +16,7 @@
 #include "boardplatform/qsb.h"
 #include "simulator/store/Database.h"
 #include "simulator/store/StoreContents.h"
+#include "simulator/store/StoreFile.h"
 
 namespace kvlsim {
 
@@ -83,6 +84,18 @@ class AttributeStore {
     Database openFile(DatabaseUse use);
     template <typename Change>
     void change(Change change);
+    template <typename Call>
+    QSBResult guarded(Call call) const;
+    /// Runs `call`, and once more when a process was killed while it changed the file.
+    template <typename Call>
+    auto undoingUnfinished(Call call) const {
+        try {
+            return call();
+        } catch (UnfinishedChange const&) {
+            undoUnfinishedChange(path());
+            return call();
+        }
+    }
 
     std::mutex m_mutex;
     std::function<StoreContents()> m_contents;

@@ -12,7 +12,10 @@ namespace {
 constexpr int kPatience = 500; // milliseconds
 
 [[noreturn]] void fail(sqlite3* handle) {
-    throw DatabaseError(handle == nullptr ? "out of memory" : sqlite3_errmsg(handle));
+    if (handle == nullptr) throw DatabaseError("out of memory");
+    if (sqlite3_extended_errcode(handle) == SQLITE_READONLY_ROLLBACK)
+        throw UnfinishedChange(sqlite3_errmsg(handle));
+    throw DatabaseError(sqlite3_errmsg(handle));
 }
 
 int flagsFor(DatabaseUse use) {

@@ -18,6 +18,11 @@ class DatabaseError : public std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
+/// A process was killed while it changed the file, and this connection may not undo the change.
+class UnfinishedChange : public DatabaseError {
+    using DatabaseError::DatabaseError;
+};
+
 enum class DatabaseUse : std::uint8_t { read, change, create };
 
 /// One connection. Not synchronised.

@@ -53,6 +53,26 @@ void run(Database& database, char const* sql, std::int64_t instance) {
     statement.step();
 }
 
+StoreListing listIn(Database database) {
+    StoreListing listing;
+    database.execute("BEGIN"); // families and boards of one moment
+    Statement families(database, "SELECT instance, data FROM record WHERE type = 'Family' "
+                                 "ORDER BY instance");
+    while (families.step())
+        listing.families.emplace_back(families.integer(0), familyName(families.bytes(1)));
+    Statement boards(database, "SELECT instance, data FROM record "
+                               "WHERE type = 'Board' AND parent = ?1 ORDER BY instance");
+    for (auto const& [family, name] : listing.families) {
+        Execution const execution(boards);
+        boards.bind(1, family);
+        while (boards.step())
+            if (isWhole(boards.bytes(1)))
+                listing.boards.push_back(
+                    {boards.integer(0), name, BoardRecord(std::string(boards.bytes(1)))});
+    }
+    return listing;
+}
+
 } // namespace
 
 template <typename Change>
@@ -71,29 +91,16 @@ void AttributeStore::change(Change change) {
 
 StoreListing AttributeStore::list() {
     std::lock_guard const lock(m_mutex);
-    StoreListing listing;
-    listing.path = path();
+    std::string const file = path();
     try {
-        Database database = openFile(DatabaseUse::read);
-        database.execute("BEGIN"); // families and boards of one moment
-        Statement families(database, "SELECT instance, data FROM record WHERE type = 'Family' "
-                                     "ORDER BY instance");
-        while (families.step())
-            listing.families.emplace_back(families.integer(0), familyName(families.bytes(1)));
-        Statement boards(database, "SELECT instance, data FROM record "
-                                   "WHERE type = 'Board' AND parent = ?1 ORDER BY instance");
-        for (auto const& [family, name] : listing.families) {
-            Execution const execution(boards);
-            boards.bind(1, family);
-            while (boards.step())
-                if (isWhole(boards.bytes(1)))
-                    listing.boards.push_back(
-                        {boards.integer(0), name, BoardRecord(std::string(boards.bytes(1)))});
-        }
+        return undoingUnfinished([&] {
+            StoreListing listing = listIn(openFile(DatabaseUse::read));
+            listing.path = file;
+            return listing;
+        });
     } catch (DatabaseError const& error) {
-        throw StoreError(listing.path + ": " + oneLine(error.what()));
+        throw StoreError(file + ": " + oneLine(error.what()));
     }
-    return listing;
 }
 
 void AttributeStore::add(StoreBoard const& board) {

@@ -99,10 +99,29 @@ void makeStoreFile(std::string const& path, std::function<StoreContents()> const
         failWith("cannot be made; VQRXCFGPATH must name a writable directory");
 }
 
+void undoUnfinishedChange(std::string const& path) {
+    try {
+        // A connection that may write undoes the change before it begins its own.
+        Database(path, DatabaseUse::change).execute("BEGIN IMMEDIATE; ROLLBACK");
+    } catch (DatabaseError const& error) {
+        throw DatabaseError(std::string("a process was killed while it changed the store, and this "
+                                        "process cannot undo the change (") +
+                            error.what() +
+                            "); run \"kvlsim store list\" on a platform whose user may write the "
+                            "file and its directory");
+    }
+}
+
 Database openStoreFile(std::string const& path, DatabaseUse use) {
     if (!isStore(Database(path, DatabaseUse::read).head(100)))
         throw DatabaseError("is no attribute store; move it away, and a new one is made");
-    return {path, use};
+    Database database(path, use);
+    try {
+        database.execute("SELECT 1 FROM record LIMIT 1");
+    } catch (UnfinishedChange const&) {
+        undoUnfinishedChange(path);
+    }
+    return database;
 }
 
 } // namespace kvlsim

@@ -20,7 +20,12 @@ inline constexpr int kRootInstance = 1;
 /// Throws what `contents` throws, and DatabaseError.
 void makeStoreFile(std::string const& path, std::function<StoreContents()> const& contents);
 
+/// Undoes a change that a killed process left unfinished. Throws DatabaseError, which says what to
+/// do, when this process may not write the file.
+void undoUnfinishedChange(std::string const& path);
+
 /// Throws DatabaseError, also for a file that is no attribute store; that file stays as it is.
+/// Undoes an unfinished change first.
 Database openStoreFile(std::string const& path, DatabaseUse use);
 
 /// Adds a record and returns its instance.
