@@ -226,6 +226,7 @@ Json show(Context const& context) {
     EventService& events = context.platform.events();
     reply["events"] = {{"announced", events.announced()},
                        {"delivered", events.delivered()},
+                       {"lost", events.lost()},
                        {"consumers", events.startedConsumers()}};
     return reply;
 }

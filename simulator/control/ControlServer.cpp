@@ -6,15 +6,22 @@
 #include <sys/socket.h>
 #include <unistd.h>
 
+#include <array>
 #include <atomic>
 #include <cerrno>
+#include <chrono>
 #include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <list>
+#include <string>
+#include <thread>
+#include <utility>
 #include <vector>
 
 #include "simulator/base/Descriptor.h"
 #include "simulator/base/ThreadStart.h"
+#include "simulator/control/Arguments.h"
 #include "simulator/control/Commands.h"
 #include "simulator/control/ControlSocket.h"
 
@@ -24,6 +31,18 @@ namespace {
 
 std::string asLine(nlohmann::json const& reply) {
     return reply.dump(-1, ' ', false, nlohmann::json::error_handler_t::replace) + "\n";
+}
+
+/// Throws CommandError, or nlohmann::json::exception for what is no JSON.
+nlohmann::json parseCommand(std::string const& line) {
+    // A board in a command has 11 levels; building thousands would take the thread seconds.
+    constexpr int maxDepth = 20;
+    return nlohmann::json::parse(
+        line, [](int depth, nlohmann::json::parse_event_t, nlohmann::json const&) {
+            if (depth > maxDepth)
+                throw CommandError("too many nested levels; a chassis needs at most 12");
+            return true;
+        });
 }
 
 /// A connection. While a reply is unsent or a drain is pending no further request is read, so that
@@ -49,7 +68,12 @@ class Server {
         m_platform.events().onProgress([this] {
             if (m_draining.load() > 0) m_wakeUp.signal();
         });
-        m_thread = startThread("kvlsim-control", [this] { run(); });
+        try {
+            m_thread = startThread("kvlsim-control", [this] { run(); });
+        } catch (...) {
+            m_platform.events().onProgress({});
+            throw;
+        }
     }
 
     ~Server() {
@@ -69,10 +93,7 @@ class Server {
                                           {m_acceptPaused ? -1 : m_listener.get(), POLLIN, 0}};
             for (auto const& client : m_clients)
                 polled.push_back(interestOf(client));
-            constexpr int pauseMilliseconds = 200;
-            if (poll(polled.data(), polled.size(), m_acceptPaused ? pauseMilliseconds : -1) < 0 &&
-                errno != EINTR)
-                return;
+            if (!wait(polled)) continue;
             m_acceptPaused = false;
             if ((polled[0].revents & POLLIN) != 0) m_wakeUp.clear();
             auto revents = polled.begin() + 2;
@@ -81,6 +102,25 @@ class Server {
             if ((polled[1].revents & POLLIN) != 0) acceptClients();
             dropEnded();
         }
+    }
+
+    /// Waits until one is ready. False after a failure: nothing is known of any of them then.
+    bool wait(std::vector<pollfd>& polled) {
+        auto const timeout = m_acceptPaused ? static_cast<int>(kPause.count()) : -1;
+        if (poll(polled.data(), polled.size(), timeout) >= 0) {
+            m_pollFails = false;
+            return true;
+        }
+        if (errno == EINTR) return false;
+        // The system is short of memory, or the host has lowered its limits.
+        if (!m_pollFails)
+            std::fprintf(stderr,
+                         "kvlsim: control socket %s: poll fails (%s) and is tried again until it "
+                         "works\n",
+                         m_listener.path().c_str(), std::strerror(errno));
+        m_pollFails = true;
+        std::this_thread::sleep_for(kPause);
+        return false;
     }
 
     void dropEnded() {
@@ -135,16 +175,15 @@ class Server {
         m_draining.fetch_sub(1);
     }
 
-    static void receive(Connection& client) {
+    void receive(Connection& client) {
         while (!client.ended && client.input.size() <= kMaxControlLine) {
-            std::size_t const before = client.input.size();
-            client.input.resize(kMaxControlLine + 1);
-            ssize_t const size = recv(client.socket.get(), client.input.data() + before,
-                                      client.input.size() - before, 0);
-            int const error = errno;
-            client.input.resize(before + static_cast<std::size_t>(size > 0 ? size : 0));
-            if (size > 0 || (size < 0 && error == EINTR)) continue;
-            if (size < 0 && error == EAGAIN) return;
+            ssize_t const size = recv(client.socket.get(), m_block.data(), m_block.size(), 0);
+            if (size > 0) {
+                client.input.append(m_block.data(), static_cast<std::size_t>(size));
+                continue;
+            }
+            if (size < 0 && errno == EINTR) continue;
+            if (size < 0 && errno == EAGAIN) return;
             client.ended = true;
         }
     }
@@ -157,8 +196,9 @@ class Server {
                 (end == std::string::npos ? client.input.size() : end) - begin;
             if (length > kMaxControlLine) {
                 client.closing = true;
-                answer(client, errorReply("the line has more than 65536 bytes; shorten it (this "
-                                          "connection is closed)"));
+                answer(client,
+                       errorReply("the line has more than " + std::to_string(kMaxControlLine) +
+                                  " bytes; shorten it (this connection is closed)"));
                 break;
             }
             if (end == std::string::npos) {
@@ -175,7 +215,10 @@ class Server {
     void executeLine(Connection& client, std::string const& line) {
         nlohmann::json command;
         try {
-            command = nlohmann::json::parse(line);
+            command = parseCommand(line);
+        } catch (CommandError const& error) {
+            answer(client, errorReply(error.what()));
+            return;
         } catch (nlohmann::json::exception const&) {
             answer(client, errorReply("the line is not JSON; write one object a line, such as "
                                       "{\"command\": \"show\"}"));
@@ -219,11 +262,15 @@ class Server {
         client.output.erase(0, sent);
     }
 
+    static constexpr std::chrono::milliseconds kPause{200}; ///< after what may pass
+
     Platform& m_platform;
     ListeningSocket m_listener;
     WakeUp m_wakeUp;
     std::list<Connection> m_clients;
+    std::array<char, 65536> m_block{}; ///< what `receive` reads into
     bool m_acceptPaused = false;
+    bool m_pollFails = false;
     std::atomic<int> m_draining = 0;
     std::atomic<bool> m_stop = false;
     std::thread m_thread;

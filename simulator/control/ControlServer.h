@@ -8,8 +8,8 @@
 
 namespace kvlsim {
 
-/// Longest request line, without its line end.
-inline constexpr std::size_t kMaxControlLine = std::size_t(64) << 10;
+/// Longest request line, without its line end. A board of some ten thousand objects fits.
+inline constexpr std::size_t kMaxControlLine = std::size_t(8) << 20;
 /// Clients served at once.
 inline constexpr std::size_t kMaxControlClients = 64;
 

@@ -2,7 +2,9 @@
 // Descriptors of the control server: the listening socket in the file system, the wake-up.
 #include "simulator/control/ControlSocket.h"
 
+#include <fcntl.h>
 #include <sys/eventfd.h>
+#include <sys/file.h>
 #include <sys/socket.h>
 #include <sys/stat.h>
 #include <sys/un.h>
@@ -18,6 +20,8 @@
 namespace kvlsim {
 
 namespace {
+
+constexpr char const* kInUse = "is in use by another process, choose another path";
 
 [[noreturn]] void fail(std::string const& path, std::string const& why) {
     throw std::runtime_error("control socket " + path + ": " + why +
@@ -58,14 +62,35 @@ void clearPath(std::string const& path, sockaddr_un const& address) {
     if (!S_ISSOCK(file.st_mode)) fail(path, "is there and is no socket, choose another path");
     Descriptor const probe = newSocket(path);
     if (connect(probe.get(), generic(address), sizeof address) == 0 || errno != ECONNREFUSED)
-        fail(path, "is in use by another process, choose another path");
+        fail(path, kInUse);
     if (unlink(path.c_str()) != 0 && errno != ENOENT)
         failErrno(path, "is stale, cannot be removed");
 }
 
 } // namespace
 
-ListeningSocket::ListeningSocket(std::string path) : m_path(std::move(path)) {
+PathLock::PathLock(std::string const& path) : m_file(path + ".lock") {
+    addressOf(path); // refuses a path that is too long before a file is made
+    struct stat held {};
+    struct stat named {};
+    do {
+        m_lock = Descriptor(
+            open(m_file.c_str(), O_RDWR | O_CREAT | O_CLOEXEC | O_NOFOLLOW, S_IRUSR | S_IWUSR));
+        if (m_lock.get() < 0) failErrno(path, "its lock file cannot be opened");
+        if (flock(m_lock.get(), LOCK_EX | LOCK_NB) != 0) {
+            if (errno == EWOULDBLOCK) fail(path, kInUse);
+            failErrno(path, "its lock file cannot be locked");
+        }
+        // A process that ended in between has removed the file: what is locked then has no name.
+    } while (fstat(m_lock.get(), &held) != 0 || stat(m_file.c_str(), &named) != 0 ||
+             held.st_ino != named.st_ino || held.st_dev != named.st_dev);
+}
+
+PathLock::~PathLock() {
+    unlink(m_file.c_str());
+}
+
+ListeningSocket::ListeningSocket(std::string path) : m_path(std::move(path)), m_lock(m_path) {
     sockaddr_un const address = addressOf(m_path);
     clearPath(m_path, address);
     m_socket = newSocket(m_path);

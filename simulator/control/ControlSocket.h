@@ -10,7 +10,21 @@
 
 namespace kvlsim {
 
-/// A listening Unix socket, mode 0600. Its file goes with it, unless another has taken the place.
+/// A lock that one process holds on a path: a file beside it, "path.lock", removed at the end.
+class PathLock {
+  public:
+    /// Throws std::runtime_error when another process holds the lock, or it cannot be made.
+    explicit PathLock(std::string const& path);
+    ~PathLock();
+    PathLock(PathLock const&) = delete;
+    PathLock& operator=(PathLock const&) = delete;
+
+  private:
+    std::string m_file;
+    Descriptor m_lock;
+};
+
+/// A listening Unix socket, mode 0600. Its file is removed with it, unless another has replaced it.
 class ListeningSocket {
   public:
     /// Replaces the socket of a process that has gone. Throws std::runtime_error when the path is
@@ -21,11 +35,13 @@ class ListeningSocket {
     ListeningSocket& operator=(ListeningSocket const&) = delete;
 
     int get() const { return m_socket.get(); }
+    std::string const& path() const { return m_path; }
     /// The next client, non-blocking, or a descriptor below 0 with errno.
     Descriptor accept() const;
 
   private:
     std::string m_path;
+    PathLock m_lock; ///< from before the path is looked at until the socket is removed
     Descriptor m_socket;
     dev_t m_device = 0;
     ino_t m_inode = 0;

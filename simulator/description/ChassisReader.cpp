@@ -180,7 +180,10 @@ ObjectDraft readBoard(Description const& description) {
 }
 
 Chassis readChassis(std::string const& yamlText) {
-    Description const file = describeYaml(yamlText);
+    return readChassis(describeYaml(yamlText));
+}
+
+Chassis readChassis(Description const& file) {
     if (file.form == Form::nothing)
         throw ChassisError(1, "there is nothing in it; begin the chassis with \"boards:\"");
     requireMap(file, "a chassis", "boards:");

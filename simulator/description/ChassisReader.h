@@ -11,6 +11,7 @@ namespace kvlsim {
 
 /// All throw ChassisError with the line and a message that says what to do.
 Chassis readChassis(std::string const& yamlText);
+Chassis readChassis(Description const& description);
 /// Defaults (condition, presence, date) included.
 ObjectDraft readBoard(Description const& description);
 /// Reads a file; throws ChassisError (without line) when it cannot be read.

@@ -4,8 +4,8 @@
 
 #include <unistd.h>
 
+#include <cstdio>
 #include <cstdlib>
-#include <cstring>
 
 #include "simulator/base/ThreadStart.h"
 
@@ -23,25 +23,50 @@ std::string_view channelOf(std::uint32_t id) {
     }
 }
 
-std::uint64_t EventService::announce(Announcement const& announcement) {
+EventService::Message EventService::messageFor(Announcement const& announcement) {
     Message message;
     message.id = announcement.id;
     if (announcement.channel) {
-        message.hasPayload = true;
-        std::memcpy(message.payload.data(), &*announcement.channel, sizeof *announcement.channel);
+        message.setPayload(*announcement.channel);
     } else if (announcement.board) {
-        message.hasPayload = true;
-        std::memcpy(message.payload.data(), &*announcement.board, sizeof(std::int32_t));
+        message.setPayload(*announcement.board);
         if (channelOf(announcement.id) == "FAULT")
-            std::memcpy(message.payload.data() + sizeof(std::int32_t), &announcement.fault,
-                        sizeof announcement.fault);
+            message.setPayload(announcement.fault, sizeof(std::int32_t));
     }
-    std::lock_guard const lock(m_mutex);
+    return message;
+}
+
+bool EventService::lose() {
+    ++m_lost;
+    bool const first = m_lostHere == 0;
+    if (first) {
+        m_queue.push_back({static_cast<std::uint32_t>(EventId::eventsLost), true, {}});
+        ++m_announced;
+    }
+    m_queue.back().setPayload(++m_lostHere);
+    return first;
+}
+
+std::uint64_t EventService::announce(Announcement const& announcement) {
+    Message const message = messageFor(announcement);
+    std::unique_lock lock(m_mutex);
     if (m_stopped) return m_announced;
     ensureThread();
-    m_queue.push_back(message);
-    m_work.notify_one();
-    return ++m_announced;
+    if (m_queue.size() < kMaxQueuedEvents) {
+        m_lostHere = 0;
+        m_queue.push_back(message);
+        m_work.notify_one();
+        return ++m_announced;
+    }
+    bool const report = lose();
+    std::uint64_t const number = m_announced;
+    lock.unlock();
+    if (report)
+        std::fprintf(stderr,
+                     "kvlsim: %zu events wait for delivery; further ones are lost until a handler "
+                     "returns\n",
+                     kMaxQueuedEvents);
+    return number;
 }
 
 bool EventService::waitDelivered(std::uint64_t number) {
@@ -64,6 +89,11 @@ std::uint64_t EventService::announced() {
 std::uint64_t EventService::delivered() {
     std::lock_guard const lock(m_mutex);
     return m_delivered;
+}
+
+std::uint64_t EventService::lost() {
+    std::lock_guard const lock(m_mutex);
+    return m_lost;
 }
 
 std::size_t EventService::startedConsumers() {

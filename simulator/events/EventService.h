@@ -5,6 +5,7 @@
 #include <array>
 #include <condition_variable>
 #include <cstdint>
+#include <cstring>
 #include <deque>
 #include <functional>
 #include <memory>
@@ -33,7 +34,11 @@ enum class EventId : std::uint32_t {
     boardStopped = 0x40008,
     boardStartPending = 0x40009,
     boardStopPending = 0x4000A,
+    eventsLost = 0x50003, ///< events were lost here; the payload is their number, 32 bits
 };
+
+/// The most events that wait for delivery. Further ones are lost.
+inline constexpr std::size_t kMaxQueuedEvents = 65536;
 
 /// The channel that carries an identifier: "ADMIN" the 0x4.... and the 0x5...., "FAULT" the
 /// 0x3....; else empty.
@@ -60,7 +65,9 @@ struct EventConsumer {
 /// any lock of the service held.
 class EventService {
   public:
-    /// Queues an event; returns its number. Numbers count from 1.
+    /// Queues an event; returns the number of the last event in the queue. Numbers count from 1.
+    /// When the queue is full the event is lost: one `EventId::eventsLost` takes the place of all
+    /// that are lost one after the other, and the first of them is reported on standard error.
     std::uint64_t announce(Announcement const& announcement);
 
     /// Waits until event `number` and all before it are delivered. Returns false when that will not
@@ -70,6 +77,8 @@ class EventService {
 
     std::uint64_t announced();
     std::uint64_t delivered();
+    /// How many events were lost because the queue was full.
+    std::uint64_t lost();
     std::size_t startedConsumers();
 
     /// Delivers to this consumer what is announced from now on. Throws std::system_error when the
@@ -92,7 +101,17 @@ class EventService {
         std::uint32_t id = 0;
         bool hasPayload = false;
         std::array<unsigned char, sizeof(ISDNChannelMsg)> payload{};
+
+        template <typename Value>
+        void setPayload(Value const& value, std::size_t offset = 0) {
+            hasPayload = true;
+            std::memcpy(payload.data() + offset, &value, sizeof value);
+        }
     };
+
+    static Message messageFor(Announcement const& announcement);
+    /// Counts one lost event; returns whether it is the first since the queue had room.
+    bool lose();
 
     void ensureThread();
     void run();
@@ -104,6 +123,8 @@ class EventService {
     std::deque<Message> m_queue;
     std::uint64_t m_announced = 0;
     std::uint64_t m_delivered = 0;
+    std::uint64_t m_lost = 0;
+    std::uint32_t m_lostHere = 0; ///< since the queue had room; the last message says so unless 0
     std::shared_ptr<Consumers const> m_consumers = std::make_shared<Consumers const>();
     EventConsumer const* m_current = nullptr; ///< whose handler may be running
     std::function<void()> m_onProgress;

@@ -48,8 +48,12 @@ std::int64_t freeBoardHandle(nlohmann::json const& reply, std::set<std::int64_t>
 Description describeText(std::string const& text) {
     auto const first = text.find_first_not_of(" \t\r\n");
     if (first != std::string::npos && text[first] == '{')
-        if (auto const json = nlohmann::json::parse(text, nullptr, false); !json.is_discarded())
+        if (auto json = nlohmann::json::parse(text, nullptr, false); json.is_object()) {
+            // "show --json" prints more than a chassis.
+            for (char const* const more : {"ok", "events"})
+                json.erase(more);
             return describeJson(json);
+        }
     return describeYaml(text);
 }
 
@@ -61,7 +65,7 @@ std::vector<nlohmann::json> readBoardFile(std::string const& path) {
         Description const description = describeText(text);
         Chassis chassis;
         if (description.find("boards") != nullptr)
-            chassis = readChassis(text);
+            chassis = readChassis(description);
         else
             chassis.insertBoard(readBoard(description));
         std::vector<nlohmann::json> boards;

@@ -2,7 +2,9 @@
 // The control socket, over a real connection: lines, errors, clients that misbehave.
 #include "simulator/exports/Control.h"
 
+#include <fcntl.h>
 #include <poll.h>
+#include <sys/resource.h>
 #include <sys/socket.h>
 #include <sys/stat.h>
 #include <sys/un.h>
@@ -112,6 +114,37 @@ class Client {
     std::string m_received;
 };
 
+/// The standard error of this process, readable line by line while this lives.
+class StandardError {
+  public:
+    StandardError() : m_before(dup(STDERR_FILENO)) {
+        std::array<int, 2> ends{};
+        EXPECT_EQ(pipe2(ends.data(), O_CLOEXEC), 0);
+        dup2(ends[1], STDERR_FILENO);
+        ::close(ends[1]);
+        m_read = ends[0];
+    }
+    ~StandardError() {
+        dup2(m_before, STDERR_FILENO);
+        ::close(m_before);
+        ::close(m_read);
+    }
+    StandardError(StandardError const&) = delete;
+    StandardError& operator=(StandardError const&) = delete;
+
+    /// Waits for a whole line, which it returns with its line end.
+    std::string line() const {
+        std::string text;
+        for (char c = 0; c != '\n' && read(m_read, &c, 1) == 1;)
+            text += c;
+        return text;
+    }
+
+  private:
+    int m_before;
+    int m_read = -1;
+};
+
 class ControlServerTest : public testing::Test {
   protected:
     ControlServerTest() {
@@ -201,7 +234,7 @@ TEST_F(ControlServerTest, LineThatIsNoObjectIsRefused) {
 
 TEST_F(ControlServerTest, DeeplyNestedLineIsRefused) {
     Client client;
-    std::string const deep = std::string(30000, '[') + std::string(30000, ']');
+    std::string const deep = std::string(2000000, '[') + std::string(2000000, ']');
     EXPECT_EQ(client.ask(deep)["ok"], false);
     EXPECT_EQ(client.ask(R"({"command": "set", "object": 5, "attribute": "X", "value": )" + deep +
                          "}")["error"],
@@ -209,23 +242,41 @@ TEST_F(ControlServerTest, DeeplyNestedLineIsRefused) {
     EXPECT_EQ(client.ask(kPing).dump(), kOk);
 }
 
-TEST_F(ControlServerTest, LineOf64KiBIsAccepted) {
+TEST_F(ControlServerTest, LineOf8MiBIsAccepted) {
     Client client;
-    EXPECT_EQ(client.ask(padded(65536)).dump(), kOk);
+    EXPECT_EQ(client.ask(padded(8388608)).dump(), kOk);
 }
 
 TEST_F(ControlServerTest, LongerLineIsRefusedAndTheConnectionClosed) {
     Client client;
-    EXPECT_EQ(client.ask(padded(65537))["error"],
-              "the line has more than 65536 bytes; shorten it (this connection is closed)");
+    EXPECT_EQ(client.ask(padded(8388609))["error"],
+              "the line has more than 8388608 bytes; shorten it (this connection is closed)");
     EXPECT_EQ(client.line(), "(closed)");
     expectAlive();
 }
 
 TEST_F(ControlServerTest, EndlessLineIsRefusedBeforeItEnds) {
     Client client;
-    client.send(std::string(300000, 'x'));
-    EXPECT_THAT(client.line(), HasSubstr("more than 65536 bytes"));
+    client.send(std::string(20000000, 'x'));
+    EXPECT_THAT(client.line(), HasSubstr("more than 8388608 bytes"));
+    expectAlive();
+}
+
+TEST_F(ControlServerTest, ServerOutlivesAPollThatFails) {
+    Client client;
+    EXPECT_EQ(client.ask(kPing).dump(), kOk);
+    rlimit before{};
+    ASSERT_EQ(getrlimit(RLIMIT_NOFILE, &before), 0);
+    StandardError standardError;
+    // poll() refuses more descriptors than the process may have open.
+    rlimit const one{1, before.rlim_max};
+    ASSERT_EQ(setrlimit(RLIMIT_NOFILE, &one), 0);
+    client.send(std::string(kPing) + "\n"); // wakes the server if it is polling already
+    EXPECT_EQ(standardError.line(), "kvlsim: control socket " + socketPath() +
+                                        ": poll fails (Invalid argument) and is tried again until "
+                                        "it works\n");
+    ASSERT_EQ(setrlimit(RLIMIT_NOFILE, &before), 0);
+    EXPECT_EQ(client.line(), kOk);
     expectAlive();
 }
 

@@ -99,6 +99,27 @@ TEST_F(KvlsimToolTest, InsertTakesWhatShowPrintsAsJson) {
     EXPECT_EQ(board("3"), shown);
 }
 
+TEST_F(KvlsimToolTest, InsertTakesAllBoardsThatShowPrintsAsJson) {
+    hold();
+    std::string const shown = succeed({"show", "--json"});
+    succeed({"remove", "1", "2", "3"});
+    succeed({"insert", write("boards.json", shown)});
+    EXPECT_EQ(json::parse(succeed({"show", "--json"}))["boards"], json::parse(shown)["boards"]);
+}
+
+TEST_F(KvlsimToolTest, InsertTakesABigBoardThatShowPrintsAsJson) {
+    std::string const path = directory.file("big.yaml");
+    succeed({"generate", "--boards", "1", "--devices", "300", "--lines", "300", "--subdevices", "4",
+             "--output", path});
+    hold({"KVLSIM_CHASSIS=" + path});
+    json const shown = board("1");
+    std::string const text = shown.dump();
+    EXPECT_GT(text.size(), 200000U);
+    succeed({"remove", "1"});
+    succeed({"insert", write("board.json", text)});
+    EXPECT_EQ(board("1"), shown);
+}
+
 TEST_F(KvlsimToolTest, InsertOfABadFileNamesTheLine) {
     hold();
     std::string const path = write("bad.yaml", "handle: 50\nattributes: {NAME: X}\n");
