@@ -6,8 +6,10 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <utility>
 #include <vector>
 
+#include "agent/fronts/EventLoop.h"
 #include "agent/notifications/NotificationSink.h"
 #include "agent/objects/ServedTree.h"
 #include "agent/rows/Counters.h"
@@ -20,12 +22,14 @@ namespace kvloamd {
 struct Served {
     std::vector<ServedTree> trees; ///< the agent's own MIB module first
     Counters& counters;
-    std::function<std::shared_ptr<Snapshot const>()> takeSnapshot;   ///< for a request
-    std::function<std::shared_ptr<Snapshot const>()> newestSnapshot; ///< as it is
+    std::function<std::shared_ptr<Snapshot const>()> takeSnapshot; ///< to answer a request
+    std::function<std::shared_ptr<Snapshot const>()>
+        newestSnapshot; ///< without asking for a new one
     Settings& settings;
 };
 
-/// Used on the thread that does all SNMP only.
+/// A `Front` connects the agent to its SNMP clients by one protocol. Thread-bound to the SNMP
+/// thread.
 class Front {
   public:
     Front() = default;
@@ -33,22 +37,32 @@ class Front {
     Front(Front const&) = delete;
     Front& operator=(Front const&) = delete;
 
-    /// Gets ready. False when the agent can not start; what is wrong has been logged.
+    /// Prepares to serve. Returns false when the agent cannot start; the errors have been logged.
     virtual bool open() = 0;
-    /// From now on requests are answered while `run` runs. Throws std::runtime_error.
+    /// Answers requests from now on, while `run` runs. Throws std::runtime_error.
     virtual void serve(Served served) = 0;
-    /// Where the agent is reached, for a message: "on udp:127.0.0.1:1161".
+    /// Where clients reach the agent, for a message: "on udp:127.0.0.1:1161".
     virtual std::string place() const = 0;
-    /// Good after `serve`.
+    /// Valid after `serve`.
     virtual NotificationSink& notifications() = 0;
 
-    /// Called when `descriptor` is readable.
-    virtual void watch(int descriptor, std::function<void()> readable) = 0;
-    /// Called before every sleep; returns when to wake at the latest.
-    virtual void beforeSleep(std::function<std::optional<Clock::time_point>()> prepare) = 0;
-    /// Serves until `stop`, or until `until`.
-    virtual void run(Clock::time_point until = Clock::time_point::max()) = 0;
-    virtual void stop() = 0;
+    /// Calls `readable` when `descriptor` is readable.
+    void watch(int descriptor, std::function<void()> readable) {
+        m_loop.watch(descriptor, std::move(readable));
+    }
+    /// Calls `prepare` before every sleep; it returns its deadline, if it has one.
+    void beforeSleep(std::function<std::optional<Clock::time_point>()> prepare) {
+        m_loop.beforeSleep(std::move(prepare));
+    }
+    /// Serves until `stop` is called or `until` is reached.
+    void run(Clock::time_point until = Clock::time_point::max()) { m_loop.run(until); }
+    void stop() { m_loop.stop(); }
+
+  protected:
+    EventLoop& loop() { return m_loop; }
+
+  private:
+    EventLoop m_loop;
 };
 
 } // namespace kvloamd

@@ -12,6 +12,9 @@
 
 namespace kvloamd {
 
+/// snmpTrapOID.0, the object that names the notification in which it is sent.
+inline Oid const kSnmpTrapOid{1, 3, 6, 1, 6, 3, 1, 1, 4, 1, 0};
+
 /// An object in a notification. It owns its value, so it does not depend on a snapshot.
 struct NotifiedObject {
     Oid name; ///< absolute

@@ -93,7 +93,7 @@ void AgentFixture::startAgent(std::vector<std::string> const& arguments) {
         command.insert(command.end(), arguments.begin(), arguments.end());
         m_agent = std::make_unique<Process>(command, environment());
         if (m_agent->waitFor("kvloamd: serving ")) return;
-        // Somebody else took the port between the choice and the start.
+        // Another process took the port between the choice and the start.
         if (m_agent->output().find("port is in use") == std::string::npos) break;
     }
     FAIL() << "the agent does not start: " << m_agent->output();

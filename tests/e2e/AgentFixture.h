@@ -34,8 +34,8 @@ class AgentFixture : public ::testing::Test {
     AgentFixture();
     ~AgentFixture() override;
 
-    /// What the SNMP configuration file of agents started later says. Anybody on loopback may read
-    /// by default.
+    /// Writes the SNMP configuration of agents started later. By default it allows everybody on
+    /// loopback to read.
     void configureSnmp(std::string const& text) { write(m_snmpConfig, text); }
     /// The chassis of agents started later; without it, the simulator's own of three boards.
     void useChassis(std::string const& yaml);
@@ -74,9 +74,9 @@ class AgentFixture : public ::testing::Test {
     void startWithReceiver(std::string const& access = "rocommunity");
 
     static int freePort();
-    /// Whether somebody on this host has bound the UDP port, as the kernel lists it.
+    /// Whether the kernel lists the UDP port as bound.
     static bool udpPortIsBound(int port);
-    /// Has the SNMP tools ask whoever serves this port of loopback.
+    /// Directs the SNMP tools to this port of loopback.
     void askPort(int port) { m_port = port; }
     /// What children started later see beside the fixture's own variables.
     void setVariable(std::string const& name, std::string const& value) {

@@ -19,7 +19,7 @@ class MasterFixture : public AgentFixture {
 
     /// Starts the master, on the same port each time, and waits until it serves.
     void startMaster();
-    /// Has the SNMP tools ask the master, after an agent of its own was asked.
+    /// Directs the SNMP tools to the master again.
     void askMaster() { askPort(m_masterPort); }
     Process& master() { return *m_master; }
     /// Ends the master at once.

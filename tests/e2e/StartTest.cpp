@@ -88,7 +88,7 @@ TEST_F(StartTest, AddressOfAnotherHostIsRefused) {
                                     "--snmp-config", path("snmp.conf"), "--persistent-dir",
                                     path("persistent"), "--listen", "udp:192.0.2.1:1161"});
     EXPECT_EQ(result.status, kExitFailure);
-    EXPECT_THAT(result.output, HasSubstr("can not listen on udp:192.0.2.1:1161"));
+    EXPECT_THAT(result.output, HasSubstr("cannot listen on udp:192.0.2.1:1161"));
 }
 
 TEST_F(StartTest, UnknownOptionIsNamed) {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Where the master of the host's SNMP agents is reached.
+// The address of the SNMP master.
 #pragma once
 
 #include <sys/socket.h>
@@ -9,17 +9,17 @@
 
 namespace kvloamd {
 
-/// Where a master is unless somebody says otherwise.
+/// The address at which a master listens by default.
 inline constexpr char kMasterAddress[] = "/var/agentx/master";
 
 struct AgentxAddress {
-    std::string text; ///< as it was written
+    std::string text; ///< as the user wrote it
     sockaddr_storage socket{};
     socklen_t size = 0;
 };
 
-/// Reads /PATH, unix:PATH, tcp:PORT (of the loopback address) or tcp:ADDRESS:PORT, whose ADDRESS is
-/// four numbers or "localhost"; as the master's own configuration writes them.
+/// Parses /PATH, unix:PATH, tcp:PORT (of the loopback address) or tcp:ADDRESS:PORT, the forms of
+/// the master's configuration. ADDRESS is four numbers or "localhost".
 std::optional<AgentxAddress> parseAgentxAddress(std::string const& text);
 
 } // namespace kvloamd

@@ -8,7 +8,7 @@ namespace kvloamd {
 
 namespace {
 
-/// A longer answer to one request is cut; the master asks for the rest.
+/// The response to a GetBulk ends at this size; the master then asks for the rest.
 constexpr std::size_t kLongAnswer = std::size_t{32} * 1024;
 
 } // namespace
@@ -22,7 +22,7 @@ AgentxAnswers::AgentxAnswers(std::vector<ServedTree> const& trees, Counters cons
 }
 
 std::string AgentxAnswers::answer(AgentxHeader const& header, std::string_view payload) {
-    // All names are registered without a context.
+    // All names are registered in the default context.
     if (header.hasContext && header.kind != AgentxKind::CleanupSet)
         return agentxResponse(header, AgentxFault::UnsupportedContext);
     AgentxReader const reader(payload, header.networkOrder);
@@ -76,7 +76,7 @@ bool AgentxAnswers::next(Facts const& facts, AgentxName const& start, Instance& 
 }
 
 std::string AgentxAnswers::set(AgentxHeader const& header, AgentxReader reader) {
-    // Only a test looks at the rows.
+    // Only the test step needs a snapshot.
     std::shared_ptr<Snapshot const> snapshot;
     return m_sets.answer(
         header, reader,

@@ -14,8 +14,8 @@
 
 namespace kvloamd {
 
-/// Knows nothing of access: the master asks only for what its client may see and set. Used on one
-/// thread only.
+/// `AgentxAnswers` are the agent's responses to a master. They check no access rights: the master
+/// asks only for what its client may see and set. Unsynchronised.
 class AgentxAnswers {
   public:
     using TakeSnapshot = std::function<std::shared_ptr<Snapshot const>()>;
@@ -24,8 +24,8 @@ class AgentxAnswers {
     AgentxAnswers(std::vector<ServedTree> const& trees, Counters const& counters,
                   TakeSnapshot takeSnapshot, Settings& settings);
 
-    /// The response to a request; empty when there is none to give. Throws AgentxError when the
-    /// request can not be read. All of one response comes from one snapshot.
+    /// Returns the response to a request, empty if the request has none. Throws AgentxError when
+    /// the request is malformed. All values of one response come from one snapshot.
     std::string answer(AgentxHeader const& header, std::string_view payload);
 
   private:
@@ -40,16 +40,17 @@ class AgentxAnswers {
     };
 
     static Range readRange(AgentxReader& reader);
-    /// `ObjectTree`'s, of absolute names.
+    /// As `ObjectTree::find` and `next`, with absolute names.
     Lookup find(Facts const& facts, OidView name, Instance& found) const;
     bool next(Facts const& facts, AgentxName const& start, Instance& found) const;
-    /// The tree that a name is in, and the rest of it; null when it is in none.
+    /// The tree that contains `name`, which becomes relative to the tree's arc; null if none does.
     ObjectTree const* treeOf(OidView& name) const;
     std::string set(AgentxHeader const& header, AgentxReader reader);
     std::string get(AgentxHeader const& header, AgentxReader reader) const;
     std::string getNext(AgentxHeader const& header, AgentxReader reader) const;
     std::string getBulk(AgentxHeader const& header, AgentxReader reader) const;
-    /// Writes the first instance in the range, or its end. Moves the range's start to it.
+    /// Writes the first instance of the range and moves the range's start to it, or writes
+    /// endOfMibView.
     void writeNext(AgentxWriter& response, Facts const& facts, Range& range) const;
 
     std::vector<Tree> m_trees; ///< ascending

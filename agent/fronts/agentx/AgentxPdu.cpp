@@ -15,10 +15,10 @@ constexpr std::uint8_t kVersion = 1;
 constexpr std::uint8_t kHasContext = 0x08;
 constexpr std::uint8_t kNetworkOrder = 0x10;
 constexpr std::size_t kLengthAt = 16;
-/// Of packets that are written in one piece.
+/// Enough for most packets.
 constexpr std::size_t kUsualSize = 512;
 
-/// A name that begins so, with a number of one octet after it, is written without its beginning.
+/// A name that begins with these numbers and one from 1 to 255 is encoded without the former.
 constexpr std::array<std::uint32_t, 4> kInternet{1, 3, 6, 1};
 
 constexpr std::uint16_t kInteger = 2;
@@ -246,7 +246,7 @@ AgentxWriter beginAgentxResponse(AgentxHeader const& request, AgentxFault fault,
                                  std::uint16_t variable) {
     AgentxWriter response(AgentxKind::Response, request.session, request.transaction,
                           request.packet);
-    response.number(0); // the master tells the time
+    response.number(0); // sysUpTime, which is the master's to report
     response.number16(static_cast<std::uint16_t>(fault));
     response.number16(variable);
     return response;

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The packets between a master and its subagents, written and read.
+// Encodes and decodes the packets of the AgentX protocol.
 #pragma once
 
 #include <cstddef>
@@ -30,7 +30,7 @@ enum class AgentxKind : std::uint8_t {
     Response = 18,
 };
 
-/// What a Response says went wrong.
+/// The error of a Response.
 enum class AgentxFault : std::uint16_t {
     None = 0,
     WrongType = 7,
@@ -45,7 +45,7 @@ enum class AgentxFault : std::uint16_t {
     RequestDenied = 267,
 };
 
-/// A packet that can not be read.
+/// A malformed packet.
 class AgentxError : public std::runtime_error {
   public:
     using std::runtime_error::runtime_error;
@@ -53,7 +53,7 @@ class AgentxError : public std::runtime_error {
 
 struct AgentxHeader {
     static constexpr std::size_t kSize = 20;
-    /// No packet of a master comes near it.
+    /// Far above the packets that a master sends.
     static constexpr std::size_t kMaxPayload = std::size_t{1024} * 1024;
 
     AgentxKind kind = AgentxKind::Ping;
@@ -68,19 +68,20 @@ struct AgentxHeader {
 /// Reads the first `kSize` octets of a packet. Throws AgentxError.
 AgentxHeader parseAgentxHeader(std::string_view octets);
 
-/// A name and whether a search may answer with the name itself.
+/// A name, and whether a search from it includes the name itself.
 struct AgentxName {
     Oid name;
     bool include = false;
 };
 
-/// A variable that is to be set.
+/// A variable of a SET.
 struct AgentxVariable {
     Oid name;
-    std::optional<std::int64_t> integer; ///< nothing when its value is of another type
+    std::optional<std::int64_t> integer; ///< empty when the value has another type
 };
 
-/// Reads a packet's payload from its beginning to its end. Throws AgentxError past the end.
+/// An `AgentxReader` decodes a packet's payload from beginning to end. Reading past the end throws
+/// AgentxError. Unsynchronised.
 class AgentxReader {
   public:
     AgentxReader(std::string_view payload, bool networkOrder)
@@ -91,7 +92,7 @@ class AgentxReader {
     std::uint16_t number16();
     std::uint32_t number();
     AgentxName name();
-    /// A variable and its value, of whatever type.
+    /// Reads a variable with a value of any type.
     AgentxVariable variable();
 
   private:
@@ -102,7 +103,7 @@ class AgentxReader {
     bool m_networkOrder;
 };
 
-/// Writes one packet, in network byte order.
+/// An `AgentxWriter` encodes one packet, in network byte order. Unsynchronised.
 class AgentxWriter {
   public:
     AgentxWriter(AgentxKind kind, std::uint32_t session, std::uint32_t transaction,
@@ -113,15 +114,15 @@ class AgentxWriter {
     void number(std::uint32_t value);
     void name(OidView name);
     void text(std::string_view value);
-    /// A variable with its value; `value` is known.
+    /// Writes a variable and its value, which must be known.
     void variable(OidView name, ValueType type, Value const& value);
-    /// A variable that says why it has no value.
+    /// Write a variable that has no value, and the reason.
     void noSuchObject(OidView name);
     void noSuchInstance(OidView name);
     void endOfView(OidView name);
 
     std::size_t size() const { return m_octets.size(); }
-    /// The packet, with its length filled in.
+    /// Returns the packet, with its length filled in.
     std::string take();
 
   private:
@@ -131,11 +132,12 @@ class AgentxWriter {
     std::string m_octets;
 };
 
-/// The answer to `request` that tells of a fault, of its first variable if of any; or of none.
+/// Encodes a complete response to `request`. `variable`: the number of the variable that caused the
+/// fault, from 1; 0: none.
 std::string agentxResponse(AgentxHeader const& request, AgentxFault fault,
                            std::uint16_t variable = 0);
 
-/// Begins the answer to `request`; its variables follow.
+/// Begins a response to `request`; the caller appends its variables.
 AgentxWriter beginAgentxResponse(AgentxHeader const& request, AgentxFault fault = AgentxFault::None,
                                  std::uint16_t variable = 0);
 

@@ -17,13 +17,10 @@ namespace kvloamd {
 
 namespace {
 
-/// snmpTrapOID.0, whose value says which notification it is.
-Oid const kTrapOid{1, 3, 6, 1, 6, 3, 1, 1, 4, 1, 0};
-
 constexpr std::uint8_t kReasonShutdown = 5;
 constexpr std::uint8_t kPriority = 127;
 
-/// A master that asks on and never reads is given up at this many octets.
+/// The connection is dropped when the master leaves this many octets unread.
 constexpr std::size_t kMaxUnread = std::size_t{4} * 1024 * 1024;
 
 std::string nameOf(AgentxFault fault) {
@@ -37,15 +34,15 @@ std::string nameOf(AgentxFault fault) {
     }
 }
 
-/// `nameOf`, and what to do.
+/// `nameOf`, and what the operator should do.
 std::string adviceOn(AgentxFault fault) {
     return nameOf(fault) + (fault == AgentxFault::DuplicateRegistration
                                 ? "; stop it, then restart the master or this agent"
                                 : "; see the master's configuration");
 }
 
-/// The rest of a Register or Unregister packet. `last`, if any: of the range that the name's last
-/// number begins.
+/// Writes the payload of a Register or Unregister packet. `last`: the last number of a range whose
+/// first one is the last number of `name`.
 void writeRegion(AgentxWriter& packet, OidView name, std::optional<std::uint32_t> last) {
     packet.octet(0); // the session's timeout
     packet.octet(kPriority);
@@ -128,7 +125,7 @@ void AgentxSession::connectNow() {
         0)
         connected();
     else if (errno == EAGAIN)
-        drop("it does not answer"); // those who wait to be let in are too many already
+        drop("it does not answer"); // its queue of new connections is full
     else if (errno != EINPROGRESS)
         drop(std::strerror(errno));
 }
@@ -192,7 +189,7 @@ void AgentxSession::takeRegistered(std::size_t root, AgentxFault fault) {
 
 void AgentxSession::send(Notification const& notification, std::function<void()> taken) {
     AgentxWriter packet = request(AgentxKind::Notify);
-    packet.variable(kTrapOid, ValueType::ObjectId, NameView{notification.name});
+    packet.variable(kSnmpTrapOid, ValueType::ObjectId, NameView{notification.name});
     for (NotifiedObject const& object : notification.objects)
         packet.variable(object.name, object.type, object.view());
     m_taken = std::move(taken);
@@ -257,7 +254,7 @@ void AgentxSession::takePacket(AgentxHeader const& header, std::string_view payl
     } else if (std::string answer = m_answer(header, payload); !answer.empty()) {
         queue(std::move(answer));
     }
-    // It may be back after a silence.
+    // The master may have been silent before.
     if (m_stage == Stage::Serving) tellConnected();
 }
 
@@ -282,7 +279,7 @@ void AgentxSession::takeResponse(AgentxHeader const& header, std::string_view pa
         takeRegistered(root, fault);
         break;
     case AgentxKind::Notify:
-        // Refused, it would be refused again.
+        // The master would refuse it again.
         if (fault != AgentxFault::None)
             log(LogLevel::Warning, "the SNMP master refuses a notification: " + nameOf(fault));
         std::exchange(m_taken, nullptr)();

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The agent's connection to the master of the host's SNMP agents, made again whenever it is lost.
+// The agent's connection to the SNMP master.
 #pragma once
 
 #include <chrono>
@@ -15,53 +15,56 @@
 
 namespace kvloamd {
 
-/// How long the agent waits for a master.
+/// The intervals of a session.
 struct AgentxPace {
-    std::chrono::milliseconds retry{1000};    ///< between two attempts to connect
-    std::chrono::milliseconds ping{10000};    ///< of silence, before the master is asked
-    std::chrono::milliseconds patience{5000}; ///< without an answer; then the master counts as lost
-    /// Without an answer; then the connection is made anew. Long: a master that hangs and goes on
-    /// finds everything in place.
+    std::chrono::milliseconds retry{1000}; ///< between two attempts to connect
+    std::chrono::milliseconds ping{10000}; ///< of silence, then the session sends a Ping
+    std::chrono::milliseconds patience{
+        5000}; ///< without a response, then the master counts as lost
+    /// Without a response, then the session reconnects. Long, so that a master that hangs and
+    /// recovers finds everything in place.
     std::chrono::milliseconds surrender{60000};
 };
 
-/// Everything below a name is asked of the agent.
+/// A subtree that the agent registers.
 struct AgentxRoot {
     Oid name;         ///< absolute
-    std::string what; ///< is there, for a message
-    bool needed;      ///< without it there is no session
+    std::string what; ///< the MIB module, for a message
+    bool needed;      ///< the session ends when the master refuses it
 };
 
-/// Never blocks: whoever owns it waits for its descriptor and its deadline. One log line per change
-/// of the master's state. Used on one thread only.
+/// An `AgentxSession` is the connection to a master. It connects again whenever it is lost, and
+/// logs one line for each change of state. It never blocks: its owner waits for the descriptor and
+/// the deadline, and calls `advance`. Thread-bound to the SNMP thread.
 class AgentxSession final : public NotificationSink {
   public:
-    /// The response to a request of the master; empty: none. May throw AgentxError.
+    /// Returns the response to a request of the master, empty if there is none. May throw
+    /// AgentxError.
     using Answer = std::function<std::string(AgentxHeader const&, std::string_view payload)>;
 
-    /// What is below `roots`, and the cells of `rows`, which outlives the session, is asked of
-    /// `answer`. Begins to connect.
+    /// Registers `roots` and the cells of `rows`, and answers requests for them by `answer`. Begins
+    /// to connect. `rows` outlives the session.
     AgentxSession(AgentxAddress address, std::vector<AgentxRoot> roots, SharedRows& rows,
                   Answer answer, AgentxPace pace = {});
-    /// Takes leave of the master, whose clients see the names go.
+    /// Closes the session, so that the master removes the agent's objects at once.
     ~AgentxSession() override;
     AgentxSession(AgentxSession const&) = delete;
     AgentxSession& operator=(AgentxSession const&) = delete;
 
-    /// The descriptor to wait for, negative while there is none, and poll()'s events.
+    /// The descriptor to wait for, negative while there is none, and the events for poll().
     int descriptor() const { return m_socket; }
     short events() const;
-    /// When `advance` is to be called at the latest.
+    /// The latest time of the next `advance`.
     Clock::time_point deadline() const;
-    /// Does what can be done: `happened` is what poll() has told of the descriptor.
+    /// Continues the session. `happened`: the events that poll() returned for the descriptor.
     void advance(short happened);
-    /// Has the master learn what is new among the rows. There is one registration under way at a
-    /// time, so that requests come in between.
+    /// Registers the next range of rows that is not yet registered. One registration is under way
+    /// at a time, so that the master can send requests in between.
     void registerRows();
 
-    /// Whether the master serves our names, the rows apart, and answers.
+    /// Whether the roots are registered and the master responds.
     bool isConnected() const { return m_told == Told::Connected; }
-    /// How often the master has been lost after it was connected.
+    /// How often an established connection was lost.
     std::uint32_t timesLost() const { return m_timesLost; }
 
     bool ready() const override { return isConnected() && !m_taken; }
@@ -73,7 +76,7 @@ class AgentxSession final : public NotificationSink {
     struct Awaited {
         std::uint32_t packet;
         AgentxKind kind;
-        std::size_t root = 0; ///< that is being registered
+        std::size_t root = 0; ///< index of the root that it registers
     };
 
     void connectNow();
@@ -87,7 +90,7 @@ class AgentxSession final : public NotificationSink {
     AgentxWriter request(AgentxKind kind);
     void queue(std::string packet);
     void flush();
-    /// Gives the connection up, to try again later.
+    /// Closes the connection and schedules the next attempt.
     void drop(std::string const& why);
     void disconnect();
     void tellConnected();
@@ -106,8 +109,8 @@ class AgentxSession final : public NotificationSink {
     std::uint32_t m_session = 0;
     std::uint32_t m_lastPacket = 0;
     std::vector<Awaited> m_awaited;
-    std::vector<std::string> m_refused; ///< of the roots, what has been told
-    std::function<void()> m_taken;      ///< set while a notification is under way
+    std::vector<std::string> m_refused; ///< roots whose refusal has been logged
+    std::function<void()> m_taken;      ///< set while a notification awaits its response
     Clock::time_point m_retryAt;        ///< while away
     Clock::time_point m_heard;          ///< the master's last word, or when it was asked after that
     std::string m_in;

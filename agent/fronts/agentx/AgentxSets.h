@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Takes a master's SETs through their steps.
+// Carries out the steps of a master's SETs.
 #pragma once
 
 #include <cstdint>
@@ -11,36 +11,32 @@
 #include <utility>
 #include <vector>
 
+#include "agent/fronts/PendingChange.h"
 #include "agent/fronts/agentx/AgentxPdu.h"
 #include "agent/objects/ObjectTree.h"
 
 namespace kvloamd {
 
-/// A SET is tested, committed or undone, and cleaned up, all of its variables or none. A master may
-/// send the variables of one in several packets: they are one SET all the same. Used on one thread
-/// only.
+/// `AgentxSets` are the SETs that a master has begun and not yet ended. The master tests a SET,
+/// commits it, undoes it if another subagent fails, and cleans it up. It may send the variables of
+/// one SET in several packets; they belong together by their transaction. Unsynchronised.
 class AgentxSets {
   public:
-    /// Whether an instance, absolute, can be set; as `ObjectTree::test`.
+    /// As `ObjectTree::test`, with an absolute name.
     using Test = std::function<SetFault(OidView name, std::optional<std::int64_t> integer,
                                         std::optional<Change>& change)>;
 
     /// `settings` outlives the sets.
     explicit AgentxSets(Settings& settings) : m_settings(settings) {}
 
-    /// The response to one of the four steps; empty when there is none to give. Throws AgentxError
-    /// when the request can not be read.
+    /// Carries out one of the four steps. Returns the response, empty if the step has none. Throws
+    /// AgentxError when the request is malformed.
     std::string answer(AgentxHeader const& header, AgentxReader reader, Test const& test);
 
   private:
-    struct Held {
-        Change change;
-        bool made;
-        std::optional<int> former;
-    };
     /// The session and the transaction.
     using Key = std::pair<std::uint32_t, std::uint32_t>;
-    /// A master that never cleans up is forgotten from its first SET on.
+    /// If a master never cleans up, the SET of the lowest transaction is forgotten.
     static constexpr std::size_t kMost = 64;
 
     std::string testSet(AgentxHeader const& header, AgentxReader reader, Test const& test);
@@ -48,7 +44,7 @@ class AgentxSets {
     void undo(AgentxHeader const& header);
 
     Settings& m_settings;
-    std::map<Key, std::vector<Held>> m_sets;
+    std::map<Key, std::vector<PendingChange>> m_sets;
 };
 
 } // namespace kvloamd

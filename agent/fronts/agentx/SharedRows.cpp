@@ -53,7 +53,7 @@ void SharedRows::updateColumn(Column& column, Facts const& facts, Clock::time_po
             fresh = ranges.insert({number, {number, State::Missing, false, now}}).first;
         }
     }
-    // What is not entered need not be taken out.
+    // A range that is not registered need not be unregistered.
     std::erase_if(ranges, [](auto const& entry) {
         State const state = entry.second.state;
         return entry.second.gone && (state == State::Missing || state == State::Refused);
@@ -89,7 +89,7 @@ void SharedRows::done() {
 
 void SharedRows::refused(std::string const& why) {
     if (!m_underWay) return;
-    // A range that the master does not know is as good as taken out.
+    // The master does not know the range, so there is nothing to unregister.
     if (underWay().state == State::Leaving) return done();
     underWay().state = State::Refused;
     Column const& column = m_columns[m_underWay->first];

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Which rows are ours in tables that the host's own agent has too.
+// The rows to register in tables that the host's own agent serves, too.
 #pragma once
 
 #include <chrono>
@@ -15,7 +15,8 @@
 
 namespace kvloamd {
 
-/// Neighbouring cells of one column, named `column`, absolute, and a number from `first` to `last`.
+/// Neighbouring cells of one column: the absolute name `column`, then a number from `first` to
+/// `last`.
 struct RowRange {
     Oid column;
     std::uint32_t first = 0;
@@ -24,40 +25,41 @@ struct RowRange {
     bool operator==(RowRange const&) const = default;
 };
 
-/// Keeps what is entered with a master in step with the snapshots: cells that have a value are
-/// entered, a few neighbours at once, and those of rows that have long been gone are taken out. A
-/// table's rows have one number as their index.
+/// `SharedRows` keeps the cells that are registered with a master in step with the snapshots. It
+/// registers cells that have a value, in ranges of neighbours, and unregisters the cells of rows
+/// that have been gone for long. Rows have one number as their index.
 ///
-/// One step at a time, from the last name to the first: a master that keeps its names in one list
-/// finds the place of each at its beginning, and is done with thousands in a second; the other way
-/// round it takes minutes. Used on one thread only.
+/// It proceeds one step at a time, from the last name to the first. A master that keeps its names
+/// in one ascending list then inserts each at the beginning, thousands in a second; in ascending
+/// order it would take minutes. Unsynchronised.
 class SharedRows {
   public:
-    /// How long cells stay entered after their last value: a board may be back soon.
+    /// How long cells stay registered after their last value, because a board may return soon.
     static constexpr std::chrono::minutes kKeep{10};
-    /// The cells of a range. A master takes no more at once than what it is through with in a
-    /// moment.
+    /// The most cells of a range; the master takes in a range in one piece, without answering
+    /// requests meanwhile.
     static constexpr std::uint32_t kLongest = 64;
 
     struct Step {
-        bool enters; ///< or else is taken out
+        bool enters; ///< registers the range; else unregisters it
         RowRange range;
 
         bool operator==(Step const&) const = default;
     };
 
-    /// All tables of the trees' places where the host has rows. The trees outlive the rows.
+    /// Keeps the tables at all places where the host has rows. `trees` outlive the rows.
     explicit SharedRows(std::vector<ServedTree> const& trees);
 
-    /// What there is now.
+    /// Compares the rows with a snapshot.
     void update(Facts const& facts, Clock::time_point now);
-    /// What to do next; it counts as under way. Nothing while something is, or nothing is to do.
+    /// Returns the next step, which is then under way; nothing while another one is, or when there
+    /// is none.
     std::optional<Step> next();
-    /// The step under way has been done; or has been refused, for the reason `why`. What is refused
-    /// is not tried again until the next start, and told once for each table.
+    /// Ends the step under way, as done or as refused for the reason `why`. A refused range is not
+    /// tried again until the agent's next start. Only a table's first refusal is logged.
     void done();
     void refused(std::string const& why);
-    /// There is a new master, with whom nothing is entered.
+    /// Starts again with a new master, which knows no rows.
     void restart();
 
   private:
@@ -72,7 +74,7 @@ class SharedRows {
         Oid name;
         char const* place;
         TableColumn cells;
-        std::map<std::uint32_t, Range> ranges; ///< by the first number
+        std::map<std::uint32_t, Range> ranges; ///< by their first number
     };
     /// A column and the first number of its range.
     using Key = std::pair<std::size_t, std::uint32_t>;
@@ -82,9 +84,9 @@ class SharedRows {
     Range& underWay() { return m_columns[m_underWay->first].ranges.at(m_underWay->second); }
 
     std::vector<Column> m_columns; ///< ascending by name
-    std::vector<Key> m_steps;      ///< to do, ascending
+    std::vector<Key> m_steps;      ///< outstanding, ascending
     std::optional<Key> m_underWay;
-    std::vector<std::string> m_told; ///< the tables of which rows have been refused
+    std::vector<std::string> m_told; ///< the tables whose refusal has been logged
 };
 
 } // namespace kvloamd

@@ -1,10 +1,12 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The agent beside the host's own: the host's master asks it, and forwards its notifications.
+// The agent as a subagent of the host's SNMP master.
 #pragma once
 
 #include <functional>
 #include <memory>
 #include <optional>
+#include <string>
+#include <utility>
 #include <vector>
 
 #include "agent/fronts/Front.h"
@@ -15,40 +17,31 @@
 
 namespace kvloamd {
 
-class Subagent final : public Front {
+/// A `Subagent` is the front that serves through a master: the master forwards its clients'
+/// requests to the agent, and the agent's notifications to its receivers.
+class Subagent final : public Front, private EventLoop::Source {
   public:
     explicit Subagent(AgentxAddress address) : m_address(std::move(address)) {}
 
-    /// A master need not be there yet.
+    /// Always succeeds: the master may be absent.
     bool open() override { return true; }
     void serve(Served served) override;
     std::string place() const override { return "through the SNMP master at " + m_address.text; }
     NotificationSink& notifications() override { return *m_session; }
-    void watch(int descriptor, std::function<void()> readable) override;
-    void beforeSleep(std::function<std::optional<Clock::time_point>()> prepare) override;
-    void run(Clock::time_point until) override;
-    void stop() override { m_stop = true; }
 
   private:
-    struct Watched {
-        int descriptor;
-        std::function<void()> readable;
-    };
-
-    /// Has the master learn of rows that have come and gone.
+    std::optional<Clock::time_point> prepare(std::vector<pollfd>& polled) override;
+    void handle(std::span<pollfd const> polled) override;
+    /// Registers rows that have appeared, and unregisters those that have been gone for long.
     void updateRows();
-    void step(Clock::time_point until);
 
     AgentxAddress m_address;
     std::function<std::shared_ptr<Snapshot const>()> m_newestSnapshot;
     Counters* m_counters = nullptr;
     std::optional<AgentxAnswers> m_answers;
     std::optional<SharedRows> m_rows;
-    std::shared_ptr<Snapshot const> m_seen; ///< by the rows
+    std::shared_ptr<Snapshot const> m_seen; ///< the snapshot of which the rows were last updated
     std::optional<AgentxSession> m_session;
-    std::vector<Watched> m_watched;
-    std::function<std::optional<Clock::time_point>()> m_prepare;
-    bool m_stop = false;
 };
 
 } // namespace kvloamd

@@ -27,8 +27,8 @@ namespace {
 
 constexpr char kAppName[] = "kvloamd";
 
-/// The parts of the library's own agent that an agent of its own needs: what it says of itself,
-/// access control, users, and where notifications go. Everything about the host is left to others.
+/// The library's MIB modules that a stand-alone agent needs: the system group, access control,
+/// users and notification receivers. Its modules about the host are left out.
 constexpr char kLibraryModules[] =
     "system_mib,sysORTable,snmp_mib,setSerialNo,vacm_vars,vacm_conf,vacm_context,snmpEngine,"
     "snmpMPDStats,usmConf,usmStats,usmUser,snmpNotifyTable,snmpNotifyTable_data,"
@@ -36,7 +36,7 @@ constexpr char kLibraryModules[] =
     "snmpNotifyFilterProfileTable,snmpNotifyFilterProfileTable_data,snmpTargetAddrEntry,"
     "snmpTargetAddrEntry_data,snmpTargetParamsEntry,snmpTargetParamsEntry_data,target_counters";
 
-/// While the configuration is read, its faults are collected here instead of logged.
+/// While the library reads the configuration, its errors are collected here instead of logged.
 std::vector<std::string>* configFaults = nullptr;
 
 bool started = false;
@@ -47,11 +47,11 @@ bool nobodyMayAsk = false;
 LogLevel levelOf(int priority) {
     if (priority <= LOG_ERR) return LogLevel::Error;
     if (priority == LOG_WARNING) return LogLevel::Warning;
-    // The library's own information is about its inner life.
+    // The library's informational messages are about its internals.
     return LogLevel::Debug;
 }
 
-/// The library's messages may have several lines; ours have one.
+/// Joins the lines of a library message to one.
 std::string oneLine(std::string_view message) {
     std::string line;
     for (char const character : message) {
@@ -72,9 +72,9 @@ int takeLogLine(int /*major*/, int /*minor*/, void* message, void* /*argument*/)
         nobodyMayAsk = true;
         return SNMP_ERR_NOERROR;
     }
-    // Only a count of what has been said already.
+    // Only a count of errors that were reported before.
     if (text.find("error(s) in config file(s)") != std::string::npos) return SNMP_ERR_NOERROR;
-    // The file is read in two rounds, and some faults are found in both.
+    // The library reads the file twice and reports some errors in both rounds.
     if (configFaults != nullptr && text.find(": line ") != std::string::npos) {
         if (std::ranges::find(*configFaults, text) == configFaults->end())
             configFaults->push_back(std::move(text));
@@ -89,8 +89,8 @@ void nameConfiguration(SnmpFiles const& files) {
         netsnmp_ds_set_string(NETSNMP_DS_LIBRARY_ID, NETSNMP_DS_LIB_PERSISTENT_DIR,
                               files.persistentDirectory.c_str());
     if (files.configuration.empty()) return;
-    // Only this file counts then, and the state of former runs, which is read on its own. Nothing
-    // can be below /dev/null.
+    // Read this file only, and the persistent state, which the library reads separately. No file
+    // can exist below /dev/null.
     set_configuration_directory("/dev/null");
     unsetenv("SNMPCONFPATH");
     netsnmp_ds_set_string(NETSNMP_DS_LIBRARY_ID, NETSNMP_DS_LIB_OPTIONALCONFIG,
@@ -101,15 +101,15 @@ void nameConfiguration(SnmpFiles const& files) {
 
 std::vector<std::string> startSnmp(SnmpFiles const& files) {
     if (!files.configuration.empty() && access(files.configuration.c_str(), R_OK) != 0)
-        return {files.configuration + ": can not be read: " + std::strerror(errno) +
+        return {files.configuration + ": cannot be read: " + std::strerror(errno) +
                 "; check --snmp-config"};
     snmp_disable_stderrlog();
     snmp_enable_calllog();
     snmp_register_callback(SNMP_CALLBACK_LIBRARY, SNMP_CALLBACK_LOGGING, takeLogLine, nullptr);
-    // The agent names objects by number: no MIB files are parsed.
+    // The agent names objects by number, so the library need not parse MIB files.
     setenv("MIBS", "", 0);
     netsnmp_ds_set_boolean(NETSNMP_DS_APPLICATION_ID, NETSNMP_DS_AGENT_ROLE, 0);
-    // Not a line for every packet.
+    // Without this, the library logs a line for every packet.
     netsnmp_ds_set_boolean(NETSNMP_DS_APPLICATION_ID,
                            NETSNMP_DS_AGENT_DONT_LOG_TCPWRAPPERS_CONNECTS, 1);
     nameConfiguration(files);

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Starts the SNMP library and has it read its own configuration.
+// Starts the SNMP library with its configuration.
 #pragma once
 
 #include <string>
@@ -9,18 +9,18 @@ namespace kvloamd {
 
 /// Where the SNMP library reads its configuration and keeps its state.
 struct SnmpFiles {
-    std::string configuration;       ///< empty: where the library looks by itself
-    std::string persistentDirectory; ///< empty: the library's own
+    std::string configuration;       ///< empty: in the directories in which the library looks
+    std::string persistentDirectory; ///< empty: the library's default
 };
 
-/// Starts the library and reads the configuration that `files` name. Returns what is wrong with
-/// it, a line each. Called once, on the thread that does all SNMP, and followed by `stopSnmp`.
+/// Starts the library and reads the configuration that `files` name. Returns the configuration's
+/// errors, one line for each. Call it once, on the SNMP thread, and `stopSnmp` at the end.
 std::vector<std::string> startSnmp(SnmpFiles const& files);
 
-/// Where state is kept that outlives the process. After `startSnmp`.
+/// The directory of the state that is kept across restarts. Valid after `startSnmp`.
 std::string persistentDirectory(SnmpFiles const& files);
 
-/// Stores the state that outlives the process and lets go of everything.
+/// Saves the state and stops the library.
 void stopSnmp();
 
 } // namespace kvloamd

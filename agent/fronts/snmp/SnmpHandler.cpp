@@ -13,6 +13,7 @@
 #include <net-snmp/agent/net-snmp-agent-includes.h>
 // clang-format on
 
+#include "agent/fronts/PendingChange.h"
 #include "agent/fronts/snmp/SnmpValues.h"
 
 namespace kvloamd {
@@ -30,36 +31,13 @@ void freeSnapshot(void* held) {
     delete static_cast<HeldSnapshot*>(held);
 }
 
-/// What a variable of a SET is to change, and how it was.
-struct HeldChange {
-    Change change;
-    bool made = false; ///< not yet, when another variable can not be set after all
-    std::optional<int> former;
-};
-
 void freeChange(void* held) {
-    delete static_cast<HeldChange*>(held);
-}
-
-int errorOf(SetFault fault) {
-    switch (fault) {
-    case SetFault::None:
-        return SNMP_ERR_NOERROR;
-    case SetFault::NotWritable:
-        return SNMP_ERR_NOTWRITABLE;
-    case SetFault::WrongType:
-        return SNMP_ERR_WRONGTYPE;
-    case SetFault::WrongValue:
-        return SNMP_ERR_WRONGVALUE;
-    case SetFault::NoCreation:
-        return SNMP_ERR_NOCREATION;
-    }
-    return SNMP_ERR_GENERR;
+    delete static_cast<PendingChange*>(held);
 }
 
 } // namespace
 
-/// One call of the library: one PDU's variables that concern us.
+/// A `Call` is one call of the library with the variables of one PDU that are below our names.
 struct SnmpHandler::Call {
     SnmpHandler const& handler;
     Facts facts;
@@ -71,17 +49,17 @@ struct SnmpHandler::Call {
                       netsnmp_agent_request_info* info, netsnmp_request_info* requests);
 
     static Snapshot const& snapshotOf(SnmpHandler const& handler, netsnmp_agent_request_info* info);
-    /// The part of the variable's name below the arc. A name outside of the arc reads as
-    /// one before or after all of ours.
+    /// The part of the variable's name below the arc. A name outside the arc becomes one that
+    /// sorts before or after all of ours.
     Oid relative(netsnmp_variable_list const* variable, bool& orEqual) const;
     void get(netsnmp_request_info* request);
     void getNext(netsnmp_request_info* request);
     void getBulk(netsnmp_request_info* request);
-    /// Whether it can be set; the library asks that of all variables before any is.
+    /// Checks whether it can be set. The library tests all variables before it sets the first.
     void testSet(netsnmp_request_info* request);
-    static HeldChange* heldChange(netsnmp_request_info* request);
+    static PendingChange* pendingChange(netsnmp_request_info* request);
     void commitSet(netsnmp_request_info* request);
-    /// Undoes the last first: one instance may be set twice.
+    /// Undoes the changes that were made, last to first.
     void undoSets(netsnmp_request_info* requests);
 };
 
@@ -115,7 +93,7 @@ int SnmpHandler::Call::answer(netsnmp_mib_handler* library, netsnmp_handler_regi
         case MODE_SET_ACTION:
             call.commitSet(request);
             break;
-        default: // the other steps of a SET need nothing
+        default: // the other steps of a SET have nothing to do
             break;
         }
     }
@@ -124,7 +102,7 @@ int SnmpHandler::Call::answer(netsnmp_mib_handler* library, netsnmp_handler_regi
 
 Snapshot const& SnmpHandler::Call::snapshotOf(SnmpHandler const& handler,
                                               netsnmp_agent_request_info* info) {
-    // The library may call several times for one PDU: all of its variables come from one snapshot.
+    // The library may call several times for one PDU; all of its variables come from one snapshot.
     auto* held = static_cast<HeldSnapshot*>(netsnmp_agent_get_list_data(info, kSnapshotKey));
     if (held == nullptr) {
         held = new HeldSnapshot(handler.m_takeSnapshot());
@@ -168,15 +146,14 @@ void SnmpHandler::Call::get(netsnmp_request_info* request) {
 void SnmpHandler::Call::getNext(netsnmp_request_info* request) {
     bool orEqual = request->inclusive != 0;
     Oid after = relative(request->requestvb, orEqual);
-    // A variable that is left alone goes to whoever serves the names after ours.
+    // If a variable is left unchanged, the library asks the handler of the names after ours.
     while (handler.m_tree.next(facts, after, orEqual, instance)) {
         name.assign(handler.m_arc.begin(), handler.m_arc.end());
         name.insert(name.end(), instance.name.begin(), instance.name.end());
         if (snmp_oid_compare(name.data(), name.size(), request->range_end,
                              request->range_end_len) >= 0)
             return;
-        // The library looks at the first answer of a GETBULK only when it compares answers with
-        // what the asker may see; so what he may not see is passed over here.
+        // The library checks access only for a GETBULK's first variable; check every one here.
         std::size_t length = name.size();
         if (in_a_view(name.data(), &length, pdu, asnTypeOf(instance.type)) == VACM_SUCCESS) {
             snmp_set_var_objid(request->requestvb, name.data(), name.size());
@@ -212,22 +189,19 @@ void SnmpHandler::Call::testSet(netsnmp_request_info* request) {
     SetFault const fault =
         handler.m_tree.test(facts, relative(&variable, orEqual), integer, change);
     if (fault != SetFault::None || !change) {
-        netsnmp_request_set_error(request, errorOf(fault));
+        netsnmp_request_set_error(request, errorStatusOf(fault));
         return;
     }
     netsnmp_request_add_list_data(
-        request, netsnmp_create_data_list(kSetKey, new HeldChange{*change, false, {}}, freeChange));
+        request, netsnmp_create_data_list(kSetKey, new PendingChange(*change), freeChange));
 }
 
-HeldChange* SnmpHandler::Call::heldChange(netsnmp_request_info* request) {
-    return static_cast<HeldChange*>(netsnmp_request_get_list_data(request, kSetKey));
+PendingChange* SnmpHandler::Call::pendingChange(netsnmp_request_info* request) {
+    return static_cast<PendingChange*>(netsnmp_request_get_list_data(request, kSetKey));
 }
 
 void SnmpHandler::Call::commitSet(netsnmp_request_info* request) {
-    HeldChange* const held = heldChange(request);
-    if (held == nullptr) return;
-    held->former = handler.m_settings.exchange(held->change.key, held->change.value);
-    held->made = true;
+    if (PendingChange* const change = pendingChange(request)) change->commit(handler.m_settings);
 }
 
 void SnmpHandler::Call::undoSets(netsnmp_request_info* requests) {
@@ -235,8 +209,7 @@ void SnmpHandler::Call::undoSets(netsnmp_request_info* requests) {
     while (last->next != nullptr)
         last = last->next;
     for (netsnmp_request_info* request = last; request != nullptr; request = request->prev)
-        if (HeldChange const* const held = heldChange(request); held != nullptr && held->made)
-            handler.m_settings.exchange(held->change.key, held->former);
+        if (PendingChange* const change = pendingChange(request)) change->undo(handler.m_settings);
 }
 
 SnmpHandler::SnmpHandler(ObjectTree const& tree, Counters const& counters, Oid arc,

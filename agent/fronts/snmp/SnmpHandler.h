@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Answers SNMP requests from an object tree and a snapshot.
+// Answers SNMP requests for the objects of a tree.
 #pragma once
 
 #include <functional>
@@ -9,23 +9,24 @@
 
 namespace kvloamd {
 
-/// One handler for all objects of a tree. Used on the thread that does all SNMP only.
+/// An `SnmpHandler` answers the SNMP library's calls for all objects of a tree, from a snapshot.
+/// Thread-bound to the SNMP thread.
 class SnmpHandler {
   public:
     using TakeSnapshot = std::function<std::shared_ptr<Snapshot const>()>;
 
-    /// `tree`, `counters` and `settings` outlive the handler. `arc` is above all names
+    /// `tree`, `counters` and `settings` outlive the handler. `arc` precedes all names
     /// of the tree.
     SnmpHandler(ObjectTree const& tree, Counters const& counters, Oid arc,
                 TakeSnapshot takeSnapshot, Settings& settings);
     SnmpHandler(SnmpHandler const&) = delete;
     SnmpHandler& operator=(SnmpHandler const&) = delete;
 
-    /// Takes over all names under `place`, relative, until the library stops. Returns false when
-    /// the library refuses.
+    /// Registers all names below `place`, relative, until the library stops. Returns false when the
+    /// library refuses.
     bool serve(Oid const& place);
 
-    /// What the library calls; for the implementation only.
+    /// One call of the library; for the implementation only.
     struct Call;
 
   private:

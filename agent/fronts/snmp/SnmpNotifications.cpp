@@ -16,9 +16,6 @@ namespace kvloamd {
 
 namespace {
 
-/// snmpTrapOID.0, whose value says which notification it is.
-Oid const kTrapOid{1, 3, 6, 1, 6, 3, 1, 1, 4, 1, 0};
-
 void addVariable(netsnmp_variable_list*& variables, Oid const& name, ValueType type,
                  Value const& value) {
     std::vector<oid> const wide(name.begin(), name.end());
@@ -35,7 +32,7 @@ void SnmpNotifications::sendStart() {
 
 void SnmpNotifications::send(Notification const& notification, std::function<void()> taken) {
     netsnmp_variable_list* variables = nullptr;
-    addVariable(variables, kTrapOid, ValueType::ObjectId, NameView{notification.name});
+    addVariable(variables, kSnmpTrapOid, ValueType::ObjectId, NameView{notification.name});
     for (NotifiedObject const& object : notification.objects)
         addVariable(variables, object.name, object.type, object.view());
     send_v2trap(variables);

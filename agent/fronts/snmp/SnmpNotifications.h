@@ -1,15 +1,16 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Sends notifications to the receivers that the SNMP library's configuration names.
+// Sends notifications to the configured receivers.
 #pragma once
 
 #include "agent/notifications/NotificationSink.h"
 
 namespace kvloamd {
 
-/// Used while the library is started only.
+/// `SnmpNotifications` sends notifications by the SNMP library, to the receivers of its
+/// configuration. Thread-bound to the SNMP thread; used while the library is started.
 class SnmpNotifications final : public NotificationSink {
   public:
-    /// Announces that the agent has started.
+    /// Sends coldStart.
     static void sendStart();
 
     bool ready() const override { return true; }

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Values as the SNMP library's variables hold them.
+// Converts values to the SNMP library's types.
 #pragma once
 
 #include "agent/objects/Value.h"
@@ -8,10 +8,10 @@ struct variable_list;
 
 namespace kvloamd {
 
-/// The library's number of a type.
+/// The library's number for a type.
 unsigned char asnTypeOf(ValueType type);
 
-/// Gives `variable` a value, which is known.
+/// Sets the value of `variable`. `value` must be known.
 void setVariable(variable_list* variable, ValueType type, Value const& value);
 
 } // namespace kvloamd

@@ -4,6 +4,7 @@
 #include <stdexcept>
 #include <utility>
 
+#include "agent/fronts/snmp/SnmpAddress.h"
 #include "agent/log/Log.h"
 
 namespace kvloamd {
@@ -16,7 +17,7 @@ bool StandAlone::open() {
     std::vector<std::string> faults = startSnmp(m_files);
     if (faults.empty()) {
         for (std::string const& address : m_listen)
-            if (std::string fault = SnmpLoop::listen(address); !fault.empty())
+            if (std::string fault = openAddress(address); !fault.empty())
                 faults.push_back(std::move(fault));
     }
     for (std::string const& fault : faults)
@@ -30,9 +31,10 @@ void StandAlone::serve(Served served) {
                                                        served.takeSnapshot, served.settings);
         for (Place const& place : each.places)
             if (!handler.serve(place.place))
-                throw std::runtime_error("the SNMP library does not let the agent serve its "
+                throw std::runtime_error("the SNMP library refuses to register the agent's "
                                          "objects; check --enterprise-oid");
     }
+    loop().add(m_library);
     SnmpNotifications::sendStart();
 }
 

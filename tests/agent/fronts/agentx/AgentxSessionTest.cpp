@@ -202,7 +202,7 @@ TEST_F(AgentxSessionTest, MasterThatWasNeverConnectedIsNotLost) {
     startSession();
     EXPECT_EQ(next().header.kind, AgentxKind::Open);
     m_master->hangUp();
-    EXPECT_TRUE(runUntil([this] { return m_session->descriptor() < 0; }));
+    EXPECT_EQ(next().header.kind, AgentxKind::Open); // of the next connection
     EXPECT_EQ(m_session->timesLost(), 0U);
 }
 
