@@ -99,8 +99,9 @@ class Server {
             auto revents = polled.begin() + 2;
             for (auto& client : m_clients)
                 serve(client, (revents++)->revents);
-            if ((polled[1].revents & POLLIN) != 0) acceptClients();
+            // Those who have gone make room for those who wait.
             dropEnded();
+            if ((polled[1].revents & POLLIN) != 0) acceptClients();
         }
     }
 

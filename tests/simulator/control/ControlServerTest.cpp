@@ -314,6 +314,17 @@ TEST_F(ControlServerTest, ClientsBeyondTheLimitAreToldSo) {
     EXPECT_EQ(clients.front().ask(kPing).dump(), kOk);
 }
 
+TEST_F(ControlServerTest, ClientsThatHaveGoneMakeRoomAtOnce) {
+    for (int round = 0; round < 50; ++round) {
+        {
+            std::list<Client> clients(64);
+            for (auto& client : clients)
+                ASSERT_EQ(client.ask(kPing).dump(), kOk) << "round " << round;
+        }
+        expectAlive();
+    }
+}
+
 /// Holds the delivery thread until it is told to let go.
 class Holder final : public VqxEventService::CEventHandlerAdaptor {
   public:
