@@ -8,6 +8,7 @@
 #include <filesystem>
 #include <memory>
 #include <new>
+#include <optional>
 #include <string_view>
 #include <system_error>
 #include <utility>
@@ -35,11 +36,14 @@
 #include "agent/readers/Collector.h"
 #include "agent/readers/EntityReader.h"
 #include "agent/readers/InterfaceReader.h"
+#include "agent/readers/KeptSettings.h"
 #include "agent/readers/PlatformReader.h"
 #include "agent/readers/ProcessReader.h"
 #include "agent/readers/ResourceReader.h"
 #include "agent/readers/ServiceReader.h"
 #include "agent/readers/StableIndices.h"
+#include "agent/readers/StateDirectory.h"
+#include "agent/readers/StateFile.h"
 #include "platform/ActionScheduler_pthread.h"
 
 namespace kvloamd {
@@ -214,23 +218,6 @@ void flushNotifications(Notifier& notifier, NotificationQueue& queue, Front& fro
         log(LogLevel::Warning, "notifications not sent before the stop: " + std::to_string(left));
 }
 
-/// Loads saved settings and persists changes.
-class KeptSettings {
-  public:
-    KeptSettings(Settings& settings, StableIndices& file) : m_settings(settings), m_file(file) {
-        m_settings.load(m_file.settings());
-    }
-    ~KeptSettings() { save(); }
-    KeptSettings(KeptSettings const&) = delete;
-    KeptSettings& operator=(KeptSettings const&) = delete;
-
-    void save() { m_file.save(m_settings.takeUnsaved()); }
-
-  private:
-    Settings& m_settings;
-    StableIndices& m_file;
-};
-
 void serve(Options const& options, ReadOptions const& readAgain, Front& front,
            Signals const& signals, InterruptibleStart& start, Boards& boards) {
     Clock::time_point const started = boards.counters.started;
@@ -239,10 +226,14 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
     PlatformReader platform;
     std::string const directory = persistentDirectory(snmpFiles(options));
-    StableIndices indices(directory + "/ifindex.sqlite", options.interfaceBase, "interfaces");
-    KeptSettings keptSettings(boards.settings, indices);
+    StateFile interfaceFile(directory + "/ifindex.sqlite", "interfaces");
+    StableIndices indices(interfaceFile, options.interfaceBase);
+    KeptSettings keptSettings(interfaceFile, indices, boards.settings);
+    interfaceFile.open();
     InterfaceReader interfaces(*boards.manager.get(), indices, started);
-    StableIndices entityIndices(directory + "/entity.sqlite", kFirstEntity, "physical entities");
+    StateFile entityFile(directory + "/entity.sqlite", "physical entities");
+    StableIndices entityIndices(entityFile, kFirstEntity);
+    entityFile.open();
     EntityReader entities(entityIndices, started, [] { return std::time(nullptr); });
     LinkWatch links(boards.settings, boards.queue);
     Collector collector(
@@ -264,6 +255,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             applySettings(boards.settings, lines);
             links.update(snapshot.interfaces.interfaces, snapshot.begun);
             snapshot.entities = entities.read(snapshot);
+            snapshot.persistence = worst(interfaceFile.state(), entityFile.state());
         },
         started, [&] { wakeup.wake(); });
     std::vector<Table const*> const allTables = tables();
@@ -335,7 +327,13 @@ int runDaemon(Options const& options, ReadOptions const& readAgain) {
                 "with --module");
         step = "opening the SNMP side";
         std::unique_ptr<Front> const front = makeFront(options);
+        SnmpFiles const files = snmpFiles(options);
+        std::string const directory = persistentDirectory(files);
+        // Before anything in it is read.
+        std::optional<StateDirectory> reserved(std::in_place, directory);
         if (!front->open()) return kExitFailure;
+        // The SNMP configuration may name another one.
+        if (persistentDirectory(files) != directory) reserved.emplace(persistentDirectory(files));
         step = "connecting to the board platform";
         if (!schedulerRuns() || !platformAnswers()) return kExitFailure;
         boards->counters.started = Clock::now();

@@ -26,6 +26,8 @@ sigset_t setOf(std::initializer_list<int> numbers) {
 Signals::Signals() {
     sigset_t const signals = setOf({SIGTERM, SIGINT, SIGHUP});
     pthread_sigmask(SIG_BLOCK, &signals, nullptr);
+    // A write beyond the file size limit fails instead, as on a full disk.
+    std::signal(SIGXFSZ, SIG_IGN);
     m_descriptor = signalfd(-1, &signals, SFD_CLOEXEC | SFD_NONBLOCK);
     if (m_descriptor < 0) throw std::system_error(errno, std::generic_category(), "signalfd");
 }

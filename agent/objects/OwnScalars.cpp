@@ -154,6 +154,12 @@ std::span<Scalar const> scalars() {
              return facts.counters.master == Master::None ? Value{}
                                                           : count(facts.counters.masterLosses);
          }},
+        {"kvlPersistence",
+         {1, 1, 9, 14},
+         ValueType::Integer,
+         [](Facts const& facts) -> Value {
+             return static_cast<std::int64_t>(facts.snapshot.persistence);
+         }},
     };
     return described;
 }

@@ -5,7 +5,6 @@
 #include <functional>
 #include <vector>
 
-#include "agent/readers/IndexFile.h"
 #include "agent/readers/LineHistories.h"
 #include "agent/rows/IndexKey.h"
 #include "agent/rows/InterfaceRows.h"

@@ -1,8 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/readers/BoardReader.h"
 
-#include <set>
-
 #include "agent/readers/Answers.h"
 
 namespace kvloamd {
@@ -53,18 +51,6 @@ BoardRow readBoard(Board& board, int boardIndex) {
 
 std::string readSerialNumber(Board& board) {
     return text(board, &Board::GetSerialNumber);
-}
-
-std::vector<std::string> keptNames(std::vector<BoardRow> const& boards) {
-    std::vector<std::string> names;
-    std::set<std::string> taken;
-    for (BoardRow const& board : boards) {
-        std::string name = board.serialNumber == "unknown" ? "" : board.serialNumber;
-        if (name.empty() || taken.contains(name)) name += "@" + std::to_string(board.boardIndex);
-        taken.insert(name);
-        names.push_back(std::move(name));
-    }
-    return names;
 }
 
 } // namespace kvloamd

@@ -3,7 +3,6 @@
 #pragma once
 
 #include <string>
-#include <vector>
 
 #include "agent/rows/BoardRow.h"
 #include "board/Board.h"
@@ -15,9 +14,5 @@ BoardRow readBoard(Board& board, int boardIndex);
 
 /// The serial number as `readBoard` gives it.
 std::string readSerialNumber(Board& board);
-
-/// What each of `boards` is known by wherever something is kept for it: its serial number; where
-/// that is unknown, or a board's before it, the board index besides. None is empty.
-std::vector<std::string> keptNames(std::vector<BoardRow> const& boards);
 
 } // namespace kvloamd

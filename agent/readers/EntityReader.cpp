@@ -9,7 +9,7 @@
 #include <utility>
 #include <vector>
 
-#include "agent/readers/BoardReader.h"
+#include "agent/readers/BoardKeys.h"
 #include "agent/readers/Courtesy.h"
 #include "agent/rows/IndexKey.h"
 
@@ -19,6 +19,9 @@ namespace {
 
 /// ifIndex in ifTable's entry, which an interface's ifIndex follows.
 constexpr std::uint32_t kIfIndex[] = {1, 3, 6, 1, 2, 1, 2, 2, 1, 1};
+
+/// What the chassis and its slots, which belong to no board, are kept under.
+BoardKey const kNoBoard{"", true};
 
 /// What ENTITY-MIB allows for a serial number.
 constexpr std::size_t kLongestSerialNumber = 32;
@@ -32,15 +35,6 @@ std::string firstKnown(std::initializer_list<std::string> texts) {
     for (std::string const& text : texts)
         if (!known(text).empty()) return text;
     return {};
-}
-
-/// "shelf 1 bus 2 slot 4", as far as the board knows; empty when it does not know its slot.
-std::string slotName(BoardRow const& board) {
-    if (!board.pciSlotNumber) return {};
-    std::string name;
-    if (board.shelfId) name += "shelf " + std::to_string(*board.shelfId) + " ";
-    if (board.busNumber) name += "bus " + std::to_string(*board.busNumber) + " ";
-    return name + "slot " + std::to_string(*board.pciSlotNumber);
 }
 
 /// The processors of one board.
@@ -70,7 +64,7 @@ class Building {
     };
 
     void addChassisAndSlots();
-    void addBoard(BoardRow const& board, std::string const& keptName);
+    void addBoard(BoardRow const& board, BoardKey const& boardKey);
     void addProcessor(ProcessorRow const& processor, std::uint32_t entity, std::uint32_t board);
     void addPort(PortRow const& port, std::uint32_t entity, std::uint32_t board, int position);
     /// Enters an entity, unless there is no index left for it.
@@ -86,9 +80,9 @@ class Building {
 
 PhysicalEntities Building::build() {
     addChassisAndSlots();
-    std::vector<std::string> const names = keptNames(m_snapshot.boards);
-    for (std::size_t i = 0; i < names.size(); ++i) {
-        addBoard(m_snapshot.boards[i], names[i]);
+    std::vector<BoardKey> const boards = boardKeys(m_snapshot.boards);
+    for (std::size_t i = 0; i < boards.size(); ++i) {
+        addBoard(m_snapshot.boards[i], boards[i]);
         giveWay();
     }
     std::ranges::sort(m_built.entities, {}, &PhysicalRow::entity);
@@ -113,7 +107,7 @@ void Building::addChassisAndSlots() {
         keys.push_back({IndexKind::Slot, std::move(name)});
         numbers.push_back(*board.pciSlotNumber);
     }
-    std::vector<std::uint32_t> const indices = m_indices.indicesOf("", keys);
+    std::vector<std::uint32_t> const indices = m_indices.indicesOf(kNoBoard, keys);
     m_chassis = indices[0];
     PhysicalRow chassis;
     chassis.entity = m_chassis;
@@ -132,7 +126,7 @@ void Building::addChassisAndSlots() {
     }
 }
 
-void Building::addBoard(BoardRow const& board, std::string const& keptName) {
+void Building::addBoard(BoardRow const& board, BoardKey const& boardKey) {
     auto const processors = rowsOf(m_snapshot.records->processors, board.boardIndex);
     std::vector<PortRow const*> const& ports = m_ports[board.boardIndex];
     std::vector<IndexKey> keys{{IndexKind::Board, ""}};
@@ -145,7 +139,7 @@ void Building::addBoard(BoardRow const& board, std::string const& keptName) {
     }
     for (PortRow const* const port : ports)
         keys.push_back(port->key);
-    std::vector<std::uint32_t> const indices = m_indices.indicesOf(keptName, keys);
+    std::vector<std::uint32_t> const indices = m_indices.indicesOf(boardKey, keys);
     auto index = indices.begin();
     std::uint32_t const entity = *index++;
     if (entity == 0) return;

@@ -7,7 +7,7 @@
 #include <set>
 #include <utility>
 
-#include "agent/readers/BoardReader.h"
+#include "agent/readers/BoardKeys.h"
 #include "agent/readers/Courtesy.h"
 #include "agent/rows/StandardNumbers.h"
 
@@ -66,14 +66,14 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     ++m_reading;
     m_histories.begin(Clock::now());
     ToTicks const toTicks = [this](long seconds) { return m_uptime.of(seconds); };
-    std::vector<std::string> const names = keptNames(boards);
+    std::vector<BoardKey> const keys = boardKeys(boards);
     for (std::size_t i = 0; i < boards.size(); ++i) {
         std::uint32_t const boardIndex = boards[i].boardIndex;
         auto const board = m_manager.GetBoardByIndex(static_cast<int>(boardIndex));
         Board* const asked = board.get();
         if (asked == nullptr) continue;
         BoardInterfaces found = readInterfaces(*asked, toTicks, m_histories);
-        auto const indices = m_indices.indicesOf(names[i], found.keys);
+        auto const indices = m_indices.indicesOf(keys[i], found.keys);
         append(all, std::move(found), indices, boardIndex);
         giveWay();
     }

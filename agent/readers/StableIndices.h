@@ -3,60 +3,94 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <map>
 #include <span>
 #include <string>
 #include <vector>
 
-#include "agent/readers/IndexFile.h"
+#include "agent/readers/BoardKeys.h"
+#include "agent/readers/IndexTables.h"
+#include "agent/readers/StateFile.h"
 #include "agent/rows/IndexKey.h"
 
 namespace kvloamd {
 
-/// A thing is known by its board's serial number, its kind and its name; what belongs to no board,
-/// by an empty serial number. It keeps its index while its board is away, and across restarts as
-/// far as the file can be used.
+/// How long indices are kept for a board that is away.
+struct Retention {
+    std::int64_t days = 400; ///< on which the agent runs
+    std::size_t boards =
+        16384; ///< that are away; more than these: those that went first are forgotten
+    std::function<std::int64_t()> date =
+        {}; ///< today, in days since the epoch; empty: by the clock
+};
+
+/// A `StableIndices` gives indices to the things of boards. A thing is identified by its board's
+/// key, its kind and its name. It keeps its index while its board is away, and across restarts as
+/// far as the file can be used, until the board has been away for too long.
 ///
-/// The things that a board has when it first comes get neighbouring indices, in a block whose
-/// size is a power of two, with room for some more; a board that outgrows its blocks gets another.
-/// Not synchronised.
-class StableIndices {
+/// The things that a board has when it first appears get neighbouring indices, in a block whose
+/// size is a power of two, with room for some more. A board that outgrows its blocks gets another.
+/// Unsynchronised.
+class StableIndices final : private StatePart {
   public:
-    /// `file`: where indices are kept; empty: nowhere. `base`: the lowest index that is given to
-    /// whatever has none yet, above 0. `things`: what is numbered, for the log.
-    StableIndices(std::string file, std::uint32_t base, std::string things);
+    /// `base`: the lowest index for a board that has none yet; above 0. Nothing is kept.
+    explicit StableIndices(std::uint32_t base);
+    /// Kept in `file`, which outlives the indices.
+    StableIndices(StateFile& file, std::uint32_t base, Retention retention = {});
+    StableIndices(StableIndices const&) = delete;
+    StableIndices& operator=(StableIndices const&) = delete;
 
     /// The indices of a board's things, in the order of `keys`, which are all different. 0 where
-    /// there is no index left.
-    std::vector<std::uint32_t> indicesOf(std::string const& serialNumber,
-                                         std::span<IndexKey const> keys);
-    /// Writes what has been given since the last time to the file, in one piece.
+    /// no index is left, and where the thing is not known yet because the file is locked.
+    std::vector<std::uint32_t> indicesOf(BoardKey const& board, std::span<IndexKey const> keys);
+    /// Writes what is new since the last call, after every reading of all boards.
     void save();
 
-    /// What the file held of settings, when it was opened.
-    std::vector<SettingEntry> const& settings() const { return m_file.records().settings; }
-    /// Writes changes of settings to the file.
-    void save(std::vector<SettingEntry> settings);
+    /// Whether `index` belongs to something that is identified across restarts.
+    bool isStable(std::uint32_t index) const;
 
   private:
-    /// What is free in a block: `next` to `end - 1`.
-    struct Room {
+    /// Indices from `first` to `end - 1`, of which those from `next` on are free.
+    struct Block {
+        std::uint32_t first;
         std::uint32_t next;
         std::uint32_t end;
     };
+    static constexpr std::int64_t kUnknownDay = -1;
     struct Board {
         std::map<IndexKey, std::uint32_t> indices;
-        std::vector<Room> rooms;
+        std::vector<Block> blocks;
+        bool stable = true;
+        std::int64_t day = kUnknownDay; ///< the agent's day on which it was present last
+        std::uint64_t reading = 0;      ///< the reading that asked for it last
     };
+    using Place = std::map<std::string, Board>::iterator;
 
-    void load(IndexRecords const& records);
+    void load(Database& database) override;
+    void createTables(Database& database) override;
+    bool hasChanges() const override;
+    void writeChanges(Database& database) override;
+    void writeAll(Database& database) override;
+    void written() override;
+
+    bool contentsKnown() const { return m_file == nullptr || m_file->contentsKnown(); }
+    void countDays();
+    void present(std::string const& name, Board& board);
     /// Makes room for `count` more indices, unless there are none left.
-    void makeRoom(std::string const& serialNumber, Board& board, std::size_t count);
+    void makeRoom(std::string const& name, Board& board, std::size_t count);
+    void forgetBoards();
+    void forget(Place board);
 
-    IndexFile m_file;
+    StateFile* m_file = nullptr; ///< null: nothing is kept
+    std::uint32_t m_base;
+    Retention m_retention;
     std::uint64_t m_free;                  ///< the first index of the next block
-    std::map<std::string, Board> m_boards; ///< by serial number
+    std::map<std::string, Board> m_boards; ///< by key
+    Calendar m_calendar;
+    std::uint64_t m_reading = 1;
     IndexRecords m_unsaved;
+    bool m_changed = false; ///< `m_unsaved` has something
 };
 
 } // namespace kvloamd

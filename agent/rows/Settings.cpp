@@ -34,6 +34,14 @@ void Settings::load(std::vector<SettingEntry> const& entries) {
         if (entry.value) m_values.insert_or_assign(entry.key, *entry.value);
 }
 
+std::vector<SettingEntry> Settings::all() const {
+    std::scoped_lock const guard(m_mutex);
+    std::vector<SettingEntry> entries;
+    for (auto const& [key, value] : m_values)
+        entries.push_back({key, value});
+    return entries;
+}
+
 bool Settings::hasUnsaved() const {
     std::scoped_lock const guard(m_mutex);
     return !m_unsaved.empty();

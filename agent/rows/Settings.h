@@ -46,6 +46,8 @@ class Settings {
 
     /// Enters what was kept.
     void load(std::vector<SettingEntry> const& entries);
+    /// Everything that is set, ascending by key.
+    std::vector<SettingEntry> all() const;
     bool hasUnsaved() const;
     /// What has been set or forgotten since the last time, ascending by key.
     std::vector<SettingEntry> takeUnsaved();

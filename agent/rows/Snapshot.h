@@ -13,6 +13,7 @@
 #include "agent/rows/EntityRows.h"
 #include "agent/rows/FaultRow.h"
 #include "agent/rows/InterfaceRows.h"
+#include "agent/rows/Persistence.h"
 #include "agent/rows/PlatformRecords.h"
 #include "agent/rows/ProcessRow.h"
 #include "agent/rows/ResourceRow.h"
@@ -33,6 +34,7 @@ struct Snapshot {
     std::shared_ptr<PlatformRecords const> records = std::make_shared<PlatformRecords>(); ///< set
     InterfaceRows interfaces;
     EntityRows entities;
+    Persistence persistence = Persistence::Kept; ///< of the indices and settings
     Clock::time_point begun;                  ///< when reading began: what happened before is in it
     std::uint32_t number = 1;                 ///< how many have been made, this one included
     std::chrono::milliseconds refreshTime{0}; ///< how long reading took

@@ -45,9 +45,9 @@ ReferenceCounter<BoardManager> managerOf(int boards) {
 BoardRefresh::BoardRefresh(int boards)
     : m_manager(managerOf(boards)),
       m_source(*m_manager.get()),
-      m_indices("", 1000, "interfaces"),
+      m_indices(1000),
       m_interfaces(*m_manager.get(), m_indices, kvloamd::Clock::now()),
-      m_entityIndices("", 1, "physical entities"),
+      m_entityIndices(1),
       m_entities(m_entityIndices, kvloamd::Clock::now(), [] { return std::time(nullptr); }) {}
 
 void BoardRefresh::stopLines() {

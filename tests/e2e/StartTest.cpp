@@ -24,7 +24,7 @@ class StartTest : public AgentFixture {
     Result start(std::vector<std::string> arguments, std::string const& moduleFolder = {}) {
         std::vector<std::string> all{
             "--snmp-config",    path("snmp.conf"),
-            "--persistent-dir", path("persistent"),
+            "--persistent-dir", path("second"),
             "--module-dir",     moduleFolder.empty() ? moduleDirectory() : moduleFolder};
         if (std::ranges::find(arguments, "--port") == arguments.end()) {
             all.emplace_back("--port");
@@ -139,7 +139,7 @@ TEST_F(StartTest, CheckOfAGoodConfigurationSucceedsAndLeavesNothingBehind) {
     EXPECT_EQ(result.status, 0) << result.output;
     EXPECT_THAT(result.output, HasSubstr("the configuration is valid"));
     struct stat file {};
-    EXPECT_NE(stat(path("persistent/kvloamd.conf").c_str(), &file), 0);
+    EXPECT_NE(stat(path("second/kvloamd.conf").c_str(), &file), 0);
 }
 
 TEST_F(StartTest, SampleConfigurationsAreGood) {

@@ -141,7 +141,7 @@ TEST_F(SubagentTest, SecondAgentIsRefusedAndSaysSoOnce) {
     start();
     setVariable("KVLSIM_SOCKET", path("second.sock"));
     Process second({KVLOAMD, "--agentx", path("master.sock"), "--module", "z7sim", "--module-dir",
-                    moduleDirectory(), "--log-level", "debug"},
+                    moduleDirectory(), "--log-level", "debug", "--persistent-dir", path("second")},
                    environment());
     ASSERT_TRUE(second.waitFor("no connection to the SNMP master at")) << second.output();
     EXPECT_THAT(second.output(), HasSubstr("another agent serves them already"));

@@ -61,7 +61,7 @@ class LineListenerTest : public ::testing::Test {
 
     FakeChassis m_chassis;
     BoardSource m_source{*m_chassis.manager.get()};
-    StableIndices m_indices{"", 1000, "interfaces"};
+    StableIndices m_indices{1000};
     InterfaceReader m_reader{*m_chassis.manager.get(), m_indices,
                              Clock::now() - std::chrono::hours(1)};
     Settings m_settings;

@@ -40,7 +40,7 @@ class LineStormTest : public ::testing::Test {
 
     FakeChassis m_chassis;
     BoardSource m_source{*m_chassis.manager.get()};
-    StableIndices m_indices{"", 1000, "interfaces"};
+    StableIndices m_indices{1000};
     InterfaceReader m_reader{*m_chassis.manager.get(), m_indices, Clock::now()};
     Settings m_settings;
     Counters m_counters;

@@ -71,6 +71,12 @@ TEST_F(HealthTest, CountsAreThoseOfTheCounters) {
     EXPECT_EQ(number("kvlSnapshots"), 9);
 }
 
+TEST_F(HealthTest, PersistenceIsThatOfTheSnapshot) {
+    EXPECT_EQ(number("kvlPersistence"), 1);
+    m_snapshot.persistence = Persistence::Failing;
+    EXPECT_EQ(number("kvlPersistence"), 3);
+}
+
 TEST_F(HealthTest, StandAloneAgentHasNoMaster) {
     EXPECT_EQ(number("kvlAgentFront"), 1);
     EXPECT_FALSE(isKnown(value("kvlMasterState")));

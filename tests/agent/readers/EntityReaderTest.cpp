@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/readers/EntityReader.h"
+#include "agent/readers/StateFile.h"
 #include "agent/rows/IndexKey.h"
 #include "agent/rows/PlatformRecords.h"
 #include "board/Board.h"
@@ -79,7 +80,7 @@ class EntityReaderTest : public ::testing::Test {
     }
 
     Snapshot m_snapshot;
-    StableIndices m_indices{"", 1, "entities"};
+    StableIndices m_indices{1};
     // Long ago, so that what happens now is told by a time that is not 0.
     EntityReader m_reader{m_indices, Clock::now() - 1h, [] { return 1'000'000'000L; }};
 };
@@ -273,7 +274,7 @@ TEST_F(EntityReaderTest, BoardInAnotherSlotKeepsItsIndex) {
 }
 
 TEST_F(EntityReaderTest, EntityThatNoIndexIsLeftForIsLeftOut) {
-    StableIndices indices("", kLastIndex - 15, "entities"); // for the chassis and its slots
+    StableIndices indices(kLastIndex - 15); // for the chassis and its slots
     EntityReader reader(indices, Clock::now(), [] { return 1L; });
     addBoards();
     auto const physical = reader.read(m_snapshot).physical;
@@ -326,7 +327,9 @@ TEST_F(EntityReaderTest, IndicesAreTheSameAfterARestart) {
     std::string folder = ::testing::TempDir() + "entity-XXXXXX";
     ASSERT_NE(mkdtemp(folder.data()), nullptr);
     auto const readAnew = [&] {
-        StableIndices indices(folder + "/entity.sqlite", 1, "entities");
+        StateFile file(folder + "/entity.sqlite", "entities");
+        StableIndices indices(file, 1);
+        file.open();
         return EntityReader(indices, Clock::now(), [] { return 1L; })
             .read(m_snapshot)
             .physical->entities;

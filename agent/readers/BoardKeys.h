@@ -1,0 +1,29 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// What boards are known by wherever something is kept for them.
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "agent/rows/BoardRow.h"
+
+namespace kvloamd {
+
+/// A `BoardKey` identifies a board from one run of the agent to the next.
+struct BoardKey {
+    std::string name;   ///< not empty, except for what belongs to no board
+    bool stable = true; ///< false: good while the board is present; nothing may be kept for it
+
+    bool operator==(BoardKey const&) const = default;
+};
+
+/// The keys of `boards`, all different: a board's serial number, if it is known. A board of unknown
+/// serial number is known by its place: its slot, or else its logical identifier. Of several boards
+/// with one serial number, the one in the lowest place has it as its key, the others have their
+/// places besides. A board that has neither gets a key that is not stable.
+std::vector<BoardKey> boardKeys(std::vector<BoardRow> const& boards);
+
+/// "shelf 1 bus 2 slot 4", as far as the board knows; empty if it does not know its slot.
+std::string slotName(BoardRow const& board);
+
+} // namespace kvloamd
