@@ -7,11 +7,11 @@
 
 namespace KVL {
 
-/// An ordered map from indices to values, with the operations of `std::map`, that remembers the
-/// entry found last: a walk asks for one index after the other and finds the next one without a
-/// search. Unsynchronised, also for reading: the table's lock is held around every call.
+/// An `IndexedEntries` is an ordered map from indices to values, with the operations of `std::map`.
+/// It remembers the entry found last, so that a walk finds the next index without a search.
+/// Unsynchronised, also for reading: callers hold the table's lock.
 ///
-/// Not copyable: `auto entries = table.entries()` would fill a copy. Take a reference.
+/// Not copyable, because `auto entries = table.entries()` would fill a copy. Take a reference.
 template <class Index, class Value>
 class IndexedEntries : private std::map<Index, Value> {
     using Map = std::map<Index, Value>;

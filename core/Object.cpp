@@ -7,7 +7,7 @@
 
 namespace {
 
-/// An identifier list that begins with the root's own identifier, as every object's does.
+/// A `RootedIIDList` is a list that begins with the identifier of `Object`, as every object's does.
 class RootedIIDList : public KVL::IIDList {
   public:
     RootedIIDList() { add(KVL::IID("6Object")); }

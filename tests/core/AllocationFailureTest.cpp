@@ -25,7 +25,7 @@ constexpr long kNone = -1;
 long s_untilFailure = kNone; ///< allocations that succeed before one fails
 long s_blocks = 0;           ///< allocated and not freed
 
-/// While it lives, the allocation after `successes` others fails; those behind it succeed.
+/// A `FailingAllocation` lets one allocation fail while it exists, after `successes` that succeed.
 class FailingAllocation {
   public:
     explicit FailingAllocation(long successes) { s_untilFailure = successes; }
@@ -70,7 +70,7 @@ void operator delete(void* block, std::size_t /*size*/, std::align_val_t /*align
 
 namespace {
 
-/// More handles than identifier lists have been recycled before.
+/// More handles than the pool has recycled identifier lists, so that some handle allocates.
 constexpr int kMoreThanAreRecycled = 20000;
 
 int s_alive = 0;
@@ -87,7 +87,7 @@ Handle made() {
     return {new Counted};
 }
 
-/// Handles of enough objects that the reference table grows with the next few.
+/// Handles of so many objects that the reference table grows when a few more are made.
 std::vector<Handle> almostTooMany() {
     constexpr int kEnough = 506;
     std::vector<Handle> handles;
@@ -116,7 +116,7 @@ bool isUsable(std::vector<Handle> const& kept) {
 
 enum Outcome : int { NothingFailed, Failed, Unusable };
 
-/// What becomes of the process when the allocation after `successes` others of `storm` fails.
+/// Runs `storm` with one failing allocation, after `successes` others, and examines the library.
 template <class Storm>
 Outcome outcomeOf(Storm const& storm, long successes, std::vector<Handle> const& kept) {
     long const blocks = s_blocks;
@@ -128,16 +128,16 @@ Outcome outcomeOf(Storm const& storm, long successes, std::vector<Handle> const&
         failed = true;
     }
 #ifdef KVLOAM_NO_POOL
-    if (s_blocks != blocks) return Unusable; // something has leaked
+    if (s_blocks != blocks) return Unusable; // a block has leaked
 #else
-    static_cast<void>(blocks); // what is recycled is not given back
+    static_cast<void>(blocks); // the pool keeps blocks
 #endif
     if (!isUsable(kept)) return Unusable;
     return failed ? Failed : NothingFailed;
 }
 
-/// Each allocation of `storm` fails in a process of its own, so that nothing has been recycled and
-/// the reference table has not grown.
+/// Fails each allocation of `storm`, each in a new process, whose pool is empty and whose reference
+/// table has not grown.
 template <class Storm>
 void failEachAllocationOf(Storm const& storm, long atLeast) {
     std::vector<Handle> const kept = almostTooMany();

@@ -25,7 +25,7 @@ class HandleThreadsTest : public testing::Test {
   protected:
     static constexpr int kThreads = 4;
 
-    /// Runs `body(thread)` on all threads, which begin together.
+    /// Runs `body(thread)` on all threads, which start at the same time.
     template <class Body>
     static void together(Body const& body) {
         std::barrier begin(kThreads);
@@ -107,7 +107,7 @@ TEST_F(HandleThreadsTest, LastDropOnAnyThreadDeletesTheObject) {
 }
 
 TEST_F(HandleThreadsTest, HandlesOfAThreadThatEndsAreDroppedCleanly) {
-    // A handle in thread storage is dropped while the thread's recycling is already gone.
+    // The handle in thread storage is dropped after the thread's cache of recycled lists is gone.
     for (int round = 0; round < 20; ++round)
         std::thread([] {
             static thread_local Handle late;

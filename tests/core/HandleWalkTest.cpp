@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Walks over handles in a vector, and the search by name.
+// Walks over handles in a vector, and searches by name and by object.
 #include <cstring>
 #include <map>
 #include <string>
@@ -61,7 +61,7 @@ TEST_F(HandleWalkTest, NextOfAnObjectOutsideTheVectorIsEmpty) {
     EXPECT_EQ(next(Handle()).get(), nullptr);
 }
 
-TEST_F(HandleWalkTest, ObjectThatStandsTwiceIsFollowedByWhatStandsBehindTheFirst) {
+TEST_F(HandleWalkTest, NextOfAnObjectThatIsThereTwiceFollowsItsFirstHandle) {
     Handle const twice = named("a");
     Handle const second = named("b");
     m_handles.push_back(twice);
@@ -106,7 +106,7 @@ TEST_F(HandleWalkTest, ObjectIsFoundAtTheFirstHandleThatRefersToIt) {
     EXPECT_EQ(KVL::find_object(m_handles, twice.get()), m_handles.begin() + 1);
 }
 
-TEST_F(HandleWalkTest, ObjectWithoutAHandleThereIsNotFound) {
+TEST_F(HandleWalkTest, ObjectWithoutAHandleInTheVectorIsNotFound) {
     named("a");
     Handle const other(new Named("a"));
     EXPECT_EQ(KVL::find_object(m_handles, other.get()), m_handles.end());

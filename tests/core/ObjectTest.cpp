@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Objects: their lock and their identifiers.
+// Objects: the lock and the interface identifiers.
 #include <thread>
 
 #include <gtest/gtest.h>
@@ -48,7 +48,7 @@ TEST(ObjectTest, NewObjectAnswersToTheRootIdentifierOnly) {
 }
 
 TEST(ObjectTest, IdentifiersOfADeletedObjectDoNotShowUpInALaterOne) {
-    // Identifier lists are recycled; what one object added must not reach the next.
+    // Lists are recycled; an identifier that one object added must not reach the next object.
     for (int round = 0; round < 3; ++round) {
         Object object(false);
         EXPECT_FALSE(object.interfaces()->is_element(KVL::IID("7Feature")));
@@ -57,7 +57,7 @@ TEST(ObjectTest, IdentifiersOfADeletedObjectDoNotShowUpInALaterOne) {
     }
 }
 
-TEST(ObjectTest, EveryObjectOwnsAListOfItsOwn) {
+TEST(ObjectTest, EveryObjectHasItsOwnList) {
     Object first(false);
     Object second(false);
     first.interfaces()->add(KVL::IID("7Feature"));

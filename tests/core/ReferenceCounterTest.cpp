@@ -12,7 +12,7 @@
 
 namespace {
 
-/// An object that tells when it is deleted.
+/// An object that notes its deletion.
 class Tracked : public Object {
   public:
     explicit Tracked(bool& deleted) : Object(false), m_deleted(deleted) { m_deleted = false; }
@@ -36,7 +36,7 @@ class ReferenceCounterTest : public testing::Test {
 
 using Handle = ReferenceCounter<Tracked>;
 
-TEST_F(ReferenceCounterTest, HandlesMadeApartFromOnePointerCountTogether) {
+TEST_F(ReferenceCounterTest, HandlesMadeIndependentlyFromOnePointerShareTheCount) {
     auto* object = new Tracked(m_deleted);
     {
         Handle const first(object);
@@ -112,7 +112,7 @@ TEST_F(ReferenceCounterTest, SelfAssignmentOfOneOfTwoHandlesKeepsTheObject) {
     EXPECT_EQ(count(other.get()), 2);
 }
 
-TEST_F(ReferenceCounterTest, AssignmentLetsGoBeforeItTakesOn) {
+TEST_F(ReferenceCounterTest, AssignmentReleasesItsObjectFirst) {
     bool otherDeleted = false;
     Handle handle(new Tracked(m_deleted));
     Handle const other(new Tracked(otherDeleted));
@@ -132,7 +132,7 @@ TEST_F(ReferenceCounterTest, MoveTakesOverAndLeavesTheSourceEmpty) {
     EXPECT_EQ(count(object), 1);
 }
 
-TEST_F(ReferenceCounterTest, MoveAssignmentLetsGoOfTheFormerObject) {
+TEST_F(ReferenceCounterTest, MoveAssignmentReleasesTheFormerObject) {
     bool otherDeleted = false;
     Handle handle(new Tracked(m_deleted));
     handle = Handle(new Tracked(otherDeleted));
@@ -141,7 +141,7 @@ TEST_F(ReferenceCounterTest, MoveAssignmentLetsGoOfTheFormerObject) {
     EXPECT_EQ(count(handle.get()), 1);
 }
 
-TEST_F(ReferenceCounterTest, OnlyWhatAllocatesNothingPromisesNotToThrow) {
+TEST_F(ReferenceCounterTest, MoveAssignmentPromisesNotToThrowButConstructionDoesNot) {
     static_assert(!std::is_nothrow_move_constructible_v<Handle>);
     static_assert(std::is_nothrow_move_assignable_v<Handle>);
     Handle handle(new Tracked(m_deleted));

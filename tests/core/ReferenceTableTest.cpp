@@ -22,7 +22,7 @@ namespace {
 
 using Handle = ReferenceCounter<ReferenceTableTestObject>;
 
-/// A table of the test's own, beside the process's.
+/// A table besides the one that the process has.
 class OwnTable : public ReferenceTable {
   public:
     OwnTable() = default;
@@ -89,7 +89,7 @@ TEST_F(ReferenceTableTest, DumpIsInTheOrderOfAddresses) {
 }
 
 TEST_F(ReferenceTableTest, DumpDoesNotHoldTheLockWhileItWrites) {
-    /// A stream's buffer that tries the table's lock from another thread at every write.
+    /// A stream buffer that tries the table's lock from another thread at every write.
     class Trying : public std::stringbuf {
       public:
         explicit Trying(KVLLockable* lock) : m_lock(lock) {}
@@ -196,7 +196,7 @@ TEST_F(ReferenceTableTest, AddressOfADeletedObjectHasNoRecord) {
 }
 
 TEST(AddressMapTest, FindsWhatWasInsertedThroughGrowthAndErasure) {
-    // A model in plain sight: which of the addresses are in.
+    // The model: which of the addresses are in the map.
     std::vector<char> addresses(5000);
     std::vector<bool> in(addresses.size(), false);
     KVL::AddressMap<char*> map;

@@ -108,7 +108,7 @@ TEST_F(IndexedTableTest, TableIsLockable) {
     EXPECT_EQ(m_table.unlock(), 0);
 }
 
-TEST_F(IndexedTableTest, WalkGoesOnWhenTheEntryBehindItIsRemoved) {
+TEST_F(IndexedTableTest, WalkContinuesWhenAnEarlierEntryIsRemoved) {
     Handle const first = enter();
     enter();
     enter();

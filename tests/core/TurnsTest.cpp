@@ -32,7 +32,7 @@ TEST(TurnsTest, QuickStepsSendAThreadAway) {
     EXPECT_TRUE(turns.noteSteps(start + 10us));
 }
 
-TEST(TurnsTest, StepsThatTakeTheirTimeSendNobodyAway) {
+TEST(TurnsTest, SlowStepsSendNoThreadAway) {
     Turns turns;
     auto const start = Turns::Clock::now();
     turns.noteSteps(start);
