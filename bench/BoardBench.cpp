@@ -118,7 +118,7 @@ void walkByNextBoard(benchmark::State& state) {
 }
 
 void oneEventOurs(benchmark::State& state) {
-    // The adaptor lives as long as the process and so does whoever listens to it.
+    // The adaptor lives as long as the process, so its listeners must, too.
     static auto* const chassis = new Chassis(kFewBoards, true);
     auto const adaptor = ExternalEventAdaptor::get_instance();
     std::int32_t board = 0;

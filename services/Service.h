@@ -29,7 +29,7 @@ class KVLOAM_API Service : public Object {
     void SetServiceScmName(char* name);
     int GetServiceStatus();
     void SetServiceStatus(int status);
-    /// Deliberate: these two change nothing; whoever controls the service sets its status.
+    /// Deliberate: these two change nothing; the owner of the service sets its status.
     void SetStatusStarted();
     void SetStatusStopped();
 

@@ -28,14 +28,14 @@ std::string inherited(char const* name) {
 std::vector<Answer> parseAnswers(std::string const& output) {
     std::vector<Answer> answers;
     for (std::string const& line : linesOf(output)) {
-        // The end of what there is, not an answer.
+        // The end of the MIB view, not an answer.
         if (line.find("No more variables left in this MIB View") != std::string::npos) continue;
         auto const equals = line.find(" = ");
         auto name = parseOid(line.substr(0, equals));
         if (equals != std::string::npos && name.has_value())
             answers.push_back({std::move(*name), line.substr(equals + 3)});
         else if (!answers.empty())
-            answers.back().value += "\n" + line; // a value of several lines
+            answers.back().value += "\n" + line; // a value that continues on the next line
     }
     return answers;
 }
@@ -45,7 +45,7 @@ AgentFixture::AgentFixture() {
     if (mkdtemp(folder.data()) == nullptr) throw std::runtime_error("no temporary folder");
     m_folder = folder;
     m_snmpConfig = path("snmp.conf");
-    // The tools say so when they make it themselves.
+    // The tools print a message when they create it themselves.
     std::filesystem::create_directories(path("client/cert_indexes"));
     std::filesystem::create_directories(path("store"));
     configureSnmp("rocommunity public 127.0.0.1\n");

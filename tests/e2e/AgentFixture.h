@@ -28,16 +28,17 @@ struct Answer {
     bool operator==(Answer const&) const = default;
 };
 
-/// Each test has a folder and a platform of its own; everything that it starts ends with it.
+/// Gives each test a directory and a simulated platform, and ends everything that it started.
 class AgentFixture : public ::testing::Test {
   protected:
     AgentFixture();
     ~AgentFixture() override;
 
-    /// Writes the SNMP configuration of agents started later. By default it allows everybody on
-    /// loopback to read.
+    /// Sets the SNMP configuration of agents started later. By default everybody on loopback may
+    /// read.
     void configureSnmp(std::string const& text) { write(m_snmpConfig, text); }
-    /// The chassis of agents started later; without it, the simulator's own of three boards.
+    /// Sets the chassis of agents started later. By default it is the bundled chassis of three
+    /// boards.
     void useChassis(std::string const& yaml);
 
     /// Starts the agent on a free port and waits until it serves.
@@ -52,7 +53,7 @@ class AgentFixture : public ::testing::Test {
 
     /// Runs one of the SNMP tools against the agent. The names of KVL-OAM-MIB may be used.
     Result snmp(std::string const& tool, std::vector<std::string> const& arguments) const;
-    /// As reader of version 2c, printing names as numbers.
+    /// The same with SNMPv2c, read access and numeric names.
     Result ask(std::string const& tool, std::vector<std::string> const& arguments) const;
     /// The same, with the answers read; expects success.
     std::vector<Answer> answers(std::string const& tool,
@@ -74,11 +75,11 @@ class AgentFixture : public ::testing::Test {
     void startWithReceiver(std::string const& access = "rocommunity");
 
     static int freePort();
-    /// Whether the kernel lists the UDP port as bound.
+    /// Whether a process on this host has bound the UDP port.
     static bool udpPortIsBound(int port);
-    /// Directs the SNMP tools to this port of loopback.
+    /// Directs the SNMP tools to this port of the loopback address.
     void askPort(int port) { m_port = port; }
-    /// What children started later see beside the fixture's own variables.
+    /// Sets an environment variable of children started later.
     void setVariable(std::string const& name, std::string const& value) {
         m_variables[name] = value;
     }
@@ -94,7 +95,7 @@ class AgentFixture : public ::testing::Test {
     static constexpr char kBoards[] = "1.3.6.1.4.1.32473.1.1.2";
     static constexpr char kTable[] = "1.3.6.1.4.1.32473.1.1.2.4";
 
-    /// What children see of the environment.
+    /// The environment of children.
     Process::Environment environment() const;
 
   private:

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The statement of what the agent implements is valid, and agrees with what it serves.
+// The capability statement is valid and agrees with what the agent serves.
 #include <filesystem>
 #include <fstream>
 #include <map>
@@ -44,12 +44,12 @@ class CapabilitiesTest : public AgentFixture {
             if (file.path() != kStatement) readStandIn(contentOf(file.path()));
     }
 
-    /// What smilint says of `file`, with the host's own configuration left out.
+    /// The output of smilint for `file`, without the host's configuration.
     Result lint(std::string const& file) {
         write(path("smi.conf"), std::string("path ") + MIB_PATH + ":" + kFolder + "\n");
         return run({"smilint", "-c", path("smi.conf"), "-l", "4", file});
     }
-    /// The places, below mib-2, of the objects that the agent serves of the standard modules.
+    /// The object identifiers, below mib-2, that the agent serves from standard modules.
     static std::map<std::string, Oid> served() {
         std::map<std::string, Oid> places;
         for (Scalar const& scalar : standardScalars())
@@ -61,7 +61,7 @@ class CapabilitiesTest : public AgentFixture {
             }
         return places;
     }
-    /// The objects of the stand-ins: below none of these is anything.
+    /// The leaf objects of the stand-in modules.
     std::set<std::string> objects() const {
         std::set<std::string> names;
         for (auto const& [name, place] : m_places)
@@ -69,7 +69,7 @@ class CapabilitiesTest : public AgentFixture {
                 names.insert(name);
         return names;
     }
-    /// The objects whose variation has this access.
+    /// The objects whose VARIATION states this access.
     static std::set<std::string> stated(std::string const& access) {
         auto const names =
             found(contentOf(kStatement), "VARIATION (\\w+)\\s+ACCESS " + access + "\\s");

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The physical entities and their states, asked of the real agent by number.
+// The physical entities and their states, as the real agent serves them.
 #include <algorithm>
 #include <cstdio>
 #include <map>
@@ -23,14 +23,14 @@ constexpr char kContains[] = "1.3.6.1.2.1.47.1.3.3.1.1";
 constexpr char kLastChange[] = "1.3.6.1.2.1.47.1.4.1.0";
 constexpr char kState[] = "1.3.6.1.2.1.131.1.1.1.";
 
-// As a receiver that has no files of the standard MIB modules prints them.
+// As a receiver without the standard MIB modules prints them.
 constexpr char kConfigChange[] = "SNMPv2-SMI::mib-2.47.2.0.1";
 constexpr char kOperEnabled[] = "SNMPv2-SMI::mib-2.131.0.1";
 constexpr char kOperDisabled[] = "SNMPv2-SMI::mib-2.131.0.2";
 
 class EntityTest : public AgentFixture {
   protected:
-    /// The values of a column by what follows its number, "17".
+    /// The values of a column by index, such as "17".
     std::map<std::string, std::string> column(std::string const& name) const {
         std::map<std::string, std::string> values;
         for (Answer const& answer : answers("snmpbulkwalk", {"-Oe", "-Cr50", name})) {
@@ -48,7 +48,7 @@ class EntityTest : public AgentFixture {
     std::string state(int number, std::string const& entity) const {
         return get(kState + std::to_string(number) + "." + entity);
     }
-    /// The index in which a column has a text; "none" when there is none.
+    /// The index of the row in which a column has this text; "none" if there is none.
     std::string entityWith(int number, std::string const& text) const {
         for (auto const& [index, value] : physical(number))
             if (value == "STRING: \"" + text + "\"") return index;
@@ -66,7 +66,7 @@ class EntityTest : public AgentFixture {
     std::string containerOf(std::string const& entity) const {
         return get(kPhysical + ("4." + entity)).substr(std::string("INTEGER: ").size());
     }
-    /// The agent's uptime, in seconds, in every notification of that name.
+    /// The sysUpTime, in seconds, of every notification of that name.
     std::vector<double> uptimesOf(std::string const& notification) {
         std::vector<double> times;
         for (std::string const& line : linesOf(trapReceiver().output())) {
@@ -113,7 +113,7 @@ TEST_F(EntityTest, EveryEntityLeadsToTheChassis) {
             at = containers.at(at).substr(std::string("INTEGER: ").size());
         EXPECT_EQ(at, "0") << entity;
     }
-    // The table of contents says the same.
+    // entPhysicalContainsTable agrees.
     auto const contains = column(kContains);
     EXPECT_THAT(contains, SizeIs(17));
     for (auto const& [pair, child] : contains) {
@@ -184,7 +184,7 @@ TEST_F(EntityTest, PulledBoardIsGoneAndComesBackUnderItsIndices) {
     long const removed = lastChange();
     EXPECT_GT(removed, 0);
 
-    // In another slot, which is an entity of its own; the board is the same.
+    // The other slot is a new entity; the board keeps its index.
     write(path("board.yaml"), "boards:\n" + boardInSlot(5, "TWO"));
     sim({"insert", path("board.yaml")});
     EXPECT_TRUE(eventually([&] { return portNamed("line-TWO") == port; }));
@@ -206,7 +206,7 @@ TEST_F(EntityTest, ChangesWithinThePauseAreToldAtItsEnd) {
     EXPECT_TRUE(trapReceiver().waitFor(kConfigChange, 2)) << trapReceiver().output();
     auto const times = uptimesOf(kConfigChange);
     ASSERT_GE(times.size(), 2U);
-    // The second that is missing to the pause is for a machine that is busy.
+    // One second less than the pause, to allow for a busy machine.
     for (std::size_t i = 1; i < times.size(); ++i)
         EXPECT_GE(times[i] - times[i - 1], 4.0);
 }
@@ -261,7 +261,7 @@ TEST_F(EntityTest, PortWithCallsIsActive) {
     sim({"call", "setup", "301"});
     EXPECT_TRUE(eventually([&] { return state(4, port) == "INTEGER: 3"; })); // active
     EXPECT_EQ(state(4, portNamed("vorn-primary-rate-2")), "INTEGER: 2");
-    EXPECT_EQ(state(4, portNamed("nx5-trunk-1")), "INTEGER: 1"); // nobody knows
+    EXPECT_EQ(state(4, portNamed("nx5-trunk-1")), "INTEGER: 1"); // unknown
 }
 
 TEST_F(EntityTest, IndicesAreTheSameAfterARestart) {
@@ -270,7 +270,7 @@ TEST_F(EntityTest, IndicesAreTheSameAfterARestart) {
     EXPECT_TRUE(eventually([&] { return boardOf("NX50001") == "none"; }));
     auto const before = physical(7);
     EXPECT_EQ(stopAgent(), 0);
-    // The chassis of the start again: what was there before is where it was.
+    // The original chassis again: its entities have their original indices.
     startAgent();
     auto const after = physical(7);
     EXPECT_GT(after.size(), before.size());

@@ -29,11 +29,11 @@ std::array<Oid, 8> const kPlaces{{{1, 3, 6, 1, 2, 1, 2},
                                   {1, 3, 6, 1, 2, 1, 131, 1},
                                   {1, 3, 6, 1, 4, 1, 32473, 1, 1}}};
 
-/// Where a master has rows of its own among ours; their last number is an interface's index.
+/// The tables in which a master has rows of its own. The last number of a name is an ifIndex.
 std::array<Oid, 3> const kSharedTables{
     {{1, 3, 6, 1, 2, 1, 2, 2}, {1, 3, 6, 1, 2, 1, 10, 7, 2}, {1, 3, 6, 1, 2, 1, 31, 1, 1}}};
 
-/// And what is the master's alone.
+/// The objects that only the master serves.
 std::array<Oid, 2> const kMasterScalars{
     {{1, 3, 6, 1, 2, 1, 2, 1, 0}, {1, 3, 6, 1, 2, 1, 31, 1, 5, 0}}};
 
@@ -55,7 +55,7 @@ std::string typeOf(std::string const& value) {
     return value.substr(0, value.find(": "));
 }
 
-/// Tools end some values with a blank; the file's lines do not.
+/// Removes trailing blanks, which the tools print after some values.
 std::string trimmed(std::string value) {
     value.erase(value.find_last_not_of(' ') + 1);
     return value;
@@ -69,8 +69,8 @@ void expectSame(Answer const& answered, Answer const& expected) {
         EXPECT_EQ(trimmed(answered.value), expected.value) << text(expected.name);
 }
 
-/// Where to ask on after a name of somebody else's: behind it or, where nothing of ours is around
-/// it, at the next place that has something.
+/// The name from which to continue after one that another agent serves: that name itself or,
+/// outside the shared tables, the next object that we serve.
 Oid pastForeign(Oid const& name) {
     auto const next = std::ranges::upper_bound(kPlaces, name);
     bool const around = next != kPlaces.begin() && startsWith(name, *std::prev(next));
@@ -101,7 +101,7 @@ Expectation::Expectation(std::string const& file, Served served, int agentPid, A
     EXPECT_TRUE(std::ranges::is_sorted(m_all, {}, &Answer::name));
 }
 
-/// Whether a name is none of ours: the master's, or of something that we do not serve.
+/// Whether our agent does not serve this name.
 bool Expectation::isForeign(Oid const& name) const {
     if (!isBelowAny(name, kPlaces)) return true;
     if (m_served == Served::Alone) return false;
@@ -123,7 +123,7 @@ void Expectation::expectGet() const {
     }
 }
 
-/// The next answer of ours after each name; a name of somebody else's on the way is passed over.
+/// The next answer of our agent after each name. Answers of other agents in between are skipped.
 std::vector<Answer> Expectation::nextOwn(std::vector<Oid> const& names) const {
     std::vector<Answer> found(names.size());
     std::vector<std::size_t> open;

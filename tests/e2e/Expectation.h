@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// What an agent answers, object by object, as a file says it.
+// Compares the answers of an agent with an expectation file.
 #pragma once
 
 #include <functional>
@@ -30,7 +30,7 @@ class Expectation {
     void expectGetNext() const;
     /// GETBULK from every seventh name answers with the lines after it.
     void expectGetBulk() const;
-    /// A walk of all that the agent serves answers with all lines, and no others.
+    /// A walk of everything that the agent serves answers with exactly the lines of the file.
     void expectWalk() const;
 
   private:

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Every object of every table, as the expectation file has it.
+// Compares every object of every table with the expectation file.
 #include "tests/e2e/Expectation.h"
 
 #include <fstream>

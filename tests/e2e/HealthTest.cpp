@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// What the agent tells of itself, as its clients see it.
+// The agent's own state, as clients see it.
 #include <gmock/gmock.h>
 
 #include "tests/e2e/AgentFixture.h"

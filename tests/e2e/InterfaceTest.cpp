@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The standard tables of lines, channels and interfaces, asked of the real agent by number.
+// The standard tables of lines, channels and interfaces, as the real agent serves them.
 #include <algorithm>
 #include <cstdlib>
 #include <filesystem>
@@ -42,7 +42,7 @@ class InterfaceTest : public AgentFixture {
                       [](Answer const& answer) { return answer.value.starts_with("No Such"); });
         return all;
     }
-    /// The values of a column by what follows its number, "1000" or "1000.96".
+    /// The values of a column by index, such as "1000" or "1000.96".
     std::map<std::string, std::string> column(std::string const& name) const {
         std::map<std::string, std::string> values;
         std::size_t const parts = parseOid(name)->size();
@@ -120,7 +120,7 @@ TEST_F(InterfaceTest, LineHasTheColumnsThatItCanAnswer) {
     EXPECT_EQ(at(c(kIfX, 15), line), "Gauge32: 2");
     EXPECT_EQ(at(c(kIfX, 17), line), "INTEGER: 1");
     EXPECT_EQ(at(c(kIfX, 18), line), "STRING: \"T1-0001\"");
-    // It carries bits, not packets.
+    // A line carries bits, not packets, so it has no packet counters.
     for (int const number : {4, 10, 11, 20})
         EXPECT_THAT(at(c(kIf, number), line), HasSubstr("No Such Instance"));
     EXPECT_THAT(at(c(kIfX, 6), line), HasSubstr("No Such Instance"));
@@ -128,7 +128,7 @@ TEST_F(InterfaceTest, LineHasTheColumnsThatItCanAnswer) {
 
 TEST_F(InterfaceTest, CountersOfAnInterfaceHave64Bits) {
     startAgent();
-    // Those of the host's loopback, over which the agent is asked.
+    // The counters of the host's loopback interface, which carries the requests.
     auto const octets = column(c(kIfX, 6));
     ASSERT_THAT(octets, SizeIs(::testing::Ge(2U)));
     for (auto const& [index, value] : octets)
@@ -177,7 +177,7 @@ TEST_F(InterfaceTest, BrokenLineShowsInItsStatusAndIsDown) {
     EXPECT_TRUE(eventually([&] { return (numberIn(at(c(kConfig, 10), line)) & 64) != 0; }));
     EXPECT_TRUE(eventually([&] { return at(c(kIf, 8), line) == "INTEGER: 2"; }));
     EXPECT_EQ(at(c(kIf, 8), lineNamed("nx5-trunk-1")), "INTEGER: 1");
-    // It counts, and tells when it broke.
+    // The line counts, and reports the time of the failure.
     EXPECT_TRUE(eventually([&] { return numberIn(at(c(kCurrent, 5), line)) > 0; }));
     EXPECT_THAT(at(c(kConfig, 16), line), HasSubstr("Timeticks: ("));
     sim({"line", "mend", "102"});
@@ -215,7 +215,8 @@ TEST_F(InterfaceTest, LineWithAPastHasItsIntervals) {
 
 TEST_F(InterfaceTest, PastOfALineShowsInTheIntervalsThatItWasIn) {
     startWithFullHistory();
-    // Without signal for 240 seconds, 50400 seconds ago: 56 intervals back, or over two of them.
+    // The signal was lost for 240 seconds, 50400 seconds ago: in interval 56, or in two
+    // neighbouring intervals.
     auto const unavailable = column(c(kInterval, 6));
     std::string const line = lineNamed("nx5-trunk-1");
     long seconds = 0;
@@ -331,7 +332,7 @@ TEST_F(InterfaceTest, RowsGoWithABoardAndComeBackUnderTheSameIndices) {
     EXPECT_TRUE(eventually([&] { return column(c(kConfig, 1)).size() == 1; }));
     EXPECT_EQ(lineNamed("line-ONE"), "none");
     EXPECT_EQ(lineNamed("line-TWO"), "1016");
-    // A board of another serial number in its place is another board.
+    // A board with another serial number is another board, even in the same slot.
     write(path("new.yaml"), "boards:\n" + boardWithLine(1, "NEW"));
     sim({"insert", path("new.yaml")});
     EXPECT_TRUE(eventually([&] { return lineNamed("line-NEW") == "1032"; }));

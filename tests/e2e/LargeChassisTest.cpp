@@ -14,7 +14,7 @@ namespace {
 
 using ::testing::SizeIs;
 
-/// A thousand, and fewer under sanitizers, which are an order of magnitude slower.
+/// 1000 boards; fewer under sanitizers, which are an order of magnitude slower.
 constexpr std::size_t kManyBoards = LARGE_CHASSIS;
 constexpr std::size_t kManyLines = 4 * kManyBoards;
 
@@ -27,7 +27,7 @@ class LargeChassisTest : public AgentFixture {
         useChassis(chassis.output);
     }
 
-    /// All below `from`, which comes in order.
+    /// Walks everything below `from` and expects ascending names.
     std::vector<Answer> bulkWalk(std::string const& from) const {
         auto walked = answers("snmpbulkwalk", {"-Cr50", from});
         EXPECT_EQ(std::ranges::adjacent_find(walked,
@@ -37,7 +37,7 @@ class LargeChassisTest : public AgentFixture {
                   walked.end());
         return walked;
     }
-    /// The rows of a table by its columns' numbers; every column has all of them.
+    /// The number of rows of each column. Expects that all columns of a table have the same.
     void expectRows(std::string const& entry, std::vector<int> const& columns,
                     std::size_t count) const {
         auto const walked = bulkWalk(entry);
@@ -58,7 +58,7 @@ TEST_F(LargeChassisTest, EveryBoardAndEveryLineIsThere) {
     for (Answer const& answer : bulkWalk("kvlBoardSerialNumber"))
         serialNumbers.insert(answer.value);
     EXPECT_THAT(serialNumbers, SizeIs(kManyBoards));
-    // Beside its lines, a board may have interfaces of the host.
+    // Besides its lines, a board may have interfaces of the host.
     std::string const number = get("1.3.6.1.2.1.2.1.0");
     std::size_t const interfaces = std::stoul(number.substr(number.find(": ") + 2));
     EXPECT_GE(interfaces, kManyLines);

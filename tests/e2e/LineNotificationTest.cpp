@@ -10,11 +10,11 @@ namespace {
 using ::testing::HasSubstr;
 using ::testing::Not;
 
-/// Of the line of index 1000, which is device 101, and its link.
+/// Notifications of the line with ifIndex 1000, which is device 101, and of its link.
 constexpr char kLineTraps[] = "1.3.6.1.2.1.10.18.6.1.17.1000";
 constexpr char kLinkTraps[] = "1.3.6.1.2.1.31.1.1.1.14.1000";
 
-/// A cut line has no signal and no frame, tells its far end, and is unavailable.
+/// The status of a cut line: no signal, no frame, RAI sent to the far end, unavailable.
 constexpr char kCut[] = "8292";
 constexpr char kWhole[] = "1";
 
@@ -88,7 +88,7 @@ TEST_F(LineNotificationTest, LineForWhichItIsNotEnabledIsNotTold) {
     cut();
     expectLinkTold(3, "1000", 2);
     mend();
-    // What the line had to tell would have come before this.
+    // A notification of the line would have arrived before this one.
     expectLinkTold(4, "1000", 1);
     EXPECT_THAT(trapReceiver().output(), Not(HasSubstr(kAnyLine)));
 }

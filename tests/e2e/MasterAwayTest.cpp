@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Masters that are late, go, come back, or hang: the agent goes on, and says so once.
+// Masters that are late, go away, return or hang: the agent continues and logs each change once.
 #include <csignal>
 
 #include <gmock/gmock.h>
@@ -124,7 +124,7 @@ TEST_F(MasterAwayTest, MasterThatRestartsFiveTimesQuicklyServesInTheEnd) {
 TEST_F(MasterAwayTest, MasterThatHangsServesAgainWhenItGoesOn) {
     start();
     master().signal(SIGSTOP);
-    // The notification is what the master does not answer.
+    // The master does not acknowledge the notification.
     sim({"stop", "1"});
     ASSERT_TRUE(isLost()) << agent().output();
     EXPECT_THAT(agent().output(), HasSubstr("it does not answer"));
@@ -194,7 +194,7 @@ TEST_F(MasterAwayTest, StopWithoutAMasterSaysWhatCouldNotBeSent) {
         << agent().output();
     sim({"remove", "2"});
     EXPECT_EQ(stopAgent(), 0) << agent().output();
-    // That of the board, and perhaps that of what it was to the chassis.
+    // One for the board, and perhaps one for the physical entities.
     EXPECT_THAT(agent().output(),
                 ::testing::ContainsRegex("notifications not sent before the stop: [1-9]"));
 }

@@ -15,7 +15,7 @@ MasterFixture::MasterFixture()
 MasterFixture::~MasterFixture() = default;
 
 void MasterFixture::startMaster() {
-    // A line a request would fill the pipe of its output.
+    // One log line for each request would fill the output pipe.
     write(path("snmpd.conf"), "master agentx\nagentXSocket " + m_address +
                                   "\ndontLogTCPWrappersConnects yes\n"
                                   "rocommunity public 127.0.0.1\n" +

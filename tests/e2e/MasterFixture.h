@@ -10,8 +10,8 @@
 
 namespace kvloamd::e2e {
 
-/// The SNMP tools ask the master. It is none of the host's: its configuration, socket, port and
-/// state are the test's own.
+/// Adds a master, with its own configuration, socket, port and state. The SNMP tools ask the
+/// master.
 class MasterFixture : public AgentFixture {
   protected:
     MasterFixture();
@@ -22,24 +22,23 @@ class MasterFixture : public AgentFixture {
     /// Directs the SNMP tools to the master again.
     void askMaster() { askPort(m_masterPort); }
     Process& master() { return *m_master; }
-    /// Ends the master at once.
+    /// Kills the master.
     void killMaster();
-    /// What the configuration of masters started later says beside the least.
+    /// Adds lines to the configuration of masters started later.
     void configureMaster(std::string const& text) { m_config = text; }
-    /// Where subagents reach masters started later.
+    /// Sets the AgentX address of masters started later.
     void useMasterAddress(std::string const& address) { m_address = address; }
 
-    /// Starts the agent as a subagent; waits until it serves that many boards, which needs no
-    /// master.
+    /// Starts the agent as a subagent and waits until it serves that many boards. Needs no master.
     void startSubagent(int boards = 3);
-    /// Waits until the agent has said `times` times that it is connected.
+    /// Waits until the agent has logged `times` times that it is connected.
     bool isConnected(int times = 1) {
         return agent().waitFor("kvloamd: connected to the SNMP master", times);
     }
     bool isLost(int times = 1) { return agent().waitFor("kvloamd: lost the SNMP master", times); }
-    /// What the agent has said of its master so far, a word a line: "none", "connected", "lost".
+    /// The agent's log lines about its master so far, as "none", "connected" or "lost".
     std::vector<std::string> statesTold();
-    /// How often `text` stands in `output`.
+    /// How often `output` contains `text`.
     static int count(std::string const& output, std::string const& text);
 
   private:

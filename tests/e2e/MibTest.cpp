@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The MIB module is valid, and the agent's descriptions agree with it.
+// KVL-OAM-MIB is valid, and the agent's descriptions agree with it.
 #include <fstream>
 #include <sstream>
 
@@ -19,17 +19,17 @@ using ::testing::Not;
 
 class MibTest : public AgentFixture {
   protected:
-    /// What smilint says of `file`, with the host's own configuration left out.
+    /// The output of smilint for `file`, without the host's configuration.
     Result lint(std::string const& file) {
         write(path("smi.conf"), "path " MIB_PATH "\n");
         return run({"smilint", "-c", path("smi.conf"), "-l", "4", file});
     }
-    /// The number of an object that the MIB module names.
+    /// The number of the object with this name in the MIB module.
     std::string numberOf(std::string const& name) {
         Result const result = snmp("snmptranslate", {"-On", "KVL-OAM-MIB::" + name});
         return result.output.substr(0, result.output.find('\n'));
     }
-    /// The syntax that the MIB module gives an object, reduced to its base type.
+    /// The base type of an object's syntax in the MIB module.
     std::string syntaxOf(std::string const& name) {
         Result const result = snmp("snmptranslate", {"-Td", "KVL-OAM-MIB::" + name});
         auto const at = result.output.find("SYNTAX");

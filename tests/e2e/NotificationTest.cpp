@@ -25,7 +25,7 @@ class NotificationTest : public AgentFixture {
         startAgent();
     }
 
-    /// One notification as it is printed: which, of which board, and its new status.
+    /// A notification as the receiver prints it: its name, the board, and the new status.
     static std::string announced(int index, std::string const& serialNumber,
                                  std::string const& status) {
         return "KVL-OAM-MIB::kvlBoardStatusChange\tKVL-OAM-MIB::kvlNotifyBoardIndex.0 = " +

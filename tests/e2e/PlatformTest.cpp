@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The tables of devices, store records, modules and processes, asked of the real agent.
+// The tables of devices, store records, modules and processes, as the real agent serves them.
 #include <fcntl.h>
 #include <unistd.h>
 
@@ -22,7 +22,7 @@ using ::testing::IsEmpty;
 using ::testing::Not;
 using ::testing::SizeIs;
 
-/// A lock on a whole file that keeps every other process's locks away; its end gives it back.
+/// An exclusive lock on a whole file for a scope.
 class FileLock {
   public:
     explicit FileLock(std::string const& file) : m_descriptor(open(file.c_str(), O_RDWR)) {
@@ -50,13 +50,13 @@ class PlatformTest : public AgentFixture {
     /// The lines of a table's rows, each beginning with the index: "1.101 ...".
     std::vector<std::string> rows(std::string const& name) const {
         auto lines = linesOf(table(name).output);
-        // Title, blank, head.
+        // The title, an empty line and the column heads.
         lines.erase(lines.begin(), lines.begin() + std::min<std::ptrdiff_t>(3, std::ssize(lines)));
         return lines;
     }
     std::vector<std::string> values(std::string const& column) const {
         std::vector<std::string> all;
-        // A walk of a column without instances answers nothing but that.
+        // The only answer of a walk of a column without instances.
         for (Answer const& answer : walk(column))
             if (!answer.value.starts_with("No Such")) all.push_back(answer.value);
         return all;
@@ -116,7 +116,7 @@ TEST_F(PlatformTest, StoreRecordsOfTheExampleChassisAreShown) {
 TEST_F(PlatformTest, ProcessesOfTheExampleChassisAreShown) {
     startAgent();
     EXPECT_THAT(rows("kvlProcessTable"), SizeIs(3));
-    // A child's name shows when the host knows its program.
+    // The name of a child is known once it has executed its program.
     for (char const* const name : {"STRING: kvloamd", "STRING: call-server", "STRING: announcer"})
         EXPECT_TRUE(eventually([&] {
             return std::ranges::count(values("kvlProcessName"), name) == 1;

@@ -89,7 +89,7 @@ int Process::wait() {
     auto const deadline = std::chrono::steady_clock::now() + kPatience;
     while (readMore(deadline)) {
     }
-    // The output has ended, so the process has, or is about to; or it hangs and is ended here.
+    // The output has ended, so the process has ended or is about to. One that hangs is killed here.
     if (std::chrono::steady_clock::now() >= deadline) signal(SIGKILL);
     int status = 0;
     waitpid(m_pid, &status, 0);

@@ -11,23 +11,24 @@
 
 namespace kvloamd::e2e {
 
-/// The most that a test waits for anything; only a failing one waits that long.
+/// The longest time that a test waits for anything. Only a failing test waits that long.
 inline constexpr std::chrono::seconds kPatience{90};
 
-/// Started by the constructor, killed by the destructor if it still runs. Its standard output and
-/// error arrive as one stream.
+/// A `Process` is a child process that the constructor starts and the destructor kills if it still
+/// runs. Its standard output and error are read as one stream.
 class Process {
   public:
     using Environment = std::map<std::string, std::string>;
 
-    /// `environment` is all that the child sees. The program is looked for on the test's PATH.
+    /// `environment` is the whole environment of the child. The program is searched on the test's
+    /// PATH.
     Process(std::vector<std::string> const& command, Environment const& environment);
     ~Process();
     Process(Process const&) = delete;
     Process& operator=(Process const&) = delete;
 
-    /// Reads on until `text` has appeared `times` times in all of the output so far. False when the
-    /// output ends or patience does.
+    /// Reads until the whole output contains `text` at least `times` times. False when the output
+    /// ends or `kPatience` is over.
     bool waitFor(std::string const& text, int times = 1);
     /// Reads to the end of the output, waits for the process, and returns its exit status; 128 and
     /// the signal when one ended it.

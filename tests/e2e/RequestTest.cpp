@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Single requests: what is not there, what may not be written, who may see what.
+// Single requests: missing instances, read-only objects and views.
 #include <gmock/gmock.h>
 
 #include "tests/e2e/AgentFixture.h"
@@ -89,7 +89,7 @@ TEST_F(RequestTest, AgentListensOnSeveralAddresses) {
     }
 }
 
-/// A reader who may see the boards' names, and the status of the second board.
+/// A user whose view contains the boards' names and the status of the second board.
 class RestrictedViewTest : public AgentFixture {
   protected:
     RestrictedViewTest() {

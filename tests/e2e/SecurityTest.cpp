@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Who gets an answer.
+// Access by community and by SNMPv3 user.
 #include <gmock/gmock.h>
 
 #include "tests/e2e/AgentFixture.h"
@@ -51,7 +51,8 @@ TEST_F(SecurityTest, RepeatedWrongPasswordsDoNotFillTheLog) {
         askAs("op", "wrongpass", "privpass1");
     stopAgent();
     EXPECT_THAT(agent().output(), HasSubstr("Authentication failed for op"));
-    EXPECT_THAT(linesOf(agent().output()), SizeIs(4)) << agent().output(); // and start, and stop
+    EXPECT_THAT(linesOf(agent().output()), SizeIs(4))
+        << agent().output(); // and the lines of start and stop
 }
 
 TEST_F(SecurityTest, WrongPrivacyPasswordIsRefused) {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The agent under a service manager, whose part the test plays.
+// The agent under a service manager, which the test simulates.
 #include <poll.h>
 #include <sys/socket.h>
 #include <sys/un.h>
@@ -18,7 +18,7 @@ namespace {
 using ::testing::HasSubstr;
 using ::testing::Not;
 
-/// Where a service manager hears of its services.
+/// The notification socket of a service manager.
 class NoticeSocket {
   public:
     explicit NoticeSocket(std::string const& path)
@@ -33,7 +33,7 @@ class NoticeSocket {
     NoticeSocket(NoticeSocket const&) = delete;
     NoticeSocket& operator=(NoticeSocket const&) = delete;
 
-    /// Waits for a notice with this line.
+    /// Waits for a message that contains this line.
     bool hears(std::string const& line) const {
         auto const deadline = std::chrono::steady_clock::now() + kPatience;
         while (std::chrono::steady_clock::now() < deadline) {
@@ -62,7 +62,7 @@ class ServiceTest : public AgentFixture {
         startAgent({"--config", path("kvloamd.toml")});
         ASSERT_TRUE(m_manager.hears("READY=1"));
     }
-    /// Has the agent read this configuration; waits until it has.
+    /// Replaces the configuration, reloads the agent, and waits until it has read it.
     void reload(std::string const& text) {
         write(path("kvloamd.toml"), text);
         agent().signal(SIGHUP);

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Settings as an operator makes them, with the real agent.
+// SET requests to the real agent.
 #include <gmock/gmock.h>
 
 #include "tests/e2e/AgentFixture.h"
@@ -9,7 +9,7 @@ namespace {
 
 using ::testing::HasSubstr;
 
-/// Of the line of index 1000, and its link.
+/// The writable objects of the line with ifIndex 1000.
 constexpr char kLineTraps[] = "1.3.6.1.2.1.10.18.6.1.17.1000";
 constexpr char kLinkTraps[] = "1.3.6.1.2.1.31.1.1.1.14.1000";
 
@@ -17,12 +17,12 @@ class SetTest : public AgentFixture {
   protected:
     SetTest() { configureSnmp("rwcommunity public 127.0.0.1\n"); }
 
-    /// What the tool says of a refused request; "" when it was not refused.
+    /// The tool's error message for a refused request; empty if it succeeded.
     std::string refusal(std::vector<std::string> const& arguments) const {
         Result const result = ask("snmpset", arguments);
         return result.status == 0 ? "" : result.output;
     }
-    /// The same by the first version of the protocol.
+    /// The same with SNMPv1.
     std::string firstVersionRefusal(std::vector<std::string> arguments) const {
         arguments.insert(arguments.begin(), {"-v1", "-c", "public", "-r", "0", address()});
         Result const result = snmp("snmpset", arguments);
@@ -113,7 +113,7 @@ TEST_F(SetTest, NoneOfSeveralIsSetWhenOneCanNotBe) {
     EXPECT_THAT(refusal({kLineTraps, "i", "1", kLinkTraps, "i", "2", "1.3.6.1.2.1.10.18.6.1.17.999",
                          "i", "1"}),
                 HasSubstr("noCreation"));
-    // The other module's objects are refused together with ours.
+    // A request that also sets an object of another module is refused as a whole.
     EXPECT_THAT(refusal({kLineTraps, "i", "1", "kvlAgentVersion.0", "s", "mine"}),
                 HasSubstr("notWritable"));
     EXPECT_EQ(get(kLineTraps), "INTEGER: 2");

@@ -26,7 +26,7 @@ constexpr char kLines[] = "1.3.6.1.2.1.10.18.6.1.1";
 constexpr char kIntervals[] = "1.3.6.1.2.1.10.18.8";
 constexpr char kStates[] = "1.3.6.1.2.1.131.1";
 constexpr char kIsdn[] = "1.3.6.1.2.1.10.20";
-/// Of the first of our interfaces; the host's are far below.
+/// The ifIndex of our first interface; those of the host are far lower.
 constexpr std::uint32_t kFirst = 1000;
 
 class SharedTablesTest : public MasterFixture {
@@ -36,7 +36,7 @@ class SharedTablesTest : public MasterFixture {
         startSubagent(boards);
         ASSERT_TRUE(isConnected()) << agent().output();
     }
-    /// The same, and waits until all of the example chassis' interfaces are served.
+    /// The same, and waits until all interfaces of the example chassis are served.
     void startWhole() {
         start();
         ASSERT_TRUE(eventually([this] { return rows(kIfName, true).size() == 71; }));
@@ -202,7 +202,7 @@ TEST_F(SharedTablesTest, MasterThatRestartsAmidTheRegistrationsServesAllInTheEnd
     for (int round = 0; round < 5; ++round) {
         killMaster();
         startMaster();
-        // Wherever the agent is with its rows then, the next round breaks it off.
+        // The next round interrupts the registration of rows wherever it is.
         ASSERT_TRUE(eventually([this] { return hostHasRows(); }));
     }
     EXPECT_TRUE(eventually([this] { return rows(kIfDescr, true).size() == 800; }));

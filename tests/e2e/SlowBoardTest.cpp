@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A board that never answers holds up neither requests nor, for ever, the stop.
+// A board that never answers delays no request, and the stop only for a limited time.
 #include <csignal>
 #include <filesystem>
 
@@ -25,7 +25,7 @@ class SlowBoardTest : public AgentFixture {
                                      path("snmp.conf"), "--persistent-dir", path("persistent")},
             variables);
         ASSERT_TRUE(m_agent->waitFor("serving 1 boards")) << m_agent->output();
-        // Asking makes the agent renew its snapshot sooner or later.
+        // Requests make the agent refresh its snapshot.
         ASSERT_TRUE(eventually([this] {
             askForName();
             return std::filesystem::exists(path("mark"));

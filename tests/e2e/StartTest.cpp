@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// What the agent says when it can not start, and what it checks without starting.
+// The agent's messages when it cannot start, and --check-config.
 #include <sys/resource.h>
 #include <sys/stat.h>
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Every object of every table through a master, as the expectation file has it.
+// Compares every object of every table, through a master, with the expectation file.
 #include <algorithm>
 #include <fstream>
 

@@ -23,7 +23,7 @@ class SubagentLineTest : public MasterFixture {
         EXPECT_TRUE(trapReceiver().waitFor(text)) << text << " not in:\n"
                                                   << trapReceiver().output();
     }
-    /// A cut line of index 1000, and its link.
+    /// Notifications of a cut line with ifIndex 1000, and of its link.
     void expectCutTold() {
         expectTold("1.1.4.1.0 = SNMPv2-SMI::mib-2.10.18.15.0.1\tSNMPv2-SMI::mib-2.10.18.6.1.10."
                    "1000 = 8292\tSNMPv2-SMI::mib-2.10.18.6.1.16.1000 = ");

@@ -21,12 +21,12 @@ class SubagentSetTest : public MasterFixture {
         startMaster();
         startSubagent();
         ASSERT_TRUE(isConnected()) << agent().output();
-        // The rows of tables that the master has too come last.
+        // The rows of tables that the master shares are registered last.
         ASSERT_TRUE(eventually([this] { return get(kLineName) == "STRING: \"nx5-trunk-1\""; }));
         m_lineTraps = get(kLineTrapsOfLine);
         m_linkTraps = get(kLinkTrapsOfLine);
     }
-    /// What the tool says to variables, each a name, a type and a value.
+    /// The tool's output for these variables, each a name, a type and a value.
     std::string set(std::vector<std::string> const& variables) const {
         std::vector<std::string> arguments{"-v2c", "-c", "private", "-t",     "30",
                                            "-r",   "0",  "-On",     address()};

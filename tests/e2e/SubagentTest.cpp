@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// What clients see of the agent through a master.
+// The agent through a master, as clients see it.
 #include <algorithm>
 #include <csignal>
 #include <iterator>
@@ -25,8 +25,7 @@ constexpr char kSystemContact[] = "1.3.6.1.2.1.1.4.0";
 
 class SubagentTest : public MasterFixture {
   protected:
-    /// The lines of a walk, sorted; without what is another at each start: the dates, and the
-    /// processes, which come last.
+    /// The lines of a walk, sorted, without those that differ between starts: dates and processes.
     std::vector<std::string> walkedLines() const {
         static std::regex const date("[0-9]+-[0-9]+-[0-9]+,[0-9]+:[0-9]+:[0-9.]+");
         std::vector<std::string> lines;
@@ -40,7 +39,7 @@ class SubagentTest : public MasterFixture {
         std::ranges::sort(lines);
         return lines;
     }
-    /// What is in one of two sorted lists only.
+    /// The lines that are in only one of two sorted lists.
     static std::vector<std::string> differences(std::vector<std::string> const& one,
                                                 std::vector<std::string> const& other) {
         std::vector<std::string> found;
@@ -53,7 +52,7 @@ class SubagentTest : public MasterFixture {
         startSubagent();
         ASSERT_TRUE(isConnected()) << agent().output();
     }
-    /// Whether the master serves none of our names.
+    /// Whether the master serves none of our objects.
     bool namesAreGone() const {
         auto const answered = walk(kObjects);
         return answered.empty() || answered.front().value.starts_with("No Such");
@@ -145,7 +144,7 @@ TEST_F(SubagentTest, SecondAgentIsRefusedAndSaysSoOnce) {
                    environment());
     ASSERT_TRUE(second.waitFor("no connection to the SNMP master at")) << second.output();
     EXPECT_THAT(second.output(), HasSubstr("another agent serves them already"));
-    // It tries again, which only the debug level tells.
+    // It keeps retrying, which is logged at debug level only.
     ASSERT_TRUE(second.waitFor("refuses the agent's names", 2)) << second.output();
     EXPECT_EQ(count(second.output(), "no connection to the SNMP master at"), 1);
     EXPECT_EQ(get("kvlBoardCount.0"), "Gauge32: 3 boards");

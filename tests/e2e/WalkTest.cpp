@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// What walks of the whole module answer, and that single requests answer the same.
+// Walks of the whole module, and single requests that must agree with them.
 #include <algorithm>
 #include <atomic>
 #include <set>
@@ -41,7 +41,7 @@ class WalkTest : public AgentFixture {
             names.push_back(text(answer.name));
         return names;
     }
-    /// The places of all columns that have an instance among `answers`, as their numbers.
+    /// The object identifiers of all columns that have an instance in `answers`.
     static std::set<std::uint32_t> columnsOf(std::vector<Answer> const& answers) {
         Oid const entry = *parseOidOf(kTable);
         std::set<std::uint32_t> columns;
@@ -60,7 +60,7 @@ TEST_F(WalkTest, EveryColumnOfEveryBoardIsThere) {
     auto const answers = walk(kBoards);
     EXPECT_TRUE(isStrictlyIncreasing(answers));
     EXPECT_THAT(columnsOf(answers), SizeIs(19));
-    // 3 scalars, and 19 columns of the 3 boards that know everything of themselves.
+    // 3 scalars, and 19 columns of 3 boards that answer every query.
     EXPECT_THAT(answers, SizeIs(3 + 3 * 19));
 }
 
@@ -134,7 +134,7 @@ TEST_F(WalkTest, TableIsPrintedWithItsNames) {
         snmp("snmptable", {"-v2c", "-c", "public", "-Ci", address(), "kvlBoardTable"});
     EXPECT_EQ(result.status, 0);
     auto const lines = linesOf(result.output);
-    ASSERT_THAT(lines, SizeIs(6)) << result.output; // title, blank, head, three boards
+    ASSERT_THAT(lines, SizeIs(6)) << result.output; // title, empty line, column heads, three boards
     for (std::size_t column = 0; column < boardTable().columnCount(); ++column)
         EXPECT_THAT(lines[2], HasSubstr(boardTable().column(column).name));
     EXPECT_THAT(lines[4], AllOf(HasSubstr("QUILLON-E1"), HasSubstr("QL-77-0420")));
@@ -177,7 +177,7 @@ TEST_F(WalkTest, WalksStayInOrderWhileBoardsComeAndGo) {
     std::atomic<bool> done{false};
     std::thread operating([&] {
         for (int round = 0; round < 5; ++round) {
-            // Each has a line of its own, and so rows in the standard tables.
+            // Each board has a line, and therefore rows in the standard tables.
             std::string const number = std::to_string(round);
             std::string const board = path("board" + number + ".yaml");
             write(board, "boards:\n"

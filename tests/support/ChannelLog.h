@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A listener that keeps the channel status events it was told of.
+// A listener that records channel status events.
 #pragma once
 
 #include <functional>

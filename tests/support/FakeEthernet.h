@@ -9,7 +9,7 @@
 #include "board/EthernetFeature.h"
 #include "core/HandleWalk.h"
 
-/// Supports nothing but what a test sets.
+/// An Ethernet interface that supports only the values that a test sets.
 class FakeEthernet final : public KVL::Ethernet {
   public:
     int type = 6;

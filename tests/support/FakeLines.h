@@ -14,7 +14,7 @@
 #include "z7/ISDNChannelZ7.h"
 #include "z7/ISDNFeatureZ7.h"
 
-/// A history that only the test writes.
+/// An interval table that only the test fills.
 class FakeHistory final : public DS1IntervalTable {
   public:
     FakeHistory() { ActionScheduler_pthread::GetScheduler()->Remove(this); }
@@ -39,14 +39,14 @@ class FakeHistory final : public DS1IntervalTable {
     }
     /// Corrects the interval that was closed last.
     void correctNewest(int errorSeconds) { interval(1)->ErrorSeconds = errorSeconds; }
-    /// What the running interval has counted, and for how long.
+    /// Sets the counters and the elapsed time of the running interval.
     void run(int errorSeconds, int timeElapsed) {
         m_current.ErrorSeconds = errorSeconds;
         m_timeElapsed = timeElapsed;
     }
 };
 
-/// Supports nothing but its name, its circuit and what a test sets.
+/// A line that supports only its name, its circuit and the values that a test sets.
 class FakeLine final : public DS1LineDevice {
   public:
     FakeLine(std::string name, std::string circuit)

@@ -4,8 +4,8 @@
 
 #include <utility>
 
-/// Makes a `T` that is never destroyed, for the event adaptors keep listeners for good. It stays
-/// reachable, so no leak check minds it.
+/// Makes a `T` that is never destroyed, because the event adaptors never release their listeners.
+/// It stays reachable, so leak checks do not report it.
 template <class T, class... Arguments>
 T& keptForGood(Arguments&&... arguments) {
     struct Node {

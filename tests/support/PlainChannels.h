@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// ISDN channels with a name, of which nothing else is known.
+// ISDN channels that know only their name.
 #pragma once
 
 #include <cstring>

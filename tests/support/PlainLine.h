@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A DS1 line with a name and an address, of which nothing else is known.
+// A DS1 line that knows only its name and its address.
 #pragma once
 
 #include <cstring>
@@ -38,7 +38,7 @@ class PlainLine : public BareInterface<DS1LineDevice> {
     int GetLineMode() override { return KVL::kNotSupported; }
     int GetLineBuildOut() override { return KVL::kNotSupported; }
 
-    /// What the query for the address answers; without 0 there is no address.
+    /// The result of the address query; there is an address only if it is 0.
     int addressAnswer = 0;
 
   private:

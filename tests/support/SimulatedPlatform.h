@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The simulated platform as the tests command it.
+// Commands for the simulated platform of a test.
 #pragma once
 
 #include <cstdint>
@@ -33,7 +33,7 @@ inline void deliver(std::uint32_t id, int board) {
     drain();
 }
 
-/// The same of a message that concerns no board.
+/// The same for a message without a board.
 inline void deliver(std::uint32_t id) {
     command({{"command", "event"}, {"id", id}});
     drain();
@@ -55,7 +55,7 @@ inline std::string board(int handle, std::string const& serialNumber,
            (rest.empty() ? "" : ", " + rest) + "}\n";
 }
 
-/// Puts a chassis of these boards in the place of the present one. Nothing is announced.
+/// Replaces the chassis by one with these boards. Announces nothing.
 inline void load(std::initializer_list<std::string> boards) {
     std::string text = "boards:\n";
     for (auto const& one : boards)

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A board status listener that remembers what it was told.
+// A listener that records board status events.
 #pragma once
 
 #include <mutex>
@@ -8,7 +8,7 @@
 
 #include "board/Board.h"
 
-/// Callable from any thread. Keeps the events' boards alive until it is cleared.
+/// Thread-safe. Keeps the boards of the events alive until it is cleared.
 class StatusLog final : public BoardStatusListener {
   public:
     struct Entry {
@@ -35,7 +35,7 @@ class StatusLog final : public BoardStatusListener {
         return all;
     }
 
-    /// The statuses told of one board.
+    /// The recorded statuses of one board.
     std::vector<int> statusesOf(ReferenceCounter<Board> const& board) const {
         std::vector<int> some;
         for (auto const& entry : entries())

@@ -14,7 +14,7 @@ using ::testing::Not;
 /// Loads from the folder of deliberately broken modules.
 class ModuleLoaderTest : public ::testing::Test {
   protected:
-    /// What loading `name` and making its factory complains of; empty: nothing.
+    /// The error of loading `name` and creating its factory; empty if there is none.
     static std::string complaint(std::string const& name) {
         try {
             LoadedModule(name, BROKEN_MODULE_DIR).createFactory();
@@ -24,7 +24,7 @@ class ModuleLoaderTest : public ::testing::Test {
         return {};
     }
 
-    /// What is said of a module that was built for another version.
+    /// The error for a module that was built for another version.
     static std::string refusal(std::string const& name) {
         return "module '" + name + "' refuses version " +
                std::to_string(KVL_BOARD_MODULE_ABI_VERSION) +

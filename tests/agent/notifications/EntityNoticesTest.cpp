@@ -15,12 +15,12 @@ Oid const kConfigChange{1, 3, 6, 1, 2, 1, 47, 2, 0, 1};
 Oid const kEnabled{1, 3, 6, 1, 2, 1, 131, 0, 1};
 Oid const kDisabled{1, 3, 6, 1, 2, 1, 131, 0, 2};
 
-/// Snapshots that a test makes, at times that it chooses.
+/// Makes snapshots at chosen times.
 class EntityNoticesTest : public ::testing::Test {
   protected:
-    /// The next snapshot, told of at `m_now`.
+    /// Publishes the next snapshot at `m_now`.
     auto tell() { return m_notices.update(std::make_shared<Snapshot>(m_next), m_now); }
-    /// Entities have changed; told at once.
+    /// Changes the entities and publishes the snapshot.
     auto tellChange() {
         ++m_next.entities.lastChange;
         return tell();
@@ -33,7 +33,7 @@ class EntityNoticesTest : public ::testing::Test {
             row.state.oper = oper;
         }
     }
-    /// The names of what has been queued since the last call.
+    /// The names of the notifications queued since the last call.
     std::vector<Oid> told() {
         std::vector<Oid> names;
         while (auto notification = m_queue.pop())
@@ -127,7 +127,7 @@ TEST_F(EntityNoticesTest, EntityThatIsDisabledIsToldWithItsStateAndAlarm) {
     auto const told = m_queue.pop();
     ASSERT_TRUE(told.has_value());
     EXPECT_EQ(told->name, kDisabled);
-    EXPECT_EQ(told->when, m_next.begun); // nothing is to be waited for
+    EXPECT_EQ(told->when, m_next.begun); // the snapshot shows the change already
     ASSERT_THAT(told->objects, SizeIs(2));
     EXPECT_EQ(told->objects[0].name, (Oid{1, 3, 6, 1, 2, 1, 131, 1, 1, 1, 2, 20}));
     EXPECT_EQ(told->objects[0].view(), Value{std::int64_t{2}});

@@ -17,7 +17,7 @@ class FaultListenerTest : public ::testing::Test {
         m_listener.start([this] { ++m_told; });
     }
 
-    /// A board that is announced; -1 is no logical identifier.
+    /// Inserts and announces a board. -1: it has no logical identifier.
     ReferenceCounter<Board> insert(std::string serialNumber, int logicalId) {
         auto board = m_chassis.insert(std::move(serialNumber));
         FakeChassis::fake(board).number = logicalId;
@@ -36,7 +36,7 @@ class FaultListenerTest : public ::testing::Test {
             new ExternalFaultEvent(message, platformBoard, fault)));
     }
     std::vector<FaultRow> rows() const { return m_faults.read(Clock::now()).rows; }
-    /// What the next notification carries: board index, fault, the platform's number.
+    /// The numbers in the next notification: board index, fault value, platform board number.
     std::vector<std::int64_t> numbersSent() {
         auto const notification = m_queue.pop();
         if (!notification) return {};

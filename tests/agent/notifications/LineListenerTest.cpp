@@ -20,7 +20,7 @@ long secondsNow() {
         .count();
 }
 
-/// Boards with a line each, and a listener that is never taken out of their features.
+/// Boards with one line each, and a listener.
 class LineListenerTest : public ::testing::Test {
   protected:
     struct LineOfBoard {
@@ -40,7 +40,7 @@ class LineListenerTest : public ::testing::Test {
     static void change(LineOfBoard const& of, DS1LineStatusEnum status) {
         of.feature->NotifyLineStatusListeners(of.feature->GetFirstDevice(), status);
     }
-    /// As the agent reads; `meanwhile` happens when the listener listens, before lines are placed.
+    /// Refreshes as the agent does; `meanwhile` runs between `listen` and `place`.
     void read(std::function<void()> const& meanwhile = [] {}) {
         auto const boards = m_source.read();
         m_listener.listen(boards, m_reader.uptime());
@@ -50,7 +50,7 @@ class LineListenerTest : public ::testing::Test {
         m_listener.place(lines);
         applySettings(m_settings, lines);
     }
-    /// What has been told since the last time: "1000:64 " for each.
+    /// The notifications since the last call: "1000:64 " for each.
     std::string told() {
         std::string all;
         while (auto const notification = m_queue.pop())

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Lines that change on threads of their own while they are read.
+// Lines change on several threads while they are read.
 #include <latch>
 #include <map>
 #include <string>
@@ -52,7 +52,7 @@ TEST_F(LineStormTest, NoChangeIsMissedOrToldOutOfOrderWhileLinesAreRead) {
     std::vector<FakeLineFeature*> features;
     for (int board = 0; board < kBoards; ++board)
         features.push_back(insert("B" + std::to_string(board)));
-    // Nothing has an index yet when the first changes come.
+    // The first changes arrive before any line has an ifIndex.
     m_listener.listen(m_source.read(), m_reader.uptime());
     std::latch done(kBoards);
     std::vector<std::jthread> tellers;

@@ -21,7 +21,7 @@ InterfaceRow interface(std::uint32_t ifIndex, std::optional<int> operStatus,
 class LinkWatchTest : public ::testing::Test {
   protected:
     void note(std::vector<InterfaceRow> const& rows) { m_watch.update(rows, Clock::now()); }
-    /// What has been told since the last time: "down 7 " for each.
+    /// The notifications since the last call: "down 7 " for each.
     std::string told() {
         std::string all;
         while (auto const notification = m_queue.pop()) {
@@ -31,7 +31,7 @@ class LinkWatchTest : public ::testing::Test {
         }
         return all;
     }
-    /// What is told of an interface that goes from one state to another.
+    /// The notifications of an interface that changes from one state to another.
     std::string toldOf(std::optional<int> former, std::optional<int> now) {
         LinkWatch watch(m_settings, m_queue);
         watch.update({interface(7, former)}, Clock::now());

@@ -6,7 +6,7 @@
 namespace kvloamd {
 namespace {
 
-/// Takes notifications when the test says so.
+/// A sink that is ready when the test says so.
 class ScriptedSink final : public NotificationSink {
   public:
     bool ready() const override { return isReady; }

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A board module whose one board answers once, and from then on never: a platform that hangs. It
-// says so by making the file that the environment's SLOW_BOARD_MARK names.
+// A board module whose one board answers once and then hangs, like a platform that hangs. It then
+// creates the file that the environment variable SLOW_BOARD_MARK names.
 #include <unistd.h>
 
 #include <cstdlib>

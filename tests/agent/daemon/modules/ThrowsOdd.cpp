@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A board module that throws what is no exception class.
+// A board module that throws an object that is not an exception.
 #include "board/BoardModule.h"
 
 extern "C" BoardFactory* kvl_create_board_factory(int) {
