@@ -17,6 +17,7 @@
 #include "board/BoardManager.h"
 #include "board/BoardModule.h"
 #include "board/DS1IntervalTable.h"
+#include "board/DS1IntervalValidity.h"
 #include "board/DS1LineDevice.h"
 #include "board/DS1LineFeature.h"
 #include "board/Ethernet.h"

@@ -8,6 +8,7 @@
 #include <benchmark/benchmark.h>
 
 #include "DrivenScheduler.h"
+#include "LineScheduler.h"
 #include "LineSource.h"
 #include "LineState.h"
 #include "Z7SimIntervalTable.h"
@@ -33,11 +34,11 @@ class CountingLine final : public LineSource {
 
 using Table = ReferenceCounter<DS1IntervalTable>;
 
-/// The benchmark ticks the table, not the process's scheduler.
+/// The benchmark ticks the table, not the scheduler of lines.
 Table tableOf(std::shared_ptr<LineSource> source) {
-    Table table(new Z7SimIntervalTable(LineFormat::esf, std::move(source),
-                                       std::make_shared<LineState>(0, 0), {}));
-    ActionScheduler_pthread::GetScheduler()->Remove(table.get());
+    Table table(new Z7SimIntervalTable(LineFormat::esf, {}, std::move(source),
+                                       std::make_shared<LineState>(), {}));
+    LineScheduler::instance().Remove(table.get());
     return table;
 }
 

@@ -60,6 +60,11 @@ static_assert(sizeof(DS1Interval) == 40);
 /// ends with `ChangePeriod(this, 1)` of the scheduler, which orders its writes before later ticks.
 /// The destructor of a table whose ticks use members begins with `Remove(this)`, which waits for a
 /// tick under way. A table must be neither made nor destroyed in a scheduled action.
+///
+/// A tick is a second of the system's clock, which may be set: none comes while the clock catches
+/// up with itself, and many come at once after a step forward. A table that must not be wrong then
+/// takes itself off the process's scheduler, is ticked by a monotonic clock, and tells by
+/// `DS1IntervalValidity` which intervals missed data.
 class KVLOAM_API DS1IntervalTable : public Object, public Schedulable {
   public:
     static constexpr int kIntervals = 96;

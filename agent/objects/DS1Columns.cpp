@@ -19,15 +19,9 @@ Value validIntervals(LineRow const& row) {
     return row.keepsHistory() ? static_cast<std::int64_t>(row.closedIntervals()) : Value{};
 }
 
-/// The oldest record of a full history is cleared for the interval to come: it counts, but says
-/// nothing.
-bool isValid(std::size_t interval) {
-    return interval < DS1IntervalTable::kIntervals;
-}
-
 Value invalidIntervals(LineRow const& row) {
     if (!row.keepsHistory()) return {};
-    return std::int64_t{isValid(row.closedIntervals()) ? 0 : 1};
+    return static_cast<std::int64_t>(std::ranges::count(row.closed->valid, false));
 }
 
 Value countValue(std::int32_t count) {
@@ -153,7 +147,10 @@ class IntervalTable final : public Table {
         Place const place = find(facts, row);
         if (column == 0) return std::int64_t{place.line.ifIndex};
         if (column == 1) return static_cast<std::int64_t>(place.interval);
-        if (column == kValidData) return std::int64_t{isValid(place.interval) ? kTrue : kFalse};
+        bool const isValid = place.line.isValid(place.interval);
+        if (column == kValidData) return std::int64_t{isValid ? kTrue : kFalse};
+        // An interval that missed data has no counts, rather than too low ones.
+        if (!isValid) return {};
         return countValue(place.line.closed->counts[place.interval - 1][column - kFirstCounter]);
     }
 

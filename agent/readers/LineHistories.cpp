@@ -3,6 +3,7 @@
 
 #include <algorithm>
 
+#include "board/DS1IntervalValidity.h"
 #include "board/Interface.h"
 
 namespace kvloamd {
@@ -35,21 +36,28 @@ int closedOf(DS1IntervalTable& table) {
     return std::clamp(table.GetValidIntervals(), 0, DS1IntervalTable::kIntervals);
 }
 
-std::shared_ptr<ClosedIntervals const> readClosed(DS1IntervalTable& table) {
+/// Adds an interval to the sums. What one interval does not know, the sum does not know.
+void add(LineCounts const& counts, LineCounts& total) {
+    for (std::size_t counter = 0; counter < counts.size(); ++counter)
+        total[counter] = counts[counter] < 0 || total[counter] < 0
+                             ? std::int32_t{KVL::kNotSupported}
+                             : total[counter] + counts[counter];
+}
+
+/// `validity`: null for a table that does not miss data.
+std::shared_ptr<ClosedIntervals const> readClosed(DS1IntervalTable& table,
+                                                  DS1IntervalValidity* validity) {
     auto closed = std::make_shared<ClosedIntervals>();
     int const count = closedOf(table);
     closed->counts.reserve(static_cast<std::size_t>(count));
-    for (int n = 1; n <= count; ++n)
+    closed->valid.reserve(static_cast<std::size_t>(count));
+    for (int n = 1; n <= count; ++n) {
         closed->counts.push_back(readInterval(table, n));
-    for (LineCounts const& counts : closed->counts)
-        for (std::size_t counter = 0; counter < counts.size(); ++counter) {
-            std::int32_t& total = closed->total[counter];
-            // What one interval does not know, the sum does not.
-            if (counts[counter] < 0 || total < 0)
-                total = KVL::kNotSupported;
-            else
-                total += counts[counter];
-        }
+        // The oldest record of a full history is cleared for the interval to come.
+        closed->valid.push_back(validity == nullptr ? n < DS1IntervalTable::kIntervals
+                                                    : validity->IsIntervalValid(n));
+        if (closed->valid.back()) add(closed->counts.back(), closed->total);
+    }
     return closed;
 }
 
@@ -70,8 +78,14 @@ void LineHistories::read(ReferenceCounter<DS1IntervalTable> const& handle, LineR
     row.running = readInterval(table, 0);
     auto const [place, isNew] = m_kept.try_emplace(&table);
     Kept& kept = place->second;
-    if (isNew) kept.table = handle;
-    if (isNew || !isUnchanged(kept, table, elapsed)) kept.closed = readClosed(table);
+    if (isNew) {
+        kept.table = handle;
+        kept.validity = dynamic_cast<DS1IntervalValidity*>(&table);
+    }
+    int const closedNow = kept.validity == nullptr ? 0 : kept.validity->GetIntervalsClosed();
+    if (isNew || closedNow != kept.intervalsClosed || !isUnchanged(kept, table, elapsed))
+        kept.closed = readClosed(table, kept.validity);
+    kept.intervalsClosed = closedNow;
     row.closed = kept.closed;
     // An interval that was closed during the reading may be there in part.
     kept.elapsed = table.GetTimeElapsed() < elapsed ? 0 : elapsed;

@@ -9,6 +9,7 @@
 #include "agent/rows/Clock.h"
 #include "agent/rows/InterfaceRows.h"
 #include "board/DS1IntervalTable.h"
+#include "board/DS1IntervalValidity.h"
 #include "core/ReferenceCounter.h"
 
 namespace kvloamd {
@@ -27,6 +28,8 @@ class LineHistories {
   private:
     struct Kept {
         ReferenceCounter<DS1IntervalTable> table; ///< so that no other has its address
+        DS1IntervalValidity* validity = nullptr;  ///< the table's; null where it has none
+        int intervalsClosed = 0;                  ///< by the table, before `closed` was read
         std::shared_ptr<ClosedIntervals const> closed;
         int elapsed = 0; ///< 0: an interval may have been closed meanwhile
         Clock::time_point readAt;

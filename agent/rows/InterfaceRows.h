@@ -80,7 +80,8 @@ using LineCounts = std::array<std::int32_t, 10>;
 /// Never changed once a row has them: snapshots share them.
 struct ClosedIntervals {
     std::vector<LineCounts> counts; ///< from the newest
-    LineCounts total{};             ///< of all of them
+    std::vector<bool> valid;        ///< of each, whether no data is missing
+    LineCounts total{};             ///< of the valid ones
 };
 
 struct LineRow {
@@ -109,6 +110,8 @@ struct LineRow {
     std::size_t intervalsBefore = 0;               ///< closed ones of all lines before this one
 
     bool keepsHistory() const { return closed != nullptr; }
+    /// `interval`: 1 is the newest closed one. Requires that there is such a one.
+    bool isValid(std::size_t interval) const { return closed->valid[interval - 1]; }
     std::size_t closedIntervals() const { return keepsHistory() ? closed->counts.size() : 0; }
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
 };

@@ -2,8 +2,10 @@
 // Times as hundredths of a second since the agent's start.
 #pragma once
 
-#include <chrono>
 #include <cstdint>
+
+#include <algorithm>
+#include <chrono>
 
 #include "agent/rows/Clock.h"
 
@@ -19,23 +21,32 @@ inline std::uint32_t timeTicks(Clock::duration time) {
 /// An `Uptime` converts times to hundredths of a second since the agent's start. Immutable.
 class Uptime {
   public:
-    explicit Uptime(Clock::time_point started)
-        : m_started(started),
-          m_startDate(std::chrono::duration_cast<std::chrono::milliseconds>(
-              std::chrono::system_clock::now().time_since_epoch() - (Clock::now() - started))) {}
+    explicit Uptime(Clock::time_point started) : m_started(started), m_startDate(startDate()) {}
 
     std::uint32_t now() const { return at(Clock::now()); }
     /// 0 for a time before the agent's start.
     std::uint32_t at(Clock::time_point when) const {
         return when <= m_started ? 0 : timeTicks(when - m_started);
     }
-    /// `seconds` since the epoch; 0 for a time before the agent's start.
+    /// `seconds` since the epoch, as the system's clock counts them now; 0 for a time before the
+    /// agent's start. Never later than now.
     std::uint32_t of(long seconds) const {
-        auto const since = std::chrono::seconds(seconds) - m_startDate;
-        return since <= std::chrono::milliseconds::zero() ? 0 : timeTicks(since);
+        Clock::duration const since = std::chrono::seconds(seconds) - (m_startDate + clockSteps());
+        Clock::duration const uptime = Clock::now() - m_started;
+        return since <= Clock::duration::zero() ? 0 : timeTicks(std::min(since, uptime));
     }
 
   private:
+    /// By how much the system's clock has been set since the agent's start, in whole seconds.
+    std::chrono::seconds clockSteps() const {
+        return std::chrono::round<std::chrono::seconds>(startDate() - m_startDate);
+    }
+    /// The agent's start, since the epoch, as the system's clock counts now.
+    std::chrono::milliseconds startDate() const {
+        return std::chrono::duration_cast<std::chrono::milliseconds>(
+            std::chrono::system_clock::now().time_since_epoch() - (Clock::now() - m_started));
+    }
+
     Clock::time_point m_started;
     std::chrono::milliseconds m_startDate; ///< since the epoch
 };

@@ -15,6 +15,7 @@ kvloamd::Snapshot makeIntervals(std::uint32_t lines) {
         line.ifIndex = kFirstLine + i;
         auto const closed = std::make_shared<kvloamd::ClosedIntervals>();
         closed->counts.resize(kIntervalsOfALine);
+        closed->valid.resize(kIntervalsOfALine, true);
         for (kvloamd::LineCounts& interval : closed->counts)
             for (std::int32_t& count : interval)
                 count = static_cast<std::int32_t>(counts(random));

@@ -18,10 +18,10 @@ void append(FeatureList& features, ReferenceCounter<T> const& feature) {
 
 } // namespace
 
-FeatureList makeExtendedFeatures(long board) {
+FeatureList makeExtendedFeatures(long board, LineRecords& records) {
     std::vector<long> const devices = DevMapBoardIf(board).ListAllDevices();
     FeatureList features;
-    auto const lines = Z7SimLineFeature::make(board);
+    auto const lines = Z7SimLineFeature::make(board, records);
     auto const isdn = makeISDNFeature(board, devices, lines);
     append(features, lines);
     append(features, isdn);

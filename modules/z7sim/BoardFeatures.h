@@ -4,6 +4,7 @@
 
 #include <vector>
 
+#include "LineRecords.h"
 #include "board/Feature.h"
 #include "core/ReferenceCounter.h"
 
@@ -11,8 +12,8 @@
 using FeatureList = std::vector<ReferenceCounter<Feature>>;
 
 /// The features of the board's lines, channels and devices; each is complete and not changed any
-/// more. A kind of which the board has none makes no feature.
-FeatureList makeExtendedFeatures(long board);
+/// more. A kind of which the board has none makes no feature. `records`: of the board's lines.
+FeatureList makeExtendedFeatures(long board, LineRecords& records);
 
 /// The features of the board's Ethernet and IP interfaces.
 FeatureList makeNetworkFeatures(long board);

@@ -16,6 +16,7 @@ constexpr int kLongestPast = 24 * 3600;
 } // namespace
 
 bool PlatformLine::read(DS1LineCounters& counters) {
+    if (m_silent) return false;
     DS1LineCounters answer{};
     if (bytesAttribute(m_device, kDS1LineCounters, &answer, sizeof answer) != sizeof answer)
         return false;
@@ -43,8 +44,7 @@ LineDefects defectsOf(DS1LineCounters const& now) {
 }
 
 LineSecond secondBetween(DS1LineCounters const& before, DS1LineCounters const& now) {
-    // All counts grow modulo 2^32; the age does not come round within a century.
-    if (now.seconds < before.seconds) return {};
+    // All counts grow modulo 2^32.
     LineSecond second;
     second.lineCodeViolations = now.lineCodeViolations - before.lineCodeViolations;
     second.pathCodeViolations = now.pathCodeViolations - before.pathCodeViolations;

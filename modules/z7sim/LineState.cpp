@@ -1,8 +1,9 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "LineState.h"
 
-#include <ctime>
+#include <cstdlib>
 
+#include "LineClocks.h"
 #include "LineStatusDelivery.h"
 #include "boardplatform/ds1_line.h"
 
@@ -28,6 +29,10 @@ constexpr AlarmStatus kStatuses[] = {
     {kDS1AlarmTestCode, DS1LineStatusRcvTestCode},
 };
 
+long clocksApart() {
+    return LineClocks::inUse().system() - LineClocks::inUse().monotonic();
+}
+
 } // namespace
 
 int lineStatusOf(std::uint32_t alarms, LinePerformance const& performance) {
@@ -44,6 +49,16 @@ int lineStatusOf(std::uint32_t alarms, LinePerformance const& performance) {
     return status == 0 ? static_cast<int>(DS1LineStatusNoAlarm) : status;
 }
 
+LineState::LineState() : m_number(LineStatusDelivery::instance().reserve()) {}
+
+long LineState::lastChange() const {
+    std::scoped_lock const guard(m_mutex);
+    if (m_changed == 0) return 0;
+    // Read one after the other, the clocks seem to differ by a second at times.
+    long const shift = clocksApart() - m_clocksApart;
+    return std::labs(shift) <= 1 ? m_changed : m_changed + shift;
+}
+
 void LineState::begin(std::uint32_t alarms, LinePerformance const& performance) {
     m_status.store(lineStatusOf(alarms, performance), std::memory_order_relaxed);
 }
@@ -51,7 +66,11 @@ void LineState::begin(std::uint32_t alarms, LinePerformance const& performance) 
 void LineState::update(std::uint32_t alarms, LinePerformance const& performance) {
     int const now = lineStatusOf(alarms, performance);
     if (now == status()) return;
-    m_lastChange.store(static_cast<long>(std::time(nullptr)), std::memory_order_relaxed);
+    {
+        std::scoped_lock const guard(m_mutex);
+        m_changed = LineClocks::inUse().system();
+        m_clocksApart = clocksApart();
+    }
     m_status.store(now, std::memory_order_relaxed);
-    LineStatusDelivery::instance().post(m_number, m_line, static_cast<DS1LineStatusEnum>(now));
+    LineStatusDelivery::instance().post(m_number, static_cast<DS1LineStatusEnum>(now));
 }

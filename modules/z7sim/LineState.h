@@ -4,19 +4,28 @@
 
 #include <atomic>
 #include <cstdint>
+#include <mutex>
 
 #include "LinePerformance.h"
 
-/// A `LineState` holds the status of a line. The line's tick writes it; any thread may read it.
+/// A `LineState` is what a line has beside its history: its status, and whether changes of it are
+/// to be announced. It belongs to the line for as long as its board is there, whether the board
+/// runs or not. The line's tick writes the status.
+///
+/// Thread-safe.
 class LineState {
   public:
-    /// `number` and `line`: under what changes are posted to the `LineStatusDelivery`.
-    LineState(std::uint64_t number, int line) : m_number(number), m_line(line) {}
+    LineState();
 
+    /// Under which changes are posted to the `LineStatusDelivery`.
+    std::uint64_t number() const { return m_number; }
     /// Bits of `DS1LineStatusEnum`.
     int status() const { return m_status.load(std::memory_order_relaxed); }
-    /// Seconds since the epoch; 0 until the status has changed.
-    long lastChange() const { return m_lastChange.load(std::memory_order_relaxed); }
+    /// When the status changed last, in seconds since the epoch as the system's clock counts them
+    /// now: when the clock has been set since, the date has been, too. 0 until a change.
+    long lastChange() const;
+    int trapEnable() const { return m_trapEnable.load(std::memory_order_relaxed); }
+    void setTrapEnable(int enable) { m_trapEnable.store(enable, std::memory_order_relaxed); }
 
     /// Sets the status that a line is found with; this is no change.
     void begin(std::uint32_t alarms, LinePerformance const& performance);
@@ -24,10 +33,12 @@ class LineState {
     void update(std::uint32_t alarms, LinePerformance const& performance);
 
   private:
-    std::uint64_t m_number;
-    int m_line;
+    std::uint64_t const m_number;
     std::atomic<int> m_status{1};
-    std::atomic<long> m_lastChange{0};
+    std::atomic<int> m_trapEnable{2};
+    mutable std::mutex m_mutex; ///< guards the two below
+    long m_changed = 0;         ///< of the system's clock
+    long m_clocksApart = 0;     ///< the system's clock minus the monotonic one, at that time
 };
 
 /// The status bits of a line with these alarms (`kDS1Alarm...`) and failures. Loss of signal, loss

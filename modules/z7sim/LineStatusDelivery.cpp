@@ -3,10 +3,8 @@
 
 #include <utility>
 
-#include "Z7SimLineFeature.h"
-
 namespace {
-constexpr std::size_t kMostNotes = 65536;
+constexpr std::size_t kMostChanges = 65536;
 }
 
 LineStatusDelivery& LineStatusDelivery::instance() {
@@ -23,25 +21,28 @@ std::uint64_t LineStatusDelivery::reserve() {
     return ++m_lastNumber;
 }
 
-void LineStatusDelivery::open(std::uint64_t number, ReferenceCounter<Z7SimLineFeature> feature) {
+void LineStatusDelivery::open(std::uint64_t number, ReferenceCounter<DS1LineFeatureZ7> feature,
+                              ReferenceCounter<DS1LineDevice> line) {
+    Line opened{std::move(feature), std::move(line)};
     std::scoped_lock const guard(m_mutex);
-    m_features.emplace(number, std::move(feature));
+    std::swap(m_lines[number], opened);
 }
 
 void LineStatusDelivery::close(std::uint64_t number) {
-    // The last handle must go without the lock: lines wait for the scheduler when they are deleted.
-    ReferenceCounter<Z7SimLineFeature> closed;
+    // Handles must not be dropped under the lock: lines wait for the scheduler when they are
+    // deleted.
+    Line closed;
     std::scoped_lock const guard(m_mutex);
-    auto const found = m_features.find(number);
-    if (found == m_features.end()) return;
+    auto const found = m_lines.find(number);
+    if (found == m_lines.end()) return;
     closed = std::move(found->second);
-    m_features.erase(found);
+    m_lines.erase(found);
 }
 
-void LineStatusDelivery::post(std::uint64_t number, int line, DS1LineStatusEnum status) {
+void LineStatusDelivery::post(std::uint64_t number, DS1LineStatusEnum status) {
     std::scoped_lock const guard(m_mutex);
-    if (m_notes.size() >= kMostNotes) return;
-    m_notes.push_back({number, line, status});
+    if (m_changes.size() >= kMostChanges) return;
+    m_changes.push_back({number, status});
     ++m_posted;
     m_changed.notify_all();
 }
@@ -54,24 +55,24 @@ void LineStatusDelivery::drain() {
 void LineStatusDelivery::Run() {
     std::unique_lock guard(m_mutex);
     for (;;) {
-        m_changed.wait(guard, [this] { return !m_notes.empty(); });
-        Note const note = m_notes.front();
-        m_notes.pop_front();
+        m_changed.wait(guard, [this] { return !m_changes.empty(); });
+        Change const change = m_changes.front();
+        m_changes.pop_front();
         guard.unlock();
-        deliver(note);
+        deliver(change);
         guard.lock();
         ++m_delivered;
         m_changed.notify_all();
     }
 }
 
-void LineStatusDelivery::deliver(Note const& note) {
-    ReferenceCounter<Z7SimLineFeature> feature;
+void LineStatusDelivery::deliver(Change const& change) {
+    Line changed;
     {
         std::scoped_lock const guard(m_mutex);
-        if (auto const found = m_features.find(note.number); found != m_features.end())
-            feature = found->second;
+        if (auto const found = m_lines.find(change.number); found != m_lines.end())
+            changed = found->second;
     }
-    if (feature.get() == nullptr) return;
-    feature->NotifyLineStatusListeners(feature->lineAt(note.line), note.status);
+    if (changed.feature.get() == nullptr) return;
+    changed.feature->NotifyLineStatusListeners(changed.line, change.status);
 }

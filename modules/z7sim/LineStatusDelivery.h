@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Tells line status changes on a thread of its own.
+// The thread that announces status changes of lines.
 #pragma once
 
 #include <condition_variable>
@@ -8,53 +8,58 @@
 #include <map>
 #include <mutex>
 
-#include "board/DS1LineFeature.h"
+#include "board/DS1LineDevice.h"
 #include "core/ReferenceCounter.h"
 #include "platform/KVLThread_pthread.h"
+#include "z7/DS1LineFeatureZ7.h"
 
-class Z7SimLineFeature;
-
-/// Changes are noticed in the scheduler's ticks, under the scheduler's lock, where nobody may be
-/// called back: a listener that dropped the last handle of a board would wait for ever. So the tick
-/// leaves a note, and this thread makes the event.
+/// The `LineStatusDelivery` calls the listeners of lines whose status has changed. Changes are
+/// noticed in the scheduler's ticks, under the scheduler's lock, where no listener may be called:
+/// one that dropped the last handle of a board would wait for ever. So the tick posts the change,
+/// and this thread announces it.
 ///
-/// One per process, never destroyed. Any thread may call; no lock is held while listeners are told.
+/// One per process, never destroyed. Thread-safe; no lock is held while listeners are called.
 class LineStatusDelivery final : public Runnable {
   public:
     /// The first call starts the thread.
     static LineStatusDelivery& instance();
 
-    /// A number under which changes can be posted.
+    /// A number for one line, under which its changes are posted.
     std::uint64_t reserve();
-    /// What is posted under `number` goes to the listeners of `feature`, which is kept meanwhile.
-    void open(std::uint64_t number, ReferenceCounter<Z7SimLineFeature> feature);
-    /// Forgets the feature and what is posted under its number. A delivery under way goes on.
+    /// Announces what is posted under `number` to the listeners of `feature`, as changes of `line`.
+    /// Keeps both until the number is closed. A number that is open already is opened anew.
+    void open(std::uint64_t number, ReferenceCounter<DS1LineFeatureZ7> feature,
+              ReferenceCounter<DS1LineDevice> line);
+    /// Forgets the feature and the line, and what is posted under their number. A delivery under
+    /// way goes on.
     void close(std::uint64_t number);
 
-    /// Leaves the note that line `line` (counted from 0) of a feature has `status` now. When
-    /// thousands of notes wait for a listener that does not return, new ones are dropped: the line
-    /// itself can still be asked.
-    void post(std::uint64_t number, int line, DS1LineStatusEnum status);
-    /// Waits until what has been posted so far is delivered. Not from a listener.
+    /// Posts the status that the line of `number` has now. When thousands of changes wait for a
+    /// listener that does not return, new ones are dropped; the line itself can still be asked.
+    void post(std::uint64_t number, DS1LineStatusEnum status);
+    /// Waits until everything posted so far has been delivered. Not for a listener to call.
     void drain();
 
     void Run() override;
 
   private:
-    struct Note {
+    struct Line {
+        ReferenceCounter<DS1LineFeatureZ7> feature;
+        ReferenceCounter<DS1LineDevice> line;
+    };
+    struct Change {
         std::uint64_t number;
-        int line;
         DS1LineStatusEnum status;
     };
 
     LineStatusDelivery() = default;
     ~LineStatusDelivery() = default;
-    void deliver(Note const& note);
+    void deliver(Change const& change);
 
-    std::mutex m_mutex; ///< guards all below; comes after the scheduler's lock
+    std::mutex m_mutex; ///< guards everything below; comes after the scheduler's lock
     std::condition_variable m_changed;
-    std::deque<Note> m_notes;
-    std::map<std::uint64_t, ReferenceCounter<Z7SimLineFeature>> m_features;
+    std::deque<Change> m_changes;
+    std::map<std::uint64_t, Line> m_lines;
     std::uint64_t m_lastNumber = 0;
     std::uint64_t m_posted = 0;
     std::uint64_t m_delivered = 0;

@@ -10,13 +10,15 @@
 
 namespace {
 
+/// What the platform's records have in the place of a text that was not answered.
+constexpr char const* kUnknown = "unknown";
 constexpr char const* kNoAnswer = "board does not answer";
 constexpr char const* kOtherBoard = "another board answers in its place";
 constexpr char const* kReportedFailed = "board is reported failed by the platform";
 
 } // namespace
 
-Z7SimBoard::Z7SimBoard(long id) : Z7Board(id) {
+Z7SimBoard::Z7SimBoard(long id, FailureTimes const& times) : Z7Board(id), m_lines(times) {
     readLogicalID();
 }
 
@@ -96,10 +98,14 @@ void Z7SimBoard::AdoptCondition() {
 void Z7SimBoard::Retire() {
     std::scoped_lock const transition(m_transition);
     m_retired = true;
-    if (m_status != BoardStatusStarted) return;
-    SetStatus(BoardStatusStopped);
-    StopBoard();
-    destroy_extended_features();
+    if (m_status == BoardStatusStarted) {
+        SetStatus(BoardStatusStopped);
+        StopBoard();
+        destroy_extended_features();
+    }
+    // Handles may still keep the histories; what takes the board's place is not theirs.
+    m_lines.suspend();
+    m_lines.clear();
 }
 
 int Z7SimBoard::ProcessExternalEvent(BoardStatusEnum status) {
@@ -182,7 +188,14 @@ int Z7SimBoard::StartStage2() {
     // the factory to replace at its next rescan; it must not run under the old one's name.
     char serialNumber[256];
     GetSerialNumber(serialNumber);
-    return record()->SerialNumber() == serialNumber ? 0 : giveUp(kOtherBoard);
+    std::string const found = record()->SerialNumber();
+    if (found != serialNumber) {
+        if (found == kUnknown) return giveUp(kNoAnswer);
+        m_lines.suspend();
+        return giveUp(kOtherBoard);
+    }
+    m_lines.resume();
+    return 0;
 }
 
 int Z7SimBoard::StartStage3() {
@@ -198,7 +211,7 @@ int Z7SimBoard::StopBoard() {
 
 int Z7SimBoard::create_extended_features() {
     // Features that nobody will withdraw must not be made.
-    if (m_startFailure == nullptr) offer(makeExtendedFeatures(GetBoardIdentifier()));
+    if (m_startFailure == nullptr) offer(makeExtendedFeatures(GetBoardIdentifier(), m_lines));
     return 0;
 }
 

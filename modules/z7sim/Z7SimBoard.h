@@ -6,6 +6,7 @@
 #include <mutex>
 
 #include "BoardFeatures.h"
+#include "LineRecords.h"
 #include "z7/Z7Board.h"
 
 /// A board of the chassis. Most answers come from its device mapper record, which the base keeps;
@@ -18,7 +19,7 @@
 class Z7SimBoard final : public Z7Board {
   public:
     /// `id`: the board's handle in the device mapper. The new board is stopped.
-    explicit Z7SimBoard(long id);
+    explicit Z7SimBoard(long id, FailureTimes const& times = {});
     ~Z7SimBoard() override;
 
     /// Brings a new board, which nobody listens to yet, into the condition that the platform
@@ -75,4 +76,5 @@ class Z7SimBoard final : public Z7Board {
     bool m_silent = false;                ///< failed because it did not answer
     bool m_retired = false;
     FeatureList m_offered; ///< what a stop takes away again
+    LineRecords m_lines;   ///< stay with the board, whether it runs or not
 };

@@ -24,7 +24,7 @@ int Z7SimBoardFactory::RefreshBoardData() {
 }
 
 Z7Board* Z7SimBoardFactory::MakeBoard(long id) {
-    auto board = std::make_unique<Z7SimBoard>(id);
+    auto board = std::make_unique<Z7SimBoard>(id, m_failureTimes);
     board->AdoptCondition();
     return board.release();
 }

@@ -5,6 +5,7 @@
 #include <mutex>
 #include <vector>
 
+#include "LineFailures.h"
 #include "z7/Z7BoardFactory.h"
 
 /// Makes a `Z7SimBoard` of every board that the device mapper knows.
@@ -12,6 +13,9 @@ class Z7SimBoardFactory : public Z7BoardFactory {
   public:
     Z7SimBoardFactory();
     ~Z7SimBoardFactory() override;
+
+    /// For the lines of boards that are made from now on. Not while the factory makes some.
+    void SetFailureTimes(FailureTimes const& times) { m_failureTimes = times; }
 
     /// Also retires a board that is announced as gone.
     int NotifyBoardStatusListeners(ReferenceCounter<Board> board, BoardStatusEnum status) override;
@@ -25,6 +29,7 @@ class Z7SimBoardFactory : public Z7BoardFactory {
     Z7Board* MakeBoard(long id) override;
 
   private:
+    FailureTimes m_failureTimes;
     std::mutex m_mutex; ///< guards the identifiers; never held during a search
     std::vector<long> m_identifiers;
 };

@@ -1,8 +1,10 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "Z7SimIntervalTable.h"
 
+#include <algorithm>
 #include <utility>
 
+#include "LineScheduler.h"
 #include "platform/ActionScheduler_pthread.h"
 
 namespace {
@@ -23,23 +25,40 @@ void add(LineCounts const& counts, DS1Interval& interval) {
 
 } // namespace
 
-Z7SimIntervalTable::Z7SimIntervalTable(LineFormat format, std::shared_ptr<LineSource> source,
+Z7SimIntervalTable::Z7SimIntervalTable(LineFormat format, FailureTimes const& times,
+                                       std::shared_ptr<LineSource> source,
                                        std::shared_ptr<LineState> state,
                                        std::vector<DS1LineCounters> const& past)
-    : m_source(std::move(source)), m_state(std::move(state)), m_performance(format) {
-    // The base has the table ticking already. A day of past takes a while: no tick may come
-    // between.
-    ActionScheduler* const scheduler = ActionScheduler_pthread::GetScheduler();
-    scheduler->Remove(this);
-    replay(past);
-    m_source->read(m_last);
-    if (past.empty()) m_performance.begin(defectsOf(m_last));
-    m_state->begin(m_last.alarms, m_performance);
-    scheduler->AddPeriodic(this, 1);
+    : m_source(std::move(source)), m_state(std::move(state)), m_performance(format, times) {
+    interfaces()->add(DS1IntervalValidity::iid());
+    // The base class has entered the table with the process's scheduler.
+    ActionScheduler_pthread::GetScheduler()->Remove(this);
+    LineScheduler& scheduler = LineScheduler::instance();
+    begin(past);
+    scheduler.AddPeriodic(this, 1);
 }
 
 Z7SimIntervalTable::~Z7SimIntervalTable() {
-    ActionScheduler_pthread::GetScheduler()->Remove(this);
+    LineScheduler::instance().Remove(this);
+}
+
+/// Counts the past, and takes the line as it is now.
+void Z7SimIntervalTable::begin(std::vector<DS1LineCounters> const& past) {
+    replay(past);
+    DS1LineCounters now{};
+    if (!m_source->read(now)) {
+        m_seconds.begin(LineScheduler::time());
+        return;
+    }
+    if (past.empty()) {
+        m_performance.begin(defectsOf(now));
+        m_last = now;
+    } else if (std::int64_t const passed = std::int64_t{now.seconds} - m_last.seconds; passed > 1) {
+        miss(passed);
+        m_last = now;
+    }
+    m_seconds.begin(m_last.seconds, LineScheduler::time());
+    m_state->begin(now.alarms, m_performance);
 }
 
 int Z7SimIntervalTable::GetControlledSlipSeconds(int n) {
@@ -53,17 +72,29 @@ int Z7SimIntervalTable::GetDegradedMinutes(int n) {
 }
 
 int Z7SimIntervalTable::CollectSecond() {
-    DS1LineCounters now = m_last;
-    m_source->read(now);
-    count(now);
+    DS1LineCounters now{};
+    bool const answered = m_source->read(now);
+    LineTick const tick = answered ? m_seconds.answered(now.seconds, LineScheduler::time())
+                                   : m_seconds.silent(LineScheduler::time());
+    if (tick.missed > 0) miss(tick.missed);
+    if (tick.counts) count(now);
+    if (!answered) return 0;
+    m_last = now;
     m_state->update(now.alarms, m_performance);
     return 0;
 }
 
 int Z7SimIntervalTable::CloseInterval() {
     close();
-    // A tick is a second, this one too.
+    // The tick that closes an interval is a second, too.
     return CollectSecond();
+}
+
+bool Z7SimIntervalTable::IsIntervalValid(int n) {
+    if (n == 0) return !m_missed;
+    // The oldest place of a full ring is empty.
+    if (n < 0 || n >= kIntervals || n > GetValidIntervals()) return false;
+    return !m_closedMissed[static_cast<std::size_t>(GetTrueIndex(n))];
 }
 
 void Z7SimIntervalTable::replay(std::vector<DS1LineCounters> const& past) {
@@ -72,19 +103,42 @@ void Z7SimIntervalTable::replay(std::vector<DS1LineCounters> const& past) {
     for (std::size_t i = 1; i < past.size(); ++i) {
         if (m_timeElapsed >= kIntervalLength) close();
         count(past[i]);
+        m_last = past[i];
     }
 }
 
 void Z7SimIntervalTable::count(DS1LineCounters const& now) {
     LinePerformance::Change const change = m_performance.count(secondBetween(m_last, now));
-    m_last = now;
     m_timeElapsed += 1;
     add(change.running, m_current);
     add(change.previous, *interval(1));
 }
 
+/// Passes time of which there is no data.
+void Z7SimIntervalTable::miss(std::int64_t seconds) {
+    m_performance.interrupt();
+    // What the ring would not hold to the end is only counted.
+    constexpr std::int64_t most = std::int64_t{kIntervals + 1} * kIntervalLength;
+    if (seconds > most) {
+        std::int64_t const forgotten = (seconds - most) / kIntervalLength;
+        m_closed += static_cast<std::int32_t>(forgotten);
+        seconds -= forgotten * kIntervalLength;
+    }
+    while (seconds > 0) {
+        if (m_timeElapsed >= kIntervalLength) close();
+        auto const left = std::int64_t{kIntervalLength} - m_timeElapsed;
+        std::int64_t const passed = std::min(seconds, left);
+        m_missed = true;
+        m_timeElapsed += static_cast<std::int32_t>(passed);
+        seconds -= passed;
+    }
+}
+
 void Z7SimIntervalTable::close() {
+    m_closedMissed[static_cast<std::size_t>(GetTrueIndex(0))] = m_missed.load();
     ArchiveInterval(m_current);
+    m_closed += 1;
     m_current = DS1Interval();
+    m_missed = false;
     m_performance.closeInterval();
 }

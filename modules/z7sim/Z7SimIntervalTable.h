@@ -1,38 +1,55 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The performance history of a line, derived from its counters.
+// The performance history of a DS1 line, derived from its counters.
 #pragma once
 
+#include <array>
+#include <atomic>
+#include <cstdint>
 #include <memory>
 #include <vector>
 
 #include "LinePerformance.h"
+#include "LineSeconds.h"
 #include "LineSource.h"
 #include "LineState.h"
 #include "board/DS1IntervalTable.h"
+#include "board/DS1IntervalValidity.h"
 
-/// Reads its line's counters once a second, on the scheduler's thread, and counts what the second
-/// was. A second in which the platform does not answer counts as clean; what it held is found in
-/// the next.
-class Z7SimIntervalTable final : public DS1IntervalTable {
+/// A `Z7SimIntervalTable` reads its line's counters once a second and counts what the second was.
+/// The `LineScheduler` ticks it, not the process's scheduler.
+///
+/// Seconds that were not seen (see `LineSeconds`) pass time and count nothing, and the intervals
+/// that they belong to are not valid. The status is then the one that was known last.
+class Z7SimIntervalTable final : public DS1IntervalTable, public DS1IntervalValidity {
   public:
     /// `past`: the counters of the seconds before, oldest first, which are counted as live ones
-    /// are; may be empty. `source` and `state` are shared with the line.
-    Z7SimIntervalTable(LineFormat format, std::shared_ptr<LineSource> source,
-                       std::shared_ptr<LineState> state, std::vector<DS1LineCounters> const& past);
+    /// are; may be empty. `source` and `state` are shared with the line's other users.
+    Z7SimIntervalTable(LineFormat format, FailureTimes const& times,
+                       std::shared_ptr<LineSource> source, std::shared_ptr<LineState> state,
+                       std::vector<DS1LineCounters> const& past);
     ~Z7SimIntervalTable() override;
 
     int GetControlledSlipSeconds(int n) override;
     int GetDegradedMinutes(int n) override;
     int CollectSecond() override;
     int CloseInterval() override;
+    bool IsIntervalValid(int n) override;
+    int GetIntervalsClosed() override { return m_closed; }
 
   private:
+    void begin(std::vector<DS1LineCounters> const& past);
     void replay(std::vector<DS1LineCounters> const& past);
     void count(DS1LineCounters const& now);
+    void miss(std::int64_t seconds);
     void close();
 
     std::shared_ptr<LineSource> m_source;
     std::shared_ptr<LineState> m_state;
-    DS1LineCounters m_last{}; ///< as read a second ago
+    DS1LineCounters m_last{}; ///< as read last
+    LineSeconds m_seconds;
     LinePerformance m_performance;
+    DS1Counter m_closed;               ///< intervals
+    std::atomic<bool> m_missed{false}; ///< a second of the running interval
+    /// The same of the closed ones, each at its interval's place in the ring.
+    std::array<std::atomic<bool>, kIntervals> m_closedMissed{};
 };

@@ -139,11 +139,11 @@ long Z7SimLine::GetLineStatusLastChange() {
     return m_state->lastChange();
 }
 int Z7SimLine::GetLineStatusChangeTrapEnable() {
-    return m_trapEnable;
+    return m_state->trapEnable();
 }
 int Z7SimLine::SetLineStatusChangeTrapEnable(int enable) {
     if (enable != 1 && enable != 2) return -1;
-    m_trapEnable = enable;
+    m_state->setTrapEnable(enable);
     return 0;
 }
 int Z7SimLine::GetLoopbackStatus() {

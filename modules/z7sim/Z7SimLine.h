@@ -2,11 +2,9 @@
 // A DS1 line of a reference board.
 #pragma once
 
-#include <atomic>
 #include <memory>
 #include <string>
 
-#include "LineSource.h"
 #include "LineState.h"
 #include "Z7SimIntervalTable.h"
 #include "board/DS1LineDevice.h"
@@ -29,8 +27,8 @@ struct LineSetup {
     bool isT1() const;
 };
 
-/// Answers from its set-up, its status and its history; no query waits for the platform. Any
-/// thread.
+/// A `Z7SimLine` answers from its set-up, its status and its history; no query waits for the
+/// platform. Thread-safe.
 class Z7SimLine final : public DS1LineDevice {
   public:
     Z7SimLine(LineSetup setup, std::shared_ptr<LineState> state,
@@ -86,5 +84,4 @@ class Z7SimLine final : public DS1LineDevice {
     LineSetup m_setup;
     std::shared_ptr<LineState> m_state;
     ReferenceCounter<DS1IntervalTable> m_intervals;
-    std::atomic<int> m_trapEnable{2};
 };

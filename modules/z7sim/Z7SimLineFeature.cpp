@@ -9,7 +9,6 @@
 #include "LineSource.h"
 #include "LineStatusDelivery.h"
 #include "ObjectAttributes.h"
-#include "Z7SimIntervalTable.h"
 #include "Z7SimLine.h"
 #include "access/DevMapBoardIf.h"
 #include "boardplatform/isdn_channels.h"
@@ -44,33 +43,33 @@ LineSetup readSetup(long device, int number) {
 
 } // namespace
 
-Z7SimLineFeature::Z7SimLineFeature(std::uint64_t number) : m_number(number) {
+Z7SimLineFeature::Z7SimLineFeature() {
     SetFeatureName("DS1");
 }
 
 Z7SimLineFeature::~Z7SimLineFeature() = default;
 
-ReferenceCounter<Z7SimLineFeature> Z7SimLineFeature::make(long board) {
-    LineStatusDelivery& delivery = LineStatusDelivery::instance();
-    ReferenceCounter<Z7SimLineFeature> feature(new Z7SimLineFeature(delivery.reserve()));
-    for (long const device : DevMapBoardIf(board).ListAllDevices())
-        feature->add(device);
-    if (feature->m_lines.empty()) return {};
-    delivery.open(feature->m_number, feature);
+ReferenceCounter<Z7SimLineFeature> Z7SimLineFeature::make(long board, LineRecords& records) {
+    ReferenceCounter<Z7SimLineFeature> feature(new Z7SimLineFeature);
+    std::vector<long> const devices = DevMapBoardIf(board).ListAllDevices();
+    for (long const device : devices)
+        feature->add(device, records);
+    records.keepOnly(devices);
+    auto const& lines = feature->m_lines;
+    if (lines.empty()) return {};
+    for (std::size_t i = 0; i < lines.size(); ++i)
+        LineStatusDelivery::instance().open(feature->m_numbers[i], {feature.get()}, lines[i]);
     return feature;
 }
 
-void Z7SimLineFeature::add(long device) {
-    auto const source = std::make_shared<PlatformLine>(device);
+void Z7SimLineFeature::add(long device, LineRecords& records) {
     DS1LineCounters counters{};
-    if (!source->read(counters)) return;
-    auto const place = static_cast<int>(m_lines.size());
-    LineSetup setup = readSetup(device, place + 1);
-    auto const state = std::make_shared<LineState>(m_number, place);
-    ReferenceCounter<DS1IntervalTable> const intervals(
-        new Z7SimIntervalTable(setup.format(), source, state, source->past()));
-    m_lines.emplace_back(new Z7SimLine(std::move(setup), state, intervals));
+    if (!PlatformLine(device).read(counters)) return;
+    LineSetup setup = readSetup(device, static_cast<int>(m_lines.size()) + 1);
+    LineRecord const& record = records.of(device, setup.format());
+    m_lines.emplace_back(new Z7SimLine(std::move(setup), record.state, record.intervals));
     m_devices.push_back(device);
+    m_numbers.push_back(record.state->number());
 }
 
 int Z7SimLineFeature::GetNumberOfLines() {
@@ -87,13 +86,8 @@ int Z7SimLineFeature::NotifyLineStatusListeners(ReferenceCounter<DS1LineDevice> 
 }
 
 void Z7SimLineFeature::Withdraw() {
-    LineStatusDelivery::instance().close(m_number);
-}
-
-ReferenceCounter<DS1LineDevice> Z7SimLineFeature::lineAt(int i) {
-    auto const place = static_cast<std::size_t>(i);
-    if (i < 0 || place >= m_lines.size()) return {};
-    return m_lines[place];
+    for (std::uint64_t const number : m_numbers)
+        LineStatusDelivery::instance().close(number);
 }
 
 ReferenceCounter<DS1LineDevice> Z7SimLineFeature::lineOfDevice(long device) {

@@ -2,7 +2,7 @@
 // The entry point of the reference board module.
 #include <cstdlib>
 
-#include "PingInterval.h"
+#include "Settings.h"
 #include "Z7SimBoardFactory.h"
 #include "board/BoardModule.h"
 
@@ -10,5 +10,7 @@ BoardFactory* kvl_create_board_factory(int abi_version) {
     if (abi_version != KVL_BOARD_MODULE_ABI_VERSION) return nullptr;
     auto* const factory = new Z7SimBoardFactory;
     factory->SetPingInterval(readPingInterval(std::getenv(kPingIntervalVariable)));
+    factory->SetFailureTimes(readFailureTimes(std::getenv(kFailureDeclarationVariable),
+                                              std::getenv(kFailureClearingVariable)));
     return factory;
 }

@@ -284,7 +284,7 @@ TEST_F(InterfaceTest, WholeTreeIsWalkedInOrderWhateverTheRequest) {
 TEST_F(InterfaceTest, BulkWalksOfAnySizeAgreeWithTheWalk) {
     startWithFullHistory();
     auto const walked = walk("1.3.6.1.2.1.10.18.8");
-    ASSERT_THAT(walked, SizeIs(13 * 96));
+    ASSERT_THAT(walked, SizeIs(13 * 95 + 3)); // the oldest has no counts
     for (char const* const repetitions : {"-Cr1", "-Cr7", "-Cr50"})
         EXPECT_EQ(answers("snmpbulkwalk", {repetitions, "1.3.6.1.2.1.10.18.8"}), walked)
             << repetitions;

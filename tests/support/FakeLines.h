@@ -2,12 +2,14 @@
 // Lines and channels whose answers a test chooses, and the features that hold them.
 #pragma once
 
+#include <algorithm>
 #include <cstring>
 #include <memory>
 #include <string>
 #include <utility>
 #include <vector>
 
+#include "board/DS1IntervalValidity.h"
 #include "board/ISDNChannelOnLine.h"
 #include "platform/ActionScheduler_pthread.h"
 #include "z7/DS1LineFeatureZ7.h"
@@ -15,7 +17,7 @@
 #include "z7/ISDNFeatureZ7.h"
 
 /// An interval table that only the test fills.
-class FakeHistory final : public DS1IntervalTable {
+class FakeHistory : public DS1IntervalTable {
   public:
     FakeHistory() { ActionScheduler_pthread::GetScheduler()->Remove(this); }
 
@@ -44,6 +46,18 @@ class FakeHistory final : public DS1IntervalTable {
         m_current.ErrorSeconds = errorSeconds;
         m_timeElapsed = timeElapsed;
     }
+};
+
+/// The same, with intervals that missed data.
+class FakeHistoryWithGaps final : public FakeHistory, public DS1IntervalValidity {
+  public:
+    std::vector<int> invalid;
+    int closed = 0;
+
+    bool IsIntervalValid(int n) override {
+        return std::find(invalid.begin(), invalid.end(), n) == invalid.end();
+    }
+    int GetIntervalsClosed() override { return closed; }
 };
 
 /// A line that supports only its name, its circuit and the values that a test sets.

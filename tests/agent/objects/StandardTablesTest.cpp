@@ -26,6 +26,7 @@ class StandardTablesTest : public ::testing::Test {
                     line.running = counts;
                 else
                     closed->counts.push_back(counts);
+                if (n > 0) closed->valid.push_back(n < 96);
             }
             if (records > 0) line.closed = closed;
             line.intervalsBefore = before;
@@ -105,7 +106,7 @@ Oid with(Oid column, std::initializer_list<std::uint32_t> index) {
 
 TEST_F(StandardTablesTest, IntervalIsFoundByLineAndNumber) {
     EXPECT_EQ(numberAt(with(kErroredSeconds, {10, 2})), 100200);
-    EXPECT_EQ(numberAt(with(kLineCodeViolations, {30, 96})), 309609);
+    EXPECT_EQ(numberAt(with(kLineCodeViolations, {30, 95})), 309509);
     EXPECT_EQ(numberAt({10, 18, 8, 1, 1, 30, 5}), 30);
     EXPECT_EQ(numberAt({10, 18, 8, 1, 2, 30, 5}), 5);
 }
@@ -124,7 +125,7 @@ TEST_F(StandardTablesTest, NextIntervalIsOfTheSameLineThenOfTheNextWithAny) {
     EXPECT_EQ(next(with(kErroredSeconds, {10, 2})), with(kErroredSeconds, {30, 1}));
     EXPECT_EQ(next(with(kErroredSeconds, {11})), with(kErroredSeconds, {30, 1}));
     EXPECT_EQ(next(with(kErroredSeconds, {20, 4294967295U})), with(kErroredSeconds, {30, 1}));
-    EXPECT_EQ(next(with(kErroredSeconds, {30, 96})), with({10, 18, 8, 1, 4}, {10, 1}));
+    EXPECT_EQ(next(with(kErroredSeconds, {30, 95})), with({10, 18, 8, 1, 4}, {10, 1}));
 }
 
 TEST_F(StandardTablesTest, NextOrEqualIntervalIsTheIntervalItself) {
@@ -141,7 +142,7 @@ TEST_F(StandardTablesTest, WalkOfTheIntervalsIsStrictlyIncreasingAndFindsEverySt
         name = after;
         EXPECT_EQ(find(name), Lookup::Found);
     }
-    EXPECT_EQ(steps, 13 * (2 + 96));
+    EXPECT_EQ(steps, 13 * (2 + 95) + 3); // the oldest has its index and its validity
 }
 
 TEST_F(StandardTablesTest, OldestIntervalOfAFullHistoryHasNoValidData) {
@@ -150,6 +151,18 @@ TEST_F(StandardTablesTest, OldestIntervalOfAFullHistoryHasNoValidData) {
     EXPECT_EQ(numberAt({10, 18, 6, 1, 4, 30}), 96); // dsx1ValidIntervals
     EXPECT_EQ(numberAt({10, 18, 6, 1, 14, 30}), 1); // dsx1InvalidIntervals
     EXPECT_EQ(numberAt({10, 18, 6, 1, 14, 10}), 0);
+}
+
+TEST_F(StandardTablesTest, IntervalThatMissedDataHasNoCounts) {
+    LineRow& line = m_snapshot.interfaces.lines[0];
+    auto const closed = std::make_shared<ClosedIntervals>(*line.closed);
+    closed->valid[0] = false;
+    line.closed = closed;
+    EXPECT_EQ(numberAt(with(kValidData, {10, 1})), 2);
+    EXPECT_EQ(find(with(kErroredSeconds, {10, 1})), Lookup::NoSuchInstance);
+    EXPECT_EQ(next(kErroredSeconds), with(kErroredSeconds, {10, 2}));
+    EXPECT_EQ(numberAt({10, 18, 6, 1, 4, 10}), 2);
+    EXPECT_EQ(numberAt({10, 18, 6, 1, 14, 10}), 1);
 }
 
 TEST_F(StandardTablesTest, LineWithoutHistoryIsInTheTableOfLinesOnly) {

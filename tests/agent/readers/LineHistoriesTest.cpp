@@ -105,6 +105,50 @@ TEST_F(LineHistoriesTest, TableThatDoesNotTellTheTimeIsReadEveryTime) {
     EXPECT_EQ(read().closed->counts[0][0], 3);
 }
 
+class GapsTest : public LineHistoriesTest {
+  protected:
+    GapsTest() { m_table = ReferenceCounter<DS1IntervalTable>(m_gaps); }
+
+    FakeHistoryWithGaps* m_gaps = new FakeHistoryWithGaps;
+};
+
+TEST_F(LineHistoriesTest, IntervalsOfATableThatMissesNothingAreValidExceptForTheEmptyOne) {
+    for (int n = 0; n <= DS1IntervalTable::kIntervals; ++n)
+        m_history->close(5);
+    LineRow const row = read();
+    EXPECT_TRUE(row.isValid(1));
+    EXPECT_TRUE(row.isValid(95));
+    EXPECT_FALSE(row.isValid(96));
+    EXPECT_EQ(row.closed->total[0], 95 * 5);
+}
+
+TEST_F(GapsTest, IntervalThatMissedDataIsNeitherValidNorInTheTotals) {
+    m_gaps->close(5);
+    m_gaps->close(7);
+    m_gaps->close(11);
+    m_gaps->invalid = {2};
+    LineRow const row = read();
+    EXPECT_TRUE(row.isValid(1));
+    EXPECT_FALSE(row.isValid(2));
+    EXPECT_TRUE(row.isValid(3));
+    EXPECT_EQ(row.closed->total[0], 16);
+}
+
+TEST_F(GapsTest, IntervalsClosedAtOnceAreReadWhateverTheTimeElapsedSays) {
+    for (int n = 0; n <= DS1IntervalTable::kIntervals; ++n)
+        m_gaps->close(5);
+    m_gaps->run(0, 100);
+    read();
+    // A host that was suspended finds intervals closed which nobody saw running.
+    m_gaps->close(0);
+    m_gaps->closed = 1;
+    m_gaps->invalid = {1};
+    m_gaps->run(0, 101);
+    LineRow const row = read();
+    EXPECT_FALSE(row.isValid(1));
+    EXPECT_EQ(row.closed->counts[0][0], 0);
+}
+
 TEST_F(LineHistoriesTest, TableThatIsReadNoMoreIsLetGo) {
     read();
     m_histories.begin(m_now += std::chrono::seconds(1));

@@ -8,14 +8,15 @@
 
 #include <gtest/gtest.h>
 
+#include "LineScheduler.h"
 #include "LineStatusDelivery.h"
 #include "Z7SimLineFeature.h"
 #include "board/BoardManager.h"
-#include "platform/ActionScheduler_pthread.h"
+#include "board/DS1IntervalValidity.h"
 #include "tests/modules/z7sim/OpenFactory.h"
 #include "tests/support/SimulatedPlatform.h"
 
-/// Time as the platform's lines have it.
+/// The clock of the platform's lines.
 class LineClock {
   public:
     LineClock() {
@@ -32,15 +33,21 @@ class LineClock {
     static inline std::atomic<std::chrono::nanoseconds> s_now{};
 };
 
-/// The process's scheduler, standing still: no tick but the test's own. Made before any line.
-class StillScheduler final : public ActionScheduler_pthread {
+/// The lines' scheduler without a thread: lines tick only when the test makes them. Made before any
+/// line.
+class StillScheduler final : public LineScheduler {
   public:
-    static void install() {
-        if (s_actionScheduler == nullptr) s_actionScheduler = new StillScheduler;
+    static StillScheduler& install() {
+        static auto* const scheduler = new StillScheduler;
+        s_instance = scheduler;
+        return *scheduler;
     }
 
+    using LineScheduler::pass;
+
   private:
-    StillScheduler() : ActionScheduler_pthread([] { return 0L; }) {}
+    StillScheduler() = default;
+    ~StillScheduler() override = default;
 };
 
 /// Board 5 with line 51, as the reference factory makes it.
@@ -57,20 +64,33 @@ class LineTest : public testing::Test {
     /// `line`: how the chassis describes it, such as `type: esf`.
     void plugIn(std::string const& line, std::string const& attributes = "NAME: span-1") {
         load(line, attributes);
+        attach();
+    }
+    /// Attaches the factory to the chassis that is loaded.
+    void attach() {
         m_manager->Attach(m_handle);
         m_board = m_manager->GetFirstBoard();
         find();
     }
-    /// Another line takes the place of the one that was plugged in.
+    /// Another board, with another line, takes the place of the one that was plugged in.
     void exchange(std::string const& line) {
-        load(line, "NAME: span-1");
-        restart();
+        load(line, "NAME: span-1", "T5");
+        m_factory->check_for_changed_boards();
+        m_board = m_manager->GetFirstBoard();
+        find();
     }
-    void restart() {
+    static void stop() {
         sim::command({{"command", "stop"}, {"board", 5}});
+        sim::drain();
+    }
+    void start() {
         sim::command({{"command", "start"}, {"board", 5}});
         sim::drain();
         find();
+    }
+    void restart() {
+        stop();
+        start();
     }
     /// Looks the line up on the board as it is now.
     void find() {
@@ -99,8 +119,12 @@ class LineTest : public testing::Test {
     }
     static void mend() { sim::command({{"command", "line-mend"}, {"line", 51}}); }
     int status() { return m_line->GetLineStatus(); }
-    static void load(std::string const& line, std::string const& attributes) {
-        sim::load({sim::board(5, "S5", "NAME: NX5-T1",
+    bool isValid(int n) {
+        return dynamic_cast<DS1IntervalValidity*>(m_table.get())->IsIntervalValid(n);
+    }
+    static void load(std::string const& line, std::string const& attributes,
+                     std::string const& serial = "S5") {
+        sim::load({sim::board(5, serial, "NAME: NX5-T1",
                               "devices: [{handle: 51, type: 501, attributes: {" + attributes +
                                   "}, line: {" + line + "}}]")});
     }

@@ -90,13 +90,26 @@ TEST_F(LinePastTest, IsFollowedByLiveSecondsWithoutASeam) {
 }
 
 TEST_F(LinePastTest, IsLostWhenTheBoardStartsLongAfterIt) {
-    plugIn("type: esf, past: {seconds: 1000, errors: {path-violations: 1}}");
-    EXPECT_EQ(m_table->GetValidIntervals(), 1);
+    load("type: esf, past: {seconds: 1000, errors: {path-violations: 1}}", "NAME: span-1");
+    sim::set(5, "BOARD_CONDITION", 4);
+    attach();
     LineClock::advance(std::chrono::seconds(61));
-    restart();
+    start();
     EXPECT_EQ(m_table->GetValidIntervals(), 0);
     EXPECT_EQ(m_table->GetPathCodingViolations(0), 0);
     EXPECT_EQ(m_table->GetTimeElapsed(), 0);
+}
+
+TEST_F(LinePastTest, TimeBetweenItsEndAndTheBoardsStartIsMissed) {
+    load("type: esf, past: {seconds: 1000, errors: {path-violations: 1}}", "NAME: span-1");
+    sim::set(5, "BOARD_CONDITION", 4);
+    attach();
+    LineClock::advance(std::chrono::seconds(20));
+    start();
+    EXPECT_EQ(m_table->GetValidIntervals(), 1);
+    EXPECT_TRUE(isValid(1));
+    EXPECT_EQ(m_table->GetTimeElapsed(), 120);
+    EXPECT_FALSE(isValid(0));
 }
 
 } // namespace

@@ -114,7 +114,7 @@ TEST(LineStormTest, ReadersSeeNothingImpossibleAndNothingIsLeftOver) {
             for (auto line = lines->GetFirstDevice(); line.get() != nullptr;
                  line = lines->GetNextDevice(line)) {
                 tables.push_back(line->GetIntervalTable());
-                ActionScheduler_pthread::GetScheduler()->Remove(tables.back().get());
+                LineScheduler::instance().Remove(tables.back().get());
             }
         }
         ASSERT_EQ(tables.size(), static_cast<std::size_t>(kSteadyBoards * kLinesOfABoard));

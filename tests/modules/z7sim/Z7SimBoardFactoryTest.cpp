@@ -9,7 +9,7 @@
 
 #include <gtest/gtest.h>
 
-#include "PingInterval.h"
+#include "Settings.h"
 #include "board/BoardManager.h"
 #include "board/BoardModule.h"
 #include "tests/modules/z7sim/OpenFactory.h"
@@ -74,6 +74,34 @@ TEST(PingIntervalTest, AnythingElseIsReportedAndLeavesTheDefault) {
                       "\"; write a number of whole seconds, 0 for no pings. Boards are pinged "
                       "every 60 seconds.\n");
     }
+}
+
+TEST(FailureTimesTest, DefectsBecomeFailuresAfterTwoSecondsAndEndAfterTenUnlessSet) {
+    FailureTimes const times = readFailureTimes(nullptr, nullptr);
+    EXPECT_EQ(times.declaration, 2);
+    EXPECT_EQ(times.clearing, 10);
+}
+
+TEST(FailureTimesTest, TimesWithinTheStandardsRangesAreTaken) {
+    EXPECT_EQ(readFailureTimes("9", nullptr).declaration, 9);
+    EXPECT_EQ(readFailureTimes(nullptr, "0").clearing, 0);
+    EXPECT_EQ(readFailureTimes(nullptr, "19").clearing, 19);
+}
+
+TEST(FailureTimesTest, AnythingElseIsReportedAndLeavesTheDefault) {
+    for (std::string const text : {"", "two", "1", "10", "-2", "2s"}) {
+        testing::internal::CaptureStderr();
+        EXPECT_EQ(readFailureTimes(text.c_str(), nullptr).declaration, 2) << text;
+        EXPECT_EQ(testing::internal::GetCapturedStderr(),
+                  "z7sim: Z7SIM_FAILURE_DECLARATION is \"" + text +
+                      "\"; write a whole number of seconds from 2 to 9. Defects become failures "
+                      "after 2 seconds.\n");
+    }
+    testing::internal::CaptureStderr();
+    EXPECT_EQ(readFailureTimes(nullptr, "20").clearing, 10);
+    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+              "z7sim: Z7SIM_FAILURE_CLEARING is \"20\"; write a whole number of seconds from 0 to "
+              "19. Failures end after 10 seconds.\n");
 }
 
 /// The module as it is installed.

@@ -338,35 +338,11 @@ TEST_F(Z7SimLineTest, AWithdrawnFeatureTellsNothingMore) {
 
 TEST_F(Z7SimLineTest, LinesGoWithAStoppedBoardAndComeBackWithAStartedOne) {
     plugIn("type: esf");
-    alarm("los");
-    tick(3);
-    sim::command({{"command", "stop"}, {"board", 5}});
-    sim::drain();
+    stop();
     EXPECT_EQ(m_board->GetFirstFeature(DS1LineFeature::iid()).get(), nullptr);
-    restart();
+    start();
     ASSERT_NE(m_feature.get(), nullptr);
     EXPECT_EQ(m_feature->GetNumberOfLines(), 1);
-    EXPECT_EQ(m_table->GetTimeElapsed(), 0);
-    EXPECT_EQ(m_table->GetSeverelyErrorSeconds(0), 0);
-}
-
-TEST_F(Z7SimLineTest, ASecondWithoutAnAnswerCountsNothing) {
-    plugIn("type: esf, errors: {path-violations: 400}");
-    tick(5);
-    sim::load({sim::board(6, "S6")});
-    tick();
-    EXPECT_EQ(m_table->GetTimeElapsed(), 6);
-    EXPECT_EQ(m_table->GetPathCodingViolations(0), 2000);
-}
-
-TEST_F(Z7SimLineTest, CountersThatStartedOverCountFromTheirNewStart) {
-    plugIn("type: esf, errors: {path-violations: 400}");
-    tick(5);
-    load("type: esf, errors: {path-violations: 300}", "NAME: span-1");
-    tick();
-    EXPECT_EQ(m_table->GetPathCodingViolations(0), 2000);
-    tick();
-    EXPECT_EQ(m_table->GetPathCodingViolations(0), 2300);
 }
 
 TEST_F(Z7SimLineTest, ABoardWithoutLinesHasNoFeatureOfThem) {

@@ -1,0 +1,44 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Which seconds of a DS1 line were seen, and which were missed.
+#pragma once
+
+#include <cstdint>
+
+/// What a tick stands for: seconds that were missed, or one whose data was read.
+struct LineTick {
+    std::int64_t missed = 0;
+    bool counts = false;
+};
+
+/// A `LineSeconds` accounts for the time of one line, tick by tick. Ticks come once a second of a
+/// monotonic clock and carry its time; each reading of the line carries the line's own age. The
+/// data of a second is the difference of two readings, so a second is seen when both its beginning
+/// and its end were read, and missed when ticks were left out, when the line did not answer, when
+/// it began anew, or when its own clock stood still.
+///
+/// The two clocks are not in step: now and then a second of the one holds two or no seconds of the
+/// other. That is no gap.
+///
+/// Unsynchronised.
+class LineSeconds {
+  public:
+    /// The reading before the first tick. `age` in seconds; `time`: of the tick under way or last.
+    void begin(std::uint32_t age, std::int64_t time);
+    /// The same for a line that did not answer.
+    void begin(std::int64_t time);
+
+    LineTick answered(std::uint32_t age, std::int64_t time);
+    LineTick silent(std::int64_t time);
+
+  private:
+    std::int64_t leftOut(std::int64_t time);
+    LineTick miss(std::int64_t seconds);
+
+    std::int64_t m_time = 0;     ///< of the last tick
+    std::int64_t m_position = 0; ///< seconds accounted for
+    std::int64_t m_zero = 0;     ///< the line's age at position 0
+    std::int64_t m_age = 0;      ///< as read last
+    int m_still = 0;             ///< ticks in a row in which the line's age stayed the same
+    bool m_hasAge = false;       ///< the line has answered at all
+    bool m_hasBeginning = false; ///< the beginning of the second under way was read
+};
