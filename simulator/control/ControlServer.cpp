@@ -102,6 +102,7 @@ class Server {
             // Those who have gone make room for those who wait.
             dropEnded();
             if ((polled[1].revents & POLLIN) != 0) acceptClients();
+            dropEnded(); // those who were refused
         }
     }
 
