@@ -20,42 +20,41 @@ ISDNMonitor::ISDNMonitor() {
     m_consumer->Start();
 }
 
-void ISDNMonitor::add(ReferenceCounter<Z7SimISDNFeature> const& feature) {
+void ISDNMonitor::add(std::vector<long> const& trunks,
+                      ReferenceCounter<ISDNFeatureZ7> const& feature,
+                      ISDNMessageReceiver& receiver) {
     std::scoped_lock const guard(m_mutex);
-    for (long const device : feature->trunks())
-        m_features.emplace(device, feature);
+    for (long const device : trunks)
+        m_receivers.emplace(device, Entry{feature, &receiver});
 }
 
-void ISDNMonitor::remove(Z7SimISDNFeature const& feature) {
-    std::vector<Handle> dropped; // the last handle may go with it, after the lock was given back
+void ISDNMonitor::remove(ISDNMessageReceiver const& receiver) {
+    std::vector<Entry> dropped; // the last handle may go with it, after the lock has been released
     std::scoped_lock const guard(m_mutex);
-    for (long const device : feature.trunks()) {
-        auto [entry, end] = m_features.equal_range(device);
-        while (entry != end) {
-            if (entry->second.get() != &feature) {
-                ++entry;
-                continue;
-            }
-            dropped.push_back(entry->second);
-            entry = m_features.erase(entry);
+    for (auto entry = m_receivers.begin(); entry != m_receivers.end();) {
+        if (entry->second.receiver != &receiver) {
+            ++entry;
+            continue;
         }
+        dropped.push_back(entry->second);
+        entry = m_receivers.erase(entry);
     }
 }
 
-std::vector<ISDNMonitor::Handle> ISDNMonitor::featuresOf(long device) {
-    std::vector<Handle> features;
+std::vector<ISDNMonitor::Entry> ISDNMonitor::receiversOf(long device) {
+    std::vector<Entry> receivers;
     std::scoped_lock const guard(m_mutex);
-    auto const [first, last] = m_features.equal_range(device);
+    auto const [first, last] = m_receivers.equal_range(device);
     for (auto entry = first; entry != last; ++entry)
-        features.push_back(entry->second);
-    return features;
+        receivers.push_back(entry->second);
+    return receivers;
 }
 
 int ISDNMonitor::HandleEvent(AdminCallbackMsg* message, void* /*context*/) {
     if (message->payload == nullptr) return 1;
     ISDNChannelMsg change;
     std::memcpy(&change, message->payload, sizeof change);
-    for (auto const& feature : featuresOf(change.device))
-        feature->apply(message->id, change);
+    for (auto const& entry : receiversOf(change.device))
+        entry.receiver->apply(message->id, change);
     return 1;
 }

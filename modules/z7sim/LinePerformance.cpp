@@ -219,6 +219,8 @@ bool LinePerformance::severe(LineSecond const& second, LineCounts const& counts)
         return counts.lineCodeViolations >= 2048;
     case LineFormat::e1Crc:
         return noFrame || counts.pathCodingViolations >= 832;
+    case LineFormat::other:
+        return false;
     }
     return false;
 }

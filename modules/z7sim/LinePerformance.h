@@ -10,10 +10,11 @@
 
 /// How a line is framed, which decides what of its errors can be seen.
 enum class LineFormat {
-    esf,  ///< T1, extended superframes: has a CRC
-    d4,   ///< T1, superframes: has none
-    e1,   ///< E1 without CRC
-    e1Crc ///< E1 with CRC
+    esf,   ///< T1, extended superframes: has a CRC
+    d4,    ///< T1, superframes: has none
+    e1,    ///< E1 without CRC
+    e1Crc, ///< E1 with CRC
+    other  ///< unframed or not known: of errors nothing is known, of failures all
 };
 
 /// The defects that deprive a line of its frame.

@@ -1,8 +1,9 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A feature that something beside its board calls.
+// Features that other parts of the module call.
 #pragma once
 
-/// Withdrawn when the board takes the feature away: from then on nothing is begun on it.
+/// A `Withdrawable` is a feature that is called from outside its board, by messages or by ticks.
+/// Its board withdraws it before removing it; no call begins after that.
 class Withdrawable {
   public:
     virtual void Withdraw() = 0;

@@ -15,9 +15,10 @@ Z7SimVoiceDevice::Z7SimVoiceDevice(DevMapDeviceIf const& record, DevicePlace pla
 
 Z7SimVoiceDevice::~Z7SimVoiceDevice() = default;
 
-TrunkFacts::TrunkFacts(long device, int number, ReferenceCounter<DS1LineDevice> ds1Line)
-    : lineNumber(number),
-      lineType(numberAttributeOr(device, kDS1LineType, -1)),
+TrunkFacts::TrunkFacts(long device, ReferenceCounter<DS1LineDevice> ds1Line)
+    : lineNumber(ds1Line.get() == nullptr ? -1 : ds1Line->GetLineIndex()),
+      lineType(ds1Line.get() == nullptr ? numberAttributeOr(device, kDS1LineType, -1)
+                                        : ds1Line->GetLineType()),
       protocolType(numberAttributeOr(device, "Protocol_Type_0", -1)),
       line(std::move(ds1Line)) {}
 

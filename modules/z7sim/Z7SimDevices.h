@@ -52,16 +52,15 @@ class Z7SimVoiceDevice final : public Z7SimDevice<Z7VoiceDevice> {
     int const m_echoCancellation;
 };
 
-/// What a trunk knows of itself: read when it is made, but for its line's status. What the platform
-/// does not say is -1.
+/// The answers of a trunk, which are read when it is made, except for its line's status. What the
+/// platform does not say is -1, and so are the answers about a line that the trunk does not have.
 struct TrunkFacts {
-    /// `number`: the trunk's among those of the board, from 1. `ds1Line`: an empty handle when the
-    /// platform has no line of the trunk.
-    TrunkFacts(long device, int number, ReferenceCounter<DS1LineDevice> ds1Line);
+    /// `ds1Line`: an empty handle when the platform has no line of the trunk.
+    TrunkFacts(long device, ReferenceCounter<DS1LineDevice> ds1Line);
 
     int lineStatus() const;
 
-    int lineNumber;
+    int lineNumber; ///< the line's `GetLineIndex`
     int lineType;
     int protocolType;
     ReferenceCounter<DS1LineDevice> line;

@@ -4,7 +4,6 @@
 #include <algorithm>
 #include <string>
 
-#include "ISDNMonitor.h"
 #include "ObjectAttributes.h"
 
 namespace {
@@ -139,7 +138,7 @@ makeISDNFeature(long board, std::vector<long> const& devices,
                 ReferenceCounter<Z7SimLineFeature> const& lines) {
     ReferenceCounter<Z7SimISDNFeature> feature(new Z7SimISDNFeature(board, devices, lines));
     if (feature->trunks().empty()) return {};
-    ISDNMonitor::instance().add(feature);
+    ISDNMonitor::instance().add(feature->trunks(), {feature.get()}, *feature.get());
     feature->readStates();
     return feature;
 }

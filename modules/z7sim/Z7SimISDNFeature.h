@@ -4,19 +4,22 @@
 
 #include <vector>
 
+#include "ISDNMonitor.h"
 #include "Withdrawable.h"
 #include "Z7SimISDNChannels.h"
 #include "Z7SimLineFeature.h"
 #include "boardplatform/isdn_channels.h"
 #include "z7/ISDNFeatureZ7.h"
 
-/// The channels of every device that has a bearer and a signalling state. Such trunks are numbered
-/// from 1 in the order of the device mapper; their channels are called "B<trunk>.<time slot>" and
-/// "D<trunk>".
+/// A `Z7SimISDNFeature` holds the channels of every device that has a bearer and a signalling
+/// state. Such trunks are numbered from 1 in the order of the device mapper; their channels are
+/// called "B<trunk>.<time slot>" and "D<trunk>".
 ///
-/// Status changes are told on the platform's delivery thread: to the feature's listeners, then to
-/// the channel's own.
-class Z7SimISDNFeature final : public ISDNFeatureZ7, public Withdrawable {
+/// Status changes are announced on the platform's delivery thread: to the feature's listeners, then
+/// to the channel's own.
+class Z7SimISDNFeature final : public ISDNFeatureZ7,
+                               public Withdrawable,
+                               public ISDNMessageReceiver {
   public:
     /// Asks `devices` of the board for their channels, and `lines`, which may be empty, for the
     /// lines that carry them. The channels' states are not known before `readStates`.
@@ -27,8 +30,8 @@ class Z7SimISDNFeature final : public ISDNFeatureZ7, public Withdrawable {
     /// Asks the platform for the state of every channel. Follow the messages first: a change is
     /// then either read or announced.
     void readStates();
-    /// Applies one message, and tells of it if it is a change. One at a time.
-    void apply(std::uint32_t id, ISDNChannelMsg const& message);
+    /// Applies a message, and announces it when it is a change.
+    void apply(std::uint32_t id, ISDNChannelMsg const& message) override;
     /// No message that comes from now on reaches the feature; one under way on another thread may.
     void Withdraw() override;
 

@@ -11,23 +11,69 @@ namespace {
 constexpr int kUp = 1;
 constexpr int kDown = 2;
 
+/// dsx1LineType. The platform names four of them (`DS1LineType`); DS1-MIB has more.
+enum LineType : int {
+    kEsf = 2,
+    kD4 = 3,
+    kE1 = 4,
+    kE1Crc = 5,
+    kE1Mf = 6,
+    kE1CrcMf = 7,
+    kUnframed = 8,
+    kE1Unframed = 9,
+    kE1Q50 = 12,
+    kE1Q50Crc = 13,
+    kJ1Esf = 14,
+    kJ1Unframed = 16
+};
+
+char const* carrierName(LineCarrier carrier) {
+    switch (carrier) {
+    case LineCarrier::t1:
+        return "T1 line ";
+    case LineCarrier::e1:
+        return "E1 line ";
+    case LineCarrier::unknown:
+        break;
+    }
+    return "Line ";
+}
+
 } // namespace
 
 LineFormat LineSetup::format() const {
     switch (type) {
-    case static_cast<int>(DS1LineType::d4):
+    case kEsf:
+    case kJ1Esf:
+        return LineFormat::esf;
+    case kD4:
         return LineFormat::d4;
-    case static_cast<int>(DS1LineType::e1):
+    case kE1:
+    case kE1Mf:
+    case kE1Q50:
         return LineFormat::e1;
-    case static_cast<int>(DS1LineType::e1Crc):
+    case kE1Crc:
+    case kE1CrcMf:
+    case kE1Q50Crc:
         return LineFormat::e1Crc;
     default:
-        return LineFormat::esf;
+        return LineFormat::other;
     }
 }
 
-bool LineSetup::isT1() const {
-    return format() == LineFormat::esf || format() == LineFormat::d4;
+LineCarrier LineSetup::carrier() const {
+    switch (format()) {
+    case LineFormat::esf:
+    case LineFormat::d4:
+        return LineCarrier::t1;
+    case LineFormat::e1:
+    case LineFormat::e1Crc:
+        return LineCarrier::e1;
+    case LineFormat::other:
+        break;
+    }
+    if (type == kUnframed || type == kJ1Unframed) return LineCarrier::t1;
+    return type == kE1Unframed ? LineCarrier::e1 : LineCarrier::unknown;
 }
 
 Z7SimLine::Z7SimLine(LineSetup setup, std::shared_ptr<LineState> state,
@@ -37,7 +83,7 @@ Z7SimLine::Z7SimLine(LineSetup setup, std::shared_ptr<LineState> state,
 Z7SimLine::~Z7SimLine() = default;
 
 int Z7SimLine::GetDescription(std::string& description) {
-    description = (m_setup.isT1() ? "T1 line " : "E1 line ") + m_setup.name;
+    description = carrierName(m_setup.carrier()) + m_setup.name;
     return 0;
 }
 int Z7SimLine::GetType() {
@@ -47,7 +93,15 @@ int Z7SimLine::GetMTU() {
     return Interface::GetMTU();
 }
 int Z7SimLine::GetSpeed() {
-    return m_setup.isT1() ? 1544000 : 2048000;
+    switch (m_setup.carrier()) {
+    case LineCarrier::t1:
+        return 1544000;
+    case LineCarrier::e1:
+        return 2048000;
+    case LineCarrier::unknown:
+        break;
+    }
+    return KVL::kNotSupported;
 }
 int Z7SimLine::GetAdminStatus() {
     return kUp;
@@ -100,6 +154,7 @@ int Z7SimLine::GetLineIndex() {
     return m_setup.number;
 }
 ReferenceCounter<DS1IntervalTable> Z7SimLine::GetIntervalTable() {
+    if (m_setup.format() == LineFormat::other) return {};
     return m_intervals;
 }
 int Z7SimLine::GetLineType() {

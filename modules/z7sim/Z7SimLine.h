@@ -9,12 +9,15 @@
 #include "Z7SimIntervalTable.h"
 #include "board/DS1LineDevice.h"
 
-/// How a line is set up: what the device mapper tells of it, read when the line is made.
+/// The kinds of lines, by how many bits they carry.
+enum class LineCarrier { t1, e1, unknown };
+
+/// How a line is set up: what the device mapper says of it, read when the line is made.
 struct LineSetup {
     std::string name;
     std::string circuit;
     int number = 0; ///< on its board, from 1
-    int type = 0;   ///< dsx1LineType
+    int type = 1;   ///< dsx1LineType; 1 where it is not known
     int coding = 0;
     int length = 0;
     int buildOut = 0;
@@ -24,7 +27,7 @@ struct LineSetup {
     bool channelized = false;
 
     LineFormat format() const;
-    bool isT1() const;
+    LineCarrier carrier() const;
 };
 
 /// A `Z7SimLine` answers from its set-up, its status and its history; no query waits for the
@@ -57,6 +60,7 @@ class Z7SimLine final : public DS1LineDevice {
 
     int GetName(char* name) override;
     int GetLineIndex() override;
+    /// Empty for a line of no known format: without it errors mean nothing.
     ReferenceCounter<DS1IntervalTable> GetIntervalTable() override;
     int GetLineType() override;
     int GetLineCoding() override;

@@ -19,16 +19,32 @@ constexpr std::size_t kMaxNameLength = 63;
 /// Of an E1 line, one per time slot.
 constexpr std::size_t kMostChannels = 32;
 
-/// What DS1-MIB calls a line's set-up, as far as the platform tells; the rest as lines of this type
-/// are usually set up.
+/// dsx1LineType of a line whose type the platform does not say.
+constexpr int kOtherType = 1;
+
+/// dsx1LineCoding.
+int usualCoding(LineCarrier carrier) {
+    switch (carrier) {
+    case LineCarrier::t1:
+        return 2; // B8ZS
+    case LineCarrier::e1:
+        return 3; // HDB3
+    case LineCarrier::unknown:
+        break;
+    }
+    return 6; // other
+}
+
+/// A line's set-up in DS1-MIB's values, as far as the platform says; the rest is as lines of this
+/// type are usually set up.
 LineSetup readSetup(long device, int number) {
     LineSetup setup;
     setup.name = textAttribute(device, "NAME").substr(0, kMaxNameLength);
     setup.circuit = textAttribute(device, "CIRCUIT");
-    setup.type = numberAttributeOr(device, kDS1LineType, static_cast<int>(DS1LineType::esf));
+    setup.type = numberAttributeOr(device, kDS1LineType, kOtherType);
     bool const esf = setup.format() == LineFormat::esf;
     setup.number = numberAttributeOr(device, "LINE_NUMBER", number);
-    setup.coding = numberAttributeOr(device, "LINE_CODING", setup.isT1() ? 2 : 3); // B8ZS, HDB3
+    setup.coding = numberAttributeOr(device, "LINE_CODING", usualCoding(setup.carrier()));
     setup.length = numberAttributeOr(device, "LINE_LENGTH", 0);
     setup.buildOut = numberAttributeOr(device, "LINE_BUILD_OUT", 1);  // not applicable
     setup.clockSource = numberAttributeOr(device, "CLOCK_SOURCE", 1); // loop timing

@@ -44,7 +44,7 @@ class DeviceMaker {
     TrunkFacts facts(long device) {
         ReferenceCounter<DS1LineDevice> line;
         if (m_lines.get() != nullptr) line = m_lines->lineOfDevice(device);
-        return {device, ++m_lineNumber, std::move(line)};
+        return {device, std::move(line)};
     }
     ReferenceCounter<ISDNDChannel> signalling(long device) const {
         if (m_isdn.get() == nullptr) return {};
@@ -58,7 +58,6 @@ class DeviceMaker {
     int m_trunks = 0;
     int m_isdnTrunks = 0;
     int m_stations = 0;
-    int m_lineNumber = 0;
 };
 
 } // namespace

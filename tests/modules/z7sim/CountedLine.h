@@ -37,7 +37,7 @@ inline void PrintTo(LineCounts const& counts, std::ostream* out) {
 }
 
 inline void PrintTo(LineFormat format, std::ostream* out) {
-    constexpr std::array kNames{"Esf", "D4", "E1", "E1Crc"};
+    constexpr std::array kNames{"Esf", "D4", "E1", "E1Crc", "Other"};
     *out << kNames.at(static_cast<std::size_t>(format));
 }
 

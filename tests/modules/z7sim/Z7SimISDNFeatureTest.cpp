@@ -7,6 +7,7 @@
 
 #include "ISDNMonitor.h"
 #include "Z7SimBoard.h"
+#include "Z7SimISDNChannels.h"
 #include "board/ISDNChannelOnLine.h"
 #include "board/Interface.h"
 #include "core/ReferenceTable.h"

@@ -7,6 +7,7 @@
 
 #include <gtest/gtest.h>
 
+#include "Z7SimLine.h"
 #include "tests/modules/z7sim/LineFixture.h"
 
 namespace {
@@ -343,6 +344,36 @@ TEST_F(Z7SimLineTest, LinesGoWithAStoppedBoardAndComeBackWithAStartedOne) {
     start();
     ASSERT_NE(m_feature.get(), nullptr);
     EXPECT_EQ(m_feature->GetNumberOfLines(), 1);
+}
+
+TEST(LineSetupTest, EveryTypeOfTheMibHasItsFormatOrNone) {
+    auto const format = [](int type) {
+        LineSetup setup;
+        setup.type = type;
+        return setup.format();
+    };
+    for (int const type : {2, 14})
+        EXPECT_EQ(format(type), LineFormat::esf) << type;
+    EXPECT_EQ(format(3), LineFormat::d4);
+    for (int const type : {4, 6, 12})
+        EXPECT_EQ(format(type), LineFormat::e1) << type;
+    for (int const type : {5, 7, 13})
+        EXPECT_EQ(format(type), LineFormat::e1Crc) << type;
+    for (int const type : {-1, 0, 1, 8, 9, 10, 11, 15, 16, 99})
+        EXPECT_EQ(format(type), LineFormat::other) << type;
+}
+
+TEST_F(Z7SimLineTest, LineOfAnUnknownTypeIsNoT1) {
+    load("type: esf", "NAME: span-1");
+    sim::unset(51, "LINE_TYPE");
+    attach();
+    std::string description;
+    m_line->GetDescription(description);
+    EXPECT_EQ(description, "Line span-1");
+    EXPECT_EQ(m_line->GetLineType(), 1); // other
+    EXPECT_EQ(m_line->GetLineCoding(), 6);
+    EXPECT_EQ(m_line->GetSpeed(), KVL::kNotSupported);
+    EXPECT_EQ(m_table.get(), nullptr);
 }
 
 TEST_F(Z7SimLineTest, ABoardWithoutLinesHasNoFeatureOfThem) {

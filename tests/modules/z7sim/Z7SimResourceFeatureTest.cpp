@@ -125,13 +125,17 @@ TEST_F(Z7SimResourceFeatureTest, TrunkTellsTheStatusOfItsLine) {
     EXPECT_NE(trunk->GetLineStatus(), find<Z7TRKDevice>("other")->GetLineStatus());
 }
 
-TEST_F(Z7SimResourceFeatureTest, LinesAreNumberedOverAllTrunksOfTheBoard) {
-    plugIn("", named(516, "i2") + named(514, "i1") + named(503, "v") + named(505, "t2") +
-                   named(501, "t1"));
-    EXPECT_EQ(find<Z7TRKDevice>("t1")->GetLineNumber(), 1);
-    EXPECT_EQ(find<Z7TRKDevice>("t2")->GetLineNumber(), 2);
-    EXPECT_EQ(find<Z7TRKDevice>("i1")->GetLineNumber(), 3);
-    EXPECT_EQ(find<Z7TRKDevice>("i2")->GetLineNumber(), 4);
+TEST_F(Z7SimResourceFeatureTest, TrunkHasTheNumberThatItsLineHas) {
+    plugIn("", named(516, "i2", "", "line: {type: e1}") + named(514, "i1") + named(503, "v") +
+                   named(505, "t2", "", "line: {type: e1}") +
+                   named(501, "t1", "LINE_NUMBER: 7", "line: {type: esf}"));
+    auto const lines = feature<DS1LineFeature>();
+    for (char const* const name : {"t1", "t2", "i2"})
+        EXPECT_EQ(find<Z7TRKDevice>(name)->GetLineNumber(), lines->Find(name)->GetLineIndex())
+            << name;
+    EXPECT_EQ(find<Z7TRKDevice>("t1")->GetLineNumber(), 7);
+    EXPECT_EQ(find<Z7TRKDevice>("i2")->GetLineNumber(), 3);
+    EXPECT_EQ(find<Z7TRKDevice>("i1")->GetLineNumber(), -1) << "it has no line";
 }
 
 TEST_F(Z7SimResourceFeatureTest, ISDNTrunkAsksItsSignallingChannel) {
