@@ -12,7 +12,8 @@ namespace {
 /// The types of devices on a board, in the order in which they are listed.
 constexpr int kDeviceTypes[] = {501, 503, 505, 507, 509, 514, 516, 518, 520, 521, 511, 525, 527};
 
-/// Deliberate: an answer of less than two bytes is address 0; boards without shared memory say so.
+/// Deliberate: an answer of less than two bytes is address 0, as boards without shared memory give
+/// it.
 long address(DMNumber const& number, DMAttribute const& request) {
     return request.status == 0 && request.size < 2 ? 0 : number.answer(request);
 }
@@ -110,8 +111,7 @@ time_t DevMapBoardIf::StateChangeDate() {
     std::tm date{};
     if (strptime(text.text().c_str(), "%a %b %e %T %Y", &date) == nullptr) return 0;
     date.tm_isdst = -1; // the text does not say whether summer time was in force
-    // Where time_t has 32 bits it may not hold the date; mktime() fails and leaves the weekday
-    // alone.
+    // A 32-bit time_t may not hold the date. mktime() then fails and does not set the weekday.
     date.tm_wday = -1;
     time_t const seconds = std::mktime(&date);
     return date.tm_wday < 0 ? 0 : seconds;

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "access/DeviceMapperIf.h"
 
+#include <cstddef>
 #include <cstdint>
 
 #include <algorithm>

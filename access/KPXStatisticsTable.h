@@ -10,30 +10,31 @@
 #include "boardplatform/kpx.h"
 #include "platform/Export.h"
 
-/// One row per process, walked by process id. The rows are read at most every ten seconds, so a
-/// walk sees one snapshot as long as no refresh falls due.
+/// A `KPXStatisticsTable` has one row per process, walked by process id. It reads the rows at most
+/// every ten seconds, so a walk sees one snapshot unless a refresh is due meanwhile.
 ///
-/// Not synchronised: the table belongs to one thread.
+/// Thread-bound: one thread uses the table.
 class KVLOAM_API KPXStatisticsTable {
   public:
-    /// The most processes that are seen.
+    /// The largest number of processes in the table.
     static constexpr int kCapacity = 101;
 
     /// Thrown by the getters for a process that is not in the table.
     class KVLOAM_API StatsErrorException {};
 
-    /// The single instance, made by the first call and never destroyed.
+    /// The single instance, created by the first call and never destroyed.
     static KPXStatisticsTable* GetInstance();
 
-    /// Reads all rows anew if the table is at least ten seconds old. Returns 1 if so, else 0.
+    /// Reads all rows anew if the table is at least ten seconds old. Returns 1 if it did, otherwise
+    /// 0.
     int CacheRefresh();
-    /// Refreshes if due. The smallest process id, or -1.
+    /// Refreshes if due. Returns the smallest process id, or -1.
     int GetFirstIndex();
-    /// Never refreshes. The next larger process id, or -1 when `pid` is the last or is not in the
-    /// table.
+    /// Never refreshes. Returns the next larger process id, or -1 if `pid` is the last or is not in
+    /// the table.
     int GetNextIndex(int pid);
 
-    /// Each refreshes if due and answers for one process, or throws `StatsErrorException`.
+    /// Each refreshes if due and returns a value of one process, or throws `StatsErrorException`.
     std::string GetApplicationName(int pid);
     int GetNumberOfOpens(int pid);
     int GetNumberOfCloses(int pid);
@@ -46,7 +47,7 @@ class KVLOAM_API KPXStatisticsTable {
   protected:
     using Clock = std::time_t();
 
-    /// `clock` tells the time in seconds.
+    /// `clock` returns the time in seconds.
     explicit KPXStatisticsTable(Clock* clock);
 
   private:

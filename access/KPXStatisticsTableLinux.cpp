@@ -12,8 +12,8 @@ namespace {
 
 constexpr std::time_t kMaxAge = 9; // seconds
 
-/// Puts the name of the process's program into `record`; leaves what the platform gave when the
-/// process's command line cannot be opened.
+/// Puts the name of the process's program into `record`. If the process's command line cannot be
+/// opened, the platform's name stays.
 void readProgramName(int pid, tag_KPXSTATISTICS& record) {
     std::array<char, 32> path{};
     std::snprintf(path.data(), path.size(), "/proc/%d/cmdline", pid);

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "access/QSBAccessor.h"
 
+#include <cstddef>
 #include <cstdlib>
 #include <cstring>
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The platform's attribute store: opened once per process, its boards found by serial number.
+// The platform's attribute store, opened once per process, with its boards by serial number.
 #pragma once
 
 #include <map>
@@ -10,20 +10,20 @@
 
 namespace KVL {
 
-/// A record type of the attribute store.
+/// A `QSBRecordType` is a record type of the attribute store.
 struct QSBRecordType {
     char name[32];
     char parent[32];
     int size; ///< bytes
 };
 
-/// The record types that are read here, a family's and a board's.
+/// The record types that the library reads: a family's and a board's.
 inline constexpr QSBRecordType kQSBRecordTypes[] = {{"Family", "root", 30},
                                                     {"Board", "Family", 2128}};
 /// Names the layout of the board record.
 inline constexpr char const* kQSBBoardLayout = "BW1.0_BCI_Struct";
 
-/// The board families of the store; the first entry is none and is never searched.
+/// The board families of the store. The first entry is no family and is never searched.
 inline constexpr char const* kQSBFamilies[] = {"", "NX5", "QUILLON", "VORN", "Z7", "VELQUOR"};
 /// The board models of the store.
 inline constexpr char const* kQSBModels[] = {"NX5-T1",  "NX5-E1",  "QUILLON-T1", "QUILLON-E1",
@@ -36,10 +36,10 @@ inline constexpr char const* kQSBResultNames[] = {
 
 } // namespace KVL
 
-/// Keeps the store open while it lives. The first accessor opens the store and maps its boards, the
-/// last one closes it.
+/// A `QSBAccessor` keeps the store open while it lives. The first accessor opens the store and
+/// reads which boards it has; the last one closes it.
 ///
-/// Not synchronised: all accessors and `QSBBoard`s of a process belong to one thread.
+/// Thread-bound: one thread uses all accessors and `QSBBoard`s of a process.
 class KVLOAM_API QSBAccessor {
   public:
     QSBAccessor();
@@ -47,16 +47,17 @@ class KVLOAM_API QSBAccessor {
     QSBAccessor(QSBAccessor const&) = delete;
     QSBAccessor& operator=(QSBAccessor const&) = delete;
 
-    /// Opens the store. Sets the environment variable VQRXCFGPATH to "/usr/velquor/cfg" when it is
+    /// Opens the store. Sets the environment variable VQRXCFGPATH to "/usr/velquor/cfg" if it is
     /// not set. Returns whether the store is open.
     bool OpenStorage();
-    /// Opens the store if it is closed; maps the boards anew if it is open then.
+    /// Opens the store if it is closed. If it is open then, reads anew which boards it has.
     void Update();
     void CreateSerialNumberToInstanceIDMap();
     /// The instance of the board's record, or -1.
     int GetBoardInstance(std::string const& serialNumber);
-    /// Finds the record of a family. Returns 0, or 1 and -1 for the instance when there is none.
-    /// The name is only read.
+    /// Finds the record of a family. Returns 0; if there is none, sets the instance to -1 and
+    /// returns
+    /// 1. The name is only read.
     int FindFamilyID(char* familyName, int* familyInstance);
 
   private:

@@ -7,11 +7,11 @@
 
 #include "access/QSBAccessor.h"
 
-/// A board's record, found by serial number; every getter reads its field anew. A text that cannot
-/// be read is "Error", a number -1. While the board is not in the store, every getter looks for it
-/// again.
+/// A `QSBBoard` is a board's record, found by serial number. Every getter reads its field anew. A
+/// text that cannot be read is "Error", a number -1. While the board is not in the store, every
+/// getter searches for it again.
 ///
-/// Not synchronised: see `QSBAccessor`.
+/// Thread-bound, like `QSBAccessor`.
 class KVLOAM_API QSBBoard {
   public:
     explicit QSBBoard(std::string const& serialNumber);
@@ -19,7 +19,7 @@ class KVLOAM_API QSBBoard {
     QSBBoard(QSBBoard const&) = delete;
     QSBBoard& operator=(QSBBoard const&) = delete;
 
-    /// Maps the boards anew and looks for this one.
+    /// Reads anew which boards the store has, and searches for this one.
     void UpdateInstanceID();
 
     std::string SerialNumber();

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "board/DS1IntervalTable.h"
 
+#include <cstddef>
+
 #include "core/ReferenceTable.h"
 #include "platform/ActionScheduler_pthread.h"
 
@@ -19,7 +21,7 @@ int DS1IntervalTable::GetTimeElapsed() {
 }
 
 int DS1IntervalTable::GetValidIntervals() {
-    // The ring is marked full before its places wrap around, and so it is asked after them.
+    // The ring is marked full before its positions wrap around; so the mark is read after them.
     int const closed = m_next - m_oldest;
     return m_wrapped.load(std::memory_order_relaxed) ? kIntervals : closed;
 }
@@ -57,8 +59,8 @@ int DS1IntervalTable::GetLineCodeViolations(int n) {
 }
 
 int DS1IntervalTable::ScheduledAction() {
-    // Neither its dynamic type nor a field of its own tells whether the table is complete: both are
-    // those of the complete table while members are being built or destroyed.
+    // The dynamic type does not show whether the table is complete: while the members of the
+    // concrete table are being constructed or destroyed, the type is that table's already.
     if (ReferenceTable::get_instance()->ReferenceTable::get_refinfo(this) == nullptr) return 0;
     if (m_timeElapsed < kIntervalLength)
         CollectSecond();

@@ -9,8 +9,9 @@
 #include "core/Object.h"
 #include "platform/Schedulable.h"
 
-/// A counter that one thread changes while others read it. Behaves like the number it holds. Who
-/// reads a value also sees what was done before it was set.
+/// A `DS1Counter` is a counter that one thread changes while others read it. It behaves like the
+/// number that it holds. A thread that reads a value also sees everything that was done before the
+/// value was set.
 class DS1Counter {
   public:
     DS1Counter(std::int32_t value = 0) : m_value(value) {}
@@ -31,8 +32,8 @@ class DS1Counter {
     std::atomic<std::int32_t> m_value;
 };
 
-/// One 15-minute interval, a row of DS1-MIB's dsx1IntervalTable (RFC 2495, RFC 4805): its columns
-/// in their order.
+/// A `DS1Interval` is one 15-minute interval, a row of DS1-MIB's dsx1IntervalTable (RFC 2495,
+/// RFC 4805): its columns in their order.
 struct DS1Interval {
     DS1Counter ErrorSeconds;
     DS1Counter SeverelyErrorSeconds;
@@ -52,39 +53,42 @@ static_assert(sizeof(DS1Interval) == 40);
 /// the 96 intervals that were closed before it, 24 hours. The process's scheduler ticks it once a
 /// second. The concrete table decides what a second counts.
 ///
+/// Time: a tick is not a second of the line. The scheduler follows the system's clock: if that is
+/// set back, no tick comes until it has caught up; if it is set forward, or the process was
+/// suspended, the missed ticks follow at once. A concrete table therefore counts seconds by a
+/// monotonic clock and by the seconds that its line itself counts, and treats a second without data
+/// as missing, not as free of errors; `DS1IntervalValidity` shows which intervals missed data. A
+/// module that needs one tick per second in spite of clock changes removes its tables from the
+/// process's scheduler and ticks them by a monotonic clock (`docs/lines.md`).
+///
 /// Threads: the scheduler's thread ticks; any thread may read. A reader sees the old or the new
-/// value of each counter; a row read while an interval is closed may mix both.
+/// value of each counter; a row read while an interval is being closed may mix both.
 ///
 /// Lifetime: the table is on the scheduler's list from the base's construction to the base's
-/// destruction, but ticks reach it only while it has a handle. A constructor may take its time and
-/// ends with `ChangePeriod(this, 1)` of the scheduler, which orders its writes before later ticks.
-/// The destructor of a table whose ticks use members begins with `Remove(this)`, which waits for a
-/// tick under way. A table must be neither made nor destroyed in a scheduled action.
-///
-/// A tick is a second of the system's clock, which may be set: none comes while the clock catches
-/// up with itself, and many come at once after a step forward. A table that must not be wrong then
-/// takes itself off the process's scheduler, is ticked by a monotonic clock, and tells by
-/// `DS1IntervalValidity` which intervals missed data.
+/// destruction, but ticks reach it only while it has a handle. A constructor may therefore take its
+/// time and needs no call of the scheduler. A tick may be under way when the last handle goes: the
+/// destructor of a table whose ticks use members must begin with `Remove(this)` of the scheduler,
+/// which waits for that tick. A table must be neither created nor destroyed in a scheduled action.
 class KVLOAM_API DS1IntervalTable : public Object, public Schedulable {
   public:
     static constexpr int kIntervals = 96;
     /// The length of an interval in seconds.
     static constexpr int kIntervalLength = 900;
 
-    /// Enters the table with the process's scheduler, with a period of one second.
+    /// Enters the table in the process's scheduler, with a period of one second.
     DS1IntervalTable();
-    /// Takes the table off the scheduler's list.
+    /// Removes the table from the scheduler.
     ~DS1IntervalTable() override;
 
     /// Seconds of the running interval, 0 to 899 (900 when it is about to be closed).
     virtual int GetTimeElapsed();
     /// The number of closed intervals, 0 to 96.
-    /// Deliberate: once the ring is full its oldest entry is cleared for the interval to come, so
-    /// 96 intervals are valid although the last of them reads 0.
+    /// Deliberate: once the ring is full, its oldest entry is cleared for the next interval, so 96
+    /// intervals are valid although the last of them reads 0.
     virtual int GetValidIntervals();
 
-    /// These read interval `n`: 0 is the running one, 1 the one closed last, 96 the oldest. An
-    /// interval that was never closed reads 0. Callers keep `n` within 0 to 96.
+    /// These read interval `n`: 0 is the running interval, 1 the one closed last, 96 the oldest. An
+    /// interval that was never closed reads 0. `n` must be 0 to 96.
     virtual int GetErrorSeconds(int n);
     virtual int GetSeverelyErrorSeconds(int n);
     virtual int GetSeverelyErrorFramingSeconds(int n);
@@ -93,7 +97,7 @@ class KVLOAM_API DS1IntervalTable : public Object, public Schedulable {
     virtual int GetLineErrorSeconds(int n);
     virtual int GetBurstyErrorSeconds(int n);
     virtual int GetLineCodeViolations(int n);
-    /// The concrete table answers these two from the same records.
+    /// The concrete table implements these two from the same records.
     virtual int GetControlledSlipSeconds(int n) = 0;
     virtual int GetDegradedMinutes(int n) = 0;
 
@@ -102,16 +106,16 @@ class KVLOAM_API DS1IntervalTable : public Object, public Schedulable {
     int ScheduledAction() override;
     /// Counts a second into the running interval and adds 1 to the time elapsed.
     virtual int CollectSecond() = 0;
-    /// Hands the running interval to `ArchiveInterval` and begins a new one. The second of this
+    /// Passes the running interval to `ArchiveInterval` and begins a new one. The second of this
     /// call belongs to the new interval.
     virtual int CloseInterval() = 0;
 
   protected:
-    /// The place in the ring of the `n`-th interval back.
+    /// The position in the ring of the `n`-th interval back.
     int GetTrueIndex(int n);
     /// Closes an interval: stores it in the ring and sets the time elapsed to 0. Returns 0.
     int ArchiveInterval(DS1Interval interval);
-    /// The record that the readers read for `n`; null where they have none and answer 0.
+    /// The record that the readers read for `n`; null if there is none and they return 0.
     DS1Interval* interval(int n);
 
     DS1Counter m_timeElapsed;

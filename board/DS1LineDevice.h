@@ -6,8 +6,8 @@
 #include "board/Interface.h"
 #include "core/ReferenceCounter.h"
 
-/// The state of a line: bits of DS1-MIB's dsx1LineStatus (RFC 4805), any of which may be set but
-/// `DS1LineStatusNoAlarm`, which stands alone.
+/// The states of a line: the bits of DS1-MIB's dsx1LineStatus (RFC 4805). Several may be set at
+/// once, except `DS1LineStatusNoAlarm`, which is set alone.
 enum DS1LineStatusEnum : int {
     DS1LineStatusNoAlarm = 1,
     DS1LineStatusRcvFarEndLOF = 2, ///< yellow alarm received
@@ -28,22 +28,23 @@ enum DS1LineStatusEnum : int {
     DS1LineStatusDs2PerfThreshold = 65536
 };
 
-/// A DS1 (T1 or E1) line of a board: the interface queries, then those of DS1-MIB's
-/// dsx1ConfigTable (RFC 4805, in the MIB's units and values). What a line does not know or does not
-/// support answers `KVL::kNotSupported`.
+/// A `DS1LineDevice` is a DS1 (T1 or E1) line of a board: the interface queries, then those of
+/// DS1-MIB's dsx1ConfigTable (RFC 4805), in the MIB's units and values. A query that a line does
+/// not support, or whose answer it does not know, returns `KVL::kNotSupported`. The concrete line
+/// says which queries are thread-safe.
 class KVLOAM_API DS1LineDevice : public KVL::Interface {
   public:
     DS1LineDevice();
     ~DS1LineDevice() override;
 
-    /// Fills `buffer` from `GetPhysAddressString` and sets `length` to its length. Returns 0; 1,
-    /// with length 0, when there is no address.
+    /// Fills `buffer` from `GetPhysAddressString` and sets `length` to its length. Returns 0. If
+    /// there is no address, sets `length` to 0 and returns 1.
     int GetPhysAddress(char* buffer, int& length) override;
 
     /// Writes the terminated name, at most 63 characters. Returns 0.
     virtual int GetName(char* name) = 0;
     virtual int GetLineIndex() = 0;
-    /// The line's performance history; an empty handle when it keeps none.
+    /// The line's performance history; an empty handle if it has none.
     virtual ReferenceCounter<DS1IntervalTable> GetIntervalTable() = 0;
     virtual int GetLineType() = 0;
     virtual int GetLineCoding() = 0;
@@ -59,7 +60,7 @@ class KVLOAM_API DS1LineDevice : public KVL::Interface {
     virtual int GetTransmitClockSource() = 0;
     virtual int GetFdl() = 0;
     virtual int GetLineLength() = 0; ///< metres
-    /// Seconds since the epoch; 0 when the status has not changed yet.
+    /// Seconds since the epoch; 0 if the status has not changed yet.
     virtual long GetLineStatusLastChange() = 0;
     /// 1 enabled, 2 disabled.
     virtual int GetLineStatusChangeTrapEnable() = 0;

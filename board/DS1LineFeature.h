@@ -6,7 +6,7 @@
 #include "board/InterfaceFeature.h"
 #include "core/Event.h"
 
-/// A change of one line's status.
+/// A `DS1LineStatusEvent` is a change of one line's status.
 class KVLOAM_API DS1LineStatusEvent : public Event {
   public:
     DS1LineStatusEvent(DS1LineStatusEnum status, ReferenceCounter<DS1LineDevice> line);
@@ -21,8 +21,8 @@ class KVLOAM_API DS1LineStatusEvent : public Event {
     ReferenceCounter<DS1LineDevice> m_line;
 };
 
-/// Told of line status changes, by features that deliver them, on the thread that notifies. All
-/// listeners of a notification see one event object.
+/// A `DS1LineStatusListener` receives line status changes from features that deliver them, on the
+/// thread that notifies. All listeners of a notification receive the same event object.
 class KVLOAM_API DS1LineStatusListener : public EventListener {
   public:
     /// The result is ignored.
@@ -32,7 +32,8 @@ class KVLOAM_API DS1LineStatusListener : public EventListener {
     ~DS1LineStatusListener() = default;
 };
 
-/// A board's DS1 lines. The concrete feature keeps them and says which threads may walk them.
+/// A `DS1LineFeature` holds a board's DS1 lines. The concrete feature says which threads may walk
+/// them.
 class KVLOAM_API DS1LineFeature : public KVL::InterfaceFeature {
   public:
     DS1LineFeature();
@@ -48,7 +49,7 @@ class KVLOAM_API DS1LineFeature : public KVL::InterfaceFeature {
     virtual ReferenceCounter<DS1LineDevice> GetFirstDevice() = 0;
     virtual ReferenceCounter<DS1LineDevice>
     GetNextDevice(ReferenceCounter<DS1LineDevice> previous) = 0;
-    /// The first line of that name, or an empty handle.
+    /// The first line with this name, or an empty handle.
     virtual ReferenceCounter<DS1LineDevice> Find(char const* name);
 
     static KVL::IID iid() { return KVL::IID("14DS1LineFeature"); }

@@ -6,8 +6,8 @@
 
 namespace KVL {
 
-/// An Ethernet interface: the interface queries, then the statistics of EtherLike-MIB's
-/// dot3StatsTable (RFC 3635). A statistic that is not supported answers `kNotSupported`.
+/// An `Ethernet` is an Ethernet interface: the interface queries, then the statistics of
+/// EtherLike-MIB's dot3StatsTable (RFC 3635). A statistic that is not supported is `kNotSupported`.
 class KVLOAM_API Ethernet : public Interface {
   public:
     Ethernet();

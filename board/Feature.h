@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The named root of all board features.
+// The root class of board features.
 #pragma once
 
 #include "core/Object.h"
@@ -7,11 +7,12 @@
 KVLOAM_API int min(int a, int b);
 KVLOAM_API int max(int a, int b);
 
-/// One capability of a board: a set of lines, a pool of resources, an Ethernet port. Found on its
-/// board by interface identifier.
+/// A `Feature` is one capability of a board: a set of lines, a pool of resources, an Ethernet port.
+/// A board's features are found by interface identifier. The name is unsynchronised: set it before
+/// other threads see the feature.
 class KVLOAM_API Feature : public Object {
   public:
-    /// The longest name that is kept whole.
+    /// The longest name that is not cut.
     static constexpr int kMaxNameLength = 256;
 
     Feature();

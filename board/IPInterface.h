@@ -3,6 +3,7 @@
 #pragma once
 
 #include <array>
+#include <cstddef>
 #include <cstdint>
 
 #include "board/Interface.h"
@@ -10,13 +11,13 @@
 
 namespace KVL {
 
-/// An IPv4 address: four octets, most significant first.
+/// An `IPAddress` is an IPv4 address: four octets, the most significant first. Unsynchronised.
 class KVLOAM_API IPAddress {
   public:
     /// The octets of `address` from its most significant byte down.
     IPAddress(int address);
-    /// Dotted decimal; the text is only read. Deliberate: octets are taken as they are written, 300
-    /// stays 300, and what follows the fourth is ignored. An octet that is missing is 0.
+    /// Dotted decimal; the text is only read. A missing octet is 0. Deliberate: octets are taken as
+    /// they are written (300 stays 300), and anything after the fourth is ignored.
     IPAddress(char* text);
     IPAddress& operator=(int address);
     IPAddress& operator=(char* text);
@@ -34,13 +35,14 @@ class KVLOAM_API IPAddress {
     std::array<std::uint32_t, 4> m_octets{};
 };
 
-/// An address with its mask and broadcast address. Not changed after it was made.
+/// An `IPAddressConfig` is an address with its mask and broadcast address. It never changes, so it
+/// is thread-safe.
 class KVLOAM_API IPAddressConfig : public Object {
   public:
-    /// Three times 0.0.0.0.
+    /// All three addresses are 0.0.0.0.
     IPAddressConfig();
     IPAddressConfig(int address, int mask, int broadcast);
-    /// The address in dotted decimal; mask and broadcast address 0.0.0.0.
+    /// The address in dotted decimal; the mask and the broadcast address are 0.0.0.0.
     IPAddressConfig(char* text);
     ~IPAddressConfig() override;
 
@@ -54,14 +56,15 @@ class KVLOAM_API IPAddressConfig : public Object {
     IPAddress m_broadcast;
 };
 
-/// An IP interface: the interface queries, and its address configurations.
+/// An `IPInterface` is an IP interface: the interface queries and its address configurations.
 class KVLOAM_API IPInterface : public Interface {
   public:
     IPInterface();
     ~IPInterface() override;
 
-    /// The first configuration; the next one after `previous`, or an empty handle. Concrete
-    /// interfaces replace both; here the only configuration is 127.1.1.1, made anew at every call.
+    /// The first configuration, and the one after `previous` or an empty handle. Concrete
+    /// interfaces override both. Here the only configuration is 127.1.1.1, created anew by every
+    /// call.
     virtual ReferenceCounter<IPAddressConfig> GetFirstIPAddressConfig();
     virtual ReferenceCounter<IPAddressConfig>
     GetNextIPAddressConfig(ReferenceCounter<IPAddressConfig> previous);

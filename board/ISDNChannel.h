@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The abstract ISDN channels, and the status changes that are told of them.
+// The abstract ISDN channels and their status changes.
 #pragma once
 
 #include "core/Event.h"
 #include "core/ReferenceCounter.h"
 
-/// The state of a bearer channel: ISDN-MIB's isdnBearerOperStatus (RFC 2127).
+/// The states of a bearer channel: ISDN-MIB's isdnBearerOperStatus (RFC 2127).
 enum ISDNBChannelStatusEnum : int {
     ISDNBChannelStatusIdle = 1,
     ISDNBChannelStatusConnecting = 2,
@@ -13,7 +13,7 @@ enum ISDNBChannelStatusEnum : int {
     ISDNBChannelStatusActive = 4
 };
 
-/// The state of a signalling channel: ISDN-MIB's isdnLapdOperStatus (RFC 2127).
+/// The states of a signalling channel: ISDN-MIB's isdnLapdOperStatus (RFC 2127).
 enum ISDNDChannelStatusEnum : int {
     ISDNDChannelStatusInactive = 1,
     ISDNDChannelStatusL1Active = 2,
@@ -22,7 +22,7 @@ enum ISDNDChannelStatusEnum : int {
 
 class ISDNChannelStatusListener;
 
-/// A bearer channel.
+/// An `ISDNBChannel` is a bearer channel. The concrete class says which operations are thread-safe.
 class KVLOAM_API ISDNBChannel : public Object {
   public:
     ISDNBChannel();
@@ -36,14 +36,15 @@ class KVLOAM_API ISDNBChannel : public Object {
     virtual int GetOperStatus() = 0;
     /// The time slot of the channel in its line, from 1.
     virtual int GetChannelNumber() = 0;
-    /// The index of the channel's board, as its module numbers it; -1 when none has been set.
+    /// The index of the channel's board, as its module numbers boards; -1 until it is set.
     virtual int GetBoardIndex() = 0;
     virtual int SetBoardIndex(int index) = 0;
-    /// The listener hears of this channel alone. It is not owned. Returns 0.
+    /// Adds a listener for this channel only. It is not owned. Returns 0.
     virtual int AddISDNStatusListener(ISDNChannelStatusListener* listener) = 0;
 };
 
-/// A signalling channel.
+/// An `ISDNDChannel` is a signalling channel. The concrete class says which operations are
+/// thread-safe.
 class KVLOAM_API ISDNDChannel : public Object {
   public:
     ISDNDChannel();
@@ -55,17 +56,17 @@ class KVLOAM_API ISDNDChannel : public Object {
     virtual int GetProtocol() = 0;
     /// An `ISDNDChannelStatusEnum`.
     virtual int GetOperStatus() = 0;
-    /// How many bearer channels it signals for.
+    /// The number of bearer channels that it controls.
     virtual int GetBChannelCount() = 0;
     /// Writes a terminated text of at most 255 characters. Returns 0.
     virtual int GetCallingAddress(char* address) = 0;
-    /// As of `ISDNBChannel`.
+    /// As in `ISDNBChannel`.
     virtual int GetBoardIndex() = 0;
     virtual int SetBoardIndex(int index) = 0;
     virtual int AddISDNStatusListener(ISDNChannelStatusListener* listener) = 0;
 };
 
-/// A status change of a bearer channel, which lives at least as long as the event.
+/// An `ISDNBChannelStatusEvent` is a status change of a bearer channel. It keeps the channel alive.
 class KVLOAM_API ISDNBChannelStatusEvent : public Event {
   public:
     ISDNBChannelStatusEvent(ISDNBChannelStatusEnum status, ReferenceCounter<ISDNBChannel> channel);
@@ -79,7 +80,8 @@ class KVLOAM_API ISDNBChannelStatusEvent : public Event {
     ReferenceCounter<ISDNBChannel> m_channel;
 };
 
-/// A status change of a signalling channel, which lives at least as long as the event.
+/// An `ISDNDChannelStatusEvent` is a status change of a signalling channel. It keeps the channel
+/// alive.
 class KVLOAM_API ISDNDChannelStatusEvent : public Event {
   public:
     ISDNDChannelStatusEvent(ISDNDChannelStatusEnum status, ReferenceCounter<ISDNDChannel> channel);
@@ -93,8 +95,9 @@ class KVLOAM_API ISDNDChannelStatusEvent : public Event {
     ReferenceCounter<ISDNDChannel> m_channel;
 };
 
-/// Told of channel status changes, of both kinds, on the thread that notifies. All listeners of a
-/// notification see one event object; one that keeps its handle keeps the event.
+/// An `ISDNChannelStatusListener` receives status changes of both kinds of channels, on the thread
+/// that notifies. All listeners of a notification receive the same event object; a listener that
+/// keeps the handle keeps the event.
 class KVLOAM_API ISDNChannelStatusListener : public EventListener {
   public:
     /// The results are ignored.

@@ -5,18 +5,18 @@
 #include "board/Feature.h"
 #include "board/ISDNChannel.h"
 
-/// A board's bearer and signalling channels. The concrete feature keeps them and says which threads
-/// may walk them.
+/// An `ISDNFeature` holds a board's bearer and signalling channels. The concrete feature says which
+/// threads may walk them.
 class KVLOAM_API ISDNFeature : public Feature {
   public:
     ISDNFeature();
     ~ISDNFeature() override;
 
-    /// The listener hears of all channels. It is not owned.
+    /// Adds a listener for all channels. It is not owned.
     virtual int AddISDNStatusListener(ISDNChannelStatusListener* listener) = 0;
 
-    // A channel walk ends with an empty handle. The argument of `GetFirstChannel` only chooses the
-    // kind of channel.
+    // A walk ends with an empty handle. The argument of `GetFirstChannel` only selects the kind of
+    // channel.
     virtual ReferenceCounter<ISDNBChannel> GetFirstChannel(ReferenceCounter<ISDNBChannel> kind) = 0;
     virtual ReferenceCounter<ISDNBChannel> GetFirstBChannel();
     virtual ReferenceCounter<ISDNBChannel>
@@ -28,7 +28,7 @@ class KVLOAM_API ISDNFeature : public Feature {
     GetNextChannel(ReferenceCounter<ISDNDChannel> previous) = 0;
     virtual ReferenceCounter<ISDNDChannel> GetNextDChannel(ReferenceCounter<ISDNDChannel> previous);
 
-    /// The first bearer channel of that name, or an empty handle.
+    /// The first bearer channel with this name, or an empty handle.
     ReferenceCounter<ISDNBChannel> FindBChannel(char const* name);
 
     static KVL::IID iid() { return KVL::IID("11ISDNFeature"); }

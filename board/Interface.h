@@ -9,12 +9,13 @@
 
 namespace KVL {
 
-/// What a query answers that an interface does not support.
+/// The result of a query that an interface does not support.
 inline constexpr int kNotSupported = -2;
 
-/// A network interface, with the queries of the interfaces group (RFC 1213, section 3.5; the values
-/// are those of IF-MIB). Every query has a body that answers `kNotSupported` and leaves its
-/// arguments untouched; a concrete class calls it for what it does not support.
+/// An `Interface` is a network interface with the queries of the interfaces group (RFC 1213,
+/// section 3.5; the values are those of IF-MIB). Every query has a body that returns
+/// `kNotSupported` and leaves its arguments alone; a concrete class calls it for a query that it
+/// does not support. The concrete class says which queries are thread-safe.
 class KVLOAM_API Interface : public virtual Object {
   public:
     Interface();
@@ -29,7 +30,7 @@ class KVLOAM_API Interface : public virtual Object {
     virtual int GetAdminStatus() = 0;
     virtual int SetAdminStatus(int status) = 0;
     virtual int GetOperStatus() = 0;
-    /// When the interface entered its present state: seconds and microseconds.
+    /// The time at which the interface entered its present state: seconds and microseconds.
     virtual int GetLastChange(int& seconds, int& microseconds) = 0;
     virtual int GetInOctets() = 0;
     virtual int GetInUcastPkts() = 0;

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The board platform's ISDN channels: what a trunk's attributes answer, and what is announced.
+// The board platform's ISDN channels: the attributes of a trunk, and the announced changes.
 #pragma once
 
 #include <cstddef>
@@ -28,7 +28,8 @@ enum class ISDNSignallingState : std::int32_t {
 inline constexpr std::uint32_t kISDNBearerChanged = 0x50001;
 inline constexpr std::uint32_t kISDNSignallingChanged = 0x50002;
 
-/// What a channel has become. The layout is the platform's; words are little-endian.
+/// An `ISDNChannelMsg` is the new state of a channel. The layout is the platform's; words are
+/// little-endian.
 struct ISDNChannelMsg {
     std::int32_t board;   ///< handle
     std::int32_t device;  ///< handle

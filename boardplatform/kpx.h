@@ -7,9 +7,10 @@
 
 #pragma GCC visibility push(default)
 
-/// One process's statistics. The layout is the platform's; counters are in host byte order.
+/// A `tag_KPXSTATISTICS` holds one process's statistics. The layout is the platform's; counters are
+/// in host byte order.
 struct tag_KPXSTATISTICS {
-    char name[32]; ///< not terminated when it fills the field
+    char name[32]; ///< not terminated if it fills the field
     std::int32_t reserved1;
     std::int32_t reserved2;
     std::int32_t numberOfOpens;
@@ -27,9 +28,9 @@ static_assert(offsetof(tag_KPXSTATISTICS, numberOfHandlers) == 64);
 
 extern "C" {
 
-/// Fills up to `max` process ids and returns how many.
+/// Fills `pids` with at most `max` process ids and returns how many.
 int _kp_getpids(int* pids, int max);
-/// Returns -1 when the process is not known.
+/// Returns -1 if the process is not known.
 int _kp_getstatsbypid(int pid, tag_KPXSTATISTICS* record);
 }
 

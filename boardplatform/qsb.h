@@ -1,8 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The board platform's attribute storage library: typed records below one root record.
 //
-// The storage is found through the environment variable VQRXCFGPATH. All calls belong to one
-// thread.
+// The environment variable VQRXCFGPATH names the storage. Thread-bound: one thread makes all calls.
 #pragma once
 
 #pragma GCC visibility push(default)
@@ -26,8 +25,8 @@ inline constexpr int kQSBTypeNameSize = 255;
 
 extern "C" {
 
-/// Opens the storage; fills the root record's type name (a buffer of `kQSBTypeNameSize`) and
-/// instance. Every call answers a `QSBResult`.
+/// Opens the storage and fills in the root record's type name (a buffer of `kQSBTypeNameSize`) and
+/// instance. Every call returns a `QSBResult`.
 int QSBOpenStorage(char* rootType, int* rootInstance);
 /// The first record of `type` under the given parent.
 int QSBGetFirstInstance(char const* type, char const* parentType, int parentInstance,

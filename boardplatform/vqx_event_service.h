@@ -7,7 +7,8 @@
 
 #pragma GCC visibility push(default)
 
-/// One delivered message. The layout is the platform's; words are little-endian.
+/// An `AdminCallbackMsg` is one delivered message. The layout is the platform's; words are
+/// little-endian.
 struct AdminCallbackMsg {
     std::uint32_t id;
     unsigned char reserved[12];
@@ -19,8 +20,9 @@ static_assert(sizeof(AdminCallbackMsg) == 16 + sizeof(void*));
 
 namespace VqxEventService {
 
-/// Callback base. `HandleEvent` runs on the event service's delivery thread, one message at a time;
-/// the message and its payload live only during the call.
+/// A `CEventHandlerAdaptor` receives messages. `HandleEvent` is called on the event service's
+/// delivery thread, for one message at a time; the message and its payload live only during the
+/// call.
 class CEventHandlerAdaptor {
   public:
     virtual int HandleEvent(AdminCallbackMsg* message, void* context) = 0;
@@ -31,7 +33,7 @@ class CEventHandlerAdaptor {
 
 namespace AdminConsumer {
 
-/// One subscription: which message goes to which handler.
+/// A `FilterCallbackAssoc` is one subscription: which message goes to which handler.
 struct FilterCallbackAssoc {
     CEventHandlerAdaptor* handler;
     void* context;
@@ -46,8 +48,8 @@ static_assert(sizeof(FilterCallbackAssoc) == 2 * sizeof(void*) + 8);
 
 } // namespace AdminConsumer
 
-/// A consumer of one channel. Messages are delivered from `Start()` on until the consumer is
-/// destroyed; the destructor waits for a delivery under way on another thread.
+/// A `VqxAdminConsumer` is a consumer of one channel. It receives messages from `Start()` until it
+/// is destroyed; the destructor waits for a delivery under way on another thread.
 class VqxAdminConsumer {
   public:
     VqxAdminConsumer(char const* channel, wchar_t const* consumer,

@@ -39,12 +39,12 @@ class KVLOAM_API ActionScheduler : public Runnable {
     ActionScheduler(ActionScheduler const&) = delete;
     ActionScheduler& operator=(ActionScheduler const&) = delete;
 
-    /// Takes `target` off the list; on return no action of it runs. Returns 0, or 1 when it is not
-    /// on the list.
+    /// Removes `target` from the list and waits for an action of it under way. Returns 0, or 1 if
+    /// it is not on the list.
     virtual int Remove(Schedulable* target) = 0;
-    /// Gives a periodic entry another period and moves its next call by the difference. Returns 0;
-    /// 1, changing nothing, when `target` is not on the list, is called only once, or has that
-    /// period. A period of 0 or less makes the next call the last.
+    /// Gives a periodic entry another period and moves its next call by the difference. Returns 0.
+    /// Changes nothing and returns 1 if `target` is not on the list, is a one-time entry, or has
+    /// that period already. A period of 0 or less makes the next call the last.
     virtual int ChangePeriod(Schedulable* target, long period) = 0;
 
   protected:
@@ -55,8 +55,8 @@ class KVLOAM_API ActionScheduler : public Runnable {
 
     // From here on: the list's lock is held.
 
-    /// Enters `target`, due in `period` seconds from now, or at `when` where the period is 0 or
-    /// less. Returns 0.
+    /// Enters `target`, due in `period` seconds from now, or at `when` if the period is 0 or less.
+    /// Requires that it is not on the list. Returns 0.
     virtual int put_item_on_list(Schedulable* target, long period, long when) = 0;
     /// Does nothing and returns 0.
     virtual int remove_item_from_list(SchedItem* item) = 0;
@@ -65,10 +65,10 @@ class KVLOAM_API ActionScheduler : public Runnable {
 
   public:
     /// Calls `target` every `period` seconds, first `period` seconds from now; with a period of 0
-    /// or less once, at once. Returns 0; 1, changing nothing, when `target` is on the list already.
+    /// or less once, at once. Returns 0. Changes nothing and returns 1 if `target` is on the list.
     int AddPeriodic(Schedulable* target, long period);
-    /// Calls `target` once, at `when`, in seconds since the epoch (not from now): a time that has
-    /// passed means at once. Returns 0; 1, changing nothing, when `target` is on the list already.
+    /// Calls `target` once, at `when`, in seconds since the epoch (not from now). A time that has
+    /// passed means at once. Returns 0. Changes nothing and returns 1 if `target` is on the list.
     int AddOneTimeAction(Schedulable* target, long when);
 
   protected:

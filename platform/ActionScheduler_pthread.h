@@ -29,23 +29,24 @@ class KVLOAM_API ActionScheduler_pthread : public ActionScheduler, public KVLThr
   protected:
     using Clock = long (*)();
 
-    /// The whole seconds of the system's clock: the clock of the timed wait, so that the loop never
-    /// takes a wake-up at its deadline for an early one, as it would by `time()`, which may lag.
+    /// The whole seconds of the system's clock. The timed wait uses the same clock; `time()` may
+    /// lag behind it, and the loop would then take a wake-up at its deadline for an early one.
     static long now();
 
-    /// Starts the thread and returns when it runs.
+    /// Starts the thread and waits until it runs; does not wait if the system refuses it.
     ActionScheduler_pthread();
-    /// A scheduler without a thread, whose owner drives it by `run_pass`, and whose now is what
-    /// `clock` answers.
+    /// Makes a scheduler without a thread. Its owner drives it by `run_pass`; `clock` returns the
+    /// time.
     explicit ActionScheduler_pthread(Clock clock);
 
     int put_item_on_list(Schedulable* target, long period, long when) override;
     int remove_item_from_list(SchedItem* item) override;
-    /// These two print an error of the mutex on standard output and go on. They return 0.
+    /// Lock and unlock the list. Both return 0; they print an error of the mutex on standard output
+    /// and carry on.
     int lock_list() override;
     int unlock_list() override;
 
-    /// Null until the first `GetScheduler`. A driven scheduler may put itself here before that.
+    /// Null until the first `GetScheduler`. A driven scheduler may set itself here before that.
     static ActionScheduler_pthread* s_actionScheduler;
 
   private:

@@ -4,26 +4,28 @@
 
 #include "platform/Export.h"
 
-/// A wait takes the form `grab(0)`, check of the caller's predicate, `wait(n)`, `release()`.
-/// All operations may be called from any thread.
+/// A `KVLConditionVariable` is a condition variable with its own mutex. To wait, a caller calls
+/// `grab(0)`, checks its predicate, calls `wait(n)`, checks again, and calls `release()`.
+/// Thread-safe.
 class KVLOAM_API KVLConditionVariable {
   public:
-    /// Thrown by `wait` when its time is up; the internal mutex is held, so the catcher releases
-    /// it.
+    /// Thrown by `wait` when its time is up. The internal mutex is held then; the catcher must call
+    /// `release`.
     class KVLOAM_API WaitTimedOutException {};
 
     /// Locks the internal mutex. The argument is ignored.
     virtual void grab(int reserved) = 0;
     /// Unlocks the internal mutex.
     virtual void release() = 0;
-    /// Waits for a notification; requires that the caller has called `grab`. `seconds` below 1:
-    /// with no limit. May return without a notification: the caller checks its predicate again.
-    /// Deliberate: the limit is cut to a whole second of the clock, so the wait is up to one second
-    /// shorter than asked; periodic callers stay aligned to whole seconds that way.
+    /// Waits for a notification, for at most `seconds`; without a limit if `seconds` is below 1.
+    /// Requires that the caller has called `grab`. May return without a notification: the caller
+    /// checks its predicate again.
+    /// Deliberate: the wait ends at a whole second of the clock, up to one second earlier than
+    /// asked, so that periodic callers stay aligned to whole seconds.
     virtual void wait(int seconds) = 0;
     /// Wakes one waiter. Takes the internal mutex: never call it between `grab` and `release`.
     virtual void notify() = 0;
-    /// Wakes all waiters; otherwise as `notify`.
+    /// Wakes all waiters. Otherwise like `notify`.
     virtual void notify_all() = 0;
     virtual ~KVLConditionVariable() = default;
 };

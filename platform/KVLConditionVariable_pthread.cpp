@@ -32,8 +32,7 @@ void KVLConditionVariable_pthread::wait(int seconds) {
     }
     timeval now{};
     gettimeofday(&now, nullptr);
-    // Where time_t has 32 bits the sum could wrap into the past: it stays at the last second
-    // instead.
+    // A 32-bit time_t could wrap into the past: the deadline is its last second at most.
     auto const latest = std::numeric_limits<std::time_t>::max();
     timespec deadline{};
     deadline.tv_sec = now.tv_sec > latest - seconds ? latest : now.tv_sec + seconds;

@@ -1,11 +1,12 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The one concrete condition variable, over POSIX.
+// The one concrete condition variable, a POSIX one.
 #pragma once
 
 #include <pthread.h>
 
 #include "platform/KVLConditionVariable.h"
 
+/// A `KVLConditionVariable_pthread` is a POSIX condition variable with its mutex.
 class KVLOAM_API KVLConditionVariable_pthread : public KVLConditionVariable {
   public:
     KVLConditionVariable_pthread();

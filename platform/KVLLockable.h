@@ -1,11 +1,11 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A lock, as every managed object may carry one.
+// The abstract lock of managed objects.
 #pragma once
 
 #include "platform/Export.h"
 
-/// A mutex behind an abstract face. All operations may be called from any thread and answer a lock
-/// code (`KVLLockCode`).
+/// A `KVLLockable` is an abstract mutex. Its operations are thread-safe and return a
+/// `KVLLockCode`.
 class KVLOAM_API KVLLockable {
   public:
     virtual ~KVLLockable() = default;
@@ -16,12 +16,12 @@ class KVLOAM_API KVLLockable {
     virtual int GetError(int result) = 0;
 };
 
-/// What the lock operations answer.
+/// The results of the lock operations.
 enum KVLLockCode : int {
     KVLLockOk = 0,
     KVLLockBusy = 1,           ///< held by another thread
     KVLLockDeadlock = 2,       ///< already held by this thread, and not recursive
     KVLLockNotInitialized = 3, ///< not a usable mutex
     KVLLockNotOwner = 4,       ///< unlocked by a thread that does not hold it
-    KVLLockUnknown = 99        ///< anything else; also: an object without a lock
+    KVLLockUnknown = 99        ///< anything else, also an object without a lock
 };

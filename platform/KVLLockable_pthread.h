@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The one concrete lock, over a POSIX mutex.
+// The one concrete lock, a POSIX mutex.
 #pragma once
 
 #include <pthread.h>
@@ -8,14 +8,14 @@
 
 #include "platform/KVLLockable.h"
 
-/// The kinds of mutex. Any other value leaves the mutex's kind at the system's default.
+/// The kinds of mutex. Any other value means the system's default kind.
 enum LockType : int {
     ErrorCheckLock = 0,
-    RecursiveLock = 1, ///< what every object lock of the library is
+    RecursiveLock = 1, ///< the kind of every object lock of the library
     NormalLock = 2
 };
 
-/// A POSIX mutex. Must not be held when it is destroyed.
+/// A `KVLLockable_pthread` is a POSIX mutex. It must not be held when it is destroyed.
 class KVLOAM_API KVLLockable_pthread : public KVLLockable {
   public:
     explicit KVLLockable_pthread(LockType type);
@@ -26,13 +26,13 @@ class KVLOAM_API KVLLockable_pthread : public KVLLockable {
     int lock() override;
     int trylock() override;
     int unlock() override;
-    /// `result`: what a `pthread_mutex_...` call returned. Answers a `KVLLockCode`.
+    /// Maps `result`, the result of a `pthread_mutex_...` call, to a `KVLLockCode`.
     int GetError(int result) override;
 
-    /// The text that belongs to a result, for diagnostics; empty for 0.
+    /// A text for a result, for diagnostics; empty for 0.
     static std::string GetErrorText(int result);
 
-    /// The mutex itself, for code that hands it to a POSIX call.
+    /// The mutex itself, for POSIX calls.
     pthread_mutex_t* get_impl_mutex() { return &m_mutex; }
 
   private:

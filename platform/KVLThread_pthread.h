@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The one concrete thread, over POSIX: detached, ended only by its body.
+// The one concrete thread, a detached POSIX thread.
 #pragma once
 
 #include <pthread.h>

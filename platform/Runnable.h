@@ -4,8 +4,10 @@
 
 #include "platform/Export.h"
 
+/// A `Runnable` is the body of a thread.
 class KVLOAM_API Runnable {
   public:
+    /// Called on the thread, which ends when this returns.
     virtual void Run() = 0;
 
   protected:

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Texts of a record, copied under the record's lock.
+// Copies texts of a record under the record's lock.
 #pragma once
 
 #include <cstring>
@@ -9,7 +9,7 @@
 
 namespace KVL {
 
-/// Copies `text` with its terminator; the buffer's size is the caller's affair.
+/// Copies `text` with its terminator. The caller's buffer must be large enough.
 inline void copy_text(Object& record, std::string const& text, char* buffer) {
     ObjectGuard const guard(record);
     std::memcpy(buffer, text.c_str(), text.size() + 1);

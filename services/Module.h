@@ -1,21 +1,21 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// One loaded software module.
+// The record of a loaded module.
 #pragma once
 
 #include <string>
 
 #include "core/Object.h"
 
-/// A module's record. The getters that take a `char*` copy the whole text with its terminator,
-/// without a length limit: the caller's buffer holds it. A record may be read and written by
-/// several threads.
+/// A `Module` is the record of a loaded module. The getters that take a `char*` copy the whole text
+/// with its terminator, without a length limit; the caller's buffer must be large enough.
+/// Thread-safe.
 class KVLOAM_API Module : public Object {
   public:
     /// Version "0.0", purpose "Unknown", dated now.
     explicit Module(std::string name);
     ~Module() override;
 
-    /// When the module was loaded: seconds since the epoch.
+    /// The time at which the module was loaded, in seconds since the epoch.
     long GetModuleDate();
     void SetModuleDate(long date);
     void GetModuleName(char* name);

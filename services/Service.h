@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// One system service, and those who listen to services.
+// The record of a system service, and service listeners.
 #pragma once
 
 #include <string>
@@ -8,23 +8,23 @@
 #include "core/ListenerTable.h"
 #include "core/ReferenceCounter.h"
 
-/// A service's record. The getters that take a `char*` copy the whole text with its terminator,
-/// without a length limit: the caller's buffer holds it. A record may be read and written by
-/// several threads.
+/// A `Service` is the record of a system service. The getters that take a `char*` copy the whole
+/// text with its terminator, without a length limit; the caller's buffer must be large enough.
+/// Thread-safe.
 class KVLOAM_API Service : public Object {
   public:
-    /// Known by `name` to the host's service control as well. Status and change date are 0.
+    /// `name` is also the service control's name of the service. Status and change date are 0.
     explicit Service(std::string name);
     ~Service() override;
 
-    /// When the status changed last: seconds since the epoch.
+    /// The time of the last status change, in seconds since the epoch.
     long GetServiceChangeDate();
-    /// Dates the last change now.
+    /// Sets the time of the last status change to now.
     void SetServiceChangeDate();
     void GetServiceName(char* name);
-    /// The name under which the host's service control knows the service.
+    /// The host's service control's name of the service.
     void GetServiceScmName(char* name);
-    /// Leaves the service control's name as it is.
+    /// Does not change the service control's name.
     void SetServiceName(char* name);
     void SetServiceScmName(char* name);
     int GetServiceStatus();
@@ -41,13 +41,14 @@ class KVLOAM_API Service : public Object {
     long m_changeDate = 0;
 };
 
-/// Tells of a service's status.
+/// A `ServiceStatusEvent` announces a change of a service's status.
 class KVLOAM_API ServiceStatusEvent : public Event {
   public:
     ServiceStatusEvent();
     ~ServiceStatusEvent() override;
 };
 
+/// A `ServiceStatusListener` receives changes of service statuses, on the thread that notifies.
 class KVLOAM_API ServiceStatusListener : public EventListener {
   public:
     /// The result is ignored.

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The system's modules and services.
+// The records of the system's modules and services.
 #pragma once
 
 #include <atomic>
@@ -8,27 +8,27 @@
 #include "services/Module.h"
 #include "services/Service.h"
 
-/// Keeps the records of modules and services, walked by index, and the status of the board
-/// platform's own service. Indices count from 1; 0 ends a walk.
+/// The `ServiceManager` keeps the records of modules and services, walked by index, and the status
+/// of the board platform's own service. Indices start at 1; 0 ends a walk.
 ///
-/// The first `GetInstance()` must return before several threads use the manager; then all
-/// operations may be called from any thread. Its lock is never held during a callback.
+/// Thread-safe once the first `GetInstance()` has returned. Its lock is never held during a
+/// callback.
 class KVLOAM_API ServiceManager : public Object, public ServiceStatusListener {
   public:
-    /// The longest name that `AddModule` takes.
+    /// The longest name that `AddModule` does not cut.
     static constexpr int kMaxModuleNameLength = 230;
 
-    /// The single instance, made by the first call and never destroyed.
+    /// The single instance, created by the first call and never destroyed.
     static ServiceManager* GetInstance();
 
     ~ServiceManager() override;
-    /// These two do nothing here; a variant for another platform fills the tables in them.
+    /// These two do nothing here. A variant for another platform fills the tables in them.
     virtual void InitializeModules();
     virtual void InitializeServices();
-    /// Enters the module of the library `<name>kvl` with today's date, version "5.2" and a purpose
-    /// that names it. A longer name than `kMaxModuleNameLength` is cut.
+    /// Enters the module of the library `<name>kvl` with the present time, version "5.2" and a
+    /// purpose that names it. A name longer than `kMaxModuleNameLength` is cut.
     virtual void AddModule(char const* name);
-    /// An empty handle when there is none.
+    /// An empty handle if there is none.
     virtual ReferenceCounter<Module> GetFirstModule();
     virtual ReferenceCounter<Module> GetNextModule(int index);
     virtual ReferenceCounter<Module> GetNextModule(ReferenceCounter<Module> module);
@@ -45,16 +45,16 @@ class KVLOAM_API ServiceManager : public Object, public ServiceStatusListener {
     virtual int GetFirstServiceIndex();
     virtual int GetIndexByService(ReferenceCounter<Service> service);
     virtual int GetNextServiceIndex(int index);
-    /// The board platform's service; the setters tell nobody.
+    /// The board platform's service. The setters notify no listener.
     virtual long GetVelquorServiceChangeDate();
     virtual int GetVelquorServiceStatus();
     virtual void SetVelquorServiceChangeDate(long date);
     virtual void SetVelquorServiceStatus(int status);
     /// Adds `listener`, once. Returns 0. The listener is not owned.
     virtual int AddServiceStatusListener(ServiceStatusListener* listener);
-    /// Hands `event` to every listener. Returns 0.
+    /// Passes `event` to every listener. Returns 0.
     int ProcessServiceStatusEvent(ReferenceCounter<ServiceStatusEvent> event) override;
-    /// Does nothing here; returns 0.
+    /// Does nothing here and returns 0.
     virtual int NotifyServiceStatusListeners(int status);
 
     /// These two do nothing and return 1.

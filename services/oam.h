@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Identifies the library without its classes. Also for programs in C.
+// Identifies the library. Needs none of its classes; also for programs in C.
 #pragma once
 
 #include "platform/Export.h"

@@ -7,29 +7,29 @@
 #include "board/DS1LineFeature.h"
 #include "core/ListenerTable.h"
 
-/// Keeps the lines in a vector, which the concrete feature fills before it publishes itself and
-/// leaves alone afterwards; any thread may then walk it. Listeners are kept and walked under the
-/// feature's own lock.
+/// A `DS1LineFeatureZ7` holds the DS1 lines of a Z7 board. The concrete feature fills the vector of
+/// lines before other threads see the feature and does not change it afterwards. Thread-safe from
+/// then on; the feature's own lock guards the listeners.
 class KVLOAM_API DS1LineFeatureZ7 : public DS1LineFeature {
   public:
     DS1LineFeatureZ7();
     ~DS1LineFeatureZ7() override;
 
-    /// Returns 0, also for a listener that was added before.
+    /// Returns 0, also if the listener was added before.
     int AddLineStatusListener(DS1LineStatusListener* listener) override;
     ReferenceCounter<DS1LineDevice> GetFirstDevice() override;
-    /// An empty handle too when `previous` is no line of this feature.
+    /// The line after `previous`; an empty handle if there is none or `previous` is not a line of
+    /// this feature.
     ReferenceCounter<DS1LineDevice>
     GetNextDevice(ReferenceCounter<DS1LineDevice> previous) override;
 
-    /// The first line of that name, or an empty handle. The name is only read.
+    /// The first line with this name, or an empty handle. The name is only read.
     virtual ReferenceCounter<DS1LineDevice> Get(char* name);
-    /// Deliberate: goes past all lines and answers an empty handle for every index. Lines are found
-    /// by name, or walked.
+    /// Deliberate: returns an empty handle for every index. Lines are found by name or by a walk.
     virtual ReferenceCounter<DS1LineDevice> Get(long index);
     virtual int GetNumberOfLines() = 0;
-    /// Deliberate: tells nobody and returns 0. A concrete feature that delivers line statuses
-    /// overrides it.
+    /// Deliberate: notifies no listener and returns 0. A concrete feature that delivers line status
+    /// changes overrides it.
     virtual int NotifyLineStatusListeners(ReferenceCounter<DS1LineDevice> line,
                                           DS1LineStatusEnum status);
 

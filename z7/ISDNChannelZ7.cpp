@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "z7/ISDNChannelZ7.h"
 
+#include <cstddef>
 #include <cstring>
 #include <utility>
 

@@ -7,8 +7,8 @@
 #include "board/ISDNChannel.h"
 #include "core/ListenerTable.h"
 
-/// A bearer channel with a name, a board index and listeners of its own, which are kept and walked
-/// under the channel's lock.
+/// An `ISDNBChannelZ7` is a bearer channel with a name, a board index and listeners of its own.
+/// Thread-safe; the channel's lock guards the listeners.
 class KVLOAM_API ISDNBChannelZ7 : public virtual ISDNBChannel {
   public:
     static constexpr int kMaxNameLength = 11;
@@ -22,8 +22,8 @@ class KVLOAM_API ISDNBChannelZ7 : public virtual ISDNBChannel {
     int SetBoardIndex(int index) override;
     int AddISDNStatusListener(ISDNChannelStatusListener* listener) override;
 
-    /// Hands one event of `channel`, a handle of this channel, to its own listeners, on the
-    /// caller's thread. Returns 0.
+    /// Passes one event of `channel`, a handle of this channel, to the channel's own listeners, on
+    /// the caller's thread. Returns 0.
     int NotifyBChannelStatusListeners(ReferenceCounter<ISDNBChannel> channel,
                                       ISDNBChannelStatusEnum status);
 
@@ -33,8 +33,8 @@ class KVLOAM_API ISDNBChannelZ7 : public virtual ISDNBChannel {
     std::atomic<int> m_boardIndex{-1};
 };
 
-/// A signalling channel, otherwise like the bearer channel.
-/// Deliberate: its base is not virtual, unlike the bearer channel's; modules are built on either.
+/// An `ISDNDChannelZ7` is a signalling channel, otherwise like the bearer channel.
+/// Deliberate: its base is not virtual, unlike the bearer channel's; modules depend on both.
 class KVLOAM_API ISDNDChannelZ7 : public ISDNDChannel {
   public:
     static constexpr int kMaxNameLength = 7;
@@ -48,7 +48,7 @@ class KVLOAM_API ISDNDChannelZ7 : public ISDNDChannel {
     int SetBoardIndex(int index) override;
     int AddISDNStatusListener(ISDNChannelStatusListener* listener) override;
 
-    /// As of `ISDNBChannelZ7`.
+    /// As in `ISDNBChannelZ7`.
     int NotifyDChannelStatusListeners(ReferenceCounter<ISDNDChannel> channel,
                                       ISDNDChannelStatusEnum status);
 
@@ -60,8 +60,8 @@ class KVLOAM_API ISDNDChannelZ7 : public ISDNDChannel {
 
 namespace KVL {
 
-/// Makes the one event of a notification and hands it to every ISDN channel status listener of
-/// `listeners`, in order. `guard` as in `for_each_listener`.
+/// Creates one event and passes it to every ISDN channel status listener of `listeners`, in order.
+/// `guard` as in `for_each_listener`.
 void notify_channel_status(ListenerTable& listeners, Object* guard,
                            ReferenceCounter<ISDNBChannel>&& channel, ISDNBChannelStatusEnum status);
 void notify_channel_status(ListenerTable& listeners, Object* guard,

@@ -7,32 +7,32 @@
 #include "board/ISDNFeature.h"
 #include "core/ListenerTable.h"
 
-/// Keeps the channels in two vectors, which the board module fills before it publishes the feature
-/// and leaves alone afterwards; any thread may then walk them. Listeners are kept and walked under
-/// the feature's own lock.
+/// An `ISDNFeatureZ7` holds the ISDN channels of a Z7 board. The board module fills the two vectors
+/// of channels before other threads see the feature and does not change them afterwards.
+/// Thread-safe from then on; the feature's own lock guards the listeners.
 class KVLOAM_API ISDNFeatureZ7 : public ISDNFeature {
   public:
     ISDNFeatureZ7();
     ~ISDNFeatureZ7() override;
 
-    /// Returns 0, also for a listener that was added before.
+    /// Returns 0, also if the listener was added before.
     int AddISDNStatusListener(ISDNChannelStatusListener* listener) override;
     ReferenceCounter<ISDNBChannel> GetFirstChannel(ReferenceCounter<ISDNBChannel> kind) override;
     ReferenceCounter<ISDNBChannel> GetNextChannel(ReferenceCounter<ISDNBChannel> previous) override;
     ReferenceCounter<ISDNDChannel> GetFirstChannel(ReferenceCounter<ISDNDChannel> kind) override;
     ReferenceCounter<ISDNDChannel> GetNextChannel(ReferenceCounter<ISDNDChannel> previous) override;
 
-    /// The first channel of that name, or an empty handle. The name is only read.
+    /// The first channel with this name, or an empty handle. The name is only read.
     virtual ReferenceCounter<ISDNBChannel> GetBChannel(char* name);
-    /// Deliberate: goes past all channels and answers an empty handle for every index. Channels are
-    /// found by name, or walked.
+    /// Deliberate: returns an empty handle for every index. Channels are found by name or by a
+    /// walk.
     virtual ReferenceCounter<ISDNBChannel> GetBChannel(long index);
     /// As for bearer channels.
     virtual ReferenceCounter<ISDNDChannel> GetDChannel(char* name);
     virtual ReferenceCounter<ISDNDChannel> GetDChannel(long index);
 
-    /// Each hands one event of `channel` to the feature's listeners, on the caller's thread.
-    /// Returns 0. The listeners of the channel itself are the channel's to notify.
+    /// Each passes one event of `channel` to the feature's listeners, on the caller's thread, and
+    /// returns 0. The channel itself notifies its own listeners.
     virtual int NotifyBChannelStatusListeners(ReferenceCounter<ISDNBChannel> channel,
                                               ISDNBChannelStatusEnum status);
     virtual int NotifyDChannelStatusListeners(ReferenceCounter<ISDNDChannel> channel,

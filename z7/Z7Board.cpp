@@ -3,7 +3,6 @@
 
 #include <cstring>
 #include <ctime>
-#include <utility>
 
 namespace {
 
@@ -11,7 +10,7 @@ std::shared_ptr<DevMapBoardIf> readRecord(long id) {
     return std::make_shared<DevMapBoardIf>(id);
 }
 
-/// Copies `text` with its terminator; the buffer's size is the caller's affair.
+/// Copies `text` with its terminator. The caller's buffer must be large enough.
 int copyText(std::string const& text, char* buffer) {
     std::memcpy(buffer, text.c_str(), text.size() + 1);
     return 0;
@@ -131,13 +130,13 @@ int Z7Board::ProcessExternalEvent(BoardStatusEnum status) {
     default:
         break;
     }
-    // Concrete boards may count on being asked for their status after the change.
+    // Asked after the change: concrete boards rely on it.
     GetStatus();
     return -1;
 }
 
 void Z7Board::start(BoardStatusEnum status, BoardStatusEnum secondary, long now) {
-    // The new record is complete before readers see it; the old one goes with its last reader.
+    // The new record is complete before readers see it. The last reader of the old one drops it.
     std::shared_ptr<DevMapBoardIf const> record = readRecord(m_boardIdentifier);
     {
         std::scoped_lock const guard(m_mutex);

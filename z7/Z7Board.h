@@ -10,13 +10,13 @@
 #include "access/DevMapBoardIf.h"
 #include "board/Board.h"
 
-/// A board that the device mapper knows: answers its hardware queries from its device mapper
-/// record, and turns status values into state changes and notifications. Concrete boards add the
-/// remaining queries and the work of starting, stopping and pinging.
+/// A `Z7Board` is a board that the device mapper knows. It answers the hardware queries from its
+/// device mapper record, and turns status values into state changes and notifications. Concrete
+/// boards add the remaining queries and the work of starting, stopping and pinging.
 ///
-/// All queries may be called from any thread while the board starts and stops on another; none
-/// waits for the platform. `ProcessExternalEvent` takes no lock: concrete boards whose `PingBoard`
-/// changes their status guard against the delivery thread themselves.
+/// The queries are thread-safe, also while the board starts or stops, and none waits for the
+/// platform. `ProcessExternalEvent` takes no lock: a concrete board whose `PingBoard` changes the
+/// status must itself keep the ping thread and the delivery thread apart.
 class KVLOAM_API Z7Board : public Board {
   public:
     /// `id`: the board's handle in the device mapper.
@@ -32,24 +32,24 @@ class KVLOAM_API Z7Board : public Board {
     int GetIRQ() override;
     int GetPCISlotNumber() override;
     int GetBusNumber() override;
-    /// Adds `listener` and at once hands it an event of the board's present status, on the caller's
-    /// thread. Returns -1.
+    /// Adds `listener` and at once passes it an event of the board's present status, on the
+    /// caller's thread. Returns -1.
     int AddBoardStatusListener(BoardStatusListener* listener) override;
 
-    /// Takes the board to `status`: 3 starts it, 4 stops it, 15 stops it and marks it failed, 13
-    /// and 14 are recorded, anything else is ignored. Repeating a status does not repeat the work,
-    /// but 3 always reads the device mapper record anew. Returns -1.
+    /// Changes the board to `status`: 3 starts it, 4 stops it, 15 stops it and marks it as failed,
+    /// 13 and 14 are recorded, any other value is ignored. A repeated status does not repeat the
+    /// work, but 3 always reads the device mapper record anew. Returns -1.
     virtual int ProcessExternalEvent(BoardStatusEnum status);
 
-    /// Called by the factory's ping thread at every interval.
+    /// Called on the factory's ping thread, once per interval.
     virtual int PingBoard() = 0;
     virtual int SetStatus(BoardStatusEnum status) = 0;
     virtual int SetSecondaryStatus(BoardStatusEnum status) = 0;
-    /// The stages are called one after the other when the board comes up.
+    /// The stages are called one after the other when the board starts.
     virtual int StartStage1() = 0;
     virtual int StartStage2() = 0;
     virtual int StartStage3() = 0;
-    /// Called when the board goes down.
+    /// Called when the board stops.
     virtual int StopBoard() = 0;
     /// These three do nothing here and return 0.
     virtual int create_ipethernet_feature();
@@ -59,11 +59,11 @@ class KVLOAM_API Z7Board : public Board {
     int GetChassisSlotNumber();
     /// The board's handle in the device mapper.
     long GetBoardIdentifier() const { return m_boardIdentifier; }
-    /// 13 or 14 when that was the last status delivered, else 0.
+    /// 13 or 14 if that was the last status delivered, otherwise 0.
     BoardStatusEnum GetLastCondition();
 
   protected:
-    /// The present device mapper record: a snapshot that stays as it is, also when the board starts
+    /// The present device mapper record, a snapshot that does not change, even if the board starts
     /// anew meanwhile.
     std::shared_ptr<DevMapBoardIf const> record();
     void SetErrorMessage(std::string message);

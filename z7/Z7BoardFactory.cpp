@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "z7/Z7BoardFactory.h"
 
+#include <cstddef>
+#include <cstdint>
 #include <ctime>
 
 #include <limits>
@@ -11,7 +13,7 @@
 
 namespace {
 
-/// Every board of a factory's map is one that `MakeBoard` built.
+/// Every board in a factory's map was created by `MakeBoard`.
 Z7Board* z7(ReferenceCounter<Board> const& board) {
     return static_cast<Z7Board*>(board.get());
 }
@@ -43,7 +45,7 @@ int Z7BoardFactory::Initialize(ReferenceCounter<BoardTable> table) {
 
 int Z7BoardFactory::AttachBoardTable(ReferenceCounter<BoardTable> table) {
     ObjectGuard const guard(*this);
-    // The former table is dropped after the lock is given back, with the argument.
+    // The argument now holds the former table and drops it after the lock is released.
     std::swap(m_boardTable, table);
     return 0;
 }
@@ -197,8 +199,8 @@ int Z7BoardFactory::ping_boards() {
 void Z7BoardFactory::Run() {
     std::time_t start = std::time(nullptr);
     for (;;) {
-        // Deliberate: a pass that takes longer than the interval makes this negative, and the sleep
-        // very long; operators know a silent ping thread by it.
+        // Deliberate: after a pass that takes longer than the interval this is negative, and the
+        // sleep very long. Operators recognise an overloaded platform by the silent ping thread.
         Sleep(static_cast<int>(start + m_pingInterval - std::time(nullptr)));
         start = std::time(nullptr);
         ping_boards();

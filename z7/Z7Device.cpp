@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "z7/Z7Device.h"
 
+#include <cstddef>
 #include <cstring>
 
 Z7Device::Z7Device(char const* name) {

@@ -1,11 +1,12 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The named resources of Z7 boards, by kind.
+// The devices of Z7 boards, by kind.
 #pragma once
 
 #include "core/Object.h"
 
-/// A resource of a board, found by name. Concrete devices answer the queries and set the type; a
-/// query that a device cannot answer returns -1. The name is set before the device is published.
+/// A `Z7Device` is a named resource of a board. Concrete devices implement the queries and set the
+/// type; a query that a device cannot answer returns -1. Set the name and the type before other
+/// threads see the device.
 class KVLOAM_API Z7Device : public Object {
   public:
     static constexpr int kNameSize = 64;
@@ -14,14 +15,14 @@ class KVLOAM_API Z7Device : public Object {
     ~Z7Device() override;
 
     virtual int GetStatus() = 0;
-    /// The index of the device's board, as its module numbers it.
+    /// The index of the device's board, as its module numbers boards.
     virtual int GetBoardIndex() = 0;
     /// The device's number on its board, from 1.
     virtual int GetDeviceNumber() = 0;
 
     /// Copies at most `kNameSize` characters and fills the rest with zeros.
-    /// Deliberate: a name of `kNameSize` characters or more is kept without a terminator; read it
-    /// with a bound.
+    /// Deliberate: a name of `kNameSize` characters or more has no terminator; read it with a
+    /// bound.
     void SetName(char const* name);
     /// The name's `kNameSize` characters, owned by the device.
     char* GetName() { return m_name; }
@@ -37,7 +38,7 @@ class KVLOAM_API Z7Device : public Object {
     int m_type = -1;
 };
 
-/// A pool of voice channels.
+/// A `Z7VoiceDevice` is a pool of voice channels.
 class KVLOAM_API Z7VoiceDevice : public Z7Device {
   public:
     explicit Z7VoiceDevice(char const* name);
@@ -52,7 +53,7 @@ class KVLOAM_API Z7VoiceDevice : public Z7Device {
     static KVL::IID iid() { return KVL::IID("13Z7VoiceDevice"); }
 };
 
-/// A digital trunk interface.
+/// A `Z7TRKDevice` is a digital trunk interface.
 class KVLOAM_API Z7TRKDevice : public Z7Device {
   public:
     explicit Z7TRKDevice(char const* name);
@@ -69,7 +70,7 @@ class KVLOAM_API Z7TRKDevice : public Z7Device {
     static KVL::IID iid() { return KVL::IID("11Z7TRKDevice"); }
 };
 
-/// A digital trunk interface that carries ISDN.
+/// A `Z7ISDNDevice` is a digital trunk interface that carries ISDN.
 class KVLOAM_API Z7ISDNDevice : public Z7TRKDevice {
   public:
     explicit Z7ISDNDevice(char const* name);
@@ -82,7 +83,7 @@ class KVLOAM_API Z7ISDNDevice : public Z7TRKDevice {
     static KVL::IID iid() { return KVL::IID("12Z7ISDNDevice"); }
 };
 
-/// A station or switching interface.
+/// A `Z7STNDevice` is a station or switching interface.
 class KVLOAM_API Z7STNDevice : public Z7Device {
   public:
     explicit Z7STNDevice(char const* name);

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The resources of a Z7 board.
+// The devices of a Z7 board.
 #pragma once
 
 #include <vector>
@@ -8,8 +8,8 @@
 #include "core/ReferenceCounter.h"
 #include "z7/Z7Device.h"
 
-/// Lists a board's devices. The concrete feature fills the list before it publishes itself and
-/// leaves it alone afterwards; any thread may then walk it.
+/// A `Z7ResourceFeature` holds a board's devices. The concrete feature fills the list before other
+/// threads see the feature and does not change it afterwards. Thread-safe from then on.
 class KVLOAM_API Z7ResourceFeature : public Feature {
   public:
     Z7ResourceFeature();
@@ -18,9 +18,10 @@ class KVLOAM_API Z7ResourceFeature : public Feature {
     virtual int GetNumberOfDevices() = 0;
 
     ReferenceCounter<Z7Device> GetFirstDevice();
-    /// An empty handle when `current` is the last device or none of this feature.
+    /// The device after `current`; an empty handle if `current` is the last device or is not one of
+    /// this feature.
     ReferenceCounter<Z7Device> GetNextDevice(ReferenceCounter<Z7Device> current);
-    /// Deliberate: answers an empty handle for every name. Devices are walked.
+    /// Deliberate: returns an empty handle for every name. Devices are found by a walk.
     ReferenceCounter<Z7Device> GetDevice(char* name);
 
     static KVL::IID iid() { return KVL::IID("17Z7ResourceFeature"); }

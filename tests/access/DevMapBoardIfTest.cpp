@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A board's record against the simulated device mapper.
+// A board's record, read from the simulated device mapper.
 #include <cstdlib>
 #include <ctime>
 
@@ -21,12 +21,12 @@ constexpr char const* kWhole =
 
 class DevMapBoardIfTest : public testing::Test {
   protected:
-    /// A record of board 5 with these attributes beside its serial number.
+    /// A record of board 5 with these attributes and its serial number.
     static DevMapBoardIf record(std::string const& attributes, std::string const& rest = "") {
         sim::load({sim::board(5, "S5", attributes, rest)});
         return DevMapBoardIf(5);
     }
-    /// What a record of board 5 says of `text` as its state change date, in time zone `zone`.
+    /// The state change date of board 5 for the attribute `text`, in the time zone `zone`.
     static time_t dateOf(char const* text, char const* zone) {
         setenv("TZ", zone, 1);
         tzset();

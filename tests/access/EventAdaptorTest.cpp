@@ -1,6 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The event adaptors against the simulated event service.
-#include <cstring>
+// The event adaptors with the simulated event service.
 
 #include <functional>
 #include <string>
@@ -35,7 +34,7 @@ class ExternalEventAdaptorTest : public testing::Test {
   protected:
     ExternalEventAdaptorTest() { sim::load({sim::board(5, "S5")}); }
 
-    /// A listener that nobody else's events reach in this test.
+    /// A listener that receives only this test's events.
     EventLog& listen() {
         auto& log = keptForGood<EventLog>();
         EXPECT_EQ(m_adaptor->AddExternalEventListener(&log), 0);

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The statistics table against a runtime library that answers as the test says, and against real
+// The statistics table with a runtime library whose answers the test chooses, and with real
 // processes of this host.
 #include "access/KPXStatisticsTable.h"
 

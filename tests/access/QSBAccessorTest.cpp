@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The accessor of the attribute store against the simulated store.
+// The accessor of the attribute store, with the simulated store.
 #include "access/QSBAccessor.h"
 
 #include <fstream>

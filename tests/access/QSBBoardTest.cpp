@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A board's record in the attribute store against the simulated store.
+// A board's record in the attribute store, with the simulated store.
 #include "access/QSBBoard.h"
 
 #include <climits>

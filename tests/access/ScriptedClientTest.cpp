@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The record classes against answers that a sound device mapper does not give every day. This
-// program has a device mapper client of its own in the place of the platform's.
+// The record classes with unusual answers of the device mapper. This program has its own device
+// mapper client instead of the platform's.
+#include <cstddef>
+#include <cstdint>
 #include <cstring>
 
 #include <algorithm>
@@ -18,7 +20,7 @@
 
 namespace {
 
-/// Answers as the test says.
+/// A client whose answers the test chooses.
 class ScriptedClient final : public DeviceMapperClient {
   public:
     int FindObjects(long /*parent*/, int count, DMAttribute* criteria, int* found,
@@ -168,8 +170,8 @@ TEST_F(ScriptedClientTest, ConditionOfTwoBytesIsSignExtended) {
     EXPECT_EQ(board.LogicalID(), -7);
 }
 
-/// Makes a record of an object that has a name, a kernel version and a descriptor, reads it again
-/// when they are gone, and returns it.
+/// Reads the record of an object that has all attributes, reads it again after all of them are
+/// gone, and returns it.
 template <class Record>
 Record readTwice() {
     s_client->onAttribute = [](DMAttribute& request) {

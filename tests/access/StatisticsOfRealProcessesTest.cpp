@@ -1,8 +1,9 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The statistics table against the simulated runtime library and its processes.
+// The statistics table with the simulated runtime library and its processes.
 #include <unistd.h>
 
-#include <string>
+#include <ctime>
+
 #include <vector>
 
 #include <gtest/gtest.h>

@@ -15,7 +15,7 @@ namespace {
 
 using BoardHandle = ReferenceCounter<Board>;
 
-/// Enters boards when told to, and remembers how it was attached.
+/// A factory that enters boards when the test asks, and records how it was attached.
 class HandFactory final : public BoardFactory {
   public:
     int Initialize(ReferenceCounter<BoardTable> table) override {

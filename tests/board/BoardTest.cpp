@@ -162,7 +162,7 @@ TEST_F(BoardTest, AllListenersSeeOneEventObject) {
     EXPECT_EQ(m_log.entries().at(0).event, second.entries().at(0).event);
 }
 
-/// Does something of its own at every event.
+/// A listener that calls the test back at every event.
 class ActingListener final : public BoardStatusListener {
   public:
     explicit ActingListener(std::function<void(ReferenceCounter<BoardStatusEvent>)> act)

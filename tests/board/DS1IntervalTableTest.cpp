@@ -1,6 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A line's performance history, ticked by the test alone.
-#include <memory>
+// A line's performance history, ticked only by the test.
 #include <string>
 #include <vector>
 

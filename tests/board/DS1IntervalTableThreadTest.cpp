@@ -1,5 +1,8 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Interval tables that are read while they tick, and that come and go while the scheduler runs.
+// Interval tables that are read while they tick, and that are created and destroyed while the
+// scheduler runs.
+#include <cstddef>
+
 #include <atomic>
 #include <chrono>
 #include <condition_variable>
@@ -73,7 +76,7 @@ class Passes final : public Schedulable {
         std::scoped_lock const lock(m_mutex);
         return m_count;
     }
-    /// Waits for some more. Returns whether they came.
+    /// Waits for `passes` more passes. Returns whether they came.
     bool waitForMore(int passes) {
         std::unique_lock lock(m_mutex);
         int const enough = m_count + passes;

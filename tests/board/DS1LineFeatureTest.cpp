@@ -1,6 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Lines, the walks over them, and what their status changes carry.
-#include <string>
+// Lines, the walks over them, and the events of their status changes.
 #include <typeinfo>
 #include <vector>
 
@@ -18,7 +17,7 @@ namespace {
 using Line = ReferenceCounter<DS1LineDevice>;
 using Interface = ReferenceCounter<KVL::Interface>;
 
-/// Lines in a vector. Remembers what it was last asked the successor of.
+/// Lines in a vector. Records the argument of the last `GetNextDevice`.
 class ListedLines final : public DS1LineFeature {
   public:
     int AddLineStatusListener(DS1LineStatusListener* /*listener*/) override { return 0; }

@@ -64,7 +64,7 @@ TEST(FeatureHelperTest, MinAndMaxPickByValue) {
     EXPECT_EQ(max(2, -3), 2);
 }
 
-/// Leaves every query to the base.
+/// An interface that calls the base for every query.
 class BareEthernet final : public BareInterface<KVL::Ethernet> {
   public:
     int GetAlignmentErrors() override { return KVL::kNotSupported; }

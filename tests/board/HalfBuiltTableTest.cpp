@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Interval tables that the scheduler meets while they are being built or destroyed.
+// Interval tables that the scheduler calls while they are under construction or destruction.
 #include <gtest/gtest.h>
 
 #include "board/DS1IntervalTable.h"
@@ -8,10 +8,10 @@
 
 namespace {
 
-int s_asked = 0; ///< how often the scheduler has asked a table for something
+int s_asked = 0; ///< the number of `CollectSecond` and `CloseInterval` calls
 
-/// A member whose construction and destruction take some seconds, during which the scheduler comes
-/// by.
+/// A `SlowMember` takes three seconds for its construction and for its destruction. The scheduler
+/// makes its passes meanwhile.
 class SlowMember {
   public:
     explicit SlowMember(Schedulable* table) : m_table(table) { hesitate(); }
@@ -29,7 +29,7 @@ class SlowMember {
     Schedulable* m_table;
 };
 
-/// A complete table with nothing special about its constructor and destructor.
+/// A table without a constructor and a destructor of its own.
 class Table : public DS1IntervalTable {
   public:
     int GetControlledSlipSeconds(int /*n*/) override { return 0; }
@@ -42,7 +42,7 @@ class TableWithSlowMember final : public Table {
     SlowMember m_member{this};
 };
 
-/// Leaves the pure operations to a further class.
+/// A table whose pure operations are implemented by a further derived class.
 class AbstractTable : public DS1IntervalTable {
     SlowMember m_member{this};
 };
@@ -55,7 +55,7 @@ class TableBehindAbstractOne final : public AbstractTable {
     int CloseInterval() override { return ++s_asked; }
 };
 
-/// Whose constructor's body takes its time.
+/// A table whose constructor's body takes three seconds.
 class SlowlyFilledTable final : public Table {
   public:
     SlowlyFilledTable() { SlowMember const pause(this); }

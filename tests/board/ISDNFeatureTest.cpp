@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Channels, the walks over them, and what their status changes carry.
+// Channels, the walks over them, and the events of their status changes.
 #include <typeinfo>
 #include <vector>
 

@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The scheduler against a plain model of its rules, and with many entries.
+// The scheduler compared with a plain model of its rules, and with many entries.
+#include <cstddef>
 #include <ctime>
 
 #include <algorithm>
@@ -23,7 +24,7 @@ constexpr long k2038 = 0x7FFFFFFF; ///< the last second of 32-bit time
 
 long s_now = 0;
 
-/// A scheduler without a thread: the test wakes it.
+/// A scheduler without a thread. The test wakes it.
 class DrivenScheduler final : public ActionScheduler_pthread {
   public:
     DrivenScheduler() : ActionScheduler_pthread([] { return s_now; }) {}
@@ -50,7 +51,7 @@ class Action final : public Schedulable {
     std::string& m_record;
 };
 
-/// The rules of the scheduler as one reads them, one entry after the other.
+/// A `Model` follows the rules of the scheduler literally, one entry after the other.
 class Model {
   public:
     explicit Model(std::string& record) : m_record(record) {}
@@ -123,7 +124,8 @@ class Model {
     long m_nextWakeUp = kLast;
 };
 
-/// Does the same to a scheduler and to the model, at random, and compares.
+/// A `RandomDrive` applies the same random operations to a scheduler and to the model, and compares
+/// the results.
 class RandomDrive {
   public:
     explicit RandomDrive(unsigned seed) : m_random(seed) {
@@ -206,8 +208,8 @@ double processorTime() {
     return static_cast<double>(time.tv_sec) + 1e-9 * static_cast<double>(time.tv_nsec);
 }
 
-/// What it takes to enter `count` entries of one period behind an entry of a longer one, and to
-/// remove them again in the order of their entry.
+/// The time to enter `count` entries of one period before an entry that is due later, and to remove
+/// them in the same order.
 double timeOfEntries(std::size_t count) {
     s_now = 1000;
     std::vector<Idle> targets(count);
@@ -228,8 +230,8 @@ TEST(ActionSchedulerModelTest, TimeOfEntryAndRemovalDoesNotGrowWithTheList) {
         small = std::min(small, timeOfEntries(500));
         large = std::min(large, timeOfEntries(50000));
     }
-    // A hundred times as many take a hundred times as long; a search of the list would take ten
-    // thousand times as long.
+    // A hundred times as many take a hundred times as long. With a search through the list, they
+    // would take ten thousand times as long.
     EXPECT_LT(large, 1000 * small);
 }
 
@@ -262,7 +264,7 @@ TEST(ActionSchedulerModelTest, EntryIsWaitedForAfter2038) {
     EXPECT_EQ(record, "aaa");
 }
 
-/// Runs out of memory; counts how often its list is locked.
+/// A scheduler that runs out of memory. It counts the locks of its list.
 class ExhaustedScheduler final : public ActionScheduler_pthread {
   public:
     ExhaustedScheduler() : ActionScheduler_pthread([] { return s_now; }) {}

@@ -19,7 +19,7 @@ constexpr long kNever = kLast;
 
 long s_now = kStart;
 
-/// A scheduler without a thread: the test wakes it.
+/// A scheduler without a thread. The test wakes it.
 class DrivenScheduler final : public ActionScheduler_pthread {
   public:
     DrivenScheduler() : ActionScheduler_pthread([] { return s_now; }) {}
@@ -38,7 +38,7 @@ class DrivenScheduler final : public ActionScheduler_pthread {
     SchedItem item(Schedulable* target) { return *find_item_on_list(target); }
 };
 
-/// Notes its name and the time in the test's record when it is called.
+/// Appends its name and the time to the test's record when it is called.
 class Action final : public Schedulable {
   public:
     Action(std::string name, std::string& record) : m_name(std::move(name)), m_record(record) {}
@@ -63,7 +63,7 @@ class ActionSchedulerTest : public testing::Test {
             m_scheduler.wakeAt(std::max(s_now, m_scheduler.nextWakeUp()));
         s_now = time;
     }
-    /// What was called since the last question.
+    /// Returns what was called since the last call of this.
     std::string called() { return std::exchange(m_record, ""); }
 
     std::string m_record;

@@ -19,14 +19,14 @@ ActionScheduler& scheduler() {
     return *ActionScheduler_pthread::GetScheduler();
 }
 
-/// By the scheduler's clock; `time()` may lag behind it.
+/// The next second of the scheduler's clock, which `time()` may lag behind.
 long nextSecond() {
     timespec now{};
     clock_gettime(CLOCK_REALTIME, &now);
     return static_cast<long>(now.tv_sec) + 1;
 }
 
-/// Counts its calls. Taken off the scheduler's list before it goes.
+/// Counts its calls. Its destructor removes it from the scheduler.
 class CountingAction final : public Schedulable {
   public:
     CountingAction() = default;
@@ -41,7 +41,7 @@ class CountingAction final : public Schedulable {
         return 0;
     }
 
-    /// Whether the action is called `calls` times in all, or will be soon.
+    /// Waits until the action has been called `calls` times in all. Returns whether it was.
     bool reaches(int calls) {
         std::unique_lock lock(m_mutex);
         return m_changed.wait_for(lock, kPatience, [&] { return m_calls >= calls; });
@@ -57,7 +57,7 @@ class CountingAction final : public Schedulable {
     int m_calls = 0;
 };
 
-/// Lasts until it is told that it was removed, or long enough to see that it is not.
+/// Lasts until `noteRemoved` is called, or long enough to show that it is not.
 class LastingAction final : public Schedulable {
   public:
     int ScheduledAction() override {
@@ -129,7 +129,7 @@ TEST(ActionSchedulerThreadTest, EntryAddedWhileTheLoopWaitsForNothingIsCalled) {
     CountingAction first, second;
     scheduler().AddOneTimeAction(&first, 0);
     ASSERT_TRUE(first.reaches(1));
-    // Whoever finds the entry gone finds the pass ended, and with it the list empty.
+    // If the entry is gone, the pass has ended and the list is empty.
     EXPECT_EQ(scheduler().Remove(&first), 1);
     EXPECT_EQ(scheduler().AddOneTimeAction(&second, nextSecond()), 0);
     EXPECT_TRUE(second.reaches(1));

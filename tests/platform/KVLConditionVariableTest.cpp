@@ -19,10 +19,10 @@ timeval now() {
     return time;
 }
 
-/// A waiter on a thread of its own, and the predicate that it waits for.
+/// A thread that waits, and the predicate that it waits for.
 class KVLConditionVariableTest : public testing::Test {
   protected:
-    /// Waits with `wait(seconds)` until the predicate holds; tells when it is about to wait.
+    /// Waits with `wait(seconds)` until the predicate holds. Signals when it is about to wait.
     void startWaiter(int seconds) {
         m_waiter = std::thread([this, seconds] {
             m_condition.grab(0);
@@ -31,7 +31,7 @@ class KVLConditionVariableTest : public testing::Test {
                 m_condition.wait(seconds);
             m_condition.release();
         });
-        // The waiter holds the mutex until it really waits, so whoever gets it next comes after.
+        // The waiter holds the mutex until it waits; when this thread gets it, the waiter waits.
         m_waiting.get_future().wait();
     }
 
@@ -100,9 +100,9 @@ TEST_F(KVLConditionVariableTest, TimedOutWaitThrowsWithTheMutexHeld) {
 }
 
 TEST_F(KVLConditionVariableTest, TimedWaitEndsAtAWholeSecondOfTheClock) {
-    // The fraction of the second in which a wait begins is dropped. So among waits of one second
-    // that begin late in a second there is one that lasts clearly less; a stall of the machine
-    // spoils a try, never all of them.
+    // The wait drops the fraction of the second in which it begins, so a wait of one second that
+    // begins late in a second is clearly shorter. A machine that stalls can spoil one attempt, but
+    // not all of them.
     constexpr long kLate = 700'000;
     bool wasShort = false;
     for (int attempt = 0; attempt < 20 && !wasShort; ++attempt) {

@@ -9,7 +9,7 @@
 
 namespace {
 
-/// What `call` answers on another thread.
+/// The result of `call` on another thread.
 template <class Call>
 int onAnotherThread(Call const& call) {
     int result = -1;

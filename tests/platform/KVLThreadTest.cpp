@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Threads: start, state, and what does nothing.
+// Threads: start, state, and the operations that do nothing.
 #include <future>
 
 #include <gtest/gtest.h>
@@ -9,7 +9,7 @@
 
 namespace {
 
-/// A body that runs until it is let go.
+/// A body that runs until `letGo` is called.
 class Body final : public Runnable {
   public:
     void Run() override {
@@ -28,7 +28,7 @@ class Body final : public Runnable {
     pthread_t m_thread{};
 };
 
-/// The thread is detached, so its end can only be seen in its state.
+/// The thread is detached, so only its state shows its end.
 void waitUntilNotRunning(KVLThread_pthread& thread) {
     while (thread.GetThreadState() != KVLThreadNotRunning)
         sched_yield();

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The channels themselves: names, board index, listeners of their own.
+// The channels: names, board index, and their own listeners.
 #include <cstring>
 #include <string>
 

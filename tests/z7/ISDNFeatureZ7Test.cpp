@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The ISDN channels of a Z7 board, and how their status changes are told.
+// The ISDN channels of a Z7 board and the notification of their status changes.
 #include <string>
 
 #include <gtest/gtest.h>

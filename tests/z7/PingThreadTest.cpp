@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The ping thread as it really runs.
+// The ping thread of a factory.
 #include <chrono>
 #include <condition_variable>
 #include <mutex>
@@ -47,7 +47,7 @@ TEST(PingThreadTest, BoardsArePingedAtEveryInterval) {
     auto* const factory = new CountingFactory;
     ReferenceCounter<BoardFactory> const handle(factory);
     ReferenceCounter<BoardManager> const manager(new BoardManager);
-    // Not 1: a pass that a busy machine holds up beyond the interval would be the last.
+    // Not 1: if a busy machine delays a pass beyond the interval, it is the last one.
     factory->SetPingInterval(2);
     manager->Attach(handle);
     EXPECT_TRUE(factory->waitForPings(2));

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A Z7 board that writes down what is asked of it.
+// A Z7 board that records the calls of its operations.
 #pragma once
 
 #include <cstring>
@@ -9,7 +9,8 @@
 
 #include "z7/Z7Board.h"
 
-/// Starts stopped. `calls` gets one word for each change or notification, in order.
+/// A board that is stopped at first. `calls` gets one word for each change or notification, in
+/// order.
 class RecordingBoard final : public Z7Board {
   public:
     explicit RecordingBoard(long id) : Z7Board(id) {}

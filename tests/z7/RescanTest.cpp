@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The Z7 factory's rescan: boards that went, came, or were exchanged.
+// The Z7 factory's rescan: boards that are removed, added or replaced.
 #include <string>
 #include <vector>
 
@@ -13,7 +13,7 @@
 
 namespace {
 
-/// A factory over boards 1 ("A") and 2 ("B"), attached.
+/// An attached factory with the boards 1 ("A") and 2 ("B").
 class RescanTest : public testing::Test {
   protected:
     RescanTest() {

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The Z7 factory: boards made, announced, exchanged, pinged and told.
+// The Z7 factory: creating, announcing, replacing, pinging and notifying boards.
 #include <chrono>
 #include <future>
 #include <string>
@@ -301,7 +301,7 @@ TEST_F(Z7BoardFactoryTest, OperationsKeepTheirSlots) {
     EXPECT_EQ(slotOf(&Z7BoardFactory::Run), ++slot);
 }
 
-// An empty handle where an object must be ends the process, as every use of one does.
+// Like every use of an empty handle, one instead of an object ends the process.
 
 using Z7BoardFactoryDeathTest = Z7BoardFactoryTest;
 

@@ -202,7 +202,7 @@ TEST_F(Z7BoardTest, OperationsKeepTheirSlots) {
     EXPECT_EQ(slotOf(&Z7Board::destroy_extended_features), ++slot);
 }
 
-/// What a status does to a board in some state: every combination once.
+/// The effect of a status on a board in each state: every combination once.
 struct Transition {
     int status;
     int secondary;

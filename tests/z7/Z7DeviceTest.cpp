@@ -11,7 +11,7 @@
 
 namespace {
 
-/// Answers what every device is asked.
+/// A device that implements the common queries.
 template <class Kind>
 class Answering : public Kind {
   public:
@@ -98,7 +98,7 @@ TEST(Z7DeviceTest, TypeIsMinusOneUntilTheConcreteDeviceSetsIt) {
     EXPECT_EQ(device.GetType(), 3);
 }
 
-/// Whether `device` answers to each of: Object, device, voice, trunk, ISDN, station.
+/// Whether `device` has each of the identifiers of Object, device, voice, trunk, ISDN and station.
 std::vector<bool> answersTo(Object const& device) {
     std::vector<bool> answers;
     for (KVL::IID const& id : {KVL::IID("6Object"), Z7Device::iid(), Z7VoiceDevice::iid(),
