@@ -6,10 +6,23 @@
 #include "core/ReferenceTable.h"
 #include "platform/ActionScheduler_pthread.h"
 
+namespace {
+
+/// Whether `table` is complete: it has handles then. The dynamic type does not show that; while the
+/// members of the concrete table are being constructed or destroyed, it is that table's already.
+/// Nothing of the object is read, and the reference table's lock orders what its constructors wrote
+/// before the tick.
+bool hasHandle(Schedulable* table) {
+    Object* const object = static_cast<DS1IntervalTable*>(table);
+    return ReferenceTable::get_instance()->ReferenceTable::get_refinfo(object) != nullptr;
+}
+
+} // namespace
+
 DS1IntervalTable::DS1IntervalTable() {
     // Every tick looks into the reference table, which must be made before another thread does so.
     ReferenceTable::get_instance();
-    ActionScheduler_pthread::GetScheduler()->AddPeriodic(this, 1);
+    ActionScheduler_pthread::GetScheduler()->AddPeriodicWhileReady(this, 1, hasHandle);
 }
 
 DS1IntervalTable::~DS1IntervalTable() {
@@ -59,9 +72,7 @@ int DS1IntervalTable::GetLineCodeViolations(int n) {
 }
 
 int DS1IntervalTable::ScheduledAction() {
-    // The dynamic type does not show whether the table is complete: while the members of the
-    // concrete table are being constructed or destroyed, the type is that table's already.
-    if (ReferenceTable::get_instance()->ReferenceTable::get_refinfo(this) == nullptr) return 0;
+    if (!hasHandle(this)) return 0;
     if (m_timeElapsed < kIntervalLength)
         CollectSecond();
     else

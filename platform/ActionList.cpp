@@ -34,7 +34,7 @@ void ActionList::insert(SchedItem const& item) {
     auto const [place, isNew] = m_places.try_emplace(item.target);
     if (!isNew) return;
     try {
-        place->second = append(item);
+        place->second = append(item, nullptr);
     } catch (...) {
         m_places.erase(place);
         throw;
@@ -49,20 +49,31 @@ void ActionList::erase(Schedulable* target) {
 
 void ActionList::change(Schedulable* target, long due, long period) {
     Place& place = m_places.find(target)->second;
-    Place const next = append({target, due, period});
+    Place const next = append({target, due, period}, place.run->ready);
     discard(std::exchange(place, next));
 }
 
-ActionList::Place ActionList::append(SchedItem const& item) {
+void ActionList::setReady(Schedulable* target, Ready ready) {
+    Place& place = m_places.find(target)->second;
+    try {
+        Place const next = append(place.run->items[place.index], ready);
+        discard(std::exchange(place, next));
+    } catch (...) {
+        erase(target);
+        throw;
+    }
+}
+
+ActionList::Place ActionList::append(SchedItem const& item, Ready ready) {
     auto const after = m_runs.upper_bound(item.due);
     if (after != m_runs.begin()) {
         auto const& [due, last] = *std::prev(after);
-        if (due == item.due && last->period == item.period) {
+        if (due == item.due && last->period == item.period && last->ready == ready) {
             last->items.push_back(item);
             return {last.get(), last->items.size() - 1};
         }
     }
-    auto run = std::make_unique<Run>(Run{item.period, {item}});
+    auto run = std::make_unique<Run>(Run{item.period, ready, {item}});
     auto const position = m_runs.emplace_hint(after, item.due, std::move(run));
     position->second->position = position;
     return {position->second.get(), 0};
@@ -117,7 +128,7 @@ void ActionList::call(Run& run, long due) {
     for (std::size_t i = 0; i < count; ++i) {
         // Targets lie all over memory; the next ones are fetched while this one works.
         if (i + kAhead < count) fetch(items[i + kAhead].target);
-        items[i].target->ScheduledAction();
+        if (run.ready == nullptr || run.ready(items[i].target)) items[i].target->ScheduledAction();
         items[i].due = due;
     }
 }
@@ -135,7 +146,7 @@ void ActionList::enterAgain(Runs::node_type node, long due) {
 bool ActionList::joinRunBefore(Runs::iterator after, Run& run, long due) {
     if (after == m_runs.begin()) return false;
     auto const& [lastDue, last] = *std::prev(after);
-    if (lastDue != due || last->period != run.period) return false;
+    if (lastDue != due || last->period != run.period || last->ready != run.ready) return false;
     std::size_t index = last->items.size();
     try {
         last->items.insert(last->items.end(), run.items.begin(), run.items.end());

@@ -24,11 +24,14 @@ inline long add_saturated(long time, long seconds) {
 /// are due at the same time stand in the order in which they were entered. It finds an entry by its
 /// target in constant time. Unsynchronised.
 ///
-/// Entries of one due time and one period stand together in a run. A host has thousands of entries
-/// with a period of a second: a pass calls their run and moves it as a whole, and no entry changes
-/// its place in the run.
+/// Entries of one due time, one period and one condition stand together in a run. A host has
+/// thousands of entries with a period of a second: a pass calls their run and moves it as a whole,
+/// and no entry changes its place in the run.
 class ActionList {
   public:
+    /// The condition of an entry's calls; null for none.
+    using Ready = bool (*)(Schedulable*);
+
     ActionList() = default;
     ActionList(ActionList const&) = delete;
     ActionList& operator=(ActionList const&) = delete;
@@ -49,7 +52,12 @@ class ActionList {
     /// If memory runs out, the list stays as it was.
     void change(Schedulable* target, long due, long period);
 
-    /// Calls every entry that is due at `now` once, in the order of the list. Periodic entries are
+    /// Lets the entry of `target`, which must be on the list, be called only while `ready(target)`
+    /// is true. If memory runs out, takes the entry off the list.
+    void setReady(Schedulable* target, Ready ready);
+
+    /// Calls every entry that is due at `now` once, in the order of the list; passes over targets
+    /// that are not ready. Periodic entries are
     /// entered again with their next due times, in the order of their calls; the others leave the
     /// list. Returns the earliest of the next due times, or `never`.
     long callDue(long now, long never);
@@ -59,6 +67,7 @@ class ActionList {
     using Runs = std::multimap<long, std::unique_ptr<Run>>;
     struct Run {
         long period;
+        Ready ready;
         std::vector<SchedItem> items; ///< without a target where an entry was removed
         std::size_t removed = 0;
         Runs::iterator position{};
@@ -68,7 +77,7 @@ class ActionList {
         std::size_t index = 0;
     };
 
-    Place append(SchedItem const& item);
+    Place append(SchedItem const& item, Ready ready);
     void discard(Place const& place);
     void compact(Run& run);
     void call(Run& run, long due);

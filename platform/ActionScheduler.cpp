@@ -14,6 +14,15 @@ int ActionScheduler::AddPeriodic(Schedulable* target, long period) {
     return 0;
 }
 
+int ActionScheduler::AddPeriodicWhileReady(Schedulable* target, long period,
+                                           bool (*ready)(Schedulable*)) {
+    ListLock const lock(*this);
+    if (check_on_list(target)) return 1;
+    put_item_on_list(target, period, 0);
+    m_list->setReady(target, ready);
+    return 0;
+}
+
 int ActionScheduler::AddOneTimeAction(Schedulable* target, long when) {
     ListLock const lock(*this);
     if (check_on_list(target)) return 1;

@@ -67,6 +67,11 @@ class KVLOAM_API ActionScheduler : public Runnable {
     /// Calls `target` every `period` seconds, first `period` seconds from now; with a period of 0
     /// or less once, at once. Returns 0. Changes nothing and returns 1 if `target` is on the list.
     int AddPeriodic(Schedulable* target, long period);
+    /// Like `AddPeriodic`, but a call that is due is left out while `ready(target)` is false. The
+    /// scheduler does not touch a target that is not ready, so an object may be on the list before
+    /// its construction is complete. `ready` is called on the scheduler's thread, with the list
+    /// locked.
+    int AddPeriodicWhileReady(Schedulable* target, long period, bool (*ready)(Schedulable*));
     /// Calls `target` once, at `when`, in seconds since the epoch (not from now). A time that has
     /// passed means at once. Returns 0. Changes nothing and returns 1 if `target` is on the list.
     int AddOneTimeAction(Schedulable* target, long when);

@@ -23,10 +23,7 @@ inline int putText(std::string const& text, char* place) {
 /// counts errored seconds only; a real one counts more.
 class SpanIntervalTable final : public DS1IntervalTable {
   public:
-    explicit SpanIntervalTable(long device) : m_device(device) {
-        read();
-        ActionScheduler_pthread::GetScheduler()->ChangePeriod(this, 1); // ticks see what is written
-    }
+    explicit SpanIntervalTable(long device) : m_device(device) { read(); }
     /// Waits for a tick under way before any member is destroyed.
     ~SpanIntervalTable() override { ActionScheduler_pthread::GetScheduler()->Remove(this); }
 

@@ -20,9 +20,7 @@ inline int putText(std::string const& text, char* place) {
 class RackIntervalTable final : public DS1IntervalTable {
   public:
     explicit RackIntervalTable(std::shared_ptr<Card> card)
-        : m_card(std::move(card)), m_last(m_card->violations) {
-        ActionScheduler_pthread::GetScheduler()->ChangePeriod(this, 1); // ticks see what is written
-    }
+        : m_card(std::move(card)), m_last(m_card->violations) {}
     /// Waits for a tick under way before any member is destroyed.
     ~RackIntervalTable() override { ActionScheduler_pthread::GetScheduler()->Remove(this); }
 

@@ -185,6 +185,32 @@ TEST(DS1IntervalTableThreadTest, TablesComeAndGoWhileTheSchedulerTicks) {
     EXPECT_GT(kept->GetErrorSeconds(0), 1000);
 }
 
+/// A table whose constructor does not call the scheduler, and whose class has a member and
+/// operations of its own.
+class PlainTable final : public DS1IntervalTable {
+  public:
+    ~PlainTable() override { scheduler().Remove(this); }
+
+    int GetControlledSlipSeconds(int /*n*/) override { return 0; }
+    int GetDegradedMinutes(int /*n*/) override { return 0; }
+    int CollectSecond() override {
+        m_seconds += m_step;
+        m_seconds.notify_all();
+        return 0;
+    }
+    int CloseInterval() override { return 0; }
+    void waitForASecond() const { m_seconds.wait(0); }
+
+  private:
+    int m_step = 1;
+    std::atomic<int> m_seconds{0};
+};
+
+TEST(DS1IntervalTableThreadTest, TickSeesWhatTheConstructorWroteWithoutACallOfTheScheduler) {
+    ReferenceCounter<PlainTable> const table(new PlainTable);
+    table->waitForASecond(); // ThreadSanitizer finds a fault
+}
+
 TEST(DS1IntervalTableThreadTest, SchedulerTicksATableForAsLongAsItLives) {
     Passes passes;
     Handle table(new ShortTable);

@@ -264,6 +264,35 @@ TEST(ActionSchedulerModelTest, EntryIsWaitedForAfter2038) {
     EXPECT_EQ(record, "aaa");
 }
 
+bool s_ready = false;
+
+bool isReady(Schedulable* /*target*/) {
+    return s_ready;
+}
+
+TEST(ActionSchedulerModelTest, TargetThatIsNotReadyIsNotCalledAndKeepsItsPlace) {
+    std::string record;
+    Action first('a', record), second('b', record), third('c', record);
+    DrivenScheduler scheduler;
+    s_now = 1000;
+    scheduler.AddPeriodic(&first, 1);
+    EXPECT_EQ(scheduler.AddPeriodicWhileReady(&second, 1, isReady), 0);
+    EXPECT_EQ(scheduler.AddPeriodicWhileReady(&second, 1, isReady), 1);
+    scheduler.AddPeriodic(&third, 1);
+    scheduler.wakeAt(1000);
+    scheduler.wakeAt(1001);
+    EXPECT_EQ(record, "ac");
+    s_ready = true;
+    scheduler.wakeAt(1002);
+    EXPECT_EQ(record, "acabc");
+    EXPECT_EQ(scheduler.ChangePeriod(&second, 2), 0);
+    s_ready = false;
+    scheduler.wakeAt(1004);
+    scheduler.wakeAt(1004);
+    EXPECT_EQ(record, "acabcacac");
+    EXPECT_EQ(scheduler.Remove(&second), 0);
+}
+
 /// A scheduler that runs out of memory. It counts the locks of its list.
 class ExhaustedScheduler final : public ActionScheduler_pthread {
   public:
