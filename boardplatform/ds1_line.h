@@ -23,6 +23,8 @@ enum class DS1LineType : std::int32_t {
     d4 = 3,
     e1 = 4,
     e1Crc = 5,
+    e1Mf = 6,    ///< with signalling multiframe in time slot 16
+    e1CrcMf = 7, ///< both
 };
 
 /// The state of a line at one moment; words are in host byte order. All fields but the last only

@@ -4,6 +4,7 @@
 
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace kvlsim {
 
@@ -20,5 +21,8 @@ std::string inQuotes(std::string_view text);
 
 /// Appends to "one, two".
 void appendToList(std::string& list, std::string_view word);
+
+/// The one of `words` that `word` was probably meant to be; empty when none is near enough.
+std::string nearestWord(std::string_view word, std::vector<std::string> const& words);
 
 } // namespace kvlsim

@@ -13,6 +13,7 @@
 namespace kvlsim {
 
 inline constexpr std::int32_t kMaxBearers = 31;
+inline constexpr std::int32_t kMaxT1Bearers = 24;
 
 /// The states' names as descriptions and commands write them, from state 1 on.
 inline constexpr std::array<std::string_view, 4> kBearerStateNames = {"idle", "connecting",

@@ -14,6 +14,13 @@ namespace {
 constexpr std::string_view kName = "NAME";
 constexpr std::string_view kSerialNumber = "SERIAL_NUMBER";
 
+std::size_t countObjects(ObjectDraft const& draft) {
+    std::size_t count = 1;
+    for (auto const& child : draft.children)
+        count += countObjects(child);
+    return count;
+}
+
 /// The text of an attribute, or null when it is missing or no text.
 AttributeValue const* textAttribute(AttributeMap const& attributes, std::string_view name) {
     auto const found = attributes.find(name);
@@ -77,6 +84,11 @@ ChassisObject const* Chassis::boardWithSerial(std::string_view serialNumber) con
 
 void Chassis::insertBoard(ObjectDraft board) {
     refuseTaken(board);
+    if (m_objects.size() - 1 + countObjects(board) > kMaxObjects)
+        throw ChassisError(board.line, "board " + std::to_string(board.handle) +
+                                           " is too much: a chassis has at most " +
+                                           std::to_string(kMaxObjects) +
+                                           " boards, devices, sub-devices and processors");
     if (auto const* serial = textAttribute(board.attributes, kSerialNumber))
         refuseSerial(serial->asText(), board.handle, board.line);
     add(std::move(board), kRootHandle);
@@ -92,6 +104,10 @@ void Chassis::setAttribute(std::int32_t handle, std::string const& name, Attribu
     if (object.kind == ObjectKind::board && name == kSerialNumber &&
         value.form() == ValueForm::text)
         refuseSerial(value.asText(), handle, 0);
+    if (object.attributes.size() >= kMaxAttributes && object.attribute(name) == nullptr)
+        throw ChassisError(0, std::string(nameOf(object.kind)) + " " + std::to_string(handle) +
+                                  " has " + std::to_string(kMaxAttributes) +
+                                  " attributes, which is the most; unset one first");
     unindex(object, name);
     object.attributes.insert_or_assign(name, std::move(value));
     index(object, name);

@@ -3,6 +3,7 @@
 // serial number; their lines and channels; what its attribute store and its processes are like.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <functional>
 #include <memory>
@@ -66,6 +67,10 @@ class Chassis {
     /// The root object's handle. Objects have handles from 1 to just below it.
     static constexpr std::int32_t kRootHandle = 0x7FFFFFFF;
 
+    /// The most objects of a chassis, its root not counted, and attributes of an object.
+    static constexpr std::size_t kMaxObjects = 200'000;
+    static constexpr std::size_t kMaxAttributes = 1'000;
+
     using LineClock = LiveLine::Time();
 
     Chassis();
@@ -80,11 +85,12 @@ class Chassis {
     std::size_t boardCount() const { return root().children.size(); }
 
     /// Adds a board behind the others. Throws ChassisError when a handle or the serial number is
-    /// taken.
+    /// taken, or there would be too many objects.
     void insertBoard(ObjectDraft board);
     /// Requires: the board is there.
     void removeBoard(std::int32_t handle);
-    /// Throws ChassisError when this gives a board the serial number of another.
+    /// Throws ChassisError when this gives a board the serial number of another, or the object too
+    /// many attributes.
     /// Requires: the object is there.
     void setAttribute(std::int32_t handle, std::string const& name, AttributeValue value);
     /// Returns whether the object had the attribute. Requires: the object is there.

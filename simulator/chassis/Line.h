@@ -41,10 +41,13 @@ struct LineTypeName {
     std::string_view name;
     DS1LineType type;
 };
-inline constexpr std::array<LineTypeName, 4> kLineTypeNames = {{{"esf", DS1LineType::esf},
-                                                                {"d4", DS1LineType::d4},
-                                                                {"e1", DS1LineType::e1},
-                                                                {"e1-crc", DS1LineType::e1Crc}}};
+inline constexpr std::array<LineTypeName, 6> kLineTypeNames = {
+    {{"esf", DS1LineType::esf},
+     {"d4", DS1LineType::d4},
+     {"e1", DS1LineType::e1},
+     {"e1-crc", DS1LineType::e1Crc},
+     {"e1-mf", DS1LineType::e1Mf},
+     {"e1-crc-mf", DS1LineType::e1CrcMf}}};
 
 /// "esf" and so on; empty for a number that is no type.
 std::string_view nameOf(DS1LineType type);

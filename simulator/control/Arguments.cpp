@@ -107,9 +107,25 @@ ChassisObject const* Arguments::look(char const* name, Chassis const& chassis,
 ChassisObject const& Arguments::found(char const* name, Chassis const& chassis,
                                       bool boardsOnly) const {
     ChassisObject const* const object = look(name, chassis, boardsOnly);
+    if (object == nullptr && boardsOnly) {
+        // The handle of a part: say whose it is.
+        auto const handle = readNumber(name);
+        auto const* part = handle && *handle > 0 && *handle < Chassis::kRootHandle
+                               ? chassis.find(static_cast<long>(*handle))
+                               : nullptr;
+        if (part != nullptr) {
+            auto const* owner = part;
+            while (owner->kind != ObjectKind::board)
+                owner = chassis.find(owner->parent);
+            throw CommandError(std::to_string(part->handle) + " is a " + nameOf(part->kind) +
+                               " of board " + std::to_string(owner->handle) +
+                               ", not a board; name board " + std::to_string(owner->handle));
+        }
+    }
     if (object == nullptr)
         throw CommandError(std::string("no ") + (boardsOnly ? "board" : "object") + " " +
-                           wordsFor(value(name)) + " in the chassis; \"show\" lists what is there");
+                           wordsFor(value(name)) +
+                           " in the chassis; \"kvlsim show\" lists what is there");
     return *object;
 }
 

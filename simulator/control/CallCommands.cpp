@@ -18,7 +18,7 @@ ChassisObject const& trunkOf(CommandContext const& context, Chassis const& chass
     ChassisObject const& object = context.arguments.object(chassis, "trunk");
     if (object.channels) return object;
     throw CommandError(std::string(nameOf(object.kind)) + ' ' + std::to_string(object.handle) +
-                       " has no channels; \"call-list\" lists those that have");
+                       " has no channels; \"kvlsim call list\" lists those that have");
 }
 
 /// The channels of one trunk, which tell of every change.

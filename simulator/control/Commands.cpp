@@ -155,7 +155,11 @@ Json changeAttribute(Context const& context, Change change) {
 void refuseUnfitLineType(ChassisObject const& object, std::string_view name,
                          AttributeValue const& value) {
     if (!object.ds1Line || name != kDS1LineType || fitsLineType(value)) return;
-    throw CommandError("LINE_TYPE of a line is 2 (esf), 3 (d4), 4 (e1) or 5 (e1-crc), in 4 bytes");
+    std::string known;
+    for (auto const& [type, number] : kLineTypeNames)
+        appendToList(known,
+                     std::to_string(static_cast<int>(number)) + " (" + std::string(type) + ")");
+    throw CommandError("LINE_TYPE of a line is one of " + known + ", in 4 bytes");
 }
 
 Json set(Context const& context) {

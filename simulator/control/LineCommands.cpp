@@ -20,7 +20,7 @@ ChassisObject const& lineOf(CommandContext const& context, Chassis const& chassi
     ChassisObject const& object = context.arguments.object(chassis, "line");
     if (object.ds1Line) return object;
     throw CommandError(std::string(nameOf(object.kind)) + ' ' + std::to_string(object.handle) +
-                       " has no line; \"line-list\" lists those that have");
+                       " has no line; \"kvlsim line list\" lists those that have");
 }
 
 /// Runs `change(line, now, board)` on the line that the command names.

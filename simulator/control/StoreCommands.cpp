@@ -61,7 +61,7 @@ Json listStore(CommandContext const& context) {
     }
     if (one && reply["boards"].empty())
         throw CommandError("no record with serial number " + inQuotes(serial) +
-                           " in the store; \"store-list\" lists what is there");
+                           " in the store; \"kvlsim store list\" lists what is there");
     return reply;
 }
 

@@ -5,6 +5,7 @@
 
 #include "simulator/base/Text.h"
 #include "simulator/chassis/AttributeSchema.h"
+#include "simulator/chassis/Chassis.h"
 #include "simulator/chassis/ChassisError.h"
 #include "simulator/description/AttributeReader.h"
 #include "simulator/description/Description.h"
@@ -180,6 +181,10 @@ AttributeMap readAttributes(Description const& attributes) {
         throw ChassisError(attributes.line,
                            "attributes cannot be " + attributes.words() +
                                "; write one attribute a line, such as NAME: NX5-T1");
+    if (attributes.entries.size() > Chassis::kMaxAttributes)
+        throw ChassisError(attributes.line, std::to_string(attributes.entries.size()) +
+                                                " attributes are too many; an object has at most " +
+                                                std::to_string(Chassis::kMaxAttributes));
     AttributeMap map;
     for (auto const& entry : attributes.entries) {
         refuseUnfitName(entry.key, entry.line);

@@ -39,7 +39,7 @@ constexpr std::array<std::string_view, 6> kDeviceKeys = {"handle",     "type", "
 constexpr std::array<std::string_view, 3> kSubDeviceKeys = {"handle", "type", "attributes"};
 constexpr std::array<std::string_view, 2> kProcessorKeys = {"handle", "attributes"};
 
-constexpr std::size_t kMaxFileSize = std::size_t(256) << 20;
+constexpr std::size_t kMaxFileSize = std::size_t(32) << 20;
 
 std::int32_t readHandle(Description const& object, ObjectKind kind) {
     std::string const what = nameOf(kind);
@@ -110,13 +110,20 @@ void readDeviceParts(Description const& item, ObjectDraft& device) {
     auto const type = AttributeValue::number(static_cast<std::int32_t>(device.ds1Line->type));
     auto const [attribute, isNew] = device.attributes.emplace(kDS1LineType, type);
     AttributeValue const& written = attribute->second;
-    if (isNew || written.form() == ValueForm::empty || written.asNumber() == type.asNumber())
-        return;
-    throw ChassisError(
-        line->line,
-        "the line of " + what + " is of type " + std::string(nameOf(device.ds1Line->type)) + " (" +
-            std::to_string(type.asNumber()) + "), but its LINE_TYPE is " +
-            std::to_string(written.asNumber()) + "; remove LINE_TYPE from the attributes");
+    std::string const ofType = "the line of " + what + " is of type " +
+                               std::string(nameOf(device.ds1Line->type)) + " (" +
+                               std::to_string(type.asNumber()) + ")";
+    bool const empty = written.form() == ValueForm::empty;
+    if (!isNew && (empty || written.asNumber() != type.asNumber()))
+        throw ChassisError(line->line, ofType + ", but its LINE_TYPE is " +
+                                           (empty ? "empty" : std::to_string(written.asNumber())) +
+                                           "; remove LINE_TYPE from the attributes");
+    bool const isT1 =
+        device.ds1Line->type == DS1LineType::esf || device.ds1Line->type == DS1LineType::d4;
+    if (isT1 && device.channels && device.channels->bearers() > kMaxT1Bearers)
+        throw ChassisError(channels->line, ofType + ", which carries at most " +
+                                               std::to_string(kMaxT1Bearers) + " channels, not " +
+                                               std::to_string(device.channels->bearers()));
 }
 
 void readChildren(Description const& parent, std::string_view key, ObjectKind kind, Keys keys,
@@ -228,7 +235,7 @@ std::string readChassisFile(std::string const& path) {
     while (std::size_t const size = std::fread(block.data(), 1, block.size(), file.get())) {
         text.append(block.data(), size);
         if (text.size() > kMaxFileSize)
-            throw ChassisError(0, "too large; a chassis file has at most 256 MiB");
+            throw ChassisError(0, "too large; a chassis file has at most 32 MiB");
     }
     if (std::ferror(file.get()) != 0) fail(errno);
     return text;

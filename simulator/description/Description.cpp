@@ -24,6 +24,9 @@ namespace {
 // spells, spell, alarms.
 constexpr std::size_t kMaxDepth = 12;
 
+// A value takes some 200 bytes as a tree.
+constexpr std::size_t kMaxValues = 2'000'000;
+
 [[noreturn]] void refuseDepth(int line) {
     throw ChassisError(line, "too many nested levels; a chassis needs at most " +
                                  std::to_string(kMaxDepth));
@@ -134,6 +137,9 @@ class TreeBuilder final : public YAML::EventHandler {
     }
 
     void add(Description node) {
+        if (++m_values > kMaxValues)
+            throw ChassisError(node.line, "too many values; a chassis has at most " +
+                                              std::to_string(kMaxValues));
         if (m_open.empty()) {
             m_root = std::move(node);
             return;
@@ -154,6 +160,7 @@ class TreeBuilder final : public YAML::EventHandler {
     }
 
     bool m_begun = false;
+    std::size_t m_values = 0; ///< keys included
     Description m_root;
     std::vector<Open> m_open;
 };

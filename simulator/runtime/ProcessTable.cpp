@@ -165,9 +165,10 @@ void ProcessTable::end(pid_t pid) {
     dropEnded();
     auto const found = std::ranges::find(m_entries, pid, &Entry::pid);
     if (found == m_entries.end())
-        throw ProcessError("no process " + std::to_string(pid) +
-                           " was added; \"process-list\" lists what is there (a process found by "
-                           "its command is taken off the list by that name)");
+        throw ProcessError(
+            "no process " + std::to_string(pid) +
+            " was added; \"kvlsim process list\" lists what is there (a process found by "
+            "its command is taken off the list by that name)");
     if (found->draft.kind == ProcessKind::self)
         throw ProcessError("process " + std::to_string(pid) +
                            " runs the platform itself; it cannot be taken off its own list");
@@ -185,7 +186,7 @@ std::size_t ProcessTable::end(std::string const& name) {
     });
     if (ended == 0)
         throw ProcessError("no process " + inQuotes(name) +
-                           " was added; \"process-list\" lists what is there");
+                           " was added; \"kvlsim process list\" lists what is there");
     return ended;
 }
 

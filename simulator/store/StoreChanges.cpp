@@ -34,7 +34,7 @@ std::vector<Found> presentBoards(Database& database, std::string const& serial) 
     auto found = boardsWith(database, serial);
     if (found.empty())
         throw StoreError("no record with serial number " + inQuotes(serial) +
-                         " in the store; \"store-list\" lists what is there");
+                         " in the store; \"kvlsim store list\" lists what is there");
     return found;
 }
 
@@ -151,7 +151,7 @@ void AttributeStore::removeFamily(std::string const& name) {
         auto const families = familiesCalled(database, name);
         if (families.empty())
             throw StoreError("no family " + inQuotes(name) +
-                             " in the store; \"store-list\" lists what is there");
+                             " in the store; \"kvlsim store list\" lists what is there");
         for (std::int64_t const family : families) {
             run(database, "DELETE FROM record WHERE parent = ?1 AND type = 'Board'", family);
             run(database, "DELETE FROM record WHERE instance = ?1", family);

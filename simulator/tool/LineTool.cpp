@@ -48,9 +48,9 @@ std::string words(Json const& value) {
 }
 
 std::string typeWords(Json const& type) {
-    static constexpr std::array<char const*, 6> names = {"-", "-", "esf", "d4", "e1", "e1-crc"};
-    auto const number = type.is_number_integer() ? type.get<std::int64_t>() : 0;
-    return number >= 2 && number <= 5 ? names[static_cast<std::size_t>(number)] : words(type);
+    if (!type.is_number_integer()) return words(type);
+    auto const name = nameOf(static_cast<DS1LineType>(type.get<std::int32_t>()));
+    return name.empty() ? words(type) : std::string(name);
 }
 
 void list(Options const& options, Connect const& connect) {

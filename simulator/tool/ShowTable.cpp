@@ -48,18 +48,46 @@ std::string count(Json const& board, char const* list) {
     return std::to_string(board.contains(list) ? board.at(list).size() : 0);
 }
 
+/// A value as people read it: 11, a text, "7 (2 bytes)", "1, 1, 16, 1".
+std::string readable(Json const& value) {
+    if (value.is_string()) return oneLine(value.get<std::string>());
+    if (!value.is_object()) return value.dump();
+    if (value.contains("short")) return value.at("short").dump() + " (2 bytes)";
+    if (value.contains("byte")) return value.at("byte").dump() + " (1 byte)";
+    if (value.contains("empty")) return "(no bytes)";
+    if (!value.contains("descriptor")) return value.dump();
+    std::string words;
+    for (auto const& word : value.at("descriptor"))
+        appendToList(words, word.dump());
+    return words;
+}
+
 void printAttributes(Json const& object, std::size_t indent, std::ostream& out) {
     for (auto const& [name, value] : object.at("attributes").items())
         out << std::string(indent, ' ') << std::left << std::setw(22) << oneLine(name) << "  "
-            << (value.is_string() ? oneLine(value.get<std::string>()) : value.dump()) << '\n';
+            << readable(value) << '\n';
 }
 
-/// A line's past is left out: it may be long, and is over.
-void printPart(Json const& object, char const* name, std::size_t indent, std::ostream& out) {
-    if (!object.contains(name)) return;
-    Json part = object.at(name);
-    part.erase("past");
-    out << std::string(indent, ' ') << name << ' ' << part.dump() << '\n';
+/// "line: e1-crc, alarms rai, errors per second code-violations 0.5". Its past is left out.
+void printLine(Json const& object, std::size_t indent, std::ostream& out) {
+    if (!object.contains("line")) return;
+    Json const& line = object.at("line");
+    std::string alarms;
+    for (auto const& alarm : line.at("alarms"))
+        appendToList(alarms, alarm.get<std::string>());
+    std::string errors;
+    for (auto const& [name, rate] : line.at("errors").items())
+        appendToList(errors, name + ' ' + rate.dump());
+    out << std::string(indent, ' ') << "line: " << readable(line.at("type"))
+        << (alarms.empty() ? ", no alarms" : ", alarms " + alarms)
+        << (errors.empty() ? ", no steady errors" : ", errors per second " + errors) << '\n';
+}
+
+void printChannels(Json const& object, std::size_t indent, std::ostream& out) {
+    if (!object.contains("channels")) return;
+    Json const& channels = object.at("channels");
+    out << std::string(indent, ' ') << "channels: " << channels.at("bearers").dump()
+        << " bearers, signalling " << readable(channels.at("signalling")) << '\n';
 }
 
 void printObjects(Json const& parent, char const* list, char const* kind, std::size_t indent,
@@ -70,8 +98,8 @@ void printObjects(Json const& parent, char const* list, char const* kind, std::s
         if (object.contains("type")) out << ", type " << object.at("type").dump();
         out << '\n';
         printAttributes(object, indent + 2, out);
-        printPart(object, "line", indent + 2, out);
-        printPart(object, "channels", indent + 2, out);
+        printLine(object, indent + 2, out);
+        printChannels(object, indent + 2, out);
         printObjects(object, "subdevices", "sub-device", indent + 2, out);
     }
 }

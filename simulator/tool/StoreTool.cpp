@@ -101,6 +101,9 @@ void set(Options const& options, Connect const& connect) {
 
 void remove(Options const& options, Connect const& connect) {
     ControlClient client = connect();
+    // All are looked up before the first is removed: a wrong one removes nothing.
+    for (auto const& serial : options.serials)
+        client.request({{"command", "store-list"}, {"serial", serial}});
     for (auto const& serial : options.serials)
         client.request({{"command", "store-remove"}, {"serial", serial}});
     if (!options.family.empty())

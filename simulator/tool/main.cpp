@@ -1,11 +1,14 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // kvlsim: controls a simulated board platform while it runs, makes and checks chassis files.
+#include <algorithm>
 #include <cstdlib>
 #include <functional>
 #include <iostream>
+#include <set>
 
 #include <CLI/CLI.hpp>
 
+#include "simulator/base/Text.h"
 #include "simulator/chassis/AttributeSchema.h"
 #include "simulator/chassis/ChassisError.h"
 #include "simulator/description/ChassisReader.h"
@@ -71,10 +74,17 @@ void change(Options const& options, Json const& command) {
 }
 
 void changeBoards(Options const& options, char const* command) {
-    std::vector<Json> commands;
-    for (auto const& board : options.boards)
-        commands.push_back({{"command", command}, {"board", board}});
     auto client = connect(options);
+    std::vector<Json> commands;
+    std::set<std::int64_t> handles;
+    // All are looked up before the first is changed: a wrong name changes nothing.
+    for (auto const& board : options.boards) {
+        Json const shown = client.request({{"command", "show"}, {"board", board}});
+        auto const handle = shown.at("boards").at(0).at("handle").get<std::int64_t>();
+        if (!handles.insert(handle).second)
+            throw ToolError("board " + std::to_string(handle) + " is named twice; nothing is done");
+        commands.push_back({{"command", command}, {"board", handle}});
+    }
     change(options, client, commands);
 }
 
@@ -148,8 +158,10 @@ void drain(Options const& options) {
 }
 
 void generate(Options const& options) {
-    if (kvlsim::Generator::objects(options.generator) >= kvlsim::Chassis::kRootHandle)
-        throw ToolError("so many objects have no handles; ask for fewer boards or devices");
+    if (kvlsim::Generator::objects(options.generator) >
+        static_cast<std::int64_t>(kvlsim::Chassis::kMaxObjects))
+        throw ToolError("a chassis has at most " + std::to_string(kvlsim::Chassis::kMaxObjects) +
+                        " objects; ask for fewer boards, devices or lines");
     std::string const text = kvlsim::Generator(options.generator).chassis();
     if (!options.output.empty()) {
         kvlsim::writeWholeFile(options.output, text);
@@ -286,6 +298,33 @@ void addOtherCommands(CLI::App& app, Options& options, Run& chosen) {
     command->add_option("file", options.file, "Chassis file")->required();
 }
 
+/// Says which command was meant by a word that is none; empty when the words name a command.
+std::string unknownCommand(CLI::App const& app, std::vector<std::string> const& words) {
+    CLI::App const* at = &app;
+    std::string path;
+    for (std::size_t i = 0; i < words.size(); ++i) {
+        if (words[i].starts_with('-')) {
+            if (words[i] == "--socket" || words[i] == "--timeout") ++i; // and its value
+            continue;
+        }
+        auto const commands = at->get_subcommands([](auto const*) { return true; });
+        if (commands.empty()) return {};
+        std::vector<std::string> names;
+        for (auto const* command : commands)
+            names.push_back(command->get_name());
+        auto const found = std::ranges::find(names, words[i]);
+        if (found != names.end()) {
+            at = commands[static_cast<std::size_t>(found - names.begin())];
+            path += words[i] + " ";
+            continue;
+        }
+        std::string const meant = kvlsim::nearestWord(words[i], names);
+        return "there is no command " + kvlsim::inQuotes(path + words[i]) +
+               (meant.empty() ? std::string() : "; did you mean \"" + path + meant + "\"?");
+    }
+    return {};
+}
+
 } // namespace
 
 int main(int argc, char** argv) {
@@ -313,7 +352,10 @@ int main(int argc, char** argv) {
     } catch (CLI::Success const& success) {
         return app.exit(success);
     } catch (CLI::ParseError const& error) {
-        std::cerr << "kvlsim: " << error.what() << "; kvlsim --help explains\n";
+        std::string const unknown = unknownCommand(app, {argv + 1, argv + argc});
+        std::cerr << "kvlsim: " << (unknown.empty() ? error.what() : unknown)
+                  << (unknown.ends_with('?') ? " kvlsim --help lists the commands\n"
+                                             : "; kvlsim --help explains\n");
         return kUsage;
     }
     if (chosenNested) chosen = [&chosenNested](Options const&) { chosenNested(); };

@@ -152,7 +152,7 @@ INSTANTIATE_TEST_SUITE_P(
         BadCommand{"NoTrunk", R"({"command": "call-setup"})",
                    "argument \"trunk\" is missing; give it"},
         BadCommand{"DeviceWithoutChannels", R"({"command": "call-setup", "trunk": 33})",
-                   "device 33 has no channels; \"call-list\" lists those that have"},
+                   "device 33 has no channels; \"kvlsim call list\" lists those that have"},
         BadCommand{"ChannelInUse", R"({"command": "call-setup", "trunk": 32, "channel": 1})",
                    "channel 1 of trunk 32 is connecting; release it first"},
         BadCommand{"NoIdleChannel", R"({"command": "call-setup", "trunk": 32})",

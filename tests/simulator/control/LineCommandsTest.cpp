@@ -178,11 +178,11 @@ INSTANTIATE_TEST_SUITE_P(
         BadCommand{"NoLine", R"({"command": "line-mend"})",
                    "argument \"line\" is missing; give it"},
         BadCommand{"UnknownObject", R"({"command": "line-mend", "line": 99})",
-                   "no object 99 in the chassis; \"show\" lists what is there"},
+                   "no object 99 in the chassis; \"kvlsim show\" lists what is there"},
         BadCommand{"DeviceWithoutLine", R"({"command": "line-mend", "line": "voice"})",
-                   "device 53 has no line; \"line-list\" lists those that have"},
+                   "device 53 has no line; \"kvlsim line list\" lists those that have"},
         BadCommand{"Board", R"({"command": "line-mend", "line": "S5"})",
-                   "board 5 has no line; \"line-list\" lists those that have"},
+                   "board 5 has no line; \"kvlsim line list\" lists those that have"},
         BadCommand{"NoErrors", R"({"command": "line-errors", "line": 51, "errors": {}})",
                    "\"errors\" is empty; write for example {\"code-violations\": 5}"},
         BadCommand{"ErrorsAreANumber", R"({"command": "line-errors", "line": 51, "errors": 5})",
@@ -220,14 +220,15 @@ INSTANTIATE_TEST_SUITE_P(
                    "LINE_COUNTERS is answered by a line or by ISDN channels; \"line-list\" and "
                    "\"call-list\" show what there is"},
         BadCommand{"SetOfAnUnknownType",
-                   R"({"command": "set", "object": 51, "attribute": "LINE_TYPE", "value": 6})",
-                   "LINE_TYPE of a line is 2 (esf), 3 (d4), 4 (e1) or 5 (e1-crc), in 4 bytes"},
+                   R"({"command": "set", "object": 51, "attribute": "LINE_TYPE", "value": 8})",
+                   "LINE_TYPE of a line is one of 2 (esf), 3 (d4), 4 (e1), 5 (e1-crc), 6 (e1-mf), "
+                   "7 (e1-crc-mf), in 4 bytes"},
         BadCommand{"InsertOfABadLine",
                    R"({"command": "insert", "board": {"handle": 6,
                        "attributes": {"SERIAL_NUMBER": "S6"},
                        "devices": [{"handle": 61, "type": 501, "line": {"type": "t1"}}]}})",
                    "the line of device 61 cannot be of type \"t1\"; choose one of esf, d4, e1, "
-                   "e1-crc"}),
+                   "e1-crc, e1-mf, e1-crc-mf"}),
     [](auto const& command) { return command.param.name; });
 
 } // namespace

@@ -251,4 +251,52 @@ TEST(ChassisReaderTest, DeepNestingIsRefusedWithoutUsingUpTheStack) {
               "chassis:1: too many nested levels; a chassis needs at most 12");
 }
 
+TEST(ChassisReaderTest, TooManyValuesAreRefusedWhileTheyAreRead) {
+    std::string text = "boards:\n  - [";
+    for (int i = 0; i < 2000000; ++i)
+        text += "1,";
+    EXPECT_EQ(refusalOf(text + "1]\n"),
+              "chassis:2: too many values; a chassis has at most 2000000");
+}
+
+TEST(ChassisReaderTest, TooManyObjectsAreRefused) {
+    ObjectDraft board;
+    board.handle = 1;
+    board.line = 7;
+    for (std::int32_t i = 0; i < 200000; ++i) {
+        ObjectDraft device;
+        device.kind = ObjectKind::device;
+        device.handle = i + 2;
+        board.children.push_back(std::move(device));
+    }
+    Chassis chassis;
+    try {
+        chassis.insertBoard(board);
+        FAIL() << "accepted";
+    } catch (ChassisError const& error) {
+        EXPECT_EQ(describeError("chassis", error),
+                  "chassis:7: board 1 is too much: a chassis has at most 200000 boards, devices, "
+                  "sub-devices and processors");
+    }
+    board.children.pop_back();
+    chassis.insertBoard(std::move(board));
+}
+
+TEST(ChassisReaderTest, TooManyAttributesAreRefused) {
+    std::string attributes;
+    for (int i = 0; i < 999; ++i)
+        attributes += "      A" + std::to_string(i) + ": 1\n";
+    EXPECT_EQ(refusalOf(boardWith(attributes)), "accepted");
+    EXPECT_EQ(refusalOf(boardWith(attributes + "      MORE: 1\n")),
+              "chassis:4: 1001 attributes are too many; an object has at most 1000");
+}
+
+TEST(ChassisReaderTest, AttributeTooManyIsRefusedAtRunTime) {
+    Chassis chassis = readChassis(boardWith(""));
+    for (int i = static_cast<int>(chassis.find(1)->attributes.size()); i < 1000; ++i)
+        chassis.setAttribute(1, "A" + std::to_string(i), AttributeValue::number(i));
+    EXPECT_THROW(chassis.setAttribute(1, "MORE", AttributeValue::number(1)), ChassisError);
+    chassis.setAttribute(1, "A999", AttributeValue::number(1));
+}
+
 } // namespace

@@ -51,7 +51,8 @@ INSTANTIATE_TEST_SUITE_P(
         BadFixture{"line-is-a-text.yaml",
                    ":7: the line of device 2 cannot be the text \"esf\"; begin it with \"type:\""},
         BadFixture{"line-no-type.yaml",
-                   ":7: the line of device 2 has no type; give it one of esf, d4, e1, e1-crc"},
+                   ":7: the line of device 2 has no type; give it one of esf, d4, e1, "
+                   "e1-crc, e1-mf, e1-crc-mf"},
         BadFixture{"line-of-a-subdevice.yaml",
                    ":8: unknown key \"line\" in sub-device 3; known: handle, type, attributes"},
         BadFixture{"line-past-is-a-number.yaml",
@@ -98,6 +99,13 @@ INSTANTIATE_TEST_SUITE_P(
         BadFixture{
             "line-spells-is-a-map.yaml",
             ":11: spells cannot be a map; write a list, each spell beginning with \"- ago:\""},
+        BadFixture{
+            "line-bearers-of-a-t1.yaml",
+            ":9: the line of device 2 is of type esf (2), which carries at most 24 channels, "
+            "not 30"},
+        BadFixture{"line-type-empty.yaml",
+                   ":8: the line of device 2 is of type e1 (4), but its LINE_TYPE is empty; remove "
+                   "LINE_TYPE from the attributes"},
         BadFixture{"line-type-contradicted.yaml",
                    ":8: the line of device 2 is of type esf (2), but its LINE_TYPE is 3; remove "
                    "LINE_TYPE from the attributes"},
@@ -112,7 +120,8 @@ INSTANTIATE_TEST_SUITE_P(
             "line-unknown-key.yaml",
             ":9: unknown key \"error\" in the line of device 2; known: type, errors, alarms, past"},
         BadFixture{"line-unknown-type.yaml", ":8: the line of device 2 cannot be of type \"t1\"; "
-                                             "choose one of esf, d4, e1, e1-crc"}),
+                                             "choose one of esf, d4, e1, e1-crc, e1-mf, "
+                                             "e1-crc-mf"}),
     [](auto const& each) {
         std::string name = each.param.file;
         name.erase(name.find('.'));
@@ -142,7 +151,8 @@ TEST(LinePartsTest, TypeOfTheLineBecomesItsLineType) {
     struct {
         char const* name;
         int number;
-    } constexpr types[] = {{"esf", 2}, {"d4", 3}, {"e1", 4}, {"e1-crc", 5}};
+    } constexpr types[] = {{"esf", 2},    {"d4", 3},    {"e1", 4},
+                           {"e1-crc", 5}, {"e1-mf", 6}, {"e1-crc-mf", 7}};
     for (auto const& [name, number] : types) {
         Chassis const chassis = readChassis(withDevice(std::string("line: {type: ") + name + "}"));
         EXPECT_EQ(chassis.find(2)->attribute("LINE_TYPE")->asNumber(), number) << name;
@@ -152,12 +162,6 @@ TEST(LinePartsTest, TypeOfTheLineBecomesItsLineType) {
 TEST(LinePartsTest, LineTypeThatAgreesMayBeWritten) {
     Chassis const chassis = readChassis(withDevice("attributes: {LINE_TYPE: 3}, line: {type: d4}"));
     EXPECT_EQ(chassis.find(2)->attribute("LINE_TYPE")->asNumber(), 3);
-}
-
-TEST(LinePartsTest, LineTypeMayBeWrittenAsAnAnswerWithoutBytes) {
-    Chassis const chassis =
-        readChassis(withDevice("attributes: {LINE_TYPE: {empty: true}}, line: {type: d4}"));
-    EXPECT_EQ(chassis.find(2)->attribute("LINE_TYPE")->bytes().size(), 0U);
 }
 
 TEST(LinePartsTest, EveryAlarmAndErrorIsRead) {

@@ -190,10 +190,11 @@ INSTANTIATE_TEST_SUITE_P(
                   "it cannot be among its fields, remove it"},
         BadChange{"NoFields", R"({"command": "store-set", "serial": "A1"})",
                   "argument \"fields\" is missing; give it"},
-        BadChange{"UnknownSerialNumber",
-                  R"({"command": "store-set", "serial": "Z1", "fields": {"IRQ": 1}})",
-                  "no record with serial number \"Z1\" in the store; \"store-list\" lists what is "
-                  "there"},
+        BadChange{
+            "UnknownSerialNumber",
+            R"({"command": "store-set", "serial": "Z1", "fields": {"IRQ": 1}})",
+            "no record with serial number \"Z1\" in the store; \"kvlsim store list\" lists what is "
+            "there"},
         BadChange{"RemoveOfAnUnknownOne", R"({"command": "store-remove", "serial": "Z1"})",
                   "no record with serial number \"Z1\" in the store"},
         BadChange{"RemoveOfAnUnknownFamily", R"({"command": "store-remove", "family": "ZZ"})",

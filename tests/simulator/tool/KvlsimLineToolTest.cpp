@@ -75,13 +75,13 @@ TEST_F(KvlsimLineToolTest, WrongUseOfLinesIsRefused) {
     expectRefusal({"line", "alarm", "102"}, 2, "; kvlsim --help explains\n");
     expectRefusal({"line", "alarm", "102", "red"}, 1, "kvlsim: no alarm is called \"red\"; ");
     expectRefusal({"line", "mend", "103"}, 1,
-                  "kvlsim: device 103 has no line; \"line-list\" lists those that have\n");
+                  "kvlsim: device 103 has no line; \"kvlsim line list\" lists those that have\n");
 }
 
 TEST_F(KvlsimLineToolTest, ShowDescribesLineAndChannels) {
     std::string const text = succeed({"show", "3"});
-    EXPECT_THAT(text, HasSubstr(R"(line {"alarms":[],"errors":{},"type":"e1-crc"})"));
-    EXPECT_THAT(text, HasSubstr(R"(channels {"bearers":30,"signalling":"l2"})"));
+    EXPECT_THAT(text, HasSubstr("line: e1-crc, no alarms, no steady errors\n"));
+    EXPECT_THAT(text, HasSubstr("channels: 30 bearers, signalling l2\n"));
 }
 
 TEST_F(KvlsimLineToolTest, InsertedBoardBringsItsLinesAndChannels) {
@@ -129,8 +129,9 @@ TEST_F(KvlsimLineToolTest, WrongUseOfCallsIsRefused) {
     expectRefusal({"call", "release", "301", "1", "--all"}, 2, "; kvlsim --help explains\n");
     expectRefusal({"call", "setup", "301", "31"}, 1,
                   "kvlsim: \"channel\" cannot be \"31\"; write a whole number from 1 to 30\n");
-    expectRefusal({"call", "setup", "101"}, 1,
-                  "kvlsim: device 101 has no channels; \"call-list\" lists those that have\n");
+    expectRefusal(
+        {"call", "setup", "101"}, 1,
+        "kvlsim: device 101 has no channels; \"kvlsim call list\" lists those that have\n");
 }
 
 TEST_F(KvlsimLineToolTest, ScriptRunsItsLines) {

@@ -190,7 +190,59 @@ TEST_F(KvlsimToolTest, ShowOfOneBoardListsItsDevices) {
 TEST_F(KvlsimToolTest, RefusalOfThePlatformIsPassedOn) {
     hold();
     expectRefusal({"stop", "77"}, 1,
-                  "kvlsim: no board \"77\" in the chassis; \"show\" lists what is there");
+                  "kvlsim: no board \"77\" in the chassis; \"kvlsim show\" lists what is there");
+}
+
+TEST_F(KvlsimToolTest, MisspeltCommandIsToldWhatWasMeant) {
+    expectRefusal(
+        {"stpo", "1"}, 2,
+        "kvlsim: there is no command \"stpo\"; did you mean \"stop\"? kvlsim --help lists "
+        "the commands");
+    expectRefusal({"--socket", "/x", "line", "alrm", "101", "los"}, 2,
+                  "kvlsim: there is no command \"line alrm\"; did you mean \"line alarm\"? kvlsim "
+                  "--help lists the commands");
+    expectRefusal({"frobnicate"}, 2,
+                  "kvlsim: there is no command \"frobnicate\"; kvlsim --help explains");
+}
+
+TEST_F(KvlsimToolTest, OneWrongBoardAmongSeveralChangesNothing) {
+    ChildProcess& process = hold();
+    expectRefusal({"remove", "1", "NONE"}, 1,
+                  "kvlsim: no board \"NONE\" in the chassis; \"kvlsim show\" lists what is there");
+    expectRefusal({"stop", "1", "NX5-T1"}, 1, "kvlsim: board 1 is named twice; nothing is done");
+    process.writeLine("read 1 NAME");
+    EXPECT_EQ(process.readLine(), "value NX5-T1"); // no event came before
+}
+
+TEST_F(KvlsimToolTest, ShowOfADeviceSaysWhoseItIs) {
+    hold();
+    expectRefusal({"show", "101"}, 1,
+                  "kvlsim: 101 is a device of board 1, not a board; name board 1");
+    expectRefusal({"show", "111"}, 1,
+                  "kvlsim: 111 is a sub-device of board 1, not a board; name board 1");
+}
+
+TEST_F(KvlsimToolTest, ShowOfOneBoardIsReadable) {
+    hold(
+        {"KVLSIM_CHASSIS=" +
+         write(
+             "chassis.yaml",
+             "boards:\n"
+             "  - handle: 1\n"
+             "    attributes: {SERIAL_NUMBER: \"A1\", LOGICAL ID: {short: 7}, IRQ: {empty: true}}\n"
+             "    devices:\n"
+             "      - handle: 2\n"
+             "        type: 501\n"
+             "        attributes: {TSCADDR: {descriptor: [1, 2, 3, 4]}}\n"
+             "        line: {type: e1-crc, alarms: [rai, los], errors: {slips: 0.5}}\n"
+             "        channels: {bearers: 3}\n")});
+    std::string const text = kvlsim({"show", "1"}).out;
+    for (char const* part :
+         {"LOGICAL ID              7 (2 bytes)\n", "IRQ                     (no bytes)\n",
+          "TSCADDR                 1, 2, 3, 4\n",
+          "line: e1-crc, alarms los, rai, errors per second slips 0.5\n",
+          "channels: 3 bearers, signalling l2\n"})
+        EXPECT_THAT(text, HasSubstr(part));
 }
 
 TEST_F(KvlsimToolTest, WithoutASocketItSaysHowToNameOne) {
