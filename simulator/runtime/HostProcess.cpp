@@ -69,6 +69,8 @@ class SpawnPlan {
         posix_spawn_file_actions_adddup2(&m_files, input, STDIN_FILENO);
         posix_spawn_file_actions_adddup2(&m_files, output, STDOUT_FILENO);
         posix_spawn_file_actions_addopen(&m_files, STDERR_FILENO, "/dev/null", O_WRONLY, 0);
+        // Sockets of the program that uses the platform are not for its processes.
+        posix_spawn_file_actions_addclosefrom_np(&m_files, STDERR_FILENO + 1);
         posix_spawnattr_init(&m_attributes);
         sigset_t none;
         sigemptyset(&none);

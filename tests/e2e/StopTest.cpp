@@ -1,7 +1,11 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The agent ends cleanly whatever it is doing. Sanitizers report through its exit status.
+#include <fcntl.h>
+
 #include <atomic>
 #include <csignal>
+#include <filesystem>
+#include <fstream>
 #include <thread>
 
 #include <gmock/gmock.h>
@@ -86,6 +90,24 @@ TEST_F(StopDuringStartTest, HangUpDoesNotEndTheStart) {
     agent().signal(SIGHUP);
     agent().signal(SIGTERM);
     EXPECT_EQ(agent().wait(), 128 + SIGTERM);
+}
+
+TEST_F(StopTest, AddressesAreNotInheritedByOtherPrograms) {
+    startAgent();
+    std::string const process = "/proc/" + std::to_string(agent().pid());
+    int sockets = 0;
+    for (auto const& file : std::filesystem::directory_iterator(process + "/fd")) {
+        std::error_code error;
+        if (!read_symlink(file, error).string().starts_with("socket:")) continue;
+        std::ifstream info(process + "/fdinfo/" + file.path().filename().string());
+        std::string word;
+        while (info >> word && word != "flags:") {
+        }
+        info >> word;
+        EXPECT_TRUE(std::stoul(word, nullptr, 8) & O_CLOEXEC) << file << ' ' << word;
+        ++sockets;
+    }
+    EXPECT_GT(sockets, 0);
 }
 
 TEST_F(StopTest, AgentStartsAgainOnTheSamePortAfterwards) {

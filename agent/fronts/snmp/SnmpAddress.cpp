@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/fronts/snmp/SnmpAddress.h"
 
+#include <fcntl.h>
+
 #include <cerrno>
 #include <cstring>
 
@@ -35,6 +37,8 @@ std::string openAddress(std::string const& address) {
                    "; check --listen, as in udp:127.0.0.1:1161";
         }
     }
+    // A program that a board module starts may outlive the agent, and would keep the port in use.
+    fcntl(transport->sock, F_SETFD, FD_CLOEXEC);
     if (netsnmp_register_agent_nsap(transport) == 0)
         return "cannot listen on " + address + ": the SNMP library refuses the address";
     return {};
