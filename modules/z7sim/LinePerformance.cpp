@@ -51,11 +51,12 @@ void LinePerformance::begin(LineDefects const& defects) {
     m_frame.begin(defects.lossOfSignal || defects.outOfFrame);
     m_indication.begin(defects.alarmIndication);
     m_unavailable = defects != LineDefects();
+    noteFailures();
 }
 
 LinePerformance::Change LinePerformance::count(LineSecond const& second) {
     LineCounts counts = availableSecond(second);
-    if (m_unavailable || counts.severelyErrorSeconds != 0 || hasDefect(second) || !isQuiet())
+    if (m_unavailable || counts.severelyErrorSeconds != 0 || hasDefect(second) || !m_isQuiet)
         return countClosely(second, counts);
     // Nothing of this second will ever be corrected, nor of those before it.
     m_run = 0;
@@ -92,6 +93,7 @@ void LinePerformance::interrupt() {
     m_signal.interrupt();
     m_frame.interrupt();
     m_indication.interrupt();
+    noteFailures();
 }
 
 void LinePerformance::closeInterval() {
@@ -108,6 +110,13 @@ void LinePerformance::countFailures(LineSecond const& second) {
     m_frame.count(noFrame, signalLost || frameLost, m_times);
     m_indication.count(second.alarmIndication, second.alarmIndication && !ended.alarmIndication,
                        m_times);
+    noteFailures();
+}
+
+/// Keeps at hand what every second asks about the failures.
+void LinePerformance::noteFailures() {
+    m_isQuiet = m_signal.isIdle() && m_frame.isIdle() && m_indication.isIdle();
+    m_failures = {m_signal.isDeclared(), m_frame.isDeclared(), m_indication.isDeclared()};
 }
 
 /// How many of the last seconds of an available line have turned out to be unavailable.

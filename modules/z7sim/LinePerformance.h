@@ -9,7 +9,7 @@
 #include "LineFailures.h"
 
 /// How a line is framed, which decides what of its errors can be seen.
-enum class LineFormat {
+enum class LineFormat : std::uint8_t {
     esf,   ///< T1, extended superframes: has a CRC
     d4,    ///< T1, superframes: has none
     e1,    ///< E1 without CRC
@@ -105,9 +105,7 @@ class LinePerformance {
 
     bool unavailable() const { return m_unavailable; }
     /// The failures. A line without signal has no frame either.
-    LineDefects failures() const {
-        return {m_signal.isDeclared(), m_frame.isDeclared(), m_indication.isDeclared()};
-    }
+    LineDefects failures() const { return m_failures; }
 
   private:
     /// The seconds so far of the sixty that may become a degraded minute.
@@ -130,7 +128,7 @@ class LinePerformance {
     bool severe(LineSecond const& second, LineCounts const& counts) const;
     LineCounts availableSecond(LineSecond const& second) const;
     bool completesDegradedMinute(LineCounts const& counts);
-    bool isQuiet() const { return m_signal.isIdle() && m_frame.isIdle() && m_indication.isIdle(); }
+    void noteFailures();
     void countFailures(LineSecond const& second);
     Change countClosely(LineSecond const& second, LineCounts counts);
     int secondsToTakeBack() const;
@@ -142,10 +140,12 @@ class LinePerformance {
     Recent const& recent(int ago) const { return const_cast<LinePerformance*>(this)->recent(ago); }
     void remember(LineCounts const& counts, Minute const& before);
 
-    // What every second touches lies together.
+    // What every second reads lies together.
     Minute m_minute;
     LineFormat m_format;
     bool m_unavailable = false;
+    bool m_isQuiet = true;  ///< no defect lasts, and no failure is declared
+    LineDefects m_failures; ///< those that are declared
     /// Seconds in a row, up to now, that speak for the line's becoming the other: severely errored
     /// while it is available, good while it is unavailable.
     int m_run = 0;

@@ -5,7 +5,7 @@
 
 void LineSeconds::begin(std::uint32_t age, std::int64_t time) {
     begin(time);
-    m_zero = m_age = age;
+    m_age = age;
     m_hasAge = m_hasBeginning = true;
 }
 
@@ -16,36 +16,31 @@ void LineSeconds::begin(std::int64_t time) {
 
 LineTick LineSeconds::answered(std::uint32_t age, std::int64_t time) {
     std::int64_t const skipped = leftOut(time);
-    std::int64_t const passed = age - m_age;
-    // By how much the line's age is ahead of this tick; ahead by one is within the difference of
-    // the clocks.
-    std::int64_t const ahead = age - m_zero - (m_position + 1);
+    std::int64_t const passed = std::int64_t{age} - m_age;
+    // With this tick. Ahead or behind by one is within the difference of the clocks.
+    std::int64_t const ahead = m_ahead + passed - 1;
     bool const startedOver = !m_hasAge || passed < 0;
-    m_still = passed == 0 ? m_still + 1 : 0;
-    bool const standsStill = m_still > 1;
+    bool const standsStill = passed == 0 && m_isStill;
+    m_isStill = passed == 0;
     m_age = age;
     m_hasAge = true;
+    m_ahead = 0;
     if (!m_hasBeginning || startedOver || standsStill) {
         std::int64_t const more = !startedOver && ahead > 1 ? ahead : 0;
-        LineTick const tick = miss(1 + std::max(skipped, more));
-        m_zero = age - m_position;
         m_hasBeginning = !standsStill;
-        return tick;
+        return {1 + std::max(skipped, more), false};
     }
     // Three seconds of the line's age take more than two.
-    if (skipped > 0 || passed > 2) {
-        LineTick const tick = miss(1 + std::max({skipped, ahead, passed - 2}));
-        m_zero = age - m_position;
-        return tick;
-    }
-    ++m_position;
-    m_zero += std::clamp<std::int64_t>(ahead, -1, 1) == ahead ? 0 : ahead;
+    if (skipped > 0 || passed > 2) return {1 + std::max({skipped, ahead, passed - 2}), false};
+    if (ahead >= -1 && ahead <= 1) m_ahead = ahead;
     return {0, true};
 }
 
 LineTick LineSeconds::silent(std::int64_t time) {
+    std::int64_t const missed = 1 + leftOut(time);
     m_hasBeginning = false;
-    return miss(1 + leftOut(time));
+    m_ahead -= missed;
+    return {missed, false};
 }
 
 /// The ticks that were left out before that of `time`.
@@ -53,9 +48,4 @@ std::int64_t LineSeconds::leftOut(std::int64_t time) {
     std::int64_t const skipped = time - m_time - 1;
     m_time = time;
     return std::max<std::int64_t>(skipped, 0);
-}
-
-LineTick LineSeconds::miss(std::int64_t seconds) {
-    m_position += seconds;
-    return {seconds, false};
 }

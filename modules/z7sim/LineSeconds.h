@@ -32,13 +32,13 @@ class LineSeconds {
 
   private:
     std::int64_t leftOut(std::int64_t time);
-    LineTick miss(std::int64_t seconds);
 
-    std::int64_t m_time = 0;     ///< of the last tick
-    std::int64_t m_position = 0; ///< seconds accounted for
-    std::int64_t m_zero = 0;     ///< the line's age at position 0
-    std::int64_t m_age = 0;      ///< as read last
-    int m_still = 0;             ///< ticks in a row in which the line's age stayed the same
+    std::int64_t m_time = 0; ///< of the last tick
+    /// By how much the line's age, as read last, is ahead of the seconds accounted for: seen or
+    /// missed.
+    std::int64_t m_ahead = 0;
+    std::uint32_t m_age = 0;     ///< as read last
+    bool m_isStill = false;      ///< the age is the one of the tick before
     bool m_hasAge = false;       ///< the line has answered at all
     bool m_hasBeginning = false; ///< the beginning of the second under way was read
 };

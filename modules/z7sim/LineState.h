@@ -34,6 +34,7 @@ class LineState {
 
   private:
     std::uint64_t const m_number;
+    std::uint64_t m_madeOf = 0; ///< the alarms and failures that the status shows; for the tick
     std::atomic<int> m_status{1};
     std::atomic<int> m_trapEnable{2};
     mutable std::mutex m_mutex; ///< guards the two below
