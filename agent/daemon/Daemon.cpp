@@ -35,6 +35,7 @@
 #include "agent/readers/BoardSource.h"
 #include "agent/readers/Collector.h"
 #include "agent/readers/EntityReader.h"
+#include "agent/readers/HostInterfaces.h"
 #include "agent/readers/InterfaceReader.h"
 #include "agent/readers/KeptSettings.h"
 #include "agent/readers/PlatformReader.h"
@@ -230,6 +231,8 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     StableIndices indices(interfaceFile, options.interfaceBase);
     KeptSettings keptSettings(interfaceFile, indices, boards.settings);
     interfaceFile.open();
+    HostInterfaces host;
+    if (!options.agentx.empty()) indices.skipTo(host.highest() + 1);
     InterfaceReader interfaces(*boards.manager.get(), indices, started);
     StateFile entityFile(directory + "/entity.sqlite", "physical entities");
     StableIndices entityIndices(entityFile, kFirstEntity);
@@ -246,7 +249,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             snapshot.processes = readProcesses(statistics);
             snapshot.resources = readResources(*boards.manager.get(), snapshot.boards);
             snapshot.records = platform.read(snapshot.boards);
-            boards.lines.listen(snapshot.boards, interfaces.uptime());
+            boards.lines.listen(snapshot.boards, interfaces.changeTimes());
             snapshot.interfaces = interfaces.read(snapshot.boards);
             boards.faults.compare(shownLineFaults(snapshot.interfaces), Clock::now());
             snapshot.faults = boards.faults.read(started);
@@ -255,6 +258,9 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             applySettings(boards.settings, lines);
             links.update(snapshot.interfaces.interfaces, snapshot.begun);
             snapshot.entities = entities.read(snapshot);
+            if (!options.agentx.empty())
+                snapshot.interfaceConflicts =
+                    host.conflicts(snapshot.interfaces.interfaces, snapshot.begun);
             snapshot.persistence = worst(interfaceFile.state(), entityFile.state());
         },
         started, [&] { wakeup.wake(); });

@@ -2,6 +2,7 @@
 #include "agent/notifications/LineListener.h"
 
 #include "agent/notifications/StandardNotifications.h"
+#include "agent/readers/BoardFaults.h"
 #include "agent/readers/BoardFeatures.h"
 #include "agent/rows/StandardNumbers.h"
 
@@ -28,19 +29,21 @@ int LineListener::ProcessLineStatusEvent(ReferenceCounter<DS1LineStatusEvent> ev
     return 0;
 }
 
-void LineListener::listen(std::vector<BoardRow> const& boards, Uptime const& uptime) {
+void LineListener::listen(std::vector<BoardRow> const& boards, ChangeTimes& times) {
     {
         std::scoped_lock const guard(m_mutex);
-        m_uptime = uptime;
+        m_times = &times;
     }
     decltype(m_features) present;
     for (BoardRow const& row : boards) {
         auto const board = m_manager.GetBoardByIndex(static_cast<int>(row.boardIndex));
         Board* const asked = board.get();
         if (asked == nullptr) continue;
-        forEachFeature<DS1LineFeature>(*asked, [&](DS1LineFeature& feature) {
-            present.emplace(&feature, ReferenceCounter<DS1LineFeature>(&feature));
-            if (!m_features.contains(&feature)) feature.AddLineStatusListener(this);
+        readGuarded(row.boardIndex, "line features", [&] {
+            forEachFeature<DS1LineFeature>(*asked, [&](DS1LineFeature& feature) {
+                if (!m_features.contains(&feature)) feature.AddLineStatusListener(this);
+                present.emplace(&feature, ReferenceCounter<DS1LineFeature>(&feature));
+            });
         });
     }
     m_features = std::move(present);
@@ -65,9 +68,11 @@ void LineListener::enqueue(std::uint32_t ifIndex, Change const& change) {
     int const enable =
         m_settings.find({Setting::LineStatusChangeTraps, ifIndex}).value_or(change.enable);
     if (enable != kEnabled) return;
-    std::uint32_t const lastChange =
-        change.lastChange < 0 ? m_uptime->now() : m_uptime->of(change.lastChange);
-    m_queue.push(lineStatusChange(ifIndex, change.status, lastChange, change.when));
+    std::uint32_t const ticks = change.lastChange < 0
+                                    ? m_times->uptime().at(change.when)
+                                    : m_times->at(ifIndex, change.lastChange, change.when);
+    m_queue.push(
+        lineStatusChange(ifIndex, change.status, m_counters.sysUpTime(ticks), change.when));
 }
 
 void LineListener::start(std::function<void()> changed) {
@@ -86,9 +91,12 @@ void applySettings(Settings const& settings, std::vector<PlacedLine> const& line
     for (PlacedLine const& placed : lines) {
         auto const set = settings.find({Setting::LineStatusChangeTraps, placed.ifIndex});
         DS1LineDevice* const line = placed.line.get();
+        if (!set) continue;
         // A line that refuses is not an error: the agent itself obeys the setting.
-        if (set && line->GetLineStatusChangeTrapEnable() != *set)
-            line->SetLineStatusChangeTrapEnable(*set);
+        readGuarded(placed.boardIndex, "lines' settings", [&] {
+            if (line->GetLineStatusChangeTrapEnable() != *set)
+                line->SetLineStatusChangeTrapEnable(*set);
+        });
     }
 }
 

@@ -11,10 +11,10 @@
 #include <vector>
 
 #include "agent/notifications/NotificationQueue.h"
+#include "agent/readers/ChangeTimes.h"
 #include "agent/readers/PlacedLine.h"
 #include "agent/rows/BoardRow.h"
 #include "agent/rows/Settings.h"
-#include "agent/rows/Uptime.h"
 #include "board/BoardManager.h"
 #include "board/DS1LineFeature.h"
 
@@ -37,8 +37,9 @@ class LineListener final : public DS1LineStatusListener {
 
     // Called before and after every refresh of the lines. Thread-bound: the collector.
 
-    /// Subscribes to the line features of `boards` to which it is not subscribed yet.
-    void listen(std::vector<BoardRow> const& boards, Uptime const& uptime);
+    /// Subscribes to the line features of `boards` to which it is not subscribed yet. `times`
+    /// outlives the process's last line event.
+    void listen(std::vector<BoardRow> const& boards, ChangeTimes& times);
     /// Takes over the ifIndex of every line, and queues the changes that waited for one.
     void place(std::vector<PlacedLine> const& lines);
 
@@ -73,7 +74,7 @@ class LineListener final : public DS1LineStatusListener {
     /// lines, which may have another ifIndex.
     std::map<DS1LineDevice const*, PlacedLine> m_places;
     std::vector<Change> m_waiting;
-    std::optional<Uptime> m_uptime;
+    ChangeTimes* m_times = nullptr; ///< set by `listen`
     std::function<void()> m_changed;
     bool m_stopped = false;
 };

@@ -58,7 +58,7 @@ constexpr Column<Row> kConfigColumns[] = {
     {"dsx1Fdl", 13, Integer, number<&Row::fdl>},
     {"dsx1InvalidIntervals", 14, Integer, invalidIntervals},
     {"dsx1LineLength", 15, Integer, number<&Row::lineLength>},
-    {"dsx1LineStatusLastChange", 16, TimeTicks, number<&Row::statusLastChange>},
+    {"dsx1LineStatusLastChange", 16, TimeStamp, number<&Row::statusLastChange>},
     {"dsx1LineStatusChangeTrapEnable", 17, Integer, number<&Row::statusChangeTrapEnable>, kTraps},
     {"dsx1LoopbackStatus", 18, Integer, number<&Row::loopbackStatus>},
     {"dsx1Ds1ChannelNumber", 19, Integer, number<&Row::ds1ChannelNumber>},

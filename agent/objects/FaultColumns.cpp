@@ -15,7 +15,7 @@ Value plain(FaultRow const& row) {
 }
 
 constexpr Column<FaultRow> kColumns[] = {
-    {"kvlFaultTime", 3, TimeTicks, plain<&FaultRow::time>},
+    {"kvlFaultTime", 3, TimeStamp, plain<&FaultRow::time>},
     {"kvlFaultDate", 4, Date, textIfKnown<&FaultRow::date>},
     {"kvlFaultTimesRaised", 5, Counter, plain<&FaultRow::times>},
     {"kvlFaultPlatformBoard", 6, Integer, plain<&FaultRow::platformBoard>},

@@ -59,7 +59,7 @@ constexpr Column<Row> kColumns[] = {
     {"ifPhysAddress", 6, Octets, textIfKnown<&Row::physAddress>},
     {"ifAdminStatus", 7, Integer, number<&Row::adminStatus>},
     {"ifOperStatus", 8, Integer, number<&Row::operStatus>},
-    {"ifLastChange", 9, TimeTicks, number<&Row::lastChange>},
+    {"ifLastChange", 9, TimeStamp, number<&Row::lastChange>},
     {"ifInOctets", 10, Counter, count32<kInOctets>},
     {"ifInUcastPkts", 11, Counter, count32<kInUcastPkts>},
     {"ifInDiscards", 13, Counter, count32<kInDiscards>},
@@ -81,7 +81,7 @@ constexpr Column<Row> kMoreColumns[] = {
     {"ifHighSpeed", 15, Gauge, highSpeed},
     {"ifConnectorPresent", 17, Integer, number<&Row::connectorPresent>},
     {"ifAlias", 18, Text, text<&Row::alias>},
-    {"ifCounterDiscontinuityTime", 19, TimeTicks, discontinuity},
+    {"ifCounterDiscontinuityTime", 19, TimeStamp, discontinuity},
 };
 
 constexpr Column<StackRow> kStackColumns[] = {

@@ -46,17 +46,17 @@ Lookup ObjectTree::find(Facts const& facts, OidView name, Instance& found) const
     if (around == nullptr) return Lookup::NoSuchObject;
     Node const& node = *around;
     OidView const index = name.subspan(node.place.size());
+    Value value;
     if (node.scalar != nullptr) {
         if (std::is_neq(compare(index, kScalarIndex))) return Lookup::NoSuchInstance;
-        found.value = node.scalar->get(facts);
+        value = node.scalar->get(facts);
     } else {
         std::size_t const row = node.table->firstRow(facts, index, true);
         if (row == node.table->rowCount(facts) || node.table->firstRow(facts, index, false) == row)
             return Lookup::NoSuchInstance;
-        found.value = node.table->value(facts, node.column, row);
+        value = node.table->value(facts, node.column, row);
     }
-    found.type = node.type;
-    return isKnown(found.value) ? Lookup::Found : Lookup::NoSuchInstance;
+    return fill(found, node, facts, value) ? Lookup::Found : Lookup::NoSuchInstance;
 }
 
 bool ObjectTree::next(Facts const& facts, OidView name, bool orEqual, Instance& found) const {
@@ -94,26 +94,34 @@ SetFault ObjectTree::test(Facts const& facts, OidView name, std::optional<std::i
     return SetFault::None;
 }
 
+bool ObjectTree::fill(Instance& found, Node const& node, Facts const& facts, Value const& value) {
+    found.value = value;
+    found.type = node.type;
+    if (node.type == ValueType::TimeStamp) {
+        found.type = ValueType::TimeTicks;
+        if (auto const* const ticks = std::get_if<std::int64_t>(&value))
+            found.value =
+                std::int64_t{facts.counters.sysUpTime(static_cast<std::uint32_t>(*ticks))};
+    }
+    return isKnown(value);
+}
+
 bool ObjectTree::firstIn(Node const& node, Facts const& facts, OidView index, bool orEqual,
                          Instance& found) {
     if (node.scalar != nullptr) {
         auto const order = compare(index, kScalarIndex);
         if (std::is_gt(order) || (std::is_eq(order) && !orEqual)) return false;
-        found.value = node.scalar->get(facts);
-        if (!isKnown(found.value)) return false;
+        if (!fill(found, node, facts, node.scalar->get(facts))) return false;
         found.name = node.place;
         found.name.push_back(kScalarIndex[0]);
-        found.type = node.type;
         return true;
     }
     std::size_t const rows = node.table->rowCount(facts);
     for (std::size_t row = node.table->firstRow(facts, index, orEqual); row < rows; ++row) {
-        found.value = node.table->value(facts, node.column, row);
-        if (!isKnown(found.value)) continue;
+        if (!fill(found, node, facts, node.table->value(facts, node.column, row))) continue;
         found.name.reserve(kUsualName);
         found.name = node.place;
         node.table->appendIndex(facts, row, found.name);
-        found.type = node.type;
         return true;
     }
     return false;

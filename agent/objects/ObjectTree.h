@@ -81,6 +81,8 @@ class ObjectTree {
     std::vector<Node>::const_iterator nodeAbove(OidView name) const;
     /// The node whose place `name` begins with; null when there is none.
     Node const* nodeOf(OidView name) const;
+    /// Gives `found` the node's value, if it is known.
+    static bool fill(Instance& found, Node const& node, Facts const& facts, Value const& value);
     static bool firstIn(Node const& node, Facts const& facts, OidView index, bool orEqual,
                         Instance& found);
 

@@ -55,7 +55,7 @@ std::span<Scalar const> scalars() {
          [](Facts const& facts) { return size(facts.snapshot.boards); }},
         {"kvlBoardTableLastChange",
          {1, 1, 2, 2},
-         ValueType::TimeTicks,
+         ValueType::TimeStamp,
          [](Facts const& facts) -> Value { return std::int64_t{facts.snapshot.lastChange}; }},
         {"kvlBoardStatusChanges",
          {1, 1, 2, 3},
@@ -83,7 +83,7 @@ std::span<Scalar const> scalars() {
          [](Facts const& facts) -> Value { return std::int64_t{facts.snapshot.faults.raised}; }},
         {"kvlFaultTableLastChange",
          {1, 1, 8, 3},
-         ValueType::TimeTicks,
+         ValueType::TimeStamp,
          [](Facts const& facts) -> Value {
              return std::int64_t{facts.snapshot.faults.lastChange};
          }},
@@ -153,6 +153,13 @@ std::span<Scalar const> scalars() {
          [](Facts const& facts) {
              return facts.counters.master == Master::None ? Value{}
                                                           : count(facts.counters.masterLosses);
+         }},
+        {"kvlInterfaceConflicts",
+         {1, 1, 9, 15},
+         ValueType::Gauge,
+         [](Facts const& facts) -> Value {
+             if (facts.counters.master == Master::None) return {};
+             return std::int64_t{facts.snapshot.interfaceConflicts};
          }},
         {"kvlPersistence",
          {1, 1, 9, 14},

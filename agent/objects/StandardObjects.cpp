@@ -13,19 +13,19 @@ std::span<Scalar const> standardScalars() {
          }},
         {"ifTableLastChange",
          {31, 1, 5},
-         ValueType::TimeTicks,
+         ValueType::TimeStamp,
          [](Facts const& facts) -> Value {
              return std::int64_t{facts.snapshot.interfaces.lastChange};
          }},
         {"ifStackLastChange",
          {31, 1, 6},
-         ValueType::TimeTicks,
+         ValueType::TimeStamp,
          [](Facts const& facts) -> Value {
              return std::int64_t{facts.snapshot.interfaces.stackLastChange};
          }},
         {"entLastChangeTime",
          {47, 1, 4, 1},
-         ValueType::TimeTicks,
+         ValueType::TimeStamp,
          [](Facts const& facts) -> Value {
              return std::int64_t{facts.snapshot.entities.lastChange};
          }},

@@ -15,7 +15,8 @@ enum class ValueType {
     Counter,   ///< 32 bits, wraps
     Counter64, ///< 64 bits
     Gauge,     ///< unsigned, 32 bits
-    TimeTicks, ///< hundredths of a second since the agent's start
+    TimeTicks, ///< a duration in hundredths of a second
+    TimeStamp, ///< sysUpTime at some event; described as a time since the agent's start
     Text,      ///< printable characters
     Octets,    ///< any
     Date,      ///< 11 octets: date, time of day, offset from UTC

@@ -148,8 +148,8 @@ void Reading::readLine(DS1LineDevice& line) {
     row.transmitClockSource = unlessNegative(line.GetTransmitClockSource());
     row.fdl = unlessNegative(line.GetFdl());
     row.lineLength = unlessNegative(line.GetLineLength());
-    if (long const change = line.GetLineStatusLastChange(); change >= 0)
-        row.statusLastChange = m_toTicks(change);
+    long const change = line.GetLineStatusLastChange();
+    m_found.lineChanges.push_back(change < 0 ? std::nullopt : std::optional(change));
     row.statusChangeTrapEnable = unlessNegative(line.GetLineStatusChangeTrapEnable());
     row.loopbackStatus = unlessNegative(line.GetLoopbackStatus());
     row.ds1ChannelNumber = unlessNegative(line.GetDs1ChannelNumber());

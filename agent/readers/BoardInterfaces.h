@@ -3,6 +3,7 @@
 #pragma once
 
 #include <functional>
+#include <optional>
 #include <vector>
 
 #include "agent/readers/LineHistories.h"
@@ -19,7 +20,9 @@ namespace kvloamd {
 struct BoardInterfaces {
     std::vector<IndexKey> keys; ///< all different
     InterfaceRows rows;
-    std::vector<ReferenceCounter<DS1LineDevice>> lines; ///< as `rows.lines`
+    // In the order of `rows.lines`.
+    std::vector<ReferenceCounter<DS1LineDevice>> lines;
+    std::vector<std::optional<long>> lineChanges; ///< when their status changed: since the epoch
 };
 
 /// Seconds since the epoch as hundredths of a second since the agent's start.

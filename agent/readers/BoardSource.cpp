@@ -2,7 +2,11 @@
 #include "agent/readers/BoardSource.h"
 
 #include <algorithm>
+#include <exception>
+#include <string>
 
+#include "agent/readers/Answers.h"
+#include "agent/readers/BoardFaults.h"
 #include "agent/readers/BoardReader.h"
 #include "agent/readers/Courtesy.h"
 
@@ -11,17 +15,41 @@ namespace kvloamd {
 std::vector<BoardRow> BoardSource::read() {
     std::vector<int> const present = indices();
     forgetGoneBoards(present);
+    std::erase_if(m_answered, [&](auto const& entry) {
+        return !std::ranges::binary_search(present, static_cast<int>(entry.first));
+    });
     std::vector<BoardRow> rows;
     rows.reserve(present.size());
     for (int const index : present) {
         ReferenceCounter<Board> const board = m_manager.GetBoardByIndex(index);
         if (Board* const asked = board.get(); asked != nullptr)
-            rows.push_back(readBoard(*asked, index));
+            rows.push_back(readRow(*asked, index));
         giveWay();
     }
     std::erase_if(
         rows, [this](BoardRow const& row) { return hasGone(static_cast<int>(row.boardIndex)); });
     return rows;
+}
+
+BoardRow BoardSource::readRow(Board& board, int index) {
+    auto const boardIndex = static_cast<std::uint32_t>(index);
+    BoardRow& answered = m_answered[boardIndex];
+    answered.boardIndex = boardIndex;
+    std::string fault;
+    if (readGuarded(boardIndex, "answers", [&] {
+            try {
+                answered = readBoard(board, index);
+            } catch (std::exception const& error) {
+                fault = error.what();
+                throw;
+            }
+        }))
+        return answered;
+    BoardRow row = answered;
+    row.status = BoardStatusNone;
+    row.secondaryStatus = BoardStatusNone;
+    row.errorMessage = printable("does not answer: " + fault);
+    return row;
 }
 
 void BoardSource::boardHasGone(int index) {

@@ -5,14 +5,18 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <exception>
+#include <string>
 #include <utility>
+
+#include "agent/log/Log.h"
 
 namespace kvloamd {
 
 namespace {
 
-/// A request that comes while boards are read has the processor at once, should there be one only.
-/// Not the least: where others keep all processors busy, boards are still read.
+/// On a single processor, a request that arrives while boards are read is served at once. Not the
+/// lowest priority: boards must be read even if other programs keep all processors busy.
 constexpr int kNiceness = 15;
 
 } // namespace
@@ -67,7 +71,7 @@ void Collector::renew() {
 }
 
 void Collector::begin(std::promise<void> first) {
-    // Of this thread only. Without it, everything works, with some requests a few ms later.
+    // For this thread only. If it fails, some requests are answered a few ms later.
     setpriority(PRIO_PROCESS, static_cast<id_t>(gettid()), kNiceness);
     try {
         m_snapshot = collect(nullptr);
@@ -80,24 +84,25 @@ void Collector::begin(std::promise<void> first) {
 }
 
 void Collector::run() {
-    // Goes once there is a newer one, when no request uses it any more: giving all its rows back
-    // takes a while, which is no request's to spend.
+    // Destroyed here, after the next snapshot: freeing all rows takes a while, which must not delay
+    // a request.
     std::shared_ptr<Snapshot const> former;
     std::unique_lock lock(m_mutex);
     while (!m_stop) {
-        m_wake.wait_until(lock, m_snapshot->begun + m_pace.idle,
+        m_wake.wait_until(lock, m_tried + m_pace.idle,
                           [this] { return m_stop || m_requested || m_eventful; });
-        // Events come in crowds: one snapshot shows them all.
+        // Events come in bursts; one snapshot shows them all.
         if (!m_requested)
-            m_wake.wait_until(lock, m_snapshot->begun + m_pace.eventPause,
-                              [this] { return m_stop; });
+            m_wake.wait_until(lock, m_tried + m_pace.eventPause, [this] { return m_stop; });
         if (m_stop) return;
         m_requested = false;
         m_eventful = false;
         std::shared_ptr<Snapshot const> snapshot = m_snapshot;
         lock.unlock();
-        snapshot = collect(snapshot.get());
+        std::shared_ptr<Snapshot const> renewed = tryToCollect(snapshot.get());
         lock.lock();
+        if (!renewed) continue;
+        snapshot = std::move(renewed);
         m_snapshot.swap(snapshot);
         lock.unlock();
         former = std::move(snapshot);
@@ -106,9 +111,27 @@ void Collector::run() {
     }
 }
 
+std::shared_ptr<Snapshot const> Collector::tryToCollect(Snapshot const* former) {
+    std::string why;
+    try {
+        auto snapshot = collect(former);
+        if (std::exchange(m_failing, false))
+            log(LogLevel::Info, "the boards and the platform can be read again");
+        return snapshot;
+    } catch (std::exception const& error) {
+        why = error.what();
+    } catch (...) {
+        why = "unknown exception";
+    }
+    if (!std::exchange(m_failing, true))
+        log(LogLevel::Error, "the boards and the platform cannot be read: " + why +
+                                 "; the agent answers from its last snapshot and keeps trying");
+    return nullptr;
+}
+
 std::shared_ptr<Snapshot const> Collector::collect(Snapshot const* former) {
     auto snapshot = std::make_shared<Snapshot>();
-    snapshot->begun = Clock::now();
+    m_tried = snapshot->begun = Clock::now();
     m_readRows(*snapshot);
     snapshot->refreshTime =
         std::chrono::duration_cast<std::chrono::milliseconds>(Clock::now() - snapshot->begun);

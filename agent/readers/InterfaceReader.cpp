@@ -7,6 +7,7 @@
 #include <set>
 #include <utility>
 
+#include "agent/readers/BoardFaults.h"
 #include "agent/readers/BoardKeys.h"
 #include "agent/readers/Courtesy.h"
 #include "agent/rows/StandardNumbers.h"
@@ -54,7 +55,7 @@ void completeStack(InterfaceRows& all) {
 
 InterfaceReader::InterfaceReader(BoardManager& manager, StableIndices& indices,
                                  Clock::time_point started)
-    : m_manager(manager), m_indices(indices), m_uptime(started) {}
+    : m_manager(manager), m_indices(indices), m_uptime(started), m_changeTimes(started) {}
 
 InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     InterfaceRows all;
@@ -72,9 +73,11 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
         auto const board = m_manager.GetBoardByIndex(static_cast<int>(boardIndex));
         Board* const asked = board.get();
         if (asked == nullptr) continue;
-        BoardInterfaces found = readInterfaces(*asked, toTicks, m_histories);
-        auto const indices = m_indices.indicesOf(keys[i], found.keys);
-        append(all, std::move(found), indices, boardIndex);
+        readGuarded(boardIndex, "interfaces", [&] {
+            BoardInterfaces found = readInterfaces(*asked, toTicks, m_histories);
+            auto const indices = m_indices.indicesOf(keys[i], found.keys);
+            append(all, std::move(found), indices, boardIndex);
+        });
         giveWay();
     }
     m_indices.save();
@@ -104,9 +107,14 @@ void InterfaceReader::append(InterfaceRows& all, BoardInterfaces&& board,
     moveRows(all.interfaces, board.rows.interfaces, indices);
     std::for_each(all.interfaces.begin() + begin, all.interfaces.end(),
                   [&](InterfaceRow& row) { countOn(row, boardIndex); });
-    for (std::size_t i = 0; i < board.lines.size(); ++i)
-        if (auto const index = indices[board.rows.lines[i].ifIndex - 1]; index != 0)
-            m_lines.push_back({index, std::move(board.lines[i])});
+    Clock::time_point const now = Clock::now();
+    for (std::size_t i = 0; i < board.lines.size(); ++i) {
+        auto const index = indices[board.rows.lines[i].ifIndex - 1];
+        if (index == 0) continue;
+        if (auto const date = board.lineChanges[i])
+            board.rows.lines[i].statusLastChange = m_changeTimes.at(index, *date, now);
+        m_lines.push_back({index, std::move(board.lines[i]), boardIndex});
+    }
     moveRows(all.lines, board.rows.lines, indices);
     moveRows(all.bearers, board.rows.bearers, indices);
     moveRows(all.signalling, board.rows.signalling, indices);
@@ -124,8 +132,11 @@ void InterfaceReader::countOn(InterfaceRow& row, std::uint32_t boardIndex) {
     auto const [place, isNew] = m_counted.try_emplace(row.ifIndex);
     Counted& counted = place->second;
     if (isNew || counted.boardIndex != boardIndex)
-        counted = {boardIndex, m_read ? m_uptime.now() : 0, row.counters, m_reading};
+        counted = {boardIndex,     m_read ? m_uptime.now() : 0,
+                   row.counters,   row.operStatus,
+                   row.lastChange, m_reading};
     counted.reading = m_reading;
+    noteOperStatus(row, counted);
     for (std::size_t i = 0; i < row.counters.size(); ++i) {
         if (!row.counters[i]) continue;
         if (!counted.counters[i]) {
@@ -138,6 +149,14 @@ void InterfaceReader::countOn(InterfaceRow& row, std::uint32_t boardIndex) {
     }
     row.discontinuity = counted.since;
     row.boardIndex = boardIndex;
+}
+
+void InterfaceReader::noteOperStatus(InterfaceRow& row, Counted& counted) const {
+    if (counted.operStatus != row.operStatus) {
+        counted.operStatus = row.operStatus;
+        counted.lastChange = m_uptime.now();
+    }
+    if (row.lastChange) row.lastChange = counted.lastChange;
 }
 
 void InterfaceReader::noteChanges(InterfaceRows& all) {

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "agent/readers/BoardInterfaces.h"
+#include "agent/readers/ChangeTimes.h"
 #include "agent/readers/PlacedLine.h"
 #include "agent/readers/StableIndices.h"
 #include "agent/rows/BoardRow.h"
@@ -33,7 +34,8 @@ class InterfaceReader {
     /// The lines of the last reading.
     std::vector<PlacedLine> takeLines() { return std::exchange(m_lines, {}); }
 
-    Uptime const& uptime() const { return m_uptime; }
+    /// When lines changed.
+    ChangeTimes& changeTimes() { return m_changeTimes; }
 
   private:
     using Counters = decltype(InterfaceRow::counters);
@@ -43,17 +45,22 @@ class InterfaceReader {
         std::uint32_t boardIndex; ///< a board that comes back has another
         std::uint32_t since;
         Counters counters;
-        std::uint64_t reading; ///< the last that found the interface
+        std::optional<int> operStatus;
+        std::optional<std::uint32_t> lastChange; ///< of `operStatus`
+        std::uint64_t reading;                   ///< the last that found the interface
     };
 
     void append(InterfaceRows& all, BoardInterfaces&& board,
                 std::vector<std::uint32_t> const& indices, std::uint32_t boardIndex);
     void countOn(InterfaceRow& row, std::uint32_t boardIndex);
+    /// Says when the row's ifOperStatus changed, whatever else of the interface has changed.
+    void noteOperStatus(InterfaceRow& row, Counted& counted) const;
     void noteChanges(InterfaceRows& all);
 
     BoardManager& m_manager;
     StableIndices& m_indices;
     Uptime const m_uptime;
+    ChangeTimes m_changeTimes;
     LineHistories m_histories;
     std::vector<PlacedLine> m_lines;
     std::unordered_map<std::uint32_t, Counted> m_counted; ///< by ifIndex

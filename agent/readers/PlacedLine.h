@@ -12,6 +12,7 @@ namespace kvloamd {
 struct PlacedLine {
     std::uint32_t ifIndex;
     ReferenceCounter<DS1LineDevice> line;
+    std::uint32_t boardIndex = 0;
 };
 
 } // namespace kvloamd

@@ -5,6 +5,7 @@
 #include <string_view>
 
 #include "agent/readers/Answers.h"
+#include "agent/readers/BoardFaults.h"
 #include "agent/readers/Courtesy.h"
 #include "board/ISDNChannel.h"
 #include "z7/Z7ResourceFeature.h"
@@ -83,7 +84,12 @@ std::vector<ResourceRow> readResources(BoardManager& manager, std::vector<BoardR
     std::vector<ResourceRow> rows;
     for (BoardRow const& row : boards) {
         auto const board = manager.GetBoardByIndex(static_cast<int>(row.boardIndex));
-        if (Board* const asked = board.get()) readBoardResources(*asked, row.boardIndex, rows);
+        std::size_t const before = rows.size();
+        if (Board* const asked = board.get();
+            asked != nullptr && !readGuarded(row.boardIndex, "resources", [&] {
+                readBoardResources(*asked, row.boardIndex, rows);
+            }))
+            rows.resize(before);
         giveWay();
     }
     return rows;

@@ -94,6 +94,11 @@ void StableIndices::makeRoom(std::string const& name, Board& board, std::size_t 
     m_changed = true;
 }
 
+void StableIndices::skipTo(std::uint32_t first) {
+    m_base = std::max(m_base, first);
+    m_free = std::max(m_free, std::uint64_t{m_base});
+}
+
 bool StableIndices::isStable(std::uint32_t index) const {
     return std::ranges::any_of(m_boards, [&](auto const& entry) {
         return entry.second.stable &&

@@ -47,6 +47,8 @@ class StableIndices final : private StatePart {
     /// Writes what is new since the last call, after every reading of all boards.
     void save();
 
+    /// From now on gives no index below `first` to a board that has no block with room.
+    void skipTo(std::uint32_t first);
     /// Whether `index` belongs to something that is identified across restarts.
     bool isStable(std::uint32_t index) const;
 

@@ -34,6 +34,7 @@ struct Snapshot {
     std::shared_ptr<PlatformRecords const> records = std::make_shared<PlatformRecords>(); ///< set
     InterfaceRows interfaces;
     EntityRows entities;
+    std::uint32_t interfaceConflicts = 0;        ///< of ifIndices with the host's own interfaces
     Persistence persistence = Persistence::Kept; ///< of the indices and settings
     Clock::time_point begun;                  ///< when reading began: what happened before is in it
     std::uint32_t number = 1;                 ///< how many have been made, this one included

@@ -31,12 +31,16 @@ class Uptime {
     /// `seconds` since the epoch, as the system's clock counts them now; 0 for a time before the
     /// agent's start. Never later than now.
     std::uint32_t of(long seconds) const {
-        Clock::duration const since = std::chrono::seconds(seconds) - (m_startDate + clockSteps());
+        std::chrono::seconds const date(std::clamp<std::int64_t>(seconds, 0, kLastDate));
+        Clock::duration const since = date - (m_startDate + clockSteps());
         Clock::duration const uptime = Clock::now() - m_started;
         return since <= Clock::duration::zero() ? 0 : timeTicks(std::min(since, uptime));
     }
 
   private:
+    /// Far ahead, and still a date of the system's clock.
+    static constexpr std::int64_t kLastDate = std::int64_t{1} << 33;
+
     /// By how much the system's clock has been set since the agent's start, in whole seconds.
     std::chrono::seconds clockSteps() const {
         return std::chrono::round<std::chrono::seconds>(startDate() - m_startDate);

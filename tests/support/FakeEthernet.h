@@ -17,6 +17,7 @@ class FakeEthernet final : public KVL::Ethernet {
     int inOctets = KVL::kNotSupported;
     int outErrors = KVL::kNotSupported;
     int lastChange = KVL::kNotSupported; ///< seconds since the epoch
+    int operStatus = KVL::kNotSupported;
     int fcsErrors = KVL::kNotSupported;
     std::string address;
 
@@ -35,7 +36,7 @@ class FakeEthernet final : public KVL::Ethernet {
     }
     int GetAdminStatus() override { return Interface::GetAdminStatus(); }
     int SetAdminStatus(int status) override { return Interface::SetAdminStatus(status); }
-    int GetOperStatus() override { return Interface::GetOperStatus(); }
+    int GetOperStatus() override { return operStatus; }
     int GetLastChange(int& seconds, int& microseconds) override {
         if (lastChange == KVL::kNotSupported) return KVL::kNotSupported;
         seconds = lastChange;
@@ -68,7 +69,7 @@ class FakeEthernet final : public KVL::Ethernet {
     int GetDuplexStatus() override { return KVL::kNotSupported; }
 };
 
-class FakeEthernetFeature final : public KVL::EthernetFeature {
+class FakeEthernetFeature : public KVL::EthernetFeature {
   public:
     explicit FakeEthernetFeature(std::vector<ReferenceCounter<KVL::Ethernet>> ports)
         : m_ports(std::move(ports)) {}

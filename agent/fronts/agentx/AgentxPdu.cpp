@@ -44,6 +44,7 @@ std::uint16_t typeOf(ValueType type) {
     case ValueType::Gauge:
         return kGauge;
     case ValueType::TimeTicks:
+    case ValueType::TimeStamp:
         return kTimeTicks;
     case ValueType::Counter64:
         return kCounter64;

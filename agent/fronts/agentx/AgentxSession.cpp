@@ -265,7 +265,7 @@ void AgentxSession::takeResponse(AgentxHeader const& header, std::string_view pa
     std::size_t const root = awaited->root;
     m_awaited.erase(awaited);
     AgentxReader reader(payload, header.networkOrder);
-    reader.number(); // the master's time
+    m_masterTime = {reader.number(), Clock::now()};
     auto const fault = static_cast<AgentxFault>(reader.number16());
     if (fault == AgentxFault::NotOpen) return drop("it has forgotten the session");
     switch (kind) {

@@ -4,6 +4,7 @@
 
 #include <chrono>
 #include <functional>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -67,6 +68,14 @@ class AgentxSession final : public NotificationSink {
     /// How often an established connection was lost.
     std::uint32_t timesLost() const { return m_timesLost; }
 
+    /// The master's sysUpTime as its last response had it, and when that came.
+    struct MasterTime {
+        std::uint32_t ticks;
+        Clock::time_point when;
+    };
+    /// Nothing before the first response.
+    std::optional<MasterTime> const& masterTime() const { return m_masterTime; }
+
     bool ready() const override { return isConnected() && !m_taken; }
     void send(Notification const& notification, std::function<void()> taken) override;
 
@@ -109,6 +118,7 @@ class AgentxSession final : public NotificationSink {
     std::uint32_t m_session = 0;
     std::uint32_t m_lastPacket = 0;
     std::vector<Awaited> m_awaited;
+    std::optional<MasterTime> m_masterTime;
     std::vector<std::string> m_refused; ///< roots whose refusal has been logged
     std::function<void()> m_taken;      ///< set while a notification awaits its response
     Clock::time_point m_retryAt;        ///< while away

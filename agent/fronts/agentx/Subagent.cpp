@@ -48,6 +48,8 @@ std::optional<Clock::time_point> Subagent::prepare(std::vector<pollfd>& polled) 
 
 void Subagent::handle(std::span<pollfd const> polled) {
     m_session->advance(polled.front().revents);
+    if (auto const& time = m_session->masterTime())
+        m_counters->setSysUpTime(time->ticks, time->when);
 }
 
 } // namespace kvloamd

@@ -135,6 +135,10 @@ std::string persistentDirectory(SnmpFiles const& files) {
     return directory == nullptr ? std::string() : std::string(directory);
 }
 
+std::uint32_t snmpUpTime() {
+    return static_cast<std::uint32_t>(netsnmp_get_agent_uptime());
+}
+
 void stopSnmp() {
     if (!started) return;
     snmp_shutdown(kAppName);

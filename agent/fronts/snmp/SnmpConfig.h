@@ -2,6 +2,7 @@
 // Starts the SNMP library with its configuration.
 #pragma once
 
+#include <cstdint>
 #include <string>
 #include <vector>
 
@@ -19,6 +20,9 @@ std::vector<std::string> startSnmp(SnmpFiles const& files);
 
 /// The directory of the state that is kept across restarts. Valid after `startSnmp`.
 std::string persistentDirectory(SnmpFiles const& files);
+
+/// The library's sysUpTime. After `startSnmp`.
+std::uint32_t snmpUpTime();
 
 /// Saves the state and stops the library.
 void stopSnmp();

@@ -22,6 +22,7 @@ unsigned char asnTypeOf(ValueType type) {
     case ValueType::Gauge:
         return ASN_GAUGE;
     case ValueType::TimeTicks:
+    case ValueType::TimeStamp:
         return ASN_TIMETICKS;
     case ValueType::ObjectId:
         return ASN_OBJECT_ID;

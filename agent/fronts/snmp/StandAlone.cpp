@@ -26,6 +26,7 @@ bool StandAlone::open() {
 }
 
 void StandAlone::serve(Served served) {
+    served.counters.setSysUpTime(snmpUpTime(), Clock::now());
     for (ServedTree const& each : served.trees) {
         SnmpHandler& handler = m_handlers.emplace_back(each.tree, served.counters, each.arc,
                                                        served.takeSnapshot, served.settings);

@@ -31,7 +31,7 @@ class LineStormTest : public ::testing::Test {
     }
     void read() {
         auto const boards = m_source.read();
-        m_listener.listen(boards, m_reader.uptime());
+        m_listener.listen(boards, m_reader.changeTimes());
         m_reader.read(boards);
         auto const lines = m_reader.takeLines();
         m_listener.place(lines);
@@ -53,7 +53,7 @@ TEST_F(LineStormTest, NoChangeIsMissedOrToldOutOfOrderWhileLinesAreRead) {
     for (int board = 0; board < kBoards; ++board)
         features.push_back(insert("B" + std::to_string(board)));
     // The first changes arrive before any line has an ifIndex.
-    m_listener.listen(m_source.read(), m_reader.uptime());
+    m_listener.listen(m_source.read(), m_reader.changeTimes());
     std::latch done(kBoards);
     std::vector<std::jthread> tellers;
     for (FakeLineFeature* const feature : features)

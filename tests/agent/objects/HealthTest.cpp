@@ -6,6 +6,7 @@
 
 #include <gtest/gtest.h>
 
+#include "agent/objects/ObjectTree.h"
 #include "agent/objects/OwnObjects.h"
 
 namespace kvloamd {
@@ -77,7 +78,44 @@ TEST_F(HealthTest, PersistenceIsThatOfTheSnapshot) {
     EXPECT_EQ(number("kvlPersistence"), 3);
 }
 
+TEST_F(HealthTest, TimesOfChangeAreThoseOfSysUpTimeAndTheUpTimeIsTheAgentsOwn) {
+    m_counters.started = Clock::now() - 1h;
+    m_snapshot.lastChange = 100000;
+    ObjectTree const tree(scalars(), {});
+    auto const served = [&](Oid name) {
+        Instance found;
+        EXPECT_EQ(tree.find({m_snapshot, m_counters}, name, found), Lookup::Found);
+        EXPECT_EQ(found.type, ValueType::TimeTicks);
+        return std::get<std::int64_t>(found.value);
+    };
+    Oid const change{1, 1, 2, 2, 0};
+    Oid const upTime{1, 1, 9, 1, 0};
+    EXPECT_EQ(served(change), 100000);
+    // The master has been up for two hours.
+    m_counters.setSysUpTime(720000, Clock::now());
+    EXPECT_NEAR(static_cast<double>(served(change)), 460000, 5);
+    EXPECT_LT(served(upTime), 720000);
+    // It has started anew: the change was before.
+    m_counters.setSysUpTime(1, Clock::now());
+    EXPECT_EQ(served(change), 0);
+    // What has not changed since the agent's start has not.
+    m_snapshot.lastChange = 0;
+    m_counters.setSysUpTime(720000, Clock::now());
+    EXPECT_EQ(served(change), 0);
+}
+
+TEST_F(HealthTest, DelaysOfTheMastersAnswersMoveNoTimes) {
+    auto const when = Clock::now() + 1h;
+    m_counters.setSysUpTime(720000, when);
+    auto const lead = m_counters.sysUpTimeLead.load();
+    m_counters.setSysUpTime(720005, when);
+    EXPECT_EQ(m_counters.sysUpTimeLead, lead);
+    m_counters.setSysUpTime(720500, when);
+    EXPECT_EQ(m_counters.sysUpTimeLead, lead + 500);
+}
+
 TEST_F(HealthTest, StandAloneAgentHasNoMaster) {
+    EXPECT_FALSE(isKnown(value("kvlInterfaceConflicts")));
     EXPECT_EQ(number("kvlAgentFront"), 1);
     EXPECT_FALSE(isKnown(value("kvlMasterState")));
     EXPECT_FALSE(isKnown(value("kvlMasterLosses")));
@@ -89,6 +127,8 @@ TEST_F(HealthTest, SubagentTellsOfItsMaster) {
     EXPECT_EQ(number("kvlAgentFront"), 2);
     EXPECT_EQ(number("kvlMasterState"), 1);
     EXPECT_EQ(number("kvlMasterLosses"), 2);
+    m_snapshot.interfaceConflicts = 3;
+    EXPECT_EQ(number("kvlInterfaceConflicts"), 3);
     m_counters.master = Master::Lost;
     EXPECT_EQ(number("kvlAgentFront"), 2);
     EXPECT_EQ(number("kvlMasterState"), 2);

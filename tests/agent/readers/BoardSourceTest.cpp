@@ -1,10 +1,13 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/readers/BoardSource.h"
 
+#include <stdexcept>
+
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
 #include "tests/support/FakeBoards.h"
+#include "tests/support/LogCapture.h"
 
 namespace kvloamd {
 namespace {
@@ -95,6 +98,36 @@ TEST_F(BoardSourceTest, BoardThatIsAnnouncedAsGoneIsLeftOutWhileTheTableStillHas
 TEST_F(BoardSourceTest, BoardThatIsAnnouncedAsGoneWhileItIsReadIsLeftOut) {
     FakeChassis::fake(m_boards[3]).whenAsked = [this] { m_source.boardHasGone(4); };
     EXPECT_THAT(readIndices(), ElementsAre(1, 2, 3));
+}
+
+TEST_F(BoardSourceTest, BoardThatThrowsIsShownAsNotAnsweringAndTheOthersAsTheyAre) {
+    LogCapture logged;
+    auto const before = m_source.read();
+    auto& faulty = FakeChassis::fake(m_boards[1]);
+    faulty.whenAsked = [] { throw std::runtime_error("lost the bus"); };
+    for (int reading = 0; reading < 3; ++reading) {
+        auto const rows = m_source.read();
+        ASSERT_EQ(rows.size(), 4U);
+        EXPECT_EQ(rows[1].status, BoardStatusNone);
+        EXPECT_EQ(rows[1].errorMessage, "does not answer: lost the bus");
+        EXPECT_EQ(rows[1].serialNumber, "B");
+        EXPECT_EQ(rows[1].name, before[1].name);
+        EXPECT_EQ(rows[2], before[2]);
+    }
+    faulty.whenAsked = [] {};
+    EXPECT_EQ(m_source.read(), before);
+    std::string const message = logged.take();
+    EXPECT_EQ(linesIn(message), 2) << message;
+}
+
+TEST_F(BoardSourceTest, BoardThatThrowsSomethingOddIsShownAsNotAnswering) {
+    LogCapture logged;
+    FakeChassis::fake(m_boards[0]).whenAsked = [] { throw 7; };
+    auto const rows = m_source.read();
+    ASSERT_EQ(rows.size(), 4U);
+    EXPECT_EQ(rows[0].errorMessage, "does not answer: ");
+    FakeChassis::fake(m_boards[0]).whenAsked = [] {};
+    m_source.read();
 }
 
 } // namespace

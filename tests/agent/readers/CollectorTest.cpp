@@ -1,10 +1,14 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/readers/Collector.h"
 
+#include <atomic>
 #include <future>
 #include <set>
+#include <stdexcept>
 
 #include <gtest/gtest.h>
+
+#include "tests/support/LogCapture.h"
 
 namespace kvloamd {
 namespace {
@@ -204,6 +208,27 @@ TEST_F(CollectorTest, TimeOfChangeStaysWhenNothingChangesAfterwards) {
     m_collector->renew();
     awaitRenewal(1);
     EXPECT_EQ(m_collector->newest()->lastChange, change);
+}
+
+TEST_F(CollectorTest, RefreshThatThrowsLeavesTheLastSnapshotAndIsLoggedOnce) {
+    LogCapture logged;
+    start(kByEventOnly);
+    std::atomic<int> thrown = 0;
+    m_whileReading = [&] {
+        if (++thrown <= 2) throw std::runtime_error("no platform");
+    };
+    m_collector->renew();
+    while (thrown < 1)
+        std::this_thread::yield();
+    EXPECT_EQ(m_collector->newest()->number, 1U);
+    m_collector->renew();
+    while (thrown < 2)
+        std::this_thread::yield();
+    m_collector->renew();
+    awaitRenewal();
+    EXPECT_EQ(m_collector->newest()->number, 2U);
+    std::string const message = logged.take();
+    EXPECT_EQ(linesIn(message), 2) << message;
 }
 
 } // namespace

@@ -3,6 +3,7 @@
 
 #include <ctime>
 #include <limits>
+#include <stdexcept>
 
 #include <gmock/gmock.h>
 
@@ -10,6 +11,7 @@
 #include "agent/rows/IndexKey.h"
 #include "tests/support/FakeBoards.h"
 #include "tests/support/FakeEthernet.h"
+#include "tests/support/LogCapture.h"
 
 namespace kvloamd {
 namespace {
@@ -17,6 +19,14 @@ namespace {
 using ::testing::ElementsAre;
 using ::testing::IsEmpty;
 using ::testing::SizeIs;
+
+class ThrowingFeature final : public FakeEthernetFeature {
+  public:
+    ThrowingFeature() : FakeEthernetFeature({}) {}
+    ReferenceCounter<KVL::Ethernet> GetFirstEthernet() override {
+        throw std::runtime_error("no answer");
+    }
+};
 
 class InterfaceReaderTest : public ::testing::Test {
   protected:
@@ -189,6 +199,50 @@ TEST_F(InterfaceReaderTest, EthernetIsAPortOfItsBoard) {
 TEST_F(InterfaceReaderTest, InterfaceWithNothingAboveOrBelowStandsAlone) {
     addPort(m_chassis.insert("A"));
     EXPECT_THAT(read().stack, ElementsAre(StackRow{0, 1000}, StackRow{1000, 0}));
+}
+
+TEST_F(InterfaceReaderTest, TimeOfLastChangeStaysWhileTheOperStatusStays) {
+    FakeEthernet& port = addPort(m_chassis.insert("A"));
+    port.operStatus = kUp;
+    port.lastChange = 1;
+    EXPECT_EQ(readOne().lastChange, 0U);
+    // Something else has changed, as a line's alarms do.
+    port.lastChange = static_cast<int>(std::time(nullptr));
+    EXPECT_EQ(readOne().lastChange, 0U);
+    port.operStatus = kDown;
+    auto const down = readOne().lastChange;
+    ASSERT_TRUE(down);
+    EXPECT_GE(*down, 360000U); // an hour after the start
+    EXPECT_EQ(readOne().lastChange, down);
+}
+
+TEST_F(InterfaceReaderTest, ClockThatWasSetBackOrAheadMovesNoTimeOfChange) {
+    FakeEthernet& port = addPort(m_chassis.insert("A"));
+    port.operStatus = kUp;
+    port.lastChange =
+        static_cast<int>(std::time(nullptr)) + 100000; // before the clock was set back
+    auto const first = readOne().lastChange;
+    ASSERT_TRUE(first);
+    EXPECT_LE(*first, 360000U + 60000U); // not in the future
+    port.operStatus = kDown;
+    port.lastChange = 1; // set back further
+    auto const down = readOne().lastChange;
+    ASSERT_TRUE(down);
+    EXPECT_GE(*down, *first);
+}
+
+TEST_F(InterfaceReaderTest, BoardThatThrowsKeepsNoOtherFromBeingRead) {
+    auto const faulty = m_chassis.insert("A");
+    addPort(faulty).address = "x";
+    addPort(m_chassis.insert("B"));
+    ASSERT_THAT(readIndices(), ElementsAre(1000, 1016));
+    faulty->AddFeature(ReferenceCounter<Feature>(new ThrowingFeature));
+    LogCapture logged;
+    EXPECT_THAT(readIndices(), ElementsAre(1016));
+    EXPECT_THAT(readIndices(), ElementsAre(1016));
+    std::string const message = logged.take();
+    EXPECT_EQ(linesIn(message), 1) << message;
+    EXPECT_THAT(message, ::testing::HasSubstr("board 1: its interfaces cannot be read: no answer"));
 }
 
 } // namespace
