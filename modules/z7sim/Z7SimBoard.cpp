@@ -122,7 +122,7 @@ int Z7SimBoard::ProcessExternalEvent(BoardStatusEnum status) {
         break;
     case BoardStatusFailed:
         m_silent = false;
-        SetErrorMessage(kReportedFailed); // before listeners are told, who may ask for it
+        SetErrorMessage(kReportedFailed); // listeners of the failure may ask for it
         break;
     default:
         break;

@@ -14,7 +14,7 @@
 ///
 /// Threads: any thread may ask. What changes the board's state, the events on the platform's
 /// delivery thread and the pings on the factory's ping thread, takes turns under a mutex of its
-/// own, which queries never take. It is held while listeners are told, so a listener must not wait
+/// own, which queries never take. It is held while listeners are called, so a listener must not wait
 /// for another status change.
 class Z7SimBoard final : public Z7Board {
   public:
@@ -22,10 +22,10 @@ class Z7SimBoard final : public Z7Board {
     explicit Z7SimBoard(long id, FailureTimes const& times = {});
     ~Z7SimBoard() override;
 
-    /// Brings a new board, which nobody listens to yet, into the condition that the platform
-    /// reports. Not part of the constructor, for the stages are virtual.
+    /// Brings a new board, which has no listeners yet, into the condition that the platform reports.
+    /// Not part of the constructor, because the stages are virtual.
     void AdoptCondition();
-    /// Takes the board out for good: it tells nobody anything more.
+    /// Takes the board out for good: it announces nothing more.
     void Retire();
 
     BoardStatusEnum GetStatus() override;
@@ -45,7 +45,7 @@ class Z7SimBoard final : public Z7Board {
     int PingBoard() override;
     int SetStatus(BoardStatusEnum status) override;
     int SetSecondaryStatus(BoardStatusEnum status) override;
-    /// Each stage returns 0, or -1 when the board can not come up.
+    /// Each stage returns 0, or -1 when the board cannot come up.
     int StartStage1() override;
     int StartStage2() override;
     int StartStage3() override;

@@ -8,8 +8,8 @@
 #include "board/ISDNChannelOnLine.h"
 #include "z7/ISDNChannelZ7.h"
 
-/// A channel's state, told by messages and, before the first of them, read from the platform. Any
-/// thread may ask.
+/// A `ChannelState` is a channel's state, which comes with messages and, before the first of them,
+/// from a reading of the platform. Thread-safe.
 template <class State>
 class ChannelState {
   public:
