@@ -14,16 +14,16 @@
 ///
 /// Threads: any thread may ask. What changes the board's state, the events on the platform's
 /// delivery thread and the pings on the factory's ping thread, takes turns under a mutex of its
-/// own, which queries never take. It is held while listeners are called, so a listener must not wait
-/// for another status change.
+/// own, which queries never take. It is held while listeners are called, so a listener must not
+/// wait for another status change.
 class Z7SimBoard final : public Z7Board {
   public:
     /// `id`: the board's handle in the device mapper. The new board is stopped.
     explicit Z7SimBoard(long id, FailureTimes const& times = {});
     ~Z7SimBoard() override;
 
-    /// Brings a new board, which has no listeners yet, into the condition that the platform reports.
-    /// Not part of the constructor, because the stages are virtual.
+    /// Brings a new board, which has no listeners yet, into the condition that the platform
+    /// reports. Not part of the constructor, because the stages are virtual.
     void AdoptCondition();
     /// Takes the board out for good: it announces nothing more.
     void Retire();
