@@ -137,7 +137,7 @@ class IntervalTable final : public Table {
         auto const line = std::ranges::lower_bound(all, index[0], {}, &LineRow::ifIndex);
         if (line == all.end()) return rowCount(facts);
         if (line->ifIndex != index[0] || index.size() < 2) return line->intervalsBefore;
-        // Intervals are numbered from 1; a longer index is behind the one that it begins with.
+        // Intervals are numbered from 1; a longer index follows the index that it begins with.
         std::size_t passed = index[1];
         if (passed > 0 && orEqual && index.size() == 2) --passed;
         return line->intervalsBefore + std::min(passed, line->closedIntervals());

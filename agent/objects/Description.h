@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // How managed objects are described: name, type, place in the tree, and where the value comes from.
 //
-// The descriptions know no protocol. Whatever tells of the boards reads the same ones.
+// The descriptions are independent of protocols; all fronts use the same ones.
 #pragma once
 
 #include <algorithm>

@@ -31,10 +31,10 @@ enum class Lookup {
     NoSuchInstance ///< the object has no such instance, or its value is not known
 };
 
-/// Why an instance can not be set, in the order in which it is looked at.
+/// Why an instance cannot be set, in the order of the checks.
 enum class SetFault {
     None,
-    NotWritable, ///< no such object, or nobody can set it
+    NotWritable, ///< no such object, or it is read-only
     WrongType,   ///< the object takes integers
     WrongValue,  ///< none that the object takes
     NoCreation   ///< there is no such instance, and setting it would not make one
@@ -46,8 +46,8 @@ struct Change {
     int value;
 };
 
-/// All scalars and columns in the order of their places. Never changed once made; every search is
-/// binary, over the objects and then over a table's rows.
+/// An `ObjectTree` holds all scalars and columns in the order of their places. Immutable. Every
+/// search is binary: over the objects, then over a table's rows.
 class ObjectTree {
   public:
     /// `scalars` and `tables` outlive the tree.

@@ -33,7 +33,7 @@ struct NameView {
 };
 
 /// A number (an unsigned one of 64 bits as the same bits), octets or a name that the snapshot
-/// behind them holds, or nothing: the value is not known.
+/// holds, or nothing if the value is not known.
 using Value = std::variant<std::monostate, std::int64_t, std::string_view, NameView>;
 
 inline bool isKnown(Value const& value) {

@@ -67,7 +67,7 @@ class Reading {
     /// Enters an interface under a name that no other of its kind has. The row is good until the
     /// next one is entered.
     InterfaceRow& enter(IndexKind kind, std::string const& name);
-    /// An interface that has no name of its own is known by its place among those of its kind.
+    /// Enters an interface without a name of its own under its position among those of its kind.
     InterfaceRow& enterNameless(IndexKind kind);
     void readInterface(KVL::Interface& interface, InterfaceRow& row) const;
     void readLine(DS1LineDevice& line);

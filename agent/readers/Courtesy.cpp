@@ -10,7 +10,7 @@ namespace kvloamd {
 
 namespace {
 
-/// Work between two times: short enough for requests, long enough for a busy processor.
+/// The time between two yields: short enough for requests, long enough for a busy processor.
 constexpr std::chrono::microseconds kTurn{1000};
 
 } // namespace

@@ -151,7 +151,7 @@ void Building::addBoard(BoardRow const& board, BoardKey const& boardKey) {
     if (auto const slot = m_slots.find(slotName(board));
         slot != m_slots.end() && slot->second.entity != 0) {
         row.containedIn = slot->second.entity;
-        // A slot holds one board; where several claim it, nobody knows their places.
+        // A slot holds one board; where several claim it, their positions are not known.
         if (slot->second.boards == 1) row.position = 1;
     }
     row.description = firstKnown({board.functionalDescription, board.model, board.name, "board"});

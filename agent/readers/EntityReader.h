@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Makes physical entities of the boards, their processors and their ports.
+// Builds the physical entities: boards, their processors and their ports.
 #pragma once
 
 #include <cstdint>
@@ -13,10 +13,11 @@
 
 namespace kvloamd {
 
-/// There is one chassis. It contains a slot for every board that knows its slot, the slot contains
-/// the board; other boards are in the chassis. A board contains its processors and its ports.
+/// An `EntityReader` builds the tree of physical entities. There is one chassis. It contains a slot
+/// for every board that knows its slot, the slot contains the board; other boards are in the
+/// chassis. A board contains its processors and its ports.
 ///
-/// Belongs to one thread.
+/// Unsynchronised.
 class EntityReader {
   public:
     /// `indices` outlive the reader. `started`: the agent's start. `now`: the time of day.

@@ -39,8 +39,8 @@ bool has(int lineStatus, unsigned bits) {
     return (static_cast<unsigned>(lineStatus) & bits) != 0;
 }
 
-/// What a line sends is the echo of what it receives, and loopbacks and test codes are somebody's
-/// wish: neither is an alarm.
+/// What a line sends is the echo of what it receives, and an operator asks for loopbacks
+/// and test codes: neither is an alarm.
 unsigned alarmsOf(int lineStatus) {
     unsigned alarms = 0;
     if (has(lineStatus, DS1LineStatusLossOfSignal | DS1LineStatusLossOfFrame))
@@ -71,7 +71,7 @@ EntityState boardState(BoardRow const& board, bool hasFault) {
     unsigned const faults = hasFault ? unsigned{kAlarmIndeterminate} : 0U;
     state.alarm = static_cast<char>(faults);
     if (board.secondaryStatus == BoardStatusFailed) {
-        // A failed board is a stopped one too, but nobody has locked it.
+        // A failed board is stopped, too, but no operator has locked it.
         state.oper = OperState::Disabled;
         state.alarm = static_cast<char>(faults | kAlarmCritical);
         return state;
@@ -106,7 +106,7 @@ EntityState portState(InterfaceRow const& interface, LineRow const* line, UsageS
     state.admin = adminOf(interface.adminStatus);
     state.oper = operOf(interface.operStatus);
     state.usage = usage;
-    // A status without any bit, not even that of no alarm, says nothing.
+    // A status without any bit, not even the one for no alarm, is no information.
     if (int const status = line == nullptr ? 0 : line->lineStatus.value_or(0); status > 0) {
         unsigned const alarms = alarmsOf(status);
         state.alarm = static_cast<char>(alarms);

@@ -14,18 +14,18 @@
 
 namespace kvloamd {
 
-/// What the board's status says of it, and whether it has a fault.
+/// The state of a board by its status, and by whether it has a fault.
 EntityState boardState(BoardRow const& board, bool hasFault);
 
 /// What the interface's status, the line's alarms (`line` is null for an Ethernet interface) and
 /// the use of its channels say of a port.
 EntityState portState(InterfaceRow const& interface, LineRow const* line, UsageState usage);
 
-/// How far the bearer channels of every line are in use, by the line's ifIndex. Lines that nobody
-/// knows the channels of, or the state of one channel of, are left out.
+/// How far the bearer channels of every line are in use, by the line's ifIndex. A line is left out
+/// if its channels, or the state of one of them, are not known.
 std::map<std::uint32_t, UsageState> lineUsage(InterfaceRows const& interfaces);
 
-/// Remembers since when every entity has been in its state. Belongs to one thread.
+/// An `EntityStates` remembers since when every entity has been in its state. Unsynchronised.
 class EntityStates {
   public:
     /// Seconds since the epoch.

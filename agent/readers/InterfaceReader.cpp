@@ -45,7 +45,7 @@ void completeStack(InterfaceRows& all) {
     for (InterfaceRow& row : all.interfaces) {
         bool const stacked = higher.contains(row.ifIndex);
         if (!stacked) all.stack.push_back({row.ifIndex, 0});
-        // One broken line is told of once, not once more for each of its channels.
+        // A broken line causes one notification, not another one for each of its channels.
         row.linkUpDownTraps = stacked ? kDisabled : kEnabled;
     }
     sortBy(all.stack);

@@ -19,11 +19,11 @@
 
 namespace kvloamd {
 
-/// Gives interfaces their indices, counts their counters on beyond 32 bits, and notes when
-/// interfaces come and go. Belongs to one thread.
+/// An `InterfaceReader` gives interfaces their indices, extends their counters beyond 32 bits, and
+/// notes when interfaces appear and disappear. Thread-bound: the collector.
 ///
-/// A counter must be read before it has gone once around; what is lost when it is not, and when a
-/// board counts anew from 0, can not be told.
+/// A counter must be read at least once in 2^32 counts. Counts that are lost because it was not, or
+/// because a board has begun again at 0, cannot be recovered.
 class InterfaceReader {
   public:
     /// `manager` and `indices` outlive the reader. `started`: the agent's start.

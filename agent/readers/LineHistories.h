@@ -17,12 +17,12 @@ namespace kvloamd {
 /// A closed interval stays what it is, except that the newest one may still be corrected for a
 /// minute: so all are read when the table is new, when an interval has been closed and when the
 /// newest is another than before. Keeps a table until the second `begin` after it was read last.
-/// Not synchronised.
+/// Unsynchronised.
 class LineHistories {
   public:
     /// Begins to read all lines once more.
     void begin(Clock::time_point now);
-    /// Fills what `row` tells of its line's intervals.
+    /// Fills the intervals of `row`.
     void read(ReferenceCounter<DS1IntervalTable> const& table, LineRow& row);
 
   private:

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// What the platform keeps of the boards, and when it is read again.
+// Reads what the platform keeps about the boards.
 #pragma once
 
 #include <chrono>
@@ -15,13 +15,13 @@
 
 namespace kvloamd {
 
-/// Reads the records of the boards in the board table: a board's when it comes, all when the last
-/// such reading is old. A board is found by its serial number.
+/// A `PlatformReader` reads the platform's records of the boards: those of a new board at once, all
+/// of them when the last such reading is old. A board is found by its serial number.
 ///
 /// While the device mapper does not answer, what it answered last stays; while the attribute store
-/// can not be read, there are no records of it. Each is logged when it begins and when it ends.
+/// cannot be read, there are no records of it. The log says when either begins and when it ends.
 ///
-/// Belongs to one thread, the only one that uses the attribute store.
+/// Thread-bound: the collector, which alone uses the attribute store.
 class PlatformReader {
   public:
     /// The age at which all is read anew.

@@ -10,8 +10,7 @@
 
 namespace kvloamd {
 
-/// The resources of `boards`, which are ascending by index; the rows are, too. Callable from any
-/// thread.
+/// The resources of `boards`, which are ascending by index; the rows are, too. Thread-safe.
 std::vector<ResourceRow> readResources(BoardManager& manager, std::vector<BoardRow> const& boards);
 
 } // namespace kvloamd

@@ -9,7 +9,7 @@
 
 namespace kvloamd {
 
-/// Both ascending by index. Callable from any thread.
+// All rows are ascending by index. Thread-safe.
 std::vector<ModuleRow> readModules(ServiceManager& manager);
 std::vector<ServiceRow> readServices(ServiceManager& manager);
 PlatformService readPlatformService(ServiceManager& manager);

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Gives every interface, or every physical entity, an index that it keeps.
+// Indices that interfaces and physical entities keep.
 #pragma once
 
 #include <cstdint>

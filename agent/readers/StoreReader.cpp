@@ -10,7 +10,7 @@ namespace kvloamd {
 
 namespace {
 
-/// A text that the record gives as "Error" when it can not be read.
+/// A text; the record answers "Error" for one that cannot be read.
 std::string textUnlessError(std::string const& text) {
     return text == "Error" ? std::string() : printable(text);
 }
@@ -37,7 +37,7 @@ std::optional<StoreRow> StoreReading::read(std::string const& serialNumber,
     StoreRow row;
     row.boardIndex = boardIndex;
     row.serialNumber = textUnlessError(board.SerialNumber());
-    // The record has gone meanwhile, or can not be read any more.
+    // The record has disappeared meanwhile, or cannot be read any more.
     if (row.serialNumber != serialNumber) return std::nullopt;
     row.model = textUnlessError(board.Model());
     row.version = textUnlessError(board.Version());

@@ -11,7 +11,7 @@
 
 namespace kvloamd {
 
-/// The attribute store, open while this lives. All of them belong to one thread.
+/// A `StoreReading` keeps the attribute store open while it exists. Thread-bound: the collector.
 class StoreReading {
   public:
     /// Whether the store can be read: it is open and has a family of boards.

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The counts that the agent keeps about itself.
+// What the agent counts about itself.
 #pragma once
 
 #include <algorithm>

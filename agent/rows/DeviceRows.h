@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A board's devices, sub-devices and processors as the agent tells of them.
+// A board's devices, sub-devices and processors as the agent serves them.
 #pragma once
 
 #include <array>

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The physical entities and their states as the agent tells of them.
+// The physical entities and their states, as the agent serves them.
 #pragma once
 
 #include <array>
@@ -71,7 +71,7 @@ enum class StandbyState : int { Unknown = 1, ProvidingService = 4 };
 
 /// Alarms are a set, the first bit is the highest; none: nothing is wrong.
 enum AlarmBits : unsigned {
-    kAlarmUnknown = 0x80, ///< whether there is an alarm can not be told
+    kAlarmUnknown = 0x80, ///< it is not known whether there is an alarm
     kAlarmCritical = 0x20,
     kAlarmMajor = 0x10,
     kAlarmMinor = 0x08,

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The faults that are raised as the agent tells of them.
+// The faults that are raised now, as the agent serves them.
 #pragma once
 
 #include <array>
@@ -21,7 +21,7 @@ struct FaultRow {
     std::array<std::uint32_t, 2> index() const { return {boardIndex, value}; }
 };
 
-/// The list of them, and its counts, at one time.
+/// A `Faults` is the list of faults and its counts at one time.
 struct Faults {
     std::vector<FaultRow> rows;   ///< ascending by index
     std::uint32_t raised = 0;     ///< raisings since the start

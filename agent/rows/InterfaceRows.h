@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The boards' lines, channels and interfaces as the agent tells of them.
+// The boards' lines, channels and interfaces as the agent serves them.
 #pragma once
 
 #include <array>
@@ -58,8 +58,7 @@ struct InterfaceRow {
     /// Since when the counters have counted on, as `lastChange`; 0: since the agent's start.
     std::uint32_t discontinuity = 0;
     std::optional<int> connectorPresent; ///< 1: yes, 2: no
-    /// Whether it is told when the link goes up or down, unless that has been set: 1 enabled, 2
-    /// disabled.
+    /// The default of ifLinkUpDownTrapEnable: 1 enabled, 2 disabled.
     int linkUpDownTraps = 1;
 
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }

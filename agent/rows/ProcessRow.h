@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// One process that uses the platform's runtime library as the agent tells of it.
+// One process that uses the platform's runtime library as the agent serves it.
 #pragma once
 
 #include <array>

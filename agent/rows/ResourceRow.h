@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The named resources of boards as the agent tells of them.
+// The named resources of boards as the agent serves them.
 #pragma once
 
 #include <array>
@@ -11,7 +11,8 @@ namespace kvloamd {
 
 enum class ResourceKind : int { Other = 1, Voice = 2, Trunk = 3, IsdnTrunk = 4, Station = 5 };
 
-/// Numbers are none when the device can not answer.
+/// A `ResourceRow` is a row of kvlResourceDeviceTable. A number that the device does not know is
+/// absent.
 struct ResourceRow {
     std::uint32_t boardIndex = 0;
     std::uint32_t place = 0; ///< in the walk of the board's devices, from 1
@@ -23,7 +24,7 @@ struct ResourceRow {
     std::optional<int> number;
     std::optional<int> coderType; ///< voice, as the next three
     std::optional<int> channelState;
-    std::optional<int> gain; ///< may be negative, but for -1, which says that it is not known
+    std::optional<int> gain; ///< may be negative; -1 means unknown
     std::optional<int> echoCancellation;
     std::optional<int> lineNumber; ///< trunks of either kind, as the next three
     std::optional<int> lineType;

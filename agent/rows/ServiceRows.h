@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Modules and services as the agent tells of them.
+// Modules and services as the agent serves them.
 #pragma once
 
 #include <array>
@@ -23,7 +23,7 @@ struct ServiceRow {
     std::uint32_t serviceIndex = 0;
     std::string name;
     std::string scmName;
-    std::optional<int> status; ///< none while nobody has set it
+    std::optional<int> status; ///< absent until it has been set
     std::string changeDate;    ///< as `dateOctets`
 
     std::array<std::uint32_t, 1> index() const { return {serviceIndex}; }
@@ -31,7 +31,7 @@ struct ServiceRow {
 
 /// The board platform's own service.
 struct PlatformService {
-    std::optional<int> status; ///< none while nobody has set it
+    std::optional<int> status; ///< absent until it has been set
     std::string changeDate;    ///< as `dateOctets`
 };
 

@@ -26,7 +26,7 @@ struct SettingKey {
     auto operator<=>(SettingKey const&) const = default;
 };
 
-/// No value: what has been set is forgotten.
+/// Without a value, the setting is deleted.
 struct SettingEntry {
     SettingKey key;
     std::optional<int> value;
@@ -34,8 +34,8 @@ struct SettingEntry {
     bool operator==(SettingEntry const&) const = default;
 };
 
-/// What is set counts at once, whatever the rows of a snapshot say; whoever owns the boards hands
-/// it on. All operations may be called from any thread.
+/// A `Settings` holds what operators have set. A value takes effect at once and overrides the rows
+/// of the snapshot. Thread-safe.
 class Settings {
   public:
     /// Nothing when it has not been set.

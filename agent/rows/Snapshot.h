@@ -22,7 +22,8 @@
 
 namespace kvloamd {
 
-/// Never changed once it is published; shared by whoever answers from it.
+/// A `Snapshot` has all rows as they were at one time. Immutable once it is published; requests
+/// share it.
 struct Snapshot {
     std::vector<BoardRow> boards; ///< ascending by index, as all rows
     std::vector<ModuleRow> modules;

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// One board's record in the attribute store as the agent tells of it.
+// One board's record in the attribute store as the agent serves it.
 #pragma once
 
 #include <array>
@@ -9,7 +9,8 @@
 
 namespace kvloamd {
 
-/// Texts are empty and numbers none when they can not be read.
+/// A `StoreRow` is a row of kvlStoreTable. A text that cannot be read is empty; such a number is
+/// absent.
 struct StoreRow {
     std::uint32_t boardIndex = 0;
     std::string serialNumber;
