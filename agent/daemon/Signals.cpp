@@ -24,6 +24,7 @@ sigset_t setOf(std::initializer_list<int> numbers) {
 } // namespace
 
 Signals::Signals() {
+    std::signal(SIGPIPE, SIG_IGN);
     sigset_t const signals = setOf({SIGTERM, SIGINT, SIGHUP});
     pthread_sigmask(SIG_BLOCK, &signals, nullptr);
     // A write beyond the file size limit fails instead, as on a full disk.

@@ -9,7 +9,8 @@ namespace kvloamd {
 
 enum class Signal { Stop, Reload };
 
-/// A `Signals` object blocks SIGTERM, SIGINT and SIGHUP and makes them readable on a descriptor.
+/// A `Signals` object blocks SIGTERM, SIGINT and SIGHUP and makes them readable on a descriptor. It
+/// ignores SIGPIPE for the rest of the process: a peer or log reader that leaves ends nothing.
 /// Requires that no other thread has been started, because threads inherit the blocked signals. The
 /// constructor throws std::system_error when no descriptor is available.
 class Signals {

@@ -33,8 +33,21 @@ TEST_F(RepeatFilterTest, TextPassesAgainAfterItsPause) {
 TEST_F(RepeatFilterTest, FloodOfDifferentTextsIsBounded) {
     std::size_t passed = 0;
     for (int text = 0; text < 1000; ++text)
-        if (passes(std::to_string(text))) ++passed;
-    EXPECT_EQ(passed, RepeatFilter::kRemembered);
+        if (passes("Unknown user name: " + std::to_string(text))) ++passed;
+    EXPECT_EQ(passed, RepeatFilter::kPerKind);
+}
+
+TEST_F(RepeatFilterTest, FloodDoesNotSuppressANewKindOfTrouble) {
+    for (int text = 0; text < 1000; ++text)
+        passes("Authentication failed for user" + std::to_string(text));
+    EXPECT_TRUE(passes("the disk is full"));
+}
+
+TEST_F(RepeatFilterTest, FloodOfKindsDoesNotSuppressANewOne) {
+    for (char first = 'a'; first <= 'z'; ++first)
+        for (char second = 'a'; second <= 'z'; ++second)
+            passes({first, second});
+    EXPECT_TRUE(passes("the disk is full"));
 }
 
 } // namespace
