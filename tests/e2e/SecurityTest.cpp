@@ -1,5 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // Access by community and by SNMPv3 user.
+#include <csignal>
+
 #include <gmock/gmock.h>
 
 #include "tests/e2e/AgentFixture.h"
@@ -104,6 +106,26 @@ TEST_F(SecurityTest, EngineKeepsItsNameAndCountsItsStarts) {
     startAgent();
     EXPECT_EQ(get(kEngineId), engine);
     EXPECT_EQ(get(kEngineBoots), "INTEGER: 2");
+}
+
+TEST_F(SecurityTest, EngineKeepsItsNameAndCountsItsStartsWhateverEndsIt) {
+    static constexpr char kEngineId[] = "1.3.6.1.6.3.10.2.1.1.0";
+    static constexpr char kEngineBoots[] = "1.3.6.1.6.3.10.2.1.2.0";
+    startAgent();
+    std::string const engine = get(kEngineId);
+    for (int boots = 2; boots <= 4; ++boots) {
+        agent().signal(SIGKILL);
+        agent().wait();
+        startAgent();
+        EXPECT_EQ(get(kEngineId), engine);
+        EXPECT_EQ(get(kEngineBoots), "INTEGER: " + std::to_string(boots));
+    }
+}
+
+TEST_F(SecurityTest, EngineStateThatCannotBeSavedIsReported) {
+    write(path("persistent"), "a file where the directory should be");
+    startAgent();
+    EXPECT_THAT(agent().output(), HasSubstr("SNMPv3 engine state cannot be saved"));
 }
 
 } // namespace

@@ -7,6 +7,7 @@
 #include <cerrno>
 #include <cstdlib>
 #include <cstring>
+#include <fstream>
 #include <string_view>
 #include <utility>
 
@@ -97,6 +98,18 @@ void nameConfiguration(SnmpFiles const& files) {
                           files.configuration.c_str());
 }
 
+/// Saves engine ID, engine boots and users before the first request, so that no end of the process
+/// loses them.
+void keepEngineState(SnmpFiles const& files) {
+    snmp_store(kAppName);
+    std::string const path = persistentDirectory(files) + "/" + kAppName + ".conf";
+    std::ifstream state(path);
+    for (std::string line; std::getline(state, line);)
+        if (line.starts_with("engineBoots")) return;
+    log(LogLevel::Warning, path + ": SNMPv3 engine state cannot be saved, so SNMPv3 managers will "
+                                  "refuse the agent after a restart; check --persistent-dir");
+}
+
 } // namespace
 
 std::vector<std::string> startSnmp(SnmpFiles const& files) {
@@ -123,6 +136,7 @@ std::vector<std::string> startSnmp(SnmpFiles const& files) {
     init_snmp(kAppName);
     configFaults = nullptr;
     started = true;
+    keepEngineState(files);
     if (nobodyMayAsk && faults.empty())
         log(LogLevel::Warning, "no community and no user is configured, so nobody gets an answer; "
                                "configure them in the file that --snmp-config names");

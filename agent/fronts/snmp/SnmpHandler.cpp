@@ -15,6 +15,7 @@
 
 #include "agent/fronts/PendingChange.h"
 #include "agent/fronts/snmp/SnmpValues.h"
+#include "agent/fronts/snmp/Visible.h"
 
 namespace kvloamd {
 
@@ -52,6 +53,8 @@ struct SnmpHandler::Call {
     /// The part of the variable's name below the arc. A name outside the arc becomes one that
     /// sorts before or after all of ours.
     Oid relative(netsnmp_variable_list const* variable, bool& orEqual) const;
+    /// Sets `name` to an absolute name.
+    void setName(OidView relativeName);
     void get(netsnmp_request_info* request);
     void getNext(netsnmp_request_info* request);
     void getBulk(netsnmp_request_info* request);
@@ -143,26 +146,36 @@ void SnmpHandler::Call::get(netsnmp_request_info* request) {
     }
 }
 
+void SnmpHandler::Call::setName(OidView relativeName) {
+    name.assign(handler.m_arc.begin(), handler.m_arc.end());
+    name.insert(name.end(), relativeName.begin(), relativeName.end());
+}
+
 void SnmpHandler::Call::getNext(netsnmp_request_info* request) {
     bool orEqual = request->inclusive != 0;
-    Oid after = relative(request->requestvb, orEqual);
+    Oid const after = relative(request->requestvb, orEqual);
+    auto const isEnd = [&](OidView found) {
+        setName(found);
+        return snmp_oid_compare(name.data(), name.size(), request->range_end,
+                                request->range_end_len) >= 0;
+    };
+    // The library checks access only for a GETBULK's first variable; check every one here.
+    View const view{[&](Instance const& found) {
+                        setName(found.name);
+                        std::size_t length = name.size();
+                        return in_a_view(name.data(), &length, pdu, asnTypeOf(found.type)) ==
+                               VACM_SUCCESS;
+                    },
+                    [&](OidView subtree) {
+                        setName(subtree);
+                        int const seen = netsnmp_acm_check_subtree(pdu, name.data(), name.size());
+                        return seen != VACM_SUCCESS && seen != VACM_SUBTREE_UNKNOWN;
+                    }};
     // If a variable is left unchanged, the library asks the handler of the names after ours.
-    while (handler.m_tree.next(facts, after, orEqual, instance)) {
-        name.assign(handler.m_arc.begin(), handler.m_arc.end());
-        name.insert(name.end(), instance.name.begin(), instance.name.end());
-        if (snmp_oid_compare(name.data(), name.size(), request->range_end,
-                             request->range_end_len) >= 0)
-            return;
-        // The library checks access only for a GETBULK's first variable; check every one here.
-        std::size_t length = name.size();
-        if (in_a_view(name.data(), &length, pdu, asnTypeOf(instance.type)) == VACM_SUCCESS) {
-            snmp_set_var_objid(request->requestvb, name.data(), name.size());
-            setVariable(request->requestvb, instance.type, instance.value);
-            return;
-        }
-        after.swap(instance.name);
-        orEqual = false;
-    }
+    if (!nextVisible(handler.m_tree, facts, after, orEqual, isEnd, view, instance)) return;
+    setName(instance.name);
+    snmp_set_var_objid(request->requestvb, name.data(), name.size());
+    setVariable(request->requestvb, instance.type, instance.value);
 }
 
 void SnmpHandler::Call::getBulk(netsnmp_request_info* request) {

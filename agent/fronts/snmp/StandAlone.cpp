@@ -4,7 +4,7 @@
 #include <stdexcept>
 #include <utility>
 
-#include "agent/fronts/snmp/SnmpAddress.h"
+#include "agent/fronts/snmp/WriteAccess.h"
 #include "agent/log/Log.h"
 
 namespace kvloamd {
@@ -17,7 +17,7 @@ bool StandAlone::open() {
     std::vector<std::string> faults = startSnmp(m_files);
     if (faults.empty()) {
         for (std::string const& address : m_listen)
-            if (std::string fault = openAddress(address); !fault.empty())
+            if (std::string fault = m_sessions.listen(address); !fault.empty())
                 faults.push_back(std::move(fault));
     }
     for (std::string const& fault : faults)
@@ -35,6 +35,8 @@ void StandAlone::serve(Served served) {
                 throw std::runtime_error("the SNMP library refuses to register the agent's "
                                          "objects; check --enterprise-oid");
     }
+    restrictWriters(served.trees);
+    m_sessions.addTo(loop());
     loop().add(m_library);
     SnmpNotifications::sendStart();
 }

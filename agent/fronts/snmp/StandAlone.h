@@ -12,6 +12,7 @@
 #include "agent/fronts/snmp/SnmpConfig.h"
 #include "agent/fronts/snmp/SnmpHandler.h"
 #include "agent/fronts/snmp/SnmpNotifications.h"
+#include "agent/fronts/snmp/SnmpSessions.h"
 
 namespace kvloamd {
 
@@ -33,6 +34,7 @@ class StandAlone final : public Front {
     std::vector<std::string> const m_listen;
     SnmpFiles const m_files;
     SnmpNotifications m_notifications;
+    SnmpSessions m_sessions;
     LibrarySource m_library;
     std::list<SnmpHandler> m_handlers; ///< the library keeps pointers to them
 };
