@@ -30,7 +30,7 @@ class LineReader {
     std::string word() {
         if (atEnd()) return {};
         std::size_t const end = std::min(m_text.find_first_of(" \t\r=,[]#\"'"), m_text.size());
-        std::string const taken(m_text.substr(0, end));
+        std::string taken(m_text.substr(0, end));
         m_text.remove_prefix(end);
         return taken;
     }
