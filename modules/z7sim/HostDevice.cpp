@@ -9,7 +9,7 @@
 
 namespace {
 
-/// The number that `text` is from its `start` on; nothing when it goes on behind it.
+/// The number that begins at `start` and ends with `text`; nothing for any other text.
 template <class Number>
 std::optional<Number> parse(std::string const& text, std::size_t start, int base) {
     if (text.size() < start) return std::nullopt;

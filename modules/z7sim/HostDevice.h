@@ -1,20 +1,21 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A network device of this host, as the kernel shows it at the time of the question.
+// A network device of this host, as the kernel describes it at present.
 #pragma once
 
 #include <cstdint>
 #include <optional>
 #include <string>
 
-/// Reads the files that the kernel keeps for every device. Such a read waits for no other process.
-/// A file that is not there, or cannot be read, answers nothing.
+/// A `HostDevice` reads the files in which the kernel describes a network device. These reads do
+/// not block. A file that is missing or cannot be read yields nothing.
 class HostDevice {
   public:
-    /// Whether it can be the name of a network device: 1 to 15 characters, no '/', and neither "."
-    /// nor "..". Nothing else may become part of a path.
+    /// Whether `name` is valid for a network device: 1 to 15 characters, no '/', and neither "."
+    /// nor
+    /// "..". Only such a name may become part of a path.
     static bool isName(std::string const& name);
 
-    /// Requires: `isName(name)`. The device need not be there. `directory`: where the kernel has
+    /// Requires: `isName(name)`. The device need not exist. `directory`: where the kernel lists
     /// its devices.
     explicit HostDevice(std::string name, std::string const& directory = "/sys/class/net");
 

@@ -14,7 +14,7 @@
 
 namespace {
 
-/// The last 32 bits, which an agent sends as they are.
+/// The low 32 bits of a counter.
 int low32(std::int64_t number) {
     return static_cast<int>(static_cast<std::uint32_t>(number));
 }
@@ -86,8 +86,8 @@ int HostEthernet::GetAdminStatus() {
 int HostEthernet::GetOperStatus() {
     auto const state = m_device.text("operstate");
     if (!state) return KVL::kNotSupported;
-    // A driver without states, the loopback's for one, is "unknown"; it runs while it is up and has
-    // a carrier.
+    // A driver without operational states, such as the loopback's, reports "unknown". Such a device
+    // is up while it is enabled and has a carrier.
     bool const runs = GetAdminStatus() == 1 && m_device.number("carrier") == 1;
     return stateNamed(kOperStates, *state, runs ? kOperUp : kOperUnknown);
 }

@@ -1,16 +1,16 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A network device of this host in the place of a board's Ethernet interface.
+// An Ethernet interface of a board, represented by a network device of this host.
 #pragma once
 
 #include "HostDevice.h"
 #include "Z7SimEthernet.h"
 
-/// Every answer comes from the kernel at the time of the question; what the kernel does not say is
-/// not supported. Numbers are those of the kernel modulo 2^32, as the counters of an interface are.
+/// A `HostEthernet` asks the kernel for every answer; what the kernel does not know is not
+/// supported. Counters are the kernel's, modulo 2^32.
 ///
-/// The kernel counts unicast packets together with all others, so the unicast queries answer all
-/// packets. It does not tell single from multiple collisions, and counts frames that are too long
-/// together with those that are too short.
+/// The kernel counts unicast packets together with all others, so the unicast queries return
+/// all packets. It does not distinguish single from multiple collisions, and it counts frames that
+/// are too long together with those that are too short.
 class HostEthernet final : public Z7SimEthernet {
   public:
     explicit HostEthernet(HostDevice device);
@@ -18,7 +18,7 @@ class HostEthernet final : public Z7SimEthernet {
 
     int GetType() override;
     int GetMTU() override;
-    /// A speed of 2^32 bit/s or more answers 2^32 - 1.
+    /// Returns 2^32 - 1 for a speed of 2^32 bit/s or more.
     int GetSpeed() override;
     int GetPhysAddress(char* buffer, int& length) override;
     int GetAdminStatus() override;

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Where the addresses of an IP interface come from.
+// The sources of the addresses of an IP interface.
 #pragma once
 
 #include <optional>
@@ -12,8 +12,8 @@
 std::optional<int> parseIPAddress(std::string const& text);
 
 /// The addresses IP_ADDRESS_0, IP_ADDRESS_1 ... of a board, up to the first that is missing; those
-/// that are no addresses are skipped. A mask or broadcast address that is missing, or is none,
-/// is 0.0.0.0. Nothing when the board describes no addresses.
+/// that are not addresses are skipped. A missing or invalid mask or broadcast address is 0.0.0.0.
+/// Nothing when the board describes no addresses.
 std::optional<Z7SimIPInterface::Addresses> readBoardAddresses(long board);
 
 /// The IPv4 addresses that a network device of this host has now.

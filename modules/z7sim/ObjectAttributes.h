@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Single attributes of the device mapper's objects, asked live.
+// Single attributes of the device mapper's objects, read at each call.
 #pragma once
 
 #include <cstdint>

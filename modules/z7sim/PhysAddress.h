@@ -12,5 +12,5 @@ using PhysAddress = std::array<unsigned char, 6>;
 /// Reads "02:00:5e:00:00:02". Nothing for any other form.
 std::optional<PhysAddress> parsePhysAddress(std::string const& text);
 
-/// As `KVL::Interface::GetPhysAddress`; without an address it is not supported.
+/// The contract of `KVL::Interface::GetPhysAddress`; not supported without an address.
 int answerPhysAddress(std::optional<PhysAddress> const& address, char* buffer, int& length);

@@ -7,11 +7,11 @@
 #include "PhysAddress.h"
 #include "Z7SimEthernet.h"
 
-/// Keeps what does not change. The counters are in the board, so their queries alone ask the
-/// platform, every time. What the board has no attribute for is not supported.
+/// A `SimulatedEthernet` keeps what does not change and asks the platform for every counter,
+/// because the board's attributes hold the counters. A query without an attribute is not supported.
 class SimulatedEthernet final : public Z7SimEthernet {
   public:
-    /// `board`: its handle in the device mapper. `address`: as its attribute says it.
+    /// `board`: its handle in the device mapper. `address`: the value of its attribute.
     SimulatedEthernet(long board, std::string const& address);
     ~SimulatedEthernet() override;
 

@@ -16,7 +16,7 @@ struct DevicePlace {
     int number = 0; ///< among the devices of its kind, from 1
 };
 
-/// What every device answers. `Kind` is one of `Z7Device`'s abstract classes.
+/// The answers that all devices share. `Kind` is one of `Z7Device`'s abstract classes.
 template <class Kind>
 class Z7SimDevice : public Kind {
   public:
@@ -34,7 +34,7 @@ class Z7SimDevice : public Kind {
     DevicePlace const m_place;
 };
 
-/// A pool of voice channels. What the platform does not say is -1.
+/// A pool of voice channels. What the platform does not know is -1.
 class Z7SimVoiceDevice final : public Z7SimDevice<Z7VoiceDevice> {
   public:
     Z7SimVoiceDevice(DevMapDeviceIf const& record, DevicePlace place);
@@ -52,10 +52,10 @@ class Z7SimVoiceDevice final : public Z7SimDevice<Z7VoiceDevice> {
     int const m_echoCancellation;
 };
 
-/// The answers of a trunk, which are read when it is made, except for its line's status. What the
-/// platform does not say is -1, and so are the answers about a line that the trunk does not have.
+/// The answers of a trunk, read when it is constructed, except for the status of its line. -1
+/// stands for what the platform does not know, and for everything about the line if there is none.
 struct TrunkFacts {
-    /// `ds1Line`: an empty handle when the platform has no line of the trunk.
+    /// `ds1Line`: an empty handle when the trunk has no line.
     TrunkFacts(long device, ReferenceCounter<DS1LineDevice> ds1Line);
 
     int lineStatus() const;

@@ -6,13 +6,13 @@
 
 #include "board/Ethernet.h"
 
-/// What IF-MIB calls the types and states that the interfaces here have.
+/// IF-MIB's numbers of the interface types and states in use here.
 inline constexpr int kTypeOther = 1;
 inline constexpr int kTypeEthernet = 6;
 inline constexpr int kTypeLoopback = 24;
 
-/// Answers its description, and `KVL::kNotSupported` to everything else. Concrete interfaces
-/// replace what they know.
+/// A `Z7SimEthernet` is the base of Ethernet interfaces: it knows its description and returns
+/// `KVL::kNotSupported` for everything else.
 class Z7SimEthernet : public KVL::Ethernet {
   public:
     explicit Z7SimEthernet(std::string description);

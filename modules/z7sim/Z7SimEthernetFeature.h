@@ -7,7 +7,7 @@
 #include "HostDevice.h"
 #include "board/EthernetFeature.h"
 
-/// Holds the one Ethernet interface that a board has.
+/// A `Z7SimEthernetFeature` holds the Ethernet interface of a board.
 class Z7SimEthernetFeature final : public KVL::EthernetFeature {
   public:
     explicit Z7SimEthernetFeature(ReferenceCounter<KVL::Ethernet> ethernet);
@@ -21,8 +21,8 @@ class Z7SimEthernetFeature final : public KVL::EthernetFeature {
     ReferenceCounter<KVL::Ethernet> const m_ethernet;
 };
 
-/// The device of this host that stands for the board's Ethernet interface, if the board names one.
-/// A text that can be no device's name is reported on standard error, and is none.
+/// The device of this host that represents the board's Ethernet interface, if the board names one.
+/// An invalid name is reported on standard error and ignored.
 std::optional<HostDevice> readHostDevice(long board);
 
 /// The board's Ethernet interface: `host` if there is one, else the simulated one that the board

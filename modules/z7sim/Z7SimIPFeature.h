@@ -8,7 +8,7 @@
 #include "board/EthernetFeature.h"
 #include "board/InterfaceFeature.h"
 
-/// Holds the one IP interface that a board has.
+/// A `Z7SimIPFeature` holds the IP interface of a board.
 class Z7SimIPFeature final : public KVL::InterfaceFeature {
   public:
     explicit Z7SimIPFeature(ReferenceCounter<KVL::Interface> interface);

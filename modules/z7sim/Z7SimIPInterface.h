@@ -7,8 +7,8 @@
 #include "board/EthernetFeature.h"
 #include "board/IPInterface.h"
 
-/// Has the addresses that it is made with; every other question it hands to the Ethernet interface
-/// below it. Without one nothing but the description and the addresses is supported.
+/// A `Z7SimIPInterface` knows its addresses and forwards all other queries to the Ethernet
+/// interface below it. Without one, it supports only the description and the addresses.
 class Z7SimIPInterface final : public KVL::IPInterface {
   public:
     using Addresses = std::vector<ReferenceCounter<KVL::IPAddressConfig>>;
@@ -17,7 +17,7 @@ class Z7SimIPInterface final : public KVL::IPInterface {
     Z7SimIPInterface(Addresses addresses, ReferenceCounter<KVL::Ethernet> ethernet);
     ~Z7SimIPInterface() override;
 
-    /// The same objects at every call.
+    /// Returns the same objects at every call.
     ReferenceCounter<KVL::IPAddressConfig> GetFirstIPAddressConfig() override;
     ReferenceCounter<KVL::IPAddressConfig>
     GetNextIPAddressConfig(ReferenceCounter<KVL::IPAddressConfig> previous) override;

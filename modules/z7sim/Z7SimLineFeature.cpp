@@ -19,7 +19,7 @@ constexpr std::size_t kMaxNameLength = 63;
 /// Of an E1 line, one per time slot.
 constexpr std::size_t kMostChannels = 32;
 
-/// dsx1LineType of a line whose type the platform does not say.
+/// dsx1LineType of a line whose type the platform does not know.
 constexpr int kOtherType = 1;
 
 /// dsx1LineCoding.
@@ -35,8 +35,8 @@ int usualCoding(LineCarrier carrier) {
     return 6; // other
 }
 
-/// A line's set-up in DS1-MIB's values, as far as the platform says; the rest is as lines of this
-/// type are usually set up.
+/// The configuration of a line in DS1-MIB's values. What the platform does not know has the usual
+/// value of the line type.
 LineSetup readSetup(long device, int number) {
     LineSetup setup;
     setup.name = textAttribute(device, "NAME").substr(0, kMaxNameLength);

@@ -14,7 +14,7 @@ class DeviceMaker {
                 ReferenceCounter<Z7SimISDNFeature> const& isdn)
         : m_board(static_cast<int>(board)), m_lines(lines), m_isdn(isdn) {}
 
-    /// Null for a device of no kind.
+    /// Null for a device of unknown kind.
     Z7Device* make(long device) {
         DevMapDeviceIf const record(device);
         switch (record.DeviceType()) {

@@ -8,9 +8,9 @@
 #include "Z7SimLineFeature.h"
 #include "z7/Z7ResourceFeature.h"
 
-/// All devices of the board that are of a kind, in the order of the device mapper. Devices of each
-/// kind are numbered from 1, and so are the lines of all trunks together. Nothing changes after the
-/// constructor but what a trunk tells of its line and its signalling channel.
+/// A `Z7SimResourceFeature` holds the devices of a board whose kind is known, in the order of the
+/// device mapper. The devices of each kind are numbered from 1. After construction, only the states
+/// of lines and signalling channels change.
 class Z7SimResourceFeature final : public Z7ResourceFeature {
   public:
     /// `lines`, `isdn`: where the trunks find their lines and signalling channels; may be empty.
@@ -22,7 +22,7 @@ class Z7SimResourceFeature final : public Z7ResourceFeature {
     int GetNumberOfDevices() override;
 };
 
-/// The feature of those among `devices` that are of a kind; an empty handle when none is.
+/// The feature of those `devices` whose kind is known; an empty handle when there is none.
 ReferenceCounter<Z7SimResourceFeature>
 makeResourceFeature(long board, std::vector<long> const& devices,
                     ReferenceCounter<Z7SimLineFeature> const& lines,
