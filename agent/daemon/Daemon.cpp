@@ -206,6 +206,9 @@ void reload(Options const& started, ReadOptions const& readAgain) {
     log(LogLevel::Info, now == started ? "the configuration has been read again"
                                        : "the configuration has been read again; changes other "
                                          "than the log level take effect at the next start");
+    if (started.agentx.empty())
+        log(LogLevel::Info, "the SNMP configuration (communities, users, views, receivers) was not "
+                            "read again; restart the agent to apply changes to it");
 }
 
 /// Flushes pending notifications, waiting at most `kFlushTime`.

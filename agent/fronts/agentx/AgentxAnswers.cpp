@@ -10,6 +10,8 @@ namespace {
 
 /// The response to a GetBulk ends at this size; the master then asks for the rest.
 constexpr std::size_t kLongAnswer = std::size_t{32} * 1024;
+/// No request of a master needs a longer response.
+constexpr std::size_t kLongestAnswer = std::size_t{1024} * 1024;
 
 } // namespace
 
@@ -93,6 +95,8 @@ std::string AgentxAnswers::get(AgentxHeader const& header, AgentxReader reader) 
     Facts const facts{*snapshot, m_counters, &m_settings};
     AgentxWriter response = beginAgentxResponse(header);
     while (!reader.atEnd()) {
+        if (response.size() > kLongestAnswer)
+            return agentxResponse(header, AgentxFault::ProcessingError);
         Oid const name = readRange(reader).start.name;
         Instance instance;
         switch (find(facts, name, instance)) {
@@ -126,6 +130,8 @@ std::string AgentxAnswers::getNext(AgentxHeader const& header, AgentxReader read
     Facts const facts{*snapshot, m_counters, &m_settings};
     AgentxWriter response = beginAgentxResponse(header);
     while (!reader.atEnd()) {
+        if (response.size() > kLongestAnswer)
+            return agentxResponse(header, AgentxFault::ProcessingError);
         Range range = readRange(reader);
         writeNext(response, facts, range);
     }
@@ -140,6 +146,8 @@ std::string AgentxAnswers::getBulk(AgentxHeader const& header, AgentxReader read
     AgentxWriter response = beginAgentxResponse(header);
     std::vector<Range> repeated;
     while (!reader.atEnd()) {
+        if (response.size() > kLongestAnswer)
+            return agentxResponse(header, AgentxFault::ProcessingError);
         Range range = readRange(reader);
         if (single > 0) {
             --single;
@@ -149,8 +157,11 @@ std::string AgentxAnswers::getBulk(AgentxHeader const& header, AgentxReader read
         }
     }
     for (std::size_t round = 0; round < rounds && !repeated.empty(); ++round) {
-        for (Range& range : repeated)
+        for (Range& range : repeated) {
+            if (response.size() > kLongestAnswer)
+                return agentxResponse(header, AgentxFault::ProcessingError);
             writeNext(response, facts, range);
+        }
         if (response.size() > kLongAnswer) break;
     }
     return response.take();

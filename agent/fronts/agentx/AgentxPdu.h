@@ -36,6 +36,7 @@ enum class AgentxFault : std::uint16_t {
     WrongType = 7,
     WrongValue = 10,
     NoCreation = 11,
+    ResourceUnavailable = 13,
     CommitFailed = 14,
     NotWritable = 17,
     NotOpen = 257,
@@ -43,6 +44,7 @@ enum class AgentxFault : std::uint16_t {
     DuplicateRegistration = 263,
     ParseError = 266,
     RequestDenied = 267,
+    ProcessingError = 268,
 };
 
 /// A malformed packet.

@@ -83,7 +83,11 @@ short AgentxSession::events() const {
 Clock::time_point AgentxSession::deadline() const {
     if (m_stage == Stage::Away) return m_retryAt;
     if (m_stage == Stage::Serving && m_awaited.empty()) return m_heard + m_pace.ping;
-    return m_heard + (m_told == Told::Lost ? m_pace.surrender : m_pace.patience);
+    auto first = m_heard + (m_told == Told::Lost ? m_pace.surrender : m_pace.patience);
+    for (Awaited const& awaited : m_awaited)
+        if (m_stage == Stage::Serving && m_heard > awaited.sent)
+            first = std::min(first, awaited.sent + m_pace.patience);
+    return first;
 }
 
 void AgentxSession::advance(short happened) {
@@ -102,7 +106,33 @@ void AgentxSession::advance(short happened) {
     checkTime();
 }
 
+bool AgentxSession::isOverdue(Awaited const& awaited, Clock::time_point now) const {
+    return m_stage == Stage::Serving && m_heard > awaited.sent &&
+           now >= awaited.sent + m_pace.patience;
+}
+
+void AgentxSession::expireRequests() {
+    auto const now = Clock::now();
+    for (auto at = m_awaited.begin(); at != m_awaited.end();) {
+        if (!isOverdue(*at, now)) {
+            ++at;
+            continue;
+        }
+        AgentxKind const kind = at->kind;
+        at = m_awaited.erase(at);
+        if (kind == AgentxKind::Notify) {
+            std::string const line = "the SNMP master does not answer a notification; continuing "
+                                     "with the next one";
+            if (m_repeats.passes(line, now)) log(LogLevel::Warning, line);
+            std::exchange(m_taken, nullptr)();
+        } else if (kind == AgentxKind::Register || kind == AgentxKind::Unregister) {
+            m_rows.refused("it does not answer");
+        }
+    }
+}
+
 void AgentxSession::checkTime() {
+    expireRequests();
     auto const now = Clock::now();
     if (now < deadline()) return;
     if (m_stage == Stage::Away) {
@@ -198,7 +228,7 @@ void AgentxSession::send(Notification const& notification, std::function<void()>
 
 AgentxWriter AgentxSession::request(AgentxKind kind) {
     if (m_awaited.empty()) m_heard = Clock::now();
-    m_awaited.push_back({++m_lastPacket, kind, 0});
+    m_awaited.push_back({++m_lastPacket, kind, 0, Clock::now()});
     return {kind, m_session, 0, m_lastPacket};
 }
 
@@ -251,6 +281,8 @@ void AgentxSession::takePacket(AgentxHeader const& header, std::string_view payl
         takeResponse(header, payload);
     } else if (header.kind == AgentxKind::Close) {
         drop("it has closed the session");
+    } else if (header.session != m_session) {
+        drop("it has sent a packet of another session");
     } else if (std::string answer = m_answer(header, payload); !answer.empty()) {
         queue(std::move(answer));
     }
@@ -280,8 +312,12 @@ void AgentxSession::takeResponse(AgentxHeader const& header, std::string_view pa
         break;
     case AgentxKind::Notify:
         // The master would refuse it again.
-        if (fault != AgentxFault::None)
-            log(LogLevel::Warning, "the SNMP master refuses a notification: " + nameOf(fault));
+        if (fault != AgentxFault::None) {
+            std::string const line = "the SNMP master refuses a notification: " + nameOf(fault);
+            if (m_repeats.passes(line, Clock::now())) log(LogLevel::Warning, line);
+        }
+        // An expired one has been given up.
+        if (!m_taken) break;
         std::exchange(m_taken, nullptr)();
         break;
     default:

@@ -12,6 +12,7 @@
 #include "agent/fronts/agentx/AgentxAddress.h"
 #include "agent/fronts/agentx/AgentxPdu.h"
 #include "agent/fronts/agentx/SharedRows.h"
+#include "agent/log/RepeatFilter.h"
 #include "agent/notifications/NotificationSink.h"
 
 namespace kvloamd {
@@ -85,7 +86,8 @@ class AgentxSession final : public NotificationSink {
     struct Awaited {
         std::uint32_t packet;
         AgentxKind kind;
-        std::size_t root = 0; ///< index of the root that it registers
+        std::size_t root; ///< index of the root that it registers
+        Clock::time_point sent;
     };
 
     void connectNow();
@@ -94,6 +96,10 @@ class AgentxSession final : public NotificationSink {
     void takePacket(AgentxHeader const& header, std::string_view payload);
     void takeResponse(AgentxHeader const& header, std::string_view payload);
     void checkTime();
+    /// Whether the master has answered other requests, but not this one for too long.
+    bool isOverdue(Awaited const& awaited, Clock::time_point now) const;
+    /// Gives overdue requests up, so that they do not block others.
+    void expireRequests();
     void registerRoots();
     void takeRegistered(std::size_t root, AgentxFault fault);
     AgentxWriter request(AgentxKind kind);
@@ -123,6 +129,7 @@ class AgentxSession final : public NotificationSink {
     std::function<void()> m_taken;      ///< set while a notification awaits its response
     Clock::time_point m_retryAt;        ///< while away
     Clock::time_point m_heard;          ///< the master's last word, or when it was asked after that
+    RepeatFilter m_repeats;             ///< of lines about notifications
     std::string m_in;
     std::string m_out;
 };

@@ -36,6 +36,8 @@ std::string AgentxSets::testSet(AgentxHeader const& header, AgentxReader reader,
     }
     if (m_sets.size() >= kMost) m_sets.erase(m_sets.begin());
     auto& held = m_sets[{header.session, header.transaction}];
+    if (held.size() + tested.size() > kMostChanges)
+        return agentxResponse(header, AgentxFault::ResourceUnavailable);
     held.insert(held.end(), tested.begin(), tested.end());
     return agentxResponse(header, AgentxFault::None);
 }

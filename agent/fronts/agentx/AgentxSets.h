@@ -38,6 +38,8 @@ class AgentxSets {
     using Key = std::pair<std::uint32_t, std::uint32_t>;
     /// If a master never cleans up, the SET of the lowest transaction is forgotten.
     static constexpr std::size_t kMost = 64;
+    /// The most changes of one SET; no SNMP message has room for more.
+    static constexpr std::size_t kMostChanges = 4096;
 
     std::string testSet(AgentxHeader const& header, AgentxReader reader, Test const& test);
     std::string commitSet(AgentxHeader const& header);

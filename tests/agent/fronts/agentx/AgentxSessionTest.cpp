@@ -242,6 +242,47 @@ TEST_F(AgentxSessionTest, SilentMasterIsAskedAndLostUntilItAnswers) {
     EXPECT_TRUE(runUntil([this] { return m_session->isConnected(); }));
 }
 
+TEST_F(AgentxSessionTest, NotificationThatIsNeverAnsweredDoesNotBlockTheNext) {
+    startMaster();
+    AgentxPace pace = patient();
+    pace.patience = milliseconds(20);
+    startSession(pace);
+    connectSession();
+    notify();
+    EXPECT_EQ(next().header.kind, AgentxKind::Notify);
+    // The master goes on with other requests.
+    EXPECT_TRUE(runUntil([this] {
+        m_master->say(AgentxWriter(AgentxKind::TestSet, 77, 5, 6).take());
+        m_master->receive();
+        return m_taken == 1;
+    }));
+    EXPECT_TRUE(runUntil([this] {
+        m_master->say(AgentxWriter(AgentxKind::TestSet, 77, 5, 6).take());
+        m_master->receive();
+        return m_session->ready();
+    }));
+}
+
+TEST_F(AgentxSessionTest, PacketOfAnotherSessionEndsTheConnection) {
+    startMaster();
+    startSession();
+    connectSession();
+    m_master->say(AgentxWriter(AgentxKind::TestSet, 78, 5, 6).take());
+    EXPECT_TRUE(runUntil([this] { return m_master->isLeft(); }));
+    m_master->hangUp();
+    connectSession();
+}
+
+TEST_F(AgentxSessionTest, EndlessPacketEndsTheConnection) {
+    startMaster();
+    startSession();
+    connectSession();
+    std::string head = AgentxWriter(AgentxKind::GetNext, 77, 5, 6).take();
+    head.replace(16, 4, "\x7f\xff\xff\xff");
+    m_master->say(head);
+    EXPECT_TRUE(runUntil([this] { return m_master->isLeft(); }));
+}
+
 TEST_F(AgentxSessionTest, MasterThatNeverAnswersIsConnectedAnew) {
     startMaster();
     AgentxPace pace = patient();
