@@ -207,6 +207,7 @@ void addCallCommands(CLI::App& app, Connect connect, std::function<void()>& chos
         ->add_option("file", options->file,
                      "Script (- for standard input) of lines such as: setup 301 3; release 301 3; "
                      "signalling 301 l1; wait 0.5; # comment")
+        ->type_name("FILE")
         ->required();
 }
 

@@ -15,6 +15,7 @@
 #include "simulator/description/Generator.h"
 #include "simulator/tool/BoardDescriptions.h"
 #include "simulator/tool/CallTool.h"
+#include "simulator/tool/Completion.h"
 #include "simulator/tool/ControlClient.h"
 #include "simulator/tool/LineTool.h"
 #include "simulator/tool/OutputFile.h"
@@ -215,8 +216,11 @@ void addBoardCommands(CLI::App& app, Options& options, Run& chosen) {
     }
 
     auto* command = addChange(app, "insert", "Plug a board in", options, chosen, insert);
-    auto* const file = command->add_option(
-        "file", options.file, "Board or chassis in YAML or JSON; without it a board is made up");
+    auto* const file =
+        command
+            ->add_option("file", options.file,
+                         "Board or chassis in YAML or JSON; without it a board is made up")
+            ->type_name("FILE");
     auto& made = options.newBoard;
     constexpr std::int64_t lastHandle = kvlsim::Chassis::kRootHandle - 1;
     for (auto* option :
@@ -292,10 +296,11 @@ void addOtherCommands(CLI::App& app, Options& options, Run& chosen) {
     command->add_option("--lines", generator.lines, "DS1 lines per board (default: none)")
         ->check(CLI::Range(0, 1000));
     command->add_option("--seed", generator.seed, "The same seed makes the same chassis");
-    command->add_option("--output", options.output, "File (default: standard output)");
+    command->add_option("--output", options.output, "File (default: standard output)")
+        ->type_name("FILE");
 
     command = addCommand(app, "check", "Check a chassis file", chosen, check);
-    command->add_option("file", options.file, "Chassis file")->required();
+    command->add_option("file", options.file, "Chassis file")->type_name("FILE")->required();
 }
 
 /// Says which command was meant by a word that is none; empty when the words name a command.
@@ -334,7 +339,8 @@ int main(int argc, char** argv) {
     Options options;
     Run chosen;
     app.set_version_flag("--version", "kvlsim " KVLSIM_VERSION);
-    app.add_option("--socket", options.socket, "Control socket (default: KVLSIM_SOCKET)");
+    app.add_option("--socket", options.socket, "Control socket (default: KVLSIM_SOCKET)")
+        ->type_name("FILE");
     app.add_option("--timeout", options.timeout, "Seconds to wait for an answer (default: 30)")
         ->check(CLI::Range(1L, 86400L));
     app.require_subcommand(0, 1);
@@ -347,6 +353,7 @@ int main(int argc, char** argv) {
     kvlsim::addProcessCommands(app, toPlatform, chosenNested);
     kvlsim::addLineCommands(app, toPlatform, chosenNested);
     kvlsim::addCallCommands(app, toPlatform, chosenNested);
+    kvlsim::addCompletionCommands(app, chosenNested);
     try {
         app.parse(argc, argv);
     } catch (CLI::Success const& success) {
