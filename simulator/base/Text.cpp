@@ -60,7 +60,8 @@ std::string nearestWord(std::string_view word, std::vector<std::string> const& w
     std::size_t least = word.size() > 4 ? 2 : 1;
     std::string nearest;
     for (auto const& each : words) {
-        std::size_t const steps = each.size() > longest ? longest : distance(word, each);
+        if (each.size() > word.size() + least || word.size() > each.size() + least) continue;
+        std::size_t const steps = distance(word, each);
         if (steps > least || (steps == least && !nearest.empty())) continue;
         least = steps;
         nearest = each;

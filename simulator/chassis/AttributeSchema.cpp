@@ -5,9 +5,12 @@
 #include <algorithm>
 #include <array>
 #include <unordered_map>
+#include <utility>
+#include <vector>
 
 #include "boardplatform/ds1_line.h"
 #include "boardplatform/isdn_channels.h"
+#include "simulator/base/Text.h"
 
 namespace kvlsim {
 
@@ -20,6 +23,13 @@ constexpr std::array<std::int32_t, 11> kSubDeviceTypes = {502, 504, 506, 508, 51
 
 constexpr std::array<std::string_view, 5> kLiveAttributes = {
     kDS1LineCounters, kDS1LinePastSeconds, kDS1LinePast, kISDNChannelStates, kISDNSignallingState};
+
+/// They have a number behind this stem.
+constexpr std::array<std::pair<std::string_view, AttributeKind>, 4> kNumberedAttributes = {
+    {{"Protocol_Type_", AttributeKind::byte},
+     {"IP_ADDRESS_", AttributeKind::text},
+     {"IP_MASK_", AttributeKind::text},
+     {"IP_BROADCAST_", AttributeKind::text}}};
 
 std::unordered_map<std::string_view, AttributeKind> const& knownAttributes() {
     using enum AttributeKind;
@@ -89,15 +99,43 @@ bool isNumbered(std::string_view attribute, std::string_view stem) {
                                [](char c) { return c >= '0' && c <= '9'; });
 }
 
+std::string_view withoutNumber(std::string_view attribute) {
+    while (!attribute.empty() && attribute.back() >= '0' && attribute.back() <= '9')
+        attribute.remove_suffix(1);
+    return attribute;
+}
+
+std::vector<std::string> sortedNames() {
+    std::vector<std::string> names;
+    for (auto const& [name, kind] : knownAttributes())
+        names.emplace_back(name);
+    std::ranges::sort(names);
+    return names;
+}
+
 } // namespace
 
 AttributeKind kindOf(std::string_view attribute) {
     auto const& known = knownAttributes();
     if (auto const found = known.find(attribute); found != known.end()) return found->second;
-    if (isNumbered(attribute, "Protocol_Type_")) return AttributeKind::byte;
-    for (char const* stem : {"IP_ADDRESS_", "IP_MASK_", "IP_BROADCAST_"})
-        if (isNumbered(attribute, stem)) return AttributeKind::text;
+    for (auto const& [stem, kind] : kNumberedAttributes)
+        if (isNumbered(attribute, stem)) return kind;
     return AttributeKind::any;
+}
+
+std::string knownNameLike(std::string_view attribute) {
+    if (kindOf(attribute) != AttributeKind::any) return {};
+    std::string_view const stem = withoutNumber(attribute);
+    std::string const number(attribute.substr(stem.size()));
+    static std::vector<std::string> const names = sortedNames();
+    std::vector<std::string> stems;
+    for (auto const& [name, kind] : kNumberedAttributes)
+        if (!number.empty()) stems.push_back(std::string(name) + number);
+    std::string numbered = nearestWord(attribute, stems);
+    if (!numbered.empty()) return numbered;
+    std::string nearest = nearestWord(attribute, names);
+    // NAME2 is another attribute than NAME, not a misspelt one.
+    return withoutNumber(nearest) == stem ? std::string() : nearest;
 }
 
 bool isLiveAttribute(std::string_view attribute) {

@@ -5,6 +5,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <span>
+#include <string>
 #include <string_view>
 
 namespace kvlsim {
@@ -28,6 +29,10 @@ enum class BoardCondition : std::int32_t {
 enum class AttributeKind : std::uint8_t { any, text, number, byte, descriptor };
 
 AttributeKind kindOf(std::string_view attribute);
+
+/// The known attribute that an unknown one was probably meant to be; empty when none is near
+/// enough.
+std::string knownNameLike(std::string_view attribute);
 
 /// Is it answered by a line or by ISDN channels, and never written?
 bool isLiveAttribute(std::string_view attribute);

@@ -143,6 +143,17 @@ AttributeValue readExplicit(std::string_view name, AttributeKind kind, Descripti
                                        "; there are text, number, short, byte, empty, descriptor");
 }
 
+/// Attributes that cannot be written.
+void refuseUnfitAttribute(DescriptionEntry const& entry) {
+    refuseUnfitName(entry.key, entry.line);
+    if (entry.key == "TYPE")
+        throw ChassisError(entry.line, "TYPE follows from what the object is; remove it "
+                                       "(a device's is written as type:)");
+    if (isLiveAttribute(entry.key))
+        throw ChassisError(entry.line, entry.key + " follows from the device's line: or "
+                                                   "channels:; remove it");
+}
+
 } // namespace
 
 void refuseUnfitName(std::string_view name, int line) {
@@ -177,6 +188,11 @@ AttributeValue readAttribute(std::string_view name, Description const& value) {
 }
 
 AttributeMap readAttributes(Description const& attributes) {
+    Findings findings;
+    return readAttributes(attributes, findings);
+}
+
+AttributeMap readAttributes(Description const& attributes, Findings& findings) {
     if (attributes.form != Description::Form::map)
         throw ChassisError(attributes.line,
                            "attributes cannot be " + attributes.words() +
@@ -187,14 +203,11 @@ AttributeMap readAttributes(Description const& attributes) {
                                                 std::to_string(Chassis::kMaxAttributes));
     AttributeMap map;
     for (auto const& entry : attributes.entries) {
-        refuseUnfitName(entry.key, entry.line);
-        if (entry.key == "TYPE")
-            throw ChassisError(entry.line, "TYPE follows from what the object is; remove it "
-                                           "(a device's is written as type:)");
-        if (isLiveAttribute(entry.key))
-            throw ChassisError(entry.line, entry.key + " follows from the device's line: or "
-                                                       "channels:; remove it");
-        map.emplace(entry.key, readAttribute(entry.key, entry.value));
+        findings.part([&] {
+            refuseUnfitAttribute(entry);
+            map.emplace(entry.key, readAttribute(entry.key, entry.value));
+            findings.checkName(entry.key, entry.line);
+        });
     }
     return map;
 }

@@ -6,12 +6,16 @@
 
 #include "simulator/chassis/AttributeMap.h"
 #include "simulator/description/Description.h"
+#include "simulator/description/Findings.h"
 
 namespace kvlsim {
 
 /// All throw ChassisError.
 /// The attributes of an object of any kind, as a map "name: value".
 AttributeMap readAttributes(Description const& attributes);
+/// The same, with one finding per wrong attribute, and a warning for an unknown name that is close
+/// to a known one.
+AttributeMap readAttributes(Description const& attributes, Findings& findings);
 AttributeValue readAttribute(std::string_view name, Description const& value);
 /// What cannot be an attribute's name or text.
 void refuseUnfitName(std::string_view name, int line);

@@ -70,21 +70,28 @@ std::int32_t readType(Description const& object, std::string const& what,
                        what + " cannot be of type " + type->words() + "; choose one of " + list);
 }
 
-/// Handle, attributes and TYPE, which every kind of object has.
-ObjectDraft readObject(Description const& object, ObjectKind kind, Keys keys) {
+/// "device 101", or "a device" where the handle is missing.
+std::string wordsFor(ObjectDraft const& object) {
+    return object.handle > 0
+               ? std::string(nameOf(object.kind)) + ' ' + std::to_string(object.handle)
+               : std::string("a ") + nameOf(object.kind);
+}
+
+/// Handle, attributes and TYPE, which every kind of object has. The handle is 0 where it is wrong.
+ObjectDraft readObject(Description const& object, ObjectKind kind, Keys keys, Findings& findings) {
     requireMap(object, std::string("a ") + nameOf(kind), "handle:");
     ObjectDraft draft;
     draft.kind = kind;
     draft.line = object.line;
-    draft.handle = readHandle(object, kind);
-    std::string const what = std::string(nameOf(kind)) + ' ' + std::to_string(draft.handle);
-    refuseUnknownKeys(object, what, keys);
+    findings.part([&] { draft.handle = readHandle(object, kind); });
+    std::string const what = wordsFor(draft);
+    findUnknownKeys(object, what, keys, findings);
     switch (kind) {
     case ObjectKind::device:
-        draft.type = readType(object, what, deviceTypes());
+        findings.part([&] { draft.type = readType(object, what, deviceTypes()); });
         break;
     case ObjectKind::subDevice:
-        draft.type = readType(object, what, subDeviceTypes());
+        findings.part([&] { draft.type = readType(object, what, subDeviceTypes()); });
         break;
     case ObjectKind::processor:
         draft.type = kProcessorType;
@@ -93,17 +100,19 @@ ObjectDraft readObject(Description const& object, ObjectKind kind, Keys keys) {
         draft.type = kBoardType;
         break;
     }
-    if (Description const* attributes = object.find("attributes"))
-        if (attributes->form != Form::nothing) draft.attributes = readAttributes(*attributes);
+    Description const* const attributes = object.find("attributes");
+    if (attributes != nullptr && attributes->form != Form::nothing)
+        findings.part([&] { draft.attributes = readAttributes(*attributes, findings); });
     draft.attributes.emplace("TYPE", AttributeValue::number(draft.type));
     return draft;
 }
 
 /// What a device may have beyond other objects.
-void readDeviceParts(Description const& item, ObjectDraft& device) {
-    std::string const what = "device " + std::to_string(device.handle);
+void readDeviceParts(Description const& item, ObjectDraft& device, Findings& findings) {
+    std::string const what = wordsFor(device);
     Description const* const channels = item.find("channels");
-    if (channels != nullptr) device.channels = readChannels(*channels, what);
+    if (channels != nullptr)
+        findings.part([&] { device.channels = readChannels(*channels, what); });
     Description const* const line = item.find("line");
     if (line == nullptr) return;
     device.ds1Line = readLine(*line, what);
@@ -127,7 +136,7 @@ void readDeviceParts(Description const& item, ObjectDraft& device) {
 }
 
 void readChildren(Description const& parent, std::string_view key, ObjectKind kind, Keys keys,
-                  ObjectDraft& into) {
+                  ObjectDraft& into, Findings& findings) {
     Description const* const list = parent.find(key);
     if (list == nullptr || list->form == Form::nothing) return;
     if (list->form != Form::list)
@@ -135,55 +144,147 @@ void readChildren(Description const& parent, std::string_view key, ObjectKind ki
                            std::string(key) + " cannot be " + list->words() +
                                "; write a list, each entry beginning with \"- handle:\"");
     for (auto const& item : list->items) {
-        ObjectDraft child = readObject(item, kind, keys);
-        if (kind == ObjectKind::device) {
-            readDeviceParts(item, child);
-            readChildren(item, "subdevices", ObjectKind::subDevice, kSubDeviceKeys, child);
-        }
-        into.children.push_back(std::move(child));
+        findings.part([&] {
+            ObjectDraft child = readObject(item, kind, keys, findings);
+            if (kind == ObjectKind::device) {
+                findings.part([&] { readDeviceParts(item, child, findings); });
+                findings.part([&] {
+                    readChildren(item, "subdevices", ObjectKind::subDevice, kSubDeviceKeys, child,
+                                 findings);
+                });
+            }
+            into.children.push_back(std::move(child));
+        });
     }
 }
 
-/// Two objects of one description with one handle.
-void refuseSharedHandles(std::span<ObjectDraft const> objects,
-                         std::unordered_map<std::int32_t, ObjectDraft const*>& seen) {
-    for (auto const& object : objects) {
-        auto const [first, isNew] = seen.emplace(object.handle, &object);
-        if (!isNew) {
-            std::string const where =
-                first->second->line > 0 ? " of line " + std::to_string(first->second->line) : "";
-            throw ChassisError(object.line, "handle " + std::to_string(object.handle) +
-                                                " is already the " + nameOf(first->second->kind) +
-                                                where + "; give every object a handle of its own");
-        }
-        refuseSharedHandles(object.children, seen);
-    }
+/// Where a handle was written.
+struct HandlePlace {
+    ObjectKind kind;
+    int line;
+};
+using HandlePlaces = std::unordered_map<std::int32_t, HandlePlace>;
+
+void refuseSharedHandle(ObjectDraft const& object, HandlePlaces& seen) {
+    auto const [first, isNew] = seen.emplace(object.handle, HandlePlace{object.kind, object.line});
+    if (isNew) return;
+    HandlePlace const& place = first->second;
+    std::string const where =
+        place.line > 0 ? " of line " + std::to_string(place.line) + " of the file" : "";
+    throw ChassisError(object.line, "handle " + std::to_string(object.handle) + " is already the " +
+                                        nameOf(place.kind) + where +
+                                        "; give every object a handle of its own");
 }
 
-ObjectDraft readBoardOnly(Description const& description, std::string const& date) {
-    ObjectDraft board = readObject(description, ObjectKind::board, kBoardKeys);
+/// Two objects of one description with one handle: the second is refused and left out, and so is an
+/// object whose handle is wrong.
+void refuseSharedHandles(std::vector<ObjectDraft>& objects, HandlePlaces& seen,
+                         Findings& findings) {
+    std::vector<ObjectDraft> good;
+    for (auto& object : objects) {
+        bool fits = false;
+        if (object.handle > 0)
+            findings.part([&] {
+                refuseSharedHandle(object, seen);
+                fits = true;
+            });
+        refuseSharedHandles(object.children, seen, findings);
+        if (fits) good.push_back(std::move(object));
+    }
+    objects = std::move(good);
+}
+
+/// Is it written under the attributes, rightly or not?
+bool writesAttribute(Description const& object, std::string_view name) {
+    Description const* const attributes = object.find("attributes");
+    return attributes != nullptr && attributes->find(name) != nullptr;
+}
+
+void refuseMissingSerial(Description const& description, ObjectDraft const& board) {
     auto const serial = board.attributes.find(std::string_view("SERIAL_NUMBER"));
+    if (serial == board.attributes.end() && writesAttribute(description, "SERIAL_NUMBER"))
+        return; // refused already
     if (serial == board.attributes.end() || serial->second.form() != ValueForm::text ||
         serial->second.asText().empty())
-        throw ChassisError(description.line, "board " + std::to_string(board.handle) +
-                                                 " has no SERIAL_NUMBER; give it one under "
-                                                 "attributes");
+        throw ChassisError(description.line,
+                           wordsFor(board) + " has no SERIAL_NUMBER; give it one under attributes");
+}
+
+ObjectDraft readBoardOnly(Description const& description, std::string const& date,
+                          Findings& findings) {
+    ObjectDraft board = readObject(description, ObjectKind::board, kBoardKeys, findings);
+    findings.part([&] { refuseMissingSerial(description, board); });
     board.attributes.emplace("BOARD_CONDITION", AttributeValue::number(static_cast<std::int32_t>(
                                                     BoardCondition::started)));
     board.attributes.emplace("BOARD_PRESENT", AttributeValue::number(1));
     board.attributes.emplace("STATE_CHANGE_DATE", AttributeValue::text(date));
-    readChildren(description, "devices", ObjectKind::device, kDeviceKeys, board);
-    readChildren(description, "processors", ObjectKind::processor, kProcessorKeys, board);
+    findings.part([&] {
+        readChildren(description, "devices", ObjectKind::device, kDeviceKeys, board, findings);
+    });
+    findings.part([&] {
+        readChildren(description, "processors", ObjectKind::processor, kProcessorKeys, board,
+                     findings);
+    });
     return board;
+}
+
+std::vector<ObjectDraft> readBoards(Description const& list, Findings& findings) {
+    if (list.form == Form::nothing) return {};
+    if (list.form != Form::list)
+        throw ChassisError(list.line,
+                           "boards cannot be " + list.words() +
+                               "; write a list, each board beginning with \"- handle:\"");
+    std::vector<ObjectDraft> boards;
+    std::string const date = currentDate();
+    for (auto const& item : list.items)
+        findings.part([&] { boards.push_back(readBoardOnly(item, date, findings)); });
+    return boards;
+}
+
+Chassis buildChassis(Description const& file, Findings& findings) {
+    if (file.form == Form::nothing)
+        throw ChassisError(1, "there is nothing in it; begin the chassis with \"boards:\"");
+    requireMap(file, "a chassis", "boards:");
+    findUnknownKeys(file, "the chassis", kChassisKeys, findings);
+    std::vector<ObjectDraft> boards;
+    findings.part([&] {
+        Description const* const list = file.find("boards");
+        if (list == nullptr)
+            throw ChassisError(file.line, "no boards; begin the chassis with \"boards:\"");
+        boards = readBoards(*list, findings);
+    });
+    HandlePlaces seen;
+    refuseSharedHandles(boards, seen, findings);
+    Chassis chassis;
+    for (auto& board : boards)
+        findings.part([&] { chassis.insertBoard(std::move(board)); });
+    if (Description const* const store = file.find("store"))
+        findings.part([&] {
+            chassis.setStore(readStore(*store, findings));
+            // A record's family may be that of a board which is left out.
+            if (!findings.hasErrors()) refuseHomelessBoards(chassis.store(), chassis, findings);
+        });
+    if (Description const* const processes = file.find("processes"))
+        findings.part([&] { chassis.setProcesses(readProcesses(*processes, findings)); });
+    return chassis;
 }
 
 } // namespace
 
 ObjectDraft readBoard(Description const& description) {
-    ObjectDraft board = readBoardOnly(description, currentDate());
-    std::unordered_map<std::int32_t, ObjectDraft const*> seen;
-    refuseSharedHandles({&board, 1}, seen);
-    return board;
+    Findings findings;
+    std::vector<ObjectDraft> boards;
+    boards.push_back(readBoardOnly(description, currentDate(), findings));
+    HandlePlaces seen;
+    refuseSharedHandles(boards, seen, findings);
+    return std::move(boards.front());
+}
+
+std::optional<Chassis> readChassis(std::string const& yamlText, Findings& findings) {
+    std::optional<Chassis> chassis;
+    findings.part([&] { chassis = buildChassis(describeYaml(yamlText, findings), findings); });
+    if (findings.hasErrors()) chassis.reset();
+    return chassis;
 }
 
 Chassis readChassis(std::string const& yamlText) {
@@ -191,35 +292,8 @@ Chassis readChassis(std::string const& yamlText) {
 }
 
 Chassis readChassis(Description const& file) {
-    if (file.form == Form::nothing)
-        throw ChassisError(1, "there is nothing in it; begin the chassis with \"boards:\"");
-    requireMap(file, "a chassis", "boards:");
-    refuseUnknownKeys(file, "the chassis", kChassisKeys);
-    Description const* const list = file.find("boards");
-    if (list == nullptr)
-        throw ChassisError(file.line, "no boards; begin the chassis with \"boards:\"");
-    std::vector<ObjectDraft> boards;
-    if (list->form != Form::nothing) {
-        if (list->form != Form::list)
-            throw ChassisError(list->line,
-                               "boards cannot be " + list->words() +
-                                   "; write a list, each board beginning with \"- handle:\"");
-        std::string const date = currentDate();
-        for (auto const& item : list->items)
-            boards.push_back(readBoardOnly(item, date));
-    }
-    std::unordered_map<std::int32_t, ObjectDraft const*> seen;
-    refuseSharedHandles(boards, seen);
-    Chassis chassis;
-    for (auto& board : boards)
-        chassis.insertBoard(std::move(board));
-    if (Description const* const store = file.find("store")) {
-        chassis.setStore(readStore(*store));
-        refuseHomelessBoards(chassis.store(), chassis);
-    }
-    if (Description const* const processes = file.find("processes"))
-        chassis.setProcesses(readProcesses(*processes));
-    return chassis;
+    Findings findings;
+    return buildChassis(file, findings);
 }
 
 std::string readChassisFile(std::string const& path) {

@@ -2,14 +2,18 @@
 // Reads a chassis, a board or one attribute from its description and refuses what is wrong.
 #pragma once
 
+#include <optional>
 #include <string>
 
 #include "simulator/chassis/Chassis.h"
 #include "simulator/description/Description.h"
+#include "simulator/description/Findings.h"
 
 namespace kvlsim {
 
-/// All throw ChassisError with the line and a message that says what to do.
+/// Reads a chassis and finds what is wrong with it. Empty: errors are collected.
+std::optional<Chassis> readChassis(std::string const& yamlText, Findings& findings);
+/// The others throw ChassisError with the line and a message that says what to do.
 Chassis readChassis(std::string const& yamlText);
 Chassis readChassis(Description const& description);
 /// Defaults (condition, presence, date) included.

@@ -49,20 +49,83 @@ void refuseRepeatedKeys(Description const& map) {
     if (repeated == sorted.end()) return;
     throw ChassisError((*(repeated + 1))->line,
                        inQuotes((*repeated)->key) + " is written twice (first in line " +
-                           std::to_string((*repeated)->line) + "); keep one of them");
+                           std::to_string((*repeated)->line) + " of the file); keep one of them");
+}
+
+/// Does the quoted text that begins at `mark` end before the file does? The parser ends it there.
+bool isClosed(std::string const& text, YAML::Mark const& mark) {
+    constexpr std::string_view byteOrderMark = "\xEF\xBB\xBF";
+    auto at = static_cast<std::size_t>(mark.pos);
+    if (text.starts_with(byteOrderMark)) at += byteOrderMark.size();
+    if (at >= text.size() || (text[at] != '"' && text[at] != '\'')) return true; // not a quoted one
+    char const quote = text[at];
+    for (++at; at < text.size(); ++at) {
+        if (text[at] == quote) return true; // a doubled ' has another behind it, which ends it too
+        if (text[at] == '\\' && quote == '"') ++at;
+    }
+    return false;
+}
+
+/// What the parser complains of, in words for those who do not know it.
+std::string plainWords(std::string const& message) {
+    constexpr char const* misfit = "this does not fit the lines above; indent entries that belong "
+                                   "together alike, and close every quote";
+    struct {
+        std::string_view message;
+        char const* words;
+    } static constexpr known[] = {
+        {"end of map not found", misfit},
+        {"end of sequence not found", misfit},
+        {"illegal block entry", misfit},
+        {"illegal map key", misfit},
+        {"illegal map value", "a \"key: value\" cannot stand here; indent it like its neighbours, "
+                              "and write texts with a colon in quotes"},
+        {"end of map flow not found", "a \"{\" is not closed; write its \"}\" here or before"},
+        {"end of sequence flow not found", "a \"[\" is not closed; write its \"]\" here or before"},
+        {"illegal EOF in scalar", "a quoted text begins here and never ends; close its quote"},
+        {"unknown token", "a value cannot begin with this character; write it in quotes"},
+    };
+    for (auto const& each : known)
+        if (message == each.message) return each.words;
+    return "not readable as YAML: " + oneLine(message) + "; correct it there or just before";
+}
+
+/// Is the indentation of this line, counted from 0, made with a tab?
+bool isIndentedWithTab(std::string const& text, int line) {
+    std::size_t begin = 0;
+    for (int i = 0; i < line; ++i) {
+        auto const end = text.find('\n', begin);
+        if (end == std::string::npos) return false;
+        begin = end + 1;
+    }
+    auto const word = std::min(text.find_first_not_of(" \t-", begin), text.size());
+    return text.substr(begin, word - begin).find('\t') != std::string::npos;
+}
+
+ChassisError inPlainWords(YAML::Exception const& error, std::string const& text) {
+    if (error.mark.is_null()) return {0, plainWords(error.msg)};
+    if (isIndentedWithTab(text, error.mark.line))
+        return {error.mark.line + 1, "the line is indented with a tab; indent with spaces"};
+    return {error.mark.line + 1, plainWords(error.msg)};
 }
 
 /// Builds the tree from the parser's events: unlike the parser's own nodes it keeps every line and
 /// cannot be made to grow by aliases.
 class TreeBuilder final : public YAML::EventHandler {
   public:
+    TreeBuilder(std::string const& text, Findings& findings) : m_text(text), m_findings(findings) {}
+
     Description take() { return std::move(m_root); }
 
     void OnDocumentStart(YAML::Mark const& mark) override {
         if (m_begun) throw ChassisError(mark.line + 1, "a second YAML document; keep the first");
         m_begun = true;
     }
-    void OnDocumentEnd() override {}
+    void OnDocumentEnd() override {
+        if (m_lastText && !isClosed(m_text, *m_lastText))
+            throw ChassisError(m_lastText->line + 1,
+                               "a quoted text begins here and never ends; close its quote");
+    }
 
     void OnNull(YAML::Mark const& mark, YAML::anchor_t /*anchor*/) override {
         Description node;
@@ -83,6 +146,7 @@ class TreeBuilder final : public YAML::EventHandler {
         node.form = (tag == "!" || tag == "tag:yaml.org,2002:str") ? Description::Form::text
                                                                    : Description::Form::plain;
         refuseTag(tag, node.line);
+        if (node.form == Description::Form::text) m_lastText = mark;
         add(std::move(node));
     }
 
@@ -97,7 +161,7 @@ class TreeBuilder final : public YAML::EventHandler {
         open(Description::Form::map, mark, tag);
     }
     void OnMapEnd() override {
-        refuseRepeatedKeys(m_open.back().node);
+        m_findings.part([&] { refuseRepeatedKeys(m_open.back().node); });
         close();
     }
 
@@ -159,7 +223,10 @@ class TreeBuilder final : public YAML::EventHandler {
         }
     }
 
+    std::string const& m_text;
+    Findings& m_findings;
     bool m_begun = false;
+    std::optional<YAML::Mark> m_lastText;
     std::size_t m_values = 0; ///< keys included
     Description m_root;
     std::vector<Open> m_open;
@@ -278,16 +345,19 @@ std::string Description::words() const {
 }
 
 Description describeYaml(std::string const& text) {
+    Findings findings;
+    return describeYaml(text, findings);
+}
+
+Description describeYaml(std::string const& text, Findings& findings) {
     std::istringstream stream(text);
-    TreeBuilder builder;
+    TreeBuilder builder(text, findings);
     try {
         YAML::Parser parser(stream);
         while (parser.HandleNextDocument(builder)) {
         }
     } catch (YAML::Exception const& error) {
-        throw ChassisError(error.mark.is_null() ? 0 : error.mark.line + 1,
-                           "not readable as YAML: " + oneLine(error.msg) +
-                               "; correct it there or just before");
+        throw inPlainWords(error, text);
     }
     return builder.take();
 }

@@ -10,6 +10,8 @@
 
 #include <nlohmann/json_fwd.hpp>
 
+#include "simulator/description/Findings.h"
+
 namespace kvlsim {
 
 struct DescriptionEntry;
@@ -49,7 +51,9 @@ struct DescriptionEntry {
     Description value;
 };
 
-/// Both throw ChassisError; trees deeper than a chassis can be are refused.
+/// Both throw ChassisError; trees deeper than a chassis can be are refused. A key that is written
+/// twice is a finding.
+Description describeYaml(std::string const& text, Findings& findings);
 Description describeYaml(std::string const& text);
 Description describeJson(nlohmann::json const& json);
 

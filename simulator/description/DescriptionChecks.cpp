@@ -12,13 +12,21 @@ namespace kvlsim {
 
 void refuseUnknownKeys(Description const& map, std::string const& what,
                        std::span<std::string_view const> known) {
+    Findings findings;
+    findUnknownKeys(map, what, known, findings);
+}
+
+void findUnknownKeys(Description const& map, std::string const& what,
+                     std::span<std::string_view const> known, Findings& findings) {
     for (auto const& entry : map.entries) {
         if (std::ranges::find(known, entry.key) != known.end()) continue;
         std::string list;
         for (auto const& key : known)
             appendToList(list, key);
-        throw ChassisError(entry.line, "unknown key " + inQuotes(entry.key) + " in " + what +
-                                           "; known: " + list);
+        findings.part([&] {
+            throw ChassisError(entry.line, "unknown key " + inQuotes(entry.key) + " in " + what +
+                                               "; known: " + list);
+        });
     }
 }
 

@@ -108,7 +108,7 @@ Counters readCounters(Description const* counters, Description const* rates) {
     return read;
 }
 
-std::vector<ProcessDraft> readProcesses(Description const& processes) {
+std::vector<ProcessDraft> readProcesses(Description const& processes, Findings& findings) {
     if (processes.form == Form::nothing) return {};
     if (processes.form != Form::list)
         throw ChassisError(processes.line,
@@ -117,14 +117,16 @@ std::vector<ProcessDraft> readProcesses(Description const& processes) {
     std::vector<ProcessDraft> drafts;
     std::set<std::pair<ProcessKind, std::string>> seen;
     for (auto const& item : processes.items) {
-        ProcessDraft draft = readProcess(item);
-        // Children may share a name, as processes do.
-        if (draft.kind != ProcessKind::child && !seen.emplace(draft.kind, draft.name).second)
-            throw ChassisError(item.line, draft.kind == ProcessKind::self
-                                              ? "the process itself is written twice; keep one"
-                                              : "command " + inQuotes(draft.name) +
-                                                    " is written twice; keep one of them");
-        drafts.push_back(std::move(draft));
+        findings.part([&] {
+            ProcessDraft draft = readProcess(item);
+            // Children may share a name, as processes do.
+            if (draft.kind != ProcessKind::child && !seen.emplace(draft.kind, draft.name).second)
+                throw ChassisError(item.line, draft.kind == ProcessKind::self
+                                                  ? "the process itself is written twice; keep one"
+                                                  : "command " + inQuotes(draft.name) +
+                                                        " is written twice; keep one of them");
+            drafts.push_back(std::move(draft));
+        });
     }
     return drafts;
 }

@@ -10,8 +10,8 @@
 
 namespace kvlsim {
 
-/// Both throw ChassisError.
-std::vector<ProcessDraft> readProcesses(Description const& processes);
+/// Both throw ChassisError. A wrong process is a finding.
+std::vector<ProcessDraft> readProcesses(Description const& processes, Findings& findings);
 /// `counters` and `rates` are maps "name: number"; null: none.
 Counters readCounters(Description const* counters, Description const* rates);
 void refuseUnfitProcessName(std::string_view name, int line);

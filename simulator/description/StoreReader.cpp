@@ -92,7 +92,7 @@ StoreBoardDraft readRecord(Description const& item) {
     return draft;
 }
 
-std::vector<StoreBoardDraft> readRecords(Description const& list) {
+std::vector<StoreBoardDraft> readRecords(Description const& list, Findings& findings) {
     if (list.form != Form::list)
         throw ChassisError(list.line,
                            "the store's boards cannot be " + list.words() +
@@ -100,16 +100,32 @@ std::vector<StoreBoardDraft> readRecords(Description const& list) {
     std::vector<StoreBoardDraft> boards;
     std::map<std::string, int> lines;
     for (auto const& item : list.items) {
-        StoreBoardDraft board = readRecord(item);
-        auto const [first, isNew] = lines.emplace(board.serial, board.line);
-        if (!isNew)
-            throw ChassisError(board.line, "serial number " + inQuotes(board.serial) +
-                                               " is already that of the record of line " +
-                                               std::to_string(first->second) +
-                                               "; serial numbers must differ");
-        boards.push_back(std::move(board));
+        findings.part([&] {
+            StoreBoardDraft board = readRecord(item);
+            auto const [first, isNew] = lines.emplace(board.serial, board.line);
+            if (!isNew)
+                throw ChassisError(board.line, "serial number " + inQuotes(board.serial) +
+                                                   " is already that of the record of line " +
+                                                   std::to_string(first->second) +
+                                                   " of the file; serial numbers must differ");
+            boards.push_back(std::move(board));
+        });
     }
     return boards;
+}
+
+void refuseHomeless(StoreBoardDraft const& draft, StoreDraft const& store, Chassis const& chassis) {
+    std::string const family = draft.family.empty()
+                                   ? textOf(chassis.boardWithSerial(draft.serial), "FAMILY")
+                                   : draft.family;
+    if (!fitsAsFamily(family))
+        throw ChassisError(draft.line, "record " + inQuotes(draft.serial) +
+                                           " has no family; give it \"family:\"");
+    if (store.families && std::ranges::find(*store.families, family) == store.families->end())
+        throw ChassisError(draft.line, "record " + inQuotes(draft.serial) + " is of family " +
+                                           inQuotes(family) +
+                                           ", which is not among the store's families; add it "
+                                           "there");
 }
 
 } // namespace
@@ -145,30 +161,20 @@ FieldValues readFields(Description const& fields) {
     return values;
 }
 
-void refuseHomelessBoards(StoreDraft const& store, Chassis const& chassis) {
+void refuseHomelessBoards(StoreDraft const& store, Chassis const& chassis, Findings& findings) {
     if (!store.boards) return;
-    for (auto const& draft : *store.boards) {
-        std::string const family = draft.family.empty()
-                                       ? textOf(chassis.boardWithSerial(draft.serial), "FAMILY")
-                                       : draft.family;
-        if (!fitsAsFamily(family))
-            throw ChassisError(draft.line, "record " + inQuotes(draft.serial) +
-                                               " has no family; give it \"family:\"");
-        if (store.families && std::ranges::find(*store.families, family) == store.families->end())
-            throw ChassisError(draft.line, "record " + inQuotes(draft.serial) + " is of family " +
-                                               inQuotes(family) +
-                                               ", which is not among the store's families; add it "
-                                               "there");
-    }
+    for (auto const& draft : *store.boards)
+        findings.part([&] { refuseHomeless(draft, store, chassis); });
 }
 
-StoreDraft readStore(Description const& store) {
+StoreDraft readStore(Description const& store, Findings& findings) {
     requireMap(store, "the store", "families:");
-    refuseUnknownKeys(store, "the store", kStoreKeys);
+    findUnknownKeys(store, "the store", kStoreKeys, findings);
     StoreDraft draft;
     if (Description const* const families = store.find("families"))
-        draft.families = readFamilies(*families);
-    if (Description const* const boards = store.find("boards")) draft.boards = readRecords(*boards);
+        findings.part([&] { draft.families = readFamilies(*families); });
+    if (Description const* const boards = store.find("boards"))
+        findings.part([&] { draft.boards = readRecords(*boards, findings); });
     return draft;
 }
 

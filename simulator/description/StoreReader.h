@@ -10,14 +10,15 @@
 
 namespace kvlsim {
 
-/// Both throw ChassisError. `fields` is a map "name: value"; SerialNumber is not among them.
-StoreDraft readStore(Description const& store);
+/// Both throw ChassisError. A wrong record of the store is a finding. `fields` is a map "name:
+/// value"; SerialNumber is not among them.
+StoreDraft readStore(Description const& store, Findings& findings);
 FieldValues readFields(Description const& fields);
 /// What cannot be a family's name or a serial number.
 void refuseUnfitFamily(std::string_view name, int line);
 void refuseUnfitSerial(std::string_view serial, int line);
 
-/// Refuses described boards that belong to no family of the store; throws ChassisError.
-void refuseHomelessBoards(StoreDraft const& store, Chassis const& chassis);
+/// Refuses described boards that belong to no family of the store.
+void refuseHomelessBoards(StoreDraft const& store, Chassis const& chassis, Findings& findings);
 
 } // namespace kvlsim

@@ -8,6 +8,7 @@
 
 #include "simulator/chassis/ChassisError.h"
 #include "simulator/description/ChassisReader.h"
+#include "simulator/description/Findings.h"
 #include "simulator/platform/BundledChassis.h"
 #include "simulator/store/StoreContents.h"
 
@@ -53,7 +54,12 @@ void Platform::loadConfiguredChassis() {
     std::string source = file.empty() ? "the bundled chassis" : file;
     try {
         // Another thread's `loadChassis` may have come first: its chassis stays.
-        m_chassis.putFirst(readChassis(file.empty() ? kBundledChassis : readChassisFile(file)));
+        Findings findings;
+        auto chassis =
+            readChassis(file.empty() ? kBundledChassis : readChassisFile(file), findings);
+        for (auto const& warning : findings.warnings(source))
+            std::fprintf(stderr, "kvlsim: %s\n", warning.c_str());
+        m_chassis.putFirst(std::move(chassis).value());
         return;
     } catch (ChassisError const& error) {
         source = describeError(source, error);

@@ -4,14 +4,16 @@
 #include <cstdlib>
 #include <functional>
 #include <iostream>
+#include <optional>
 #include <set>
 
 #include <CLI/CLI.hpp>
 
 #include "simulator/base/Text.h"
 #include "simulator/chassis/AttributeSchema.h"
-#include "simulator/chassis/ChassisError.h"
+#include "simulator/chassis/Chassis.h"
 #include "simulator/description/ChassisReader.h"
+#include "simulator/description/Findings.h"
 #include "simulator/description/Generator.h"
 #include "simulator/tool/BoardDescriptions.h"
 #include "simulator/tool/CallTool.h"
@@ -172,12 +174,19 @@ void generate(Options const& options) {
 }
 
 void check(Options const& options) {
-    try {
-        auto const chassis = kvlsim::readChassis(kvlsim::readChassisFile(options.file));
-        std::cout << options.file << ": good, " << chassis.boardCount() << " boards\n";
-    } catch (kvlsim::ChassisError const& error) {
-        throw ToolError(kvlsim::describeError(options.file, error));
+    kvlsim::Findings findings(kvlsim::Findings::OnError::collect);
+    std::optional<kvlsim::Chassis> chassis;
+    findings.part(
+        [&] { chassis = kvlsim::readChassis(kvlsim::readChassisFile(options.file), findings); });
+    for (auto const& warning : findings.warnings(options.file))
+        std::cerr << "kvlsim: " << warning << '\n';
+    if (!chassis) {
+        std::string errors; // every line begins like the first
+        for (auto const& error : findings.errors(options.file))
+            errors += (errors.empty() ? "" : "\nkvlsim: ") + error;
+        throw ToolError(errors);
     }
+    std::cout << options.file << ": good, " << chassis->boardCount() << " boards\n";
 }
 
 using Run = std::function<void(Options const&)>;

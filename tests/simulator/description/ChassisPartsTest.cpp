@@ -67,7 +67,7 @@ INSTANTIATE_TEST_SUITE_P(
                    ":4: a serial number cannot be 12345; it is a text, write it in quotes"},
         BadFixture{"store-serial-twice.yaml",
                    ":5: serial number \"A1\" is already that of the record "
-                   "of line 4; serial numbers must differ"},
+                   "of line 4 of the file; serial numbers must differ"},
         BadFixture{"store-text-too-long.yaml",
                    ":7: Model: a text of 80 bytes is too long; 79 is the most"},
         BadFixture{"store-unknown-field.yaml",

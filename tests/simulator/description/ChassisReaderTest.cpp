@@ -50,9 +50,7 @@ constexpr char const* kAllSubDeviceTypes =
 INSTANTIATE_TEST_SUITE_P(
     Fixtures, BadChassisFileTest,
     testing::Values(
-        BadFixture{"not-yaml.yaml",
-                   ":4: not readable as YAML: end of map flow not found; correct it "
-                   "there or just before"},
+        BadFixture{"not-yaml.yaml", ":4: a \"{\" is not closed; write its \"}\" here or before"},
         BadFixture{"empty.yaml", ":1: there is nothing in it; begin the chassis with \"boards:\""},
         BadFixture{"no-boards.yaml", ":2: no boards; begin the chassis with \"boards:\""},
         BadFixture{"boards-is-a-map.yaml", ":2: boards cannot be a map; write a list, each board "
@@ -65,7 +63,7 @@ INSTANTIATE_TEST_SUITE_P(
                    ":2: unknown key \"borads\" in the chassis; known: boards, "
                    "store, processes"},
         BadFixture{"key-twice.yaml",
-                   ":6: \"IRQ\" is written twice (first in line 5); keep one of them"},
+                   ":6: \"IRQ\" is written twice (first in line 5 of the file); keep one of them"},
         BadFixture{"list-as-key.yaml",
                    ":2: a key must be a plain word; this one is a list or a map"},
         BadFixture{"no-handle.yaml",
@@ -82,7 +80,7 @@ INSTANTIATE_TEST_SUITE_P(
                    ":2: the handle of a board cannot be the text \"1\"; write a "
                    "number from 1 to 2147483646"},
         BadFixture{"handle-twice.yaml",
-                   ":6: handle 7 is already the processor of line 5; give every "
+                   ":6: handle 7 is already the processor of line 5 of the file; give every "
                    "object a handle of its own"},
         BadFixture{"no-serial.yaml",
                    ":2: board 5 has no SERIAL_NUMBER; give it one under attributes"},

@@ -286,6 +286,7 @@ TEST_F(KvlsimToolTest, GeneratedChassisIsGood) {
     Finished const checked = kvlsim({"check", path});
     EXPECT_EQ(checked.status, 0) << checked.err;
     EXPECT_EQ(checked.out, path + ": good, 200 boards\n");
+    EXPECT_EQ(checked.err, "");
     ChildProcess& process = hold({"KVLSIM_CHASSIS=" + path});
     process.writeLine("read 200 SERIAL_NUMBER");
     EXPECT_THAT(process.readLine(), testing::EndsWith("0000200"));
@@ -311,11 +312,41 @@ TEST_F(KvlsimToolTest, ChassisThatCannotBeWrittenLeavesNothingBehind) {
 }
 
 TEST_F(KvlsimToolTest, CheckRefusesABadChassisWithItsLine) {
-    std::string const path = write("bad.yaml", "boards:\n  - handle: 0\n");
+    std::string const path =
+        write("bad.yaml", "boards:\n  - {handle: 0, attributes: {SERIAL_NUMBER: A1}}\n");
     expectRefusal({"check", path}, 1,
                   "kvlsim: " + path +
                       ":2: the handle of a board cannot be 0; write a number from 1 to "
                       "2147483646");
+}
+
+TEST_F(KvlsimToolTest, CheckReportsEveryErrorAndWarning) {
+    std::string const path = write("bad.yaml", "boards:\n"
+                                               "  - handle: 0\n"
+                                               "    attributes: {SERIAL_NUMBER: A1, FAMILIY: X}\n"
+                                               "  - handle: 2\n");
+    expectRefusal({"check", path}, 1,
+                  "kvlsim: " + path +
+                      ":3: warning: unknown attribute \"FAMILIY\"; did you mean FAMILY?\n"
+                      "kvlsim: " +
+                      path +
+                      ":2: the handle of a board cannot be 0; write a number from 1 to "
+                      "2147483646\n"
+                      "kvlsim: " +
+                      path + ":4: board 2 has no SERIAL_NUMBER; give it one under attributes");
+}
+
+TEST_F(KvlsimToolTest, CheckOfAMisspeltAttributeWarnsAndSucceeds) {
+    std::string const path =
+        write("warned.yaml", "boards:\n"
+                             "  - handle: 1\n"
+                             "    attributes: {SERIAL_NUMBER: A1, BOARD_PRESNT: 0}\n");
+    Finished const checked = kvlsim({"check", path});
+    EXPECT_EQ(checked.status, 0);
+    EXPECT_EQ(checked.out, path + ": good, 1 boards\n");
+    EXPECT_EQ(checked.err, "kvlsim: " + path +
+                               ":3: warning: unknown attribute \"BOARD_PRESNT\"; did you mean "
+                               "BOARD_PRESENT?\n");
 }
 
 TEST_F(KvlsimToolTest, BundledChassisIsTheExampleChassis) {
@@ -339,6 +370,22 @@ TEST_F(KvlsimToolTest, BadChassisIsReportedInOneLineAndThePlatformAnswersNothing
     Finished const finished = process.finish();
     EXPECT_EQ(finished.status, 0);
     EXPECT_EQ(finished.err, "kvlsim: " + reason + "\n");
+}
+
+TEST_F(KvlsimToolTest, LoadingAChassisWarnsOfAMisspeltAttribute) {
+    std::string const path = write("warned.yaml", "boards:\n"
+                                                  "  - handle: 1\n"
+                                                  "    attributes:\n"
+                                                  "      SERIAL_NUMBER: A1\n"
+                                                  "      FAMILIY: NX5\n");
+    ChildProcess& process = hold({"KVLSIM_CHASSIS=" + path});
+    process.writeLine("read 1 FAMILIY");
+    EXPECT_THAT(process.readLine(), testing::EndsWith("NX5"));
+    Finished const finished = process.finish();
+    EXPECT_EQ(finished.status, 0);
+    EXPECT_EQ(finished.err, "kvlsim: " + path +
+                                ":5: warning: unknown attribute \"FAMILIY\"; did you mean "
+                                "FAMILY?\n");
 }
 
 TEST_F(KvlsimToolTest, SocketGoesWithItsProcess) {
