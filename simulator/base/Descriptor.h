@@ -6,7 +6,7 @@
 
 namespace kvlsim {
 
-/// A file descriptor, closed with its owner.
+/// A `Descriptor` owns a file descriptor and closes it when it is destroyed.
 class Descriptor {
   public:
     explicit Descriptor(int fd = -1) : m_fd(fd) {}

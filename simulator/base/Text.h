@@ -8,7 +8,7 @@
 
 namespace kvlsim {
 
-/// Is this byte an ASCII control character?
+/// Whether this byte is an ASCII control character.
 constexpr bool isControl(char c) {
     return static_cast<unsigned char>(c) < 0x20 || c == 0x7f;
 }
@@ -19,7 +19,7 @@ std::string oneLine(std::string text);
 /// `text` quoted, cut to a readable length and with control characters replaced, fit for one line.
 std::string inQuotes(std::string_view text);
 
-/// Appends to "one, two".
+/// Appends an item to a list such as "one, two".
 void appendToList(std::string& list, std::string_view word);
 
 /// The one of `words` that `word` was probably meant to be; empty when none is near enough.

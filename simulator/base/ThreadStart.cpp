@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Starts a thread of the simulator inside somebody else's process.
+// Starts a thread of the simulator in the host process.
 #include "simulator/base/ThreadStart.h"
 
 #include <csignal>

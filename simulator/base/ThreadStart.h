@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Starts a thread of the simulator inside somebody else's process.
+// Starts a thread of the simulator in the host process.
 #pragma once
 
 #include <functional>
@@ -7,8 +7,8 @@
 
 namespace kvlsim {
 
-/// The thread bears `name` (15 characters at most) and takes no signals: those are the host's.
-/// Throws std::system_error when the system has no thread left.
+/// Starts a thread called `name` (at most 15 characters), which blocks all signals: they are for
+/// the host's own threads. Throws std::system_error when the system cannot make another thread.
 std::thread startThread(char const* name, std::function<void()> body);
 
 } // namespace kvlsim

@@ -12,7 +12,7 @@
 
 namespace kvlsim {
 
-/// Hash that lets maps be searched with a text that is not a std::string.
+/// `TextHash` is a hash that lets maps be searched with a text that is not a std::string.
 struct TextHash {
     using is_transparent = void;
     std::size_t operator()(std::string_view text) const noexcept {

@@ -92,7 +92,7 @@ std::unordered_map<std::string_view, AttributeKind> const& knownAttributes() {
     return known;
 }
 
-/// Is it this stem and a number behind it?
+/// Whether `attribute` is this stem followed by a number.
 bool isNumbered(std::string_view attribute, std::string_view stem) {
     if (!attribute.starts_with(stem) || attribute.size() == stem.size()) return false;
     return std::ranges::all_of(attribute.substr(stem.size()),

@@ -13,7 +13,7 @@ namespace kvlsim {
 inline constexpr std::int32_t kBoardType = 200;
 inline constexpr std::int32_t kProcessorType = 800;
 
-/// Longest text: a reader's 128-byte buffer holds it with its terminating NUL.
+/// The most characters of a text: it fits a reader's 128-byte buffer with its terminating NUL.
 inline constexpr std::size_t kMaxTextLength = 127;
 
 /// Values of BOARD_CONDITION.
@@ -25,7 +25,7 @@ enum class BoardCondition : std::int32_t {
     failed = 15,
 };
 
-/// What a known attribute must be; `any` for names that the simulator does not know.
+/// The kind that a known attribute must have; `any` for names that the simulator does not know.
 enum class AttributeKind : std::uint8_t { any, text, number, byte, descriptor };
 
 AttributeKind kindOf(std::string_view attribute);
@@ -34,7 +34,7 @@ AttributeKind kindOf(std::string_view attribute);
 /// enough.
 std::string knownNameLike(std::string_view attribute);
 
-/// Is it answered by a line or by ISDN channels, and never written?
+/// Whether a line or ISDN channels answer the attribute, so that nobody writes it.
 bool isLiveAttribute(std::string_view attribute);
 
 std::span<std::int32_t const> deviceTypes();

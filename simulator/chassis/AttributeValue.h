@@ -9,7 +9,7 @@
 
 namespace kvlsim {
 
-/// The forms an attribute's answer can take; the name says how many bytes it has.
+/// The forms of an attribute's answer, which differ in their size.
 enum class ValueForm : std::uint8_t {
     text,        ///< the characters and a terminating NUL
     number,      ///< four bytes, signed
@@ -21,7 +21,8 @@ enum class ValueForm : std::uint8_t {
 
 using DescriptorWords = std::array<std::uint16_t, 4>;
 
-/// A value is immutable and compares by its bytes, as a search does.
+/// An `AttributeValue` is one attribute's value: immutable, and compared by its bytes, as a search
+/// does.
 class AttributeValue {
   public:
     static AttributeValue text(std::string_view text);
@@ -32,7 +33,7 @@ class AttributeValue {
     static AttributeValue descriptor(DescriptorWords const& words);
 
     ValueForm form() const { return m_form; }
-    /// What the client stores; a text's terminating NUL included.
+    /// The bytes that the client stores, a text's terminating NUL included.
     std::string_view bytes() const { return m_bytes; }
     /// Requires: a text.
     std::string_view asText() const;

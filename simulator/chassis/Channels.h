@@ -27,7 +27,8 @@ inline std::string_view nameOf(ISDNSignallingState state) {
     return kSignallingStateNames[static_cast<std::size_t>(state) - 1];
 }
 
-/// Not synchronised: the platform guards it with its lock. Channels count from 1.
+/// `Channels` are the ISDN channels of one trunk, numbered from 1. Unsynchronised: the platform
+/// guards them with its lock.
 class Channels {
   public:
     /// All bearer channels are idle. Requires: 1 to kMaxBearers of them.

@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The chassis: boards with their devices, sub-devices and processors, found by handle, name or
-// serial number; their lines and channels; what its attribute store and its processes are like.
+// serial number; their lines and channels; the descriptions of the attribute store and processes.
 #pragma once
 
 #include <cstddef>
@@ -28,7 +28,7 @@ enum class ObjectKind : std::uint8_t { root, board, device, subDevice, processor
 /// "board", "device" and so on.
 char const* nameOf(ObjectKind kind);
 
-/// An object as it is described, with its children, before it enters a chassis.
+/// An `ObjectDraft` is an object as it is described, with its children, before it enters a chassis.
 struct ObjectDraft {
     ObjectKind kind = ObjectKind::board;
     std::int32_t handle = 0;
@@ -40,7 +40,7 @@ struct ObjectDraft {
     std::vector<ObjectDraft> children;
 };
 
-/// An object of the chassis.
+/// A `ChassisObject` is an object of the chassis: its root, a board, or an object of a board.
 struct ChassisObject {
     ObjectKind kind = ObjectKind::root;
     std::int32_t handle = 0;
@@ -60,8 +60,8 @@ struct ChassisObject {
 /// The text of an attribute; empty when there is no object or no such text.
 std::string textOf(ChassisObject const* object, std::string_view attribute);
 
-/// Not synchronised: the platform guards it with its lock. An operation that throws has changed
-/// nothing.
+/// A `Chassis` is the set of all boards with their objects. Unsynchronised: the platform guards it
+/// with its lock. An operation that throws has changed nothing.
 class Chassis {
   public:
     /// The root object's handle. Objects have handles from 1 to just below it.
@@ -98,13 +98,13 @@ class Chassis {
 
     /// The clock of the lines; null: the steady clock. All lines begin again as at loading.
     void setLineClock(LineClock* clock);
-    /// What the clock of the lines tells now.
+    /// The time of the clock of the lines.
     LiveLine::Time lineTime() const;
     /// To change them. Require: the object has one.
     LiveLine& line(std::int32_t handle) { return *m_objects.at(handle).ds1Line; }
     Channels& channels(std::int32_t handle) { return *m_objects.at(handle).channels; }
 
-    /// What the attribute store holds when it is made.
+    /// The contents of the attribute store when it is created.
     StoreDraft const& store() const { return m_store; }
     void setStore(StoreDraft store) { m_store = std::move(store); }
     /// The processes of the runtime library; none: the process itself.

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// What is wrong with a description, as one line.
+// A fault in a description, as one line.
 #include "simulator/chassis/ChassisError.h"
 
 namespace kvlsim {

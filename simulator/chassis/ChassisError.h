@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// What is wrong with a description.
+// A fault in a description.
 #pragma once
 
 #include <stdexcept>
@@ -8,7 +8,8 @@
 
 namespace kvlsim {
 
-/// What is wrong with a description, and what to do about it. `line()` is 0 where there is none.
+/// A `ChassisError` says what is wrong with a description and what to do about it. `line()` is 0
+/// where no line is known.
 class ChassisError : public std::runtime_error {
   public:
     ChassisError(int line, std::string const& message)

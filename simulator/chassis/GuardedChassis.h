@@ -11,8 +11,8 @@
 
 namespace kvlsim {
 
-/// A shared mutex under which writers do not starve: readers that come after a waiting writer stand
-/// behind it. Not recursive, not even for readers.
+/// A `FairSharedMutex` is a shared mutex under which writers do not starve: readers that come after
+/// a waiting writer wait until it is done. Not recursive, not even for readers.
 class FairSharedMutex {
   public:
     void lock() {
@@ -37,10 +37,11 @@ class FairSharedMutex {
     std::shared_mutex m_mutex;
 };
 
-/// The chassis of a platform behind its lock; thread-safe. There is none until `put` is called.
+/// A `GuardedChassis` is the chassis of a platform with its lock; thread-safe. It is empty until
+/// `put` is called.
 class GuardedChassis {
   public:
-    /// Calls `look(chassis)` with the chassis held still; null when there is none.
+    /// Calls `look(chassis)` while the chassis cannot change; with null when there is none.
     template <typename Look>
     auto read(Look&& look) {
         std::shared_lock const lock(m_lock);

@@ -8,7 +8,7 @@ namespace kvlsim {
 
 namespace {
 
-/// With one of these a line has no frame, and says so to the far end.
+/// With one of these alarms a line has no frame, and sends RAI to the far end.
 constexpr std::uint32_t kFrameLosing =
     kDS1AlarmLossOfSignal | kDS1AlarmLossOfFrame | kDS1AlarmIndication;
 
@@ -20,7 +20,8 @@ std::string_view nameOf(DS1LineType type) {
 }
 
 Line::Count Line::Count::after(std::uint64_t rate, Time time) const {
-    // Whole seconds and the rest apart, whole errors and billionths apart: every product fits.
+    // Whole seconds and their rest, whole errors and billionths are multiplied separately, so that
+    // every product fits.
     auto const nanoseconds = static_cast<std::uint64_t>(std::max(time, Time::zero()).count());
     std::uint64_t const seconds = nanoseconds / kLineRateUnit;
     std::uint64_t const rest = nanoseconds % kLineRateUnit;

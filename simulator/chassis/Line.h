@@ -16,11 +16,11 @@ inline constexpr std::array<std::string_view, 4> kLineErrorNames = {
     "code-violations", "path-violations", "framing-errors", "slips"};
 
 using LineErrors = std::array<std::uint32_t, kLineErrorNames.size()>;
-/// Errors per second, in billionths: sums of them are exact.
+/// Errors per second, in billionths, so that sums are exact.
 using LineRates = std::array<std::uint64_t, kLineErrorNames.size()>;
 
 inline constexpr std::uint64_t kLineRateUnit = 1'000'000'000;
-/// Errors per second; what many rates add up to still fits.
+/// The highest rate, in errors per second; the sum of many such rates still fits.
 inline constexpr std::uint64_t kMaxLineRate = 1'000'000;
 
 /// The alarms' names; alarm n is bit n of `DS1LineCounters::alarms`.
@@ -36,7 +36,7 @@ inline constexpr std::array<std::string_view, 11> kLineAlarmNames = {"los",
                                                                      "sending-remote-multiframe",
                                                                      "test-code"};
 
-/// The types' names as descriptions and commands write them.
+/// A `LineTypeName` is a line type with its name in descriptions and commands.
 struct LineTypeName {
     std::string_view name;
     DS1LineType type;
@@ -52,25 +52,26 @@ inline constexpr std::array<LineTypeName, 6> kLineTypeNames = {
 /// "esf" and so on; empty for a number that is no type.
 std::string_view nameOf(DS1LineType type);
 
-/// Counts evenly and without chance: after t seconds at a rate r, floor(r * t). Times are the
-/// line's age and do not go back from one call to the next.
+/// A `Line` is the model of a DS1 line: its counters and its alarms. It counts evenly, without
+/// randomness: after t seconds at a rate r, floor(r * t). All times are the line's age and must not
+/// decrease from one call to the next.
 class Line {
   public:
     using Time = std::chrono::nanoseconds;
 
     DS1LineCounters counters(Time age) const;
     LineRates const& rates() const { return m_rates; }
-    /// The alarms that were raised, without those that follow from them.
+    /// The alarms that were raised, without those that they cause.
     std::uint32_t raised() const { return m_raised; }
 
     /// Counts these at once.
     void add(LineErrors const& errors);
     void setRates(LineRates const& rates, Time age);
-    /// Lets these alarms, and no others, be raised.
+    /// Raises these alarms and clears all others.
     void setRaised(std::uint32_t alarms, Time age);
 
   private:
-    /// An even count. `part` is what it has beyond the whole, in billionths.
+    /// A `Count` is a number of errors; `part` is its fraction, in billionths.
     struct Count {
         std::uint32_t whole = 0;
         std::uint64_t part = 0;
@@ -78,7 +79,7 @@ class Line {
         Count after(std::uint64_t rate, Time time) const;
     };
 
-    /// The seconds that a defect has touched.
+    /// `TouchedSeconds` are the seconds in which a defect was present, however briefly.
     class TouchedSeconds {
       public:
         std::uint32_t at(Time age) const;

@@ -9,7 +9,7 @@
 
 namespace kvlsim {
 
-/// A part of the past in which there was more than the usual.
+/// A `LineSpell` is a part of the past with errors or alarms beyond the usual ones.
 struct LineSpell {
     std::int64_t ago = 0;     ///< seconds before loading at which it began
     std::int64_t seconds = 0; ///< how long it lasted
@@ -17,12 +17,14 @@ struct LineSpell {
     LineRates rates{}; ///< on top of the usual ones
 };
 
+/// A `LinePast` is the described past of a line.
 struct LinePast {
     std::int64_t seconds = 0; ///< 0: none
     LineRates rates{};
     std::vector<LineSpell> spells; ///< may overlap
 };
 
+/// A `LineDraft` is a line as it is described.
 struct LineDraft {
     DS1LineType type = DS1LineType::esf;
     LineRates rates{};

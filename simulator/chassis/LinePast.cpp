@@ -11,7 +11,7 @@ namespace kvlsim {
 
 namespace {
 
-/// Where a spell begins or ends.
+/// A `Change` is the start or the end of a spell.
 struct Change {
     std::int64_t second = 0;
     LineSpell const* spell = nullptr;
@@ -26,13 +26,13 @@ std::vector<Change> changesOf(LinePast const& past) {
         changes.push_back({begin, &spell, true});
         changes.push_back({begin + spell.seconds, &spell, false});
     }
-    // What begins comes before what ends, so that an alarm that goes on is not interrupted.
+    // Spells that begin come before those that end, so that an alarm of both is not interrupted.
     std::ranges::sort(
         changes, {}, [](Change const& change) { return std::pair(change.second, !change.begins); });
     return changes;
 }
 
-/// The line in its past, with all spells of the moment added up.
+/// A `PastLine` is a line in its past, with the sum of all spells that are under way.
 class PastLine {
   public:
     explicit PastLine(LinePast const& past) : m_rates(past.rates) { m_line.setRates(m_rates, {}); }

@@ -8,7 +8,7 @@
 
 namespace kvlsim {
 
-/// The line at its loading, whose age is then the length of its past.
+/// The line at loading; its age is the length of its past.
 Line lineAtLoading(LineDraft const& draft);
 /// Calls `record` with the counters of every second of the past, the first and the last included.
 void replayPast(LinePast const& past, std::function<void(DS1LineCounters const&)> const& record);

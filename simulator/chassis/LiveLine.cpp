@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A line of the chassis: its beginning.
+// The start of a line of the chassis.
 #include "simulator/chassis/LiveLine.h"
 
 #include <utility>

@@ -8,7 +8,8 @@
 
 namespace kvlsim {
 
-/// `now` is what the clock of lines tells. Not synchronised: the platform guards it with its lock.
+/// A `LiveLine` is a line of the chassis that runs since it was loaded. `now` is the time of the
+/// clock of the lines. Unsynchronised: the platform guards it with its lock.
 class LiveLine {
   public:
     using Time = Line::Time;

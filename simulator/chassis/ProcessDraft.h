@@ -18,22 +18,25 @@ using CounterValues = std::array<std::int32_t, kCounterNames.size()>;
 /// Changes per second.
 using CounterRates = std::array<double, kCounterNames.size()>;
 
+/// `Counters` are the counters of a process at its start, and how they change.
 struct Counters {
     CounterValues start{};
     CounterRates rates{};
 
-    /// The counters after so many seconds, each between 0 and the largest 32-bit number. No more
-    /// events are on the queue than it holds, and no fewer were there at most than are there now.
+    /// The counters after so many seconds, each between 0 and the largest 32-bit number. The events
+    /// on the queue never exceed its size, and their maximum is never below their number.
     CounterValues after(double seconds) const;
 };
 
+/// How a process of the runtime library is chosen.
 enum class ProcessKind : std::uint8_t {
     self,    ///< the process that runs the platform
     child,   ///< started under a name, ends with the process
-    command, ///< every process on the host whose program bears the name
+    command, ///< every process on the host whose program has the name
     pid,     ///< one process on the host
 };
 
+/// A `ProcessDraft` is a process, or all processes of a command, as it is described.
 struct ProcessDraft {
     ProcessKind kind = ProcessKind::self;
     std::string name; ///< of a child or command; a child's may be a path

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// What a chassis says of its attribute store.
+// The description of the attribute store in a chassis.
 #pragma once
 
 #include <optional>
@@ -13,8 +13,8 @@ namespace kvlsim {
 
 using FieldValues = std::vector<std::pair<RecordField const*, FieldValue>>;
 
-/// A board's record as it is described; what is left out comes from the chassis's board with this
-/// serial number.
+/// A `StoreBoardDraft` is a board's record as it is described. Fields that are left out come from
+/// the chassis's board with this serial number.
 struct StoreBoardDraft {
     std::string serial;
     std::string family; ///< empty: left out
@@ -22,7 +22,7 @@ struct StoreBoardDraft {
     int line = 0; ///< where it was described; 0 when it came without lines
 };
 
-/// The part "store" of a chassis.
+/// A `StoreDraft` is the part "store" of a chassis.
 struct StoreDraft {
     std::optional<std::vector<std::string>> families;   ///< none: the known ones and the boards'
     std::optional<std::vector<StoreBoardDraft>> boards; ///< none: all boards that have a family

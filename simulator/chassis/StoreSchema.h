@@ -10,7 +10,7 @@
 
 namespace kvlsim {
 
-/// A type of record; the root's has no parent.
+/// A `RecordType` is a type of record; the root's has no parent.
 struct RecordType {
     std::string_view name;
     std::string_view parent;
@@ -24,7 +24,7 @@ inline constexpr RecordType kBoardRecord{"Board", "Family", 2128};
 /// Null when there is no such type.
 RecordType const* recordTypeNamed(std::string_view name);
 
-/// Names the layout of the board's record; its Version.
+/// The name of the layout of a board's record, which is its Version.
 inline constexpr std::string_view kBoardLayout = "BW1.0_BCI_Struct";
 
 /// The families that every store has.
@@ -32,8 +32,8 @@ std::span<std::string_view const> knownFamilies();
 
 enum class FieldKind : std::uint8_t { text, number };
 
-/// A field of the board's record. A text has at most `length` - 1 characters and a NUL; a number is
-/// signed, in host byte order.
+/// A `RecordField` is a field of the board's record. A text has at most `length` - 1 characters and
+/// a NUL; a number is signed, in host byte order.
 struct RecordField {
     std::string_view name;
     int offset;
@@ -48,7 +48,7 @@ RecordField const* boardFieldNamed(std::string_view name);
 
 using FieldValue = std::variant<std::int32_t, std::string>;
 
-/// The bytes of one board's record.
+/// A `BoardRecord` is the bytes of one board's record.
 class BoardRecord {
   public:
     BoardRecord() : m_bytes(static_cast<std::size_t>(kBoardRecord.size), '\0') {}

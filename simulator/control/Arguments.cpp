@@ -108,7 +108,7 @@ ChassisObject const& Arguments::found(char const* name, Chassis const& chassis,
                                       bool boardsOnly) const {
     ChassisObject const* const object = look(name, chassis, boardsOnly);
     if (object == nullptr && boardsOnly) {
-        // The handle of a part: say whose it is.
+        // The handle of a device or processor: name the board that owns it.
         auto const handle = readNumber(name);
         auto const* part = handle && *handle > 0 && *handle < Chassis::kRootHandle
                                ? chassis.find(static_cast<long>(*handle))

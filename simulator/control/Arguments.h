@@ -15,12 +15,13 @@
 
 namespace kvlsim {
 
-/// Why a command is refused, in one line.
+/// A `CommandError` says in one line why a command is refused.
 class CommandError : public std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
-/// All throw CommandError when an argument is missing or of the wrong type.
+/// `Arguments` are the arguments of one control command. All operations throw CommandError when an
+/// argument is missing or of the wrong type.
 class Arguments {
   public:
     /// Requires: an object that outlives this.
@@ -36,9 +37,9 @@ class Arguments {
     /// A whole number within the bounds, as a JSON number or a text such as "0x30001".
     std::int64_t number(char const* name, std::int64_t least, std::int64_t most) const;
 
-    /// A board by handle, serial number or NAME (when only one bears it), in this order.
+    /// A board by handle, serial number or NAME (if only one board has it), in this order.
     ChassisObject const& board(Chassis const& chassis) const;
-    /// Any object: by handle, serial number of a board, or NAME (when only one bears it).
+    /// Any object: by handle, serial number of a board, or NAME (if only one object has it).
     ChassisObject const& object(Chassis const& chassis, char const* name = "object") const;
     /// As `board`, but a handle need not be in the chassis.
     std::int32_t boardHandle(Chassis const& chassis) const;

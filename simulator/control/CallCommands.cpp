@@ -21,7 +21,7 @@ ChassisObject const& trunkOf(CommandContext const& context, Chassis const& chass
                        " has no channels; \"kvlsim call list\" lists those that have");
 }
 
-/// The channels of one trunk, which tell of every change.
+/// A `Trunk` is the channels of one trunk; it announces every change.
 class Trunk {
   public:
     Trunk(CommandContext const& context, Chassis& chassis)

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// What a control command works on, and the commands that have files of their own.
+// The context of a control command, and the commands that are in files of their own.
 #pragma once
 
 #include <cstdint>
@@ -12,6 +12,7 @@
 
 namespace kvlsim {
 
+/// A `CommandContext` is the platform and the arguments that a control command works on.
 struct CommandContext {
     Platform& platform;
     Arguments const& arguments;
@@ -22,7 +23,7 @@ struct CommandContext {
     }
 };
 
-/// Thrown where a command needs a chassis and there is none.
+/// `NoChassis` is thrown when a command needs a chassis and there is none.
 struct NoChassis {};
 
 template <typename AnyChassis>

@@ -88,7 +88,7 @@ Json replace(Context const& context) {
             throw CommandError("board " + std::to_string(board) + " already has serial number " +
                                inQuotes(serial) + "; a replacement has another");
         chassis.setAttribute(board, "SERIAL_NUMBER", now);
-        // A card just plugged in runs, whatever became of the one before it.
+        // A board that has just been plugged in runs, whatever the condition of its predecessor.
         setCondition(chassis, board, BoardCondition::started);
         chassis.setAttribute(board, "BOARD_PRESENT", AttributeValue::number(1));
         for (auto& [name, value] : attributes)
@@ -151,7 +151,7 @@ Json changeAttribute(Context const& context, Change change) {
     return {{"object", handle}};
 }
 
-/// A line's type is told twice when it is shown: it must be one of those that can be described.
+/// LINE_TYPE must be a type that a description can have, because "show" prints both.
 void refuseUnfitLineType(ChassisObject const& object, std::string_view name,
                          AttributeValue const& value) {
     if (!object.ds1Line || name != kDS1LineType || fitsLineType(value)) return;
@@ -187,7 +187,7 @@ Json unset(Context const& context) {
         });
 }
 
-/// Do messages with this identifier always concern one board?
+/// Whether messages with this identifier always concern one board.
 bool needsBoard(std::uint32_t id) {
     auto const between = [id](EventId first, EventId last) {
         return id >= static_cast<std::uint32_t>(first) && id <= static_cast<std::uint32_t>(last);
@@ -251,6 +251,7 @@ Json ping(Context const& context) {
     return Json::object();
 }
 
+/// A `Command` is a name with its function.
 struct Command {
     std::string_view name;
     Json (*run)(Context const&);

@@ -12,8 +12,8 @@
 
 namespace kvlsim {
 
-/// Executes a command on the platform. Never throws. A "drain" does not wait here: `waitFor` gets
-/// the number of the event after whose delivery the reply is true.
+/// Executes a command on the platform. Never throws. A "drain" does not wait here: `waitFor` is set
+/// to the number of the event after whose delivery the reply may be sent.
 nlohmann::json dispatch(Platform& platform, nlohmann::json const& command,
                         std::optional<std::uint64_t>& waitFor);
 

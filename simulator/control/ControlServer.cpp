@@ -33,9 +33,10 @@ std::string asLine(nlohmann::json const& reply) {
     return reply.dump(-1, ' ', false, nlohmann::json::error_handler_t::replace) + "\n";
 }
 
-/// Throws CommandError, or nlohmann::json::exception for what is no JSON.
+/// Throws CommandError, or nlohmann::json::exception for a text that is not JSON.
 nlohmann::json parseCommand(std::string const& line) {
-    // A board in a command has 11 levels; building thousands would take the thread seconds.
+    // A board in a command has 11 levels; building thousands would keep the thread busy for
+    // seconds.
     constexpr int maxDepth = 20;
     return nlohmann::json::parse(
         line, [](int depth, nlohmann::json::parse_event_t, nlohmann::json const&) {
@@ -45,8 +46,8 @@ nlohmann::json parseCommand(std::string const& line) {
         });
 }
 
-/// A connection. While a reply is unsent or a drain is pending no further request is read, so that
-/// a client that never reads costs one reply at most.
+/// A `Connection` is a client's connection. While a reply is unsent or a drain is pending, no
+/// further request is read, so that a client that never reads costs one reply at most.
 struct Connection {
     explicit Connection(Descriptor connected) : socket(std::move(connected)) {}
 
@@ -55,13 +56,14 @@ struct Connection {
     std::string output;
     std::optional<std::uint64_t> waitFor; ///< event after which `pending` is sent
     nlohmann::json pending;
-    bool ended = false;   ///< nothing more comes from the client
+    bool ended = false;   ///< the client sends nothing more
     bool closing = false; ///< to be closed once the output is sent
-    bool deaf = false;    ///< the client has gone: its requests count, its replies do not
+    bool deaf = false;    ///< the client has gone: requests are executed, replies are dropped
 
     bool busy() const { return !output.empty() || waitFor.has_value(); }
 };
 
+/// A `Server` is the control socket with its clients. It runs on the control thread.
 class Server {
   public:
     Server(std::string const& path, Platform& platform) : m_platform(platform), m_listener(path) {
@@ -99,14 +101,14 @@ class Server {
             auto revents = polled.begin() + 2;
             for (auto& client : m_clients)
                 serve(client, (revents++)->revents);
-            // Those who have gone make room for those who wait.
+            // Ended clients make room for waiting ones.
             dropEnded();
             if ((polled[1].revents & POLLIN) != 0) acceptClients();
-            dropEnded(); // those who were refused
+            dropEnded(); // those that were refused
         }
     }
 
-    /// Waits until one is ready. False after a failure: nothing is known of any of them then.
+    /// Waits until a descriptor is ready. False after a failure: their states are then unknown.
     bool wait(std::vector<pollfd>& polled) {
         auto const timeout = m_acceptPaused ? static_cast<int>(kPause.count()) : -1;
         if (poll(polled.data(), polled.size(), timeout) >= 0) {
@@ -232,7 +234,7 @@ class Server {
             answer(client, reply);
             return;
         }
-        // Counted before the look: a delivery after it sees the count and wakes the loop.
+        // Counted before the check: a later delivery sees the count and wakes the loop.
         m_draining.fetch_add(1);
         client.waitFor = waitFor;
         client.pending = std::move(reply);
@@ -264,7 +266,7 @@ class Server {
         client.output.erase(0, sent);
     }
 
-    static constexpr std::chrono::milliseconds kPause{200}; ///< after what may pass
+    static constexpr std::chrono::milliseconds kPause{200}; ///< after a temporary failure
 
     Platform& m_platform;
     ListeningSocket m_listener;

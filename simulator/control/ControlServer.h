@@ -8,9 +8,10 @@
 
 namespace kvlsim {
 
-/// Longest request line, without its line end. A board of some ten thousand objects fits.
+/// The most bytes of a request line, without its line end: enough for a board of ten thousand
+/// objects.
 inline constexpr std::size_t kMaxControlLine = std::size_t(8) << 20;
-/// Clients served at once.
+/// The most clients that are served at once.
 inline constexpr std::size_t kMaxControlClients = 64;
 
 /// Serves `platform` on a socket at `path` until the process ends. When that is not possible, says

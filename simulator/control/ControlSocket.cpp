@@ -81,7 +81,8 @@ PathLock::PathLock(std::string const& path) : m_file(path + ".lock") {
             if (errno == EWOULDBLOCK) fail(path, kInUse);
             failErrno(path, "its lock file cannot be locked");
         }
-        // A process that ended in between has removed the file: what is locked then has no name.
+        // A process that ended in the meantime has removed the file, and the lock is on a file
+        // without a name.
     } while (fstat(m_lock.get(), &held) != 0 || stat(m_file.c_str(), &named) != 0 ||
              held.st_ino != named.st_ino || held.st_dev != named.st_dev);
 }
@@ -97,7 +98,7 @@ ListeningSocket::ListeningSocket(std::string path) : m_path(std::move(path)), m_
     if (bind(m_socket.get(), generic(address), sizeof address) != 0)
         failErrno(m_path, "cannot be bound");
     struct stat file {};
-    // Nobody can connect before listen(), so the mode is right from the first moment it matters.
+    // No client can connect before listen(), so the mode is set in time.
     if (chmod(m_path.c_str(), S_IRUSR | S_IWUSR) != 0 || stat(m_path.c_str(), &file) != 0 ||
         listen(m_socket.get(), SOMAXCONN) != 0) {
         int const error = errno;
@@ -127,7 +128,7 @@ WakeUp::WakeUp() : m_event(eventfd(0, EFD_NONBLOCK | EFD_CLOEXEC)) {
 
 void WakeUp::signal() const {
     std::uint64_t const one = 1;
-    // Fails only when the counter is full, and then the poll is awake anyway.
+    // Fails only when the counter is full; the poll is then awake already.
     static_cast<void>(!write(m_event.get(), &one, sizeof one));
 }
 

@@ -10,7 +10,8 @@
 
 namespace kvlsim {
 
-/// A lock that one process holds on a path: a file beside it, "path.lock", removed at the end.
+/// A `PathLock` is a lock that one process holds on a path: a locked file beside it, "path.lock",
+/// which is removed at the end.
 class PathLock {
   public:
     /// Throws std::runtime_error when another process holds the lock, or it cannot be made.
@@ -24,7 +25,8 @@ class PathLock {
     Descriptor m_lock;
 };
 
-/// A listening Unix socket, mode 0600. Its file is removed with it, unless another has replaced it.
+/// A `ListeningSocket` is a listening Unix socket with mode 0600. It removes its file when it is
+/// destroyed, unless another process has replaced the file.
 class ListeningSocket {
   public:
     /// Replaces the socket of a process that has gone. Throws std::runtime_error when the path is
@@ -47,7 +49,7 @@ class ListeningSocket {
     ino_t m_inode = 0;
 };
 
-/// Wakes a poll() from another thread.
+/// A `WakeUp` is a descriptor through which another thread ends a poll().
 class WakeUp {
   public:
     WakeUp(); ///< throws std::runtime_error

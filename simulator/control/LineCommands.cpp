@@ -36,7 +36,7 @@ Json changeLine(CommandContext const& context, Change change) {
     return {{"line", handle}};
 }
 
-/// Lets these alarms be raised and announces every difference.
+/// Raises these alarms, clears all others, and announces every change.
 void setRaised(CommandContext const& context, LiveLine& line, LiveLine::Time now,
                std::int32_t board, std::uint32_t alarms) {
     std::uint32_t const changed = line.raised() ^ alarms;

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Objects and values as JSON, in the very form in which a description is written.
+// Objects and values as JSON, in the form of a description.
 #pragma once
 
 #include <cstdint>

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Reads a chassis, a board or one attribute from its description and refuses what is wrong.
+// Reads a chassis, a board or one attribute from its description and refuses faulty ones.
 #pragma once
 
 #include <optional>
@@ -21,7 +21,7 @@ ObjectDraft readBoard(Description const& description);
 /// Reads a file; throws ChassisError (without line) when it cannot be read.
 std::string readChassisFile(std::string const& path);
 
-/// Now, in the format of STATE_CHANGE_DATE, local time.
+/// The local time now, in the format of STATE_CHANGE_DATE.
 std::string currentDate();
 
 } // namespace kvlsim

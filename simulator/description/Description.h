@@ -16,7 +16,7 @@ namespace kvlsim {
 
 struct DescriptionEntry;
 
-/// One node of the tree.
+/// A `Description` is one node of the tree.
 struct Description {
     enum class Form : std::uint8_t {
         nothing, ///< written, but without a value
@@ -36,7 +36,7 @@ struct Description {
     bool isScalar() const { return form == Form::text || form == Form::plain; }
     /// The number that an unquoted scalar reads as, if it reads as one and fits 64 bits.
     std::optional<std::int64_t> integer() const;
-    /// Does an unquoted scalar read as a whole number, of whatever size?
+    /// Whether an unquoted scalar reads as a whole number, of any size.
     bool readsAsInteger() const;
     /// The finite number, 0.5 or -2, that an unquoted scalar or a JSON number reads as.
     std::optional<double> decimal() const;
@@ -45,6 +45,7 @@ struct Description {
     std::string words() const;
 };
 
+/// A `DescriptionEntry` is a key of a map with its value.
 struct DescriptionEntry {
     std::string key;
     int line = 0;

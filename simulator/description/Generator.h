@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Makes up boards and whole chassis, the same for the same seed on every machine.
+// Generates boards and whole chassis. The same seed gives the same result on every machine.
 #pragma once
 
 #include <cstdint>
@@ -10,6 +10,7 @@
 
 namespace kvlsim {
 
+/// `GeneratorOptions` say how large a generated chassis is.
 struct GeneratorOptions {
     std::int32_t boards = 3;
     std::int32_t devices = 2;    ///< per board
@@ -20,6 +21,7 @@ struct GeneratorOptions {
     std::string family; ///< of all boards, where it is a known one; else families vary
 };
 
+/// A `Generator` makes boards from a sequence of pseudo-random numbers. Unsynchronised.
 class Generator {
   public:
     explicit Generator(GeneratorOptions const& options)

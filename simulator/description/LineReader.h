@@ -12,9 +12,9 @@
 
 namespace kvlsim {
 
-/// These throw ChassisError. `of` is the device, for messages: "device 101".
+/// All functions throw ChassisError. `of` is the device, for messages: "device 101".
 LineDraft readLine(Description const& line, std::string const& of);
-/// A map "name: errors per second"; what is not named stays what it is in `rates`.
+/// A map "name: errors per second"; other rates stay as they are in `rates`.
 void readLineRates(Description const& errors, LineRates& rates);
 /// A map "name: number".
 LineErrors readLineErrors(Description const& errors);

@@ -14,7 +14,7 @@ namespace kvlsim {
 /// value"; SerialNumber is not among them.
 StoreDraft readStore(Description const& store, Findings& findings);
 FieldValues readFields(Description const& fields);
-/// What cannot be a family's name or a serial number.
+/// Refuse a text that cannot be a family's name or a serial number.
 void refuseUnfitFamily(std::string_view name, int line);
 void refuseUnfitSerial(std::string_view serial, int line);
 

@@ -144,8 +144,8 @@ void EventService::stop() {
 
 void EventService::ensureThread() {
     if (m_thread.joinable()) return;
-    // Registered now, so that the thread is gone before objects that are older than it are
-    // destroyed: their handlers may be what it calls.
+    // Registered now, so that the thread has ended before objects that are older than it are
+    // destroyed: it may call their handlers.
     static pid_t const process = getpid();
     static EventService* const service = this;
     std::atexit([] {
@@ -182,7 +182,7 @@ void EventService::deliver(std::unique_lock<std::mutex>& lock, Message& message,
             if (filter.id != message.id || filter.enabled == 0 || filter.handler == nullptr)
                 continue;
             lock.unlock();
-            // Each handler gets a message of its own: one may scribble over it.
+            // Each handler gets a copy of the message, because a handler may change it.
             auto payload = message.payload;
             AdminCallbackMsg callback{};
             callback.id = message.id;

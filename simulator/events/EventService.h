@@ -21,6 +21,7 @@
 
 namespace kvlsim {
 
+/// The identifiers of administrative and fault events.
 enum class EventId : std::uint32_t {
     faultRaised = 0x30001,
     faultCleared = 0x30002,
@@ -44,7 +45,7 @@ inline constexpr std::size_t kMaxQueuedEvents = 65536;
 /// 0x3....; else empty.
 std::string_view channelOf(std::uint32_t id);
 
-/// An event before it is queued.
+/// An `Announcement` is an event before it is queued.
 struct Announcement {
     std::uint32_t id = 0;
     std::optional<std::int32_t> board;
@@ -52,7 +53,8 @@ struct Announcement {
     std::optional<ISDNChannelMsg> channel = {}; ///< the payload in the place of board and fault
 };
 
-/// One subscriber. Its fields are guarded by the service's lock, except those that never change.
+/// An `EventConsumer` is one subscriber. Its fields are guarded by the service's lock, except those
+/// that never change.
 struct EventConsumer {
     std::string channel;
     std::vector<VqxEventService::AdminConsumer::FilterCallbackAssoc> filters;
@@ -61,8 +63,9 @@ struct EventConsumer {
     bool closed = false;
 };
 
-/// Callable from any thread. Handlers run on the delivery thread, one message at a time, without
-/// any lock of the service held.
+/// An `EventService` is the queue of events and the thread that delivers them; thread-safe.
+/// Handlers run on the delivery thread, one message at a time, without any lock of the service
+/// held.
 class EventService {
   public:
     /// Queues an event; returns the number of the last event in the queue. Numbers count from 1.
@@ -81,10 +84,10 @@ class EventService {
     std::uint64_t lost();
     std::size_t startedConsumers();
 
-    /// Delivers to this consumer what is announced from now on. Throws std::system_error when the
-    /// delivery thread cannot be made.
+    /// Delivers to this consumer all events announced from now on. Throws std::system_error when
+    /// the delivery thread cannot be made.
     void start(std::shared_ptr<EventConsumer> const& consumer);
-    /// Delivers nothing more to it; waits for a delivery under way on another thread.
+    /// Ends delivery to this consumer; waits for a delivery under way on another thread.
     void close(std::shared_ptr<EventConsumer> const& consumer);
 
     /// Called after each delivered event on the delivery thread, under the service's lock; an empty
@@ -119,7 +122,7 @@ class EventService {
 
     std::mutex m_mutex;
     std::condition_variable m_work;     ///< a message is queued, or stop
-    std::condition_variable m_progress; ///< a consumer or a message is done with, or stop
+    std::condition_variable m_progress; ///< a delivery or a consumer has ended, or stop
     std::deque<Message> m_queue;
     std::uint64_t m_announced = 0;
     std::uint64_t m_delivered = 0;

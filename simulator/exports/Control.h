@@ -18,15 +18,15 @@ nlohmann::json execute(nlohmann::json const& command);
 
 /// Replaces the chassis, announcing nothing. May come before the first platform call, which then
 /// loads no other. Throws std::runtime_error with one line, "chassis:12: ...", when the text is
-/// bad; the chassis is then what it was.
+/// bad; the chassis is then unchanged.
 void loadChassis(std::string const& yamlText);
 
-/// The clock by which the counters of the runtime library's processes move, from now on and
-/// beginning anew; null: the steady clock. It is called on whatever thread asks for counters.
+/// Sets the clock of the counters of the runtime library's processes, which start again; null: the
+/// steady clock. The clock is called on any thread that reads counters.
 void setCounterClock(std::chrono::nanoseconds (*clock)());
 
-/// The clock by which the lines of the chassis age, from now on and in whatever chassis; null: the
-/// steady clock. They begin anew, as at loading. It is called on whatever thread reads a line.
+/// Sets the clock of the lines, of this chassis and of later ones; null: the steady clock. The
+/// lines start again, as at loading. The clock is called on any thread that reads a line.
 void setLineClock(std::chrono::nanoseconds (*clock)());
 
 } // namespace kvlsim

@@ -48,7 +48,7 @@ std::int32_t readBytes(DMAttribute& request, std::int32_t capacity, void const* 
     return 0;
 }
 
-/// Answers what a line or ISDN channels tell of themselves; none: the attribute is no such one.
+/// The answer of a line or ISDN channels; none for an attribute that they do not answer.
 std::optional<std::int32_t> readLive(DMAttribute& request, std::int32_t capacity,
                                      ChassisObject const& object, Chassis const& chassis) {
     std::string_view const name = request.name;
@@ -112,6 +112,7 @@ void failAll(std::span<DMAttribute> requests) {
     }
 }
 
+/// A `Client` is the client of the device mapper for one chassis; thread-safe.
 class Client final : public DeviceMapperClient {
   public:
     explicit Client(GuardedChassis& chassis) : m_chassis(chassis) {}

@@ -13,9 +13,9 @@
 
 namespace kvlsim {
 
-/// The platform of this process: one instance, never destroyed; thread-safe. Lock order: the
-/// store's or the processes' own lock, the chassis, the event service's own lock. No callback runs
-/// under the chassis lock.
+/// The `Platform` is the one of this process: a single instance, never destroyed; thread-safe. Lock
+/// order: the store's or the processes' own lock, the chassis, the event service's own lock. No
+/// callback runs under the chassis lock.
 class Platform {
   public:
     static Platform& instance();

@@ -39,6 +39,7 @@ std::optional<std::string> readProcFile(pid_t pid, char const* name) {
     return std::string(text.data(), static_cast<std::size_t>(size));
 }
 
+/// A `Pipe` is both ends of a pipe.
 struct Pipe {
     Descriptor out; ///< to read from
     Descriptor in;  ///< to write to
@@ -61,7 +62,8 @@ bool readByte(int fd, char& byte) {
     return size == 1;
 }
 
-/// What a spawned process begins with: no signal blocked or ignored, and these files.
+/// A `SpawnPlan` is the state in which a spawned process starts: no signal blocked or ignored, and
+/// these files.
 class SpawnPlan {
   public:
     SpawnPlan(int input, int output) {
@@ -152,11 +154,11 @@ WaitingChild::WaitingChild(std::string const& name) {
     // Written while the other end is open here: a child that ends at once raises no signal.
     char byte = '\n';
     bool const written = write(input.in.get(), &byte, 1) == 1;
-    // It copies what it reads until the lifeline's last holder has gone, which the kernel sees to.
+    // It copies its input until the kernel has closed the last other end of the lifeline.
     m_process.pid = SpawnPlan(input.out.get(), output.in.get()).spawn("/bin/cat", name);
     m_lifeline = std::move(input.in);
     output.in = Descriptor();
-    // Once it has copied a byte it is the program that it is to be: its command line is there only
+    // Once it has copied a byte, the program runs and its command line can be read: that is only
     // some time after it has been spawned.
     bool const copied = written && readByte(output.out.get(), byte);
     auto const process = runningProcess(m_process.pid);
@@ -183,7 +185,7 @@ void WaitingChild::end() {
 bool WaitingChild::runs() {
     if (m_reaped) return false;
     pid_t const ended = waitpid(m_process.pid, nullptr, WNOHANG);
-    // Where the host takes its children's exit statuses itself, ours is gone.
+    // A host that reaps all its children may have taken the exit status already.
     m_reaped = ended == m_process.pid || (ended < 0 && errno == ECHILD);
     return !m_reaped;
 }

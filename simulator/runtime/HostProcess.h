@@ -13,7 +13,7 @@
 
 namespace kvlsim {
 
-/// A process that runs, told apart from a later one with the same id.
+/// A `HostProcess` is a running process, distinct from a later one with the same id.
 struct HostProcess {
     pid_t pid = 0;
     std::uint64_t startedAt = 0; ///< in the kernel's ticks since its start
@@ -21,15 +21,15 @@ struct HostProcess {
     bool operator==(HostProcess const&) const = default;
 };
 
-/// The process with this id, unless it has ended; one that waits to be reaped has.
+/// The process with this id, unless it has ended; a zombie has ended.
 std::optional<HostProcess> runningProcess(pid_t pid);
 /// The file name of the program with which its command line begins; empty when it has none.
 std::string programOf(pid_t pid);
 /// All that run a program of this name, by process id.
 std::vector<HostProcess> processesRunning(std::string const& program);
 
-/// A child that does nothing but wait until it is ended, and ends with this process in any case,
-/// however that ends.
+/// A `WaitingChild` is a child process that only waits until it is ended. It also ends when this
+/// process ends, however that happens.
 class WaitingChild {
   public:
     /// `name` stands first on its command line. Throws std::runtime_error.

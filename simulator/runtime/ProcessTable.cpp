@@ -86,8 +86,8 @@ void ProcessTable::dropEnded() {
     });
 }
 
-/// When a process of this command was first seen: a process found again keeps its time, one that
-/// took an ended one's id begins anew.
+/// When a process of this command was first seen. A process that is found again keeps its time; one
+/// that has the id of an ended process starts again.
 ProcessTable::Time ProcessTable::firstSeen(Entry& entry, HostProcess const& process) const {
     auto const [seen, isNew] = entry.found.try_emplace(process.pid, process, now());
     if (!isNew && seen->second.first != process) seen->second = {process, now()};

@@ -17,12 +17,12 @@
 
 namespace kvlsim {
 
-/// Why a process cannot be added or ended, in one line.
+/// A `ProcessError` says in one line why a process cannot be added or ended.
 class ProcessError : public std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
-/// A process and what the library says of it now.
+/// A `ListedProcess` is a process with the counters that the library shows now.
 struct ListedProcess {
     pid_t pid = 0;
     ProcessKind kind = ProcessKind::self;
@@ -30,18 +30,19 @@ struct ListedProcess {
     CounterValues counters{};
 };
 
-/// Callable from any thread: one lock guards it all. Lock order: the processes, the chassis.
+/// The `ProcessTable` is the list of the processes that use the simulated runtime library.
+/// Thread-safe: one lock guards it all. Lock order: the processes, the chassis.
 class ProcessTable {
   public:
     using Clock = std::chrono::nanoseconds();
     static constexpr std::size_t kCapacity = 1000;
 
-    /// `described` tells the processes to begin with, at the first use.
+    /// `described` returns the first processes; it is called at the first use.
     explicit ProcessTable(std::function<std::vector<ProcessDraft>()> described);
 
-    /// Ends all children and begins again with what is described, at the next use.
+    /// Ends all children; the next use starts again with the described processes.
     void restart();
-    /// The clock of the counters; null: the steady clock. They begin anew.
+    /// Sets the clock of the counters, which start again; null: the steady clock.
     void setClock(Clock* clock);
 
     /// In the order in which they were described or added; those that have ended are left out.

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The simulated attribute store: the file, and the storage library's side.
+// The simulated attribute store: the file, and the storage library's calls.
 #include "simulator/store/AttributeStore.h"
 
 #include <cstdlib>
@@ -11,7 +11,7 @@
 
 namespace kvlsim {
 
-/// The statements of an open store; the connection goes last.
+/// A `Reading` is the statements of an open store; its connection is destroyed last.
 struct AttributeStore::Reading {
     explicit Reading(Database opened) : database(std::move(opened)) {}
 
@@ -42,7 +42,7 @@ struct AttributeStore::Reading {
     }
 };
 
-/// Runs a call of the storage library. What is wrong with the file is QSB_EGENERAL.
+/// Runs a call of the storage library. A fault of the file is answered with QSB_EGENERAL.
 template <typename Call>
 QSBResult AttributeStore::guarded(Call call) const {
     try {

@@ -20,40 +20,44 @@
 
 namespace kvlsim {
 
-/// A store that cannot be used, or a change that it refuses: one line that names the file.
+/// A `StoreError` says in one line, which names the file, why a store cannot be used or refuses a
+/// change.
 class StoreError : public std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
-/// A record as the store lists it.
+/// A `ListedBoard` is a record as the store lists it.
 struct ListedBoard {
     std::int64_t instance = 0;
     std::string family;
     BoardRecord record;
 };
 
+/// A `StoreListing` is everything in a store.
 struct StoreListing {
     std::string path;
     std::vector<std::pair<std::int64_t, std::string>> families;
     std::vector<ListedBoard> boards; ///< family by family
 };
 
-/// Both of the store's sides: the storage library's calls, and the operator's changes. A change is
-/// one transaction, so that a reader, in whatever process, sees all of it or nothing.
+/// An `AttributeStore` is a store with its two interfaces: the storage library's calls, and the
+/// operator's changes. A change is one transaction, so that a reader in any process sees all of it
+/// or nothing.
 ///
-/// Callable from any thread: one lock guards it all. Lock order: the store, the chassis.
+/// Thread-safe: one lock guards it all. Lock order: the store, the chassis.
 class AttributeStore {
   public:
-    /// `contents` tells what a store holds that is not there yet; it may throw, with the reason.
+    /// `contents` returns the contents of a store that has to be created; it may throw, with the
+    /// reason.
     explicit AttributeStore(std::function<StoreContents()> contents);
     ~AttributeStore();
     AttributeStore(AttributeStore const&) = delete;
     AttributeStore& operator=(AttributeStore const&) = delete;
 
-    /// Where the store is until `open` is called. Empty: nowhere.
+    /// The directory of the store until `open` is called. Empty: none.
     void setDirectory(std::string directory);
 
-    // The storage library. An open store stays the one that it is until it is closed.
+    // The storage library. An open store stays in use until it is closed.
     QSBResult open(std::string_view& rootType, int& rootInstance);
     QSBResult first(std::string_view type, std::string_view parentType, int parent, int& instance);
     QSBResult next(int& instance);
@@ -80,7 +84,7 @@ class AttributeStore {
     };
 
     std::string path() const;
-    /// Makes the store where it is not there yet, and opens it.
+    /// Creates the store if it does not exist, and opens it.
     Database openFile(DatabaseUse use);
     template <typename Change>
     void change(Change change);

@@ -8,7 +8,7 @@ namespace kvlsim {
 
 namespace {
 
-/// How long a request waits for another process to let go of the file.
+/// How long a request waits until another process unlocks the file.
 constexpr int kPatience = 500; // milliseconds
 
 [[noreturn]] void fail(sqlite3* handle) {

@@ -13,19 +13,19 @@ struct sqlite3_stmt;
 
 namespace kvlsim {
 
-/// What the database says of a failure, in one line.
+/// A `DatabaseError` is the database's own message about a failure, in one line.
 class DatabaseError : public std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
-/// A process was killed while it changed the file, and this connection may not undo the change.
+/// An `UnfinishedChange` is a change of a killed process that this connection must not undo.
 class UnfinishedChange : public DatabaseError {
     using DatabaseError::DatabaseError;
 };
 
 enum class DatabaseUse : std::uint8_t { read, change, create };
 
-/// One connection. Not synchronised.
+/// A `Database` is one connection to a database file. Unsynchronised.
 class Database {
   public:
     /// Throws DatabaseError.
@@ -44,8 +44,8 @@ class Database {
     std::unique_ptr<sqlite3, Close> m_handle;
 };
 
-/// A prepared statement. It holds the file's lock from its first `step` to `reset`; `Execution`
-/// sees to the latter.
+/// A `Statement` is a prepared statement. It holds the file's lock from its first `step` until
+/// `reset`, which `Execution` calls.
 class Statement {
   public:
     Statement(Database& database, char const* sql);
@@ -69,7 +69,7 @@ class Statement {
     std::unique_ptr<sqlite3_stmt, Finalize> m_statement;
 };
 
-/// Resets a statement at the end of a scope, whatever happens in it.
+/// An `Execution` resets a statement at the end of a scope, also after an exception.
 class Execution {
   public:
     explicit Execution(Statement& statement) : m_statement(statement) {}

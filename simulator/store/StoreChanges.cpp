@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The simulated attribute store: the operator's side.
+// The simulated attribute store: the operator's changes.
 
 #include "simulator/base/Text.h"
 #include "simulator/store/AttributeStore.h"
@@ -9,6 +9,7 @@ namespace kvlsim {
 
 namespace {
 
+/// A `Found` is a record that a look-up has found.
 struct Found {
     std::int64_t instance;
     BoardRecord record;
@@ -80,7 +81,7 @@ void AttributeStore::change(Change change) {
     std::lock_guard const lock(m_mutex);
     try {
         Database database = openFile(DatabaseUse::change);
-        // Closing the connection on the way out takes back what was not committed.
+        // The connection is closed, which rolls an uncommitted change back.
         database.execute("BEGIN IMMEDIATE");
         change(database);
         database.execute("COMMIT");

@@ -11,11 +11,13 @@
 
 namespace kvlsim {
 
+/// A `StoreBoard` is a record with the name of its family.
 struct StoreBoard {
     std::string family;
     BoardRecord record;
 };
 
+/// `StoreContents` are the families and records of a new store.
 struct StoreContents {
     std::vector<std::string> families;
     std::vector<StoreBoard> boards;
@@ -23,7 +25,7 @@ struct StoreContents {
 
 /// A record, its family included (empty: unknown). `board` may be null.
 StoreBoard makeRecord(StoreBoardDraft const& draft, ChassisObject const* board);
-/// What the store of this chassis holds.
+/// The contents of a new store for this chassis.
 StoreContents contentsFor(Chassis const& chassis);
 
 } // namespace kvlsim

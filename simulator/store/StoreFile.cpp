@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The file of an attribute store: its making and its recognition.
+// The file of an attribute store: creating it and recognising it.
 #include "simulator/store/StoreFile.h"
 
 #include <fcntl.h>
@@ -15,7 +15,7 @@ namespace kvlsim {
 
 namespace {
 
-// Instances are never given a second time: a reader may hold one of a record that has gone.
+// An instance is never used again: a reader may still have the instance of a removed record.
 constexpr char const* kLayout = "PRAGMA application_id = 1263948099;"
                                 "PRAGMA user_version = 1;"
                                 "CREATE TABLE record ("
@@ -38,7 +38,7 @@ bool isStore(std::string_view head) {
     throw DatabaseError(what + " (" + std::strerror(errno) + ")");
 }
 
-/// A file of its own name beside `path`, which goes with it.
+/// An `AsideFile` is a temporary file beside `path`, which is removed with its object.
 class AsideFile {
   public:
     explicit AsideFile(std::string const& path) : m_path(path + ".XXXXXX") {
@@ -94,7 +94,7 @@ void makeStoreFile(std::string const& path, std::function<StoreContents()> const
         Database database(aside.path(), DatabaseUse::create);
         fill(database, contents());
     }
-    // Not rename: of two processes that make the store at once, the first one's stays.
+    // Not rename: when two processes create the store at once, the first one's file stays.
     if (link(aside.path().c_str(), path.c_str()) != 0 && errno != EEXIST)
         failWith("cannot be made; VQRXCFGPATH must name a writable directory");
 }

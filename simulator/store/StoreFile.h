@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The file of an attribute store: its making and its recognition.
+// The file of an attribute store: creating it and recognising it.
 #pragma once
 
 #include <cstdint>
@@ -16,7 +16,7 @@ inline constexpr char const* kStoreFileName = "attributes.db";
 /// The root record's instance.
 inline constexpr int kRootInstance = 1;
 
-/// Makes the file, whole or not at all, where there is none; leaves one that is there alone.
+/// Creates the file, whole or not at all, if there is none; an existing file stays as it is.
 /// Throws what `contents` throws, and DatabaseError.
 void makeStoreFile(std::string const& path, std::function<StoreContents()> const& contents);
 

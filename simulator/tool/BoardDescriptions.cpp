@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// What the tool sends: boards from files or options, attribute values from words.
+// Boards from files or options, and attribute values from words, as the tool sends them.
 #include "simulator/tool/BoardDescriptions.h"
 
 #include <algorithm>

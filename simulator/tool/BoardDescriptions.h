@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// What the tool sends: boards from files or options, attribute values from words.
+// Boards from files or options, and attribute values from words, as the tool sends them.
 #pragma once
 
 #include <cstdint>
@@ -14,7 +14,7 @@ namespace kvlsim {
 /// The boards of a file, which holds one board or a chassis, in YAML or JSON. Throws ToolError.
 std::vector<nlohmann::json> readBoardFile(std::string const& path);
 
-/// Options of `kvlsim insert`; what is empty or 0 is made up.
+/// `BoardOptions` are the options of `kvlsim insert`; an empty or zero one gets a default value.
 struct BoardOptions {
     std::int64_t handle = 0;
     std::string serial;
@@ -26,7 +26,8 @@ struct BoardOptions {
     std::vector<std::string> attributes; ///< NAME=VALUE
 };
 
-/// A board from options; `reply` is what "show" says, for free handles. Throws ToolError.
+/// A board from options; `reply` is the reply to "show", which shows the handles in use. Throws
+/// ToolError.
 nlohmann::json makeBoard(BoardOptions const& options, nlohmann::json const& reply);
 
 /// A value as it is written in a command: a number where it reads as one and the attribute is not

@@ -21,6 +21,7 @@ namespace {
 
 using Json = nlohmann::json;
 
+/// `Options` are the options of all commands of `kvlsim call`.
 struct Options {
     std::string trunk;
     std::string channel;
@@ -101,7 +102,7 @@ void signalling(Options const& options, Connect const& connect) {
     change(options, client, signallingCommand(options));
 }
 
-/// One line of a script; says what was wrong with it by throwing ToolError.
+/// Executes one line of a script; throws ToolError when it is wrong.
 void runLine(Options const& options, ControlClient& client, std::vector<std::string> const& line) {
     Options call = options;
     auto const requireWords = [&line](std::size_t least, std::size_t most, char const* usage) {
@@ -182,7 +183,7 @@ void addCallCommands(CLI::App& app, Connect connect, std::function<void()>& chos
     constexpr char const* trunkHelp = "Handle or NAME of a device with ISDN channels";
 
     group.add("list", "List the trunks and the states of their channels", list)
-        ->add_flag("--json", options->json, "The raw reply");
+        ->add_flag("--json", options->json, "Print the reply as JSON");
 
     auto* command = addChange("setup", "Set a call up", setUp);
     command->add_option("trunk", options->trunk, trunkHelp)->required();

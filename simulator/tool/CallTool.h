@@ -10,7 +10,7 @@
 
 namespace kvlsim {
 
-/// Adds the commands; the one that is chosen puts what to do into `chosen`.
+/// Adds the commands; the chosen one puts its action into `chosen`.
 void addCallCommands(CLI::App& app, Connect connect, std::function<void()>& chosen);
 
 } // namespace kvlsim

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A word of kvlsim with commands below it, such as `kvlsim line ...`.
+// A group of commands of kvlsim, such as `kvlsim line ...`.
 #pragma once
 
 #include <functional>
@@ -11,7 +11,8 @@
 
 namespace kvlsim {
 
-/// Its commands share one set of options; the command that is chosen puts what to do into `chosen`.
+/// A `CommandGroup` is a group of commands that share one set of options. The chosen command puts
+/// its action into `chosen`.
 template <class Options>
 class CommandGroup {
   public:

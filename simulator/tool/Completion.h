@@ -9,7 +9,7 @@
 namespace kvlsim {
 
 /// Adds `completion bash`, `completion zsh` and `completion fish`, which print a script made of all
-/// commands and options of `app`. The command that is chosen puts what to do into `chosen`.
+/// commands and options of `app`. The chosen command puts its action into `chosen`.
 void addCompletionCommands(CLI::App& app, std::function<void()>& chosen);
 
 } // namespace kvlsim

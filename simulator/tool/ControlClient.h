@@ -13,14 +13,15 @@
 
 namespace kvlsim {
 
-/// Why the tool gives up: one line that says what to do.
+/// A `ToolError` says in one line why the tool gives up and what to do.
 class ToolError : public std::runtime_error {
     using std::runtime_error::runtime_error;
 };
 
+/// A `ControlClient` is a connection to a platform's control socket. Unsynchronised.
 class ControlClient {
   public:
-    /// Throws ToolError when nobody listens at `path`.
+    /// Throws ToolError when no platform listens at `path`.
     ControlClient(std::string path, std::chrono::seconds timeout);
 
     /// Sends a command and returns its reply. Throws ToolError when the platform refuses it, with

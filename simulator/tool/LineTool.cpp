@@ -17,6 +17,7 @@ namespace {
 
 using Json = nlohmann::json;
 
+/// `Options` are the options of all commands of `kvlsim line`.
 struct Options {
     std::string line;
     std::string alarm;
@@ -33,7 +34,7 @@ void change(Options const& options, Connect const& connect, Json const& command)
     if (!options.noWait) client.request({{"command", "drain"}});
 }
 
-/// What of these was given, by the errors' names.
+/// The counts or rates that were given, by the errors' names.
 template <typename Values>
 Json given(Values const& values) {
     Json json = Json::object();
@@ -127,7 +128,7 @@ void addLineCommands(CLI::App& app, Connect connect, std::function<void()>& chos
     };
 
     group.add("list", "List the lines and their counters", list)
-        ->add_flag("--json", options->json, "The raw reply");
+        ->add_flag("--json", options->json, "Print the reply as JSON");
 
     addErrorOptions(*addChange("errors", "Count errors at once", addErrors), options->errors,
                     CLI::Range(std::int64_t(0), std::int64_t(UINT32_MAX)), "How many of each kind");
@@ -142,7 +143,7 @@ void addLineCommands(CLI::App& app, Connect connect, std::function<void()>& chos
     for (auto const& name : kLineAlarmNames)
         appendToList(known, name);
     alarm->add_option("alarm", options->alarm, "One of " + known)->required();
-    alarm->add_flag("--clear", options->clear, "The alarm is over");
+    alarm->add_flag("--clear", options->clear, "Clear the alarm");
 
     addChange("mend", "Clear all alarms and steady errors", mend);
 }

@@ -16,6 +16,7 @@ namespace {
 
 using Json = nlohmann::json;
 
+/// `Options` are the options of all commands of `kvlsim process`.
 struct Options {
     std::string name;
     std::int32_t pid = 0;
@@ -26,7 +27,7 @@ struct Options {
     bool json = false;
 };
 
-/// NAME=VALUE words as numbers; what is no number is refused by the platform, with its own words.
+/// NAME=VALUE words as numbers; the platform refuses a value that is no number.
 Json numbersFrom(std::vector<std::string> const& words) {
     Json numbers = Json::object();
     for (auto const& word : words) {
@@ -89,11 +90,11 @@ void addProcessCommands(CLI::App& app, Connect connect, std::function<void()>& c
     auto const& options = group.options();
 
     auto* command = group.add("list", "List the processes and their counters", list);
-    command->add_flag("--json", options->json, "The raw reply");
+    command->add_flag("--json", options->json, "Print the reply as JSON");
 
     command = group.add("add", "Add a process", add);
     auto* const which = command->add_option_group("process");
-    which->add_option("--name", options->name, "Start a child that bears this name or path");
+    which->add_option("--name", options->name, "Start a child with this name or path");
     which->add_option("--pid", options->pid, "A process of this host")
         ->check(CLI::Range(1, 0x7FFFFFFF));
     which->add_option("--command", options->process,
@@ -108,7 +109,7 @@ void addProcessCommands(CLI::App& app, Connect connect, std::function<void()>& c
                      "Its change per second as NAME=VALUE, such as TotalQueuedEvents=0.5; repeat")
         ->allow_extra_args(false);
 
-    command = group.add("end", "End a child, or take other processes off the list", end);
+    command = group.add("end", "End a child, or remove other processes from the list", end);
     command->add_option("process", options->which, "Process id or name")->required();
 }
 

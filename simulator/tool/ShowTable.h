@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Prints what "show" replies for human eyes.
+// Prints the reply to "show" for people.
 #pragma once
 
 #include <ostream>

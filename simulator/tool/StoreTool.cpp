@@ -17,6 +17,7 @@ namespace {
 
 using Json = nlohmann::json;
 
+/// `Options` are the options of all commands of `kvlsim store`.
 struct Options {
     std::string serial;
     std::vector<std::string> serials;
@@ -27,7 +28,7 @@ struct Options {
 
 constexpr char const* kFieldHelp = "Field as NAME=VALUE, such as IRQ=11";
 
-/// Texts stay texts, whatever they look like.
+/// Texts stay texts, even if they look like numbers.
 Json fieldsFrom(std::vector<std::string> const& words) {
     Json fields = Json::object();
     for (auto const& word : words) {
@@ -119,7 +120,7 @@ void addStoreCommands(CLI::App& app, Connect connect, std::function<void()>& cho
 
     auto* command = group.add("list", "List the records, or show one", list);
     command->add_option("serial", options->serial, serialHelp);
-    command->add_flag("--json", options->json, "The raw reply");
+    command->add_flag("--json", options->json, "Print the reply as JSON");
 
     command = group.add("add", "Add a board's record, or a family", add);
     auto* const serial = command->add_option("serial", options->serial, serialHelp);

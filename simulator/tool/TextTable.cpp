@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Prints rows in columns as wide as they must be.
+// Prints rows in columns that are as wide as their contents.
 #include "simulator/tool/TextTable.h"
 
 #include <algorithm>

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// kvlsim: controls a simulated board platform while it runs, makes and checks chassis files.
+// kvlsim: controls a running simulated board platform, generates and checks chassis files.
 #include <algorithm>
 #include <cstdlib>
 #include <functional>
@@ -34,7 +34,7 @@ constexpr int kSuccess = 0;
 constexpr int kFailure = 1;
 constexpr int kUsage = 2;
 
-/// Everything that the command line can say.
+/// `Options` are the options of all commands that are defined here.
 struct Options {
     std::string socket;
     long timeout = 30;
@@ -63,7 +63,7 @@ kvlsim::ControlClient connect(Options const& options) {
     return {path, std::chrono::seconds(options.timeout)};
 }
 
-/// Sends the commands in turn and waits until what they announced is delivered.
+/// Sends the commands one after the other and waits until their events are delivered.
 void change(Options const& options, kvlsim::ControlClient& client,
             std::vector<Json> const& commands) {
     for (auto const& command : commands)
@@ -206,7 +206,7 @@ CLI::App* addChange(CLI::App& app, char const* name, char const* help, Options& 
     return command;
 }
 
-constexpr char const* kBoardHelp = "Handle, serial number, or NAME where only one board bears it";
+constexpr char const* kBoardHelp = "Handle, serial number, or NAME if only one board has it";
 constexpr char const* kAttributeHelp = "Attribute as NAME=VALUE; repeat for more";
 
 void addBoardCommands(CLI::App& app, Options& options, Run& chosen) {
@@ -216,7 +216,7 @@ void addBoardCommands(CLI::App& app, Options& options, Run& chosen) {
     } static constexpr simple[] = {{"remove", "Pull boards out"},
                                    {"start", "Start boards"},
                                    {"stop", "Stop boards"},
-                                   {"fail", "Let boards fail"}};
+                                   {"fail", "Make boards fail"}};
     for (auto const& [name, help] : simple) {
         Run run = [name = name](Options const& given) { changeBoards(given, name); };
         addChange(app, name, help, options, chosen, std::move(run))
@@ -227,8 +227,9 @@ void addBoardCommands(CLI::App& app, Options& options, Run& chosen) {
     auto* command = addChange(app, "insert", "Plug a board in", options, chosen, insert);
     auto* const file =
         command
-            ->add_option("file", options.file,
-                         "Board or chassis in YAML or JSON; without it a board is made up")
+            ->add_option(
+                "file", options.file,
+                "Board or chassis in YAML or JSON; without it, a board is made from the options")
             ->type_name("FILE");
     auto& made = options.newBoard;
     constexpr std::int64_t lastHandle = kvlsim::Chassis::kRootHandle - 1;
@@ -256,12 +257,12 @@ void addBoardCommands(CLI::App& app, Options& options, Run& chosen) {
     command = addChange(app, "fault", "Raise or clear a fault of a board", options, chosen, fault);
     command->add_option("board", options.board, kBoardHelp)->required();
     command->add_option("value", options.value, "Fault value, 0 to 65535")->required();
-    command->add_flag("--clear", options.cleared, "The fault is over");
+    command->add_flag("--clear", options.cleared, "Clear the fault");
 }
 
 void addAttributeCommands(CLI::App& app, Options& options, Run& chosen) {
     constexpr char const* objectHelp = "Handle, serial number of a board, or unique NAME";
-    auto* command = addChange(app, "set", "Set an attribute of any object; announces nothing",
+    auto* command = addChange(app, "set", "Set an attribute of any object; no event is sent",
                               options, chosen, set);
     command->add_option("object", options.object, objectHelp)->required();
     command->add_option("attribute", options.attribute, "Attribute, such as IRQ")->required();
@@ -272,26 +273,26 @@ void addAttributeCommands(CLI::App& app, Options& options, Run& chosen) {
                                  [&options, form] { options.form = form; });
     forms->require_option(0, 1);
 
-    command = addChange(app, "unset", "Take an attribute away; announces nothing", options, chosen,
-                        unset);
+    command =
+        addChange(app, "unset", "Remove an attribute; no event is sent", options, chosen, unset);
     command->add_option("object", options.object, objectHelp)->required();
     command->add_option("attribute", options.attribute, "Attribute, such as IRQ")->required();
 }
 
 void addOtherCommands(CLI::App& app, Options& options, Run& chosen) {
     auto* command =
-        addChange(app, "event", "Send any event; changes nothing", options, chosen, event);
+        addChange(app, "event", "Send any event; no state changes", options, chosen, event);
     command->add_option("id", options.object, "Identifier, such as 0x40001")->required();
-    command->add_option("--board", options.board, "Board, also one that is not there");
+    command->add_option("--board", options.board, "Board; it need not exist");
     command->add_option("--value", options.value, "Fault value, 0 to 65535");
 
-    command = addCommand(app, "show", "Show the boards, or all about one", chosen, show);
+    command = addCommand(app, "show", "Show all boards in a table, or one in detail", chosen, show);
     command->add_option("board", options.board, kBoardHelp);
-    command->add_flag("--json", options.json, "The raw reply");
+    command->add_flag("--json", options.json, "Print the reply as JSON");
 
     addCommand(app, "drain", "Wait until all events so far are delivered", chosen, drain);
 
-    command = addCommand(app, "generate", "Make up a chassis file", chosen, generate);
+    command = addCommand(app, "generate", "Generate a chassis file", chosen, generate);
     auto& generator = options.generator;
     command->add_option("--boards", generator.boards, "Number of boards")
         ->check(CLI::Range(0, 1000000))
@@ -304,7 +305,7 @@ void addOtherCommands(CLI::App& app, Options& options, Run& chosen) {
         ->check(CLI::Range(0, 100));
     command->add_option("--lines", generator.lines, "DS1 lines per board (default: none)")
         ->check(CLI::Range(0, 1000));
-    command->add_option("--seed", generator.seed, "The same seed makes the same chassis");
+    command->add_option("--seed", generator.seed, "The same seed gives the same chassis");
     command->add_option("--output", options.output, "File (default: standard output)")
         ->type_name("FILE");
 
@@ -312,7 +313,8 @@ void addOtherCommands(CLI::App& app, Options& options, Run& chosen) {
     command->add_option("file", options.file, "Chassis file")->type_name("FILE")->required();
 }
 
-/// Says which command was meant by a word that is none; empty when the words name a command.
+/// A message for a word that is no command, with the one probably meant; empty when the words name
+/// a command.
 std::string unknownCommand(CLI::App const& app, std::vector<std::string> const& words) {
     CLI::App const* at = &app;
     std::string path;
@@ -342,7 +344,7 @@ std::string unknownCommand(CLI::App const& app, std::vector<std::string> const& 
 } // namespace
 
 int main(int argc, char** argv) {
-    CLI::App app("Controls a simulated board platform while it runs; makes and checks chassis "
+    CLI::App app("Controls a running simulated board platform; generates and checks chassis "
                  "files.",
                  "kvlsim");
     Options options;

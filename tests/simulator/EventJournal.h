@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Writes down what the platform announces of boards, their faults and their ISDN channels.
+// Records the events of boards, their faults and their ISDN channels.
 #pragma once
 
 #include <array>
@@ -19,6 +19,8 @@
 
 namespace support {
 
+/// An `EventJournal` is a consumer that records events. Unsynchronised: they are read after a
+/// drain.
 class EventJournal final : public VqxEventService::CEventHandlerAdaptor {
   public:
     EventJournal() {
@@ -46,7 +48,7 @@ class EventJournal final : public VqxEventService::CEventHandlerAdaptor {
         return 1;
     }
 
-    /// What came since the last call.
+    /// The events since the last call.
     std::vector<std::string> take() {
         EXPECT_EQ(kvlsim::execute({{"command", "drain"}})["ok"], true);
         return std::exchange(m_lines, {}); // the drain orders this after the handler's calls

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A clock of lines that stands still until the test moves it.
+// A clock for lines that changes only when the test moves it.
 #pragma once
 
 #include <atomic>
@@ -11,7 +11,7 @@
 
 namespace support {
 
-/// The clock of the lines while this lives. One at a time.
+/// A `LineClock` is the clock of the lines during its lifetime. Only one at a time.
 class LineClock {
   public:
     LineClock() {

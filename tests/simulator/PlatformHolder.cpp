@@ -27,7 +27,8 @@ namespace {
 
 using Filter = VqxEventService::AdminConsumer::FilterCallbackAssoc;
 
-/// A static object that is older than the platform: delivery must have ended before it goes.
+/// A `Printer` is a consumer that prints events. It is a static object that is older than the
+/// platform, so delivery must have ended before it is destroyed.
 class Printer final : public VqxEventService::CEventHandlerAdaptor {
   public:
     ~Printer() { m_gone = true; }

@@ -126,6 +126,7 @@ TEST_F(CallCommandsTest, ShownBoardCanBeInsertedAgainWithItsChannelsIdle) {
     EXPECT_EQ(trunks()[0]["channels"], json::parse(R"(["idle", "idle", "idle"])"));
 }
 
+/// A `BadCommand` is a command that is refused, with the error.
 struct BadCommand {
     char const* name;
     char const* command;

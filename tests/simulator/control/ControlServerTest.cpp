@@ -37,7 +37,8 @@ std::string socketPath() {
     return directory().file("control");
 }
 
-/// The platform opens its socket when it starts, so the variable comes before all tests.
+/// A `SocketEnvironment` sets KVLSIM_SOCKET before all tests, because the platform opens its socket
+/// when it starts.
 class SocketEnvironment final : public testing::Environment {
   public:
     void SetUp() override { setenv("KVLSIM_SOCKET", socketPath().c_str(), 1); }
@@ -45,6 +46,7 @@ class SocketEnvironment final : public testing::Environment {
 
 auto* const s_environment = testing::AddGlobalTestEnvironment(new SocketEnvironment);
 
+/// A `Client` is a connection to the control socket.
 class Client {
   public:
     Client() : m_socket(::socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0)) {
@@ -114,7 +116,7 @@ class Client {
     std::string m_received;
 };
 
-/// The standard error of this process, readable line by line while this lives.
+/// A `StandardError` makes the standard error of this process readable line by line.
 class StandardError {
   public:
     StandardError() : m_before(dup(STDERR_FILENO)) {
@@ -298,7 +300,7 @@ TEST_F(ControlServerTest, CommandOfAClientThatLeavesAtOnceIsExecuted) {
     hasty.send("{\"command\": \"drain\"}\n{\"command\": \"remove\", \"board\": 5}\n");
     hasty.close();
     Client other;
-    // Bounded by the test's time limit: each question is answered, sooner or later with no board.
+    // Bounded by the test's time limit: each request is answered, in the end with no board.
     while (!other.ask(R"({"command": "show"})")["boards"].empty()) {
     }
     expectAlive();
@@ -325,7 +327,7 @@ TEST_F(ControlServerTest, ClientsThatHaveGoneMakeRoomAtOnce) {
     }
 }
 
-/// Holds the delivery thread until it is told to let go.
+/// A `Holder` is a handler that blocks the delivery thread until the test releases it.
 class Holder final : public VqxEventService::CEventHandlerAdaptor {
   public:
     int HandleEvent(AdminCallbackMsg*, void*) override {

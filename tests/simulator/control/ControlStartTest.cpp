@@ -28,7 +28,7 @@ bool s_controlThreadFails = false;
 
 namespace kvlsim {
 
-/// Stands in for the simulator's own: it fails when a test asks for it.
+/// Replaces the simulator's own function: it fails when a test asks for it.
 std::thread startThread(char const* name, std::function<void()> body) {
     if (s_controlThreadFails && std::string(name) == "kvlsim-control")
         throw std::system_error(EAGAIN, std::generic_category());

@@ -19,7 +19,7 @@ using testing::ElementsAre;
 using testing::HasSubstr;
 using testing::IsEmpty;
 
-/// Writes down every administrative and fault event as "id board".
+/// A `Journal` is a consumer that records every administrative and fault event as "id board".
 class Journal final : public VqxEventService::CEventHandlerAdaptor {
   public:
     Journal() {
@@ -48,7 +48,7 @@ class Journal final : public VqxEventService::CEventHandlerAdaptor {
         return 1;
     }
 
-    /// What came since the last call.
+    /// The events since the last call.
     std::vector<std::string> take() {
         EXPECT_EQ(kvlsim::execute({{"command", "drain"}})["ok"], true);
         return std::exchange(m_lines, {}); // the drain orders this after the handler's calls
@@ -266,6 +266,7 @@ TEST_F(ControlTest, BadChassisIsRefusedAndTheOldOneStays) {
     EXPECT_THAT(handles(), ElementsAre(5, 6, 7));
 }
 
+/// A `BadCommand` is a command that is refused, with the error.
 struct BadCommand {
     char const* name;
     char const* command;

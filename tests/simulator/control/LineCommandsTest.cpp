@@ -154,6 +154,7 @@ TEST_F(LineCommandsTest, ValueOfLineTypeIsFreeWhereThereIsNoLine) {
     succeed(R"({"command": "set", "object": 53, "attribute": "LINE_TYPE", "value": 9})");
 }
 
+/// A `BadCommand` is a command that is refused, with the error.
 struct BadCommand {
     char const* name;
     char const* command;

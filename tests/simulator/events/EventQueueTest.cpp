@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The event service's queue when nobody takes events from it.
+// The event service's queue while no events are delivered.
 #include <cstdint>
 #include <cstring>
 #include <future>
@@ -19,7 +19,8 @@ using testing::SizeIs;
 constexpr auto kStarted = static_cast<std::uint32_t>(EventId::boardStarted);
 constexpr auto kLost = static_cast<std::uint32_t>(EventId::eventsLost);
 
-/// Holds the delivery thread in the first message, and keeps what comes after it.
+/// A `Holder` is a handler that blocks the delivery thread in the first message, and records all
+/// later ones.
 class Holder final : public VqxEventService::CEventHandlerAdaptor {
   public:
     struct Heard {

@@ -28,7 +28,7 @@ using testing::IsEmpty;
 using VqxEventService::VqxAdminConsumer;
 using Filter = VqxEventService::AdminConsumer::FilterCallbackAssoc;
 
-/// One delivery as a handler saw it.
+/// A `Seen` is one delivery as a handler saw it.
 struct Seen {
     std::uint32_t id = 0;
     std::optional<std::int32_t> board;
@@ -41,6 +41,7 @@ void PrintTo(Seen const& seen, std::ostream* out) {
     *out << std::hex << seen.id << " board " << std::dec << seen.board.value_or(-1);
 }
 
+/// A `Recorder` is a handler that records its deliveries.
 class Recorder final : public VqxEventService::CEventHandlerAdaptor {
   public:
     int HandleEvent(AdminCallbackMsg* message, void* context) override {
@@ -74,7 +75,7 @@ class Recorder final : public VqxEventService::CEventHandlerAdaptor {
     std::vector<Seen> m_seen;
 };
 
-/// A door that one thread opens and others wait at.
+/// A `Gate` is opened by one thread while others wait for it.
 class Gate {
   public:
     void open() {
@@ -322,7 +323,7 @@ TEST_F(EventServiceTest, DestructorWaitsForADeliveryUnderWay) {
         admin.reset();
         return left.load();
     });
-    // Passes however long this takes; a destructor that does not wait is through by then.
+    // The test passes however long this takes; a destructor that does not wait has ended by then.
     EXPECT_EQ(destroyed.wait_for(std::chrono::milliseconds(50)), std::future_status::timeout);
     leave.open();
     EXPECT_TRUE(destroyed.get());

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// What lines and ISDN channels answer to a client of the device mapper.
+// The answers of lines and ISDN channels to a client of the device mapper.
 #include <atomic>
 #include <cstring>
 #include <string>

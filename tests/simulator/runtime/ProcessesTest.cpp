@@ -140,7 +140,7 @@ TEST_F(ProcessesTest, ChildEndsWithTheProcessThatStartedItHoweverThatEnds) {
     ASSERT_EQ(kill(child, 0), 0);
     holder.kill();
     holder.finish();
-    // Its parent is another now, which takes its exit status in its own time.
+    // It has another parent now, which reaps it at a time of its own.
     auto const running = [child] {
         std::string const path = "/proc/" + std::to_string(child) + "/cmdline";
         std::ifstream file(path);

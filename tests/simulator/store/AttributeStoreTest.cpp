@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The storage library: what each call answers, and what it does to a file that is no good.
+// The storage library: the answer of each call, and its effect on a damaged file.
 #include <array>
 #include <climits>
 #include <fstream>

@@ -223,7 +223,7 @@ TEST_F(StoreChangesTest, ReaderSeesTheOldRecordOrTheNewOneOfAnotherProcess) {
     std::thread driver([&] {
         for (int i = 1; i <= 100; ++i) {
             writer.writeLine(commands[i % 2]);
-            // A change that meets a reader for too long is refused, and changes nothing.
+            // A change that a reader blocks for too long is refused, and changes nothing.
             if (writer.readLine().find("\"ok\":true") == std::string::npos) ++refused;
         }
         done = true;

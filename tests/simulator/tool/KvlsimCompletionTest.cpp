@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The scripts that kvlsim prints for shells: bash runs its own, the others are held against --help.
+// The scripts that kvlsim prints for shells: bash runs its own, the others are compared with
+// --help.
 #include <set>
 #include <sstream>
 #include <string>

@@ -13,11 +13,12 @@
 #include "tests/support/ChildProcess.h"
 #include "tests/support/TemporaryDirectory.h"
 
+/// A `ToolTest` runs the real kvlsim against a process that holds a platform.
 class ToolTest : public testing::Test {
   protected:
-    /// Starts the process, in the place of an earlier one.
+    /// Starts the process, and ends an earlier one.
     support::ChildProcess& hold(std::vector<std::string> environment = {}) {
-        holder.reset(); // an earlier one gives the socket up before the next wants it
+        holder.reset(); // an earlier one must release the socket first
         environment.push_back("KVLSIM_SOCKET=" + socket());
         holder = std::make_unique<support::ChildProcess>(
             std::vector<std::string>{KVLSIM_PLATFORM_HOLDER}, environment);
@@ -28,7 +29,7 @@ class ToolTest : public testing::Test {
         arguments.insert(arguments.begin(), KVLSIM_TOOL);
         return support::run(arguments, {"KVLSIM_SOCKET=" + socket()});
     }
-    /// What the tool prints; it must succeed without a word of complaint.
+    /// The output of the tool, which must succeed and print no message.
     std::string succeed(std::vector<std::string> const& arguments) const {
         auto const finished = kvlsim(arguments);
         EXPECT_EQ(finished.status, 0) << arguments.front() << ": " << finished.err;
