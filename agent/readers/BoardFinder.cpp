@@ -34,7 +34,7 @@ std::optional<long> BoardFinder::find(std::string const& serialNumber) const {
 
 std::optional<std::string> BoardFinder::serialNumberOfDriverBoard(long driverBoard) const {
     auto const found = m_driverBoards.find(driverBoard);
-    // One that is that of several boards, or of none, is no serial number either.
+    // A number that several boards have, or none, does not identify a board.
     if (found == m_driverBoards.end() || !find(found->second)) return std::nullopt;
     return found->second;
 }

@@ -9,7 +9,7 @@ namespace kvloamd {
 /// A `StateDirectory` is the persistent directory, reserved for this process while the object
 /// exists.
 ///
-/// Whoever can write to the directory decides what the agent serves and to whom, so it and its
+/// A user who can write to it decides what the agent serves and to whom, so it and its
 /// files must belong to the agent's user or to root. A process reserves the directory by a lock on
 /// its file `kvloamd.lock`, which contains the process id. The kernel releases the lock when the
 /// process ends, however it ends.

@@ -9,7 +9,7 @@
 
 namespace kvloamd {
 
-/// An object's place in the tree of names. Whoever says "relative" leaves out the arc above
+/// The name of an object in the tree of names. A name called "relative" omits the arc above
 /// all objects of its tree.
 using Oid = std::vector<std::uint32_t>;
 using OidView = std::span<std::uint32_t const>;

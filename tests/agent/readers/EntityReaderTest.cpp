@@ -81,7 +81,7 @@ class EntityReaderTest : public ::testing::Test {
 
     Snapshot m_snapshot;
     StableIndices m_indices{1};
-    // Long ago, so that what happens now is told by a time that is not 0.
+    // Long ago, so that changes get a time other than 0.
     EntityReader m_reader{m_indices, Clock::now() - 1h, [] { return 1'000'000'000L; }};
 };
 

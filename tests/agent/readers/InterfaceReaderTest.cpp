@@ -53,7 +53,7 @@ class InterfaceReaderTest : public ::testing::Test {
     FakeChassis m_chassis;
     BoardSource m_source{*m_chassis.manager.get()};
     StableIndices m_indices{1000};
-    // Long ago, so that what happens now is told by a time that is not 0.
+    // Long ago, so that changes get a time other than 0.
     InterfaceReader m_reader{*m_chassis.manager.get(), m_indices,
                              Clock::now() - std::chrono::hours(1)};
 };

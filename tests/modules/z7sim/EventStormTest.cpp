@@ -110,7 +110,7 @@ class TrapListener final : public BoardStatusListener {
     std::array<std::atomic<int>, 16> m_heard{};
 };
 
-/// Throws the chassis about. Deterministic, but for the threads that look on.
+/// Changes the chassis in a fixed sequence. Only the reading threads are not deterministic.
 class Storm {
   public:
     Storm() {

@@ -151,7 +151,7 @@ class Reader {
     ChannelListener& m_listener;
 };
 
-/// Throws boards and calls about. Deterministic, but for the threads that look on.
+/// Changes boards and calls in a fixed sequence. Only the reading threads are not deterministic.
 class Storm {
   public:
     Storm() {

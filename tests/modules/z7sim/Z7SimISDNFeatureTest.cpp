@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The ISDN channels of the reference board: what they answer, and what is told of them.
+// The ISDN channels of the reference board: their answers and their status events.
 #include <string>
 #include <vector>
 

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A line of the reference board: what it answers, what its seconds count, and what is told of it.
+// A line of the reference board: its answers, its counts and its status events.
 #include <ctime>
 #include <string>
 #include <utility>

@@ -75,7 +75,7 @@ TEST_F(AgentxSessionTest, NamesThatCanBeDoneWithoutMayBeRefused) {
     std::string const told = ::testing::internal::GetCapturedStderr();
     EXPECT_THAT(told, ::testing::HasSubstr("the SNMP master refuses DS1-MIB: another agent serves "
                                            "them already; stop it"));
-    // The next master refuses them too, which is no news.
+    // The next master refuses them, too, which is not logged again.
     m_master->hangUp();
     ::testing::internal::CaptureStderr();
     grant(AgentxKind::Open);
