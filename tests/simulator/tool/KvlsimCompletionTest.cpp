@@ -182,6 +182,14 @@ TEST_F(KvlsimCompletionTest, FishsScriptHasEveryCommandAndOption) {
     }
 }
 
+TEST_F(KvlsimCompletionTest, ScriptsThatTheBuildInstallsAreOfThisTool) {
+    for (std::string const shell : {"bash", "zsh", "fish"}) {
+        std::ostringstream built;
+        built << std::ifstream(KVLSIM_COMPLETIONS "/kvlsim." + shell).rdbuf();
+        EXPECT_EQ(built.str(), succeed({"completion", shell})) << shell;
+    }
+}
+
 TEST_F(KvlsimCompletionTest, UnknownShellIsRefused) {
     expectRefusal({"completion", "fihs"}, 2, "did you mean \"completion fish\"?");
     expectRefusal({"completion"}, 2, "kvlsim: ");
