@@ -90,6 +90,7 @@ int receiveMessage(netsnmp_transport* transport, void* buffer, int size, void** 
     return static_cast<int>(message->octets.size());
 }
 
+// NOLINTNEXTLINE(readability-non-const-parameter): the library's type
 int sendMessage(netsnmp_transport* transport, void const* buffer, int size, void** receiver,
                 int* receiverSize) {
     if (receiver == nullptr || *receiver == nullptr || receiverSize == nullptr ||
@@ -123,6 +124,7 @@ netsnmp_transport* makeTransport(TcpConnections& connections) {
     // The library frees both.
     auto* const transport =
         static_cast<netsnmp_transport*>(std::calloc(1, sizeof(netsnmp_transport)));
+    // NOLINTNEXTLINE(bugprone-sizeof-expression): a pointer is kept
     auto* const held = static_cast<TcpConnections**>(std::malloc(sizeof(TcpConnections*)));
     if (transport == nullptr || held == nullptr) std::abort();
     *held = &connections;
@@ -130,7 +132,7 @@ netsnmp_transport* makeTransport(TcpConnections& connections) {
     transport->domain_length = 7;
     transport->sock = connections.descriptor();
     transport->data = held;
-    transport->data_length = sizeof *held;
+    transport->data_length = sizeof *held; // NOLINT(bugprone-sizeof-expression): as above
     transport->msgMaxSize = TcpConnections::kLongestMessage;
     transport->f_recv = receiveMessage;
     transport->f_send = sendMessage;
