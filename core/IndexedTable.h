@@ -16,7 +16,7 @@ class IndexedTable : public Object {
   public:
     using Entries = KVL::IndexedEntries<Index, Value>;
 
-    IndexedTable() : Object(true), m_emptyValue(0) {} // NOLINT(modernize-use-nullptr): or a number
+    IndexedTable() : Object(true), m_emptyValue(0) {}
     ~IndexedTable() override = default;
 
     /// The lowest index; 0 when the table is empty.

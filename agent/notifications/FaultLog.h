@@ -58,7 +58,6 @@ class FaultLog {
         int platformBoard; ///< 0 when the board is known
         std::uint16_t value;
 
-        // NOLINTNEXTLINE(modernize-use-nullptr): clang-tidy 14 takes the comparison for one with 0
         auto operator<=>(Key const&) const = default;
     };
     struct Fault {

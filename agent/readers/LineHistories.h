@@ -23,7 +23,7 @@ class LineHistories {
     /// Begins to read all lines once more.
     void begin(Clock::time_point now);
     /// Fills the intervals of `row`.
-    void read(ReferenceCounter<DS1IntervalTable> const& table, LineRow& row);
+    void read(ReferenceCounter<DS1IntervalTable> const& handle, LineRow& row);
 
   private:
     struct Kept {
