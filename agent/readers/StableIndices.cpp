@@ -130,7 +130,7 @@ void StableIndices::countDays() {
 void StableIndices::forgetBoards() {
     std::vector<Place> away;
     for (auto board = m_boards.begin(); board != m_boards.end();) {
-        Place const here = board++;
+        auto const here = board++;
         if (here->second.reading == m_reading) continue;
         if (!here->second.stable || m_calendar.day - here->second.day > m_retention.days)
             forget(here);
