@@ -129,12 +129,12 @@ WakeUp::WakeUp() : m_event(eventfd(0, EFD_NONBLOCK | EFD_CLOEXEC)) {
 void WakeUp::signal() const {
     std::uint64_t const one = 1;
     // Fails only when the counter is full; the poll is then awake already.
-    static_cast<void>(!write(m_event.get(), &one, sizeof one));
+    static_cast<void>(write(m_event.get(), &one, sizeof one) == sizeof one);
 }
 
 void WakeUp::clear() const {
     std::uint64_t count = 0;
-    static_cast<void>(!read(m_event.get(), &count, sizeof count));
+    static_cast<void>(read(m_event.get(), &count, sizeof count) == sizeof count);
 }
 
 } // namespace kvlsim

@@ -41,7 +41,7 @@ void setRaised(CommandContext const& context, LiveLine& line, LiveLine::Time now
                std::int32_t board, std::uint32_t alarms) {
     std::uint32_t const changed = line.raised() ^ alarms;
     line.setRaised(alarms, now);
-    for (std::uint16_t bit = 0; bit < kLineAlarmNames.size(); ++bit) {
+    for (std::size_t bit = 0; bit < kLineAlarmNames.size(); ++bit) {
         if ((changed >> bit & 1U) == 0) continue;
         context.announce((alarms >> bit & 1U) != 0 ? EventId::faultRaised : EventId::faultCleared,
                          board, static_cast<std::uint16_t>(kFirstAlarmFault + bit));

@@ -15,7 +15,7 @@ namespace kvlsim {
 std::optional<Chassis> readChassis(std::string const& yamlText, Findings& findings);
 /// The others throw ChassisError with the line and a message that says what to do.
 Chassis readChassis(std::string const& yamlText);
-Chassis readChassis(Description const& description);
+Chassis readChassis(Description const& file);
 /// Defaults (condition, presence, date) included.
 ObjectDraft readBoard(Description const& description);
 /// Reads a file; throws ChassisError (without line) when it cannot be read.
