@@ -20,6 +20,7 @@ std::vector<std::string> Findings::Kept::lines(std::string_view source, char con
     auto sorted = first;
     std::ranges::stable_sort(sorted, {}, &ChassisError::line);
     std::vector<std::string> lines;
+    lines.reserve(sorted.size() + 1);
     for (auto const& each : sorted)
         lines.push_back(describeError(source, each));
     if (more > 0)
