@@ -112,7 +112,7 @@ Json Generator::line(std::int32_t board, std::int32_t handle, std::int32_t index
 }
 
 Json Generator::board(std::int32_t handle, std::int32_t& nextHandle) {
-    auto const wanted = std::ranges::find(kFamilies, m_options.family, &Family::name);
+    auto const* const wanted = std::ranges::find(kFamilies, m_options.family, &Family::name);
     Family const& family =
         wanted != kFamilies.end()
             ? *wanted

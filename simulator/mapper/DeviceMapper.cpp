@@ -100,7 +100,9 @@ void readInto(DMAttribute& request, ChassisObject const& object, Chassis const& 
         request.status = kBufferTooSmall;
         return;
     }
-    if (!bytes.empty()) std::memcpy(request.value, bytes.data(), bytes.size());
+    // There is a buffer unless its capacity is 0.
+    if (!bytes.empty() && request.value != nullptr)
+        std::memcpy(request.value, bytes.data(), bytes.size());
     request.size = static_cast<std::int32_t>(bytes.size());
     request.status = 0;
 }

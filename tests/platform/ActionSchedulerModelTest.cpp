@@ -235,8 +235,9 @@ TEST(ActionSchedulerModelTest, TimeOfEntryAndRemovalDoesNotGrowWithTheList) {
     EXPECT_LT(large, 1000 * small);
 }
 
+#if __SIZEOF_LONG__ > 4 // else times end in 2038
+
 TEST(ActionSchedulerModelTest, EmptyListIsNotWokenForAfter2038) {
-    if (sizeof(long) == 4) GTEST_SKIP() << "time has 32 bits";
     DrivenScheduler scheduler;
     scheduler.wakeAt(k2038 + 1000L);
     EXPECT_GT(scheduler.nextWakeUp(), s_now);
@@ -251,7 +252,6 @@ TEST(ActionSchedulerModelTest, EmptyListIsNotWokenForAfter2038) {
 }
 
 TEST(ActionSchedulerModelTest, EntryIsWaitedForAfter2038) {
-    if (sizeof(long) == 4) GTEST_SKIP() << "time has 32 bits";
     std::string record;
     Action action('a', record);
     DrivenScheduler scheduler;
@@ -263,6 +263,8 @@ TEST(ActionSchedulerModelTest, EntryIsWaitedForAfter2038) {
     }
     EXPECT_EQ(record, "aaa");
 }
+
+#endif
 
 bool s_ready = false;
 
