@@ -3,7 +3,6 @@
 #include "simulator/runtime/HostProcess.h"
 
 #include <fcntl.h>
-#include <signal.h>
 #include <spawn.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -12,6 +11,7 @@
 #include <array>
 #include <cerrno>
 #include <charconv>
+#include <csignal>
 #include <cstring>
 #include <filesystem>
 #include <sstream>
