@@ -1,8 +1,8 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // What survives a restart, and what the agent does when something is in the way.
-#include <signal.h>
 #include <unistd.h>
 
+#include <csignal>
 #include <filesystem>
 
 #include <gmock/gmock.h>
