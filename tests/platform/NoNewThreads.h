@@ -15,7 +15,7 @@ class NoNewThreads {
         pthread_getattr_default_np(&m_default);
         pthread_attr_t huge;
         pthread_getattr_default_np(&huge);
-        pthread_attr_setstacksize(&huge, std::numeric_limits<std::size_t>::max() / 4);
+        pthread_attr_setstacksize(&huge, std::numeric_limits<std::size_t>::max() / 8 * 7);
         pthread_setattr_default_np(&huge);
         pthread_attr_destroy(&huge);
     }
