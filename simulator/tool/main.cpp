@@ -98,6 +98,7 @@ void insert(Options const& options) {
     if (options.file.empty())
         boards.push_back(makeBoard(options.newBoard, client.request({{"command", "show"}})));
     std::vector<Json> commands;
+    commands.reserve(boards.size());
     for (auto const& board : boards)
         commands.push_back({{"command", "insert"}, {"board", board}});
     change(options, client, commands);
@@ -326,6 +327,7 @@ std::string unknownCommand(CLI::App const& app, std::vector<std::string> const& 
         auto const commands = at->get_subcommands([](auto const*) { return true; });
         if (commands.empty()) return {};
         std::vector<std::string> names;
+        names.reserve(commands.size());
         for (auto const* command : commands)
             names.push_back(command->get_name());
         auto const found = std::ranges::find(names, words[i]);
@@ -343,6 +345,7 @@ std::string unknownCommand(CLI::App const& app, std::vector<std::string> const& 
 
 } // namespace
 
+// NOLINTNEXTLINE(bugprone-exception-escape): only a contradictory set-up of the options throws
 int main(int argc, char** argv) {
     CLI::App app("Controls a running simulated board platform; generates and checks chassis "
                  "files.",
