@@ -190,7 +190,7 @@ TEST_F(ObjectTreeTest, WalkIsStrictlyIncreasingAndFindsEveryStep) {
     }
     // All scalars but the platform service's 2 and the master's 2; 8 texts and 2 statuses of 3
     // boards; the IRQ of 2.
-    EXPECT_EQ(steps, std::ssize(scalars()) - 5 + 3 * 10 + 2);
+    EXPECT_EQ(steps, std::ssize(scalars()) - 5 + 3L * 10 + 2);
 }
 
 TEST_F(ObjectTreeTest, StatusWithoutANameIsLeftOut) {
