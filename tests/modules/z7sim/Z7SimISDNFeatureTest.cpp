@@ -107,7 +107,7 @@ TEST_F(Z7SimISDNFeatureTest, FeatureIsCalledISDN) {
 TEST_F(Z7SimISDNFeatureTest, BearersOfAT1TakeTheFirstTimeSlots) {
     plugIn("", trunk(301, 23));
     auto const names = bearerNames();
-    ASSERT_EQ(names.size(), 23u);
+    ASSERT_EQ(names.size(), 23U);
     EXPECT_EQ(names.front(), "B1.1");
     EXPECT_EQ(names[15], "B1.16");
     EXPECT_EQ(names.back(), "B1.23");
@@ -117,7 +117,7 @@ TEST_F(Z7SimISDNFeatureTest, BearersOfAT1TakeTheFirstTimeSlots) {
 TEST_F(Z7SimISDNFeatureTest, BearersOfAnE1LeaveTheSignallingSlotOut) {
     plugIn("", trunk(301, 30));
     auto const names = bearerNames();
-    ASSERT_EQ(names.size(), 30u);
+    ASSERT_EQ(names.size(), 30U);
     EXPECT_EQ(names[14], "B1.15");
     EXPECT_EQ(names[15], "B1.17");
     EXPECT_EQ(names.back(), "B1.31");
@@ -127,7 +127,7 @@ TEST_F(Z7SimISDNFeatureTest, BearersOfAnE1LeaveTheSignallingSlotOut) {
 TEST_F(Z7SimISDNFeatureTest, BearersOfAFullE1TakeEverySlot) {
     plugIn("", trunk(301, 31));
     auto const names = bearerNames();
-    ASSERT_EQ(names.size(), 31u);
+    ASSERT_EQ(names.size(), 31U);
     EXPECT_EQ(names[15], "B1.16");
     EXPECT_EQ(names.back(), "B1.31");
 }
@@ -306,7 +306,7 @@ TEST_F(Z7SimISDNFeatureTest, FeatureIsBackOnceAfterEveryStart) {
         EXPECT_EQ(countFeatures<ISDNFeature>(), 0);
         start();
         EXPECT_EQ(countFeatures<ISDNFeature>(), 1);
-        EXPECT_EQ(bearerNames().size(), 2u);
+        EXPECT_EQ(bearerNames().size(), 2U);
         // The factories of former tests have found the board as well by the first start.
         int const present = ReferenceTable::get_instance()->referenced_objects();
         if (round == 1) objects = present;
@@ -339,7 +339,8 @@ TEST_F(Z7SimISDNFeatureTest, ForgottenBoardLeavesNoFeatureBehind) {
     load("", trunk(301, 2));
     m_factory->GetBoardIdentifiers();
     int const objects = ReferenceTable::get_instance()->referenced_objects();
-    ReferenceCounter<Board>(m_factory->MakeBoard(5)); // gone with its only handle
+    // NOLINTNEXTLINE(bugprone-unused-raii): gone with its only handle
+    ReferenceCounter<Board>(m_factory->MakeBoard(5));
     EXPECT_EQ(ReferenceTable::get_instance()->referenced_objects(), objects);
 }
 
