@@ -43,7 +43,7 @@ class StableIndices final : private StatePart {
 
     /// The indices of a board's things, in the order of `keys`, which are all different. 0 where
     /// no index is left, and where the thing is not known yet because the file is locked.
-    std::vector<std::uint32_t> indicesOf(BoardKey const& board, std::span<IndexKey const> keys);
+    std::vector<std::uint32_t> indicesOf(BoardKey const& key, std::span<IndexKey const> keys);
     /// Writes what is new since the last call, after every reading of all boards.
     void save();
 

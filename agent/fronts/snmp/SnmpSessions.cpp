@@ -90,9 +90,8 @@ int receiveMessage(netsnmp_transport* transport, void* buffer, int size, void** 
     return static_cast<int>(message->octets.size());
 }
 
-// NOLINTNEXTLINE(readability-non-const-parameter): the library's type
 int sendMessage(netsnmp_transport* transport, void const* buffer, int size, void** receiver,
-                int* receiverSize) {
+                int* receiverSize) { // NOLINT(readability-non-const-parameter): the library's type
     if (receiver == nullptr || *receiver == nullptr || receiverSize == nullptr ||
         *receiverSize != static_cast<int>(sizeof(netsnmp_indexed_addr_pair)))
         return -1;
