@@ -3,6 +3,7 @@
 #pragma once
 
 #include <optional>
+#include <utility>
 
 #include "agent/objects/ObjectTree.h"
 
@@ -15,6 +16,8 @@ inline int errorStatusOf(SetFault fault) {
         return 0;
     case SetFault::WrongType:
         return 7;
+    case SetFault::WrongLength:
+        return 8;
     case SetFault::WrongValue:
         return 10;
     case SetFault::NoCreation:
@@ -29,7 +32,7 @@ inline int errorStatusOf(SetFault fault) {
 /// changes of a SET last to first, because a SET may contain an instance twice. Unsynchronised.
 class PendingChange {
   public:
-    explicit PendingChange(Change change) : m_change(change) {}
+    explicit PendingChange(Change change) : m_change(std::move(change)) {}
 
     /// Makes the change, once.
     void commit(Settings& settings) {
@@ -39,14 +42,14 @@ class PendingChange {
     }
     /// Restores the former value if the change was made.
     void undo(Settings& settings) {
-        if (m_committed) settings.exchange(m_change.key, m_former);
+        if (m_committed) settings.exchange(m_change.key, std::move(m_former));
         m_committed = false;
     }
 
   private:
     Change m_change;
     bool m_committed = false;
-    std::optional<int> m_former;
+    std::optional<SettingValue> m_former;
 };
 
 } // namespace kvloamd

@@ -10,6 +10,10 @@
 #include <functional>
 #include <optional>
 #include <span>
+#include <string>
+#include <utility>
+#include <variant>
+#include <vector>
 
 #include "agent/objects/Value.h"
 #include "agent/rows/Snapshot.h"
@@ -24,11 +28,15 @@ struct Scalar {
     Value (*get)(Facts const&);
 };
 
-/// What can be set in a column of integers.
+/// What a text that can be set may consist of. Control characters are never accepted.
+enum class Characters { Utf8, Ascii };
+
+/// What can be set in a column of integers or of texts.
 struct Writable {
     Setting setting;
-    int lowest; ///< an enumeration without gaps is the range of its numbers
+    int lowest; ///< an enumeration without gaps is the range of its numbers; of a text: its length
     int highest;
+    Characters characters = Characters::Utf8; ///< of a text
 };
 
 struct ColumnHead {
@@ -98,10 +106,12 @@ class RowTable final : public Table {
     Value value(Facts const& facts, std::size_t column, std::size_t row) const override {
         Column<Row> const& described = m_columns[column];
         Row const& asked = rows(facts)[row];
-        Value const value = described.get(asked);
+        Value value = described.get(asked);
         if (!described.writable || facts.settings == nullptr || !isKnown(value)) return value;
-        auto const set = facts.settings->find({described.writable->setting, asked.index().front()});
-        return set ? Value{std::int64_t{*set}} : value;
+        auto set = facts.settings->value({described.writable->setting, asked.index().front()});
+        if (!set) return value;
+        if (auto* const text = std::get_if<std::string>(&*set)) return std::move(*text);
+        return std::int64_t{std::get<int>(*set)};
     }
 
   private:

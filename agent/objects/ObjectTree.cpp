@@ -2,6 +2,11 @@
 #include "agent/objects/ObjectTree.h"
 
 #include <algorithm>
+#include <cstddef>
+#include <string>
+#include <utility>
+
+#include "agent/objects/TextCheck.h"
 
 namespace kvloamd {
 
@@ -9,6 +14,25 @@ namespace {
 
 /// A scalar's one instance.
 constexpr std::uint32_t kScalarIndex[] = {0};
+
+/// Whether a column that is `writable` takes `asked`; then `value` is it.
+SetFault accept(Writable const& writable, ValueType type, Value const& asked, SettingValue& value) {
+    if (type == ValueType::Integer) {
+        auto const* const integer = std::get_if<std::int64_t>(&asked);
+        if (integer == nullptr) return SetFault::WrongType;
+        if (*integer < writable.lowest || *integer > writable.highest) return SetFault::WrongValue;
+        value = static_cast<int>(*integer);
+        return SetFault::None;
+    }
+    auto const octets = octetsOf(asked);
+    if (!octets) return SetFault::WrongType;
+    auto const length = static_cast<std::ptrdiff_t>(octets->size());
+    if (length < writable.lowest || length > writable.highest) return SetFault::WrongLength;
+    if (!isText(*octets) || (writable.characters == Characters::Ascii && !isAscii(*octets)))
+        return SetFault::WrongValue;
+    value = std::string(*octets);
+    return SetFault::None;
+}
 
 /// An instance's whole name, from the root on; longer ones have to be made room for.
 constexpr std::size_t kUsualName = 20;
@@ -80,17 +104,18 @@ std::vector<TableColumn> ObjectTree::columnsBelow(OidView place) const {
     return columns;
 }
 
-SetFault ObjectTree::test(Facts const& facts, OidView name, std::optional<std::int64_t> integer,
+SetFault ObjectTree::test(Facts const& facts, OidView name, Value const& asked,
                           std::optional<Change>& change) const {
     Node const* const node = nodeOf(name);
     if (node == nullptr || node->table == nullptr) return SetFault::NotWritable;
     auto const writable = node->table->column(node->column).writable;
     if (!writable) return SetFault::NotWritable;
-    if (!integer) return SetFault::WrongType;
-    if (*integer < writable->lowest || *integer > writable->highest) return SetFault::WrongValue;
+    SettingValue value;
+    if (SetFault const fault = accept(*writable, node->type, asked, value); fault != SetFault::None)
+        return fault;
     Instance present;
     if (find(facts, name, present) != Lookup::Found) return SetFault::NoCreation;
-    change = {{writable->setting, name[node->place.size()]}, static_cast<int>(*integer)};
+    change = {{writable->setting, name[node->place.size()]}, std::move(value)};
     return SetFault::None;
 }
 

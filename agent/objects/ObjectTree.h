@@ -35,7 +35,8 @@ enum class Lookup {
 enum class SetFault {
     None,
     NotWritable, ///< no such object, or it is read-only
-    WrongType,   ///< the object takes integers
+    WrongType,   ///< the object takes integers, or octets
+    WrongLength, ///< the object takes fewer octets
     WrongValue,  ///< none that the object takes
     NoCreation   ///< there is no such instance, and setting it would not make one
 };
@@ -43,7 +44,7 @@ enum class SetFault {
 /// A setting and what it is to be. `Settings::exchange` makes the change, and undoes it.
 struct Change {
     SettingKey key;
-    int value;
+    SettingValue value;
 };
 
 /// An `ObjectTree` holds all scalars and columns in the order of their places. Immutable. Every
@@ -59,9 +60,9 @@ class ObjectTree {
     /// The first instance after `name`, or at `name` if `orEqual`. False when there is none.
     bool next(Facts const& facts, OidView name, bool orEqual, Instance& found) const;
 
-    /// Whether the instance `name` can be set to `integer`; nothing when the value is no integer.
-    /// `change` is what to do, if it can.
-    SetFault test(Facts const& facts, OidView name, std::optional<std::int64_t> integer,
+    /// Whether the instance `name` can be set to `asked`, an integer or octets; nothing when the
+    /// value is of another type. `change` is what to do, if it can.
+    SetFault test(Facts const& facts, OidView name, Value const& asked,
                   std::optional<Change>& change) const;
 
     /// The columns of tables that are at `place` or below, ascending.

@@ -3,6 +3,8 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
+#include <string>
 #include <string_view>
 #include <variant>
 
@@ -33,8 +35,15 @@ struct NameView {
 };
 
 /// A number (an unsigned one of 64 bits as the same bits), octets or a name that the snapshot
-/// holds, or nothing if the value is not known.
-using Value = std::variant<std::monostate, std::int64_t, std::string_view, NameView>;
+/// holds, octets that the value itself holds, or nothing if the value is not known.
+using Value = std::variant<std::monostate, std::int64_t, std::string_view, NameView, std::string>;
+
+/// The octets of a value that has some; valid as long as the value.
+inline std::optional<std::string_view> octetsOf(Value const& value) {
+    if (auto const* const view = std::get_if<std::string_view>(&value)) return *view;
+    if (auto const* const own = std::get_if<std::string>(&value)) return *own;
+    return std::nullopt;
+}
 
 inline bool isKnown(Value const& value) {
     return !std::holds_alternative<std::monostate>(value);

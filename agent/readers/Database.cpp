@@ -85,6 +85,12 @@ Statement& Statement::bind(int parameter, std::int64_t value) {
     return *this;
 }
 
+Statement& Statement::bindBlob(int parameter, std::string const& value) {
+    sqlite3_bind_blob(m_statement, parameter, value.data(), static_cast<int>(value.size()),
+                      SQLITE_STATIC);
+    return *this;
+}
+
 bool Statement::step() {
     int const result = sqlite3_step(m_statement);
     if (result != SQLITE_ROW && result != SQLITE_DONE) m_database.fail();
@@ -104,6 +110,16 @@ std::string Statement::text(int column) const {
     auto const* const bytes =
         reinterpret_cast<char const*>(sqlite3_column_text(m_statement, column));
     return bytes == nullptr ? std::string() : std::string(bytes);
+}
+
+bool Statement::isBlob(int column) const {
+    return sqlite3_column_type(m_statement, column) == SQLITE_BLOB;
+}
+
+std::string Statement::blob(int column) const {
+    auto const* const octets = static_cast<char const*>(sqlite3_column_blob(m_statement, column));
+    auto const size = static_cast<std::size_t>(sqlite3_column_bytes(m_statement, column));
+    return octets == nullptr ? std::string() : std::string(octets, size);
 }
 
 Transaction::Transaction(Database& database, Kind kind) : m_database(database) {

@@ -68,12 +68,16 @@ class Statement {
     /// `value` must live until the next `run`.
     Statement& bind(int parameter, std::string const& value);
     Statement& bind(int parameter, std::int64_t value);
+    /// As octets, which SQLite never converts. `value` must live until the next `run`.
+    Statement& bindBlob(int parameter, std::string const& value);
     /// Steps to the next row. Returns false after the last one.
     bool step();
     /// Executes the statement and makes it ready for other values.
     void run();
     std::int64_t number(int column) const;
     std::string text(int column) const;
+    bool isBlob(int column) const;
+    std::string blob(int column) const;
 
   private:
     Database& m_database;

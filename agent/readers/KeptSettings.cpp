@@ -5,16 +5,24 @@ namespace kvloamd {
 
 namespace {
 
+/// The column `ifIndex` has the index of whatever the file is about. A number is an INTEGER, a text
+/// is a BLOB, because SQLite would store a text of digits as a number.
 constexpr char kSchema[] = "CREATE TABLE IF NOT EXISTS setting ("
                            " ifIndex INTEGER NOT NULL,"
                            " setting INTEGER NOT NULL,"
                            " value INTEGER NOT NULL,"
                            " PRIMARY KEY (ifIndex, setting)) WITHOUT ROWID;";
 
+SettingValue valueOf(Statement const& row, int column) {
+    if (row.isBlob(column)) return row.blob(column);
+    return static_cast<int>(row.number(column));
+}
+
 } // namespace
 
-KeptSettings::KeptSettings(StateFile& file, StableIndices const& indices, Settings& settings)
-    : m_file(file), m_indices(indices), m_settings(settings) {
+KeptSettings::KeptSettings(StateFile& file, StableIndices const& indices, Settings& settings,
+                           SettingIndex kind)
+    : m_file(file), m_indices(indices), m_settings(settings), m_kind(kind) {
     m_file.add(*this);
 }
 
@@ -23,7 +31,7 @@ KeptSettings::~KeptSettings() {
 }
 
 void KeptSettings::save() {
-    for (SettingEntry const& entry : m_settings.takeUnsaved())
+    for (SettingEntry const& entry : m_settings.takeUnsaved(m_kind))
         m_unsaved.insert_or_assign(entry.key, entry.value);
     m_file.save();
 }
@@ -37,7 +45,7 @@ void KeptSettings::load(Database& database) {
         SettingKey const key{static_cast<Setting>(settings.number(0)),
                              static_cast<std::uint32_t>(settings.number(1))};
         if (m_indices.isStable(key.index))
-            entries.push_back({key, static_cast<int>(settings.number(2))});
+            entries.push_back({key, valueOf(settings, 2)});
         else
             m_unsaved.emplace(key, std::nullopt);
     }
@@ -59,7 +67,7 @@ void KeptSettings::writeChanges(Database& database) {
 
 void KeptSettings::writeAll(Database& database) {
     database.execute("DELETE FROM setting");
-    for (SettingEntry const& entry : m_settings.all())
+    for (SettingEntry const& entry : m_settings.all(m_kind))
         write(database, entry);
 }
 
@@ -71,11 +79,14 @@ void KeptSettings::write(Database& database, SettingEntry const& entry) const {
             .run();
         return;
     }
-    Statement(database, "INSERT OR REPLACE INTO setting (ifIndex, setting, value) VALUES (?, ?, ?)")
-        .bind(1, entry.key.index)
-        .bind(2, static_cast<std::int64_t>(entry.key.setting))
-        .bind(3, *entry.value)
-        .run();
+    Statement insert(database,
+                     "INSERT OR REPLACE INTO setting (ifIndex, setting, value) VALUES (?, ?, ?)");
+    insert.bind(1, entry.key.index).bind(2, static_cast<std::int64_t>(entry.key.setting));
+    if (auto const* const text = std::get_if<std::string>(&*entry.value))
+        insert.bindBlob(3, *text);
+    else
+        insert.bind(3, std::get<int>(*entry.value));
+    insert.run();
 }
 
 void KeptSettings::written() {

@@ -11,15 +11,17 @@
 
 namespace kvloamd {
 
-/// A `KeptSettings` keeps operators' settings in the file of the indices that they belong to.
+/// A `KeptSettings` keeps operators' settings of one kind in the file of the indices that they
+/// belong to.
 ///
 /// A setting of something that cannot be identified after a restart is not saved, because another
 /// board might have its index then. Settings whose index has been forgotten are deleted when the
 /// file is read. Bound to the collector's thread once the file is open.
 class KeptSettings final : private StatePart {
   public:
-    /// Adds itself to `file`. All arguments outlive it.
-    KeptSettings(StateFile& file, StableIndices const& indices, Settings& settings);
+    /// Adds itself to `file`. All arguments outlive it. `kind`: what `indices` are.
+    KeptSettings(StateFile& file, StableIndices const& indices, Settings& settings,
+                 SettingIndex kind = SettingIndex::Interface);
     /// Saves.
     ~KeptSettings();
     KeptSettings(KeptSettings const&) = delete;
@@ -40,7 +42,8 @@ class KeptSettings final : private StatePart {
     StateFile& m_file;
     StableIndices const& m_indices;
     Settings& m_settings;
-    std::map<SettingKey, std::optional<int>> m_unsaved;
+    SettingIndex m_kind;
+    std::map<SettingKey, std::optional<SettingValue>> m_unsaved;
 };
 
 } // namespace kvloamd

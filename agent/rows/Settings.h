@@ -8,17 +8,32 @@
 #include <mutex>
 #include <optional>
 #include <set>
+#include <string>
+#include <variant>
 #include <vector>
 
 namespace kvloamd {
 
-/// The numbers are in the file of interface indices: they stay.
+/// The numbers are in the files of the indices: they stay. Those of physical entities begin at
+/// 1000.
 enum class Setting : int {
     LineStatusChangeTraps = 1, ///< of a line: 1 enabled, 2 disabled
-    LinkUpDownTraps = 2        ///< of an interface: the same
+    LinkUpDownTraps = 2,       ///< of an interface: the same
+    EntityAlias = 1000,        ///< of a physical entity: a text, as the next two
+    EntityAssetId = 1001,
+    EntityUris = 1002
 };
 
-/// A setting of the row whose index begins with `index`, an ifIndex.
+/// What the index of a setting's row is. Each kind has a file of its own.
+enum class SettingIndex { Interface, Entity };
+
+inline SettingIndex indexOf(Setting setting) {
+    return setting < Setting::EntityAlias ? SettingIndex::Interface : SettingIndex::Entity;
+}
+
+using SettingValue = std::variant<int, std::string>;
+
+/// A setting of the row whose index begins with `index`, an ifIndex or an entPhysicalIndex.
 struct SettingKey {
     Setting setting;
     std::uint32_t index;
@@ -29,7 +44,7 @@ struct SettingKey {
 /// Without a value, the setting is deleted.
 struct SettingEntry {
     SettingKey key;
-    std::optional<int> value;
+    std::optional<SettingValue> value;
 
     bool operator==(SettingEntry const&) const = default;
 };
@@ -39,22 +54,26 @@ struct SettingEntry {
 class Settings {
   public:
     /// Nothing when it has not been set.
+    std::optional<SettingValue> value(SettingKey key) const;
+    /// The same for a setting that is a number.
     std::optional<int> find(SettingKey key) const;
+    /// The same for a setting that is a text.
+    std::optional<std::string> findText(SettingKey key) const;
     /// Sets it, or forgets it. Returns what was set before, with which the same call undoes this
     /// one.
-    std::optional<int> exchange(SettingKey key, std::optional<int> value);
+    std::optional<SettingValue> exchange(SettingKey key, std::optional<SettingValue> value);
 
     /// Enters what was kept.
     void load(std::vector<SettingEntry> const& entries);
-    /// Everything that is set, ascending by key.
-    std::vector<SettingEntry> all() const;
+    /// Everything of this kind that is set, ascending by key.
+    std::vector<SettingEntry> all(SettingIndex kind = SettingIndex::Interface) const;
     bool hasUnsaved() const;
-    /// What has been set or forgotten since the last time, ascending by key.
-    std::vector<SettingEntry> takeUnsaved();
+    /// What of this kind has been set or forgotten since the last time, ascending by key.
+    std::vector<SettingEntry> takeUnsaved(SettingIndex kind = SettingIndex::Interface);
 
   private:
     mutable std::mutex m_mutex; ///< guards what follows
-    std::map<SettingKey, int> m_values;
+    std::map<SettingKey, SettingValue> m_values;
     std::set<SettingKey> m_unsaved;
 };
 

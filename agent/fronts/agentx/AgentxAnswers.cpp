@@ -81,12 +81,11 @@ std::string AgentxAnswers::set(AgentxHeader const& header, AgentxReader reader) 
     // Only the test step needs a snapshot.
     std::shared_ptr<Snapshot const> snapshot;
     return m_sets.answer(
-        header, reader,
-        [&](OidView name, std::optional<std::int64_t> integer, std::optional<Change>& change) {
+        header, reader, [&](OidView name, Value const& asked, std::optional<Change>& change) {
             ObjectTree const* const tree = treeOf(name);
             if (tree == nullptr) return SetFault::NotWritable;
             if (!snapshot) snapshot = m_takeSnapshot();
-            return tree->test({*snapshot, m_counters, &m_settings}, name, integer, change);
+            return tree->test({*snapshot, m_counters, &m_settings}, name, asked, change);
         });
 }
 

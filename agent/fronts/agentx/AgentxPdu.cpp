@@ -129,7 +129,7 @@ AgentxVariable AgentxReader::variable() {
     result.name = name().name;
     switch (type) {
     case kInteger:
-        result.integer = static_cast<std::int32_t>(number());
+        result.value = std::int64_t{static_cast<std::int32_t>(number())};
         break;
     case kCounter:
     case kGauge:
@@ -143,7 +143,8 @@ AgentxVariable AgentxReader::variable() {
     case kIpAddress:
     case kOpaque: {
         std::size_t const size = number();
-        take(size);
+        std::string_view const octets = take(size);
+        if (type == kOctetString) result.value = octets;
         take((4 - size % 4) % 4);
         break;
     }
@@ -219,7 +220,7 @@ void AgentxWriter::head(std::uint16_t type, OidView named) {
 
 void AgentxWriter::variable(OidView named, ValueType type, Value const& value) {
     head(typeOf(type), named);
-    if (auto const* const octets = std::get_if<std::string_view>(&value)) return text(*octets);
+    if (auto const octets = octetsOf(value)) return text(*octets);
     if (auto const* const place = std::get_if<NameView>(&value)) return name(place->name);
     auto const bits = static_cast<std::uint64_t>(std::get<std::int64_t>(value));
     if (type == ValueType::Counter64) number(static_cast<std::uint32_t>(bits >> 32U));

@@ -34,6 +34,7 @@ enum class AgentxKind : std::uint8_t {
 enum class AgentxFault : std::uint16_t {
     None = 0,
     WrongType = 7,
+    WrongLength = 8,
     WrongValue = 10,
     NoCreation = 11,
     ResourceUnavailable = 13,
@@ -79,7 +80,7 @@ struct AgentxName {
 /// A variable of a SET.
 struct AgentxVariable {
     Oid name;
-    std::optional<std::int64_t> integer; ///< empty when the value has another type
+    Value value; ///< an integer or octets in the packet; nothing when it has another type
 };
 
 /// An `AgentxReader` decodes a packet's payload from beginning to end. Reading past the end throws

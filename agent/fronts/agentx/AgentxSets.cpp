@@ -2,6 +2,7 @@
 #include "agent/fronts/agentx/AgentxSets.h"
 
 #include <algorithm>
+#include <iterator>
 
 namespace kvloamd {
 
@@ -29,16 +30,17 @@ std::string AgentxSets::testSet(AgentxHeader const& header, AgentxReader reader,
     for (std::uint16_t variable = 1; !reader.atEnd(); ++variable) {
         AgentxVariable const asked = reader.variable();
         std::optional<Change> change;
-        SetFault const fault = test(asked.name, asked.integer, change);
+        SetFault const fault = test(asked.name, asked.value, change);
         if (fault != SetFault::None || !change)
             return agentxResponse(header, static_cast<AgentxFault>(errorStatusOf(fault)), variable);
-        tested.emplace_back(*change);
+        tested.emplace_back(*std::move(change));
     }
     if (m_sets.size() >= kMost) m_sets.erase(m_sets.begin());
     auto& held = m_sets[{header.session, header.transaction}];
     if (held.size() + tested.size() > kMostChanges)
         return agentxResponse(header, AgentxFault::ResourceUnavailable);
-    held.insert(held.end(), tested.begin(), tested.end());
+    held.insert(held.end(), std::make_move_iterator(tested.begin()),
+                std::make_move_iterator(tested.end()));
     return agentxResponse(header, AgentxFault::None);
 }
 

@@ -23,8 +23,8 @@ namespace kvloamd {
 class AgentxSets {
   public:
     /// As `ObjectTree::test`, with an absolute name.
-    using Test = std::function<SetFault(OidView name, std::optional<std::int64_t> integer,
-                                        std::optional<Change>& change)>;
+    using Test =
+        std::function<SetFault(OidView name, Value const& asked, std::optional<Change>& change)>;
 
     /// `settings` outlives the sets.
     explicit AgentxSets(Settings& settings) : m_settings(settings) {}

@@ -195,18 +195,22 @@ void SnmpHandler::Call::getBulk(netsnmp_request_info* request) {
 
 void SnmpHandler::Call::testSet(netsnmp_request_info* request) {
     netsnmp_variable_list const& variable = *request->requestvb;
-    std::optional<std::int64_t> integer;
-    if (variable.type == ASN_INTEGER) integer = *variable.val.integer;
+    Value asked;
+    if (variable.type == ASN_INTEGER)
+        asked = std::int64_t{*variable.val.integer};
+    else if (variable.type == ASN_OCTET_STR)
+        asked =
+            std::string_view(reinterpret_cast<char const*>(variable.val.string), variable.val_len);
     bool orEqual = false;
     std::optional<Change> change;
-    SetFault const fault =
-        handler.m_tree.test(facts, relative(&variable, orEqual), integer, change);
+    SetFault const fault = handler.m_tree.test(facts, relative(&variable, orEqual), asked, change);
     if (fault != SetFault::None || !change) {
         netsnmp_request_set_error(request, errorStatusOf(fault));
         return;
     }
     netsnmp_request_add_list_data(
-        request, netsnmp_create_data_list(kSetKey, new PendingChange(*change), freeChange));
+        request,
+        netsnmp_create_data_list(kSetKey, new PendingChange(*std::move(change)), freeChange));
 }
 
 PendingChange* SnmpHandler::Call::pendingChange(netsnmp_request_info* request) {

@@ -36,7 +36,7 @@ unsigned char asnTypeOf(ValueType type) {
 
 void setVariable(variable_list* variable, ValueType type, Value const& value) {
     u_char const asn = asnTypeOf(type);
-    if (auto const* const octets = std::get_if<std::string_view>(&value)) {
+    if (auto const octets = octetsOf(value)) {
         snmp_set_var_typed_value(variable, asn, octets->data(), octets->size());
     } else if (auto const* const named = std::get_if<NameView>(&value)) {
         std::vector<oid> const wide(named->name.begin(), named->name.end());

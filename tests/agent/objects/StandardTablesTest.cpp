@@ -204,7 +204,7 @@ class StandardSetTest : public StandardTablesTest {
     }
 
     SetFault test(Oid const& name, std::optional<std::int64_t> integer) {
-        return m_tree.test(m_withSettings, name, integer, m_change);
+        return m_tree.test(m_withSettings, name, integer ? Value{*integer} : Value{}, m_change);
     }
     std::int64_t setNumberAt(Oid const& name) {
         Instance found;
@@ -222,7 +222,7 @@ TEST_F(StandardSetTest, WritableColumnTakesItsValues) {
     EXPECT_EQ(test(with(kLineTraps, {10}), 1), SetFault::None);
     ASSERT_TRUE(m_change);
     EXPECT_EQ(m_change->key, (SettingKey{Setting::LineStatusChangeTraps, 10}));
-    EXPECT_EQ(m_change->value, 1);
+    EXPECT_EQ(m_change->value, SettingValue{1});
     EXPECT_EQ(test(with(kLinkTraps, {50}), 2), SetFault::None);
     EXPECT_EQ(m_change->key, (SettingKey{Setting::LinkUpDownTraps, 50}));
 }

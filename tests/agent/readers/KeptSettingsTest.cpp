@@ -15,6 +15,23 @@ using ::testing::IsEmpty;
 constexpr SettingKey kFirst{Setting::LineStatusChangeTraps, 1000};
 constexpr SettingKey kSecond{Setting::LinkUpDownTraps, 1001};
 
+constexpr SettingKey kAlias{Setting::EntityAlias, 1000};
+
+/// One run of the agent, with the file as that of physical entities.
+struct EntityRun {
+    explicit EntityRun(std::string const& path)
+        : file(path, "physical entities"),
+          indices(file, 1000),
+          kept(file, indices, settings, SettingIndex::Entity) {
+        file.open();
+    }
+
+    Settings settings;
+    StateFile file;
+    StableIndices indices;
+    KeptSettings kept;
+};
+
 class KeptSettingsTest : public StateFolder {
   protected:
     KeptSettingsTest() { AgentRun(file()).ask("A", lines(2)); }
@@ -30,6 +47,20 @@ TEST_F(KeptSettingsTest, SettingsAreTheSameAfterARestart) {
     }
     EXPECT_THAT(AgentRun(file()).settings.all(),
                 ElementsAre(SettingEntry{kFirst, 1}, SettingEntry{kSecond, 2}));
+}
+
+TEST_F(KeptSettingsTest, TextIsTheSameAfterARestartEvenIfItLooksLikeANumber) {
+    for (char const* const text : {"West wing", "0042", "", "Zw\xc3\xb6lf"}) {
+        {
+            EntityRun run(file());
+            run.settings.exchange(kAlias, text);
+            run.settings.exchange(kFirst, 1); // an interface's: it is in another file
+        }
+        EntityRun const run(file());
+        EXPECT_THAT(run.settings.all(SettingIndex::Entity),
+                    ElementsAre(SettingEntry{kAlias, text}));
+        EXPECT_THAT(run.settings.all(), IsEmpty());
+    }
 }
 
 TEST_F(KeptSettingsTest, SettingIsSavedWhenTheAgentStops) {

@@ -38,8 +38,8 @@ struct AgentRun {
         indices.save();
         return given;
     }
-    void set(SettingKey key, std::optional<int> value) {
-        settings.exchange(key, value);
+    void set(SettingKey key, std::optional<SettingValue> value) {
+        settings.exchange(key, std::move(value));
         kept.save();
     }
 

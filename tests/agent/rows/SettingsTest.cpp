@@ -11,6 +11,7 @@ using ::testing::IsEmpty;
 
 constexpr SettingKey kLine{Setting::LineStatusChangeTraps, 1000};
 constexpr SettingKey kLink{Setting::LinkUpDownTraps, 1000};
+constexpr SettingKey kAlias{Setting::EntityAlias, 1};
 
 TEST(SettingsTest, NothingIsSetAtFirst) {
     Settings const settings;
@@ -59,6 +60,29 @@ TEST(SettingsTest, ForgottenSettingIsSavedAsSuch) {
     settings.takeUnsaved();
     settings.exchange(kLine, std::nullopt);
     EXPECT_THAT(settings.takeUnsaved(), ElementsAre(SettingEntry{kLine, std::nullopt}));
+}
+
+TEST(SettingsTest, TextAndNumberAreFoundAsWhatTheyAre) {
+    Settings settings;
+    settings.exchange(kAlias, "west");
+    settings.exchange(kLine, 1);
+    EXPECT_EQ(settings.findText(kAlias), "west");
+    EXPECT_EQ(settings.find(kAlias), std::nullopt);
+    EXPECT_EQ(settings.findText(kLine), std::nullopt);
+    EXPECT_EQ(settings.value(kAlias), SettingValue{"west"});
+}
+
+TEST(SettingsTest, SettingsOfInterfacesAndOfEntitiesAreHandedOutApart) {
+    Settings settings;
+    settings.exchange(kLine, 1);
+    settings.exchange(kAlias, "west");
+    EXPECT_THAT(settings.all(), ElementsAre(SettingEntry{kLine, 1}));
+    EXPECT_THAT(settings.all(SettingIndex::Entity), ElementsAre(SettingEntry{kAlias, "west"}));
+    EXPECT_THAT(settings.takeUnsaved(), ElementsAre(SettingEntry{kLine, 1}));
+    EXPECT_TRUE(settings.hasUnsaved());
+    EXPECT_THAT(settings.takeUnsaved(SettingIndex::Entity),
+                ElementsAre(SettingEntry{kAlias, "west"}));
+    EXPECT_FALSE(settings.hasUnsaved());
 }
 
 TEST(SettingsTest, WhatWasKeptCountsAndIsNotSavedAgain) {

@@ -7,11 +7,17 @@ namespace kvloamd {
 namespace {
 
 constexpr std::uint32_t kMissing = 99;
+constexpr std::uint32_t kText = 98;
 
-/// Names are the number of a row: 99 does not exist, 100 is read-only.
-SetFault testRow(OidView name, std::optional<std::int64_t> integer, std::optional<Change>& change) {
+/// Names are the number of a row: 98 takes texts, 99 does not exist, 100 is read-only.
+SetFault testRow(OidView name, Value const& asked, std::optional<Change>& change) {
+    auto const* const integer = std::get_if<std::int64_t>(&asked);
     if (name.front() == 100) return SetFault::NotWritable;
-    if (!integer) return SetFault::WrongType;
+    if (auto const text = octetsOf(asked); text && name.front() == kText) {
+        change = {{Setting::EntityAlias, kText}, std::string(*text)};
+        return SetFault::None;
+    }
+    if (integer == nullptr) return SetFault::WrongType;
     if (*integer < 1 || *integer > 9) return SetFault::WrongValue;
     if (name.front() == kMissing) return SetFault::NoCreation;
     change = {{Setting::LinkUpDownTraps, name.front()}, static_cast<int>(*integer)};
@@ -90,6 +96,22 @@ TEST_F(AgentxSetsTest, ValueOfEveryOtherTypeIsOfTheWrongType) {
     EXPECT_EQ(fault(ValueType::Gauge, std::int64_t{5}), wrongType);
     EXPECT_EQ(fault(ValueType::TimeTicks, std::int64_t{5}), wrongType);
     EXPECT_EQ(fault(ValueType::ObjectId, NameView{place}), wrongType);
+}
+
+TEST_F(AgentxSetsTest, TextIsSetAndUndone) {
+    SettingKey const key{Setting::EntityAlias, kText};
+    m_settings.exchange(key, "before");
+    AgentxWriter writer(AgentxKind::TestSet, 1, 1, 1);
+    writer.variable(Oid{kText}, ValueType::Text, std::string_view("after"));
+    writer.variable(Oid{1}, ValueType::Integer, std::int64_t{5});
+    EXPECT_EQ(send(writer.take()), kGood);
+    EXPECT_EQ(m_settings.findText(key), "before");
+    step(AgentxKind::CommitSet);
+    EXPECT_EQ(m_settings.findText(key), "after");
+    EXPECT_EQ(valueOf(1), 5);
+    step(AgentxKind::UndoSet);
+    EXPECT_EQ(m_settings.findText(key), "before");
+    EXPECT_EQ(valueOf(1), std::nullopt);
 }
 
 TEST_F(AgentxSetsTest, NegativeIntegersAreRead) {
