@@ -33,6 +33,11 @@ Value highSpeed(InterfaceRow const& row) {
     return std::int64_t{*row.speed / 1'000'000 + (*row.speed % 1'000'000 >= 500'000 ? 1 : 0)};
 }
 
+/// Empty until it is set.
+Value alias(InterfaceRow const& /*row*/) {
+    return std::string_view();
+}
+
 Value linkUpDownTraps(InterfaceRow const& row) {
     return std::int64_t{row.linkUpDownTraps};
 }
@@ -49,6 +54,8 @@ using enum ValueType;
 using Row = InterfaceRow;
 
 constexpr Writable kTraps{Setting::LinkUpDownTraps, kEnabled, kDisabled};
+constexpr int kLongestAlias = 64;
+constexpr Writable kAlias{Setting::InterfaceAlias, 0, kLongestAlias, Characters::Ascii};
 
 constexpr Column<Row> kColumns[] = {
     {"ifIndex", 1, Integer, index},
@@ -80,7 +87,7 @@ constexpr Column<Row> kMoreColumns[] = {
     {"ifLinkUpDownTrapEnable", 14, Integer, linkUpDownTraps, kTraps},
     {"ifHighSpeed", 15, Gauge, highSpeed},
     {"ifConnectorPresent", 17, Integer, number<&Row::connectorPresent>},
-    {"ifAlias", 18, Text, text<&Row::alias>},
+    {"ifAlias", 18, Text, alias, kAlias},
     {"ifCounterDiscontinuityTime", 19, TimeStamp, discontinuity},
 };
 

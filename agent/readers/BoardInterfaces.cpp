@@ -135,7 +135,6 @@ void Reading::readLine(DS1LineDevice& line) {
     InterfaceRow& interface = enter(IndexKind::Line, name);
     readInterface(line, interface);
     interface.name = name;
-    interface.alias = row.circuitIdentifier;
     interface.connectorPresent = kTrue;
     row.ifIndex = interface.ifIndex;
     m_found.rows.ports.push_back({row.ifIndex, 0, m_found.keys.back()});

@@ -45,7 +45,6 @@ struct InterfaceRow {
     std::uint32_t boardIndex = 0;
     std::string description;
     std::string name;
-    std::string alias;
     std::optional<int> type;
     std::optional<int> mtu;
     std::optional<std::uint32_t> speed; ///< bit/s

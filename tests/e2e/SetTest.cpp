@@ -12,6 +12,7 @@ using ::testing::HasSubstr;
 /// The writable objects of the line with ifIndex 1000.
 constexpr char kLineTraps[] = "1.3.6.1.2.1.10.18.6.1.17.1000";
 constexpr char kLinkTraps[] = "1.3.6.1.2.1.31.1.1.1.14.1000";
+constexpr char kAlias[] = "1.3.6.1.2.1.31.1.1.1.18.1000";
 
 class SetTest : public AgentFixture {
   protected:
@@ -147,6 +148,28 @@ TEST_F(SetTest, SettingsSurviveARestart) {
     startAgent();
     EXPECT_EQ(get(kLineTraps), "INTEGER: 1");
     EXPECT_EQ(get(kLinkTraps), "INTEGER: 2");
+}
+
+TEST_F(SetTest, AliasIsEmptyUntilItIsSetAndKept) {
+    startAgent();
+    EXPECT_EQ(get(kAlias), "\"\"");
+    set({kAlias, "s", "trunk to Berlin, floor 2"});
+    EXPECT_EQ(get(kAlias), "STRING: \"trunk to Berlin, floor 2\"");
+    EXPECT_THAT(refusal({kAlias, "s", std::string(65, 'x')}), HasSubstr("wrongLength"));
+    EXPECT_THAT(refusal({kAlias, "x", "e9"}), HasSubstr("wrongValue"));
+    EXPECT_THAT(refusal({kAlias, "i", "1"}), HasSubstr("wrongType"));
+    // Digits are a text too.
+    set({kAlias, "s", "0017"});
+    EXPECT_EQ(stopAgent(), 0) << agent().output();
+    startAgent();
+    EXPECT_EQ(get(kAlias), "STRING: \"0017\"");
+}
+
+TEST_F(SetTest, TextIsNotSetWhenAnotherVariableCanNotBe) {
+    startAgent();
+    set({kAlias, "s", "first"});
+    EXPECT_THAT(refusal({kAlias, "s", "second", kLinkTraps, "i", "3"}), HasSubstr("wrongValue"));
+    EXPECT_EQ(get(kAlias), "STRING: \"first\"");
 }
 
 TEST_F(SetTest, SettingsAreThereAgainWhenTheirBoardComesBack) {

@@ -12,6 +12,7 @@ using ::testing::HasSubstr;
 constexpr char kLineTraps[] = "1.3.6.1.2.1.10.18.6.1.17.";
 constexpr char kLinkTrapsOfLine[] = "1.3.6.1.2.1.31.1.1.1.14.1000";
 constexpr char kLineTrapsOfLine[] = "1.3.6.1.2.1.10.18.6.1.17.1000";
+constexpr char kAliasOfLine[] = "1.3.6.1.2.1.31.1.1.1.18.1000";
 constexpr char kLineName[] = "1.3.6.1.2.1.31.1.1.1.1.1000";
 
 class SubagentSetTest : public MasterFixture {
@@ -57,6 +58,22 @@ TEST_F(SubagentSetTest, RowAmongTheHostsIsSet) {
     std::string const value = other(m_linkTraps);
     EXPECT_THAT(set({kLinkTrapsOfLine, "i", value}), HasSubstr("INTEGER: " + value));
     EXPECT_EQ(get(kLinkTrapsOfLine), "INTEGER: " + value);
+}
+
+TEST_F(SubagentSetTest, TextAmongTheHostsRowsIsSetAndKept) {
+    start();
+    EXPECT_EQ(get(kAliasOfLine), "\"\"");
+    EXPECT_THAT(set({kAliasOfLine, "s", "to Berlin"}), HasSubstr("to Berlin"));
+    EXPECT_EQ(get(kAliasOfLine), "STRING: \"to Berlin\"");
+    // One bad variable leaves the text as it was.
+    EXPECT_THAT(set({kAliasOfLine, "s", "elsewhere", kLinkTrapsOfLine, "i", "9"}),
+                HasSubstr("wrongValue"));
+    EXPECT_THAT(set({kAliasOfLine, "s", std::string(65, 'x')}), HasSubstr("wrongLength"));
+    EXPECT_EQ(stopAgent(), 0) << agent().output();
+    startSubagent();
+    ASSERT_TRUE(isConnected()) << agent().output();
+    EXPECT_TRUE(eventually([this] { return get(kAliasOfLine) == "STRING: \"to Berlin\""; }))
+        << get(kAliasOfLine);
 }
 
 TEST_F(SubagentSetTest, VariablesOfSeveralTablesAreSetTogether) {

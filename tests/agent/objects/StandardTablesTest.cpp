@@ -189,6 +189,7 @@ TEST_F(StandardTablesTest, CountThatALineDoesNotKnowHasNoInstance) {
 
 Oid const kLineTraps{10, 18, 6, 1, 17};
 Oid const kLinkTraps{31, 1, 1, 1, 14};
+Oid const kAlias{31, 1, 1, 1, 18};
 
 /// Lines 10, 20, 30 and 40, of which all but 20 know whether they tell; interfaces 10 and 50, the
 /// latter stacked.
@@ -205,6 +206,9 @@ class StandardSetTest : public StandardTablesTest {
 
     SetFault test(Oid const& name, std::optional<std::int64_t> integer) {
         return m_tree.test(m_withSettings, name, integer ? Value{*integer} : Value{}, m_change);
+    }
+    SetFault testText(Oid const& name, std::string_view text) {
+        return m_tree.test(m_withSettings, name, text, m_change);
     }
     std::int64_t setNumberAt(Oid const& name) {
         Instance found;
@@ -241,6 +245,31 @@ TEST_F(StandardSetTest, WhatIsSetShowsAtOnceAndInItsRowOnly) {
 
 TEST_F(StandardSetTest, ValueThatIsNoIntegerIsOfTheWrongType) {
     EXPECT_EQ(test(with(kLineTraps, {10}), std::nullopt), SetFault::WrongType);
+}
+
+TEST_F(StandardSetTest, AliasTakesTextsOfUpTo64Characters) {
+    for (std::string const& text :
+         {std::string(), std::string("to Berlin"), std::string(64, 'x')}) {
+        EXPECT_EQ(testText(with(kAlias, {10}), text), SetFault::None) << text;
+        ASSERT_TRUE(m_change);
+        EXPECT_EQ(m_change->key, (SettingKey{Setting::InterfaceAlias, 10}));
+        EXPECT_EQ(m_change->value, SettingValue(text));
+    }
+    std::string const long65(65, 'x');
+    EXPECT_EQ(testText(with(kAlias, {10}), long65), SetFault::WrongLength);
+    EXPECT_EQ(testText(with(kAlias, {10}), "a\nb"), SetFault::WrongValue);
+    EXPECT_EQ(testText(with(kAlias, {10}), "caf\xc3\xa9"), SetFault::WrongValue);
+    EXPECT_EQ(test(with(kAlias, {10}), 1), SetFault::WrongType);
+    EXPECT_EQ(testText(with(kAlias, {11}), "x"), SetFault::NoCreation);
+}
+
+TEST_F(StandardSetTest, AliasIsEmptyUntilItIsSet) {
+    Instance found;
+    ASSERT_EQ(m_tree.find(m_withSettings, with(kAlias, {10}), found), Lookup::Found);
+    EXPECT_EQ(octetsOf(found.value), "");
+    m_settings.exchange({Setting::InterfaceAlias, 10}, "to Berlin");
+    ASSERT_EQ(m_tree.find(m_withSettings, with(kAlias, {10}), found), Lookup::Found);
+    EXPECT_EQ(octetsOf(found.value), "to Berlin");
 }
 
 TEST_F(StandardSetTest, NumbersBesideTheRangeAreWrongValues) {

@@ -279,6 +279,17 @@ TEST_F(AgentxAnswersTest, AnswersShowWhatIsSet) {
     EXPECT_EQ(answered[0].number, 2);
 }
 
+TEST_F(AgentxAnswersTest, AnswersShowATextThatIsSet) {
+    Oid const alias{1, 3, 6, 1, 2, 1, 31, 1, 1, 1, 18, 1000};
+    AgentxWriter test(AgentxKind::TestSet, 1, 2, 3);
+    test.variable(alias, ValueType::Text, std::string_view("to Berlin"));
+    EXPECT_EQ(faultOf(test.take()), static_cast<int>(AgentxFault::None));
+    EXPECT_EQ(faultOf(AgentxKind::CommitSet), static_cast<int>(AgentxFault::None));
+    auto const answered = ask(AgentxKind::Get, {{alias, false, {}}});
+    ASSERT_EQ(answered.size(), 1U);
+    EXPECT_EQ(answered[0].text, "to Berlin");
+}
+
 TEST_F(AgentxAnswersTest, EndOfASetIsNotAnsweredInAnyContext) {
     std::string request = AgentxWriter(AgentxKind::CleanupSet, 1, 2, 3).take();
     EXPECT_EQ(answer(request), "");
