@@ -303,7 +303,37 @@ Command const& commandNamed(Json const& request) {
     throw CommandError("unknown command " + inQuotes(text) + "; known: " + known);
 }
 
+/// Throws CommandError, or nlohmann::json::exception for a text that is not JSON.
+Json parseCommand(std::string const& line) {
+    // A board in a command has 11 levels; building thousands would keep the thread busy for
+    // seconds.
+    constexpr int maxDepth = 20;
+    return Json::parse(line, [](int depth, Json::parse_event_t, Json const&) {
+        if (depth > maxDepth)
+            throw CommandError("too many nested levels; a chassis needs at most 12");
+        return true;
+    });
+}
+
 } // namespace
+
+Json answerLine(Platform& platform, std::string const& line,
+                std::optional<std::uint64_t>& waitFor) {
+    Json command;
+    try {
+        command = parseCommand(line);
+    } catch (CommandError const& error) {
+        return errorReply(error.what());
+    } catch (Json::exception const&) {
+        return errorReply("the line is not JSON; write one object a line, such as "
+                          "{\"command\": \"show\"}");
+    }
+    return dispatch(platform, command, waitFor);
+}
+
+std::string asLine(Json const& reply) {
+    return reply.dump(-1, ' ', false, Json::error_handler_t::replace) + "\n";
+}
 
 Json errorReply(std::string_view error) {
     return {{"ok", false}, {"error", std::string(error)}};

@@ -4,6 +4,7 @@
 
 #include <cstdint>
 #include <optional>
+#include <string>
 #include <string_view>
 
 #include <nlohmann/json.hpp>
@@ -17,6 +18,12 @@ namespace kvlsim {
 nlohmann::json dispatch(Platform& platform, nlohmann::json const& command,
                         std::optional<std::uint64_t>& waitFor);
 
+/// The same for a command as a line of the control socket, which need not be JSON.
+nlohmann::json answerLine(Platform& platform, std::string const& line,
+                          std::optional<std::uint64_t>& waitFor);
+
 nlohmann::json errorReply(std::string_view error);
+/// A reply as a line of the control socket, its line end included.
+std::string asLine(nlohmann::json const& reply);
 
 } // namespace kvlsim

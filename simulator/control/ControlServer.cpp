@@ -21,30 +21,12 @@
 
 #include "simulator/base/Descriptor.h"
 #include "simulator/base/ThreadStart.h"
-#include "simulator/control/Arguments.h"
 #include "simulator/control/Commands.h"
 #include "simulator/control/ControlSocket.h"
 
 namespace kvlsim {
 
 namespace {
-
-std::string asLine(nlohmann::json const& reply) {
-    return reply.dump(-1, ' ', false, nlohmann::json::error_handler_t::replace) + "\n";
-}
-
-/// Throws CommandError, or nlohmann::json::exception for a text that is not JSON.
-nlohmann::json parseCommand(std::string const& line) {
-    // A board in a command has 11 levels; building thousands would keep the thread busy for
-    // seconds.
-    constexpr int maxDepth = 20;
-    return nlohmann::json::parse(
-        line, [](int depth, nlohmann::json::parse_event_t, nlohmann::json const&) {
-            if (depth > maxDepth)
-                throw CommandError("too many nested levels; a chassis needs at most 12");
-            return true;
-        });
-}
 
 /// A `Connection` is a client's connection. While a reply is unsent or a drain is pending, no
 /// further request is read, so that a client that never reads costs one reply at most.
@@ -217,19 +199,8 @@ class Server {
     }
 
     void executeLine(Connection& client, std::string const& line) {
-        nlohmann::json command;
-        try {
-            command = parseCommand(line);
-        } catch (CommandError const& error) {
-            answer(client, errorReply(error.what()));
-            return;
-        } catch (nlohmann::json::exception const&) {
-            answer(client, errorReply("the line is not JSON; write one object a line, such as "
-                                      "{\"command\": \"show\"}"));
-            return;
-        }
         std::optional<std::uint64_t> waitFor;
-        nlohmann::json reply = dispatch(m_platform, command, waitFor);
+        nlohmann::json reply = answerLine(m_platform, line, waitFor);
         if (!waitFor || client.deaf) {
             answer(client, reply);
             return;
