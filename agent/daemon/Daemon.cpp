@@ -239,12 +239,16 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     InterfaceReader interfaces(*boards.manager.get(), indices, started);
     StateFile entityFile(directory + "/entity.sqlite", "physical entities");
     StableIndices entityIndices(entityFile, kFirstEntity);
+    KeptSettings keptEntitySettings(entityFile, entityIndices, boards.settings,
+                                    SettingIndex::Entity);
     entityFile.open();
-    EntityReader entities(entityIndices, started, [] { return std::time(nullptr); });
+    EntityReader entities(entityIndices, boards.settings, started,
+                          [] { return std::time(nullptr); });
     LinkWatch links(boards.settings, boards.queue);
     Collector collector(
         [&](Snapshot& snapshot) {
             keptSettings.save();
+            keptEntitySettings.save();
             snapshot.boards = boards.source.read();
             snapshot.modules = readModules(services);
             snapshot.services = readServices(services);

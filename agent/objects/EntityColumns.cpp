@@ -57,6 +57,13 @@ Value child(ContainsRow const& row) {
 using enum ValueType;
 using Row = PhysicalRow;
 
+constexpr int kLongestAlias = 32;
+/// ENTITY-MIB sets no limit; this one keeps every row well within a message.
+constexpr int kLongestUris = 255;
+constexpr Writable kAlias{Setting::EntityAlias, 0, kLongestAlias};
+constexpr Writable kAssetId{Setting::EntityAssetId, 0, kLongestAlias};
+constexpr Writable kUris{Setting::EntityUris, 0, kLongestUris, Characters::Ascii};
+
 constexpr Column<Row> kPhysicalColumns[] = {
     {"entPhysicalDescr", 2, Text, text<&Row::description>},
     {"entPhysicalVendorType", 3, ObjectId, vendorType},
@@ -70,10 +77,11 @@ constexpr Column<Row> kPhysicalColumns[] = {
     {"entPhysicalSerialNum", 11, Text, text<&Row::serialNumber>},
     {"entPhysicalMfgName", 12, Text, notKnown},
     {"entPhysicalModelName", 13, Text, text<&Row::model>},
-    {"entPhysicalAlias", 14, Text, notKnown},
-    {"entPhysicalAssetID", 15, Text, notKnown},
+    {"entPhysicalAlias", 14, Text, text<&Row::alias>, kAlias},
+    {"entPhysicalAssetID", 15, Text, text<&Row::assetId>, kAssetId},
     {"entPhysicalIsFRU", 16, Integer, isReplaceable},
     {"entPhysicalMfgDate", 17, Octets, manufacturingDate},
+    {"entPhysicalUris", 18, Octets, text<&Row::uris>, kUris},
     {"entPhysicalUUID", 19, Octets, notKnown},
 };
 

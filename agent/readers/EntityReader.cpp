@@ -48,8 +48,10 @@ std::span<ProcessorRow const> rowsOf(std::vector<ProcessorRow> const& rows,
 /// The entities of one snapshot, while they are put together.
 class Building {
   public:
-    Building(StableIndices& indices, Snapshot const& snapshot)
+    Building(StableIndices& indices, Settings const& settings, Snapshot const& snapshot)
         : m_indices(indices), m_snapshot(snapshot) {
+        for (SettingEntry& entry : settings.all(SettingIndex::Entity))
+            m_set[entry.key.index].push_back(std::move(entry));
         for (PortRow const& port : snapshot.interfaces.ports)
             m_ports[port.boardIndex].push_back(&port);
     }
@@ -67,12 +69,14 @@ class Building {
     void addBoard(BoardRow const& board, BoardKey const& boardKey);
     void addProcessor(ProcessorRow const& processor, std::uint32_t entity, std::uint32_t board);
     void addPort(PortRow const& port, std::uint32_t entity, std::uint32_t board, int position);
+    void applySettings(PhysicalRow& row) const;
     /// Enters an entity, unless there is no index left for it.
     void add(PhysicalRow row);
 
     StableIndices& m_indices;
     Snapshot const& m_snapshot;
     std::map<std::uint32_t, std::vector<PortRow const*>> m_ports; ///< by board index
+    std::map<std::uint32_t, std::vector<SettingEntry>> m_set;     ///< by entity
     std::map<std::string, Slot> m_slots;
     std::uint32_t m_chassis = 0;
     PhysicalEntities m_built;
@@ -91,8 +95,31 @@ PhysicalEntities Building::build() {
     return std::move(m_built);
 }
 
+void Building::applySettings(PhysicalRow& row) const {
+    auto const entries = m_set.find(row.entity);
+    if (entries == m_set.end()) return;
+    for (SettingEntry const& entry : entries->second) {
+        auto const* const text = entry.value ? std::get_if<std::string>(&*entry.value) : nullptr;
+        if (text == nullptr) continue;
+        switch (entry.key.setting) {
+        case Setting::EntityAlias:
+            row.alias = *text;
+            break;
+        case Setting::EntityAssetId:
+            row.assetId = *text;
+            break;
+        case Setting::EntityUris:
+            row.uris = *text;
+            break;
+        default:
+            break;
+        }
+    }
+}
+
 void Building::add(PhysicalRow row) {
     if (row.entity == 0) return;
+    applySettings(row);
     if (row.containedIn != 0) m_built.contains.push_back({row.containedIn, row.entity});
     m_built.entities.push_back(std::move(row));
 }
@@ -210,11 +237,12 @@ void Building::addPort(PortRow const& port, std::uint32_t entity, std::uint32_t 
 
 } // namespace
 
-EntityReader::EntityReader(StableIndices& indices, Clock::time_point started, EntityStates::Now now)
-    : m_indices(indices), m_uptime(started), m_states(std::move(now)) {}
+EntityReader::EntityReader(StableIndices& indices, Settings const& settings,
+                           Clock::time_point started, EntityStates::Now now)
+    : m_indices(indices), m_settings(settings), m_uptime(started), m_states(std::move(now)) {}
 
 EntityRows EntityReader::read(Snapshot const& snapshot) {
-    PhysicalEntities found = Building(m_indices, snapshot).build();
+    PhysicalEntities found = Building(m_indices, m_settings, snapshot).build();
     m_indices.save();
     if (!m_physical || *m_physical != found) {
         if (m_physical) m_lastChange = m_uptime.now();

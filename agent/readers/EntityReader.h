@@ -8,6 +8,7 @@
 #include "agent/readers/EntityStates.h"
 #include "agent/readers/StableIndices.h"
 #include "agent/rows/EntityRows.h"
+#include "agent/rows/Settings.h"
 #include "agent/rows/Snapshot.h"
 #include "agent/rows/Uptime.h"
 
@@ -20,14 +21,17 @@ namespace kvloamd {
 /// Unsynchronised.
 class EntityReader {
   public:
-    /// `indices` outlive the reader. `started`: the agent's start. `now`: the time of day.
-    EntityReader(StableIndices& indices, Clock::time_point started, EntityStates::Now now);
+    /// `indices` and `settings` outlive the reader. `started`: the agent's start. `now`: the time
+    /// of day.
+    EntityReader(StableIndices& indices, Settings const& settings, Clock::time_point started,
+                 EntityStates::Now now);
 
     /// The entities of what is in `snapshot` already.
     EntityRows read(Snapshot const& snapshot);
 
   private:
     StableIndices& m_indices;
+    Settings const& m_settings;
     Uptime const m_uptime;
     EntityStates m_states;
     std::shared_ptr<PhysicalEntities const> m_physical; ///< null before the first reading

@@ -8,7 +8,6 @@
 #include "agent/readers/Answers.h"
 #include "board/Board.h"
 #include "board/DS1LineDevice.h"
-#include "board/ISDNChannel.h"
 
 namespace kvloamd {
 
@@ -19,15 +18,15 @@ AdminState adminOf(std::optional<int> status) {
     return status == kDown ? AdminState::Locked : AdminState::Unknown;
 }
 
-OperState operOf(std::optional<int> status) {
-    switch (status.value_or(0)) {
+/// Whether the port itself works. An interface that an operator has taken down, whose board is away
+/// or that waits for a lower layer says nothing about that.
+OperState operOf(InterfaceRow const& interface) {
+    switch (interface.operStatus.value_or(0)) {
     case kUp:
     case kDormant: // it waits for work
         return OperState::Enabled;
     case kDown:
-    case kNotPresent:
-    case kLowerLayerDown:
-        return OperState::Disabled;
+        return interface.adminStatus == kDown ? OperState::Unknown : OperState::Disabled;
     case kTesting:
         return OperState::Testing;
     default:
@@ -66,6 +65,8 @@ Row const* find(std::vector<Row> const& rows, std::uint32_t index) {
 } // namespace
 
 EntityState boardState(BoardRow const& board, bool hasFault) {
+    // The operational state does not follow the administrative one, and a board that does not run,
+    // or not yet, cannot tell whether it could.
     EntityState state;
     // The platform tells no severity.
     unsigned const faults = hasFault ? unsigned{kAlarmIndeterminate} : 0U;
@@ -80,15 +81,12 @@ EntityState boardState(BoardRow const& board, bool hasFault) {
     case BoardStatusStarted:
         state.admin = AdminState::Unlocked;
         state.oper = OperState::Enabled;
-        state.standby = StandbyState::ProvidingService;
         break;
     case BoardStatusStartPending:
         state.admin = AdminState::Unlocked;
-        state.oper = OperState::Disabled;
         break;
     case BoardStatusStopped:
         state.admin = AdminState::Locked;
-        state.oper = OperState::Disabled;
         break;
     case BoardStatusStopPending:
         // It works until it has stopped.
@@ -101,11 +99,10 @@ EntityState boardState(BoardRow const& board, bool hasFault) {
     return state;
 }
 
-EntityState portState(InterfaceRow const& interface, LineRow const* line, UsageState usage) {
+EntityState portState(InterfaceRow const& interface, LineRow const* line) {
     EntityState state;
     state.admin = adminOf(interface.adminStatus);
-    state.oper = operOf(interface.operStatus);
-    state.usage = usage;
+    state.oper = operOf(interface);
     // A status without any bit, not even the one for no alarm, is no information.
     if (int const status = line == nullptr ? 0 : line->lineStatus.value_or(0); status > 0) {
         unsigned const alarms = alarmsOf(status);
@@ -117,34 +114,7 @@ EntityState portState(InterfaceRow const& interface, LineRow const* line, UsageS
                 state.oper = OperState::Enabled;
         }
     }
-    if (interface.operStatus == kUp) state.standby = StandbyState::ProvidingService;
     return state;
-}
-
-std::map<std::uint32_t, UsageState> lineUsage(InterfaceRows const& interfaces) {
-    struct Bearers {
-        int all = 0;
-        int idle = 0;
-        int unknown = 0;
-    };
-    std::map<std::uint32_t, Bearers> lines;
-    for (StackRow const& row : interfaces.stack) {
-        BearerRow const* const bearer = find(interfaces.bearers, row.higher);
-        if (bearer == nullptr || row.lower == 0) continue;
-        Bearers& counted = lines[row.lower];
-        ++counted.all;
-        if (!bearer->operStatus)
-            ++counted.unknown;
-        else if (*bearer->operStatus == ISDNBChannelStatusIdle)
-            ++counted.idle;
-    }
-    std::map<std::uint32_t, UsageState> usage;
-    for (auto const& [line, bearers] : lines)
-        if (bearers.unknown == 0)
-            usage[line] = bearers.idle == bearers.all ? UsageState::Idle
-                          : bearers.idle == 0         ? UsageState::Busy
-                                                      : UsageState::Active;
-    return usage;
 }
 
 EntityStates::EntityStates(Now now) : m_now(std::move(now)), m_started(dateOctets(m_now())) {}
@@ -153,7 +123,6 @@ std::vector<EntityStateRow> EntityStates::read(std::vector<PhysicalRow> const& e
                                                std::vector<BoardRow> const& boards,
                                                InterfaceRows const& interfaces,
                                                std::vector<FaultRow> const& faults) {
-    std::map<std::uint32_t, UsageState> const usage = lineUsage(interfaces);
     std::vector<EntityStateRow> rows;
     std::string const now = m_read ? dateOctets(m_now()) : m_started;
     for (PhysicalRow const& entity : entities) {
@@ -162,10 +131,9 @@ std::vector<EntityStateRow> EntityStates::read(std::vector<PhysicalRow> const& e
             state = boardState(*board, find(faults, entity.boardIndex) != nullptr);
         } else if (InterfaceRow const* const interface =
                        find(interfaces.interfaces, entity.ifIndex)) {
-            auto const used = usage.find(entity.ifIndex);
-            state = portState(*interface, find(interfaces.lines, entity.ifIndex),
-                              used == usage.end() ? UsageState::Unknown : used->second);
-        } else {
+            state = portState(*interface, find(interfaces.lines, entity.ifIndex));
+        } else if (entity.physicalClass != PhysicalClass::Cpu) {
+            // The platform does not tell how a processor is.
             continue;
         }
         EntityStateRow const* const former = find(m_former, entity.entity);

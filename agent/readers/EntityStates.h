@@ -3,7 +3,6 @@
 #pragma once
 
 #include <functional>
-#include <map>
 #include <string>
 #include <vector>
 
@@ -17,13 +16,9 @@ namespace kvloamd {
 /// The state of a board by its status, and by whether it has a fault.
 EntityState boardState(BoardRow const& board, bool hasFault);
 
-/// What the interface's status, the line's alarms (`line` is null for an Ethernet interface) and
-/// the use of its channels say of a port.
-EntityState portState(InterfaceRow const& interface, LineRow const* line, UsageState usage);
-
-/// How far the bearer channels of every line are in use, by the line's ifIndex. A line is left out
-/// if its channels, or the state of one of them, are not known.
-std::map<std::uint32_t, UsageState> lineUsage(InterfaceRows const& interfaces);
+/// What the interface's status and the line's alarms (`line` is null for an Ethernet interface) say
+/// of a port.
+EntityState portState(InterfaceRow const& interface, LineRow const* line);
 
 /// An `EntityStates` remembers since when every entity has been in its state. Unsynchronised.
 class EntityStates {
@@ -33,8 +28,8 @@ class EntityStates {
 
     explicit EntityStates(Now now);
 
-    /// The states of those `entities` that have one: modules and ports. What is found in the first
-    /// reading has been as it is since the states were made.
+    /// The states of those `entities` that have one: modules, their processors and ports. What is
+    /// found in the first reading has been as it is since the states were made.
     std::vector<EntityStateRow> read(std::vector<PhysicalRow> const& entities,
                                      std::vector<BoardRow> const& boards,
                                      InterfaceRows const& interfaces,

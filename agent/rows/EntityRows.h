@@ -28,6 +28,10 @@ struct PhysicalRow {
     std::string serialNumber;
     std::string model;
     bool replaceable = false;
+    // What operators have set.
+    std::string alias;
+    std::string assetId;
+    std::string uris;
     // Where its state comes from.
     std::uint32_t boardIndex = 0; ///< of a module
     std::uint32_t ifIndex = 0;    ///< of a port
@@ -67,7 +71,12 @@ struct PhysicalEntities {
 enum class AdminState : int { Unknown = 1, Locked = 2, ShuttingDown = 3, Unlocked = 4 };
 enum class OperState : int { Unknown = 1, Disabled = 2, Enabled = 3, Testing = 4 };
 enum class UsageState : int { Unknown = 1, Idle = 2, Active = 3, Busy = 4 };
-enum class StandbyState : int { Unknown = 1, ProvidingService = 4 };
+enum class StandbyState : int {
+    Unknown = 1,
+    HotStandby = 2,
+    ColdStandby = 3,
+    ProvidingService = 4
+};
 
 /// Alarms are a set, the first bit is the highest; none: nothing is wrong.
 enum AlarmBits : unsigned {
@@ -79,12 +88,15 @@ enum AlarmBits : unsigned {
     kAlarmIndeterminate = 0x02
 };
 
+/// The usage is about other entities that an entity has room for. Those that have a state have no
+/// room for another one, which ENTITY-STATE-MIB calls busy. None has a standby role, which is
+/// called providing service.
 struct EntityState {
     AdminState admin = AdminState::Unknown;
     OperState oper = OperState::Unknown;
-    UsageState usage = UsageState::Unknown;
+    UsageState usage = UsageState::Busy;
     char alarm = static_cast<char>(kAlarmUnknown); ///< of `AlarmBits`
-    StandbyState standby = StandbyState::Unknown;
+    StandbyState standby = StandbyState::ProvidingService;
 
     bool operator==(EntityState const&) const = default;
 };

@@ -48,7 +48,8 @@ BoardRefresh::BoardRefresh(int boards)
       m_indices(1000),
       m_interfaces(*m_manager.get(), m_indices, kvloamd::Clock::now()),
       m_entityIndices(1),
-      m_entities(m_entityIndices, kvloamd::Clock::now(), [] { return std::time(nullptr); }) {}
+      m_entities(m_entityIndices, m_settings, kvloamd::Clock::now(),
+                 [] { return std::time(nullptr); }) {}
 
 void BoardRefresh::stopLines() {
     auto* const scheduler = ActionScheduler_pthread::GetScheduler();

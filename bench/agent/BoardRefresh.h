@@ -28,5 +28,6 @@ class BoardRefresh {
     kvloamd::InterfaceReader m_interfaces;
     kvloamd::PlatformReader m_platform;
     kvloamd::StableIndices m_entityIndices;
+    kvloamd::Settings m_settings;
     kvloamd::EntityReader m_entities;
 };

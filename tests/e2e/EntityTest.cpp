@@ -211,20 +211,20 @@ TEST_F(EntityTest, ChangesWithinThePauseAreToldAtItsEnd) {
         EXPECT_GE(times[i] - times[i - 1], 4.0);
 }
 
-TEST_F(EntityTest, StoppedBoardIsToldAsDisabledAndStartedOneAsEnabled) {
+TEST_F(EntityTest, StoppedBoardIsLockedWhichIsNoFailure) {
     startWithReceiver();
     std::string const board = boardOf("NX50001");
     EXPECT_EQ(state(3, board), "INTEGER: 3");
     sim({"stop", "1"});
-    std::string const objects = "\tSNMPv2-SMI::mib-2.131.1.1.1.2." + board + " = ";
-    EXPECT_TRUE(trapReceiver().waitFor(kOperDisabled + objects + "2")) << trapReceiver().output();
-    EXPECT_EQ(state(2, board), "INTEGER: 2");
-    EXPECT_EQ(state(3, board), "INTEGER: 2");
-    EXPECT_EQ(state(6, board), "INTEGER: 1");
+    EXPECT_TRUE(eventually([&] { return state(2, board) == "INTEGER: 2"; }));
+    EXPECT_EQ(state(3, board), "INTEGER: 1");
+    EXPECT_EQ(state(4, board), "INTEGER: 4");
+    EXPECT_EQ(state(6, board), "INTEGER: 4");
     sim({"start", "1"});
+    std::string const objects = "\tSNMPv2-SMI::mib-2.131.1.1.1.2." + board + " = ";
     EXPECT_TRUE(trapReceiver().waitFor(kOperEnabled + objects + "4")) << trapReceiver().output();
     EXPECT_EQ(state(2, board), "INTEGER: 4");
-    EXPECT_EQ(state(6, board), "INTEGER: 4");
+    EXPECT_THAT(trapReceiver().output(), Not(HasSubstr(kOperDisabled)));
 }
 
 TEST_F(EntityTest, FailedBoardHasACriticalAlarm) {
@@ -254,14 +254,34 @@ TEST_F(EntityTest, BrokenLineIsADisabledPortWithAnAlarm) {
     EXPECT_TRUE(eventually([&] { return state(3, port) == "INTEGER: 3"; }));
 }
 
-TEST_F(EntityTest, PortWithCallsIsActive) {
+TEST_F(EntityTest, PortIsBusyWhateverItsCalls) {
     startAgent();
     std::string const port = portNamed("vorn-primary-rate-1");
-    EXPECT_EQ(state(4, port), "INTEGER: 2"); // idle
+    EXPECT_EQ(state(4, port), "INTEGER: 4");
     sim({"call", "setup", "301"});
-    EXPECT_TRUE(eventually([&] { return state(4, port) == "INTEGER: 3"; })); // active
-    EXPECT_EQ(state(4, portNamed("vorn-primary-rate-2")), "INTEGER: 2");
-    EXPECT_EQ(state(4, portNamed("nx5-trunk-1")), "INTEGER: 1"); // unknown
+    // A bearer channel, which is dormant without a call, is up.
+    EXPECT_TRUE(eventually([this] {
+        auto const states = column("1.3.6.1.2.1.10.20.1.2.1.1.2");
+        return std::ranges::any_of(
+            states, [](auto const& channel) { return channel.second != "INTEGER: 1"; });
+    }));
+    EXPECT_EQ(state(4, port), "INTEGER: 4");
+}
+
+TEST_F(EntityTest, EveryBoardProcessorAndPortHasStates) {
+    startAgent();
+    auto const classes = physical(5);
+    auto const states = column(kState + std::string("3"));
+    EXPECT_THAT(states, SizeIs(3 + 4 + 7));
+    for (auto const& [entity, value] : states) {
+        EXPECT_THAT(classes.at(entity),
+                    ::testing::AnyOf("INTEGER: 9", "INTEGER: 10", "INTEGER: 12"));
+        // The platform does not tell how processors are.
+        bool const isProcessor = classes.at(entity) == "INTEGER: 12";
+        if (isProcessor) {
+            EXPECT_EQ(value, "INTEGER: 1") << entity;
+        }
+    }
 }
 
 TEST_F(EntityTest, IndicesAreTheSameAfterARestart) {
@@ -280,13 +300,59 @@ TEST_F(EntityTest, IndicesAreTheSameAfterARestart) {
     }));
 }
 
-TEST_F(EntityTest, NothingCanBeWritten) {
+TEST_F(EntityTest, StatesCannotBeWritten) {
     configureSnmp("rwcommunity public 127.0.0.1\n");
     startAgent();
     Result const set = ask("snmpset", {kState + ("2." + boardOf("NX50001")), "i", "2"});
     EXPECT_NE(set.status, 0);
     EXPECT_THAT(set.output, HasSubstr("notWritable"));
     EXPECT_EQ(state(2, boardOf("NX50001")), "INTEGER: 4");
+}
+
+TEST_F(EntityTest, NamesThatAnOperatorGivesShowAtOnceAndSurviveARestart) {
+    configureSnmp("rwcommunity public 127.0.0.1\n");
+    startAgent();
+    std::string const board = boardOf("NX50001");
+    std::map<std::string, std::string> const names{
+        {"14." + board, "trunks west"}, {"15." + board, "004711"}, {"18.1", "urn:example:rack-7"}};
+    std::vector<std::string> arguments;
+    for (auto const& [instance, name] : names) {
+        EXPECT_EQ(get(kPhysical + instance), "\"\"");
+        arguments.insert(arguments.end(), {kPhysical + instance, "s", name});
+    }
+    EXPECT_EQ(ask("snmpset", arguments).status, 0);
+    auto const expectNames = [&] {
+        for (auto const& [instance, name] : names)
+            EXPECT_EQ(get(kPhysical + instance), "STRING: \"" + name + "\"");
+    };
+    expectNames();
+    EXPECT_EQ(stopAgent(), 0) << agent().output();
+    startAgent();
+    expectNames();
+}
+
+TEST_F(EntityTest, NameThatAnOperatorGivesIsAChangeOfEntities) {
+    startWithReceiver("rwcommunity");
+    EXPECT_EQ(lastChange(), 0);
+    EXPECT_EQ(ask("snmpset", {kPhysical + std::string("14.1"), "s", "rack 7"}).status, 0);
+    EXPECT_TRUE(trapReceiver().waitFor(kConfigChange)) << trapReceiver().output();
+    EXPECT_GT(lastChange(), 0);
+}
+
+TEST_F(EntityTest, NameThatDoesNotFitIsRefused) {
+    configureSnmp("rwcommunity public 127.0.0.1\n");
+    startAgent();
+    auto const refusal = [this](std::vector<std::string> const& arguments) {
+        return ask("snmpset", arguments).output;
+    };
+    std::string const alias = kPhysical + std::string("14.1");
+    EXPECT_THAT(refusal({alias, "s", std::string(33, 'a')}), HasSubstr("wrongLength"));
+    EXPECT_THAT(refusal({alias, "x", "1b5b324a"}), HasSubstr("wrongValue"));
+    EXPECT_THAT(refusal({alias, "i", "1"}), HasSubstr("wrongType"));
+    EXPECT_THAT(refusal({kPhysical + std::string("14.4711"), "s", "x"}), HasSubstr("noCreation"));
+    EXPECT_THAT(refusal({alias, "s", "x", kPhysical + std::string("7.1"), "s", "x"}),
+                HasSubstr("notWritable"));
+    EXPECT_EQ(get(alias), "\"\"");
 }
 
 } // namespace

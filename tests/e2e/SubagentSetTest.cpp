@@ -85,6 +85,18 @@ TEST_F(SubagentSetTest, VariablesOfSeveralTablesAreSetTogether) {
     EXPECT_EQ(get(kLinkTrapsOfLine), "INTEGER: " + link);
 }
 
+TEST_F(SubagentSetTest, TextIsSetTogetherWithANumberOrNotAtAll) {
+    start();
+    std::string const alias = "1.3.6.1.2.1.47.1.1.1.1.14.1";
+    std::string const line = other(m_lineTraps);
+    EXPECT_THAT(set({alias, "s", "rack 7", kLineTrapsOfLine, "i", "9"}), HasSubstr("wrongValue"));
+    EXPECT_EQ(get(alias), "\"\"");
+    EXPECT_THAT(set({alias, "s", std::string(33, 'a')}), HasSubstr("wrongLength"));
+    set({alias, "s", "rack 7", kLineTrapsOfLine, "i", line});
+    EXPECT_EQ(get(alias), "STRING: \"rack 7\"");
+    EXPECT_EQ(get(kLineTrapsOfLine), "INTEGER: " + line);
+}
+
 TEST_F(SubagentSetTest, OneBadVariableLeavesAllAsTheyWere) {
     start();
     std::string const line = other(m_lineTraps);

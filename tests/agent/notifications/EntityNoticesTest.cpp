@@ -148,7 +148,7 @@ TEST_F(EntityNoticesTest, OtherStatesAreNotTold) {
     setOper({{1, OperState::Disabled}, {2, OperState::Enabled}});
     tell();
     setOper({{1, OperState::Unknown}, {2, OperState::Testing}});
-    m_next.entities.states[0].state.usage = UsageState::Busy;
+    m_next.entities.states[0].state.usage = UsageState::Idle;
     tell();
     EXPECT_THAT(told(), IsEmpty());
 }

@@ -41,14 +41,19 @@ class EntityTablesTest : public ::testing::Test {
         EXPECT_EQ(m_tree.find(m_facts, name, m_found), Lookup::Found);
         return m_found.value;
     }
+    SetFault set(std::uint32_t number, Value const& asked) {
+        return m_tree.test(m_facts, Oid{47, 1, 1, 1, 1, number, 7}, asked, m_change);
+    }
     Lookup find(Oid const& name) { return m_tree.find(m_facts, name, m_found); }
 
     std::vector<Table const*> const m_tables = standardTables();
     ObjectTree const m_tree{standardScalars(), m_tables};
     Snapshot m_snapshot;
     Counters m_counters;
-    Facts const m_facts{m_snapshot, m_counters};
+    Settings m_settings;
+    Facts const m_facts{m_snapshot, m_counters, &m_settings};
     Instance m_found;
+    std::optional<Change> m_change;
 };
 
 TEST_F(EntityTablesTest, PlaceInTheWholeIsServed) {
@@ -64,13 +69,48 @@ TEST_F(EntityTablesTest, WhatTheMibHasAWordForWhenItIsNotKnownIsThatWord) {
     static constexpr std::uint32_t kNoType[] = {0, 0};
     EXPECT_EQ(physical(3), Value{NameView{kNoType}});
     EXPECT_EQ(m_found.type, ValueType::ObjectId);
-    for (std::uint32_t const number : {7U, 8U, 9U, 10U, 11U, 12U, 13U, 14U, 15U, 19U})
+    for (std::uint32_t const number : {7U, 8U, 9U, 10U, 11U, 12U, 13U, 14U, 15U, 18U, 19U})
         EXPECT_EQ(physical(number), Value{std::string_view()}) << number;
     EXPECT_EQ(physical(17), Value{std::string_view("\0\0\0\0\0\0\0\0", 8)});
 }
 
-TEST_F(EntityTablesTest, WhatTheMibHasNoWordForIsLeftOut) {
-    EXPECT_EQ(find({47, 1, 1, 1, 1, 18, 7}), Lookup::NoSuchObject); // entPhysicalUris
+TEST_F(EntityTablesTest, OperatorsMaySetNamesOfTheirOwn) {
+    for (auto const& [number, setting] : {std::pair{14U, Setting::EntityAlias},
+                                          {15U, Setting::EntityAssetId},
+                                          {18U, Setting::EntityUris}}) {
+        EXPECT_EQ(set(number, std::string_view("west")), SetFault::None) << number;
+        ASSERT_TRUE(m_change);
+        EXPECT_EQ(m_change->key, (SettingKey{setting, 7}));
+        EXPECT_EQ(m_change->value, SettingValue{"west"});
+        m_settings.exchange(m_change->key, m_change->value);
+        EXPECT_EQ(octetsOf(physical(number)), "west") << number;
+    }
+}
+
+TEST_F(EntityTablesTest, NameThatIsTooLongIsOfTheWrongLength) {
+    EXPECT_EQ(set(14, std::string(32, 'a')), SetFault::None);
+    EXPECT_EQ(set(14, std::string(33, 'a')), SetFault::WrongLength);
+    EXPECT_EQ(set(15, std::string(33, 'a')), SetFault::WrongLength);
+    EXPECT_EQ(set(18, std::string(255, 'a')), SetFault::None);
+    EXPECT_EQ(set(18, std::string(256, 'a')), SetFault::WrongLength);
+    EXPECT_EQ(set(14, std::string()), SetFault::None);
+}
+
+TEST_F(EntityTablesTest, NameThatIsNoTextIsAWrongValue) {
+    EXPECT_EQ(set(14, std::string_view("Zw\xc3\xb6lf")), SetFault::None);
+    EXPECT_EQ(set(14, std::string_view("\xff")), SetFault::WrongValue);
+    EXPECT_EQ(set(15, std::string_view("\x1b[2J")), SetFault::WrongValue);
+    EXPECT_EQ(set(18, std::string_view("urn:zw\xc3\xb6lf")), SetFault::WrongValue);
+}
+
+TEST_F(EntityTablesTest, NumberIsNoName) {
+    EXPECT_EQ(set(14, std::int64_t{7}), SetFault::WrongType);
+    EXPECT_EQ(set(14, {}), SetFault::WrongType);
+}
+
+TEST_F(EntityTablesTest, OtherColumnsOfEntitiesAreNotWritable) {
+    for (std::uint32_t const number : {2U, 7U, 11U, 19U})
+        EXPECT_EQ(set(number, std::string_view("x")), SetFault::NotWritable) << number;
 }
 
 TEST_F(EntityTablesTest, IndexIsNoObjectOfItsOwn) {

@@ -82,7 +82,8 @@ class EntityReaderTest : public ::testing::Test {
     Snapshot m_snapshot;
     StableIndices m_indices{1};
     // Long ago, so that changes get a time other than 0.
-    EntityReader m_reader{m_indices, Clock::now() - 1h, [] { return 1'000'000'000L; }};
+    Settings m_settings;
+    EntityReader m_reader{m_indices, m_settings, Clock::now() - 1h, [] { return 1'000'000'000L; }};
 };
 
 TEST_F(EntityReaderTest, ChassisIsThereWithoutAnyBoard) {
@@ -275,7 +276,7 @@ TEST_F(EntityReaderTest, BoardInAnotherSlotKeepsItsIndex) {
 
 TEST_F(EntityReaderTest, EntityThatNoIndexIsLeftForIsLeftOut) {
     StableIndices indices(kLastIndex - 15); // for the chassis and its slots
-    EntityReader reader(indices, Clock::now(), [] { return 1L; });
+    EntityReader reader(indices, m_settings, Clock::now(), [] { return 1L; });
     addBoards();
     auto const physical = reader.read(m_snapshot).physical;
     EXPECT_THAT(physical->entities, SizeIs(3));
@@ -301,6 +302,20 @@ TEST_F(EntityReaderTest, ComingGoingAndChangingAreTimedAndStayingIsNot) {
     EXPECT_EQ(same.physical, changed.physical); // shared, not copied
 }
 
+TEST_F(EntityReaderTest, WhatOperatorsSetIsInTheRowsAndAChange) {
+    addBoards();
+    std::uint32_t const board = find(readEntities(), "NX5-T1").entity;
+    m_settings.exchange({Setting::EntityAlias, board}, "west");
+    m_settings.exchange({Setting::EntityAssetId, board}, "4711");
+    m_settings.exchange({Setting::EntityUris, 1}, "urn:example:rack");
+    auto const rows = read();
+    EXPECT_EQ(find(rows.physical->entities, "NX5-T1").alias, "west");
+    EXPECT_EQ(find(rows.physical->entities, "NX5-T1").assetId, "4711");
+    EXPECT_EQ(rows.physical->entities[0].uris, "urn:example:rack");
+    EXPECT_EQ(find(rows.physical->entities, "control").alias, "");
+    EXPECT_GE(rows.lastChange, 360000U); // an hour
+}
+
 TEST_F(EntityReaderTest, ChangeOfStateIsNoChangeOfEntities) {
     addBoards();
     read();
@@ -309,17 +324,18 @@ TEST_F(EntityReaderTest, ChangeOfStateIsNoChangeOfEntities) {
     EXPECT_EQ(read().lastChange, 0U);
 }
 
-TEST_F(EntityReaderTest, BoardsAndPortsHaveStatesAndOthersHaveNot) {
+TEST_F(EntityReaderTest, EverythingButChassisAndSlotsHasAState) {
     addBoards();
     auto const rows = read();
     std::vector<std::uint32_t> expected;
     for (PhysicalRow const& row : rows.physical->entities)
-        if (row.physicalClass == PhysicalClass::Module || row.physicalClass == PhysicalClass::Port)
+        if (row.physicalClass != PhysicalClass::Chassis &&
+            row.physicalClass != PhysicalClass::Container)
             expected.push_back(row.entity);
     std::vector<std::uint32_t> found;
     for (EntityStateRow const& row : rows.states)
         found.push_back(row.entity);
-    EXPECT_THAT(found, SizeIs(6));
+    EXPECT_THAT(found, SizeIs(8));
     EXPECT_EQ(found, expected);
 }
 
@@ -330,7 +346,7 @@ TEST_F(EntityReaderTest, IndicesAreTheSameAfterARestart) {
         StateFile file(folder + "/entity.sqlite", "entities");
         StableIndices indices(file, 1);
         file.open();
-        return EntityReader(indices, Clock::now(), [] { return 1L; })
+        return EntityReader(indices, m_settings, Clock::now(), [] { return 1L; })
             .read(m_snapshot)
             .physical->entities;
     };

@@ -6,7 +6,6 @@
 #include "agent/readers/Answers.h"
 #include "board/Board.h"
 #include "board/DS1LineDevice.h"
-#include "board/ISDNChannel.h"
 
 namespace kvloamd {
 namespace {
@@ -26,28 +25,33 @@ EntityState portOf(std::optional<int> operStatus, std::optional<int> lineStatus 
     interface.operStatus = operStatus;
     LineRow line;
     line.lineStatus = lineStatus;
-    return portState(interface, &line, UsageState::Unknown);
+    return portState(interface, &line);
 }
 
 unsigned alarmOf(int lineStatus) {
     return static_cast<unsigned char>(portOf(1, lineStatus).alarm);
 }
 
-TEST(BoardStateTest, StartedBoardProvidesService) {
+TEST(BoardStateTest, StartedBoardWorks) {
     EntityState const state = stateOf(BoardStatusStarted);
     EXPECT_EQ(state.admin, AdminState::Unlocked);
     EXPECT_EQ(state.oper, OperState::Enabled);
-    EXPECT_EQ(state.standby, StandbyState::ProvidingService);
-    EXPECT_EQ(state.usage, UsageState::Unknown);
     EXPECT_EQ(state.alarm, 0);
 }
 
-TEST(BoardStateTest, StoppedBoardIsLocked) {
+TEST(BoardStateTest, StoppedBoardIsLockedAndCannotTellWhetherItWorks) {
     EntityState const state = stateOf(BoardStatusStopped);
     EXPECT_EQ(state.admin, AdminState::Locked);
-    EXPECT_EQ(state.oper, OperState::Disabled);
-    EXPECT_EQ(state.standby, StandbyState::Unknown);
+    EXPECT_EQ(state.oper, OperState::Unknown);
     EXPECT_EQ(state.alarm, 0);
+}
+
+TEST(BoardStateTest, BoardHasNoRoomForAnotherEntityAndNoStandbyRole) {
+    for (int const status : {BoardStatusNone, BoardStatusStarted, BoardStatusStopped,
+                             BoardStatusStartPending, BoardStatusStopPending}) {
+        EXPECT_EQ(stateOf(status).usage, UsageState::Busy) << status;
+        EXPECT_EQ(stateOf(status).standby, StandbyState::ProvidingService) << status;
+    }
 }
 
 TEST(BoardStateTest, FaultIsAnAlarmOfNoKnownSeverity) {
@@ -70,10 +74,10 @@ TEST(BoardStateTest, BoardThatIsToStopWorksYet) {
     EXPECT_EQ(state.oper, OperState::Enabled);
 }
 
-TEST(BoardStateTest, BoardThatIsToStartDoesNotWorkYet) {
+TEST(BoardStateTest, BoardThatIsToStartCannotTellYetWhetherItWorks) {
     EntityState const state = stateOf(BoardStatusStartPending);
     EXPECT_EQ(state.admin, AdminState::Unlocked);
-    EXPECT_EQ(state.oper, OperState::Disabled);
+    EXPECT_EQ(state.oper, OperState::Unknown);
 }
 
 TEST(BoardStateTest, FailedBoardIsCriticalAndNobodyHasLockedIt) {
@@ -81,7 +85,6 @@ TEST(BoardStateTest, FailedBoardIsCriticalAndNobodyHasLockedIt) {
     EXPECT_EQ(state.admin, AdminState::Unknown);
     EXPECT_EQ(state.oper, OperState::Disabled);
     EXPECT_EQ(static_cast<unsigned char>(state.alarm), kAlarmCritical);
-    EXPECT_EQ(state.standby, StandbyState::Unknown);
 }
 
 TEST(BoardStateTest, BoardWithoutStatusIsUnknown) {
@@ -96,8 +99,8 @@ TEST(PortStateTest, OperStateIsThatOfTheInterface) {
                                         {3, OperState::Testing},
                                         {4, OperState::Unknown},
                                         {5, OperState::Enabled},
-                                        {6, OperState::Disabled},
-                                        {7, OperState::Disabled}})
+                                        {6, OperState::Unknown},
+                                        {7, OperState::Unknown}})
         EXPECT_EQ(portOf(status).oper, state) << status;
     EXPECT_EQ(portOf(std::nullopt).oper, OperState::Unknown);
 }
@@ -110,19 +113,36 @@ TEST(PortStateTest, LineStatusTellsWhatTheInterfaceDoesNot) {
     EXPECT_EQ(portOf(1, DS1LineStatusLossOfSignal).oper, OperState::Enabled);
 }
 
-TEST(PortStateTest, OnlyAPortThatIsUpProvidesService) {
-    EXPECT_EQ(portOf(1).standby, StandbyState::ProvidingService);
-    for (int const status : {2, 3, 4, 5, 6, 7})
-        EXPECT_EQ(portOf(status).standby, StandbyState::Unknown) << status;
+TEST(PortStateTest, PortThatWasTakenDownWorksAsFarAsItsLineKnows) {
+    InterfaceRow interface;
+    interface.adminStatus = kDown;
+    interface.operStatus = kDown;
+    LineRow line;
+    auto const operWith = [&](std::optional<int> lineStatus) {
+        line.lineStatus = lineStatus;
+        EXPECT_EQ(portState(interface, &line).admin, AdminState::Locked);
+        return portState(interface, &line).oper;
+    };
+    EXPECT_EQ(operWith(std::nullopt), OperState::Unknown);
+    EXPECT_EQ(operWith(DS1LineStatusNoAlarm), OperState::Enabled);
+    EXPECT_EQ(operWith(DS1LineStatusLossOfSignal), OperState::Disabled);
+    EXPECT_EQ(portState(interface, nullptr).oper, OperState::Unknown);
+}
+
+TEST(PortStateTest, PortHasNoRoomForAnotherEntityAndNoStandbyRole) {
+    for (int const status : {1, 2, 3, 4, 5, 6, 7}) {
+        EXPECT_EQ(portOf(status).usage, UsageState::Busy) << status;
+        EXPECT_EQ(portOf(status).standby, StandbyState::ProvidingService) << status;
+    }
 }
 
 TEST(PortStateTest, AdminStateIsThatOfTheInterface) {
     InterfaceRow interface;
-    EXPECT_EQ(portState(interface, nullptr, UsageState::Unknown).admin, AdminState::Unknown);
+    EXPECT_EQ(portState(interface, nullptr).admin, AdminState::Unknown);
     for (auto const& [status, state] :
          {std::pair{1, AdminState::Unlocked}, {2, AdminState::Locked}, {3, AdminState::Unknown}}) {
         interface.adminStatus = status;
-        EXPECT_EQ(portState(interface, nullptr, UsageState::Unknown).admin, state);
+        EXPECT_EQ(portState(interface, nullptr).admin, state);
     }
 }
 
@@ -151,51 +171,9 @@ TEST(PortStateTest, WhatALineSendsOrIsTestedWithIsNoAlarm) {
 
 TEST(PortStateTest, PortThatTellsOfNoAlarmsMayHaveSome) {
     InterfaceRow const ethernet;
-    EXPECT_EQ(static_cast<unsigned char>(portState(ethernet, nullptr, UsageState::Unknown).alarm),
-              kAlarmUnknown);
+    EXPECT_EQ(static_cast<unsigned char>(portState(ethernet, nullptr).alarm), kAlarmUnknown);
     EXPECT_EQ(static_cast<unsigned char>(portOf(1, std::nullopt).alarm), kAlarmUnknown);
     EXPECT_EQ(alarmOf(0), kAlarmUnknown);
-}
-
-class LineUsageTest : public ::testing::Test {
-  protected:
-    /// Line 10 with bearer channels in these states.
-    UsageState usageOf(std::initializer_list<std::optional<int>> states) {
-        InterfaceRows rows;
-        std::uint32_t index = 100;
-        for (auto const& state : states) {
-            rows.bearers.push_back({index, std::nullopt, state, std::nullopt});
-            rows.stack.push_back({index++, 10});
-        }
-        rows.stack.push_back({index, 10}); // a signalling channel does not count
-        auto const usage = lineUsage(rows);
-        auto const found = usage.find(10);
-        return found == usage.end() ? UsageState::Unknown : found->second;
-    }
-};
-
-TEST_F(LineUsageTest, LineWithoutACallIsIdle) {
-    EXPECT_EQ(usageOf({ISDNBChannelStatusIdle, ISDNBChannelStatusIdle}), UsageState::Idle);
-}
-
-TEST_F(LineUsageTest, LineWithRoomForACallIsActive) {
-    EXPECT_EQ(usageOf({ISDNBChannelStatusIdle, ISDNBChannelStatusActive}), UsageState::Active);
-}
-
-TEST_F(LineUsageTest, LineWhoseChannelsAreAllInUseIsBusy) {
-    EXPECT_EQ(usageOf({ISDNBChannelStatusConnecting, ISDNBChannelStatusActive}), UsageState::Busy);
-}
-
-TEST_F(LineUsageTest, UseOfChannelsThatDoNotTellIsUnknown) {
-    EXPECT_EQ(usageOf({ISDNBChannelStatusActive, std::nullopt}), UsageState::Unknown);
-    EXPECT_EQ(usageOf({}), UsageState::Unknown);
-}
-
-TEST_F(LineUsageTest, ChannelThatLiesAboveNothingIsOfNoLine) {
-    InterfaceRows rows;
-    rows.bearers.push_back({100, std::nullopt, ISDNBChannelStatusIdle, std::nullopt});
-    rows.stack = {{0, 100}, {100, 0}};
-    EXPECT_THAT(lineUsage(rows), IsEmpty());
 }
 
 class EntityStatesTest : public ::testing::Test {
@@ -243,6 +221,20 @@ TEST_F(EntityStatesTest, FaultOfABoardIsItsAlarmAndNoOthers) {
     EXPECT_EQ(read().at(0).state.alarm, 0);
     m_faults.insert(m_faults.begin(), {1, 17, 1, 0, "", 1});
     EXPECT_EQ(read().at(0).state.alarm, '\x02');
+}
+
+TEST_F(EntityStatesTest, ProcessorHasOnlyTheStatesThatNeedNoPlatform) {
+    PhysicalRow processor;
+    processor.entity = 18;
+    processor.physicalClass = PhysicalClass::Cpu;
+    auto const rows = m_states.read({m_entity, processor}, {m_board}, {}, {});
+    ASSERT_THAT(rows, SizeIs(2));
+    EXPECT_EQ(rows[1].entity, 18U);
+    EXPECT_EQ(rows[1].state.admin, AdminState::Unknown);
+    EXPECT_EQ(rows[1].state.oper, OperState::Unknown);
+    EXPECT_EQ(rows[1].state.usage, UsageState::Busy);
+    EXPECT_EQ(static_cast<unsigned char>(rows[1].state.alarm), kAlarmUnknown);
+    EXPECT_EQ(rows[1].state.standby, StandbyState::ProvidingService);
 }
 
 TEST_F(EntityStatesTest, EntityThatComesIsInItsStateSinceThen) {
