@@ -157,6 +157,15 @@ std::string AgentFixture::get(std::string const& name) const {
     return answered.empty() ? "nothing" : answered.front().value;
 }
 
+void AgentFixture::editWalks(std::string const& edit) {
+    std::filesystem::create_directory(path("bin"));
+    std::string const searched = environment()["PATH"];
+    write(path("bin/snmpbulkwalk"),
+          "#!/bin/sh\nPATH='" + searched + "' snmpbulkwalk \"$@\" | sed '" + edit + "'\n");
+    std::filesystem::permissions(path("bin/snmpbulkwalk"), std::filesystem::perms::owner_all);
+    setVariable("PATH", path("bin") + ":" + searched);
+}
+
 void AgentFixture::sim(std::vector<std::string> const& arguments) const {
     std::vector<std::string> command{KVLSIM};
     command.insert(command.end(), arguments.begin(), arguments.end());

@@ -62,6 +62,10 @@ class AgentFixture : public ::testing::Test {
     /// The value of one instance, with names; such as "INTEGER: started(3)".
     std::string get(std::string const& name) const;
 
+    /// From now on, programs that run snmpbulkwalk get other answers than the agent's: `edit` is a
+    /// command of sed.
+    void editWalks(std::string const& edit);
+
     /// Runs the simulator's control tool on the agent's platform; expects success.
     void sim(std::vector<std::string> const& arguments) const;
     /// Waits until `condition` holds.

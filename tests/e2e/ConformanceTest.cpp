@@ -2,23 +2,65 @@
 // The agent's answers conform to the MIB modules, except as mibs/conformance.ini says.
 #include <iostream>
 
+#include <gmock/gmock.h>
+
 #include "tests/e2e/AgentFixture.h"
 
 namespace kvloamd::e2e {
 namespace {
 
+using ::testing::HasSubstr;
+
 class ConformanceTest : public AgentFixture {
   protected:
     static constexpr char kClosedIntervals[] = "1.3.6.1.2.1.10.18.6.1.4.1000";
+
+    void serve() {
+        startAgent();
+        // The past of the lines is there from the first second that they count.
+        ASSERT_TRUE(eventually([this] { return get(kClosedIntervals).starts_with("INTEGER: "); }));
+    }
+    Result check() {
+        return run({SOURCE_DIR "/tests/mibs/check-conformance", SOURCE_DIR, address()});
+    }
+    /// The check finds a fault in the edited answers.
+    void expectFinds(std::string const& edit, std::string const& fault) {
+        editWalks(edit);
+        Result const checked = check();
+        EXPECT_NE(checked.status, 0);
+        EXPECT_THAT(checked.output, HasSubstr(fault));
+    }
 };
 
 TEST_F(ConformanceTest, EveryObjectHasALegalValueOrAReasonToHaveNone) {
-    startAgent();
-    // The past of the lines is there from the first second that they count.
-    ASSERT_TRUE(eventually([this] { return get(kClosedIntervals).starts_with("INTEGER: "); }));
-    Result const check = run({SOURCE_DIR "/tests/mibs/check-conformance", SOURCE_DIR, address()});
-    std::cout << check.output;
-    EXPECT_EQ(check.status, 0);
+    serve();
+    Result const checked = check();
+    std::cout << checked.output;
+    EXPECT_EQ(checked.status, 0);
+}
+
+TEST_F(ConformanceTest, CheckFindsAValueThatTheEnumerationDoesNotHave) {
+    serve();
+    expectFinds(R"(s/^\(\.1\.3\.6\.1\.2\.1\.2\.2\.1\.3\.1000 = INTEGER:\).*/\1 999/)",
+                "IF-MIB::ifType.1000 is 999, which the enumeration does not have");
+}
+
+TEST_F(ConformanceTest, CheckFindsAWrongType) {
+    serve();
+    expectFinds(R"(s/^\(\.1\.3\.6\.1\.2\.1\.2\.2\.1\.3\.1000 = \)INTEGER:/\1Gauge32:/)",
+                "IF-MIB::ifType.1000 is a Gauge32, not INTEGER");
+}
+
+TEST_F(ConformanceTest, CheckFindsARowWithoutAValue) {
+    serve();
+    expectFinds(R"(/^\.1\.3\.6\.1\.2\.1\.2\.2\.1\.3\.1000 /d)",
+                "ifType has no value in the rows 1000, and no \"some rows\" says why");
+}
+
+TEST_F(ConformanceTest, CheckFindsAnIndexThatIsOutOfRange) {
+    serve();
+    expectFinds(R"(s/^\.1\.3\.6\.1\.2\.1\.2\.2\.1\.3\.1000 /.1.3.6.1.2.1.2.2.1.3.0 /)",
+                "IF-MIB::ifType.0: the index ifIndex is 0");
 }
 
 } // namespace
