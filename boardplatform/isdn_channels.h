@@ -11,6 +11,22 @@ inline constexpr char const* kISDNChannelStates = "CHANNEL_STATES";
 /// An `ISDNSignallingState`, in 4 bytes.
 inline constexpr char const* kISDNSignallingState = "SIGNALLING_STATE";
 
+/// What the trunk calls itself in calls: texts, absent when it has none.
+inline constexpr char const* kISDNCallingAddress = "CALLING_ADDRESS";
+inline constexpr char const* kISDNCallingSubAddress = "CALLING_SUBADDRESS";
+/// An `ISDNProtocol`, in 1 byte.
+inline constexpr char const* kISDNProtocol = "Protocol_Type_0";
+
+/// The signalling protocols of trunks. There are others, which the platform does not name.
+enum class ISDNProtocol : std::int8_t {
+    national2 = 1,
+    ess4 = 2,
+    dms100 = 3,
+    etsi = 4,
+    qsig = 5,
+    ins1500 = 6,
+};
+
 enum class ISDNBearerState : std::uint8_t {
     idle = 1,
     connecting = 2,

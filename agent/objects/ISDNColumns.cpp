@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// ISDN-MIB's tables: the bearer channels and the signalling channels.
+// ISDN-MIB's tables: the bearer channels, the signalling channels and their data links.
 #include "agent/objects/RowValues.h"
 #include "agent/objects/StandardObjects.h"
 
@@ -22,12 +22,12 @@ constexpr Column<BearerRow> kBearerColumns[] = {
 constexpr Column<SignallingRow> kSignallingColumns[] = {
     {"isdnSignalingIfIndex", 2, Integer, ifIndex},
     {"isdnSignalingProtocol", 3, Integer, number<&SignallingRow::protocol>},
-    {"isdnSignalingCallingAddress", 4, Text, textIfKnown<&SignallingRow::callingAddress>},
+    {"isdnSignalingCallingAddress", 4, Text, text<&SignallingRow::callingAddress>},
     {"isdnSignalingBchannelCount", 6, Integer, number<&SignallingRow::bearerCount>},
 };
 
-constexpr Column<SignallingRow> kLapdColumns[] = {
-    {"isdnLapdOperStatus", 2, Integer, number<&SignallingRow::operStatus>},
+constexpr Column<LapdRow> kLapdColumns[] = {
+    {"isdnLapdOperStatus", 2, Integer, number<&LapdRow::operStatus>},
 };
 
 } // namespace
@@ -45,7 +45,7 @@ Table const& isdnSignalingTable() {
 }
 
 Table const& isdnLapdTable() {
-    static RowTable<SignallingRow, interfaceRows<&InterfaceRows::signalling>> const table(
+    static RowTable<LapdRow, interfaceRows<&InterfaceRows::lapds>> const table(
         "isdnLapdTable", {10, 20, 1, 3, 4, 1}, kLapdColumns);
     return table;
 }

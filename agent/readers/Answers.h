@@ -8,6 +8,8 @@
 #include <string>
 #include <string_view>
 
+#include "board/Interface.h"
+
 namespace kvloamd {
 
 /// The longest text that is served; longer ones are cut.
@@ -15,6 +17,19 @@ inline constexpr std::size_t kLongestText = 255;
 
 /// `text` as it is served: what is not printable ASCII becomes '?', what is too long is cut.
 std::string printable(std::string_view text);
+
+/// Texts of the model have 256 bytes at most; a concrete class may answer longer ones.
+inline constexpr std::size_t kTextCapacity = 4096;
+
+/// The text that `query` of `asked` answers, as it is served; empty if it is not supported.
+template <class Asked>
+std::string askText(Asked& asked, int (Asked::*query)(char*)) {
+    char answer[kTextCapacity];
+    answer[0] = '\0';
+    answer[kTextCapacity - 1] = '\0';
+    if ((asked.*query)(answer) == KVL::kNotSupported) return {};
+    return printable(answer);
+}
 
 /// Seconds since the epoch as the 11 octets of a date with its offset from UTC, in local time;
 /// empty for 0 or less, which is an unknown date, and for years that have no four digits.

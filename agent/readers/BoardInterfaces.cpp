@@ -25,25 +25,31 @@ namespace {
 // Values of ifType.
 constexpr int kTypeLoopback = 24;
 constexpr int kTypeIsdn = 63;
+constexpr int kTypeLapd = 77;
 constexpr int kTypeDs0 = 81;
 
 /// The speed of a DS0, in bit/s.
-constexpr std::uint32_t kBearerSpeed = 64000;
+constexpr std::uint32_t kDs0Speed = 64000;
+
+/// The values of dsx1LineType that are E1 lines.
+constexpr int kTypesOfE1[] = {4, 5, 6, 7, 9, 12, 13};
+
+/// The time slot of an E1 line that usually carries its signalling.
+constexpr int kSignallingSlotOfE1 = 16;
+
+/// The highest isdnBearerChannelNumber.
+constexpr int kHighestBearer = 30;
+
+/// The number of a bearer channel among those of its line. An E1 line with `signallingInside` its
+/// bearers leaves out one slot. Nothing if ISDN-MIB has no such number.
+std::optional<int> bearerNumber(std::optional<int> timeSlot, bool signallingInside) {
+    if (!timeSlot) return std::nullopt;
+    int const number = *timeSlot - (signallingInside && *timeSlot > kSignallingSlotOfE1 ? 1 : 0);
+    return number >= 1 && number <= kHighestBearer ? std::optional(number) : std::nullopt;
+}
 
 /// The largest number of bearer channels that is believed of one signalling channel.
 constexpr int kMostBearers = 1024;
-
-/// Texts of the model have 256 bytes at most; a concrete class may answer longer ones.
-constexpr std::size_t kTextCapacity = 4096;
-
-template <class Asked>
-std::string text(Asked& asked, int (Asked::*query)(char*)) {
-    char answer[kTextCapacity];
-    answer[0] = '\0';
-    answer[kTextCapacity - 1] = '\0';
-    if ((asked.*query)(answer) == KVL::kNotSupported) return {};
-    return printable(answer);
-}
 
 /// A number that uses all 32 bits; one value of them says that it is not supported.
 std::optional<std::uint32_t> unsignedNumber(int answer) {
@@ -71,9 +77,17 @@ class Reading {
     InterfaceRow& enterNameless(IndexKind kind);
     void readInterface(KVL::Interface& interface, InterfaceRow& row) const;
     void readLine(DS1LineDevice& line);
-    std::uint32_t readSignalling(ISDNDChannel& channel);
+    /// A signalling channel's number on the board, and its line's, which is 0 if it is not known.
+    struct Signalling {
+        ReferenceCounter<ISDNDChannel> channel;
+        std::uint32_t index = 0;
+        std::uint32_t line = 0;
+    };
+    Signalling readSignalling(ReferenceCounter<ISDNDChannel> channel);
+    std::uint32_t readLapd(ISDNDChannel& channel);
     std::uint32_t readBearer(ISDNBChannel& channel);
-    void stack(std::uint32_t channel, std::uint32_t line);
+    bool isE1(std::uint32_t line) const;
+    void stack(std::uint32_t higher, std::uint32_t lower);
     /// The line that is called `name`, or whose circuit is; 0 when there is none.
     std::uint32_t findLine(std::string const& name) const;
     /// The line that `channel` itself says; 0 if it says none of this board. Nothing if the channel
@@ -129,9 +143,9 @@ void Reading::readInterface(KVL::Interface& interface, InterfaceRow& row) const 
 }
 
 void Reading::readLine(DS1LineDevice& line) {
-    std::string const name = text(line, &DS1LineDevice::GetName);
+    std::string const name = askText(line, &DS1LineDevice::GetName);
     LineRow row;
-    row.circuitIdentifier = text(line, &DS1LineDevice::GetCircuitIdentifier);
+    row.circuitIdentifier = askText(line, &DS1LineDevice::GetCircuitIdentifier);
     InterfaceRow& interface = enter(IndexKind::Line, name);
     readInterface(line, interface);
     interface.name = name;
@@ -171,38 +185,61 @@ void Reading::readLines(DS1LineFeature& feature) {
     }
 }
 
-std::uint32_t Reading::readSignalling(ISDNDChannel& channel) {
-    std::string const name = text(channel, &ISDNDChannel::GetName);
+Reading::Signalling Reading::readSignalling(ReferenceCounter<ISDNDChannel> handle) {
+    ISDNDChannel& channel = *handle.get();
+    std::string const name = askText(channel, &ISDNDChannel::GetName);
     InterfaceRow& interface = enter(IndexKind::SignallingChannel, name);
     SignallingRow row;
     row.ifIndex = interface.ifIndex;
     row.protocol = unlessNegative(channel.GetProtocol());
-    row.callingAddress = text(channel, &ISDNDChannel::GetCallingAddress);
+    row.callingAddress = askText(channel, &ISDNDChannel::GetCallingAddress);
+    // A channel may name its line in the place of an address.
+    std::uint32_t const named = findLine(row.callingAddress);
+    if (named != 0) row.callingAddress.clear();
+    std::uint32_t const line = ownLine(channel).value_or(named);
     row.bearerCount = unlessNegative(channel.GetBChannelCount());
-    if (int const status = channel.GetOperStatus(); status > 0) row.operStatus = status;
     interface.description = "signalling channel " + name;
     interface.name = name;
     interface.type = kTypeIsdn;
     interface.connectorPresent = kFalse;
-    if (row.operStatus)
-        interface.operStatus = *row.operStatus == ISDNDChannelStatusL2Active ? kUp : kDown;
+    if (int const status = channel.GetOperStatus(); status > 0)
+        interface.operStatus = status == ISDNDChannelStatusL2Active ? kUp : kDown;
+    Signalling found{std::move(handle), row.ifIndex, line};
     m_found.rows.signalling.push_back(std::move(row));
-    return m_found.rows.signalling.back().ifIndex;
+    return found;
+}
+
+std::uint32_t Reading::readLapd(ISDNDChannel& channel) {
+    std::string const name = askText(channel, &ISDNDChannel::GetName);
+    InterfaceRow& interface = enter(IndexKind::Lapd, name);
+    LapdRow row;
+    row.ifIndex = interface.ifIndex;
+    interface.description = "data link of signalling channel " + name;
+    interface.name = name + "-lapd";
+    interface.type = kTypeLapd;
+    interface.connectorPresent = kFalse;
+    interface.speed = kDs0Speed;
+    if (int const status = channel.GetOperStatus(); status > 0) {
+        row.operStatus = status;
+        interface.operStatus = status == ISDNDChannelStatusL2Active ? kUp : kDown;
+    }
+    m_found.rows.lapds.push_back(row);
+    return row.ifIndex;
 }
 
 std::uint32_t Reading::readBearer(ISDNBChannel& channel) {
-    std::string const name = text(channel, &ISDNBChannel::GetName);
+    std::string const name = askText(channel, &ISDNBChannel::GetName);
     InterfaceRow& interface = enter(IndexKind::BearerChannel, name);
     BearerRow row;
     row.ifIndex = interface.ifIndex;
     row.channelType = unlessNegative(channel.GetChannelType());
     if (int const status = channel.GetOperStatus(); status > 0) row.operStatus = status;
-    row.channelNumber = unlessNegative(channel.GetChannelNumber());
+    row.timeSlot = unlessNegative(channel.GetChannelNumber());
     interface.description = "bearer channel " + name;
     interface.name = name;
     interface.type = kTypeDs0;
     interface.connectorPresent = kFalse;
-    interface.speed = kBearerSpeed;
+    interface.speed = kDs0Speed;
     if (row.operStatus)
         interface.operStatus = *row.operStatus >= ISDNBChannelStatusConnected ? kUp : kDormant;
     m_found.rows.bearers.push_back(row);
@@ -210,15 +247,15 @@ std::uint32_t Reading::readBearer(ISDNBChannel& channel) {
 }
 
 void Reading::readChannels(ISDNFeature& feature) {
+    std::vector<Signalling> signalling;
     std::vector<std::uint32_t> lineOfBearer;
     for (auto channel = feature.GetFirstDChannel(); channel.get() != nullptr;
          channel = feature.GetNextDChannel(channel)) {
-        std::uint32_t const index = readSignalling(*channel.get());
+        signalling.push_back(readSignalling(channel));
         SignallingRow const& row = m_found.rows.signalling.back();
-        std::uint32_t const line = ownLine(*channel.get()).value_or(findLine(row.callingAddress));
-        stack(index, line);
         int const bearers = std::min(row.bearerCount.value_or(0), kMostBearers);
-        lineOfBearer.insert(lineOfBearer.end(), static_cast<std::size_t>(bearers), line);
+        lineOfBearer.insert(lineOfBearer.end(), static_cast<std::size_t>(bearers),
+                            signalling.back().line);
     }
     std::vector<std::pair<std::uint32_t, std::optional<std::uint32_t>>> bearers;
     for (auto channel = feature.GetFirstBChannel(); channel.get() != nullptr;
@@ -227,14 +264,37 @@ void Reading::readChannels(ISDNFeature& feature) {
     // Bearer channels that cannot say their line come in the order of the signalling channels that
     // they belong to. If the counts do not agree, their lines are not known.
     bool const countsAgree = lineOfBearer.size() == bearers.size();
+    std::size_t const firstRow = m_found.rows.bearers.size() - bearers.size();
+    std::vector<std::uint32_t> lines;
+    std::set<std::uint32_t> withSlot16;
     for (std::size_t i = 0; i < bearers.size(); ++i) {
-        auto const& [index, line] = bearers[i];
-        stack(index, line.value_or(countsAgree ? lineOfBearer[i] : 0));
+        auto const& [index, said] = bearers[i];
+        std::uint32_t const line = said.value_or(countsAgree ? lineOfBearer[i] : 0);
+        stack(index, line);
+        lines.push_back(line);
+        if (m_found.rows.bearers[firstRow + i].timeSlot == kSignallingSlotOfE1)
+            withSlot16.insert(line);
+    }
+    for (std::size_t i = 0; i < lines.size(); ++i) {
+        BearerRow& row = m_found.rows.bearers[firstRow + i];
+        row.channelNumber =
+            bearerNumber(row.timeSlot, isE1(lines[i]) && !withSlot16.contains(lines[i]));
+    }
+    for (Signalling& each : signalling) {
+        std::uint32_t const lapd = readLapd(*each.channel.get());
+        stack(each.index, lapd);
+        stack(lapd, each.line);
     }
 }
 
-void Reading::stack(std::uint32_t channel, std::uint32_t line) {
-    if (line != 0) m_found.rows.stack.push_back({channel, line});
+bool Reading::isE1(std::uint32_t line) const {
+    auto const found = std::ranges::find(m_found.rows.lines, line, &LineRow::ifIndex);
+    return found != m_found.rows.lines.end() && found->lineType &&
+           std::ranges::find(kTypesOfE1, *found->lineType) != std::end(kTypesOfE1);
+}
+
+void Reading::stack(std::uint32_t higher, std::uint32_t lower) {
+    if (lower != 0) m_found.rows.stack.push_back({higher, lower});
 }
 
 std::uint32_t Reading::findLine(std::string const& name) const {

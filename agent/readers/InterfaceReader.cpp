@@ -88,6 +88,7 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     sortBy(all.lines, &LineRow::ifIndex);
     sortBy(all.bearers, &BearerRow::ifIndex);
     sortBy(all.signalling, &SignallingRow::ifIndex);
+    sortBy(all.lapds, &LapdRow::ifIndex);
     sortBy(all.ethernets, &EthernetRow::ifIndex);
     sortBy(all.ports, &PortRow::ifIndex);
     completeStack(all);
@@ -118,6 +119,7 @@ void InterfaceReader::append(InterfaceRows& all, BoardInterfaces&& board,
     moveRows(all.lines, board.rows.lines, indices);
     moveRows(all.bearers, board.rows.bearers, indices);
     moveRows(all.signalling, board.rows.signalling, indices);
+    moveRows(all.lapds, board.rows.lapds, indices);
     moveRows(all.ethernets, board.rows.ethernets, indices);
     for (PortRow& port : board.rows.ports)
         port.boardIndex = boardIndex;

@@ -19,7 +19,8 @@ enum class IndexKind : int {
     Chassis = 7,
     Slot = 8,
     Board = 9,
-    Processor = 10
+    Processor = 10,
+    Lapd = 11 ///< the data link of a signalling channel
 };
 
 /// One thing among those of its board, or among those of no board.

@@ -118,7 +118,8 @@ struct BearerRow {
     std::uint32_t ifIndex = 0;
     std::optional<int> channelType;
     std::optional<int> operStatus;
-    std::optional<int> channelNumber;
+    std::optional<int> channelNumber;           ///< among the bearers of its line, from 1
+    std::optional<int> timeSlot = std::nullopt; ///< of its line, from 1
 
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
 };
@@ -128,6 +129,13 @@ struct SignallingRow {
     std::optional<int> protocol;
     std::string callingAddress;
     std::optional<int> bearerCount;
+
+    std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
+};
+
+/// The data link (LAPD) below a signalling channel.
+struct LapdRow {
+    std::uint32_t ifIndex = 0;
     std::optional<int> operStatus;
 
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
@@ -167,6 +175,7 @@ struct InterfaceRows {
     std::vector<LineRow> lines;
     std::vector<BearerRow> bearers;
     std::vector<SignallingRow> signalling;
+    std::vector<LapdRow> lapds;
     std::vector<EthernetRow> ethernets;
     std::vector<PortRow> ports;
     // When interfaces last came or went: hundredths of a second since the agent's start.

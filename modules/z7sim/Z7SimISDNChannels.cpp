@@ -1,15 +1,37 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "Z7SimISDNChannels.h"
 
-#include <cstring>
 #include <utility>
 
+#include "CopyText.h"
 #include "ObjectAttributes.h"
 #include "board/Interface.h"
+#include "boardplatform/isdn_channels.h"
 
 namespace {
 
 constexpr int kDialup = 1; ///< of ISDN-MIB's isdnBearerChannelType
+
+/// The numbers of ISDN-MIB's IsdnSignalingProtocol.
+int protocolOf(long device) {
+    auto const protocol = numberAttribute(device, kISDNProtocol);
+    if (!protocol) return KVL::kNotSupported;
+    switch (static_cast<ISDNProtocol>(*protocol)) {
+    case ISDNProtocol::national2:
+        return 10; // ni2
+    case ISDNProtocol::ess4:
+        return 5;
+    case ISDNProtocol::dms100:
+        return 7;
+    case ISDNProtocol::etsi:
+        return 3;
+    case ISDNProtocol::qsig:
+        return 23;
+    case ISDNProtocol::ins1500:
+        return 18;
+    }
+    return 1; // other
+}
 
 } // namespace
 
@@ -28,9 +50,9 @@ int Z7SimBChannel::GetChannelType() {
 Z7SimDChannel::Z7SimDChannel(std::string const& name, long device, int bearers, int board,
                              ReferenceCounter<DS1LineDevice> line)
     : ISDNDChannelZ7(name.c_str()),
-      m_protocol(numberAttributeOr(device, "Protocol_Type_0", KVL::kNotSupported)),
+      m_protocol(protocolOf(device)),
       m_bearers(bearers),
-      m_trunkName(textAttribute(device, "NAME")),
+      m_callingAddress(textAttribute(device, kISDNCallingAddress)),
       m_line(std::move(line)) {
     ISDNDChannelZ7::SetBoardIndex(board);
 }
@@ -38,6 +60,5 @@ Z7SimDChannel::Z7SimDChannel(std::string const& name, long device, int bearers, 
 Z7SimDChannel::~Z7SimDChannel() = default;
 
 int Z7SimDChannel::GetCallingAddress(char* address) {
-    std::memcpy(address, m_trunkName.c_str(), m_trunkName.size() + 1);
-    return 0;
+    return copyText(m_callingAddress, address);
 }

@@ -54,7 +54,7 @@ class Z7SimBChannel final : public ISDNBChannelZ7, public ISDNChannelOnLine {
 /// The signalling channel of a trunk.
 class Z7SimDChannel final : public ISDNDChannelZ7, public ISDNChannelOnLine {
   public:
-    /// `device`: the trunk's handle in the device mapper; its protocol and name are read now.
+    /// `device`: the trunk's handle in the device mapper; its protocol and address are read now.
     Z7SimDChannel(std::string const& name, long device, int bearers, int board,
                   ReferenceCounter<DS1LineDevice> line);
     ~Z7SimDChannel() override;
@@ -63,7 +63,7 @@ class Z7SimDChannel final : public ISDNDChannelZ7, public ISDNChannelOnLine {
     int GetProtocol() override { return m_protocol; }
     int GetOperStatus() override { return m_state.get(); }
     int GetBChannelCount() override { return m_bearers; }
-    /// The trunk's name.
+    /// Empty when the trunk has none.
     int GetCallingAddress(char* address) override;
     ReferenceCounter<DS1LineDevice> GetLine() override { return m_line; }
 
@@ -72,7 +72,7 @@ class Z7SimDChannel final : public ISDNDChannelZ7, public ISDNChannelOnLine {
   private:
     int const m_protocol;
     int const m_bearers;
-    std::string const m_trunkName;
+    std::string const m_callingAddress;
     ReferenceCounter<DS1LineDevice> const m_line;
     ChannelState<ISDNDChannelStatusEnum> m_state;
 };

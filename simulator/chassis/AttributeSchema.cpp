@@ -82,6 +82,9 @@ std::unordered_map<std::string_view, AttributeKind> const& knownAttributes() {
         {"CLOCK_SOURCE", number},
         {"FDL", number},
         {"CIRCUIT", text},
+        // Trunks.
+        {kISDNCallingAddress, text},
+        {kISDNCallingSubAddress, text},
         // Processors.
         {"PROC_NUM", number},
         {"BK_VERSION", text},

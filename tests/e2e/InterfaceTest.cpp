@@ -87,13 +87,14 @@ class InterfaceTest : public AgentFixture {
 
 TEST_F(InterfaceTest, EveryInterfaceOfTheExampleChassisHasARow) {
     startAgent();
-    EXPECT_EQ(at("1.3.6.1.2.1.2.1", "0"), "INTEGER: 71");
+    EXPECT_EQ(at("1.3.6.1.2.1.2.1", "0"), "INTEGER: 73");
     auto const descriptions = column(c(kIf, 2));
-    EXPECT_THAT(descriptions, SizeIs(71));
+    EXPECT_THAT(descriptions, SizeIs(73));
     for (char const* const description :
          {"T1 line nx5-trunk-1", "T1 line nx5-trunk-2", "host interface lo",
           "IP interface over host interface lo", "E1 line quillon-span-1",
-          "E1 line vorn-primary-rate-2", "signalling channel D1", "bearer channel B2.31"})
+          "E1 line vorn-primary-rate-2", "signalling channel D1",
+          "data link of signalling channel D2", "bearer channel B2.31"})
         EXPECT_THAT(descriptions,
                     Contains(::testing::Pair(::testing::_,
                                              "STRING: \"" + std::string(description) + "\"")));
@@ -102,6 +103,7 @@ TEST_F(InterfaceTest, EveryInterfaceOfTheExampleChassisHasARow) {
         ++types[type];
     EXPECT_EQ(types["INTEGER: 18"], 5);  // ds1
     EXPECT_EQ(types["INTEGER: 63"], 2);  // isdn
+    EXPECT_EQ(types["INTEGER: 77"], 2);  // lapd
     EXPECT_EQ(types["INTEGER: 81"], 60); // ds0
     EXPECT_EQ(types["INTEGER: 24"], 2);  // the loopback, and the IP interface over it
     EXPECT_EQ(types["INTEGER: 6"], 2);   // the same of an Ethernet
@@ -159,10 +161,14 @@ TEST_F(InterfaceTest, ChannelsLieAboveTheirLine) {
     EXPECT_EQ(std::ranges::count_if(
                   stack, [&](auto const& row) { return row.first.ends_with("." + first); }),
               31);
-    for (auto const& [channel, line] :
-         {std::pair{"D1", first}, {"B1.1", first}, {"D2", second}, {"B2.31", second}}) {
+    for (auto const& [channel, line] : {std::pair{std::string("D1"), lineNamed("D1-lapd")},
+                                        {"D1-lapd", first},
+                                        {"B1.1", first},
+                                        {"D2", lineNamed("D2-lapd")},
+                                        {"D2-lapd", second},
+                                        {"B2.31", second}}) {
         EXPECT_TRUE(stack.contains(lineNamed(channel) + "." + line)) << channel;
-        EXPECT_TRUE(stack.contains("0." + lineNamed(channel))) << channel;
+        EXPECT_EQ(stack.contains("0." + lineNamed(channel)), !channel.ends_with("lapd")) << channel;
         EXPECT_FALSE(stack.contains(lineNamed(channel) + ".0")) << channel;
     }
     EXPECT_TRUE(stack.contains(first + ".0"));
@@ -251,12 +257,12 @@ TEST_F(InterfaceTest, ChannelsHaveTheirStates) {
     EXPECT_THAT(column(c(kIsdn, 2) + ".1.1.1"), SizeIs(60));
     auto const slots = column(c(kIsdn, 2) + ".1.1.3");
     EXPECT_EQ(slots.at(lineNamed("B1.1")), "INTEGER: 1");
-    EXPECT_EQ(slots.at(lineNamed("B2.31")), "INTEGER: 31");
+    EXPECT_EQ(slots.at(lineNamed("B2.31")), "INTEGER: 30");
     EXPECT_THAT(column(c(kIsdn, 2) + ".1.1.2"), Each(::testing::Pair(::testing::_, "INTEGER: 1")));
     EXPECT_EQ(at(c(kIf, 8), lineNamed("B1.1")), "INTEGER: 5"); // dormant while it is idle
     std::string const signalling = lineNamed("D1");
     EXPECT_EQ(at(c(kIsdn, 3) + ".2.1.2", signalling), "INTEGER: " + signalling);
-    EXPECT_EQ(at(c(kIsdn, 3) + ".2.1.4", signalling), "STRING: \"vorn-primary-rate-1\"");
+    EXPECT_EQ(at(c(kIsdn, 3) + ".2.1.4", signalling), "STRING: \"5550100\"");
     EXPECT_EQ(at(c(kIsdn, 3) + ".2.1.6", signalling), "INTEGER: 30");
     EXPECT_THAT(column(c(kIsdn, 3) + ".4.1.2"), SizeIs(2));
 }
@@ -296,7 +302,7 @@ TEST_F(InterfaceTest, ViewThatLeavesOutAnInterfaceHoldsForItsInstances) {
                   "rocommunity public 127.0.0.1 -V some\n");
     startAgent();
     auto const descriptions = column(c(kIf, 2));
-    EXPECT_THAT(descriptions, SizeIs(70));
+    EXPECT_THAT(descriptions, SizeIs(72));
     EXPECT_FALSE(descriptions.contains("1001"));
 }
 
@@ -312,7 +318,7 @@ TEST_F(InterfaceTest, StateThatIsWantedCanNotBeWritten) {
 TEST_F(InterfaceTest, IndicesAreTheSameAfterARestart) {
     startAgent();
     auto const before = column(c(kIfX, 1));
-    ASSERT_THAT(before, SizeIs(71));
+    EXPECT_THAT(before, SizeIs(73));
     EXPECT_EQ(stopAgent(), 0);
     startAgent({"--interface-base", "5000"});
     EXPECT_EQ(column(c(kIfX, 1)), before);

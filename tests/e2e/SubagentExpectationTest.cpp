@@ -24,7 +24,7 @@ class SubagentExpectationTest : public MasterFixture {
         ASSERT_TRUE(eventually([this] {
             return std::ranges::count_if(walk("1.3.6.1.2.1.2.2.1.1"), [](Answer const& answer) {
                        return answer.name.back() >= 1000;
-                   }) == 7;
+                   }) == 8;
         }));
         ASSERT_TRUE(eventually([this] { return get("kvlFaultCount.0") == "Gauge32: 1 faults"; }));
         // The line's past ends with a whole interval, which the first live second closes.

@@ -66,6 +66,7 @@ class FakeLine final : public DS1LineDevice {
     FakeLine(std::string name, std::string circuit)
         : m_name(std::move(name)), m_circuit(std::move(circuit)) {}
 
+    int lineType = KVL::kNotSupported;
     int lineStatus = KVL::kNotSupported;
     long statusLastChange = KVL::kNotSupported;
     int trapEnable = KVL::kNotSupported;
@@ -96,7 +97,7 @@ class FakeLine final : public DS1LineDevice {
     int GetName(char* name) override { return give(name, m_name); }
     int GetLineIndex() override { return KVL::kNotSupported; }
     ReferenceCounter<DS1IntervalTable> GetIntervalTable() override { return history; }
-    int GetLineType() override { return KVL::kNotSupported; }
+    int GetLineType() override { return lineType; }
     int GetLineCoding() override { return KVL::kNotSupported; }
     int GetSendCode() override { return KVL::kNotSupported; }
     int GetCircuitIdentifier(char* identifier) override { return give(identifier, m_circuit); }
@@ -153,13 +154,15 @@ class FakeLineFeature final : public DS1LineFeatureZ7 {
 
 class FakeBChannel : public ISDNBChannelZ7 {
   public:
-    FakeBChannel(char const* name, int status) : ISDNBChannelZ7(name), m_status(status) {}
+    FakeBChannel(char const* name, int status, int timeSlot = KVL::kNotSupported)
+        : ISDNBChannelZ7(name), m_status(status), m_timeSlot(timeSlot) {}
     int GetChannelType() override { return 1; }
     int GetOperStatus() override { return m_status; }
-    int GetChannelNumber() override { return KVL::kNotSupported; }
+    int GetChannelNumber() override { return m_timeSlot; }
 
   private:
     int m_status;
+    int m_timeSlot;
 };
 
 class FakeDChannel : public ISDNDChannelZ7 {

@@ -29,6 +29,19 @@ class BoardInterfacesTest : public ::testing::Test {
         line.history = ReferenceCounter<DS1IntervalTable>(history);
         return *history;
     }
+    static std::vector<ISDNBChannel*> bearersOn(FakeLine* line, std::vector<int> const& slots) {
+        std::vector<ISDNBChannel*> bearers;
+        for (int const slot : slots)
+            bearers.push_back(
+                new OnLine<FakeBChannel>(line, ("B" + std::to_string(slot)).c_str(), 1, slot));
+        return bearers;
+    }
+    std::vector<std::optional<int>> bearerNumbers() {
+        std::vector<std::optional<int>> numbers;
+        for (BearerRow const& row : read().bearers)
+            numbers.push_back(row.channelNumber);
+        return numbers;
+    }
     InterfaceRows read() { return readInterfaces(*m_board.get(), m_toTicks, m_histories).rows; }
     LineRow readLine() {
         auto rows = read();
@@ -54,7 +67,7 @@ TEST_F(BoardInterfacesTest, LinesArePortsAndChannelsAreNot) {
     addLine("one");
     add(new FakeISDNFeature({new FakeDChannel("D", 1, 1, "one")}, {new FakeBChannel("B", 1)}));
     auto const rows = read();
-    EXPECT_THAT(rows.interfaces, SizeIs(3));
+    EXPECT_THAT(rows.interfaces, SizeIs(4));
     ASSERT_THAT(rows.ports, SizeIs(1));
     EXPECT_EQ(rows.ports[0].ifIndex, rows.lines[0].ifIndex);
     EXPECT_EQ(rows.ports[0].key, (IndexKey{IndexKind::Line, "one"}));
@@ -120,21 +133,65 @@ TEST_F(BoardInterfacesTest, ChannelsLieAboveTheLineThatTheirSignallingNames) {
     add(new FakeISDNFeature(
         {new FakeDChannel("D1", 3, 1, "one"), new FakeDChannel("D2", 3, 2, "circuit 2")},
         {new FakeBChannel("B1", 1), new FakeBChannel("B2", 1), new FakeBChannel("B3", 1)}));
-    // Numbers on the board: lines 1 and 2, signalling 3 and 4, bearers 5 to 7.
-    EXPECT_THAT(read().stack, UnorderedElementsAre(StackRow{3, 1}, StackRow{4, 2}, StackRow{5, 1},
-                                                   StackRow{6, 2}, StackRow{7, 2}));
+    // Numbers on the board: lines 1 and 2, signalling 3 and 4, bearers 5 to 7, data links 8 and 9.
+    EXPECT_THAT(read().stack,
+                UnorderedElementsAre(StackRow{3, 8}, StackRow{8, 1}, StackRow{4, 9}, StackRow{9, 2},
+                                     StackRow{5, 1}, StackRow{6, 2}, StackRow{7, 2}));
 }
 
 TEST_F(BoardInterfacesTest, BearersThatDoNotAddUpLieAboveNothing) {
     addLine("one");
     add(new FakeISDNFeature({new FakeDChannel("D1", 3, 5, "one")}, {new FakeBChannel("B1", 1)}));
-    EXPECT_THAT(read().stack, ElementsAre(StackRow{2, 1}));
+    EXPECT_THAT(read().stack, UnorderedElementsAre(StackRow{2, 4}, StackRow{4, 1}));
 }
 
-TEST_F(BoardInterfacesTest, ChannelsOfAnUnknownLineLieAboveNothing) {
+TEST_F(BoardInterfacesTest, ChannelsOfAnUnknownLineLieAboveNoLine) {
     addLine("one");
     add(new FakeISDNFeature({new FakeDChannel("D1", 3, 1, "other")}, {new FakeBChannel("B1", 1)}));
-    EXPECT_THAT(read().stack, IsEmpty());
+    EXPECT_THAT(read().stack, ElementsAre(StackRow{2, 4}));
+}
+
+TEST_F(BoardInterfacesTest, EverySignallingChannelHasADataLink) {
+    add(new FakeISDNFeature({new FakeDChannel("D1", ISDNDChannelStatusL1Active, 0, "")}, {}));
+    auto const rows = read();
+    ASSERT_THAT(rows.lapds, SizeIs(1));
+    EXPECT_EQ(rows.lapds[0].ifIndex, 2U);
+    EXPECT_EQ(rows.lapds[0].operStatus, ISDNDChannelStatusL1Active);
+    EXPECT_EQ(rows.interfaces[1].type, 77);
+    EXPECT_EQ(rows.interfaces[1].speed, 64000U);
+    EXPECT_EQ(rows.interfaces[1].name, "D1-lapd");
+}
+
+TEST_F(BoardInterfacesTest, LineInThePlaceOfACallingAddressIsNoAddress) {
+    addLine("one");
+    add(new FakeISDNFeature(
+        {new FakeDChannel("D1", 3, 1, "one"), new FakeDChannel("D2", 3, 1, "555 0100")}, {}));
+    auto const rows = read();
+    ASSERT_THAT(rows.signalling, SizeIs(2));
+    EXPECT_EQ(rows.signalling[0].callingAddress, "");
+    EXPECT_EQ(rows.signalling[1].callingAddress, "555 0100");
+}
+
+TEST_F(BoardInterfacesTest, BearersOfAnE1AreNumberedWithoutTheSlotOfItsSignalling) {
+    FakeLine& line = addLine("one");
+    line.lineType = 5;
+    add(new FakeISDNFeature({}, bearersOn(&line, {1, 15, 17, 31})));
+    EXPECT_THAT(bearerNumbers(), ElementsAre(1, 15, 16, 30));
+}
+
+TEST_F(BoardInterfacesTest, BearersThatUseEverySlotKeepTheirNumbers) {
+    FakeLine& line = addLine("one");
+    line.lineType = 5;
+    add(new FakeISDNFeature({}, bearersOn(&line, {15, 16, 17, 31})));
+    // ISDN-MIB has no number 31.
+    EXPECT_THAT(bearerNumbers(), ElementsAre(15, 16, 17, std::nullopt));
+}
+
+TEST_F(BoardInterfacesTest, BearersOfAT1KeepTheirNumbers) {
+    FakeLine& line = addLine("one");
+    line.lineType = 2;
+    add(new FakeISDNFeature({}, bearersOn(&line, {1, 17, 23})));
+    EXPECT_THAT(bearerNumbers(), ElementsAre(1, 17, 23));
 }
 
 TEST_F(BoardInterfacesTest, ChannelsLieAboveTheLineThatTheySay) {
@@ -144,8 +201,8 @@ TEST_F(BoardInterfacesTest, ChannelsLieAboveTheLineThatTheySay) {
         {new OnLine<FakeDChannel>(&second, "D1", 3, 1, "same"),
          new OnLine<FakeDChannel>(&first, "D2", 3, 1, "same")},
         {new OnLine<FakeBChannel>(&second, "B1", 1), new OnLine<FakeBChannel>(&first, "B2", 1)}));
-    EXPECT_THAT(read().stack, UnorderedElementsAre(StackRow{3, 2}, StackRow{4, 1}, StackRow{5, 2},
-                                                   StackRow{6, 1}));
+    EXPECT_THAT(read().stack, UnorderedElementsAre(StackRow{3, 7}, StackRow{7, 2}, StackRow{4, 8},
+                                                   StackRow{8, 1}, StackRow{5, 2}, StackRow{6, 1}));
 }
 
 TEST_F(BoardInterfacesTest, BearersThatSayTheirLineNeedNotAddUp) {
@@ -159,14 +216,14 @@ TEST_F(BoardInterfacesTest, BearersThatCannotSayTheirLineFollowTheirSignallingCh
     FakeLine& line = addLine("one");
     add(new FakeISDNFeature({new OnLine<FakeDChannel>(&line, "D1", 3, 1, "other")},
                             {new FakeBChannel("B1", 1)}));
-    EXPECT_THAT(read().stack, UnorderedElementsAre(StackRow{2, 1}, StackRow{3, 1}));
+    EXPECT_THAT(read().stack, UnorderedElementsAre(StackRow{2, 4}, StackRow{4, 1}, StackRow{3, 1}));
 }
 
-TEST_F(BoardInterfacesTest, ChannelThatSaysNoLineLiesAboveNothing) {
+TEST_F(BoardInterfacesTest, ChannelThatSaysNoLineLiesAboveNoLine) {
     addLine("one");
     add(new FakeISDNFeature({new OnLine<FakeDChannel>(nullptr, "D1", 3, 1, "one")},
                             {new OnLine<FakeBChannel>(nullptr, "B1", 1)}));
-    EXPECT_THAT(read().stack, IsEmpty());
+    EXPECT_THAT(read().stack, ElementsAre(StackRow{2, 4}));
 }
 
 TEST_F(BoardInterfacesTest, ChannelThatSaysALineOfAnotherBoardLiesAboveNothing) {
@@ -191,7 +248,7 @@ TEST_F(BoardInterfacesTest, ChannelIsUpWhenItCarriesSomething) {
     std::vector<std::optional<int>> states;
     for (InterfaceRow const& row : read().interfaces)
         states.push_back(row.operStatus);
-    EXPECT_THAT(states, ElementsAre(2, 1, 5, 1, std::nullopt));
+    EXPECT_THAT(states, ElementsAre(2, 1, 5, 1, std::nullopt, 2, 1));
 }
 
 } // namespace

@@ -138,10 +138,6 @@ TEST_F(Z7SimISDNFeatureTest, TrunksAreNumberedAsTheDeviceMapperListsThem) {
                    trunk(304, 1, "NAME: second"));
     EXPECT_EQ(bearerNames(), (std::vector<std::string>{"B1.1", "B1.2", "B2.1", "B3.1"}));
     EXPECT_EQ(signallingNames(), (std::vector<std::string>{"D1", "D2", "D3"}));
-    char address[256];
-    auto second = isdn()->GetNextDChannel(isdn()->GetFirstDChannel());
-    EXPECT_EQ(second->GetCallingAddress(address), 0);
-    EXPECT_STREQ(address, "second");
 }
 
 TEST_F(Z7SimISDNFeatureTest, BearerAnswersEveryQuery) {
@@ -155,15 +151,15 @@ TEST_F(Z7SimISDNFeatureTest, BearerAnswersEveryQuery) {
 }
 
 TEST_F(Z7SimISDNFeatureTest, SignallingChannelAnswersEveryQuery) {
-    plugIn("", trunk(301, 2, "NAME: primary-rate, Protocol_Type_0: 4"));
+    plugIn("", trunk(301, 2, "Protocol_Type_0: 4, CALLING_ADDRESS: '5550100'"));
     auto const channel = isdn()->GetFirstDChannel();
     char address[256];
     EXPECT_EQ(nameOf(*channel.get()), "D1");
-    EXPECT_EQ(channel->GetProtocol(), 4);
+    EXPECT_EQ(channel->GetProtocol(), 3); // etsi
     EXPECT_EQ(channel->GetOperStatus(), ISDNDChannelStatusL2Active);
     EXPECT_EQ(channel->GetBChannelCount(), 2);
     EXPECT_EQ(channel->GetCallingAddress(address), 0);
-    EXPECT_STREQ(address, "primary-rate");
+    EXPECT_STREQ(address, "5550100");
     EXPECT_EQ(channel->GetBoardIndex(), 5);
 }
 
@@ -183,8 +179,21 @@ TEST_F(Z7SimISDNFeatureTest, ChannelsOfATrunkWithoutALineKnowNone) {
     EXPECT_EQ(lineIndexOf(isdn()->GetNextDChannel(isdn()->GetFirstDChannel())), -1);
 }
 
-TEST_F(Z7SimISDNFeatureTest, TrunkWithoutProtocolAndNameSaysSo) {
-    plugIn("", trunk(301, 2));
+TEST_F(Z7SimISDNFeatureTest, ProtocolsOfThePlatformHaveTheNumbersOfTheStandard) {
+    std::string trunks;
+    for (int const platform : {-1, 0, 1, 2, 3, 4, 5, 6, 7})
+        trunks += trunk(302 + platform, 2, "Protocol_Type_0: " + std::to_string(platform));
+    plugIn("", trunks);
+    std::vector<int> protocols;
+    auto const channels = isdn();
+    for (auto channel = channels->GetFirstDChannel(); channel.get() != nullptr;
+         channel = channels->GetNextDChannel(channel))
+        protocols.push_back(channel->GetProtocol());
+    EXPECT_EQ(protocols, (std::vector<int>{1, 1, 10, 5, 7, 3, 23, 18, 1}));
+}
+
+TEST_F(Z7SimISDNFeatureTest, TrunkWithoutProtocolAndAddressSaysSo) {
+    plugIn("", trunk(301, 2, "NAME: primary-rate"));
     char address[256] = "before";
     EXPECT_EQ(isdn()->GetFirstDChannel()->GetProtocol(), KVL::kNotSupported);
     EXPECT_EQ(isdn()->GetFirstDChannel()->GetCallingAddress(address), 0);
