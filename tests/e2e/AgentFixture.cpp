@@ -188,13 +188,15 @@ void AgentFixture::startWithReceiver(std::string const& access) {
     startAgent();
 }
 
-void AgentFixture::startTrapReceiver(std::string const& config) {
+void AgentFixture::startTrapReceiver(std::string const& config,
+                                     std::vector<std::string> const& output) {
     write(path("trapd.conf"), config);
     for (int attempt = 0; attempt < 10; ++attempt) {
         m_trapPort = freePort();
-        std::vector<std::string> const command{
-            "snmptrapd", "-f",     "-Lo", "-C",          "-c",  path("trapd.conf"),
-            "-M",        MIB_PATH, "-m",  "KVL-OAM-MIB", "-OQ", "udp:" + trapAddress()};
+        std::vector<std::string> command{"snmptrapd",       "-f", "-Lo", "-n", "-C", "-c",
+                                         path("trapd.conf")};
+        command.insert(command.end(), output.begin(), output.end());
+        command.push_back("udp:" + trapAddress());
         m_trapReceiver = std::make_unique<Process>(command, environment());
         if (m_trapReceiver->waitFor("NET-SNMP version") &&
             eventually([this] { return udpPortIsBound(m_trapPort); }))

@@ -72,7 +72,10 @@ class AgentFixture : public ::testing::Test {
     static bool eventually(std::function<bool()> const& condition);
 
     /// Starts to receive notifications. Before `startAgent`, whose configuration names the port.
-    void startTrapReceiver(std::string const& config);
+    /// `output`: how it prints them; by default names of KVL-OAM-MIB, without types.
+    void startTrapReceiver(std::string const& config,
+                           std::vector<std::string> const& output = {"-M", MIB_PATH, "-m",
+                                                                     "KVL-OAM-MIB", "-OQ"});
     Process& trapReceiver() { return *m_trapReceiver; }
     /// Starts a receiver of notifications of version 2c and the agent, which sends them there;
     /// `access` is what the community public gets.

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The agent's answers conform to the MIB modules, except as mibs/conformance.ini says.
 #include <iostream>
+#include <map>
 
 #include <gmock/gmock.h>
 
@@ -61,6 +62,34 @@ TEST_F(ConformanceTest, CheckFindsAnIndexThatIsOutOfRange) {
     serve();
     expectFinds(R"(s/^\.1\.3\.6\.1\.2\.1\.2\.2\.1\.3\.1000 /.1.3.6.1.2.1.2.2.1.3.0 /)",
                 "IF-MIB::ifType.0: the index ifIndex is 0");
+}
+
+TEST_F(ConformanceTest, NotificationsContainWhatTheirModulesSay) {
+    startTrapReceiver("authCommunity log public\n", {"-m", "", "-OnxU", "-Oe"});
+    configureSnmp("rwcommunity public 127.0.0.1\ntrap2sink " + trapAddress() + " public\n");
+    serve();
+    ask("snmpset", {"1.3.6.1.2.1.10.18.6.1.17.1000", "i", "1"});
+    sim({"line", "alarm", "101", "los"});
+    sim({"fault", "3", "17"});
+    sim({"stop", "2"});
+    std::map<std::string, std::string> const wanted{
+        {"linkDown", "1.3.6.1.6.3.1.1.5.3"},
+        {"dsx1LineStatusChange", "1.3.6.1.2.1.10.18.15.0.1"},
+        {"entConfigChange", "1.3.6.1.2.1.47.2.0.1"},
+        {"entStateOperDisabled", "1.3.6.1.2.1.131.0.2"},
+        {"kvlBoardStatusChange", "1.3.6.1.4.1.32473.1.0.1"},
+        {"kvlFaultRaised", "1.3.6.1.4.1.32473.1.0.2"}};
+    std::vector<std::string> command{SOURCE_DIR "/tests/mibs/check-notifications", SOURCE_DIR,
+                                     address(), path("received")};
+    for (auto const& [name, number] : wanted) {
+        EXPECT_TRUE(trapReceiver().waitFor("= OID: ." + number)) << name;
+        command.push_back(name);
+    }
+    ASSERT_TRUE(eventually([this] { return trapReceiver().output().ends_with('\n'); }));
+    write(path("received"), trapReceiver().output());
+    Result const checked = run(command);
+    std::cout << checked.output;
+    EXPECT_EQ(checked.status, 0) << trapReceiver().output();
 }
 
 } // namespace

@@ -4,6 +4,21 @@ import re
 import subprocess
 
 
+# As Net-SNMP's tools print types.
+TYPES = {'INTEGER': ('INTEGER', 'Integer32'), 'Gauge32': ('Gauge32', 'Unsigned32'),
+         'Counter32': ('Counter32',), 'Counter64': ('Counter64',), 'Timeticks': ('TimeTicks',),
+         'Hex-STRING': ('OCTET STRING', 'BITS'), 'STRING': ('OCTET STRING', 'BITS'),
+         'OID': ('OBJECT IDENTIFIER',), 'IpAddress': ('IpAddress',)}
+
+
+def parse(line):
+    """(number, (type as the tools print it, value)) of "name = TYPE: value", or None."""
+    answer = re.fullmatch(r'\.([\d.]+) = (?:([\w-]+): ?)?(.*)', line)
+    if answer is None:
+        return None
+    return tuple(int(part) for part in answer[1].split('.')), (answer[2] or 'STRING', answer[3])
+
+
 def walk(address, places):
     """number -> (type as the tools print it, value)."""
     answers = {}
@@ -13,10 +28,10 @@ def walk(address, places):
                               text=True)
         last = None
         for line in done.stdout.splitlines():
-            answer = re.fullmatch(r'\.([\d.]+) = (?:([\w-]+): ?)?(.*)', line)
+            answer = parse(line)
             if answer:
-                last = tuple(int(part) for part in answer[1].split('.'))
-                answers[last] = (answer[2] or 'STRING', answer[3])
+                last = answer[0]
+                answers[last] = answer[1]
             elif last:
                 answers[last] = (answers[last][0], answers[last][1] + line)
     return {oid: a for oid, a in answers.items() if not a[1].startswith('No ')}
@@ -32,6 +47,26 @@ def octets(kind, value):
 def number(value):
     """A number without its unit; of TimeTicks, the hundredths."""
     return int(value.split()[0].strip('()'))
+
+
+def wrong_value(syntax, kind, value):
+    """Why a value is not legal, or None."""
+    if syntax.base not in TYPES.get(kind, ()):
+        return 'is a %s, not %s' % (kind, syntax.base)
+    if syntax.base == 'BITS':
+        wrong = [8 * byte + bit for byte, octet in enumerate(octets(kind, value)) for bit in range(8)
+                 if octet & (0x80 >> bit) and 8 * byte + bit not in syntax.labels]
+        return 'has the unknown bits %s' % wrong if wrong else None
+    if syntax.base == 'OCTET STRING':
+        size = len(octets(kind, value))
+        return None if syntax.permits(size) else 'has %d octets' % size
+    if syntax.base == 'OBJECT IDENTIFIER':
+        return None if re.fullmatch(r'\.?[\d.]+', value) else 'is no object identifier'
+    numeric = number(value)
+    if syntax.labels:
+        return None if numeric in syntax.labels else \
+            'is %d, which the enumeration does not have' % numeric
+    return None if syntax.permits(numeric) else 'is %d, out of range' % numeric
 
 
 def plain(answer):
