@@ -1,6 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The road of an administrative event as one would write it with std::shared_ptr: the same
-// stations, the same events, everything passed by value.
+// The delivery of an administrative event as one would write it with std::shared_ptr: the same
+// stages, the same events, everything passed by value.
 #pragma once
 
 #include <algorithm>

@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// What boards are known by wherever something is kept for them.
+// Identifies boards wherever something is kept for them.
 #pragma once
 
 #include <string>
@@ -18,9 +18,9 @@ struct BoardKey {
 };
 
 /// The keys of `boards`, all different: a board's serial number, if it is known. A board of unknown
-/// serial number is known by its place: its slot, or else its logical identifier. Of several boards
-/// with one serial number, the one in the lowest place has it as its key, the others have their
-/// places besides. A board that has neither gets a key that is not stable.
+/// serial number is identified by its place: its slot, or else its logical identifier. Of several
+/// boards with one serial number, the one in the lowest place has it as its key, the others have
+/// their places besides. A board that has neither gets a key that is not stable.
 std::vector<BoardKey> boardKeys(std::vector<BoardRow> const& boards);
 
 /// "shelf 1 bus 2 slot 4", as far as the board knows; empty if it does not know its slot.

@@ -24,7 +24,7 @@ std::vector<BoardRow> BoardSource::read() {
         ReferenceCounter<Board> const board = m_manager.GetBoardByIndex(index);
         if (Board* const asked = board.get(); asked != nullptr)
             rows.push_back(readRow(*asked, index));
-        giveWay();
+        yieldBetweenBoards();
     }
     std::erase_if(
         rows, [this](BoardRow const& row) { return hasGone(static_cast<int>(row.boardIndex)); });

@@ -15,7 +15,7 @@ constexpr std::chrono::microseconds kTurn{1000};
 
 } // namespace
 
-void giveWay() {
+void yieldBetweenBoards() {
     static thread_local Clock::time_point last;
     if (Clock::now() - last < kTurn) return;
     std::this_thread::yield();

@@ -6,6 +6,6 @@ namespace kvloamd {
 
 /// Yields the CPU between boards, at most once per millisecond, so that requests are not delayed.
 /// Yielding after every board would starve the reader on a saturated CPU.
-void giveWay();
+void yieldBetweenBoards();
 
 } // namespace kvloamd

@@ -87,7 +87,7 @@ PhysicalEntities Building::build() {
     std::vector<BoardKey> const boards = boardKeys(m_snapshot.boards);
     for (std::size_t i = 0; i < boards.size(); ++i) {
         addBoard(m_snapshot.boards[i], boards[i]);
-        giveWay();
+        yieldBetweenBoards();
     }
     std::ranges::sort(m_built.entities, {}, &PhysicalRow::entity);
     std::ranges::sort(m_built.contains);

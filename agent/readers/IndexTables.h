@@ -14,8 +14,8 @@ namespace kvloamd {
 /// No index is above this.
 inline constexpr std::uint32_t kLastIndex = 0x7fffffff;
 
-/// Indices that belong to one board: `first` to `first + size - 1`. A board is known by its
-/// `BoardKey`'s name.
+/// Indices that belong to one board: `first` to `first + size - 1`. The name of its
+/// `BoardKey` identifies the board.
 struct IndexBlock {
     std::string board;
     std::uint32_t first = 0;

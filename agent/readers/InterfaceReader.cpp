@@ -78,7 +78,7 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
             auto const indices = m_indices.indicesOf(keys[i], found.keys);
             append(all, std::move(found), indices, boardIndex);
         });
-        giveWay();
+        yieldBetweenBoards();
     }
     m_indices.save();
     if (m_counted.size() > all.interfaces.size())

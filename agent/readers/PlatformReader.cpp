@@ -69,7 +69,7 @@ void PlatformReader::readObjects(Wanted const& wanted) {
         auto const handle = finder.find(board->serialNumber);
         m_boards[board->boardIndex].objects =
             handle ? readDevices(*handle, board->boardIndex) : DeviceRows{};
-        giveWay();
+        yieldBetweenBoards();
     }
 }
 

@@ -90,7 +90,7 @@ std::vector<ResourceRow> readResources(BoardManager& manager, std::vector<BoardR
                 readBoardResources(*asked, row.boardIndex, rows);
             }))
             rows.resize(before);
-        giveWay();
+        yieldBetweenBoards();
     }
     return rows;
 }

@@ -10,8 +10,8 @@
 
 namespace kvloamd {
 
-/// Objects of the device mapper are known by their handles, which stay the same while the platform
-/// runs. Texts are empty and numbers none when they are not known; addresses are as
+/// A device is an object of the device mapper, identified by its handle, which stays the same while
+/// the platform runs. Texts are empty and numbers none when they are unknown; addresses are as
 /// `descriptorOctets`.
 struct DeviceRow {
     std::uint32_t boardIndex = 0;
