@@ -1,14 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // kvlsim, end to end: the real tool against a real process that holds a platform.
-#include <sys/socket.h>
-#include <sys/stat.h>
-#include <sys/un.h>
-#include <unistd.h>
-
-#include <cstring>
-#include <fstream>
-#include <sstream>
-
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
@@ -29,14 +20,6 @@ class KvlsimToolTest : public ToolTest {
         Finished const shown = kvlsim({"show", name, "--json"});
         EXPECT_EQ(shown.status, 0) << shown.err;
         return json::parse(shown.out)["boards"][0];
-    }
-
-    void expectRefusal(std::vector<std::string> const& arguments, int status,
-                       std::string const& line) const {
-        Finished const finished = kvlsim(arguments);
-        EXPECT_EQ(finished.status, status);
-        EXPECT_EQ(finished.err, line + "\n");
-        EXPECT_EQ(finished.out, "");
     }
 };
 
@@ -123,9 +106,9 @@ TEST_F(KvlsimToolTest, InsertTakesABigBoardThatShowPrintsAsJson) {
 TEST_F(KvlsimToolTest, InsertOfABadFileNamesTheLine) {
     hold();
     std::string const path = write("bad.yaml", "handle: 50\nattributes: {NAME: X}\n");
-    expectRefusal({"insert", path}, 1,
-                  "kvlsim: " + path +
-                      ":1: board 50 has no SERIAL_NUMBER; give it one under attributes");
+    expectRefusalLine({"insert", path}, 1,
+                      "kvlsim: " + path +
+                          ":1: board 50 has no SERIAL_NUMBER; give it one under attributes");
 }
 
 TEST_F(KvlsimToolTest, ReplacedBoardKeepsItsHandle) {
@@ -189,37 +172,41 @@ TEST_F(KvlsimToolTest, ShowOfOneBoardListsItsDevices) {
 
 TEST_F(KvlsimToolTest, RefusalOfThePlatformIsPassedOn) {
     hold();
-    expectRefusal({"stop", "77"}, 1,
-                  "kvlsim: no board \"77\" in the chassis; \"kvlsim show\" lists what is there");
+    expectRefusalLine(
+        {"stop", "77"}, 1,
+        "kvlsim: no board \"77\" in the chassis; \"kvlsim show\" lists what is there");
 }
 
 TEST_F(KvlsimToolTest, MisspeltCommandIsToldWhatWasMeant) {
-    expectRefusal(
+    expectRefusalLine(
         {"stpo", "1"}, 2,
         "kvlsim: there is no command \"stpo\"; did you mean \"stop\"? kvlsim --help lists "
         "the commands");
-    expectRefusal({"--socket", "/x", "line", "alrm", "101", "los"}, 2,
-                  "kvlsim: there is no command \"line alrm\"; did you mean \"line alarm\"? kvlsim "
-                  "--help lists the commands");
-    expectRefusal({"frobnicate"}, 2,
-                  "kvlsim: there is no command \"frobnicate\"; kvlsim --help explains");
+    expectRefusalLine(
+        {"--socket", "/x", "line", "alrm", "101", "los"}, 2,
+        "kvlsim: there is no command \"line alrm\"; did you mean \"line alarm\"? kvlsim "
+        "--help lists the commands");
+    expectRefusalLine({"frobnicate"}, 2,
+                      "kvlsim: there is no command \"frobnicate\"; kvlsim --help explains");
 }
 
 TEST_F(KvlsimToolTest, OneWrongBoardAmongSeveralChangesNothing) {
     ChildProcess& process = hold();
-    expectRefusal({"remove", "1", "NONE"}, 1,
-                  "kvlsim: no board \"NONE\" in the chassis; \"kvlsim show\" lists what is there");
-    expectRefusal({"stop", "1", "NX5-T1"}, 1, "kvlsim: board 1 is named twice; nothing is done");
+    expectRefusalLine(
+        {"remove", "1", "NONE"}, 1,
+        "kvlsim: no board \"NONE\" in the chassis; \"kvlsim show\" lists what is there");
+    expectRefusalLine({"stop", "1", "NX5-T1"}, 1,
+                      "kvlsim: board 1 is named twice; nothing is done");
     process.writeLine("read 1 NAME");
     EXPECT_EQ(process.readLine(), "value NX5-T1"); // no event came before
 }
 
 TEST_F(KvlsimToolTest, ShowOfADeviceSaysWhoseItIs) {
     hold();
-    expectRefusal({"show", "101"}, 1,
-                  "kvlsim: 101 is a device of board 1, not a board; name board 1");
-    expectRefusal({"show", "111"}, 1,
-                  "kvlsim: 111 is a sub-device of board 1, not a board; name board 1");
+    expectRefusalLine({"show", "101"}, 1,
+                      "kvlsim: 101 is a device of board 1, not a board; name board 1");
+    expectRefusalLine({"show", "111"}, 1,
+                      "kvlsim: 111 is a sub-device of board 1, not a board; name board 1");
 }
 
 TEST_F(KvlsimToolTest, ShowOfOneBoardIsReadable) {
@@ -252,16 +239,16 @@ TEST_F(KvlsimToolTest, WithoutASocketItSaysHowToNameOne) {
 }
 
 TEST_F(KvlsimToolTest, WithoutAPlatformItSaysHowToStartOne) {
-    expectRefusal({"show"}, 1,
-                  "kvlsim: no simulated platform answers at " + socket() +
-                      " (No such file or directory); start one with KVLSIM_SOCKET=" + socket());
+    expectRefusalLine({"show"}, 1,
+                      "kvlsim: no simulated platform answers at " + socket() +
+                          " (No such file or directory); start one with KVLSIM_SOCKET=" + socket());
 }
 
 TEST_F(KvlsimToolTest, SocketIsTakenFromTheOptionFirst) {
     hold();
-    expectRefusal({"--socket", "/nowhere", "show"}, 1,
-                  "kvlsim: no simulated platform answers at /nowhere (No such file or "
-                  "directory); start one with KVLSIM_SOCKET=/nowhere");
+    expectRefusalLine({"--socket", "/nowhere", "show"}, 1,
+                      "kvlsim: no simulated platform answers at /nowhere (No such file or "
+                      "directory); start one with KVLSIM_SOCKET=/nowhere");
 }
 
 TEST_F(KvlsimToolTest, WrongUseHasStatus2) {
@@ -278,182 +265,6 @@ TEST_F(KvlsimToolTest, HelpAndVersionSucceed) {
     Finished const version = kvlsim({"--version"});
     EXPECT_EQ(version.status, 0);
     EXPECT_THAT(version.out, StartsWith("kvlsim "));
-}
-
-TEST_F(KvlsimToolTest, GeneratedChassisIsGood) {
-    std::string const path = directory.file("big.yaml");
-    succeed({"generate", "--boards", "200", "--devices", "3", "--output", path});
-    Finished const checked = kvlsim({"check", path});
-    EXPECT_EQ(checked.status, 0) << checked.err;
-    EXPECT_EQ(checked.out, path + ": good, 200 boards\n");
-    EXPECT_EQ(checked.err, "");
-    ChildProcess& process = hold({"KVLSIM_CHASSIS=" + path});
-    process.writeLine("read 200 SERIAL_NUMBER");
-    EXPECT_THAT(process.readLine(), testing::EndsWith("0000200"));
-}
-
-TEST_F(KvlsimToolTest, SameSeedMakesTheSameChassisAndAnotherDoesNot) {
-    std::string const one = kvlsim({"generate", "--boards", "5", "--seed", "7"}).out;
-    EXPECT_FALSE(one.empty());
-    EXPECT_EQ(kvlsim({"generate", "--boards", "5", "--seed", "7"}).out, one);
-    auto const behindFirstLine = [](std::string const& text) {
-        return text.substr(text.find('\n'));
-    };
-    EXPECT_NE(behindFirstLine(kvlsim({"generate", "--boards", "5", "--seed", "8"}).out),
-              behindFirstLine(one));
-}
-
-TEST_F(KvlsimToolTest, ChassisThatCannotBeWrittenLeavesNothingBehind) {
-    expectRefusal({"generate", "--boards", "1", "--output", directory.file("no/such/place.yaml")},
-                  1,
-                  "kvlsim: " + directory.file("no/such/place.yaml") +
-                      ": cannot be written (No such file or directory); choose a place that is "
-                      "writable and has room");
-}
-
-TEST_F(KvlsimToolTest, CheckRefusesABadChassisWithItsLine) {
-    std::string const path =
-        write("bad.yaml", "boards:\n  - {handle: 0, attributes: {SERIAL_NUMBER: A1}}\n");
-    expectRefusal({"check", path}, 1,
-                  "kvlsim: " + path +
-                      ":2: the handle of a board cannot be 0; write a number from 1 to "
-                      "2147483646");
-}
-
-TEST_F(KvlsimToolTest, CheckReportsEveryErrorAndWarning) {
-    std::string const path = write("bad.yaml", "boards:\n"
-                                               "  - handle: 0\n"
-                                               "    attributes: {SERIAL_NUMBER: A1, FAMILIY: X}\n"
-                                               "  - handle: 2\n");
-    expectRefusal({"check", path}, 1,
-                  "kvlsim: " + path +
-                      ":3: warning: unknown attribute \"FAMILIY\"; did you mean FAMILY?\n"
-                      "kvlsim: " +
-                      path +
-                      ":2: the handle of a board cannot be 0; write a number from 1 to "
-                      "2147483646\n"
-                      "kvlsim: " +
-                      path + ":4: board 2 has no SERIAL_NUMBER; give it one under attributes");
-}
-
-TEST_F(KvlsimToolTest, CheckOfAMisspeltAttributeWarnsAndSucceeds) {
-    std::string const path =
-        write("warned.yaml", "boards:\n"
-                             "  - handle: 1\n"
-                             "    attributes: {SERIAL_NUMBER: A1, BOARD_PRESNT: 0}\n");
-    Finished const checked = kvlsim({"check", path});
-    EXPECT_EQ(checked.status, 0);
-    EXPECT_EQ(checked.out, path + ": good, 1 boards\n");
-    EXPECT_EQ(checked.err, "kvlsim: " + path +
-                               ":3: warning: unknown attribute \"BOARD_PRESNT\"; did you mean "
-                               "BOARD_PRESENT?\n");
-}
-
-TEST_F(KvlsimToolTest, BundledChassisIsTheExampleChassis) {
-    hold();
-    json const bundled = json::parse(kvlsim({"show", "--json"}).out)["boards"];
-    hold({"KVLSIM_CHASSIS=" KVLSIM_SMALL_CHASSIS});
-    json const example = json::parse(kvlsim({"show", "--json"}).out)["boards"];
-    ASSERT_EQ(bundled.size(), 3U);
-    for (std::size_t i = 0; i < 3; ++i)
-        EXPECT_EQ(bundled[i]["devices"], example[i]["devices"]);
-}
-
-TEST_F(KvlsimToolTest, BadChassisIsReportedInOneLineAndThePlatformAnswersNothing) {
-    std::string const path = write("bad.yaml", "boards: 5\n");
-    ChildProcess& process = hold({"KVLSIM_CHASSIS=" + path});
-    std::string const reason = path + ":1: boards cannot be 5; write a list, each board beginning "
-                                      "with \"- handle:\"";
-    process.writeLine("read 1 NAME");
-    EXPECT_EQ(process.readLine(), "result 204");
-    expectRefusal({"show"}, 1, "kvlsim: there is no chassis: " + reason);
-    Finished const finished = process.finish();
-    EXPECT_EQ(finished.status, 0);
-    EXPECT_EQ(finished.err, "kvlsim: " + reason + "\n");
-}
-
-TEST_F(KvlsimToolTest, LoadingAChassisWarnsOfAMisspeltAttribute) {
-    std::string const path = write("warned.yaml", "boards:\n"
-                                                  "  - handle: 1\n"
-                                                  "    attributes:\n"
-                                                  "      SERIAL_NUMBER: A1\n"
-                                                  "      FAMILIY: NX5\n");
-    ChildProcess& process = hold({"KVLSIM_CHASSIS=" + path});
-    process.writeLine("read 1 FAMILIY");
-    EXPECT_THAT(process.readLine(), testing::EndsWith("NX5"));
-    Finished const finished = process.finish();
-    EXPECT_EQ(finished.status, 0);
-    EXPECT_EQ(finished.err, "kvlsim: " + path +
-                                ":5: warning: unknown attribute \"FAMILIY\"; did you mean "
-                                "FAMILY?\n");
-}
-
-TEST_F(KvlsimToolTest, SocketGoesWithItsProcess) {
-    EXPECT_EQ(hold().finish().status, 0);
-    EXPECT_NE(access(socket().c_str(), F_OK), 0);
-}
-
-TEST_F(KvlsimToolTest, SocketOfAKilledProcessIsReplaced) {
-    hold().kill();
-    EXPECT_EQ(holder->finish().status, 1009);
-    EXPECT_EQ(access(socket().c_str(), F_OK), 0);
-    hold();
-    succeed({"show"});
-}
-
-TEST_F(KvlsimToolTest, SocketInUseIsRefusedAndItsOwnerKeepsIt) {
-    hold();
-    ChildProcess second({KVLSIM_PLATFORM_HOLDER}, {"KVLSIM_SOCKET=" + socket()});
-    EXPECT_EQ(second.readLine(), "ready");
-    second.writeLine("read 1 NAME");
-    EXPECT_EQ(second.readLine(), "value NX5-T1");
-    EXPECT_EQ(second.finish().err, "kvlsim: control socket " + socket() +
-                                       ": is in use by another process, choose another path; the "
-                                       "platform goes on without control\n");
-    succeed({"show"});
-}
-
-TEST_F(KvlsimToolTest, FileInTheSocketsPlaceIsLeftAlone) {
-    write("socket", "precious");
-    ChildProcess& process = hold();
-    EXPECT_EQ(process.finish().err, "kvlsim: control socket " + socket() +
-                                        ": is there and is no socket, choose another path; the "
-                                        "platform goes on without control\n");
-    std::stringstream text;
-    text << std::ifstream(socket()).rdbuf();
-    EXPECT_EQ(text.str(), "precious");
-}
-
-TEST_F(KvlsimToolTest, SocketPathThatIsTooLongIsRefused) {
-    std::string const path = "/tmp/" + std::string(120, 'x');
-    ChildProcess process({KVLSIM_PLATFORM_HOLDER}, {"KVLSIM_SOCKET=" + path});
-    EXPECT_EQ(process.readLine(), "ready");
-    EXPECT_THAT(process.finish().err, HasSubstr("more than 107 bytes"));
-}
-
-TEST_F(KvlsimToolTest, ProcessEndsCleanlyWhileEventsAreDelivered) {
-    ChildProcess& process = hold();
-    process.writeLine("flood 5000");
-    Finished const finished = process.finish();
-    EXPECT_EQ(finished.status, 0) << finished.err;
-}
-
-TEST_F(KvlsimToolTest, HandlerMayEndTheProcess) {
-    ChildProcess& process = hold();
-    process.writeLine("exit-in-handler");
-    Finished const finished = process.finish();
-    EXPECT_EQ(finished.status, 0) << finished.err;
-}
-
-TEST_F(KvlsimToolTest, ProcessEndsWhileAClientHangs) {
-    ChildProcess& process = hold();
-    int const client = ::socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0);
-    sockaddr_un address{};
-    address.sun_family = AF_UNIX;
-    std::strncpy(address.sun_path, socket().c_str(), sizeof address.sun_path - 1);
-    ASSERT_EQ(connect(client, reinterpret_cast<sockaddr const*>(&address), sizeof address), 0);
-    EXPECT_EQ(process.finish().status, 0);
-    close(client);
 }
 
 } // namespace

@@ -44,6 +44,14 @@ class ToolTest : public testing::Test {
         EXPECT_THAT(finished.err, testing::HasSubstr(words));
         EXPECT_EQ(finished.out, "");
     }
+    /// The tool must fail with `status` and print `line` and nothing else.
+    void expectRefusalLine(std::vector<std::string> const& arguments, int status,
+                           std::string const& line) const {
+        auto const finished = kvlsim(arguments);
+        EXPECT_EQ(finished.status, status);
+        EXPECT_EQ(finished.err, line + "\n");
+        EXPECT_EQ(finished.out, "");
+    }
     std::string write(char const* name, std::string const& text) const {
         std::string const path = directory.file(name);
         std::ofstream(path) << text;
