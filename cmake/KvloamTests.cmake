@@ -13,36 +13,14 @@ function(kvloam_test_options target)
     target_link_libraries(${target} PRIVATE GTest::gtest GTest::gmock)
 endfunction()
 
-# The headers that most tests include, compiled once for all test programs. A test still includes what
-# it uses: the presets `release` and `ilp32` compile without. Test programs are compiled with -fPIE.
-file(CONFIGURE OUTPUT ${CMAKE_CURRENT_BINARY_DIR}/precompiled.cpp CONTENT "")
-add_library(kvloam_test_headers OBJECT ${CMAKE_CURRENT_BINARY_DIR}/precompiled.cpp)
-kvloam_test_options(kvloam_test_headers)
+# The headers that most tests include. Test programs are compiled with -fPIE.
+find_package(nlohmann_json REQUIRED)
+kvloam_precompiled(kvloam_test_headers
+    PRECOMPILE <gmock/gmock.h> <gtest/gtest.h> <nlohmann/json.hpp> ${KVLOAM_COMMON_HEADERS}
+    LIBRARIES GTest::gtest GTest::gmock nlohmann_json::nlohmann_json)
 set_target_properties(kvloam_test_headers PROPERTIES POSITION_INDEPENDENT_CODE OFF)
 target_compile_options(kvloam_test_headers PRIVATE
-    -fPIE
-    # Or a cached object would not be found after the headers are compiled again.
-    $<$<CXX_COMPILER_ID:Clang>:SHELL:-Xclang -fno-pch-timestamp>)
-target_precompile_headers(kvloam_test_headers PRIVATE
-    <gmock/gmock.h>
-    <gtest/gtest.h>
-    <algorithm>
-    <array>
-    <atomic>
-    <chrono>
-    <condition_variable>
-    <filesystem>
-    <fstream>
-    <functional>
-    <map>
-    <memory>
-    <mutex>
-    <optional>
-    <set>
-    <sstream>
-    <string>
-    <thread>
-    <vector>)
+    -fPIE $<$<CONFIG:Debug>:-g${KVLOAM_TEST_DEBUG}>)
 
 # kvloam_test(<name> [TOGETHER] SOURCES <files> [LIBRARIES <libs>] [LABELS <labels>]
 #     [ENVIRONMENT <VAR=value>]): a GoogleTest program; every test case becomes one ctest test. With
@@ -57,7 +35,7 @@ function(kvloam_test name)
     kvloam_test_options(${name})
     set_target_properties(${name} PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${PROJECT_BINARY_DIR}/tests)
     target_link_libraries(${name} PRIVATE ${arg_LIBRARIES} GTest::gtest_main)
-    target_precompile_headers(${name} REUSE_FROM kvloam_test_headers)
+    kvloam_use_precompiled(${name} kvloam_test_headers)
     set(properties TIMEOUT 300)
     if(arg_LABELS)
         list(APPEND properties LABELS "${arg_LABELS}")
