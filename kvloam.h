@@ -20,6 +20,7 @@
 #include "board/DS1IntervalValidity.h"
 #include "board/DS1LineDevice.h"
 #include "board/DS1LineFeature.h"
+#include "board/DS1LineImpedance.h"
 #include "board/Ethernet.h"
 #include "board/EthernetFeature.h"
 #include "board/Feature.h"

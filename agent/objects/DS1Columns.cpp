@@ -43,6 +43,8 @@ using Row = LineRow;
 
 constexpr Writable kTraps{Setting::LineStatusChangeTraps, kEnabled, kDisabled};
 
+constexpr Writable kCircuit{Setting::CircuitIdentifier, 0, 255, Characters::Ascii};
+
 constexpr Column<Row> kConfigColumns[] = {
     {"dsx1LineIndex", 1, Integer, index},
     {"dsx1TimeElapsed", 3, Integer, number<&Row::timeElapsed>},
@@ -50,7 +52,7 @@ constexpr Column<Row> kConfigColumns[] = {
     {"dsx1LineType", 5, Integer, number<&Row::lineType>},
     {"dsx1LineCoding", 6, Integer, number<&Row::lineCoding>},
     {"dsx1SendCode", 7, Integer, number<&Row::sendCode>},
-    {"dsx1CircuitIdentifier", 8, Text, text<&Row::circuitIdentifier>},
+    {"dsx1CircuitIdentifier", 8, Text, text<&Row::circuitIdentifier>, kCircuit},
     {"dsx1LoopbackConfig", 9, Integer, number<&Row::loopbackConfig>},
     {"dsx1LineStatus", 10, Integer, number<&Row::lineStatus>},
     {"dsx1SignalMode", 11, Integer, number<&Row::signalMode>},
@@ -65,6 +67,7 @@ constexpr Column<Row> kConfigColumns[] = {
     {"dsx1Channelization", 20, Integer, number<&Row::channelization>},
     {"dsx1LineMode", 21, Integer, number<&Row::lineMode>},
     {"dsx1LineBuildOut", 22, Integer, number<&Row::lineBuildOut>},
+    {"dsx1LineImpedance", 23, Integer, number<&Row::lineImpedance>},
 };
 
 constexpr Column<Row> kCurrentColumns[] = {

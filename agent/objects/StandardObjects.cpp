@@ -44,6 +44,8 @@ std::vector<Table const*> standardTables() {
             &isdnBearerTable(),
             &isdnSignalingTable(),
             &isdnLapdTable(),
+            &dsx0ConfigTable(),
+            &dsx0ChanMappingTable(),
             &dot3StatsTable(),
             &entPhysicalTable(),
             &entAliasMappingTable(),

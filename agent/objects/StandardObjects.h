@@ -14,12 +14,13 @@ namespace kvloamd {
 inline Oid const kStandardArc{1, 3, 6, 1, 2, 1};
 
 /// The places that the agent takes over, relative, and no others below the arc.
-inline std::array<Place, 11> const kStandardPlaces{{
+inline std::array<Place, 12> const kStandardPlaces{{
     {{2, 1}, "ifNumber", HostHas::All},
     {{2, 2}, "ifTable", HostHas::Rows},
     {{10, 7, 2}, "dot3StatsTable", HostHas::Rows},
     {{10, 18}, "DS1-MIB"},
     {{10, 20}, "ISDN-MIB"},
+    {{10, 81}, "DS0-MIB"},
     {{31, 1, 1}, "ifXTable", HostHas::Rows},
     {{31, 1, 2}, "ifStackTable"},
     {{31, 1, 5}, "ifTableLastChange", HostHas::All},
@@ -37,6 +38,8 @@ Table const& dsx1ConfigTable();
 Table const& dsx1CurrentTable();
 Table const& dsx1IntervalTable();
 Table const& dsx1TotalTable();
+Table const& dsx0ConfigTable();
+Table const& dsx0ChanMappingTable();
 Table const& isdnBearerTable();
 Table const& isdnSignalingTable();
 Table const& isdnLapdTable();

@@ -9,9 +9,11 @@
 
 #include "agent/readers/Answers.h"
 #include "agent/readers/BoardFeatures.h"
+#include "agent/readers/LegalValues.h"
 #include "agent/rows/IndexKey.h"
 #include "agent/rows/StandardNumbers.h"
 #include "board/DS1LineFeature.h"
+#include "board/DS1LineImpedance.h"
 #include "board/EthernetFeature.h"
 #include "board/IPInterface.h"
 #include "board/ISDNChannelOnLine.h"
@@ -37,15 +39,15 @@ constexpr int kTypesOfE1[] = {4, 5, 6, 7, 9, 12, 13};
 /// The time slot of an E1 line that usually carries its signalling.
 constexpr int kSignallingSlotOfE1 = 16;
 
-/// The highest isdnBearerChannelNumber.
-constexpr int kHighestBearer = 30;
+/// dsx1LineImpedance.
+constexpr int kImpedanceNotApplicable = 1;
 
 /// The number of a bearer channel among those of its line. An E1 line with `signallingInside` its
 /// bearers leaves out one slot. Nothing if ISDN-MIB has no such number.
 std::optional<int> bearerNumber(std::optional<int> timeSlot, bool signallingInside) {
     if (!timeSlot) return std::nullopt;
     int const number = *timeSlot - (signallingInside && *timeSlot > kSignallingSlotOfE1 ? 1 : 0);
-    return number >= 1 && number <= kHighestBearer ? std::optional(number) : std::nullopt;
+    return legal(kBearerNumbers, number);
 }
 
 /// The largest number of bearer channels that is believed of one signalling channel.
@@ -152,23 +154,28 @@ void Reading::readLine(DS1LineDevice& line) {
     interface.connectorPresent = kTrue;
     row.ifIndex = interface.ifIndex;
     m_found.rows.ports.push_back({row.ifIndex, 0, m_found.keys.back()});
-    row.lineType = unlessNegative(line.GetLineType());
-    row.lineCoding = unlessNegative(line.GetLineCoding());
-    row.sendCode = unlessNegative(line.GetSendCode());
-    row.loopbackConfig = unlessNegative(line.GetLoopbackConfig());
-    row.lineStatus = unlessNegative(line.GetLineStatus());
-    row.signalMode = unlessNegative(line.GetSignalMode());
-    row.transmitClockSource = unlessNegative(line.GetTransmitClockSource());
-    row.fdl = unlessNegative(line.GetFdl());
-    row.lineLength = unlessNegative(line.GetLineLength());
+    row.lineType = legal(kLineTypes, line.GetLineType());
+    row.lineCoding = legal(kLineCodings, line.GetLineCoding());
+    row.sendCode = legal(kSendCodes, line.GetSendCode());
+    row.loopbackConfig = legal(kLoopbackConfigs, line.GetLoopbackConfig());
+    row.lineStatus = legal(kLineStatuses, line.GetLineStatus());
+    row.signalMode = legal(kSignalModes, line.GetSignalMode());
+    row.transmitClockSource = legal(kTransmitClockSources, line.GetTransmitClockSource());
+    row.fdl = legal(kFdls, line.GetFdl());
+    row.lineLength = legal(kLineLengths, line.GetLineLength());
     long const change = line.GetLineStatusLastChange();
     m_found.lineChanges.push_back(change < 0 ? std::nullopt : std::optional(change));
-    row.statusChangeTrapEnable = unlessNegative(line.GetLineStatusChangeTrapEnable());
-    row.loopbackStatus = unlessNegative(line.GetLoopbackStatus());
-    row.ds1ChannelNumber = unlessNegative(line.GetDs1ChannelNumber());
-    row.channelization = unlessNegative(line.GetChannelization());
-    row.lineMode = unlessNegative(line.GetLineMode());
-    row.lineBuildOut = unlessNegative(line.GetLineBuildOut());
+    row.statusChangeTrapEnable = legal(kTrapEnables, line.GetLineStatusChangeTrapEnable());
+    row.loopbackStatus = legal(kLoopbackStatuses, line.GetLoopbackStatus());
+    row.ds1ChannelNumber = legal(kDs1ChannelNumbers, line.GetDs1ChannelNumber());
+    row.channelization = legal(kChannelizations, line.GetChannelization());
+    row.lineMode = legal(kLineModes, line.GetLineMode());
+    row.lineBuildOut = legal(kLineBuildOuts, line.GetLineBuildOut());
+    // DS1-MIB has a number for a line whose impedance is not known.
+    auto* const impedance = dynamic_cast<DS1LineImpedance*>(&line);
+    row.lineImpedance = legal(kLineImpedances, impedance == nullptr ? kImpedanceNotApplicable
+                                                                    : impedance->GetLineImpedance())
+                            .value_or(kImpedanceNotApplicable);
     auto const history = line.GetIntervalTable();
     if (history.get() != nullptr) m_histories.read(history, row);
     m_lines.emplace(name, row.ifIndex);
@@ -191,18 +198,18 @@ Reading::Signalling Reading::readSignalling(ReferenceCounter<ISDNDChannel> handl
     InterfaceRow& interface = enter(IndexKind::SignallingChannel, name);
     SignallingRow row;
     row.ifIndex = interface.ifIndex;
-    row.protocol = unlessNegative(channel.GetProtocol());
+    row.protocol = legal(kSignalingProtocols, channel.GetProtocol());
     row.callingAddress = askText(channel, &ISDNDChannel::GetCallingAddress);
     // A channel may name its line in the place of an address.
     std::uint32_t const named = findLine(row.callingAddress);
     if (named != 0) row.callingAddress.clear();
     std::uint32_t const line = ownLine(channel).value_or(named);
-    row.bearerCount = unlessNegative(channel.GetBChannelCount());
+    row.bearerCount = legal(kBearerCounts, channel.GetBChannelCount());
     interface.description = "signalling channel " + name;
     interface.name = name;
     interface.type = kTypeIsdn;
     interface.connectorPresent = kFalse;
-    if (int const status = channel.GetOperStatus(); status > 0)
+    if (auto const status = legal(kLapdStatuses, channel.GetOperStatus()))
         interface.operStatus = status == ISDNDChannelStatusL2Active ? kUp : kDown;
     Signalling found{std::move(handle), row.ifIndex, line};
     m_found.rows.signalling.push_back(std::move(row));
@@ -219,10 +226,9 @@ std::uint32_t Reading::readLapd(ISDNDChannel& channel) {
     interface.type = kTypeLapd;
     interface.connectorPresent = kFalse;
     interface.speed = kDs0Speed;
-    if (int const status = channel.GetOperStatus(); status > 0) {
-        row.operStatus = status;
-        interface.operStatus = status == ISDNDChannelStatusL2Active ? kUp : kDown;
-    }
+    row.operStatus = legal(kLapdStatuses, channel.GetOperStatus());
+    if (row.operStatus)
+        interface.operStatus = row.operStatus == ISDNDChannelStatusL2Active ? kUp : kDown;
     m_found.rows.lapds.push_back(row);
     return row.ifIndex;
 }
@@ -232,9 +238,9 @@ std::uint32_t Reading::readBearer(ISDNBChannel& channel) {
     InterfaceRow& interface = enter(IndexKind::BearerChannel, name);
     BearerRow row;
     row.ifIndex = interface.ifIndex;
-    row.channelType = unlessNegative(channel.GetChannelType());
-    if (int const status = channel.GetOperStatus(); status > 0) row.operStatus = status;
-    row.timeSlot = unlessNegative(channel.GetChannelNumber());
+    row.channelType = legal(kBearerTypes, channel.GetChannelType());
+    row.operStatus = legal(kBearerStatuses, channel.GetOperStatus());
+    row.timeSlot = legal(kDs0ChannelNumbers, channel.GetChannelNumber());
     interface.description = "bearer channel " + name;
     interface.name = name;
     interface.type = kTypeDs0;
@@ -272,6 +278,8 @@ void Reading::readChannels(ISDNFeature& feature) {
         std::uint32_t const line = said.value_or(countsAgree ? lineOfBearer[i] : 0);
         stack(index, line);
         lines.push_back(line);
+        if (auto const slot = m_found.rows.bearers[firstRow + i].timeSlot; slot && line != 0)
+            m_found.rows.ds0Channels.push_back({line, static_cast<std::uint32_t>(*slot), index});
         if (m_found.rows.bearers[firstRow + i].timeSlot == kSignallingSlotOfE1)
             withSlot16.insert(line);
     }

@@ -87,6 +87,9 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     sortBy(all.interfaces, &InterfaceRow::ifIndex);
     sortBy(all.lines, &LineRow::ifIndex);
     sortBy(all.bearers, &BearerRow::ifIndex);
+    sortBy(all.ds0Channels, &Ds0ChannelRow::index);
+    auto const twice = std::ranges::unique(all.ds0Channels, {}, &Ds0ChannelRow::index);
+    all.ds0Channels.erase(twice.begin(), twice.end());
     sortBy(all.signalling, &SignallingRow::ifIndex);
     sortBy(all.lapds, &LapdRow::ifIndex);
     sortBy(all.ethernets, &EthernetRow::ifIndex);
@@ -124,6 +127,10 @@ void InterfaceReader::append(InterfaceRows& all, BoardInterfaces&& board,
     for (PortRow& port : board.rows.ports)
         port.boardIndex = boardIndex;
     moveRows(all.ports, board.rows.ports, indices);
+    for (Ds0ChannelRow const& row : board.rows.ds0Channels) {
+        Ds0ChannelRow const placed{indices[row.line - 1], row.timeSlot, indices[row.channel - 1]};
+        if (placed.line != 0 && placed.channel != 0) all.ds0Channels.push_back(placed);
+    }
     for (StackRow const& row : board.rows.stack) {
         StackRow const placed{indices[row.higher - 1], indices[row.lower - 1]};
         if (placed.higher != 0 && placed.lower != 0) all.stack.push_back(placed);

@@ -101,6 +101,7 @@ struct LineRow {
     std::optional<int> channelization;
     std::optional<int> lineMode;
     std::optional<int> lineBuildOut;
+    std::optional<int> lineImpedance;
 
     std::optional<int> timeElapsed;                ///< of the running interval, in seconds
     LineCounts running{};                          ///< good when the line keeps a history
@@ -131,6 +132,15 @@ struct SignallingRow {
     std::optional<int> bearerCount;
 
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
+};
+
+/// A time slot of a line and the channel in it.
+struct Ds0ChannelRow {
+    std::uint32_t line = 0; ///< its ifIndex
+    std::uint32_t timeSlot = 0;
+    std::uint32_t channel = 0; ///< its ifIndex
+
+    std::array<std::uint32_t, 2> index() const { return {line, timeSlot}; }
 };
 
 /// The data link (LAPD) below a signalling channel.
@@ -174,6 +184,7 @@ struct InterfaceRows {
     std::vector<StackRow> stack;
     std::vector<LineRow> lines;
     std::vector<BearerRow> bearers;
+    std::vector<Ds0ChannelRow> ds0Channels; ///< no two in one time slot
     std::vector<SignallingRow> signalling;
     std::vector<LapdRow> lapds;
     std::vector<EthernetRow> ethernets;

@@ -20,6 +20,7 @@ enum class Setting : int {
     LineStatusChangeTraps = 1, ///< of a line: 1 enabled, 2 disabled
     LinkUpDownTraps = 2,       ///< of an interface: the same
     InterfaceAlias = 3,        ///< of an interface: a text
+    CircuitIdentifier = 10,    ///< of a line: a text
     EntityAlias = 1000,        ///< of a physical entity: a text, as the next two
     EntityAssetId = 1001,
     EntityUris = 1002

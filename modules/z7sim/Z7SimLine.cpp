@@ -169,8 +169,11 @@ int Z7SimLine::GetSendCode() {
 int Z7SimLine::GetCircuitIdentifier(char* identifier) {
     return copyText(m_setup.circuit, identifier);
 }
+bool Z7SimLine::isLooped() const {
+    return (m_state->status() & DS1LineStatusLoopbackState) != 0;
+}
 int Z7SimLine::GetLoopbackConfig() {
-    return 1; // none asked for
+    return isLooped() ? 3 : 1; // line loop, no loop
 }
 int Z7SimLine::GetLineStatus() {
     return m_state->status();
@@ -202,8 +205,7 @@ int Z7SimLine::SetLineStatusChangeTrapEnable(int enable) {
     return 0;
 }
 int Z7SimLine::GetLoopbackStatus() {
-    bool const looped = (m_state->status() & DS1LineStatusLoopbackState) != 0;
-    return looped ? 4 : 1; // near end line loopback, none
+    return isLooped() ? 4 : 1; // near end line loopback, none
 }
 int Z7SimLine::GetDs1ChannelNumber() {
     return 0; // not part of a DS3

@@ -8,6 +8,7 @@
 #include "LineState.h"
 #include "Z7SimIntervalTable.h"
 #include "board/DS1LineDevice.h"
+#include "board/DS1LineImpedance.h"
 
 /// The kinds of lines, by how many bits they carry.
 enum class LineCarrier { t1, e1, unknown };
@@ -21,6 +22,7 @@ struct LineSetup {
     int coding = 0;
     int length = 0;
     int buildOut = 0;
+    int impedance = 1; ///< dsx1LineImpedance; 1 where it is not known
     int signalMode = 0;
     int clockSource = 0;
     int fdl = 0;
@@ -32,7 +34,7 @@ struct LineSetup {
 
 /// A `Z7SimLine` answers from its set-up, its status and its history; no query waits for the
 /// platform. Thread-safe.
-class Z7SimLine final : public DS1LineDevice {
+class Z7SimLine final : public DS1LineDevice, public DS1LineImpedance {
   public:
     Z7SimLine(LineSetup setup, std::shared_ptr<LineState> state,
               ReferenceCounter<DS1IntervalTable> intervals);
@@ -83,8 +85,12 @@ class Z7SimLine final : public DS1LineDevice {
     int GetChannelization() override;
     int GetLineMode() override;
     int GetLineBuildOut() override;
+    int GetLineImpedance() override { return m_setup.impedance; }
 
   private:
+    /// The platform knows one kind of loopback, that of the line.
+    bool isLooped() const;
+
     LineSetup m_setup;
     std::shared_ptr<LineState> m_state;
     ReferenceCounter<DS1IntervalTable> m_intervals;

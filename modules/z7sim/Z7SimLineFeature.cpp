@@ -47,6 +47,7 @@ LineSetup readSetup(long device, int number) {
     setup.coding = numberAttributeOr(device, "LINE_CODING", usualCoding(setup.carrier()));
     setup.length = numberAttributeOr(device, "LINE_LENGTH", 0);
     setup.buildOut = numberAttributeOr(device, "LINE_BUILD_OUT", 1);  // not applicable
+    setup.impedance = numberAttributeOr(device, "LINE_IMPEDANCE", 1); // not applicable
     setup.clockSource = numberAttributeOr(device, "CLOCK_SOURCE", 1); // loop timing
     setup.fdl = numberAttributeOr(device, "FDL", esf ? 2 : 8);        // ANSI T1.403, none
     std::array<char, kMostChannels> states{};

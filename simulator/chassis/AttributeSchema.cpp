@@ -77,6 +77,7 @@ std::unordered_map<std::string_view, AttributeKind> const& knownAttributes() {
         {"LINE_CODING", number},
         {"LINE_LENGTH", number},
         {"LINE_BUILD_OUT", number},
+        {"LINE_IMPEDANCE", number},
         {"LINE_NUMBER", number},
         {"SIGNAL_MODE", number},
         {"CLOCK_SOURCE", number},
@@ -94,6 +95,16 @@ std::unordered_map<std::string_view, AttributeKind> const& knownAttributes() {
     };
     return known;
 }
+
+/// What DS1-MIB allows for the attributes of lines that have its numbers.
+constexpr std::array<std::pair<std::string_view, LegalNumbers>, 7> kLegalNumbers = {
+    {{"LINE_CODING", {1, 7}},
+     {"LINE_LENGTH", {0, 64000}},
+     {"LINE_BUILD_OUT", {1, 5}},
+     {"LINE_IMPEDANCE", {1, 4}},
+     {"SIGNAL_MODE", {1, 5}},
+     {"CLOCK_SOURCE", {1, 4}},
+     {"FDL", {1, 15}}}};
 
 /// Whether `attribute` is this stem followed by a number.
 bool isNumbered(std::string_view attribute, std::string_view stem) {
@@ -139,6 +150,12 @@ std::string knownNameLike(std::string_view attribute) {
     std::string nearest = nearestWord(attribute, names);
     // NAME2 is another attribute than NAME, not a misspelt one.
     return withoutNumber(nearest) == stem ? std::string() : nearest;
+}
+
+std::optional<LegalNumbers> legalNumbersOf(std::string_view attribute) {
+    for (auto const& [name, numbers] : kLegalNumbers)
+        if (name == attribute) return numbers;
+    return std::nullopt;
 }
 
 bool isLiveAttribute(std::string_view attribute) {

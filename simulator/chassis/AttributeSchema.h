@@ -4,6 +4,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <optional>
 #include <span>
 #include <string>
 #include <string_view>
@@ -33,6 +34,15 @@ AttributeKind kindOf(std::string_view attribute);
 /// The known attribute that an unknown one was probably meant to be; empty when none is near
 /// enough.
 std::string knownNameLike(std::string_view attribute);
+
+/// The numbers from `lowest` to `highest`.
+struct LegalNumbers {
+    std::int32_t lowest;
+    std::int32_t highest;
+};
+
+/// What DS1-MIB allows for an attribute that has one of its numbers; nothing for others.
+std::optional<LegalNumbers> legalNumbersOf(std::string_view attribute);
 
 /// Whether a line or ISDN channels answer the attribute, so that nobody writes it.
 bool isLiveAttribute(std::string_view attribute);

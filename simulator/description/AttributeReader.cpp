@@ -205,8 +205,10 @@ AttributeMap readAttributes(Description const& attributes, Findings& findings) {
     for (auto const& entry : attributes.entries) {
         findings.part([&] {
             refuseUnfitAttribute(entry);
-            map.emplace(entry.key, readAttribute(entry.key, entry.value));
+            auto const [place, added] =
+                map.emplace(entry.key, readAttribute(entry.key, entry.value));
             findings.checkName(entry.key, entry.line);
+            findings.checkNumber(entry.key, place->second, entry.line);
         });
     }
     return map;

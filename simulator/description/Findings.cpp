@@ -41,6 +41,17 @@ void Findings::checkName(std::string const& name, int line) {
                                   found->second + "?"});
 }
 
+void Findings::checkNumber(std::string const& name, AttributeValue const& value, int line) {
+    auto const legal = legalNumbersOf(name);
+    if (!legal || value.form() != ValueForm::number) return;
+    std::int32_t const number = value.asNumber();
+    if (number >= legal->lowest && number <= legal->highest) return;
+    m_warnings.add({line, "warning: " + name + " " + std::to_string(number) +
+                              " is not a value of DS1-MIB, which has " +
+                              std::to_string(legal->lowest) + " to " +
+                              std::to_string(legal->highest) + "; agents leave it out"});
+}
+
 std::vector<std::string> Findings::errors(std::string_view source) const {
     return m_errors.lines(source, "errors");
 }

@@ -9,6 +9,7 @@
 #include <unordered_map>
 #include <vector>
 
+#include "simulator/chassis/AttributeValue.h"
 #include "simulator/chassis/ChassisError.h"
 
 namespace kvlsim {
@@ -37,6 +38,8 @@ class Findings {
     }
     /// Warns of an attribute whose name is unknown but close to a known one.
     void checkName(std::string const& name, int line);
+    /// Warns of a number that the standard does not allow for the attribute.
+    void checkNumber(std::string const& name, AttributeValue const& value, int line);
 
     bool hasErrors() const { return !m_errors.first.empty(); }
 

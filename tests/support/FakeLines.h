@@ -66,6 +66,7 @@ class FakeLine final : public DS1LineDevice {
     FakeLine(std::string name, std::string circuit)
         : m_name(std::move(name)), m_circuit(std::move(circuit)) {}
 
+    int setUp = KVL::kNotSupported; ///< what every query of the line's set-up answers
     int lineType = KVL::kNotSupported;
     int lineStatus = KVL::kNotSupported;
     long statusLastChange = KVL::kNotSupported;
@@ -98,27 +99,27 @@ class FakeLine final : public DS1LineDevice {
     int GetLineIndex() override { return KVL::kNotSupported; }
     ReferenceCounter<DS1IntervalTable> GetIntervalTable() override { return history; }
     int GetLineType() override { return lineType; }
-    int GetLineCoding() override { return KVL::kNotSupported; }
-    int GetSendCode() override { return KVL::kNotSupported; }
+    int GetLineCoding() override { return setUp; }
+    int GetSendCode() override { return setUp; }
     int GetCircuitIdentifier(char* identifier) override { return give(identifier, m_circuit); }
-    int GetLoopbackConfig() override { return KVL::kNotSupported; }
+    int GetLoopbackConfig() override { return setUp; }
     int GetLineStatus() override { return lineStatus; }
-    int GetSignalMode() override { return KVL::kNotSupported; }
+    int GetSignalMode() override { return setUp; }
     int GetPhysAddressString(char* address) override { return give(address, ""); }
-    int GetTransmitClockSource() override { return KVL::kNotSupported; }
-    int GetFdl() override { return KVL::kNotSupported; }
-    int GetLineLength() override { return KVL::kNotSupported; }
+    int GetTransmitClockSource() override { return setUp; }
+    int GetFdl() override { return setUp; }
+    int GetLineLength() override { return setUp; }
     long GetLineStatusLastChange() override { return statusLastChange; }
     int GetLineStatusChangeTrapEnable() override { return trapEnable; }
     int SetLineStatusChangeTrapEnable(int enable) override {
         trapEnable = enable;
         return 0;
     }
-    int GetLoopbackStatus() override { return KVL::kNotSupported; }
-    int GetDs1ChannelNumber() override { return KVL::kNotSupported; }
-    int GetChannelization() override { return KVL::kNotSupported; }
-    int GetLineMode() override { return KVL::kNotSupported; }
-    int GetLineBuildOut() override { return KVL::kNotSupported; }
+    int GetLoopbackStatus() override { return setUp; }
+    int GetDs1ChannelNumber() override { return setUp; }
+    int GetChannelization() override { return setUp; }
+    int GetLineMode() override { return setUp; }
+    int GetLineBuildOut() override { return setUp; }
 
   private:
     static int give(char* answer, std::string const& value) {

@@ -78,6 +78,25 @@ TEST_F(StandardTablesTest, CounterHasItsLow32BitsInTheTableAndAllInTheOther) {
     EXPECT_EQ(find({31, 1, 1, 1, 10, 7}), Lookup::NoSuchInstance); // never told
 }
 
+TEST_F(StandardTablesTest, BearerChannelIsADs0WithoutCodes) {
+    BearerRow bearer;
+    bearer.ifIndex = 7;
+    bearer.timeSlot = 31;
+    m_snapshot.interfaces.bearers = {bearer};
+    EXPECT_EQ(numberAt({10, 81, 1, 1, 1, 7}), 31);
+    EXPECT_EQ(numberAt({10, 81, 1, 1, 2, 7}), 2);
+    EXPECT_EQ(find({10, 81, 1, 1, 3, 7}), Lookup::Found);
+    EXPECT_EQ(m_found.value, Value{std::string_view()});
+    EXPECT_EQ(numberAt({10, 81, 1, 1, 7, 7}), 2);
+    EXPECT_EQ(numberAt({10, 81, 1, 1, 8, 7}), 0);
+}
+
+TEST_F(StandardTablesTest, Ds0IsFoundByLineAndTimeSlot) {
+    m_snapshot.interfaces.ds0Channels = {{5, 1, 70}, {5, 31, 71}, {6, 1, 72}};
+    EXPECT_EQ(numberAt({10, 81, 3, 1, 1, 5, 31}), 71);
+    EXPECT_EQ(next({10, 81, 3, 1, 1, 5, 31}), (Oid{10, 81, 3, 1, 1, 6, 1}));
+}
+
 TEST_F(StandardTablesTest, HighSpeedIsRounded) {
     for (auto const& [speed, rounded] :
          {std::pair{64000U, 0}, {1544000U, 2}, {1499999U, 1}, {4294967295U, 4295}}) {

@@ -91,6 +91,39 @@ TEST_F(BoardInterfacesTest, WhatALineDoesNotSupportIsNotKnown) {
     EXPECT_FALSE(line.keepsHistory());
 }
 
+TEST_F(BoardInterfacesTest, NumbersThatTheStandardDoesNotHaveAreLeftOut) {
+    FakeLine& line = addLine("one");
+    for (int const illegal : {0, 200000, -3}) {
+        line.setUp = line.lineType = line.lineStatus = illegal;
+        LineRow const row = readLine();
+        for (auto const field :
+             {&LineRow::lineType, &LineRow::lineCoding, &LineRow::sendCode,
+              &LineRow::loopbackConfig, &LineRow::lineStatus, &LineRow::signalMode,
+              &LineRow::transmitClockSource, &LineRow::fdl, &LineRow::loopbackStatus,
+              &LineRow::channelization, &LineRow::lineMode, &LineRow::lineBuildOut})
+            EXPECT_EQ(row.*field, std::nullopt) << illegal;
+    }
+    line.setUp = 2;
+    line.lineType = 15; // between the others, and no value
+    EXPECT_EQ(readLine().lineBuildOut, 2);
+    EXPECT_EQ(readLine().lineType, std::nullopt);
+}
+
+TEST_F(BoardInterfacesTest, ImpedanceThatALineDoesNotSayIsNotApplicable) {
+    addLine("one");
+    EXPECT_EQ(readLine().lineImpedance, 1);
+}
+
+TEST_F(BoardInterfacesTest, TimeSlotsOfALineAreMappedToTheirChannels) {
+    FakeLine& line = addLine("one");
+    add(new FakeISDNFeature({}, bearersOn(&line, {1, 31})));
+    auto const rows = read();
+    ASSERT_THAT(rows.ds0Channels, SizeIs(2));
+    EXPECT_EQ(rows.ds0Channels[1].line, 1U);
+    EXPECT_EQ(rows.ds0Channels[1].timeSlot, 31U);
+    EXPECT_EQ(rows.ds0Channels[1].channel, 3U);
+}
+
 TEST_F(BoardInterfacesTest, HistoryIsReadFromTheRunningIntervalBackwards) {
     FakeHistory& history = addHistory(addLine("one"));
     history.close(5);

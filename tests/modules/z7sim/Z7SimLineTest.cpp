@@ -80,6 +80,20 @@ TEST_F(Z7SimLineTest, WhatTheChassisSaysOfTheSetUpIsAnswered) {
     EXPECT_EQ(m_line->GetFdl(), 1);
 }
 
+TEST_F(Z7SimLineTest, ImpedanceIsThatOfTheChassis) {
+    plugIn("type: e1-crc", "LINE_IMPEDANCE: 4");
+    auto* const known = dynamic_cast<DS1LineImpedance*>(m_line.get());
+    ASSERT_NE(known, nullptr);
+    EXPECT_EQ(known->GetLineImpedance(), 4);
+}
+
+TEST_F(Z7SimLineTest, ImpedanceThatIsNotSaidIsNotApplicable) {
+    plugIn("type: e1-crc", "");
+    auto* const unknown = dynamic_cast<DS1LineImpedance*>(m_line.get());
+    ASSERT_NE(unknown, nullptr);
+    EXPECT_EQ(unknown->GetLineImpedance(), 1);
+}
+
 TEST_F(Z7SimLineTest, AnInterfaceOfTypeDs1AnswersItsSpeedAndNoPackets) {
     plugIn("type: e1", "NAME: span-1, CIRCUIT: E1-0007");
     std::string description;
@@ -257,6 +271,7 @@ TEST_F(Z7SimLineTest, OtherAlarmsShowInTheStatusAtOnce) {
     EXPECT_EQ(status(), DS1LineStatusRcvFarEndLOF | DS1LineStatusLoopbackState);
     EXPECT_EQ(m_line->GetOperStatus(), 1);
     EXPECT_EQ(m_line->GetLoopbackStatus(), 4);
+    EXPECT_EQ(m_line->GetLoopbackConfig(), 3);
     alarm("sending-rai");
     tick();
     EXPECT_EQ(status(),

@@ -43,6 +43,17 @@ TEST(ChassisFindingsTest, MisspeltAttributesAreWarnedOfWithTheNameMeant) {
                             "IP_ADDRESS_3?"));
 }
 
+TEST(ChassisFindingsTest, NumbersThatTheStandardDoesNotHaveAreWarnedOf) {
+    EXPECT_THAT(warningsOf("      LINE_BUILD_OUT: 0\n      LINE_CODING: 8\n      FDL: 15\n"
+                           "      LINE_LENGTH: -1\n      LINE_IMPEDANCE: 4\n"),
+                ElementsAre("f:5: warning: LINE_BUILD_OUT 0 is not a value of DS1-MIB, which has "
+                            "1 to 5; agents leave it out",
+                            "f:6: warning: LINE_CODING 8 is not a value of DS1-MIB, which has 1 to "
+                            "7; agents leave it out",
+                            "f:8: warning: LINE_LENGTH -1 is not a value of DS1-MIB, which has 0 "
+                            "to 64000; agents leave it out"));
+}
+
 TEST(ChassisFindingsTest, OtherUnknownAttributesAreNotWarnedOf) {
     EXPECT_THAT(warningsOf("      COLOUR: red\n      NAME2: X\n      IRQ7: 1\n      A: 1\n"
                            "      FIRMWARE_NAME2: X\n      IP_ADDRESS_12: 127.0.0.1\n"),

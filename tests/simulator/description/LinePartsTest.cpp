@@ -211,7 +211,7 @@ TEST(LinePartsTest, LineAndChannelsAreWrittenAsTheyAreRead) {
 TEST(LinePartsTest, AttributesOfLinesAndInterfacesHaveTheirKinds) {
     Chassis const chassis = readChassis(
         withDevice("attributes: {CIRCUIT: T1-0001, LINE_CODING: 2, LINE_LENGTH: 40, "
-                   "LINE_BUILD_OUT: 0, SIGNAL_MODE: 2, CLOCK_SOURCE: 1, FDL: 2, LINE_NUMBER: 1, "
+                   "LINE_BUILD_OUT: 5, SIGNAL_MODE: 2, CLOCK_SOURCE: 1, FDL: 2, LINE_NUMBER: 1, "
                    "ETHERNET_SPEED: 100000000, IP_ADDRESS_0: 192.0.2.10}"));
     EXPECT_EQ(chassis.find(2)->attribute("IP_ADDRESS_0")->asText(), "192.0.2.10");
     for (char const* text : {"CIRCUIT", "ETHERNET_DEVICE", "ETHERNET_ADDRESS", "IP_ADDRESS_1",
