@@ -41,10 +41,12 @@ int takeRequest(int operation, netsnmp_session* session, int request, netsnmp_pd
 }
 
 /// Encodes a message whose response PDU has been made to fit. The library would try again and again
-/// to shorten one that does not.
+/// to shorten one that does not; and the encoder that it chooses for a GETBULK whose response it has
+/// shortened itself writes past the end of its buffer.
 int buildMessage(netsnmp_session* session, netsnmp_pdu* pdu, u_char** packet, size_t* size,
                  size_t* length) {
     if (pdu->command == SNMP_MSG_RESPONSE) fitResponse(*pdu, askedCommand == SNMP_MSG_GETBULK);
+    pdu->flags &= ~static_cast<u_long>(UCD_MSG_FLAG_FORWARD_ENCODE | UCD_MSG_FLAG_BULK_TOOBIG);
     int const result = snmp_build(packet, size, length, session, pdu);
     // The library encodes from the end of the buffer, but expects our message at its beginning.
     if (result == 0) std::memmove(*packet, *packet + *size - *length, *length);
