@@ -32,6 +32,12 @@ struct Notification {
     Clock::time_point when; ///< the time of the event
 };
 
+/// What became of a notification that was handed over.
+enum class Delivery {
+    Sent,   ///< to every receiver
+    Dropped ///< at least one receiver does not get it
+};
+
 /// Makes a kvlBoardStatusChange. `enterprise`: the arc above KVL-OAM-MIB.
 Notification boardStatusNotification(Oid const& enterprise, int boardIndex,
                                      std::string serialNumber, int status);

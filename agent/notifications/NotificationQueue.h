@@ -38,14 +38,15 @@ class NotificationQueue {
         return m_notifications.front();
     }
 
-    /// Removes the oldest notification and counts it as sent; nothing when the queue is empty.
-    /// Requires that only one thread consumes.
-    std::optional<Notification> pop() {
+    /// Removes the oldest notification and counts it as `delivery` says; nothing when the queue is
+    /// empty. Requires that only one thread consumes.
+    std::optional<Notification> pop(Delivery delivery = Delivery::Sent) {
         std::scoped_lock const guard(m_mutex);
         if (m_notifications.empty()) return std::nullopt;
         Notification notification = std::move(m_notifications.front());
         m_notifications.pop_front();
-        ++m_counters.notificationsSent;
+        ++(delivery == Delivery::Sent ? m_counters.notificationsSent
+                                      : m_counters.notificationsDropped);
         countWaiting();
         return notification;
     }

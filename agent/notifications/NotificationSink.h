@@ -8,7 +8,9 @@
 
 namespace kvloamd {
 
-/// Thread-bound: the SNMP thread.
+using Delivered = std::function<void(Delivery)>;
+
+/// A `NotificationSink` takes notifications. Thread-bound: the SNMP thread.
 class NotificationSink {
   public:
     virtual ~NotificationSink() = default;
@@ -16,9 +18,9 @@ class NotificationSink {
     /// Whether `send` may be called now.
     virtual bool ready() const = 0;
     /// Sends a notification. Calls `delivered`, during this call or later, when the notification
-    /// has been handed over and need not be sent again. If the connection is lost before,
-    /// `delivered` is never called, and the caller sends the notification again.
-    virtual void send(Notification const& notification, std::function<void()> delivered) = 0;
+    /// has been handed over, or given up, and is not to be sent again. If the connection is lost
+    /// before, `delivered` is never called, and the caller sends the notification again.
+    virtual void send(Notification const& notification, Delivered delivered) = 0;
 };
 
 } // namespace kvloamd

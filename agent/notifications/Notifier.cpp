@@ -22,7 +22,7 @@ bool Notifier::sendAll() {
 }
 
 void Notifier::handOver(Notification const& notification) {
-    m_sink.send(notification, [this] { m_queue.pop(); });
+    m_sink.send(notification, [this](Delivery delivery) { m_queue.pop(delivery); });
 }
 
 } // namespace kvloamd

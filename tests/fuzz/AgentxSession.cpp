@@ -112,7 +112,8 @@ class Encounter {
             break;
         case 6:
             if (m_session->ready())
-                m_session->send({joined(kSampleEnterprise, kFaultRaisedPlace), {}, {}}, [] {});
+                m_session->send({joined(kSampleEnterprise, kFaultRaisedPlace), {}, {}},
+                                [](Delivery) {});
             break;
         default: // other interfaces than before
             Snapshot changed;

@@ -60,7 +60,8 @@ AgentxSession::AgentxSession(AgentxAddress address, std::vector<AgentxRoot> root
       m_roots(std::move(roots)),
       m_rows(rows),
       m_answer(std::move(answer)),
-      m_pace(pace) {
+      m_pace(pace),
+      m_pause(pace.retry) {
     connectNow();
 }
 
@@ -124,7 +125,7 @@ void AgentxSession::expireRequests() {
             std::string const line = "the SNMP master does not answer a notification; continuing "
                                      "with the next one";
             if (m_repeats.passes(line, now)) log(LogLevel::Warning, line);
-            std::exchange(m_taken, nullptr)();
+            std::exchange(m_delivered, nullptr)(Delivery::Dropped);
         } else if (kind == AgentxKind::Register || kind == AgentxKind::Unregister) {
             m_rows.refused("it does not answer");
         }
@@ -217,12 +218,12 @@ void AgentxSession::takeRegistered(std::size_t root, AgentxFault fault) {
     registerRows();
 }
 
-void AgentxSession::send(Notification const& notification, std::function<void()> taken) {
+void AgentxSession::send(Notification const& notification, Delivered delivered) {
     AgentxWriter packet = request(AgentxKind::Notify);
     packet.variable(kSnmpTrapOid, ValueType::ObjectId, NameView{notification.name});
     for (NotifiedObject const& object : notification.objects)
         packet.variable(object.name, object.type, object.view());
-    m_taken = std::move(taken);
+    m_delivered = std::move(delivered);
     queue(packet.take());
 }
 
@@ -244,7 +245,7 @@ void AgentxSession::flush() {
         if (sent < 0) {
             if (errno == EINTR) continue;
             if (errno != EAGAIN) return drop(std::strerror(errno));
-            if (m_out.size() > kMaxUnread) drop("it does not read our answers");
+            if (m_out.size() > kMaxUnread) dropMisbehaving("it does not read our answers");
             return;
         }
         m_out.erase(0, static_cast<std::size_t>(sent));
@@ -271,7 +272,7 @@ void AgentxSession::receive() {
             if (m_socket < 0) return;
         }
     } catch (AgentxError const& error) {
-        drop(std::string("it has sent ") + error.what());
+        dropMisbehaving(std::string("it has sent ") + error.what());
     }
 }
 
@@ -282,7 +283,7 @@ void AgentxSession::takePacket(AgentxHeader const& header, std::string_view payl
     } else if (header.kind == AgentxKind::Close) {
         drop("it has closed the session");
     } else if (header.session != m_session) {
-        drop("it has sent a packet of another session");
+        dropMisbehaving("it has sent a packet of another session");
     } else if (std::string answer = m_answer(header, payload); !answer.empty()) {
         queue(std::move(answer));
     }
@@ -311,14 +312,15 @@ void AgentxSession::takeResponse(AgentxHeader const& header, std::string_view pa
         takeRegistered(root, fault);
         break;
     case AgentxKind::Notify:
-        // The master would refuse it again.
+        // The master would refuse a refused one again.
         if (fault != AgentxFault::None) {
             std::string const line = "the SNMP master refuses a notification: " + nameOf(fault);
             if (m_repeats.passes(line, Clock::now())) log(LogLevel::Warning, line);
         }
         // An expired one has been given up.
-        if (!m_taken) break;
-        std::exchange(m_taken, nullptr)();
+        if (!m_delivered) break;
+        std::exchange(m_delivered,
+                      nullptr)(fault == AgentxFault::None ? Delivery::Sent : Delivery::Dropped);
         break;
     default:
         break;
@@ -326,9 +328,23 @@ void AgentxSession::takeResponse(AgentxHeader const& header, std::string_view pa
 }
 
 void AgentxSession::drop(std::string const& why) {
+    m_retryAt = Clock::now() + nextPause(false);
     disconnect();
-    m_retryAt = Clock::now() + m_pace.retry;
     tellLost(why);
+}
+
+void AgentxSession::dropMisbehaving(std::string const& why) {
+    m_retryAt = Clock::now() + nextPause(true);
+    disconnect();
+    tellLost(why);
+}
+
+std::chrono::milliseconds AgentxSession::nextPause(bool misbehaves) {
+    bool const wasSteady = isConnected() && Clock::now() >= m_connectedAt + m_pace.steady;
+    if (wasSteady) m_pause = m_pace.retry;
+    // One that is away, or refuses, is asked at the usual pace.
+    if (!misbehaves && (!isConnected() || wasSteady)) return m_pace.retry;
+    return std::exchange(m_pause, std::min(2 * m_pause, m_pace.longestRetry));
 }
 
 void AgentxSession::disconnect() {
@@ -337,7 +353,7 @@ void AgentxSession::disconnect() {
     m_stage = Stage::Away;
     m_session = 0;
     m_awaited.clear();
-    m_taken = nullptr;
+    m_delivered = nullptr;
     m_in.clear();
     m_out.clear();
 }
@@ -345,6 +361,7 @@ void AgentxSession::disconnect() {
 void AgentxSession::tellConnected() {
     if (m_told == Told::Connected) return;
     m_told = Told::Connected;
+    m_connectedAt = Clock::now();
     log(LogLevel::Info, "connected to the SNMP master at " + m_address.text);
 }
 

@@ -26,6 +26,10 @@ struct AgentxPace {
     /// Without a response, then the session reconnects. Long, so that a master that hangs and
     /// recovers finds everything in place.
     std::chrono::milliseconds surrender{60000};
+    /// The longest pause before the agent connects again to a master that misbehaves.
+    std::chrono::milliseconds longestRetry{60000};
+    /// A connection that lasts so long ends such pauses.
+    std::chrono::milliseconds steady{60000};
 };
 
 /// A subtree that the agent registers.
@@ -36,8 +40,10 @@ struct AgentxRoot {
 };
 
 /// An `AgentxSession` is the connection to a master. It connects again whenever it is lost, and
-/// logs one line for each change of state. It never blocks: its owner waits for the descriptor and
-/// the deadline, and calls `advance`. Thread-bound to the SNMP thread.
+/// logs one line for each change of state. The pause before that doubles each time that the master
+/// has sent something malformed, or that the connection has lasted only for a short time, so that
+/// such a master causes neither load nor many log lines. It never blocks: its owner waits for the
+/// descriptor and the deadline, and calls `advance`. Thread-bound to the SNMP thread.
 class AgentxSession final : public NotificationSink {
   public:
     /// Returns the response to a request of the master, empty if there is none. May throw
@@ -77,8 +83,8 @@ class AgentxSession final : public NotificationSink {
     /// Nothing before the first response.
     std::optional<MasterTime> const& masterTime() const { return m_masterTime; }
 
-    bool ready() const override { return isConnected() && !m_taken; }
-    void send(Notification const& notification, std::function<void()> taken) override;
+    bool ready() const override { return isConnected() && !m_delivered; }
+    void send(Notification const& notification, Delivered delivered) override;
 
   private:
     enum class Told { Nothing, Connected, Lost };
@@ -107,6 +113,10 @@ class AgentxSession final : public NotificationSink {
     void flush();
     /// Closes the connection and schedules the next attempt.
     void drop(std::string const& why);
+    /// The same for a master that does not follow the protocol.
+    void dropMisbehaving(std::string const& why);
+    /// The pause before the next attempt to connect.
+    std::chrono::milliseconds nextPause(bool misbehaves);
     void disconnect();
     void tellConnected();
     void tellLost(std::string const& why);
@@ -126,10 +136,12 @@ class AgentxSession final : public NotificationSink {
     std::vector<Awaited> m_awaited;
     std::optional<MasterTime> m_masterTime;
     std::vector<std::string> m_refused; ///< roots whose refusal has been logged
-    std::function<void()> m_taken;      ///< set while a notification awaits its response
+    Delivered m_delivered;              ///< set while a notification awaits its response
     Clock::time_point m_retryAt;        ///< while away
-    Clock::time_point m_heard;          ///< the master's last word, or when it was asked after that
-    RepeatFilter m_repeats;             ///< of lines about notifications
+    std::chrono::milliseconds m_pause;  ///< before connecting to a master that misbehaves
+    Clock::time_point m_connectedAt;
+    Clock::time_point m_heard; ///< the master's last word, or when it was asked after that
+    RepeatFilter m_repeats;    ///< of lines about notifications
     std::string m_in;
     std::string m_out;
 };

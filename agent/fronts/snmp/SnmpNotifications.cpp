@@ -30,14 +30,14 @@ void SnmpNotifications::sendStart() {
     send_easy_trap(SNMP_TRAP_COLDSTART, 0);
 }
 
-void SnmpNotifications::send(Notification const& notification, std::function<void()> taken) {
+void SnmpNotifications::send(Notification const& notification, Delivered delivered) {
     netsnmp_variable_list* variables = nullptr;
     addVariable(variables, kSnmpTrapOid, ValueType::ObjectId, NameView{notification.name});
     for (NotifiedObject const& object : notification.objects)
         addVariable(variables, object.name, object.type, object.view());
     send_v2trap(variables);
     snmp_free_varbind(variables);
-    taken();
+    delivered(Delivery::Sent);
 }
 
 } // namespace kvloamd

@@ -14,7 +14,7 @@ class SnmpNotifications final : public NotificationSink {
     static void sendStart();
 
     bool ready() const override { return true; }
-    void send(Notification const& notification, std::function<void()> taken) override;
+    void send(Notification const& notification, Delivered delivered) override;
 };
 
 } // namespace kvloamd

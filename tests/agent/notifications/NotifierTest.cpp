@@ -10,10 +10,10 @@ namespace {
 class ScriptedSink final : public NotificationSink {
   public:
     bool ready() const override { return isReady; }
-    void send(Notification const& notification, std::function<void()> taken) override {
+    void send(Notification const& notification, Delivered taken) override {
         sent.push_back(notification.name.back());
         if (takesAtOnce)
-            taken();
+            taken(Delivery::Sent);
         else
             isReady = false;
         underWay = std::move(taken);
@@ -21,7 +21,7 @@ class ScriptedSink final : public NotificationSink {
 
     bool isReady = true;
     bool takesAtOnce = true;
-    std::function<void()> underWay;
+    Delivered underWay;
     std::vector<std::uint32_t> sent;
 };
 
@@ -60,7 +60,7 @@ TEST_F(NotifierTest, ChangeStaysUntilItIsTaken) {
     announceShown();
     EXPECT_EQ(m_sink.sent, (std::vector<std::uint32_t>{1}));
     EXPECT_EQ(m_queue.size(), 2U);
-    m_sink.underWay();
+    m_sink.underWay(Delivery::Sent);
     EXPECT_EQ(m_queue.size(), 1U);
     m_sink.isReady = true;
     announceShown();
@@ -75,6 +75,16 @@ TEST_F(NotifierTest, ChangeThatWasLostOnItsWayIsSentAgain) {
     announceShown();
     EXPECT_EQ(m_sink.sent, (std::vector<std::uint32_t>{1, 1}));
     EXPECT_EQ(m_queue.size(), 1U);
+}
+
+TEST_F(NotifierTest, ChangeThatIsGivenUpCountsAsDropped) {
+    m_sink.takesAtOnce = false;
+    change(1);
+    announceShown();
+    m_sink.underWay(Delivery::Dropped);
+    EXPECT_EQ(m_queue.size(), 0U);
+    EXPECT_EQ(m_counters.notificationsSent, 0U);
+    EXPECT_EQ(m_counters.notificationsDropped, 1U);
 }
 
 TEST_F(NotifierTest, NothingIsSentWhileTheSinkIsNotReady) {

@@ -160,7 +160,9 @@ class AgentxSessionFixture : public ::testing::Test {
         EXPECT_TRUE(runUntil([this] { return m_session->isConnected(); }));
     }
     void notify() {
-        m_session->send({{1, 3, 6, 1, 4, 1, 32473, 1, 0, 1}, {}, {}}, [this] { ++m_taken; });
+        m_session->send({{1, 3, 6, 1, 4, 1, 32473, 1, 0, 1}, {}, {}}, [this](Delivery delivery) {
+            ++(delivery == Delivery::Sent ? m_taken : m_dropped);
+        });
     }
 
     std::string path() const { return m_folder + "/master"; }
@@ -216,6 +218,7 @@ class AgentxSessionFixture : public ::testing::Test {
     std::optional<ScriptedMaster> m_master;
     std::optional<AgentxSession> m_session;
     int m_taken = 0;
+    int m_dropped = 0;
 };
 
 } // namespace kvloamd

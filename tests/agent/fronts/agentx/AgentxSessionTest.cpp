@@ -139,7 +139,7 @@ TEST_F(AgentxSessionTest, NotificationCarriesValuesOfEveryType) {
                       {name, ValueType::Octets, bits},
                       {name, ValueType::ObjectId, kOtherRoot}},
                      Clock::now()},
-                    [] {});
+                    [](Delivery) {});
     Packet const packet = next();
     AgentxReader reader(packet.payload, true);
     auto const head = [&](unsigned type, Oid const& of) {
@@ -206,13 +206,14 @@ TEST_F(AgentxSessionTest, MasterThatWasNeverConnectedIsNotLost) {
     EXPECT_EQ(m_session->timesLost(), 0U);
 }
 
-TEST_F(AgentxSessionTest, RefusedNotificationIsNotSentAgain) {
+TEST_F(AgentxSessionTest, RefusedNotificationIsDropped) {
     startMaster();
     startSession();
     connectSession();
     notify();
     m_master->respond(next(), AgentxFault::ParseError);
-    EXPECT_TRUE(runUntil([this] { return m_taken == 1; }));
+    EXPECT_TRUE(runUntil([this] { return m_dropped == 1; }));
+    EXPECT_EQ(m_taken, 0);
     EXPECT_TRUE(m_session->isConnected());
 }
 
@@ -254,13 +255,56 @@ TEST_F(AgentxSessionTest, NotificationThatIsNeverAnsweredDoesNotBlockTheNext) {
     EXPECT_TRUE(runUntil([this] {
         m_master->say(AgentxWriter(AgentxKind::TestSet, 77, 5, 6).take());
         m_master->receive();
-        return m_taken == 1;
+        return m_dropped == 1;
     }));
+    EXPECT_EQ(m_taken, 0);
     EXPECT_TRUE(runUntil([this] {
         m_master->say(AgentxWriter(AgentxKind::TestSet, 77, 5, 6).take());
         m_master->receive();
         return m_session->ready();
     }));
+}
+
+TEST_F(AgentxSessionTest, MasterThatMisbehavesIsConnectedToEverMoreSlowly) {
+    startMaster();
+    AgentxPace pace = patient();
+    pace.retry = milliseconds(4);
+    pace.longestRetry = milliseconds(16);
+    startSession(pace);
+    for (int const expected : {4, 8, 16, 16}) {
+        connectSession();
+        auto const before = Clock::now();
+        m_master->say(std::string(40, 'x'));
+        EXPECT_TRUE(runUntil([this] { return m_master->isLeft(); }));
+        EXPECT_GE(m_session->deadline(), before + milliseconds(expected));
+        EXPECT_LE(m_session->deadline(), Clock::now() + milliseconds(expected));
+        m_master->hangUp();
+    }
+}
+
+TEST_F(AgentxSessionTest, MasterThatLeavesAtOnceIsConnectedToEverMoreSlowly) {
+    startMaster();
+    startSession();
+    for (int const expected : {1, 2, 4, 8}) {
+        connectSession();
+        auto const before = Clock::now();
+        m_master->hangUp();
+        EXPECT_TRUE(runUntil([this] { return !m_session->isConnected(); }));
+        EXPECT_GE(m_session->deadline(), before + milliseconds(expected));
+    }
+}
+
+TEST_F(AgentxSessionTest, SteadyConnectionEndsTheLongPauses) {
+    startMaster();
+    AgentxPace pace = patient();
+    pace.steady = milliseconds(0);
+    startSession(pace);
+    for (int round = 0; round < 4; ++round) {
+        connectSession();
+        m_master->hangUp();
+        EXPECT_TRUE(runUntil([this] { return !m_session->isConnected(); }));
+        EXPECT_LE(m_session->deadline(), Clock::now() + pace.retry);
+    }
 }
 
 TEST_F(AgentxSessionTest, PacketOfAnotherSessionEndsTheConnection) {
