@@ -3,9 +3,7 @@
 
 #include <algorithm>
 #include <cerrno>
-#include <cstdlib>
 #include <ctime>
-#include <filesystem>
 #include <memory>
 #include <new>
 #include <optional>
@@ -13,15 +11,15 @@
 #include <system_error>
 #include <utility>
 
-#include "access/DeviceMapperIf.h"
-#include "access/ExternalEventAdaptor.h"
 #include "access/ExternalFaultEventAdaptor.h"
+#include "agent/daemon/ConfigCheck.h"
 #include "agent/daemon/FrontChoice.h"
 #include "agent/daemon/InterruptibleStart.h"
 #include "agent/daemon/ModuleLoader.h"
+#include "agent/daemon/Platform.h"
 #include "agent/daemon/ServiceNotice.h"
 #include "agent/daemon/Signals.h"
-#include "agent/daemon/Wakeup.h"
+#include "agent/fronts/Wakeup.h"
 #include "agent/log/Log.h"
 #include "agent/notifications/EntityNotices.h"
 #include "agent/notifications/FaultListener.h"
@@ -73,28 +71,6 @@ struct Boards {
     LineListener lines{*manager.get(), settings, queue, counters};
     FaultListener faultListener;
 };
-
-/// Asks the platform for its root object. Returns whether it answered.
-bool rootObjectAnswers() {
-    DeviceMapperClient* const client = DeviceMapperIf::get_interface()->GetDMClient();
-    long root = -1;
-    int const result = client == nullptr ? -1 : client->GetRootObject(&root);
-    if (result == 0) return true;
-    log(LogLevel::Error, "the board platform does not answer: its device mapper gives no root "
-                         "object (result " +
-                             std::to_string(result) + "); check that the platform runs");
-    return false;
-}
-
-/// Creates the library's singletons, whose first calls must come from one thread. Returns whether
-/// the platform answers.
-bool platformAnswers() {
-    ReferenceTable::get_instance();
-    if (!rootObjectAnswers()) return false;
-    ExternalEventAdaptor::get_instance();
-    ExternalFaultEventAdaptor::get_instance();
-    return true;
-}
 
 /// Creates the library's scheduler, which ticks the history of every line. Returns whether the
 /// system gave it a thread.
@@ -152,39 +128,6 @@ class ListeningScope {
     Boards& m_boards;
 };
 
-/// A directory that exists for a scope.
-class TemporaryFolder {
-  public:
-    TemporaryFolder() {
-        m_path = (std::filesystem::temp_directory_path() / "kvloamd-XXXXXX").string();
-        if (mkdtemp(m_path.data()) == nullptr)
-            throw std::system_error(errno, std::generic_category(), m_path);
-    }
-    ~TemporaryFolder() {
-        std::error_code ignored;
-        std::filesystem::remove_all(m_path, ignored);
-    }
-    TemporaryFolder(TemporaryFolder const&) = delete;
-    TemporaryFolder& operator=(TemporaryFolder const&) = delete;
-
-    std::string const& path() const { return m_path; }
-
-  private:
-    std::string m_path;
-};
-
-bool checkSnmpConfig(Options const& options) {
-    // The SNMP library writes its state while it runs; a check must not leave any.
-    TemporaryFolder const folder;
-    Options withoutTrace = options;
-    withoutTrace.persistentDirectory = folder.path();
-    std::vector<std::string> const faults = startSnmp(snmpFiles(withoutTrace));
-    for (std::string const& fault : faults)
-        log(LogLevel::Error, fault);
-    stopSnmp();
-    return faults.empty();
-}
-
 using Deadline = std::optional<Clock::time_point>;
 
 Deadline earliest(Deadline const& one, Deadline const& other) {
@@ -193,7 +136,7 @@ Deadline earliest(Deadline const& one, Deadline const& other) {
 
 /// Reads the options again and applies those that can change while the agent runs. The others need
 /// a restart.
-void reload(Options const& started, ReadOptions const& readAgain) {
+void reloadOptions(Options const& started, ReadOptions const& readAgain) {
     auto const read = readAgain();
     auto const* const options = std::get_if<Options>(&read);
     if (options == nullptr) {
@@ -206,9 +149,21 @@ void reload(Options const& started, ReadOptions const& readAgain) {
     log(LogLevel::Info, now == started ? "the configuration has been read again"
                                        : "the configuration has been read again; changes other "
                                          "than the log level take effect at the next start");
-    if (started.agentx.empty())
-        log(LogLevel::Info, "the SNMP configuration (communities, users, views, receivers) was not "
-                            "read again; restart the agent to apply changes to it");
+}
+
+/// Reads the SNMP configuration again, of which a check has found `fault`.
+void reloadSnmp(Front& front, std::string const& fault) {
+    if (!fault.empty()) {
+        log(LogLevel::Error, fault + "; keeping the previous SNMP configuration");
+        return;
+    }
+    std::vector<std::string> const faults = front.readConfigurationAgain();
+    // The file has changed since the check.
+    for (std::string const& each : faults)
+        log(LogLevel::Error, each);
+    if (faults.empty())
+        log(LogLevel::Info, "the SNMP configuration (communities, users, views, receivers) has "
+                            "been read again");
 }
 
 /// Flushes pending notifications, waiting at most `kFlushTime`.
@@ -290,13 +245,23 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     std::string const serving =
         "serving " + std::to_string(collector.newest()->boards.size()) + " boards " + front.place();
     front.watch(wakeup.descriptor(), [&] { wakeup.clear(); });
+    ConfigCheck configCheck(options);
     front.watch(signals.descriptor(), [&] {
         while (auto const signal = signals.next()) {
             if (*signal == Signal::Stop) return front.stop();
             notice.reloading();
-            reload(options, readAgain);
-            notice.ready(serving);
+            reloadOptions(options, readAgain);
+            if (options.agentx.empty())
+                configCheck.start();
+            else
+                notice.ready(serving);
         }
+    });
+    front.watch(configCheck.descriptor(), [&] {
+        auto const fault = configCheck.take();
+        if (!fault) return;
+        reloadSnmp(front, *fault);
+        notice.ready(serving);
     });
     front.beforeSleep([&] {
         if (boards.settings.hasUnsaved()) collector.renew();
@@ -369,23 +334,6 @@ int runDaemon(Options const& options, ReadOptions const& readAgain) {
         return kExitFailure;
     }
     return 0;
-}
-
-int checkConfiguration(Options const& options) {
-    // Reads the description of a simulated platform, for example.
-    bool good = rootObjectAnswers();
-    for (std::string const& name : options.modules) {
-        try {
-            LoadedModule(name, options.moduleDirectory);
-        } catch (ModuleError const& error) {
-            log(LogLevel::Error, error.what());
-            good = false;
-        }
-    }
-    // A subagent's access control is the master's.
-    if (options.agentx.empty()) good = checkSnmpConfig(options) && good;
-    if (good) log(LogLevel::Info, "the configuration is valid");
-    return good ? 0 : kExitFailure;
 }
 
 } // namespace kvloamd

@@ -17,8 +17,4 @@ using ReadOptions = std::function<std::variant<Options, Exit>()>;
 /// once, on the main thread, before any other thread is started.
 int runDaemon(Options const& options, ReadOptions const& readAgain);
 
-/// Checks modules and configuration without starting the agent. Returns the exit status; errors
-/// have been logged.
-int checkConfiguration(Options const& options);
-
 } // namespace kvloamd

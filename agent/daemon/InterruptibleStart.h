@@ -5,7 +5,7 @@
 #include <thread>
 
 #include "agent/daemon/Signals.h"
-#include "agent/daemon/Wakeup.h"
+#include "agent/fronts/Wakeup.h"
 
 namespace kvloamd {
 

@@ -190,6 +190,7 @@ std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
     app.add_flag("--check-config", options.checkConfig,
                  "Check options, modules and configuration, then exit")
         ->configurable(false);
+    app.add_flag("--check-snmp-config", options.checkSnmpConfig)->configurable(false)->group("");
     app.set_config("--config", "", "Read options from this file, as in module=[\"z7sim\"]")
         ->type_name("FILE");
     app.allow_config_extras(CLI::config_extras_mode::error);

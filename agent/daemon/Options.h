@@ -23,6 +23,7 @@ struct Options {
     std::uint32_t interfaceBase = 1000;
     LogLevel logLevel = LogLevel::Info;
     bool checkConfig = false;
+    bool checkSnmpConfig = false; ///< check only what a reload reads; for the agent itself
 
     bool operator==(Options const&) const = default;
 };

@@ -4,6 +4,7 @@
 #include <exception>
 #include <string>
 
+#include "agent/daemon/Check.h"
 #include "agent/daemon/Daemon.h"
 #include "agent/daemon/Options.h"
 #include "agent/log/Log.h"
@@ -21,6 +22,7 @@ int main(int argc, char** argv) {
         }
         auto const& options = std::get<Options>(parsed);
         setLogLevel(options.logLevel);
+        if (options.checkSnmpConfig) return checkSnmpConfiguration(options);
         if (options.checkConfig) return checkConfiguration(options);
         return runDaemon(options, [=] { return parseOptions(argc, argv); });
     } catch (std::exception const& error) {

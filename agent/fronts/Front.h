@@ -41,6 +41,9 @@ class Front {
     virtual bool open() = 0;
     /// Answers requests from now on, while `run` runs. Throws std::runtime_error.
     virtual void serve(Served served) = 0;
+    /// Reads the configuration of access and notification receivers again, if the front has one.
+    /// Returns its errors, one line for each; the rest of it is in effect. After `serve`.
+    virtual std::vector<std::string> readConfigurationAgain() { return {}; }
     /// Where clients reach the agent, for a message: "on udp:127.0.0.1:1161".
     virtual std::string place() const = 0;
     /// Valid after `serve`.

@@ -79,10 +79,16 @@ StateDirectory::StateDirectory(std::string const& path) {
     if (path.empty()) return;
     std::string const directory = withoutSlash(path);
     makeDirectory(directory);
+    check(directory);
+    lock(directory + "/kvloamd.lock");
+}
+
+void StateDirectory::check(std::string const& path) {
+    if (path.empty()) return;
+    std::string const directory = withoutSlash(path);
     checkDirectory(directory);
     for (char const* const file : kFiles)
         checkFile(directory + "/" + file);
-    lock(directory + "/kvloamd.lock");
 }
 
 StateDirectory::~StateDirectory() {

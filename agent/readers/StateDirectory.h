@@ -21,6 +21,8 @@ class StateDirectory {
     /// write to the directory. A directory that cannot be written is only logged: state is then
     /// not kept. An empty `path` is no directory.
     explicit StateDirectory(std::string const& path);
+    /// Makes the same checks without creating or reserving anything; `path` may be in use.
+    static void check(std::string const& path);
     ~StateDirectory();
     StateDirectory(StateDirectory const&) = delete;
     StateDirectory& operator=(StateDirectory const&) = delete;

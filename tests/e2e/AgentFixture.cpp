@@ -192,7 +192,7 @@ void AgentFixture::startTrapReceiver(std::string const& config,
                                      std::vector<std::string> const& output) {
     write(path("trapd.conf"), config);
     for (int attempt = 0; attempt < 10; ++attempt) {
-        m_trapPort = freePort();
+        if (!m_trapPortIsChosen) m_trapPort = freePort();
         std::vector<std::string> command{"snmptrapd",       "-f", "-Lo", "-n", "-C", "-c",
                                          path("trapd.conf")};
         command.insert(command.end(), output.begin(), output.end());

@@ -76,6 +76,11 @@ class AgentFixture : public ::testing::Test {
     void startTrapReceiver(std::string const& config,
                            std::vector<std::string> const& output = {"-M", MIB_PATH, "-m",
                                                                      "KVL-OAM-MIB", "-OQ"});
+    /// Chooses the port of the receiver that is started later, so that `trapAddress` has it now.
+    void chooseTrapPort() {
+        m_trapPort = freePort();
+        m_trapPortIsChosen = true;
+    }
     Process& trapReceiver() { return *m_trapReceiver; }
     /// Starts a receiver of notifications of version 2c and the agent, which sends them there;
     /// `access` is what the community public gets.
@@ -112,6 +117,7 @@ class AgentFixture : public ::testing::Test {
     Process::Environment m_variables;
     int m_port = 0;
     int m_trapPort = 0;
+    bool m_trapPortIsChosen = false;
     std::unique_ptr<Process> m_trapReceiver;
     std::unique_ptr<Process> m_agent;
 };

@@ -8,7 +8,6 @@
 #include <unistd.h>
 
 #include <algorithm>
-#include <cerrno>
 #include <csignal>
 #include <sstream>
 #include <system_error>
@@ -56,14 +55,21 @@ Process::~Process() {
         signal(SIGKILL);
         waitpid(m_pid, nullptr, 0);
     }
-    close(m_pipe);
+    closePipe();
+}
+
+void Process::closePipe() {
+    if (m_pipe >= 0) close(m_pipe);
+    m_pipe = -1;
 }
 
 bool Process::readMore(std::chrono::steady_clock::time_point deadline) {
-    auto const left = std::chrono::duration_cast<std::chrono::milliseconds>(
-        deadline - std::chrono::steady_clock::now());
+    auto const left = std::min(std::chrono::duration_cast<std::chrono::milliseconds>(
+                                   deadline - std::chrono::steady_clock::now()),
+                               std::chrono::milliseconds(kPatience));
     pollfd readable{m_pipe, POLLIN, 0};
-    if (left.count() <= 0 || poll(&readable, 1, static_cast<int>(left.count())) <= 0) return false;
+    if (m_pipe < 0 || left.count() <= 0 || poll(&readable, 1, static_cast<int>(left.count())) <= 0)
+        return false;
     char buffer[4096];
     ssize_t const got = read(m_pipe, buffer, sizeof buffer);
     if (got <= 0) return false;
@@ -83,6 +89,13 @@ bool Process::waitFor(std::string const& text, int times) {
     while (!appeared())
         if (!readMore(deadline)) return false;
     return true;
+}
+
+bool Process::hasNow(std::string const& text) {
+    pollfd readable{m_pipe, POLLIN, 0};
+    while (poll(&readable, 1, 0) > 0 && readMore(std::chrono::steady_clock::time_point::max())) {
+    }
+    return m_output.find(text) != std::string::npos;
 }
 
 int Process::wait() {

@@ -30,6 +30,12 @@ class Process {
     /// Reads until the whole output contains `text` at least `times` times. False when the output
     /// ends or `kPatience` is over.
     bool waitFor(std::string const& text, int times = 1);
+    /// Whether the output contains `text` already.
+    bool hasNow(std::string const& text);
+    /// The end of the pipe from which the output is read; negative once it is closed.
+    int pipe() const { return m_pipe; }
+    /// Leaves the output unread for good: the process finds its reader gone.
+    void closePipe();
     /// Reads to the end of the output, waits for the process, and returns its exit status; 128 and
     /// the signal when one ended it.
     int wait();

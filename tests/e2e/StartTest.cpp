@@ -2,6 +2,7 @@
 // The agent's messages when it cannot start, and --check-config.
 #include <sys/resource.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <algorithm>
 
@@ -162,6 +163,43 @@ TEST_F(StartTest, CheckNamesTheFaultOfABrokenChassis) {
     Result const result = start({"--module", "z7sim", "--check-config"});
     EXPECT_EQ(result.status, kExitFailure);
     EXPECT_THAT(result.output, AllOf(HasSubstr("yaml:2"), HasSubstr("does not answer")));
+}
+
+TEST_F(StartTest, CheckNamesAddressesAtWhichTheAgentCannotListen) {
+    for (char const* const address : {"bogus:127", "udp:192.0.2.1:1161", "udp:127.0.0.1:nowhere",
+                                      "tcp:192.0.2.1:1161", "unix:/x"}) {
+        Result const result = runAgent({"--snmp-config", path("snmp.conf"), "--persistent-dir",
+                                        path("second"), "--check-config", "--listen", address});
+        expectOneLine(result, kExitFailure,
+                      HasSubstr("cannot listen on " + std::string(address) + ": "));
+    }
+}
+
+TEST_F(StartTest, CheckNamesAnAddressThatIsGivenTwice) {
+    std::string const address = "udp:127.0.0.1:" + std::to_string(freePort());
+    expectOneLine(runAgent({"--snmp-config", path("snmp.conf"), "--persistent-dir", path("second"),
+                            "--check-config", "--listen", address, "--listen", address}),
+                  kExitFailure, HasSubstr("given twice"));
+}
+
+TEST_F(StartTest, CheckNamesEveryModuleThatAStartWouldRefuse) {
+    for (char const* const module :
+         {"noentry", "refusing", "older", "newer", "throwing", "throwing-odd", "text"})
+        expectOneLine(start({"--module", module, "--check-config"}, BROKEN_MODULE_DIR),
+                      kExitFailure, HasSubstr("'" + std::string(module) + "'"));
+}
+
+TEST_F(StartTest, CheckNamesAPersistentDirectoryThatAStartWouldRefuse) {
+    ASSERT_EQ(symlink(path("store").c_str(), path("second").c_str()), 0);
+    expectOneLine(start({"--module", "z7sim", "--check-config"}), kExitFailure,
+                  AllOf(HasSubstr(path("second")), HasSubstr("symbolic link")));
+}
+
+TEST_F(StartTest, CheckAcceptsAPersistentDirectoryInUse) {
+    startAgent();
+    Result const result = runAgent({"--snmp-config", path("snmp.conf"), "--persistent-dir",
+                                    path("persistent"), "--check-config"});
+    EXPECT_EQ(result.status, 0) << result.output;
 }
 
 TEST_F(StartTest, ModulesAreFoundBesideTheProgram) {

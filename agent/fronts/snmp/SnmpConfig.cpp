@@ -3,16 +3,14 @@
 
 #include <unistd.h>
 
-#include <algorithm>
 #include <cerrno>
 #include <cstdlib>
 #include <cstring>
 #include <fstream>
-#include <string_view>
-#include <utility>
 
+#include "agent/fronts/snmp/LibraryLog.h"
+#include "agent/fronts/snmp/Receivers.h"
 #include "agent/log/Log.h"
-#include "agent/log/RepeatFilter.h"
 
 // The SNMP library's headers build on each other.
 // clang-format off
@@ -20,6 +18,7 @@
 #include <net-snmp/net-snmp-includes.h>
 #include <net-snmp/agent/net-snmp-agent-includes.h>
 #include <net-snmp/agent/mib_modules.h>
+#include <net-snmp/agent/agent_read_config.h>
 // clang-format on
 
 namespace kvloamd {
@@ -37,53 +36,7 @@ constexpr char kLibraryModules[] =
     "snmpNotifyFilterProfileTable,snmpNotifyFilterProfileTable_data,snmpTargetAddrEntry,"
     "snmpTargetAddrEntry_data,snmpTargetParamsEntry,snmpTargetParamsEntry_data,target_counters";
 
-/// While the library reads the configuration, its errors are collected here instead of logged.
-std::vector<std::string>* configFaults = nullptr;
-
 bool started = false;
-
-/// The configuration names no community and no user.
-bool nobodyMayAsk = false;
-
-LogLevel levelOf(int priority) {
-    if (priority <= LOG_ERR) return LogLevel::Error;
-    if (priority == LOG_WARNING) return LogLevel::Warning;
-    // The library's informational messages are about its internals.
-    return LogLevel::Debug;
-}
-
-/// Joins the lines of a library message to one.
-std::string oneLine(std::string_view message) {
-    std::string line;
-    for (char const character : message) {
-        if (character != '\n' && character != ' ')
-            line += character;
-        else if (!line.empty() && line.back() != ' ')
-            line += ' ';
-    }
-    while (line.ends_with(' '))
-        line.pop_back();
-    return line;
-}
-
-int takeLogLine(int /*major*/, int /*minor*/, void* message, void* /*argument*/) {
-    auto const* const entry = static_cast<snmp_log_message const*>(message);
-    std::string text = oneLine(entry->msg);
-    if (text.starts_with("Warning: no access control information configured")) {
-        nobodyMayAsk = true;
-        return SNMP_ERR_NOERROR;
-    }
-    // Only a count of errors that were reported before.
-    if (text.find("error(s) in config file(s)") != std::string::npos) return SNMP_ERR_NOERROR;
-    // The library reads the file twice and reports some errors in both rounds.
-    if (configFaults != nullptr && text.find(": line ") != std::string::npos) {
-        if (std::ranges::find(*configFaults, text) == configFaults->end())
-            configFaults->push_back(std::move(text));
-    } else if (static RepeatFilter filter; filter.passes(text, RepeatFilter::Clock::now())) {
-        log(levelOf(entry->priority), text);
-    }
-    return SNMP_ERR_NOERROR;
-}
 
 void nameConfiguration(SnmpFiles const& files) {
     if (!files.persistentDirectory.empty())
@@ -110,15 +63,19 @@ void keepEngineState(SnmpFiles const& files) {
                                   "refuse the agent after a restart; check --persistent-dir");
 }
 
+void warnIfNobodyMayAsk(LibraryFaults const& faults) {
+    if (faults.nobodyMayAsk() && faults.lines().empty())
+        log(LogLevel::Warning, "no community and no user is configured, so nobody gets an answer; "
+                               "configure them in the file that --snmp-config names");
+}
+
 } // namespace
 
-std::vector<std::string> startSnmp(SnmpFiles const& files) {
+std::vector<std::string> startSnmp(SnmpFiles const& files, Receivers& receivers) {
     if (!files.configuration.empty() && access(files.configuration.c_str(), R_OK) != 0)
         return {files.configuration + ": cannot be read: " + std::strerror(errno) +
                 "; check --snmp-config"};
-    snmp_disable_stderrlog();
-    snmp_enable_calllog();
-    snmp_register_callback(SNMP_CALLBACK_LIBRARY, SNMP_CALLBACK_LOGGING, takeLogLine, nullptr);
+    takeLibraryLog();
     // The agent names objects by number, so the library need not parse MIB files.
     setenv("MIBS", "", 0);
     netsnmp_ds_set_boolean(NETSNMP_DS_APPLICATION_ID, NETSNMP_DS_AGENT_ROLE, 0);
@@ -127,20 +84,28 @@ std::vector<std::string> startSnmp(SnmpFiles const& files) {
                            NETSNMP_DS_AGENT_DONT_LOG_TCPWRAPPERS_CONNECTS, 1);
     nameConfiguration(files);
 
-    std::vector<std::string> faults;
-    configFaults = &faults;
+    LibraryFaults const faults;
     std::string modules = kLibraryModules;
     add_to_init_list(modules.data());
     init_agent(kAppName);
     init_mib_modules();
+    receivers.takeDirectives();
     init_snmp(kAppName);
-    configFaults = nullptr;
     started = true;
     keepEngineState(files);
-    if (nobodyMayAsk && faults.empty())
-        log(LogLevel::Warning, "no community and no user is configured, so nobody gets an answer; "
-                               "configure them in the file that --snmp-config names");
-    return faults;
+    warnIfNobodyMayAsk(faults);
+    return faults.lines();
+}
+
+std::vector<std::string> readSnmpConfigAgain() {
+    LibraryFaults const faults;
+    // What the library keeps is newer in memory than in its file.
+    netsnmp_ds_set_boolean(NETSNMP_DS_LIBRARY_ID, NETSNMP_DS_LIB_DISABLE_PERSISTENT_LOAD, 1);
+    update_config();
+    netsnmp_ds_set_boolean(NETSNMP_DS_LIBRARY_ID, NETSNMP_DS_LIB_DISABLE_PERSISTENT_LOAD, 0);
+    snmp_store(kAppName);
+    warnIfNobodyMayAsk(faults);
+    return faults.lines();
 }
 
 std::string persistentDirectory(SnmpFiles const& files) {

@@ -8,6 +8,8 @@
 
 namespace kvloamd {
 
+class Receivers;
+
 /// Where the SNMP library reads its configuration and keeps its state.
 struct SnmpFiles {
     std::string configuration;       ///< empty: in the directories in which the library looks
@@ -15,8 +17,14 @@ struct SnmpFiles {
 };
 
 /// Starts the library and reads the configuration that `files` name. Returns the configuration's
-/// errors, one line for each. Call it once, on the SNMP thread, and `stopSnmp` at the end.
-std::vector<std::string> startSnmp(SnmpFiles const& files);
+/// errors, one line for each. `receivers`, which outlives the library's run, takes the notification
+/// receivers. Call it once, on the SNMP thread, and `stopSnmp` at the end.
+std::vector<std::string> startSnmp(SnmpFiles const& files, Receivers& receivers);
+
+/// Replaces communities, views, receivers and access by what the configuration says now, and adds
+/// its users; users stay until the state is deleted. Returns the errors, one line for each. After
+/// `startSnmp`.
+std::vector<std::string> readSnmpConfigAgain();
 
 /// The directory of the state that is kept across restarts. Valid after `startSnmp`.
 std::string persistentDirectory(SnmpFiles const& files);

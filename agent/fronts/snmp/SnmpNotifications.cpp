@@ -37,7 +37,7 @@ void SnmpNotifications::send(Notification const& notification, Delivered deliver
         addVariable(variables, object.name, object.type, object.view());
     send_v2trap(variables);
     snmp_free_varbind(variables);
-    delivered(Delivery::Sent);
+    delivered(m_receivers.allOpen() ? Delivery::Sent : Delivery::Dropped);
 }
 
 } // namespace kvloamd

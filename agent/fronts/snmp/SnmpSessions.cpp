@@ -19,6 +19,7 @@
 // clang-format on
 
 #include "agent/fronts/snmp/ResponseSize.h"
+#include "agent/fronts/snmp/TransportKinds.h"
 
 namespace kvloamd {
 
@@ -158,20 +159,17 @@ std::string describeFailure(std::string const& address, int fault) {
     }
 }
 
-/// Whether the library would serve the address by a transport that can block the agent.
-bool isOfBlockingKind(std::string_view address) {
-    constexpr std::string_view kinds[] = {"tcp6",    "tcpv6",   "tcpipv6", "unix",    "tlstcp",
-                                          "dtlsudp", "tls",     "dtls",    "ssh",     "std",
-                                          "stdout",  "aal5pvc", "ipx",     "callback"};
-    return std::ranges::find(kinds, address.substr(0, address.find(':'))) != std::end(kinds);
+std::string describeKind(std::string const& address) {
+    return "cannot listen on " + address + ": only udp:, udp6: and tcp: are supported";
 }
+
+constexpr std::string_view kTcp = "tcp:";
 
 } // namespace
 
 std::string SnmpSessions::listen(std::string const& address) {
-    if (address.starts_with("tcp:")) return listenByTcp(address);
-    if (isOfBlockingKind(address))
-        return "cannot listen on " + address + ": only udp:, udp6: and tcp: are supported";
+    if (address.starts_with(kTcp)) return listenByTcp(address);
+    if (isOfBlockingKind(address)) return describeKind(address);
     errno = 0;
     netsnmp_transport* const transport = netsnmp_transport_open_server("snmp", address.c_str());
     if (transport == nullptr) return describeFailure(address, errno);
@@ -182,10 +180,25 @@ std::string SnmpSessions::listen(std::string const& address) {
     return {};
 }
 
+std::string SnmpSessions::check(std::string const& address) {
+    errno = 0;
+    if (address.starts_with(kTcp)) {
+        bool const good = TcpConnections().listen(address.substr(kTcp.size()));
+        return good || errno == EADDRINUSE ? std::string() : describeFailure(address, errno);
+    }
+    if (isOfBlockingKind(address)) return describeKind(address);
+    netsnmp_transport* const transport = netsnmp_transport_open_server("snmp", address.c_str());
+    if (transport == nullptr)
+        return errno == EADDRINUSE ? std::string() : describeFailure(address, errno);
+    transport->f_close(transport);
+    netsnmp_transport_free(transport);
+    return {};
+}
+
 std::string SnmpSessions::listenByTcp(std::string const& address) {
     bool const isFirst = m_tcp == nullptr;
     if (isFirst) m_tcp = std::make_unique<TcpConnections>();
-    if (!m_tcp->listen(address.substr(4))) return describeFailure(address, errno);
+    if (!m_tcp->listen(address.substr(kTcp.size()))) return describeFailure(address, errno);
     if (isFirst && !addSession(makeTransport(*m_tcp)))
         return "cannot listen on " + address + ": the SNMP library refuses the address";
     return {};

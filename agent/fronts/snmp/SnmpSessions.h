@@ -19,6 +19,8 @@ class SnmpSessions {
     /// Listens at an address such as udp:127.0.0.1:1161. Returns the error as one line; empty when
     /// there is none.
     std::string listen(std::string const& address);
+    /// Returns the error that `listen` would; empty when there is none, or the port is in use.
+    static std::string check(std::string const& address);
     /// Adds the TCP connections, if there are any, to `loop`.
     void addTo(EventLoop& loop);
 

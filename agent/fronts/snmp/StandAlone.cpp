@@ -14,7 +14,7 @@ StandAlone::~StandAlone() {
 }
 
 bool StandAlone::open() {
-    std::vector<std::string> faults = startSnmp(m_files);
+    std::vector<std::string> faults = startSnmp(m_files, m_receivers);
     if (faults.empty()) {
         for (std::string const& address : m_listen)
             if (std::string fault = m_sessions.listen(address); !fault.empty())
@@ -27,7 +27,8 @@ bool StandAlone::open() {
 
 void StandAlone::serve(Served served) {
     served.counters.setSysUpTime(snmpUpTime(), Clock::now());
-    for (ServedTree const& each : served.trees) {
+    m_trees = std::move(served.trees);
+    for (ServedTree const& each : m_trees) {
         SnmpHandler& handler = m_handlers.emplace_back(each.tree, served.counters, each.arc,
                                                        served.takeSnapshot, served.settings);
         for (Place const& place : each.places)
@@ -35,10 +36,18 @@ void StandAlone::serve(Served served) {
                 throw std::runtime_error("the SNMP library refuses to register the agent's "
                                          "objects; check --enterprise-oid");
     }
-    restrictWriters(served.trees);
+    restrictWriters(m_trees);
     m_sessions.addTo(loop());
     loop().add(m_library);
-    SnmpNotifications::sendStart();
+    loop().add(m_receivers);
+    m_receivers.begin(SnmpNotifications::sendStart);
+}
+
+std::vector<std::string> StandAlone::readConfigurationAgain() {
+    std::vector<std::string> faults = readSnmpConfigAgain();
+    restrictWriters(m_trees);
+    m_receivers.begin([] {});
+    return faults;
 }
 
 } // namespace kvloamd

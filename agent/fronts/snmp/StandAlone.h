@@ -9,6 +9,7 @@
 
 #include "agent/fronts/Front.h"
 #include "agent/fronts/snmp/LibrarySource.h"
+#include "agent/fronts/snmp/Receivers.h"
 #include "agent/fronts/snmp/SnmpConfig.h"
 #include "agent/fronts/snmp/SnmpHandler.h"
 #include "agent/fronts/snmp/SnmpNotifications.h"
@@ -27,16 +28,19 @@ class StandAlone final : public Front {
 
     bool open() override;
     void serve(Served served) override;
+    std::vector<std::string> readConfigurationAgain() override;
     std::string place() const override { return "on " + m_listen.front(); }
     NotificationSink& notifications() override { return m_notifications; }
 
   private:
     std::vector<std::string> const m_listen;
     SnmpFiles const m_files;
-    SnmpNotifications m_notifications;
+    Receivers m_receivers;
+    SnmpNotifications m_notifications{m_receivers};
     SnmpSessions m_sessions;
     LibrarySource m_library;
     std::list<SnmpHandler> m_handlers; ///< the library keeps pointers to them
+    std::vector<ServedTree> m_trees;
 };
 
 } // namespace kvloamd

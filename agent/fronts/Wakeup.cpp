@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-#include "agent/daemon/Wakeup.h"
+#include "agent/fronts/Wakeup.h"
 
 #include <sys/eventfd.h>
 #include <unistd.h>
