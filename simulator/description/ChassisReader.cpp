@@ -241,7 +241,9 @@ std::vector<ObjectDraft> readBoards(Description const& list, Findings& findings)
     return boards;
 }
 
-Chassis buildChassis(Description const& file, Findings& findings) {
+} // namespace
+
+Chassis readChassis(Description const& file, Findings& findings) {
     if (file.form == Form::nothing)
         throw ChassisError(1, "there is nothing in it; begin the chassis with \"boards:\"");
     requireMap(file, "a chassis", "boards:");
@@ -269,20 +271,23 @@ Chassis buildChassis(Description const& file, Findings& findings) {
     return chassis;
 }
 
-} // namespace
-
 ObjectDraft readBoard(Description const& description) {
     Findings findings;
+    return *readBoard(description, findings); // errors are thrown
+}
+
+std::optional<ObjectDraft> readBoard(Description const& description, Findings& findings) {
     std::vector<ObjectDraft> boards;
     boards.push_back(readBoardOnly(description, currentDate(), findings));
     HandlePlaces seen;
     refuseSharedHandles(boards, seen, findings);
+    if (findings.hasErrors()) return std::nullopt;
     return std::move(boards.front());
 }
 
 std::optional<Chassis> readChassis(std::string const& yamlText, Findings& findings) {
     std::optional<Chassis> chassis;
-    findings.part([&] { chassis = buildChassis(describeYaml(yamlText, findings), findings); });
+    findings.part([&] { chassis = readChassis(describeYaml(yamlText, findings), findings); });
     if (findings.hasErrors()) chassis.reset();
     return chassis;
 }
@@ -293,7 +298,7 @@ Chassis readChassis(std::string const& yamlText) {
 
 Chassis readChassis(Description const& file) {
     Findings findings;
-    return buildChassis(file, findings);
+    return readChassis(file, findings);
 }
 
 std::string readChassisFile(std::string const& path) {

@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <set>
 #include <sstream>
+#include <utility>
 
 #include "simulator/base/Text.h"
 #include "simulator/chassis/AttributeSchema.h"
@@ -45,7 +46,7 @@ std::int64_t freeBoardHandle(nlohmann::json const& reply, std::set<std::int64_t>
     return handle;
 }
 
-Description describeText(std::string const& text) {
+Description describeText(std::string const& text, Findings& findings) {
     auto const first = text.find_first_not_of(" \t\r\n");
     if (first != std::string::npos && text[first] == '{')
         if (auto json = nlohmann::json::parse(text, nullptr, false); json.is_object()) {
@@ -54,27 +55,34 @@ Description describeText(std::string const& text) {
                 json.erase(more);
             return describeJson(json);
         }
-    return describeYaml(text);
+    return describeYaml(text, findings);
 }
 
 } // namespace
 
+ToolError errorsOf(Findings const& findings, std::string const& path) {
+    std::string errors; // every line begins like the first
+    for (auto const& error : findings.errors(path))
+        errors += (errors.empty() ? "" : "\nkvlsim: ") + error;
+    return ToolError(errors);
+}
+
 std::vector<nlohmann::json> readBoardFile(std::string const& path) {
-    try {
-        std::string const text = readChassisFile(path);
-        Description const description = describeText(text);
-        Chassis chassis;
-        if (description.find("boards") != nullptr)
-            chassis = readChassis(description);
-        else
-            chassis.insertBoard(readBoard(description));
-        std::vector<nlohmann::json> boards;
-        for (std::int32_t const handle : chassis.root().children)
-            boards.push_back(toJson(*chassis.find(handle), chassis));
-        return boards;
-    } catch (ChassisError const& error) {
-        throw ToolError(describeError(path, error));
-    }
+    Findings findings(Findings::OnError::collect);
+    Chassis chassis;
+    findings.part([&] {
+        Description const description = describeText(readChassisFile(path), findings);
+        if (description.find("boards") != nullptr) {
+            chassis = readChassis(description, findings);
+        } else if (auto board = readBoard(description, findings)) {
+            chassis.insertBoard(*std::move(board));
+        }
+    });
+    if (findings.hasErrors()) throw errorsOf(findings, path);
+    std::vector<nlohmann::json> boards;
+    for (std::int32_t const handle : chassis.root().children)
+        boards.push_back(toJson(*chassis.find(handle), chassis));
+    return boards;
 }
 
 nlohmann::json makeBoard(BoardOptions const& options, nlohmann::json const& reply) {

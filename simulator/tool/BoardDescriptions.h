@@ -9,9 +9,16 @@
 
 #include <nlohmann/json.hpp>
 
+#include "simulator/description/Findings.h"
+#include "simulator/tool/ControlClient.h"
+
 namespace kvlsim {
 
-/// The boards of a file, which holds one board or a chassis, in YAML or JSON. Throws ToolError.
+/// The errors that were found in a file, as lines that follow "kvlsim: ".
+ToolError errorsOf(Findings const& findings, std::string const& path);
+
+/// The boards of a file, which holds one board or a chassis, in YAML or JSON. Throws ToolError with
+/// all errors of the file.
 std::vector<nlohmann::json> readBoardFile(std::string const& path);
 
 /// `BoardOptions` are the options of `kvlsim insert`; an empty or zero one gets a default value.

@@ -181,12 +181,7 @@ void check(Options const& options) {
         [&] { chassis = kvlsim::readChassis(kvlsim::readChassisFile(options.file), findings); });
     for (auto const& warning : findings.warnings(options.file))
         std::cerr << "kvlsim: " << warning << '\n';
-    if (!chassis) {
-        std::string errors; // every line begins like the first
-        for (auto const& error : findings.errors(options.file))
-            errors += (errors.empty() ? "" : "\nkvlsim: ") + error;
-        throw ToolError(errors);
-    }
+    if (!chassis) throw kvlsim::errorsOf(findings, options.file);
     std::cout << options.file << ": good, " << chassis->boardCount() << " boards\n";
 }
 

@@ -103,6 +103,24 @@ TEST_F(KvlsimToolTest, InsertTakesABigBoardThatShowPrintsAsJson) {
     EXPECT_EQ(board("1"), shown);
 }
 
+TEST_F(KvlsimToolTest, InsertOfAFileWithSeveralErrorsNamesAllAndInsertsNothing) {
+    hold();
+    for (char const* const text :
+         {"boards:\n  - handle: 91\n  - {handle: 92, attributes: {SERIAL_NUMBER: B92}}\n"
+          "  - {handle: many, attributes: {SERIAL_NUMBER: B93}}\n",
+          "handle: many\nattributes: {IRQ: [1]}\n"}) {
+        std::string const file = write("bad.yaml", text);
+        Finished const result = kvlsim({"insert", file});
+        EXPECT_EQ(result.status, 1);
+        std::istringstream lines(result.err);
+        int faults = 0;
+        for (std::string line; std::getline(lines, line); ++faults)
+            EXPECT_THAT(line, StartsWith("kvlsim: " + file + ":"));
+        EXPECT_GE(faults, 2) << result.err;
+    }
+    EXPECT_EQ(kvlsim({"show", "92"}).status, 1);
+}
+
 TEST_F(KvlsimToolTest, InsertOfABadFileNamesTheLine) {
     hold();
     std::string const path = write("bad.yaml", "handle: 50\nattributes: {NAME: X}\n");
