@@ -156,5 +156,28 @@ TEST_F(SubagentTest, PortOfItsOwnIsRefused) {
     EXPECT_THAT(linesOf(result.output), ElementsAre(HasSubstr("--agentx excludes --port")));
 }
 
+/// The hundredths in an answer such as "Timeticks: (518) 0:00:05.18".
+unsigned long ticksIn(std::string const& value) {
+    auto const bracket = value.find('(');
+    return bracket == std::string::npos ? 0 : std::stoul(value.substr(bracket + 1));
+}
+
+TEST_F(SubagentTest, TimesOfChangeAreValuesOfTheMastersSysUpTime) {
+    constexpr char sysUpTime[] = "1.3.6.1.2.1.1.3.0";
+    startMaster();
+    // Long enough for the two start times to be told apart.
+    ASSERT_TRUE(eventually([&] { return ticksIn(get(sysUpTime)) > 300; }));
+    startSubagent();
+    ASSERT_TRUE(isConnected()) << agent().output();
+    unsigned long const before = ticksIn(get(sysUpTime));
+    sim({"stop", "1"});
+    EXPECT_TRUE(eventually([this] { return get("kvlBoardStatus.1") == "INTEGER: stopped(4)"; }));
+    unsigned long const when = ticksIn(get("kvlBoardTableLastChange.0"));
+    // The master's answer was a few hundredths on its way.
+    EXPECT_GE(when + 20, before);
+    EXPECT_LE(when, ticksIn(get(sysUpTime)) + 20);
+    EXPECT_LT(ticksIn(get("kvlAgentUpTime.0")) + 250, ticksIn(get(sysUpTime)));
+}
+
 } // namespace
 } // namespace kvloamd::e2e
