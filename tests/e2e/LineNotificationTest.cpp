@@ -18,7 +18,7 @@ constexpr char kLinkTraps[] = "1.3.6.1.2.1.31.1.1.1.14.1000";
 constexpr char kCut[] = "8292";
 constexpr char kWhole[] = "1";
 
-constexpr char kAnyLine[] = "mib-2.10.18.15.0.1";
+constexpr char kAnyLine[] = "transmission.18.15.0.1";
 constexpr char kAnyLinkDown[] = "snmpModules.1.1.5.3";
 
 class LineNotificationTest : public AgentFixture {
@@ -46,9 +46,10 @@ class LineNotificationTest : public AgentFixture {
                                                   << trapReceiver().output();
     }
     void expectLineTold(std::string const& status) {
-        expectTold("1.1.4.1.0 = SNMPv2-SMI::mib-2.10.18.15.0.1\tSNMPv2-SMI::mib-2.10.18.6.1.10."
-                   "1000 = " +
-                   status + "\tSNMPv2-SMI::mib-2.10.18.6.1.16.1000 = ");
+        expectTold(
+            "1.1.4.1.0 = SNMPv2-SMI::transmission.18.15.0.1\tSNMPv2-SMI::transmission.18.6.1.10."
+            "1000 = " +
+            status + "\tSNMPv2-SMI::transmission.18.6.1.16.1000 = ");
     }
     /// `number`: 3 for linkDown, 4 for linkUp.
     void expectLinkTold(int number, std::string const& index, int operStatus) {

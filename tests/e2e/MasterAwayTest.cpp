@@ -59,8 +59,9 @@ TEST_F(MasterAwayTest, LineThatIsCutIsToldThroughTheMaster) {
                                         "1.3.6.1.2.1.10.18.6.1.17.1000", "i", "1"});
     ASSERT_EQ(set.status, 0) << set.output;
     sim({"line", "alarm", "101", "los"});
-    EXPECT_TRUE(trapReceiver().waitFor("1.1.4.1.0 = SNMPv2-SMI::mib-2.10.18.15.0.1\tSNMPv2-SMI::"
-                                       "mib-2.10.18.6.1.10.1000 = 8292\t"))
+    EXPECT_TRUE(
+        trapReceiver().waitFor("1.1.4.1.0 = SNMPv2-SMI::transmission.18.15.0.1\tSNMPv2-SMI::"
+                               "transmission.18.6.1.10.1000 = 8292\t"))
         << trapReceiver().output();
     EXPECT_TRUE(trapReceiver().waitFor("1.1.4.1.0 = SNMPv2-SMI::snmpModules.1.1.5.3\tSNMPv2-SMI::"
                                        "mib-2.2.2.1.1.1000 = 1000\t"))

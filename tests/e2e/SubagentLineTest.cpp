@@ -25,8 +25,9 @@ class SubagentLineTest : public MasterFixture {
     }
     /// Notifications of a cut line with ifIndex 1000, and of its link.
     void expectCutTold() {
-        expectTold("1.1.4.1.0 = SNMPv2-SMI::mib-2.10.18.15.0.1\tSNMPv2-SMI::mib-2.10.18.6.1.10."
-                   "1000 = 8292\tSNMPv2-SMI::mib-2.10.18.6.1.16.1000 = ");
+        expectTold(
+            "1.1.4.1.0 = SNMPv2-SMI::transmission.18.15.0.1\tSNMPv2-SMI::transmission.18.6.1.10."
+            "1000 = 8292\tSNMPv2-SMI::transmission.18.6.1.16.1000 = ");
         expectTold("1.1.4.1.0 = SNMPv2-SMI::snmpModules.1.1.5.3\tSNMPv2-SMI::mib-2.2.2.1.1.1000 = "
                    "1000\tSNMPv2-SMI::mib-2.2.2.1.7.1000 = 1\tSNMPv2-SMI::mib-2.2.2.1.8.1000 = 2");
     }
