@@ -42,8 +42,8 @@ int takeRequest(int operation, netsnmp_session* session, int request, netsnmp_pd
 }
 
 /// Encodes a message whose response PDU has been made to fit. The library would try again and again
-/// to shorten one that does not; and the encoder that it chooses for a GETBULK whose response it has
-/// shortened itself writes past the end of its buffer.
+/// to shorten one that does not; and the encoder that it chooses for a GETBULK whose response it
+/// has shortened itself writes past the end of its buffer.
 int buildMessage(netsnmp_session* session, netsnmp_pdu* pdu, u_char** packet, size_t* size,
                  size_t* length) {
     if (pdu->command == SNMP_MSG_RESPONSE) fitResponse(*pdu, askedCommand == SNMP_MSG_GETBULK);

@@ -327,6 +327,31 @@ TEST_F(AgentxSessionTest, EndlessPacketEndsTheConnection) {
     EXPECT_TRUE(runUntil([this] { return m_master->isLeft(); }));
 }
 
+TEST_F(AgentxSessionTest, MasterThatAsksAndDoesNotReadCostsBoundedMemory) {
+    constexpr std::size_t answerSize = std::size_t{64} * 1024;
+    startMaster();
+    m_session.emplace(
+        *parseAgentxAddress(path()), roots(), m_rows,
+        [](AgentxHeader const&, std::string_view) { return std::string(answerSize, 'x'); },
+        patient());
+    connectSession();
+    std::size_t asked = 0;
+    while (asked < 1000 && m_session->isConnected()) {
+        m_master->say(AgentxWriter(AgentxKind::TestSet, 77, 5, 6).take());
+        m_session->advance(POLLIN);
+        ++asked;
+    }
+    EXPECT_FALSE(m_session->isConnected());
+    // What the socket takes, and four megabytes.
+    int taken = 0;
+    socklen_t size = sizeof taken;
+    int const probe = socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0);
+    ASSERT_EQ(getsockopt(probe, SOL_SOCKET, SO_SNDBUF, &taken, &size), 0);
+    close(probe);
+    EXPECT_LE(asked * answerSize,
+              std::size_t{4} * 1024 * 1024 + static_cast<std::size_t>(taken) + 2 * answerSize);
+}
+
 TEST_F(AgentxSessionTest, MasterThatNeverAnswersIsConnectedAnew) {
     startMaster();
     AgentxPace pace = patient();

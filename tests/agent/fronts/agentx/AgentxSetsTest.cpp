@@ -183,6 +183,17 @@ TEST_F(AgentxSetsTest, MasterThatNeverCleansUpCanStillSet) {
     }
 }
 
+TEST_F(AgentxSetsTest, EndlessSetIsRefused) {
+    constexpr int resourceUnavailable = 13;
+    std::vector<Asked> const many(1000, Asked{1, 5});
+    int packets = 0;
+    while (packets < 100 && test(many) == kGood)
+        ++packets;
+    EXPECT_EQ(packets, 4);
+    EXPECT_EQ(test(many), Fault(resourceUnavailable, 0));
+    EXPECT_EQ(step(AgentxKind::CommitSet), kGood);
+}
+
 TEST_F(AgentxSetsTest, UnknownTypeIsAnError) {
     AgentxWriter writer(AgentxKind::TestSet, 1, 1, 1);
     writer.number16(77);
