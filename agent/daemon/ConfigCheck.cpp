@@ -42,6 +42,7 @@ std::string summaryOf(std::string_view output) {
 /// the error of posix_spawn.
 int spawn(std::vector<std::string> arguments, int output, pid_t& child) {
     std::vector<char*> words;
+    words.reserve(arguments.size() + 1);
     for (std::string& argument : arguments)
         words.push_back(argument.data());
     words.push_back(nullptr);

@@ -82,6 +82,11 @@ std::uint64_t NameResolver::ask(std::string const& name, int family) {
     return m_lastQuestion;
 }
 
+void NameResolver::dropQuestions() {
+    std::scoped_lock const guard(m_state->mutex);
+    m_state->questions.clear();
+}
+
 std::vector<NameResolver::Answer> NameResolver::take() {
     std::scoped_lock const guard(m_state->mutex);
     m_state->answered.clear();

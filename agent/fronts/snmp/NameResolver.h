@@ -31,6 +31,8 @@ class NameResolver {
     int descriptor() const;
     /// Asks for a number of `family` (AF_INET, AF_INET6). Returns the number of the question.
     std::uint64_t ask(std::string const& name, int family);
+    /// Drops the questions that the thread has not begun to ask.
+    void dropQuestions();
     /// Removes the answers that have come.
     std::vector<Answer> take();
 

@@ -50,6 +50,7 @@ void Receivers::takeDirectives() {
         register_app_config_handler(directive.name.data(), takeLine, forget, nullptr);
 }
 
+// NOLINTNEXTLINE(readability-non-const-parameter): the library's type
 void Receivers::takeLine(char const* directive, char* text) {
     if (current == nullptr) return;
     std::string name(directive);
@@ -64,7 +65,10 @@ void Receivers::takeLine(char const* directive, char* text) {
 }
 
 void Receivers::forget() {
-    if (current != nullptr) current->m_waiting.clear();
+    if (current != nullptr) {
+        current->m_waiting.clear();
+        current->m_resolver.dropQuestions();
+    }
     snmpd_free_trapsinks();
 }
 

@@ -70,6 +70,7 @@ class Receivers final : public EventLoop::Source {
     };
 
     static void takeLine(char const* directive, char* text);
+    /// Forgets all receivers, before the configuration is read again.
     static void forget();
     /// Lets the library open a receiver that delays nothing.
     static void openByLibrary(ReceiverLine const& line, std::string const& number,
