@@ -39,8 +39,8 @@ class SharedTablesTest : public MasterFixture {
     /// The same, and waits until all interfaces of the example chassis are served.
     void startWhole() {
         start();
-        ASSERT_TRUE(eventually([this] { return rows(kIfName, true).size() == 71; }));
-        ASSERT_TRUE(eventually([this] { return rows(kIfDescr, true).size() == 71; }));
+        ASSERT_TRUE(eventually([this] { return rows(kIfName, true).size() == 73; }));
+        ASSERT_TRUE(eventually([this] { return rows(kIfDescr, true).size() == 73; }));
     }
     std::vector<Answer> walkOf(std::string const& from) const {
         auto all = walk(from);
@@ -92,7 +92,7 @@ TEST_F(SharedTablesTest, InterfacesOfTheHostAndOursAreInOneTable) {
         values.push_back(answer.value);
     EXPECT_THAT(values, Contains("STRING: \"lo\""));
     EXPECT_THAT(values, Contains("STRING: \"T1 line nx5-trunk-1\""));
-    EXPECT_THAT(rows(kIfDescr, true), SizeIs(71));
+    EXPECT_THAT(rows(kIfDescr, true), SizeIs(73));
     EXPECT_TRUE(isStrictlyIncreasing(walkOf(kIfTable)));
     EXPECT_TRUE(isStrictlyIncreasing(walkOf(kIfXTable)));
     EXPECT_TRUE(isStrictlyIncreasing(walkOf("1.3.6.1")));
@@ -191,7 +191,7 @@ TEST_F(SharedTablesTest, RowsAreBackAfterTheMastersRestart) {
     ASSERT_TRUE(isLost()) << agent().output();
     startMaster();
     ASSERT_TRUE(isConnected(2)) << agent().output();
-    EXPECT_TRUE(eventually([this] { return rows(kIfDescr, true).size() == 71; }));
+    EXPECT_TRUE(eventually([this] { return rows(kIfDescr, true).size() == 73; }));
     EXPECT_TRUE(hostHasRows());
     EXPECT_THAT(walkOf(kIsdn), Not(IsEmpty()));
 }
