@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The host's clock is set while the agent runs.
+#include <cstdint>
 #include <fstream>
+#include <stdexcept>
 
 #include <gmock/gmock.h>
 

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // SIGHUP makes the agent read its SNMP configuration again.
 #include <csignal>
+#include <cstdio>
 
 #include <gmock/gmock.h>
 

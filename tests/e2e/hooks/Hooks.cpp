@@ -49,6 +49,8 @@ Function next(char const* name, char const* version = nullptr) {
 
 } // namespace
 
+// The names of the C library's own parameters are reserved.
+// NOLINTBEGIN(readability-inconsistent-declaration-parameter-name)
 extern "C" {
 
 __attribute__((visibility("default"))) int clock_gettime(clockid_t clock, timespec* time) noexcept {
@@ -95,3 +97,4 @@ __attribute__((visibility("default"))) int getaddrinfo(char const* name, char co
 }
 
 } // extern "C"
+// NOLINTEND(readability-inconsistent-declaration-parameter-name)
