@@ -27,6 +27,7 @@
 #include "agent/notifications/LinkWatch.h"
 #include "agent/notifications/Notifier.h"
 #include "agent/notifications/StatusListener.h"
+#include "agent/notifications/SubjectObjects.h"
 #include "agent/objects/ObjectTree.h"
 #include "agent/objects/OwnObjects.h"
 #include "agent/objects/StandardObjects.h"
@@ -43,6 +44,7 @@
 #include "agent/readers/StableIndices.h"
 #include "agent/readers/StateDirectory.h"
 #include "agent/readers/StateFile.h"
+#include "agent/readers/Whereabouts.h"
 #include "platform/ActionScheduler_pthread.h"
 
 namespace kvloamd {
@@ -220,6 +222,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             applySettings(boards.settings, lines);
             links.update(snapshot.interfaces.interfaces, snapshot.begun);
             snapshot.entities = entities.read(snapshot);
+            noteWhereabouts(snapshot);
             if (!options.agentx.empty())
                 snapshot.interfaceConflicts =
                     host.conflicts(snapshot.interfaces.interfaces, snapshot.begun);
@@ -230,16 +233,19 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     ObjectTree const tree(scalars(), allTables);
     std::vector<Table const*> const allStandardTables = standardTables();
     ObjectTree const standardTree(standardScalars(), allStandardTables);
-    front.serve({{{tree, options.enterprise, {{kObjectsPlace, "KVL-OAM-MIB"}}},
-                  {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}}},
-                 boards.counters,
+    std::vector<ServedTree> const trees{
+        {tree, options.enterprise, {{kObjectsPlace, "KVL-OAM-MIB"}}},
+        {standardTree, kStandardArc, {kStandardPlaces.begin(), kStandardPlaces.end()}}};
+    front.serve({trees, boards.counters,
                  [&] {
                      ++boards.counters.requests;
                      return collector.snapshot();
                  },
-                 [&] { return collector.newest(); },
-                 boards.settings});
-    Notifier notifier(boards.queue, front.notifications());
+                 [&] { return collector.newest(); }, boards.settings});
+    Notifier notifier(boards.queue, front.notifications(), [&](Notification& notification) {
+        auto const snapshot = collector.newest();
+        nameSubject(notification, trees, {*snapshot, boards.counters, &boards.settings});
+    });
     EntityNotices entityNotices(boards.queue);
     ServiceNotice notice;
     std::string const serving =

@@ -29,7 +29,8 @@ Notification stateNotice(EntityStateRow const& row, OidView which, Clock::time_p
         joined(kStandardArc, which),
         {objectOf(row, kAdmin, ValueType::Integer, std::int64_t{static_cast<int>(row.state.admin)}),
          objectOf(row, kAlarm, ValueType::Octets, std::string(1, row.state.alarm))},
-        when};
+        when,
+        {.entity = row.entity}};
 }
 
 } // namespace

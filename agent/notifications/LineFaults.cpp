@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <set>
 
+#include "agent/rows/FaultRow.h"
 #include "board/DS1LineFeature.h"
 
 namespace kvloamd {
@@ -16,6 +17,10 @@ constexpr std::array<DS1LineStatusEnum, kLineFaults> kStatuses{
     DS1LineStatusLoopbackState, DS1LineStatusT16AIS,       DS1LineStatusRcvFarEndLOMF,
     DS1LineStatusXmtFarEndLOMF, DS1LineStatusRcvTestCode,
 };
+
+static_assert(kFirstLineFault == kFirstNamedFault &&
+                  kFirstLineFault + kLineFaults - 1 == kLastNamedFault,
+              "every line fault has a name");
 
 } // namespace
 

@@ -38,15 +38,18 @@ Notification boardStatusNotification(Oid const& enterprise, int boardIndex,
     return {joined(enterprise, kBoardStatusChangePlace),
             {sent(enterprise, 1, boardIndex), sent(enterprise, 2, std::move(serialNumber)),
              sent(enterprise, 3, status)},
-            Clock::now()};
+            Clock::now(),
+            {.boardIndex = static_cast<std::uint32_t>(boardIndex)}};
 }
 
 Notification faultNotification(Oid const& enterprise, FaultChange const& change) {
     return {joined(enterprise, change.raised ? kFaultRaisedPlace : kFaultClearedPlace),
             {sent(enterprise, 1, change.boardIndex), sent(enterprise, 2, change.serialNumber),
              sent(enterprise, 4, ValueType::Gauge, std::int64_t{change.value}),
-             sent(enterprise, 5, change.platformBoard)},
-            Clock::now()};
+             sent(enterprise, 5, change.platformBoard),
+             sent(enterprise, 6, faultKind(change.value))},
+            Clock::now(),
+            {.boardIndex = static_cast<std::uint32_t>(change.boardIndex)}};
 }
 
 } // namespace kvloamd

@@ -26,10 +26,18 @@ struct NotifiedObject {
     Value view() const;
 };
 
+/// What a notification is about: one of these, the others are 0. All 0: what is in its objects.
+struct Subject {
+    std::uint32_t ifIndex = 0;
+    std::uint32_t entity = 0; ///< an entPhysicalIndex
+    std::uint32_t boardIndex = 0;
+};
+
 struct Notification {
     Oid name; ///< absolute
     std::vector<NotifiedObject> objects;
     Clock::time_point when; ///< the time of the event
+    Subject subject = {};
 };
 
 /// What became of a notification that was handed over.

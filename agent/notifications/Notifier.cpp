@@ -4,7 +4,7 @@
 namespace kvloamd {
 
 std::optional<Clock::time_point> Notifier::send(Clock::time_point snapshotBegun) {
-    while (auto const oldest = m_queue.oldest()) {
+    while (auto oldest = m_queue.oldest()) {
         if (!m_sink.ready()) return std::nullopt;
         if (oldest->when > snapshotBegun && Clock::now() < oldest->when + kPatience)
             return oldest->when + kPatience;
@@ -14,14 +14,15 @@ std::optional<Clock::time_point> Notifier::send(Clock::time_point snapshotBegun)
 }
 
 bool Notifier::sendAll() {
-    while (auto const oldest = m_queue.oldest()) {
+    while (auto oldest = m_queue.oldest()) {
         if (!m_sink.ready()) return false;
         handOver(*oldest);
     }
     return true;
 }
 
-void Notifier::handOver(Notification const& notification) {
+void Notifier::handOver(Notification& notification) {
+    m_complete(notification);
     m_sink.send(notification, [this](Delivery delivery) { m_queue.pop(delivery); });
 }
 

@@ -3,7 +3,9 @@
 #pragma once
 
 #include <chrono>
+#include <functional>
 #include <optional>
+#include <utility>
 
 #include "agent/notifications/NotificationQueue.h"
 #include "agent/notifications/NotificationSink.h"
@@ -18,8 +20,12 @@ class Notifier {
     /// the notification longer than this.
     static constexpr std::chrono::milliseconds kPatience{1000};
 
-    /// `queue` and `sink` outlive the notifier.
-    Notifier(NotificationQueue& queue, NotificationSink& sink) : m_queue(queue), m_sink(sink) {}
+    /// Appends objects to a notification that is about to be sent.
+    using Complete = std::function<void(Notification&)>;
+
+    /// `queue` and `sink` outlive the notifier. `complete` is called on the calling thread.
+    Notifier(NotificationQueue& queue, NotificationSink& sink, Complete complete)
+        : m_queue(queue), m_sink(sink), m_complete(std::move(complete)) {}
 
     /// Sends, while the sink is ready, the notifications whose change a snapshot that was begun at
     /// `snapshotBegun` shows, and those that have waited for `kPatience`. A notification stays in
@@ -31,10 +37,11 @@ class Notifier {
     bool sendAll();
 
   private:
-    void handOver(Notification const& notification);
+    void handOver(Notification& notification);
 
     NotificationQueue& m_queue;
     NotificationSink& m_sink;
+    Complete m_complete;
 };
 
 } // namespace kvloamd

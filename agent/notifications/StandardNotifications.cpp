@@ -24,7 +24,8 @@ Notification lineStatusChange(std::uint32_t ifIndex, int status, std::uint32_t l
     return {joined(kStandardArc, kLineStatusChangePlace),
             {object(dsx1ConfigTable(), 10, ifIndex, ValueType::Integer, status),
              object(dsx1ConfigTable(), 16, ifIndex, ValueType::TimeTicks, lastChange)},
-            when};
+            when,
+            {.ifIndex = ifIndex}};
 }
 
 Notification linkChange(InterfaceRow const& row, Clock::time_point when) {
@@ -36,7 +37,8 @@ Notification linkChange(InterfaceRow const& row, Clock::time_point when) {
         {object(ifTable(), 1, row.ifIndex, ValueType::Integer, row.ifIndex),
          object(ifTable(), 7, row.ifIndex, ValueType::Integer, row.adminStatus.value_or(int{kUp})),
          object(ifTable(), 8, row.ifIndex, ValueType::Integer, operStatus)},
-        when};
+        when,
+        {.ifIndex = row.ifIndex}};
 }
 
 } // namespace kvloamd

@@ -8,29 +8,32 @@ namespace kvloamd {
 
 namespace {
 
-/// A status that the MIB module has no name for is left out.
-template <int BoardRow::*Field>
+/// KvlBoardState. A board with any other status says nothing about it.
+constexpr NamedNumber kStates[] = {
+    {BoardStatusNone, "none"},
+    {BoardStatusStarted, "started"},
+    {BoardStatusStopped, "stopped"},
+    {BoardStatusAdded, "added"},
+    {BoardStatusRemoved, "removed"},
+    {BoardStatusStartPending, "startPending"},
+    {BoardStatusStopPending, "stopPending"},
+    {BoardStatusFailed, "failed"},
+};
+
+template <auto Field>
 Value status(BoardRow const& row) {
-    switch (row.*Field) {
-    case BoardStatusNone:
-    case BoardStatusStarted:
-    case BoardStatusStopped:
-    case BoardStatusAdded:
-    case BoardStatusRemoved:
-    case BoardStatusStartPending:
-    case BoardStatusStopPending:
-    case BoardStatusFailed:
-        return std::int64_t{row.*Field};
-    default:
-        return {};
-    }
+    return std::int64_t{row.*Field};
+}
+
+Value entity(BoardRow const& row) {
+    return row.entity == 0 ? Value{} : Value{std::int64_t{row.entity}};
 }
 
 using enum ValueType;
 
 constexpr Column<BoardRow> kColumns[] = {
-    {"kvlBoardStatus", 2, Integer, status<&BoardRow::status>},
-    {"kvlBoardSecondaryStatus", 3, Integer, status<&BoardRow::secondaryStatus>},
+    {"kvlBoardStatus", 2, Integer, status<&BoardRow::status>, oneOf(kStates)},
+    {"kvlBoardSecondaryStatus", 3, Integer, status<&BoardRow::secondaryStatus>, oneOf(kStates)},
     {"kvlBoardName", 4, Text, text<&BoardRow::name>},
     {"kvlBoardModel", 5, Text, text<&BoardRow::model>},
     {"kvlBoardFamily", 6, Text, text<&BoardRow::family>},
@@ -48,6 +51,7 @@ constexpr Column<BoardRow> kColumns[] = {
     {"kvlBoardShelfId", 18, Integer, number<&BoardRow::shelfId>},
     {"kvlBoardPciSlotNumber", 19, Integer, number<&BoardRow::pciSlotNumber>},
     {"kvlBoardBusNumber", 20, Integer, number<&BoardRow::busNumber>},
+    {"kvlBoardPhysicalIndex", 21, Integer, entity},
 };
 
 } // namespace

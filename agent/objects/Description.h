@@ -39,11 +39,50 @@ struct Writable {
     Characters characters = Characters::Utf8; ///< of a text
 };
 
+/// A number of an enumeration, and its name in the MIB module.
+struct NamedNumber {
+    int number;
+    char const* name;
+};
+
+/// All numbers of an enumeration.
+using Names = std::span<NamedNumber const>;
+
+/// What there is to say about an object beyond its name, type and place.
+struct Details {
+    constexpr Details() = default;
+    /// An object that can be set.
+    constexpr Details(Writable what)
+        : writable(what) {} // NOLINT(google-explicit-constructor): reads well in tables
+
+    std::optional<Writable> writable; ///< nothing: the object is read-only
+    Names names;                      ///< of an enumeration; otherwise empty
+
+    /// The same with the numbers that it may have. Any other number counts as not known.
+    constexpr Details named(Names numbers) const {
+        Details changed = *this;
+        changed.names = numbers;
+        return changed;
+    }
+    /// Whether the MIB module has a word for `value`.
+    bool allows(Value const& value) const {
+        auto const* const number = std::get_if<std::int64_t>(&value);
+        return names.empty() || number == nullptr ||
+               std::ranges::any_of(
+                   names, [&](NamedNumber const& named) { return named.number == *number; });
+    }
+};
+
+/// The details of an enumeration.
+constexpr Details oneOf(Names numbers) {
+    return Details().named(numbers);
+}
+
 struct ColumnHead {
     char const* name;
     std::uint32_t number; ///< in the table's entry
     ValueType type;
-    std::optional<Writable> writable = std::nullopt; ///< nothing: the column is read-only
+    Details details = {};
 };
 
 /// A table: columns ascending by number, rows ascending by index.
@@ -71,8 +110,7 @@ struct Column {
     std::uint32_t number;
     ValueType type;
     Value (*get)(Row const&);
-    std::optional<Writable> writable =
-        std::nullopt; ///< then `get` says what counts until it is set
+    Details details = {}; ///< if the column can be set, `get` says what counts until it is
 };
 
 /// A table whose rows lie in a sorted vector of the snapshot; a row says its own `index()`.
@@ -88,7 +126,7 @@ class RowTable final : public Table {
     std::size_t columnCount() const override { return m_columns.size(); }
     ColumnHead column(std::size_t column) const override {
         Column<Row> const& described = m_columns[column];
-        return {described.name, described.number, described.type, described.writable};
+        return {described.name, described.number, described.type, described.details};
     }
     std::size_t rowCount(Facts const& facts) const override { return rows(facts).size(); }
     void appendIndex(Facts const& facts, std::size_t row, Oid& name) const override {
@@ -107,8 +145,10 @@ class RowTable final : public Table {
         Column<Row> const& described = m_columns[column];
         Row const& asked = rows(facts)[row];
         Value value = described.get(asked);
-        if (!described.writable || facts.settings == nullptr || !isKnown(value)) return value;
-        auto set = facts.settings->value({described.writable->setting, asked.index().front()});
+        if (!described.details.allows(value)) return {};
+        auto const& writable = described.details.writable;
+        if (!writable || facts.settings == nullptr || !isKnown(value)) return value;
+        auto set = facts.settings->value({writable->setting, asked.index().front()});
         if (!set) return value;
         if (auto* const text = std::get_if<std::string>(&*set)) return std::move(*text);
         return std::int64_t{std::get<int>(*set)};

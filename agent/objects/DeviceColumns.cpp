@@ -10,9 +10,30 @@ namespace {
 
 using enum ValueType;
 
+constexpr NamedNumber kDeviceTypes[] = {
+    {501, "digitalTrunk"},   {503, "voice"},       {505, "digitalSpan"}, {507, "conference"},
+    {509, "tones"},          {511, "fax"},         {514, "isdnTrunk"},   {516, "isdnTrunk2"},
+    {518, "signalling"},     {520, "mediaOverIp"}, {521, "switching"},   {525, "stations"},
+    {527, "lineInterfaces"},
+};
+
+constexpr NamedNumber kSubDeviceTypes[] = {
+    {502, "trunkTimeSlots"},
+    {504, "players"},
+    {506, "spanTimeSlots"},
+    {508, "conferenceParties"},
+    {510, "mixers"},
+    {512, "faxEngines"},
+    {517, "bearerChannels"},
+    {519, "signallingLinks"},
+    {522, "mediaStreams"},
+    {526, "stationSlots"},
+    {528, "lineInterfaceSlots"},
+};
+
 constexpr Column<DeviceRow> kDeviceColumns[] = {
     {"kvlDeviceName", 2, Text, textIfKnown<&DeviceRow::name>},
-    {"kvlDeviceType", 3, Integer, number<&DeviceRow::type>},
+    {"kvlDeviceType", 3, Integer, number<&DeviceRow::type>, oneOf(kDeviceTypes)},
     {"kvlDeviceChannelCount", 4, Integer, number<&DeviceRow::channelCount>},
     {"kvlDeviceLineAdminAddress", 5, Octets, textIfKnown<&DeviceRow::lineAdminAddress>},
     {"kvlDeviceProtocolTypes", 6, Text, textIfKnown<&DeviceRow::protocolTypes>},
@@ -20,7 +41,7 @@ constexpr Column<DeviceRow> kDeviceColumns[] = {
 
 constexpr Column<SubDeviceRow> kSubDeviceColumns[] = {
     {"kvlSubDeviceName", 2, Text, textIfKnown<&SubDeviceRow::name>},
-    {"kvlSubDeviceType", 3, Integer, number<&SubDeviceRow::type>},
+    {"kvlSubDeviceType", 3, Integer, number<&SubDeviceRow::type>, oneOf(kSubDeviceTypes)},
     {"kvlSubDeviceOutVariant", 4, Integer, number<&SubDeviceRow::outVariant>},
     {"kvlSubDeviceTscAddress", 5, Octets, textIfKnown<&SubDeviceRow::tscAddress>},
     {"kvlSubDeviceClusterAddress", 6, Octets, textIfKnown<&SubDeviceRow::clusterAddress>},

@@ -14,11 +14,31 @@ Value plain(FaultRow const& row) {
     return std::int64_t{row.*Field};
 }
 
+Value kind(FaultRow const& row) {
+    return std::int64_t{faultKind(row.value)};
+}
+
+constexpr NamedNumber kKinds[] = {
+    {kOtherFault, "other"},
+    {256, "lossOfSignal"},
+    {257, "lossOfFrame"},
+    {258, "receivingAis"},
+    {259, "receivingRai"},
+    {260, "sendingRai"},
+    {261, "sendingAis"},
+    {262, "loopback"},
+    {263, "receivingTimeSlot16Ais"},
+    {264, "receivingRemoteMultiframeAlarm"},
+    {265, "sendingRemoteMultiframeAlarm"},
+    {266, "receivingTestCode"},
+};
+
 constexpr Column<FaultRow> kColumns[] = {
     {"kvlFaultTime", 3, TimeStamp, plain<&FaultRow::time>},
     {"kvlFaultDate", 4, Date, textIfKnown<&FaultRow::date>},
     {"kvlFaultTimesRaised", 5, Counter, plain<&FaultRow::times>},
     {"kvlFaultPlatformBoard", 6, Integer, plain<&FaultRow::platformBoard>},
+    {"kvlFaultKind", 7, Integer, kind, oneOf(kKinds)},
 };
 
 std::vector<FaultRow> const& rows(Snapshot const& snapshot) {

@@ -108,7 +108,7 @@ SetFault ObjectTree::test(Facts const& facts, OidView name, Value const& asked,
                           std::optional<Change>& change) const {
     Node const* const node = nodeOf(name);
     if (node == nullptr || node->table == nullptr) return SetFault::NotWritable;
-    auto const writable = node->table->column(node->column).writable;
+    auto const writable = node->table->column(node->column).details.writable;
     if (!writable) return SetFault::NotWritable;
     SettingValue value;
     if (SetFault const fault = accept(*writable, node->type, asked, value); fault != SetFault::None)

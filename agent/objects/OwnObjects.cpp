@@ -4,9 +4,9 @@
 namespace kvloamd {
 
 std::vector<Table const*> tables() {
-    return {&boardTable(),          &moduleTable(),    &serviceTable(), &deviceTable(),
-            &subDeviceTable(),      &processorTable(), &storeTable(),   &processTable(),
-            &resourceDeviceTable(), &faultTable()};
+    return {&boardTable(),          &moduleTable(),    &serviceTable(),  &deviceTable(),
+            &subDeviceTable(),      &processorTable(), &storeTable(),    &processTable(),
+            &resourceDeviceTable(), &faultTable(),     &interfaceTable()};
 }
 
 } // namespace kvloamd

@@ -28,6 +28,7 @@ Table const& storeTable();
 Table const& processTable();
 Table const& resourceDeviceTable();
 Table const& faultTable();
+Table const& interfaceTable();
 
 /// Every table.
 std::vector<Table const*> tables();

@@ -161,6 +161,18 @@ std::span<Scalar const> scalars() {
              if (facts.counters.master == Master::None) return {};
              return std::int64_t{facts.snapshot.interfaceConflicts};
          }},
+        {"kvlHealthNotificationsDropped",
+         {1, 1, 9, 16},
+         ValueType::Counter,
+         [](Facts const& facts) { return count(facts.counters.notificationsDropped); }},
+        {"kvlHealthFaultCount",
+         {1, 1, 9, 17},
+         ValueType::Gauge,
+         [](Facts const& facts) { return size(facts.snapshot.faults.rows); }},
+        {"kvlHealthFaultsUnlisted",
+         {1, 1, 9, 18},
+         ValueType::Counter,
+         [](Facts const& facts) -> Value { return std::int64_t{facts.snapshot.faults.unlisted}; }},
         {"kvlPersistence",
          {1, 1, 9, 14},
          ValueType::Integer,

@@ -9,6 +9,17 @@
 
 namespace kvloamd {
 
+/// The numbers of the faults that have a name, KVL-OAM-MIB's KvlFaultKind: the alarms of lines.
+inline constexpr std::uint32_t kFirstNamedFault = 256;
+inline constexpr std::uint32_t kLastNamedFault = 266;
+/// The kind of every other fault.
+inline constexpr int kOtherFault = 1;
+
+inline int faultKind(std::uint32_t value) {
+    bool const isNamed = value >= kFirstNamedFault && value <= kLastNamedFault;
+    return isNamed ? static_cast<int>(value) : kOtherFault;
+}
+
 /// A fault that has been raised and not been cleared.
 struct FaultRow {
     std::uint32_t boardIndex = 0; ///< 0: of a board that the agent does not know

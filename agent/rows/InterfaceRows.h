@@ -59,6 +59,9 @@ struct InterfaceRow {
     std::optional<int> connectorPresent; ///< 1: yes, 2: no
     /// The default of ifLinkUpDownTrapEnable: 1 enabled, 2 disabled.
     int linkUpDownTraps = 1;
+    // Whose it is, known when the entities are.
+    std::string boardSerialNumber;
+    std::uint32_t entity = 0; ///< the entPhysicalIndex of its port, else of its board; 0: none
 
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
 };

@@ -136,6 +136,27 @@ TEST_F(EntityTest, BoardIsDescribed) {
     EXPECT_EQ(physical(6).at(slot), "INTEGER: 4");
 }
 
+TEST_F(EntityTest, BoardAndInterfacesLeadToTheirEntities) {
+    startAgent();
+    std::string const board = boardOf("NX50001");
+    EXPECT_EQ(get("kvlBoardPhysicalIndex.1"), "INTEGER: " + board);
+    std::string const port = portNamed("nx5-trunk-1");
+    EXPECT_EQ(get("kvlInterfacePhysicalIndex.1000"), "INTEGER: " + port);
+    EXPECT_EQ(get("kvlInterfaceBoardIndex.1000"), "INTEGER: 1");
+    EXPECT_EQ(get("kvlInterfaceBoardSerialNumber.1000"), "STRING: NX50001");
+    // Every interface belongs to a board and is somewhere in it.
+    std::size_t const interfaces = column("1.3.6.1.2.1.2.2.1.1").size();
+    auto const boards = column("1.3.6.1.4.1.32473.1.1.10.1.1.2");
+    EXPECT_EQ(boards.size(), interfaces);
+    auto const entities = column("1.3.6.1.4.1.32473.1.1.10.1.1.4");
+    EXPECT_EQ(entities.size(), interfaces);
+    auto const containers = physical(4);
+    for (auto const& [index, entity] : entities) {
+        std::string const own = get("kvlBoardPhysicalIndex." + boards.at(index).substr(9));
+        EXPECT_TRUE(entity == own || containers.at(entity.substr(9)) == own) << index;
+    }
+}
+
 TEST_F(EntityTest, PortIsMappedToTheInterfaceOfItsName) {
     startAgent();
     auto const aliases = column(kAlias);
@@ -223,6 +244,11 @@ TEST_F(EntityTest, StoppedBoardIsLockedWhichIsNoFailure) {
     sim({"start", "1"});
     std::string const objects = "\tSNMPv2-SMI::mib-2.131.1.1.1.2." + board + " = ";
     EXPECT_TRUE(trapReceiver().waitFor(kOperEnabled + objects + "4")) << trapReceiver().output();
+    // After the objects of the standard: whose state it is.
+    EXPECT_TRUE(trapReceiver().waitFor("\tSNMPv2-SMI::mib-2.47.1.1.1.1.7." + board +
+                                       " = \"NX5-T1\"\tSNMPv2-SMI::mib-2.47.1.1.1.1.14." + board +
+                                       " = \"\"\tKVL-OAM-MIB::kvlBoardSerialNumber.1 = NX50001"))
+        << trapReceiver().output();
     EXPECT_EQ(state(2, board), "INTEGER: 4");
     EXPECT_THAT(trapReceiver().output(), Not(HasSubstr(kOperDisabled)));
 }

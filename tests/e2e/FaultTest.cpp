@@ -21,8 +21,12 @@ class FaultTest : public AgentFixture {
             "\tKVL-OAM-MIB::kvlNotifyBoardSerialNumber.0 = " + serialNumber +
             "\tKVL-OAM-MIB::kvlNotifyFaultValue.0 = " + std::to_string(fault) +
             "\tKVL-OAM-MIB::kvlNotifyFaultPlatformBoard.0 = " + std::to_string(platformBoard) +
-            "\n";
+            "\tKVL-OAM-MIB::kvlNotifyFaultKind.0 = " + kindOf(fault) +
+            (index == 0 ? "\n" : "\tKVL-OAM-MIB::kvlBoardName." + std::to_string(index) + " = ");
         EXPECT_TRUE(trapReceiver().waitFor(text)) << text << "not in:\n" << trapReceiver().output();
+    }
+    static std::string kindOf(int fault) {
+        return fault == 256 ? "lossOfSignal" : fault == 259 ? "receivingRai" : "other";
     }
     std::vector<Answer> faults() const {
         auto all = walk("kvlFaultTimesRaised");
@@ -38,6 +42,7 @@ TEST_F(FaultTest, RaisedFaultIsInTheTableWhenItsNotificationArrives) {
     expectAnnounced("kvlFaultRaised", 2, "QL-77-0420", 17, 1);
     EXPECT_EQ(get("kvlFaultTimesRaised.2.17"), "Counter32: 1 times");
     EXPECT_EQ(get("kvlFaultPlatformBoard.2.17"), "INTEGER: 1");
+    EXPECT_EQ(get("kvlFaultKind.2.17"), "INTEGER: other(1)");
     EXPECT_THAT(get("kvlFaultDate.2.17"), HasSubstr("STRING: 20"));
     EXPECT_EQ(get("kvlFaultTime.2.17"), get("kvlFaultTableLastChange.0"));
     EXPECT_EQ(get("kvlFaultCount.0"), "Gauge32: 1 faults");
@@ -95,6 +100,7 @@ TEST_F(FaultTest, AlarmFromBeforeTheStartIsAFault) {
     EXPECT_TRUE(
         eventually([this] { return get("kvlFaultTimesRaised.1.259") == "Counter32: 1 times"; }));
     EXPECT_EQ(get("kvlFaultPlatformBoard.1.259"), "INTEGER: -1");
+    EXPECT_EQ(get("kvlFaultKind.1.259"), "INTEGER: receivingRai(259)");
 }
 
 TEST_F(FaultTest, BoardWithoutLogicalIdentifierIsKnownByItsDrivers) {

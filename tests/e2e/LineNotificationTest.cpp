@@ -76,6 +76,25 @@ TEST_F(LineNotificationTest, LineForWhichItIsEnabledIsToldCutAndWhole) {
     expectLineTold(kWhole);
 }
 
+TEST_F(LineNotificationTest, LineAndLinkSayWhoTheyAreWithWhatAGetAnswers) {
+    startWithReceiver("rwcommunity");
+    set(kLineTraps, "1");
+    std::string const alias = "1.3.6.1.2.1.31.1.1.1.18.1000";
+    EXPECT_EQ(ask("snmpset", {alias, "s", "to the exchange"}).status, 0);
+    cut();
+    expectLinkTold(3, "1000", 2);
+    expectLineTold(kCut);
+    std::string const who = "\tSNMPv2-SMI::mib-2.31.1.1.1.1.1000 = \"nx5-trunk-1\""
+                            "\tSNMPv2-SMI::mib-2.31.1.1.1.18.1000 = \"to the exchange\""
+                            "\tKVL-OAM-MIB::kvlBoardSerialNumber.1 = NX50001";
+    EXPECT_TRUE(trapReceiver().waitFor(who, 2)) << trapReceiver().output();
+    // They follow the objects of the standard.
+    expectTold("\tSNMPv2-SMI::mib-2.2.2.1.8.1000 = 2" + who);
+    EXPECT_EQ(get("1.3.6.1.2.1.31.1.1.1.1.1000"), "STRING: \"nx5-trunk-1\"");
+    EXPECT_EQ(get(alias), "STRING: \"to the exchange\"");
+    EXPECT_EQ(get("kvlBoardSerialNumber.1"), "STRING: NX50001");
+}
+
 TEST_F(LineNotificationTest, ThirdVersionCarriesLinesAndLinks) {
     startWithUser();
     set(kLineTraps, "1");

@@ -24,7 +24,7 @@ class MasterAwayTest : public MasterFixture {
     }
     static std::string announced(std::string const& serialNumber, std::string const& status) {
         return "\tKVL-OAM-MIB::kvlNotifyBoardSerialNumber.0 = " + serialNumber +
-               "\tKVL-OAM-MIB::kvlNotifyBoardStatus.0 = " + status + "\n";
+               "\tKVL-OAM-MIB::kvlNotifyBoardStatus.0 = " + status;
     }
     void expectAnnounced(std::string const& serialNumber, std::string const& status) {
         EXPECT_TRUE(trapReceiver().waitFor(announced(serialNumber, status)))

@@ -129,7 +129,7 @@ TEST_F(MibTest, NotificationsCarryWhatTheModuleSays) {
                   {"kvlNotifyBoardIndex", "kvlNotifyBoardSerialNumber", "kvlNotifyBoardStatus"});
     expectCarried(faultNotification({}, FaultChange{}),
                   {"kvlNotifyBoardIndex", "kvlNotifyBoardSerialNumber", "kvlNotifyFaultValue",
-                   "kvlNotifyFaultPlatformBoard"});
+                   "kvlNotifyFaultPlatformBoard", "kvlNotifyFaultKind"});
 }
 
 TEST_F(MibTest, EveryReadableObjectOfTheModuleIsDescribed) {

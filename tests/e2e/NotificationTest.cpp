@@ -31,7 +31,7 @@ class NotificationTest : public AgentFixture {
         return "KVL-OAM-MIB::kvlBoardStatusChange\tKVL-OAM-MIB::kvlNotifyBoardIndex.0 = " +
                std::to_string(index) +
                "\tKVL-OAM-MIB::kvlNotifyBoardSerialNumber.0 = " + serialNumber +
-               "\tKVL-OAM-MIB::kvlNotifyBoardStatus.0 = " + status + "\n";
+               "\tKVL-OAM-MIB::kvlNotifyBoardStatus.0 = " + status;
     }
     void expectAnnounced(int index, std::string const& serialNumber, std::string const& status,
                          int times = 1) {

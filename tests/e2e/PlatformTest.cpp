@@ -76,8 +76,9 @@ TEST_F(PlatformTest, DevicesOfTheExampleChassisAreShown) {
         EXPECT_THAT(result.output, HasSubstr(deviceTable().column(column).name));
     auto const devices = rows("kvlDeviceTable");
     ASSERT_THAT(devices, SizeIs(14)) << result.output;
-    EXPECT_THAT(devices[0], AllOf(HasSubstr("1.101"), HasSubstr("nx5-trunk-1"), HasSubstr("501"),
-                                  HasSubstr("24"), HasSubstr("1.1.1.0"), HasSubstr("1,3,-1")));
+    EXPECT_THAT(devices[0],
+                AllOf(HasSubstr("1.101"), HasSubstr("nx5-trunk-1"), HasSubstr("digitalTrunk"),
+                      HasSubstr("24"), HasSubstr("1.1.1.0"), HasSubstr("1,3,-1")));
     EXPECT_THAT(devices[13], AllOf(HasSubstr("3.304"), HasSubstr("vorn-lines")));
 }
 
@@ -196,8 +197,8 @@ TEST_F(PlatformTest, MissingAttributesLeaveHoles) {
                "    devices: [{handle: 71, type: 501, subdevices: [{handle: 72, type: 502}]}]\n"
                "    processors: [{handle: 73, attributes: {NAME: only}}]\n");
     startAgent();
-    EXPECT_EQ(get("kvlDeviceType.1.71"), "INTEGER: 501");
-    EXPECT_EQ(get("kvlSubDeviceType.1.71.72"), "INTEGER: 502");
+    EXPECT_EQ(get("kvlDeviceType.1.71"), "INTEGER: digitalTrunk(501)");
+    EXPECT_EQ(get("kvlSubDeviceType.1.71.72"), "INTEGER: trunkTimeSlots(502)");
     for (char const* const missing :
          {"kvlDeviceName.1.71", "kvlDeviceChannelCount.1.71", "kvlDeviceLineAdminAddress.1.71",
           "kvlDeviceProtocolTypes.1.71", "kvlSubDeviceTscAddress.1.71.72",

@@ -59,7 +59,13 @@ void printTables(Oid const& arc, std::vector<Table const*> const& tables) {
             place.push_back(head.number);
             std::printf("column %s %s %s %s", head.name, number(arc, place).c_str(),
                         typeName(head.type), table->name());
-            if (head.writable) std::printf(" %d %d", head.writable->lowest, head.writable->highest);
+            if (auto const& writable = head.details.writable)
+                std::printf(" %d %d", writable->lowest, writable->highest);
+            std::printf("\n");
+            if (head.details.names.empty()) continue;
+            std::printf("names %s", head.name);
+            for (NamedNumber const& named : head.details.names)
+                std::printf(" %d=%s", named.number, named.name);
             std::printf("\n");
         }
 }

@@ -140,11 +140,19 @@ def described(program_output):
     """The agent's description: name -> (number, type, table, range that can be set)."""
     objects = {}
     for line in program_output.splitlines():
+        if line.startswith('names '):
+            continue
         kind, name, number, value_type, *rest = line.split()
         oid = tuple(int(part) for part in number.split('.'))
         settable = (int(rest[1]), int(rest[2])) if len(rest) == 3 else None
         objects[name] = (oid, value_type, rest[0] if kind == 'column' else None, settable)
     return objects
+
+
+def named(program_output):
+    """The names of the numbers of described enumerations: name -> {number: its name}."""
+    return {name: {int(number): text for number, text in (each.split('=') for each in numbers)}
+            for kind, name, *numbers in map(str.split, program_output.splitlines()) if kind == 'names'}
 
 
 def updated(root, conformance, described_objects):

@@ -71,7 +71,7 @@ TEST_F(FaultListenerTest, RaisedFaultIsAnnouncedWithItsBoard) {
     ASSERT_TRUE(notification.has_value());
     EXPECT_EQ(notification->name, (Oid{1, 3, 9, 1, 0, 2}));
     EXPECT_EQ(std::get<std::string>(notification->objects.at(1).value), "A");
-    EXPECT_EQ(numbersSent(), (std::vector<std::int64_t>{1, 17, 0}));
+    EXPECT_EQ(numbersSent(), (std::vector<std::int64_t>{1, 17, 0, 1}));
 }
 
 TEST_F(FaultListenerTest, ClearedFaultIsAnnouncedAndOutOfTheList) {
@@ -81,14 +81,14 @@ TEST_F(FaultListenerTest, ClearedFaultIsAnnouncedAndOutOfTheList) {
     tell(FaultCleared, 3, 17);
     EXPECT_TRUE(rows().empty());
     EXPECT_EQ(m_queue.oldest()->name, (Oid{1, 3, 9, 1, 0, 3}));
-    EXPECT_EQ(numbersSent(), (std::vector<std::int64_t>{1, 17, 3}));
+    EXPECT_EQ(numbersSent(), (std::vector<std::int64_t>{1, 17, 3, 1}));
 }
 
 TEST_F(FaultListenerTest, FaultOfNoBoardIsThatOfBoardZero) {
     insert("A", 3);
     tell(FaultRaised, 4, 17);
     EXPECT_EQ(rows().at(0).boardIndex, 0U);
-    EXPECT_EQ(numbersSent(), (std::vector<std::int64_t>{0, 17, 4}));
+    EXPECT_EQ(numbersSent(), (std::vector<std::int64_t>{0, 17, 4, 1}));
 }
 
 TEST_F(FaultListenerTest, FaultsOfARemovedBoardAreGoneAtOnce) {

@@ -12,6 +12,7 @@ class ScriptedSink final : public NotificationSink {
     bool ready() const override { return isReady; }
     void send(Notification const& notification, Delivered taken) override {
         sent.push_back(notification.name.back());
+        objects = notification.objects.size();
         if (takesAtOnce)
             taken(Delivery::Sent);
         else
@@ -23,6 +24,7 @@ class ScriptedSink final : public NotificationSink {
     bool takesAtOnce = true;
     Delivered underWay;
     std::vector<std::uint32_t> sent;
+    std::size_t objects = 0; ///< of the last one
 };
 
 class NotifierTest : public ::testing::Test {
@@ -33,7 +35,9 @@ class NotifierTest : public ::testing::Test {
     Counters m_counters;
     NotificationQueue m_queue{m_counters};
     ScriptedSink m_sink;
-    Notifier m_notifier{m_queue, m_sink};
+    Notifier m_notifier{m_queue, m_sink, [](Notification& notification) {
+                            notification.objects.push_back({{1, 7}, ValueType::Integer, 7});
+                        }};
 };
 
 TEST_F(NotifierTest, ChangesThatTheSnapshotShowsAreSentInOrder) {
@@ -51,6 +55,18 @@ TEST_F(NotifierTest, ChangeThatTheSnapshotDoesNotShowWaits) {
     ASSERT_TRUE(again.has_value());
     EXPECT_GE(*again, before + Notifier::kPatience);
     EXPECT_TRUE(m_sink.sent.empty());
+}
+
+TEST_F(NotifierTest, NotificationIsCompletedOnceForEachTimeItIsSent) {
+    m_sink.takesAtOnce = false;
+    change(1);
+    announceShown();
+    EXPECT_EQ(m_sink.objects, 1U);
+    // The connection was lost, so it is sent again.
+    m_sink.isReady = true;
+    announceShown();
+    EXPECT_EQ(m_sink.sent, (std::vector<std::uint32_t>{1, 1}));
+    EXPECT_EQ(m_sink.objects, 1U);
 }
 
 TEST_F(NotifierTest, ChangeStaysUntilItIsTaken) {

@@ -85,7 +85,7 @@ TEST_F(ObjectTreeTest, IndexColumnIsNoObject) {
 }
 
 TEST_F(ObjectTreeTest, ColumnBeyondTheLastIsNoObject) {
-    EXPECT_EQ(find({1, 1, 2, 4, 1, 21, 5}), Lookup::NoSuchObject);
+    EXPECT_EQ(find({1, 1, 2, 4, 1, 22, 5}), Lookup::NoSuchObject);
 }
 
 TEST_F(ObjectTreeTest, BranchIsNoObject) {

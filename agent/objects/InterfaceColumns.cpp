@@ -1,0 +1,36 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// kvlInterfaceTable: which board an interface belongs to.
+#include "agent/objects/OwnObjects.h"
+#include "agent/objects/RowValues.h"
+
+namespace kvloamd {
+
+namespace {
+
+using enum ValueType;
+using Row = InterfaceRow;
+
+/// An index of another table; 0 is none.
+template <auto Field>
+Value reference(Row const& row) {
+    return row.*Field == 0 ? Value{} : Value{std::int64_t{row.*Field}};
+}
+
+constexpr Column<Row> kColumns[] = {
+    {"kvlInterfaceBoardIndex", 2, Integer, reference<&Row::boardIndex>},
+    {"kvlInterfaceBoardSerialNumber", 3, Text, text<&Row::boardSerialNumber>},
+    {"kvlInterfacePhysicalIndex", 4, Integer, reference<&Row::entity>},
+};
+
+std::vector<Row> const& rows(Snapshot const& snapshot) {
+    return snapshot.interfaces.interfaces;
+}
+
+} // namespace
+
+Table const& interfaceTable() {
+    static RowTable<Row, rows> const table("kvlInterfaceTable", {1, 1, 10, 1, 1}, kColumns);
+    return table;
+}
+
+} // namespace kvloamd
