@@ -28,16 +28,23 @@ Value channel(Ds0ChannelRow const& row) {
 
 using enum ValueType;
 
+constexpr NamedNumber kTruthValues[] = {{1, "true"}, {2, "false"}};
+
 constexpr Column<BearerRow> kConfigColumns[] = {
-    {"dsx0Ds0ChannelNumber", 1, Integer, number<&BearerRow::timeSlot>},
-    {"dsx0RobbedBitSignalling", 2, Integer, no},
-    {"dsx0CircuitIdentifier", 3, Text, circuit},
-    {"dsx0TransmitCodesEnable", 7, Integer, no},
-    {"dsx0Ds0BundleMappedIfIndex", 8, Integer, bundle},
+    {"dsx0Ds0ChannelNumber", 1, Integer, number<&BearerRow::timeSlot>,
+     about("The number of the channel on its line")},
+    {"dsx0RobbedBitSignalling", 2, Integer, no,
+     about("Whether signalling takes bits of the channel").oneOf(kTruthValues)},
+    {"dsx0CircuitIdentifier", 3, Text, circuit,
+     about("The name that the carrier has given to the circuit")},
+    {"dsx0TransmitCodesEnable", 7, Integer, no,
+     about("Whether idle and seized codes are sent").oneOf(kTruthValues)},
+    {"dsx0Ds0BundleMappedIfIndex", 8, Integer, bundle,
+     about("The bundle that the channel is part of")},
 };
 
 constexpr Column<Ds0ChannelRow> kMappingColumns[] = {
-    {"dsx0ChanMappedIfIndex", 1, Integer, channel},
+    {"dsx0ChanMappedIfIndex", 1, Integer, channel, about("The interface that is the channel")},
 };
 
 } // namespace

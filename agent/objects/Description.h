@@ -20,14 +20,6 @@
 
 namespace kvloamd {
 
-/// An object with one instance.
-struct Scalar {
-    char const* name;
-    Oid place; ///< relative
-    ValueType type;
-    Value (*get)(Facts const&);
-};
-
 /// What a text that can be set may consist of. Control characters are never accepted.
 enum class Characters { Utf8, Ascii };
 
@@ -48,35 +40,101 @@ struct NamedNumber {
 /// All numbers of an enumeration.
 using Names = std::span<NamedNumber const>;
 
-/// What there is to say about an object beyond its name, type and place.
+/// What a value tells. It decides how other surfaces than SNMP show it.
+enum class Kind {
+    Information, ///< what something is
+    State,       ///< one of several that something may be in
+    Counter,     ///< only grows
+    Gauge,       ///< goes up and down
+    Time         ///< a date, or a time since the start
+};
+
+/// What there is to say about an object beyond its name, type and place. Written as a sentence:
+///
+///     about("The state of the line").oneOf(kStates)
+///     about("Octets received").in("octets")
+///     about("The name that operators gave").settable(kAlias).identifies()
 struct Details {
-    constexpr Details() = default;
-    /// An object that can be set.
-    constexpr Details(Writable what)
-        : writable(what) {} // NOLINT(google-explicit-constructor): reads well in tables
+    char const* help = "";                           ///< one line for people, without a full stop
+    char const* unit = "";                           ///< in the plural; empty: none
+    Names names = {};                                ///< of an enumeration, or of the bits of a set
+    bool hasOtherNumbers = false;                    ///< numbers without a name are legal as well
+    std::optional<Writable> writable = std::nullopt; ///< nothing: the object is read-only
+    bool isIdentifying = false;                      ///< people recognise the row by it
+    std::optional<Kind> kind = std::nullopt;         ///< nothing: follows from the type
 
-    std::optional<Writable> writable; ///< nothing: the object is read-only
-    Names names;                      ///< of an enumeration; otherwise empty
-
-    /// The same with the numbers that it may have. Any other number counts as not known.
-    constexpr Details named(Names numbers) const {
+    constexpr Details oneOf(Names numbers) const {
         Details changed = *this;
         changed.names = numbers;
         return changed;
     }
-    /// Whether the MIB module has a word for `value`.
+    constexpr Details someOf(Names numbers) const {
+        Details changed = oneOf(numbers);
+        changed.hasOtherNumbers = true;
+        return changed;
+    }
+    constexpr Details in(char const* what) const {
+        Details changed = *this;
+        changed.unit = what;
+        return changed;
+    }
+    constexpr Details settable(Writable what) const {
+        Details changed = *this;
+        changed.writable = what;
+        return changed;
+    }
+    constexpr Details identifies() const {
+        Details changed = *this;
+        changed.isIdentifying = true;
+        return changed;
+    }
+    constexpr Details as(Kind what) const {
+        Details changed = *this;
+        changed.kind = what;
+        return changed;
+    }
+
+    /// Whether the MIB module has a word for `value`. A value without one counts as not known.
     bool allows(Value const& value) const {
         auto const* const number = std::get_if<std::int64_t>(&value);
-        return names.empty() || number == nullptr ||
+        return names.empty() || hasOtherNumbers || number == nullptr ||
                std::ranges::any_of(
                    names, [&](NamedNumber const& named) { return named.number == *number; });
     }
 };
 
-/// The details of an enumeration.
-constexpr Details oneOf(Names numbers) {
-    return Details().named(numbers);
+constexpr Details about(char const* help) {
+    Details details;
+    details.help = help;
+    return details;
 }
+
+/// The kind of an object of this type.
+constexpr Kind kindOf(ValueType type, Details const& details) {
+    if (details.kind) return *details.kind;
+    switch (type) {
+    case ValueType::Counter:
+    case ValueType::Counter64:
+        return Kind::Counter;
+    case ValueType::Gauge:
+        return Kind::Gauge;
+    case ValueType::TimeTicks:
+    case ValueType::TimeStamp:
+    case ValueType::Date:
+        return Kind::Time;
+    default:
+        return details.names.empty() ? Kind::Information : Kind::State;
+    }
+}
+
+/// An object with one instance.
+struct Scalar {
+    char const* name;
+    Oid place; ///< relative
+    ValueType type;
+    Value (*get)(Facts const&);
+    Details details = {};
+};
 
 struct ColumnHead {
     char const* name;

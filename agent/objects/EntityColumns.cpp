@@ -64,33 +64,54 @@ constexpr Writable kAlias{Setting::EntityAlias, 0, kLongestAlias};
 constexpr Writable kAssetId{Setting::EntityAssetId, 0, kLongestAlias};
 constexpr Writable kUris{Setting::EntityUris, 0, kLongestUris, Characters::Ascii};
 
+constexpr NamedNumber kEntPhysicalClass[] = {
+    {1, "other"},       {2, "unknown"}, {3, "chassis"},       {4, "backplane"}, {5, "container"},
+    {6, "powerSupply"}, {7, "fan"},     {8, "sensor"},        {9, "module"},    {10, "port"},
+    {11, "stack"},      {12, "cpu"},    {13, "energyObject"}, {14, "battery"}};
+
+constexpr NamedNumber kTruthValues[] = {{1, "true"}, {2, "false"}};
+
 constexpr Column<Row> kPhysicalColumns[] = {
-    {"entPhysicalDescr", 2, Text, text<&Row::description>},
-    {"entPhysicalVendorType", 3, ObjectId, vendorType},
-    {"entPhysicalContainedIn", 4, Integer, containedIn},
-    {"entPhysicalClass", 5, Integer, physicalClass},
-    {"entPhysicalParentRelPos", 6, Integer, position},
-    {"entPhysicalName", 7, Text, text<&Row::name>},
-    {"entPhysicalHardwareRev", 8, Text, notKnown},
-    {"entPhysicalFirmwareRev", 9, Text, text<&Row::firmware>},
-    {"entPhysicalSoftwareRev", 10, Text, text<&Row::software>},
-    {"entPhysicalSerialNum", 11, Text, text<&Row::serialNumber>},
-    {"entPhysicalMfgName", 12, Text, notKnown},
-    {"entPhysicalModelName", 13, Text, text<&Row::model>},
-    {"entPhysicalAlias", 14, Text, text<&Row::alias>, kAlias},
-    {"entPhysicalAssetID", 15, Text, text<&Row::assetId>, kAssetId},
-    {"entPhysicalIsFRU", 16, Integer, isReplaceable},
-    {"entPhysicalMfgDate", 17, Octets, manufacturingDate},
-    {"entPhysicalUris", 18, Octets, text<&Row::uris>, kUris},
-    {"entPhysicalUUID", 19, Octets, notKnown},
+    {"entPhysicalDescr", 2, Text, text<&Row::description>, about("What the entity is, in words")},
+    {"entPhysicalVendorType", 3, ObjectId, vendorType,
+     about("The maker's identity for this kind of entity")},
+    {"entPhysicalContainedIn", 4, Integer, containedIn, about("The entity that contains this one")},
+    {"entPhysicalClass", 5, Integer, physicalClass,
+     about("The kind of the entity").oneOf(kEntPhysicalClass).as(Kind::Information)},
+    {"entPhysicalParentRelPos", 6, Integer, position,
+     about("The position among the entities of the same container")},
+    {"entPhysicalName", 7, Text, text<&Row::name>,
+     about("The name of the entity on the system's own console").identifies()},
+    {"entPhysicalHardwareRev", 8, Text, notKnown, about("The revision of the hardware")},
+    {"entPhysicalFirmwareRev", 9, Text, text<&Row::firmware>,
+     about("The revision of the firmware")},
+    {"entPhysicalSoftwareRev", 10, Text, text<&Row::software>,
+     about("The revision of the software")},
+    {"entPhysicalSerialNum", 11, Text, text<&Row::serialNumber>,
+     about("The serial number").identifies()},
+    {"entPhysicalMfgName", 12, Text, notKnown, about("The maker")},
+    {"entPhysicalModelName", 13, Text, text<&Row::model>, about("The maker's name of the model")},
+    {"entPhysicalAlias", 14, Text, text<&Row::alias>,
+     about("The name that the operator has given to the entity").settable(kAlias)},
+    {"entPhysicalAssetID", 15, Text, text<&Row::assetId>,
+     about("The operator's inventory number").settable(kAssetId)},
+    {"entPhysicalIsFRU", 16, Integer, isReplaceable,
+     about("Whether the entity can be replaced in the field")
+         .oneOf(kTruthValues)
+         .as(Kind::Information)},
+    {"entPhysicalMfgDate", 17, Octets, manufacturingDate, about("When the entity was made")},
+    {"entPhysicalUris", 18, Octets, text<&Row::uris>,
+     about("Identifiers of the entity as URIs, separated by white space").settable(kUris)},
+    {"entPhysicalUUID", 19, Octets, notKnown,
+     about("The universally unique identifier of the entity")},
 };
 
 constexpr Column<AliasRow> kAliasColumns[] = {
-    {"entAliasMappingIdentifier", 2, ObjectId, interface},
+    {"entAliasMappingIdentifier", 2, ObjectId, interface, about("The instance in the other table")},
 };
 
 constexpr Column<ContainsRow> kContainsColumns[] = {
-    {"entPhysicalChildIndex", 1, Integer, child},
+    {"entPhysicalChildIndex", 1, Integer, child, about("The entity that is contained")},
 };
 
 } // namespace

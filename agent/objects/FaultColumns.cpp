@@ -34,11 +34,15 @@ constexpr NamedNumber kKinds[] = {
 };
 
 constexpr Column<FaultRow> kColumns[] = {
-    {"kvlFaultTime", 3, TimeStamp, plain<&FaultRow::time>},
-    {"kvlFaultDate", 4, Date, textIfKnown<&FaultRow::date>},
-    {"kvlFaultTimesRaised", 5, Counter, plain<&FaultRow::times>},
-    {"kvlFaultPlatformBoard", 6, Integer, plain<&FaultRow::platformBoard>},
-    {"kvlFaultKind", 7, Integer, kind, oneOf(kKinds)},
+    {"kvlFaultTime", 3, TimeStamp, plain<&FaultRow::time>, about("When the fault was raised")},
+    {"kvlFaultDate", 4, Date, textIfKnown<&FaultRow::date>,
+     about("The date at which the fault was raised")},
+    {"kvlFaultTimesRaised", 5, Counter, plain<&FaultRow::times>,
+     about("How many times the fault has been raised since kvlFaultTime").in("times")},
+    {"kvlFaultPlatformBoard", 6, Integer, plain<&FaultRow::platformBoard>,
+     about("The board number that the platform used")},
+    {"kvlFaultKind", 7, Integer, kind,
+     about("What the fault is").oneOf(kKinds).identifies().as(Kind::Information)},
 };
 
 std::vector<FaultRow> const& rows(Snapshot const& snapshot) {

@@ -57,42 +57,91 @@ constexpr Writable kTraps{Setting::LinkUpDownTraps, kEnabled, kDisabled};
 constexpr int kLongestAlias = 64;
 constexpr Writable kAlias{Setting::InterfaceAlias, 0, kLongestAlias, Characters::Ascii};
 
+constexpr NamedNumber kIfType[] = {
+    {1, "other"},        {6, "ethernetCsmacd"}, {18, "ds1"},  {19, "e1"},  {24, "softwareLoopback"},
+    {53, "propVirtual"}, {63, "isdn"},          {77, "lapd"}, {81, "ds0"}, {126, "ip"},
+    {131, "tunnel"},     {135, "l2vlan"}};
+
+constexpr NamedNumber kIfAdminStatus[] = {{1, "up"}, {2, "down"}, {3, "testing"}};
+
+constexpr NamedNumber kIfOperStatus[] = {
+    {1, "up"},      {2, "down"},       {3, "testing"},       {4, "unknown"},
+    {5, "dormant"}, {6, "notPresent"}, {7, "lowerLayerDown"}};
+
+constexpr NamedNumber kEnabling[] = {{1, "enabled"}, {2, "disabled"}};
+
+constexpr NamedNumber kTruthValues[] = {{1, "true"}, {2, "false"}};
+
+constexpr NamedNumber kIfStackStatus[] = {{1, "active"},      {2, "notInService"},  {3, "notReady"},
+                                          {4, "createAndGo"}, {5, "createAndWait"}, {6, "destroy"}};
+
 constexpr Column<Row> kColumns[] = {
-    {"ifIndex", 1, Integer, index},
-    {"ifDescr", 2, Text, text<&Row::description>},
-    {"ifType", 3, Integer, number<&Row::type>},
-    {"ifMtu", 4, Integer, number<&Row::mtu>},
-    {"ifSpeed", 5, Gauge, number<&Row::speed>},
-    {"ifPhysAddress", 6, Octets, textIfKnown<&Row::physAddress>},
-    {"ifAdminStatus", 7, Integer, number<&Row::adminStatus>},
-    {"ifOperStatus", 8, Integer, number<&Row::operStatus>},
-    {"ifLastChange", 9, TimeStamp, number<&Row::lastChange>},
-    {"ifInOctets", 10, Counter, count32<kInOctets>},
-    {"ifInUcastPkts", 11, Counter, count32<kInUcastPkts>},
-    {"ifInDiscards", 13, Counter, count32<kInDiscards>},
-    {"ifInErrors", 14, Counter, count32<kInErrors>},
-    {"ifInUnknownProtos", 15, Counter, count32<kInUnknownProtos>},
-    {"ifOutOctets", 16, Counter, count32<kOutOctets>},
-    {"ifOutUcastPkts", 17, Counter, count32<kOutUcastPkts>},
-    {"ifOutDiscards", 19, Counter, count32<kOutDiscards>},
-    {"ifOutErrors", 20, Counter, count32<kOutErrors>},
+    {"ifIndex", 1, Integer, index, about("The number of the interface")},
+    {"ifDescr", 2, Text, text<&Row::description>,
+     about("What the interface is, in words").identifies()},
+    {"ifType", 3, Integer, number<&Row::type>,
+     about("The kind of the interface").someOf(kIfType).as(Kind::Information)},
+    {"ifMtu", 4, Integer, number<&Row::mtu>,
+     about("The largest packet, in octets, that the interface sends or receives").in("octets")},
+    {"ifSpeed", 5, Gauge, number<&Row::speed>,
+     about("The bandwidth in bits per second").in("bits per second")},
+    {"ifPhysAddress", 6, Octets, textIfKnown<&Row::physAddress>,
+     about("The address of the interface in its own layer")},
+    {"ifAdminStatus", 7, Integer, number<&Row::adminStatus>,
+     about("The state that the interface is meant to have").oneOf(kIfAdminStatus)},
+    {"ifOperStatus", 8, Integer, number<&Row::operStatus>,
+     about("The state that the interface has").oneOf(kIfOperStatus)},
+    {"ifLastChange", 9, TimeStamp, number<&Row::lastChange>,
+     about("The value of sysUpTime when the interface entered the state that it has")},
+    {"ifInOctets", 10, Counter, count32<kInOctets>,
+     about("Octets received, framing included").in("octets")},
+    {"ifInUcastPkts", 11, Counter, count32<kInUcastPkts>,
+     about("Packets received for this interface alone and passed up").in("packets")},
+    {"ifInDiscards", 13, Counter, count32<kInDiscards>,
+     about("Packets received without a fault and dropped all the same")},
+    {"ifInErrors", 14, Counter, count32<kInErrors>,
+     about("Packets or transmission units received with a fault")},
+    {"ifInUnknownProtos", 15, Counter, count32<kInUnknownProtos>,
+     about("Packets received of a protocol that is not known")},
+    {"ifOutOctets", 16, Counter, count32<kOutOctets>,
+     about("Octets sent, framing included").in("octets")},
+    {"ifOutUcastPkts", 17, Counter, count32<kOutUcastPkts>,
+     about("Packets from above that were meant for one receiver").in("packets")},
+    {"ifOutDiscards", 19, Counter, count32<kOutDiscards>,
+     about("Packets without a fault that were dropped instead of sent")},
+    {"ifOutErrors", 20, Counter, count32<kOutErrors>,
+     about("Packets or transmission units that could not be sent because of faults")},
 };
 
 constexpr Column<Row> kMoreColumns[] = {
-    {"ifName", 1, Text, text<&Row::name>},
-    {"ifHCInOctets", 6, Counter64, count64<kInOctets>},
-    {"ifHCInUcastPkts", 7, Counter64, count64<kInUcastPkts>},
-    {"ifHCOutOctets", 10, Counter64, count64<kOutOctets>},
-    {"ifHCOutUcastPkts", 11, Counter64, count64<kOutUcastPkts>},
-    {"ifLinkUpDownTrapEnable", 14, Integer, linkUpDownTraps, kTraps},
-    {"ifHighSpeed", 15, Gauge, highSpeed},
-    {"ifConnectorPresent", 17, Integer, number<&Row::connectorPresent>},
-    {"ifAlias", 18, Text, alias, kAlias},
-    {"ifCounterDiscontinuityTime", 19, TimeStamp, discontinuity},
+    {"ifName", 1, Text, text<&Row::name>,
+     about("The name of the interface on the system's own console").identifies()},
+    {"ifHCInOctets", 6, Counter64, count64<kInOctets>,
+     about("As ifInOctets, with 64 bits").in("octets")},
+    {"ifHCInUcastPkts", 7, Counter64, count64<kInUcastPkts>,
+     about("As ifInUcastPkts, with 64 bits").in("packets")},
+    {"ifHCOutOctets", 10, Counter64, count64<kOutOctets>,
+     about("As ifOutOctets, with 64 bits").in("octets")},
+    {"ifHCOutUcastPkts", 11, Counter64, count64<kOutUcastPkts>,
+     about("As ifOutUcastPkts, with 64 bits").in("packets")},
+    {"ifLinkUpDownTrapEnable", 14, Integer, linkUpDownTraps,
+     about("Whether linkUp and linkDown are sent for the interface")
+         .oneOf(kEnabling)
+         .settable(kTraps)
+         .as(Kind::Information)},
+    {"ifHighSpeed", 15, Gauge, highSpeed,
+     about("The bandwidth in millions of bits per second").in("millions of bits per second")},
+    {"ifConnectorPresent", 17, Integer, number<&Row::connectorPresent>,
+     about("Whether the interface has a connector").oneOf(kTruthValues).as(Kind::Information)},
+    {"ifAlias", 18, Text, alias,
+     about("The name that the operator has given to the interface").settable(kAlias)},
+    {"ifCounterDiscontinuityTime", 19, TimeStamp, discontinuity,
+     about("The value of sysUpTime when a counter of the interface last jumped")},
 };
 
 constexpr Column<StackRow> kStackColumns[] = {
-    {"ifStackStatus", 3, Integer, stackStatus},
+    {"ifStackStatus", 3, Integer, stackStatus,
+     about("The state of the row").oneOf(kIfStackStatus).as(Kind::Information)},
 };
 
 } // namespace

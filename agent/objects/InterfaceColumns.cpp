@@ -17,9 +17,12 @@ Value reference(Row const& row) {
 }
 
 constexpr Column<Row> kColumns[] = {
-    {"kvlInterfaceBoardIndex", 2, Integer, reference<&Row::boardIndex>},
-    {"kvlInterfaceBoardSerialNumber", 3, Text, text<&Row::boardSerialNumber>},
-    {"kvlInterfacePhysicalIndex", 4, Integer, reference<&Row::entity>},
+    {"kvlInterfaceBoardIndex", 2, Integer, reference<&Row::boardIndex>,
+     about("The interface's board")},
+    {"kvlInterfaceBoardSerialNumber", 3, Text, text<&Row::boardSerialNumber>,
+     about("The serial number of the interface's board").identifies()},
+    {"kvlInterfacePhysicalIndex", 4, Integer, reference<&Row::entity>,
+     about("The physical entity that the interface is or belongs to")},
 };
 
 std::vector<Row> const& rows(Snapshot const& snapshot) {

@@ -10,17 +10,22 @@ namespace {
 using enum ValueType;
 
 constexpr Column<ModuleRow> kModuleColumns[] = {
-    {"kvlModuleName", 2, Text, text<&ModuleRow::name>},
-    {"kvlModulePurpose", 3, Text, text<&ModuleRow::purpose>},
-    {"kvlModuleVersion", 4, Text, text<&ModuleRow::version>},
-    {"kvlModuleDate", 5, Date, textIfKnown<&ModuleRow::date>},
+    {"kvlModuleName", 2, Text, text<&ModuleRow::name>,
+     about("The name of the module's library").identifies()},
+    {"kvlModulePurpose", 3, Text, text<&ModuleRow::purpose>,
+     about("The purpose of the module, in words")},
+    {"kvlModuleVersion", 4, Text, text<&ModuleRow::version>, about("The module's version")},
+    {"kvlModuleDate", 5, Date, textIfKnown<&ModuleRow::date>, about("When the module was loaded")},
 };
 
 constexpr Column<ServiceRow> kServiceColumns[] = {
-    {"kvlServiceName", 2, Text, text<&ServiceRow::name>},
-    {"kvlServiceScmName", 3, Text, text<&ServiceRow::scmName>},
-    {"kvlServiceStatus", 4, Integer, number<&ServiceRow::status>},
-    {"kvlServiceChangeDate", 5, Date, textIfKnown<&ServiceRow::changeDate>},
+    {"kvlServiceName", 2, Text, text<&ServiceRow::name>, about("The service's name").identifies()},
+    {"kvlServiceScmName", 3, Text, text<&ServiceRow::scmName>,
+     about("The name of the service in the host's service control")},
+    {"kvlServiceStatus", 4, Integer, number<&ServiceRow::status>,
+     about("The service's status").as(Kind::State)},
+    {"kvlServiceChangeDate", 5, Date, textIfKnown<&ServiceRow::changeDate>,
+     about("When kvlServiceStatus last changed")},
 };
 
 } // namespace

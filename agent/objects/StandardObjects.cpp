@@ -10,25 +10,29 @@ std::span<Scalar const> standardScalars() {
          ValueType::Integer,
          [](Facts const& facts) -> Value {
              return static_cast<std::int64_t>(facts.snapshot.interfaces.interfaces.size());
-         }},
+         },
+         about("The number of interfaces").in("interfaces").as(Kind::Gauge)},
         {"ifTableLastChange",
          {31, 1, 5},
          ValueType::TimeStamp,
          [](Facts const& facts) -> Value {
              return std::int64_t{facts.snapshot.interfaces.lastChange};
-         }},
+         },
+         about("The value of sysUpTime when a row of ifTable was last added or removed")},
         {"ifStackLastChange",
          {31, 1, 6},
          ValueType::TimeStamp,
          [](Facts const& facts) -> Value {
              return std::int64_t{facts.snapshot.interfaces.stackLastChange};
-         }},
+         },
+         about("The value of sysUpTime when the stack last changed")},
         {"entLastChangeTime",
          {47, 1, 4, 1},
          ValueType::TimeStamp,
          [](Facts const& facts) -> Value {
              return std::int64_t{facts.snapshot.entities.lastChange};
-         }},
+         },
+         about("The value of sysUpTime when an entity last changed")},
     };
     return described;
 }

@@ -45,10 +45,41 @@ std::string number(Oid const& arc, Oid const& place) {
     return text;
 }
 
+char const* kindName(Kind kind) {
+    switch (kind) {
+    case Kind::Information:
+        return "information";
+    case Kind::State:
+        return "state";
+    case Kind::Counter:
+        return "counter";
+    case Kind::Gauge:
+        return "gauge";
+    case Kind::Time:
+        break;
+    }
+    return "time";
+}
+
+/// What people need, a line each.
+void printDetails(char const* name, ValueType type, Details const& details) {
+    std::printf("help %s %s\n", name, details.help);
+    std::printf("kind %s %s%s\n", name, kindName(kindOf(type, details)),
+                details.isIdentifying ? " identifying" : "");
+    if (*details.unit != '\0') std::printf("unit %s %s\n", name, details.unit);
+    if (details.names.empty()) return;
+    std::printf("%s %s", details.hasOtherNumbers ? "some-names" : "names", name);
+    for (NamedNumber const& named : details.names)
+        std::printf(" %d=%s", named.number, named.name);
+    std::printf("\n");
+}
+
 void printScalars(Oid const& arc, std::span<Scalar const> scalars) {
-    for (Scalar const& scalar : scalars)
+    for (Scalar const& scalar : scalars) {
         std::printf("scalar %s %s %s\n", scalar.name, number(arc, scalar.place).c_str(),
                     typeName(scalar.type));
+        printDetails(scalar.name, scalar.type, scalar.details);
+    }
 }
 
 void printTables(Oid const& arc, std::vector<Table const*> const& tables) {
@@ -62,11 +93,7 @@ void printTables(Oid const& arc, std::vector<Table const*> const& tables) {
             if (auto const& writable = head.details.writable)
                 std::printf(" %d %d", writable->lowest, writable->highest);
             std::printf("\n");
-            if (head.details.names.empty()) continue;
-            std::printf("names %s", head.name);
-            for (NamedNumber const& named : head.details.names)
-                std::printf(" %d=%s", named.number, named.name);
-            std::printf("\n");
+            printDetails(head.name, head.type, head.details);
         }
 }
 

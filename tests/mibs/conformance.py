@@ -140,7 +140,7 @@ def described(program_output):
     """The agent's description: name -> (number, type, table, range that can be set)."""
     objects = {}
     for line in program_output.splitlines():
-        if line.startswith('names '):
+        if line.split()[0] not in ('scalar', 'column'):
             continue
         kind, name, number, value_type, *rest = line.split()
         oid = tuple(int(part) for part in number.split('.'))
@@ -149,10 +149,16 @@ def described(program_output):
     return objects
 
 
-def named(program_output):
+def named(program_output, which='names'):
     """The names of the numbers of described enumerations: name -> {number: its name}."""
     return {name: {int(number): text for number, text in (each.split('=') for each in numbers)}
-            for kind, name, *numbers in map(str.split, program_output.splitlines()) if kind == 'names'}
+            for kind, name, *numbers in map(str.split, program_output.splitlines()) if kind == which}
+
+
+def details(program_output, kind):
+    """What the program prints of one kind: name -> text."""
+    lines = (line.split(' ', 2) for line in program_output.splitlines())
+    return {line[1]: line[2] for line in lines if line[0] == kind}
 
 
 def updated(root, conformance, described_objects):

@@ -30,9 +30,9 @@ class Syntax:
 class Object:
     """An `Object` is a scalar or a column."""
 
-    def __init__(self, module, name, oid, syntax, access, status, entry=None):
+    def __init__(self, module, name, oid, syntax, access, status, entry=None, unit=''):
         self.module, self.name, self.oid, self.syntax = module, name, oid, syntax
-        self.access, self.status, self.entry = access, status, entry
+        self.access, self.status, self.entry, self.unit = access, status, entry, unit
 
 
 class Entry:
@@ -114,7 +114,8 @@ class Modules:
         if access == 'read-write' and node.get('create') == 'true':
             access = 'read-create'
         self.objects[node.get('name')] = Object(module, node.get('name'), _oid(node), self._syntax(node),
-                                                access, node.get('status'), entry)
+                                                access, node.get('status'), entry,
+                                                node.findtext('units') or '')
 
     def _read(self, module, tree):
         for node in tree.iter('scalar'):
