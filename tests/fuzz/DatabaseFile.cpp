@@ -1,7 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "tests/fuzz/DatabaseFile.h"
 
-#include <cstring>
 #include <fstream>
 #include <iterator>
 
@@ -76,7 +75,7 @@ std::string withRows(FuzzInput& input, std::string const& sound,
     sqlite3* database = nullptr;
     sqlite3_open(":memory:", &database);
     auto* const copy = static_cast<unsigned char*>(sqlite3_malloc64(sound.size()));
-    std::memcpy(copy, sound.data(), sound.size());
+    sound.copy(reinterpret_cast<char*>(copy), sound.size());
     auto const size = static_cast<sqlite3_int64>(sound.size());
     sqlite3_deserialize(database, "main", copy, size, size,
                         SQLITE_DESERIALIZE_FREEONCLOSE | SQLITE_DESERIALIZE_RESIZEABLE);

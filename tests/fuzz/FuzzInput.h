@@ -7,7 +7,6 @@
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
-#include <cstring>
 #include <string>
 #include <string_view>
 
@@ -27,8 +26,7 @@ class FuzzInput {
     template <class Number>
     Number number() {
         Number value{};
-        std::string_view const taken = take(sizeof value);
-        std::memcpy(&value, taken.data(), taken.size());
+        take(sizeof value).copy(reinterpret_cast<char*>(&value), sizeof value);
         return value;
     }
     std::uint8_t octet() { return number<std::uint8_t>(); }

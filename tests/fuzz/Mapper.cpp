@@ -87,7 +87,7 @@ DeviceMapperClient* dm_getDeviceMapperClient() {
 int QSBOpenStorage(char* rootType, int* rootInstance) {
     std::string const type = s_input.text();
     std::memset(rootType, 'x', kQSBTypeNameSize);
-    std::memcpy(rootType, type.data(), std::min<std::size_t>(type.size(), kQSBTypeNameSize));
+    type.copy(rootType, kQSBTypeNameSize);
     *rootInstance = 1;
     return s_input.octet();
 }
@@ -124,8 +124,7 @@ int _kp_getpids(int* pids, int max) {
 }
 
 int _kp_getstatsbypid(int /*pid*/, tag_KPXSTATISTICS* record) {
-    std::string_view const octets = s_input.take(sizeof *record);
-    std::memcpy(record, octets.data(), octets.size());
+    s_input.take(sizeof *record).copy(reinterpret_cast<char*>(record), sizeof *record);
     return s_input.octet() == 0 ? -1 : 0;
 }
 
