@@ -14,7 +14,7 @@ namespace kvloamd {
 ///
 /// - entConfigChange when entities were added, removed or changed: the first one at once, then at
 ///   most one in each `kPause`, which covers all changes of that time;
-/// - entStateOperEnabled and entStateOperDisabled when the operational state of an entity has become
+/// - entStateOperEnabled and entStateOperDisabled when the operational state of an entity becomes
 ///   enabled or disabled. An entity that appears or disappears has not changed its state.
 ///
 /// Thread-bound: the SNMP thread.
