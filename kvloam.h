@@ -25,6 +25,7 @@
 #include "board/EthernetFeature.h"
 #include "board/Feature.h"
 #include "board/IPInterface.h"
+#include "board/ISDNCall.h"
 #include "board/ISDNChannel.h"
 #include "board/ISDNChannelOnLine.h"
 #include "board/ISDNFeature.h"

@@ -14,6 +14,10 @@ inline constexpr char const* kISDNSignallingState = "SIGNALLING_STATE";
 /// What the trunk calls itself in calls: texts, absent when it has none.
 inline constexpr char const* kISDNCallingAddress = "CALLING_ADDRESS";
 inline constexpr char const* kISDNCallingSubAddress = "CALLING_SUBADDRESS";
+/// One `ISDNCallRecord` per bearer channel, in the order of the channels.
+inline constexpr char const* kISDNCallRecords = "CALL_RECORDS";
+/// One `ISDNSignallingCounters`.
+inline constexpr char const* kISDNSignallingCounters = "SIGNALLING_COUNTERS";
 /// An `ISDNProtocol`, in 1 byte.
 inline constexpr char const* kISDNProtocol = "Protocol_Type_0";
 
@@ -40,7 +44,37 @@ enum class ISDNSignallingState : std::int32_t {
     layer2Active = 3,
 };
 
+/// An `ISDNCallRecord` is the call of a bearer channel, or its last call. The texts are terminated
+/// by a NUL; times are seconds since the epoch, 0 for none. The numbers of `origin` and
+/// `information` are those of isdnBearerCallOrigin and isdnBearerInfoType.
+struct ISDNCallRecord {
+    char peer[32];
+    char peerSubAddress[24];
+    std::int32_t origin;
+    std::int32_t information;
+    std::int32_t multirate; ///< 1: yes
+    std::uint32_t chargedUnits;
+    std::uint32_t setupTime;
+    std::uint32_t connectTime;
+};
+
+static_assert(sizeof(ISDNCallRecord) == 80 && alignof(ISDNCallRecord) == 4);
+
+/// What a signalling channel has counted since it was loaded, modulo 2^32.
+struct ISDNSignallingCounters {
+    std::uint32_t inCalls;
+    std::uint32_t inConnected;
+    std::uint32_t outCalls;
+    std::uint32_t outConnected;
+    std::uint32_t chargedUnits;
+    std::uint32_t peerSabme; ///< SABME frames from the peer: it established the data link
+    std::uint32_t recvdFrmr; ///< FRMR frames from the peer: it rejected a frame
+};
+
+static_assert(sizeof(ISDNSignallingCounters) == 28 && alignof(ISDNSignallingCounters) == 4);
+
 /// Messages of the channel "ADMIN", each with an ISDNChannelMsg.
+/// Of a bearer channel: its state or its call record has changed.
 inline constexpr std::uint32_t kISDNBearerChanged = 0x50001;
 inline constexpr std::uint32_t kISDNSignallingChanged = 0x50002;
 

@@ -21,6 +21,7 @@
 #include "agent/daemon/Signals.h"
 #include "agent/fronts/Wakeup.h"
 #include "agent/log/Log.h"
+#include "agent/notifications/CallWatch.h"
 #include "agent/notifications/EntityNotices.h"
 #include "agent/notifications/FaultListener.h"
 #include "agent/notifications/LineListener.h"
@@ -202,6 +203,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     EntityReader entities(entityIndices, boards.settings, started,
                           [] { return std::time(nullptr); });
     LinkWatch links(boards.settings, boards.queue);
+    CallWatch calls(boards.settings, boards.queue, boards.counters);
     Collector collector(
         [&](Snapshot& snapshot) {
             keptSettings.save();
@@ -221,6 +223,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             boards.lines.place(lines);
             applySettings(boards.settings, lines);
             links.update(snapshot.interfaces.interfaces, snapshot.begun);
+            calls.update(snapshot.interfaces.bearers, snapshot.begun);
             snapshot.entities = entities.read(snapshot);
             noteWhereabouts(snapshot);
             if (!options.agentx.empty())

@@ -13,6 +13,10 @@ namespace kvloamd {
 Notification lineStatusChange(std::uint32_t ifIndex, int status, std::uint32_t lastChange,
                               Clock::time_point when);
 
+/// Makes an isdnMibCallInformation about the call of `row`.
+Notification callInformation(BearerRow const& row, Counters const& counters,
+                             Clock::time_point when);
+
 /// Makes a linkDown if `row` is down, else a linkUp.
 Notification linkChange(InterfaceRow const& row, Clock::time_point when);
 

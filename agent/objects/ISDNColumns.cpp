@@ -2,16 +2,66 @@
 // ISDN-MIB's tables: the bearer channels, the signalling channels and their data links.
 #include "agent/objects/RowValues.h"
 #include "agent/objects/StandardObjects.h"
+#include "agent/rows/StandardNumbers.h"
 
 namespace kvloamd {
 
 namespace {
 
+/// RowStatus's.
+constexpr std::int64_t kActive = 1;
+
 Value ifIndex(SignallingRow const& row) {
     return std::int64_t{row.ifIndex};
 }
 
+Value trapsDisabled(SignallingRow const& /*row*/) {
+    return std::int64_t{kDisabled};
+}
+
+Value active(SignallingRow const& /*row*/) {
+    return kActive;
+}
+
+/// No channel stands in for another.
+Value primary(LapdRow const& /*row*/) {
+    return std::int64_t{kTrue};
+}
+
+template <auto Field>
+Value callText(BearerRow const& row) {
+    return std::string_view(row.call.*Field);
+}
+
+template <auto Field>
+Value callNumber(BearerRow const& row) {
+    return std::int64_t{row.call.*Field};
+}
+
 using enum ValueType;
+using Signalling = SignallingRow;
+
+constexpr Writable kTraps{Setting::CallInformationTraps, kEnabled, kDisabled};
+
+constexpr NamedNumber kTruthValues[] = {{1, "true"}, {2, "false"}};
+
+constexpr NamedNumber kTrapEnables[] = {{1, "enabled"}, {2, "disabled"}};
+
+constexpr NamedNumber kRowStatuses[] = {{1, "active"},      {2, "notInService"},  {3, "notReady"},
+                                        {4, "createAndGo"}, {5, "createAndWait"}, {6, "destroy"}};
+
+constexpr NamedNumber kIsdnBearerCallOrigin[] = {
+    {1, "unknown"}, {2, "originate"}, {3, "answer"}, {4, "callback"}};
+
+constexpr NamedNumber kIsdnBearerInfoType[] = {{1, "unknown"},
+                                               {2, "speech"},
+                                               {3, "unrestrictedDigital"},
+                                               {4, "unrestrictedDigital56"},
+                                               {5, "restrictedDigital"},
+                                               {6, "audio31"},
+                                               {7, "audio7"},
+                                               {8, "video"},
+                                               {9, "packetSwitched"}};
 
 constexpr NamedNumber kIsdnBearerChannelType[] = {{1, "dialup"}, {2, "leased"}};
 
@@ -36,6 +86,28 @@ constexpr Column<BearerRow> kBearerColumns[] = {
      about("How far the call on the channel has come").oneOf(kIsdnBearerOperStatus)},
     {"isdnBearerChannelNumber", 3, Integer, number<&BearerRow::channelNumber>,
      about("The number of the channel on its interface")},
+    {"isdnBearerPeerAddress", 4, Text, callText<&CallRow::peerAddress>,
+     about("The address of the peer of the present or last call")},
+    {"isdnBearerPeerSubAddress", 5, Text, callText<&CallRow::peerSubAddress>,
+     about("The subaddress of the peer of the present or last call")},
+    {"isdnBearerCallOrigin", 6, Integer, callNumber<&CallRow::origin>,
+     about("Who began the present or last call")
+         .oneOf(kIsdnBearerCallOrigin)
+         .as(Kind::Information)},
+    {"isdnBearerInfoType", 7, Integer, callNumber<&CallRow::informationType>,
+     about("What the present or last call carries")
+         .oneOf(kIsdnBearerInfoType)
+         .as(Kind::Information)},
+    {"isdnBearerMultirate", 8, Integer, callNumber<&CallRow::multirate>,
+     about("Whether the present or last call has several channels")
+         .oneOf(kTruthValues)
+         .as(Kind::Information)},
+    {"isdnBearerCallSetupTime", 9, TimeStamp, callNumber<&CallRow::setupTime>,
+     about("The value of sysUpTime when the present or last call was begun")},
+    {"isdnBearerCallConnectTime", 10, TimeStamp, callNumber<&CallRow::connectTime>,
+     about("The value of sysUpTime when the present or last call was connected")},
+    {"isdnBearerChargedUnits", 11, Gauge, callNumber<&CallRow::chargedUnits>,
+     about("The units charged for the present or last call").in("units")},
 };
 
 constexpr Column<SignallingRow> kSignallingColumns[] = {
@@ -45,13 +117,42 @@ constexpr Column<SignallingRow> kSignallingColumns[] = {
      about("The protocol of the channel").oneOf(kIsdnSignalingProtocol).as(Kind::Information)},
     {"isdnSignalingCallingAddress", 4, Text, text<&SignallingRow::callingAddress>,
      about("The calling address for outgoing calls")},
+    {"isdnSignalingSubAddress", 5, Text, text<&SignallingRow::callingSubAddress>,
+     about("The subaddress for outgoing calls")},
     {"isdnSignalingBchannelCount", 6, Integer, number<&SignallingRow::bearerCount>,
      about("How many bearer channels the channel controls")},
+    {"isdnSignalingInfoTrapEnable", 7, Integer, trapsDisabled,
+     about("Whether calls are announced")
+         .oneOf(kTrapEnables)
+         .settable(kTraps)
+         .as(Kind::Information)},
+    {"isdnSignalingStatus", 8, Integer, active, about("The status of the row").oneOf(kRowStatuses)},
+};
+
+constexpr Column<Signalling> kStatisticsColumns[] = {
+    {"isdnSigStatsInCalls", 1, Counter, number<&Signalling::inCalls>,
+     about("Incoming calls").in("calls")},
+    {"isdnSigStatsInConnected", 2, Counter, number<&Signalling::inConnected>,
+     about("Incoming calls that were connected").in("calls")},
+    {"isdnSigStatsOutCalls", 3, Counter, number<&Signalling::outCalls>,
+     about("Outgoing calls").in("calls")},
+    {"isdnSigStatsOutConnected", 4, Counter, number<&Signalling::outConnected>,
+     about("Outgoing calls that were connected").in("calls")},
+    {"isdnSigStatsChargedUnits", 5, Counter, number<&Signalling::chargedUnits>,
+     about("The units charged for all calls").in("units")},
 };
 
 constexpr Column<LapdRow> kLapdColumns[] = {
+    {"isdnLapdPrimaryChannel", 1, Integer, primary,
+     about("Whether the channel is not a backup of another")
+         .oneOf(kTruthValues)
+         .as(Kind::Information)},
     {"isdnLapdOperStatus", 2, Integer, number<&LapdRow::operStatus>,
      about("The state of the data link").oneOf(kIsdnLapdOperStatus)},
+    {"isdnLapdPeerSabme", 3, Counter, number<&LapdRow::peerSabme>,
+     about("SABME frames received from the peer").in("frames")},
+    {"isdnLapdRecvdFrmr", 4, Counter, number<&LapdRow::recvdFrmr>,
+     about("FRMR frames received from the peer").in("frames")},
 };
 
 } // namespace
@@ -65,6 +166,12 @@ Table const& isdnBearerTable() {
 Table const& isdnSignalingTable() {
     static RowTable<SignallingRow, interfaceRows<&InterfaceRows::signalling>> const table(
         "isdnSignalingTable", {10, 20, 1, 3, 2, 1}, kSignallingColumns);
+    return table;
+}
+
+Table const& isdnSignalingStatsTable() {
+    static RowTable<Signalling, interfaceRows<&InterfaceRows::signalling>> const table(
+        "isdnSignalingStatsTable", {10, 20, 1, 3, 3, 1}, kStatisticsColumns);
     return table;
 }
 

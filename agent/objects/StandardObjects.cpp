@@ -26,6 +26,12 @@ std::span<Scalar const> standardScalars() {
              return std::int64_t{facts.snapshot.interfaces.stackLastChange};
          },
          about("The value of sysUpTime when the stack last changed")},
+        // Rows cannot be created, so there is no index for the next one.
+        {"isdnSignalingGetIndex",
+         {10, 20, 1, 3, 1},
+         ValueType::Integer,
+         [](Facts const& /*facts*/) -> Value { return std::int64_t{0}; },
+         about("The index for a new signalling channel; 0: none can be created")},
         {"entLastChangeTime",
          {47, 1, 4, 1},
          ValueType::TimeStamp,
@@ -47,6 +53,7 @@ std::vector<Table const*> standardTables() {
             &dsx1TotalTable(),
             &isdnBearerTable(),
             &isdnSignalingTable(),
+            &isdnSignalingStatsTable(),
             &isdnLapdTable(),
             &dsx0ConfigTable(),
             &dsx0ChanMappingTable(),

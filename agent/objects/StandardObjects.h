@@ -42,6 +42,7 @@ Table const& dsx0ConfigTable();
 Table const& dsx0ChanMappingTable();
 Table const& isdnBearerTable();
 Table const& isdnSignalingTable();
+Table const& isdnSignalingStatsTable();
 Table const& isdnLapdTable();
 Table const& dot3StatsTable();
 Table const& entPhysicalTable();

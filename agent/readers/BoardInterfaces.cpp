@@ -9,6 +9,7 @@
 
 #include "agent/readers/Answers.h"
 #include "agent/readers/BoardFeatures.h"
+#include "agent/readers/CallReader.h"
 #include "agent/readers/LegalValues.h"
 #include "agent/rows/IndexKey.h"
 #include "agent/rows/StandardNumbers.h"
@@ -211,6 +212,7 @@ Reading::Signalling Reading::readSignalling(ReferenceCounter<ISDNDChannel> handl
     interface.connectorPresent = kFalse;
     if (auto const status = legal(kLapdStatuses, channel.GetOperStatus()))
         interface.operStatus = status == ISDNDChannelStatusL2Active ? kUp : kDown;
+    readCounts(channel, row);
     Signalling found{std::move(handle), row.ifIndex, line};
     m_found.rows.signalling.push_back(std::move(row));
     return found;
@@ -229,6 +231,7 @@ std::uint32_t Reading::readLapd(ISDNDChannel& channel) {
     row.operStatus = legal(kLapdStatuses, channel.GetOperStatus());
     if (row.operStatus)
         interface.operStatus = row.operStatus == ISDNDChannelStatusL2Active ? kUp : kDown;
+    readCounts(channel, row);
     m_found.rows.lapds.push_back(row);
     return row.ifIndex;
 }
@@ -248,20 +251,20 @@ std::uint32_t Reading::readBearer(ISDNBChannel& channel) {
     interface.speed = kDs0Speed;
     if (row.operStatus)
         interface.operStatus = *row.operStatus >= ISDNBChannelStatusConnected ? kUp : kDormant;
-    m_found.rows.bearers.push_back(row);
-    return row.ifIndex;
+    readCall(channel, m_toTicks, row);
+    m_found.rows.bearers.push_back(std::move(row));
+    return m_found.rows.bearers.back().ifIndex;
 }
 
 void Reading::readChannels(ISDNFeature& feature) {
     std::vector<Signalling> signalling;
-    std::vector<std::uint32_t> lineOfBearer;
+    std::vector<std::size_t> ofBearer; // where its signalling channel is
     for (auto channel = feature.GetFirstDChannel(); channel.get() != nullptr;
          channel = feature.GetNextDChannel(channel)) {
         signalling.push_back(readSignalling(channel));
         SignallingRow const& row = m_found.rows.signalling.back();
         int const bearers = std::min(row.bearerCount.value_or(0), kMostBearers);
-        lineOfBearer.insert(lineOfBearer.end(), static_cast<std::size_t>(bearers),
-                            signalling.back().line);
+        ofBearer.insert(ofBearer.end(), static_cast<std::size_t>(bearers), signalling.size() - 1);
     }
     std::vector<std::pair<std::uint32_t, std::optional<std::uint32_t>>> bearers;
     for (auto channel = feature.GetFirstBChannel(); channel.get() != nullptr;
@@ -269,13 +272,19 @@ void Reading::readChannels(ISDNFeature& feature) {
         bearers.emplace_back(readBearer(*channel.get()), ownLine(*channel.get()));
     // Bearer channels that cannot say their line come in the order of the signalling channels that
     // they belong to. If the counts do not agree, their lines are not known.
-    bool const countsAgree = lineOfBearer.size() == bearers.size();
+    bool const countsAgree = ofBearer.size() == bearers.size();
     std::size_t const firstRow = m_found.rows.bearers.size() - bearers.size();
     std::vector<std::uint32_t> lines;
     std::set<std::uint32_t> withSlot16;
     for (std::size_t i = 0; i < bearers.size(); ++i) {
         auto const& [index, said] = bearers[i];
-        std::uint32_t const line = said.value_or(countsAgree ? lineOfBearer[i] : 0);
+        Signalling const* by = countsAgree ? &signalling[ofBearer[i]] : nullptr;
+        if (said) {
+            auto const found = std::ranges::find(signalling, *said, &Signalling::line);
+            by = *said != 0 && found != signalling.end() ? &*found : by;
+        }
+        std::uint32_t const line = said.value_or(by == nullptr ? 0 : by->line);
+        if (by != nullptr) m_found.rows.bearers[firstRow + i].signalling = by->index;
         stack(index, line);
         lines.push_back(line);
         if (auto const slot = m_found.rows.bearers[firstRow + i].timeSlot; slot && line != 0)

@@ -120,6 +120,8 @@ void InterfaceReader::append(InterfaceRows& all, BoardInterfaces&& board,
         m_lines.push_back({index, std::move(board.lines[i]), boardIndex});
     }
     moveRows(all.lines, board.rows.lines, indices);
+    for (BearerRow& row : board.rows.bearers)
+        if (row.signalling != 0) row.signalling = indices[row.signalling - 1];
     moveRows(all.bearers, board.rows.bearers, indices);
     moveRows(all.signalling, board.rows.signalling, indices);
     moveRows(all.lapds, board.rows.lapds, indices);

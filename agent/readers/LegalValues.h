@@ -41,6 +41,9 @@ inline constexpr LegalValues kBearerNumbers{1, 30};
 inline constexpr LegalValues kSignalingProtocols{1, 25};
 inline constexpr LegalValues kBearerCounts{1, 65535};
 inline constexpr LegalValues kLapdStatuses{1, 3};
+inline constexpr LegalValues kCallOrigins{1, 4};
+inline constexpr LegalValues kInformationTypes{1, 9};
+inline constexpr LegalValues kTruthValues{1, 2};
 
 /// `answer` if it is among `values`. A board that answers another number, or says that it does not
 /// know, gives the object no value.

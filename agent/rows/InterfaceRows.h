@@ -118,12 +118,27 @@ struct LineRow {
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
 };
 
+/// A bearer channel's call, or its last one. The defaults are ISDN-MIB's for no call.
+struct CallRow {
+    std::string peerAddress;
+    std::string peerSubAddress;
+    int origin = 1;
+    int informationType = 1;
+    int multirate = 2;
+    std::uint32_t setupTime = 0; ///< as `InterfaceRow::lastChange`
+    std::uint32_t connectTime = 0;
+    std::uint32_t chargedUnits = 0;
+    bool connected = false; ///< it was, also if that was before the agent's start
+};
+
 struct BearerRow {
     std::uint32_t ifIndex = 0;
     std::optional<int> channelType;
     std::optional<int> operStatus;
     std::optional<int> channelNumber;           ///< among the bearers of its line, from 1
     std::optional<int> timeSlot = std::nullopt; ///< of its line, from 1
+    std::uint32_t signalling = 0;               ///< the ifIndex of what signals for it; 0: unknown
+    CallRow call = {};
 
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
 };
@@ -132,7 +147,13 @@ struct SignallingRow {
     std::uint32_t ifIndex = 0;
     std::optional<int> protocol;
     std::string callingAddress;
+    std::string callingSubAddress;
     std::optional<int> bearerCount;
+    std::optional<std::uint32_t> inCalls;
+    std::optional<std::uint32_t> inConnected;
+    std::optional<std::uint32_t> outCalls;
+    std::optional<std::uint32_t> outConnected;
+    std::optional<std::uint32_t> chargedUnits;
 
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
 };
@@ -150,6 +171,8 @@ struct Ds0ChannelRow {
 struct LapdRow {
     std::uint32_t ifIndex = 0;
     std::optional<int> operStatus;
+    std::optional<std::uint32_t> peerSabme;
+    std::optional<std::uint32_t> recvdFrmr;
 
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
 };

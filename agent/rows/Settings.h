@@ -21,6 +21,7 @@ enum class Setting : int {
     LinkUpDownTraps = 2,       ///< of an interface: the same
     InterfaceAlias = 3,        ///< of an interface: a text
     CircuitIdentifier = 10,    ///< of a line: a text
+    CallInformationTraps = 11, ///< of a signalling channel: 1 enabled, 2 disabled
     EntityAlias = 1000,        ///< of a physical entity: a text, as the next two
     EntityAssetId = 1001,
     EntityUris = 1002

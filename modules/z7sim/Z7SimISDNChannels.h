@@ -3,9 +3,12 @@
 #pragma once
 
 #include <atomic>
+#include <mutex>
 #include <string>
 
+#include "board/ISDNCall.h"
 #include "board/ISDNChannelOnLine.h"
+#include "boardplatform/isdn_channels.h"
 #include "z7/ISDNChannelZ7.h"
 
 /// A `ChannelState` is a channel's state, which comes with messages and, before the first of them,
@@ -29,7 +32,9 @@ class ChannelState {
 };
 
 /// A bearer channel of a trunk.
-class Z7SimBChannel final : public ISDNBChannelZ7, public ISDNChannelOnLine {
+class Z7SimBChannel final : public ISDNBChannelZ7,
+                            public ISDNChannelOnLine,
+                            public ISDNCallChannel {
   public:
     /// `timeSlot`: from 1. `board`: the board's handle in the device mapper. `line`: the trunk's
     /// line, may be empty.
@@ -43,16 +48,24 @@ class Z7SimBChannel final : public ISDNBChannelZ7, public ISDNChannelOnLine {
     int GetChannelNumber() override { return m_timeSlot; }
     ReferenceCounter<DS1LineDevice> GetLine() override { return m_line; }
 
+    ISDNCallDetails GetCall() override;
+
     ChannelState<ISDNBChannelStatusEnum>& state() { return m_state; }
+    /// Takes the platform's record of the channel's call.
+    void setCall(ISDNCallRecord const& record);
 
   private:
+    std::mutex m_mutex; ///< guards the call
+    ISDNCallDetails m_call;
     int const m_timeSlot;
     ReferenceCounter<DS1LineDevice> const m_line;
     ChannelState<ISDNBChannelStatusEnum> m_state;
 };
 
 /// The signalling channel of a trunk.
-class Z7SimDChannel final : public ISDNDChannelZ7, public ISDNChannelOnLine {
+class Z7SimDChannel final : public ISDNDChannelZ7,
+                            public ISDNChannelOnLine,
+                            public ISDNCountingChannel {
   public:
     /// `device`: the trunk's handle in the device mapper; its protocol and address are read now.
     Z7SimDChannel(std::string const& name, long device, int bearers, int board,
@@ -66,13 +79,18 @@ class Z7SimDChannel final : public ISDNDChannelZ7, public ISDNChannelOnLine {
     /// Empty when the trunk has none.
     int GetCallingAddress(char* address) override;
     ReferenceCounter<DS1LineDevice> GetLine() override { return m_line; }
+    /// Asks the platform.
+    int GetCounts(ISDNSignallingCounts& counts) override;
+    int GetCallingSubAddress(char* address) override;
 
     ChannelState<ISDNDChannelStatusEnum>& state() { return m_state; }
 
   private:
     int const m_protocol;
     int const m_bearers;
+    long const m_device;
     std::string const m_callingAddress;
+    std::string const m_callingSubAddress;
     ReferenceCounter<DS1LineDevice> const m_line;
     ChannelState<ISDNDChannelStatusEnum> m_state;
 };

@@ -2,6 +2,7 @@
 #include "Z7SimISDNFeature.h"
 
 #include <algorithm>
+#include <array>
 #include <string>
 
 #include "ObjectAttributes.h"
@@ -70,6 +71,7 @@ void Z7SimISDNFeature::addTrunk(long board, long device, int bearers,
 
 void Z7SimISDNFeature::readStates() {
     for (auto const& trunk : m_trunks) {
+        readCalls(trunk);
         std::string const states = readBearerStates(trunk.device);
         for (std::size_t i = 0; i < trunk.bearers.size(); ++i) {
             int const state = i < states.size() ? states[i] : 0;
@@ -84,6 +86,15 @@ void Z7SimISDNFeature::readStates() {
     }
 }
 
+void Z7SimISDNFeature::readCalls(Trunk const& trunk) {
+    std::array<ISDNCallRecord, kMostBearers> records{};
+    std::size_t const size =
+        bytesAttribute(trunk.device, kISDNCallRecords, records.data(), sizeof records);
+    std::size_t const count = std::min(size / sizeof(ISDNCallRecord), trunk.bearers.size());
+    for (std::size_t i = 0; i < count; ++i)
+        trunk.bearers[i]->setCall(records[i]);
+}
+
 void Z7SimISDNFeature::apply(std::uint32_t id, ISDNChannelMsg const& message) {
     Trunk const* const trunk = find(message.device);
     if (trunk == nullptr) return;
@@ -95,6 +106,8 @@ void Z7SimISDNFeature::applyToBearer(Trunk const& trunk, ISDNChannelMsg const& m
     auto const number = static_cast<std::size_t>(message.channel);
     if (message.channel < 1 || number > trunk.bearers.size() || !isBearerState(message.state))
         return;
+    // A listener of the change then finds the call that it belongs to.
+    readCalls(trunk);
     auto const& channel = trunk.bearers[number - 1];
     auto const status = static_cast<ISDNBChannelStatusEnum>(message.state);
     if (!channel->state().change(status)) return;

@@ -50,6 +50,7 @@ class Z7SimISDNFeature final : public ISDNFeatureZ7,
     void addTrunk(long board, long device, int bearers,
                   ReferenceCounter<DS1LineDevice> const& line);
     Trunk const* find(long device) const;
+    static void readCalls(Trunk const& trunk);
     void applyToBearer(Trunk const& trunk, ISDNChannelMsg const& message);
     void applyToSignalling(Trunk const& trunk, ISDNChannelMsg const& message);
 

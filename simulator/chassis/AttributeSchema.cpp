@@ -21,8 +21,9 @@ constexpr std::array<std::int32_t, 13> kDeviceTypes = {501, 503, 505, 507, 509, 
 constexpr std::array<std::int32_t, 11> kSubDeviceTypes = {502, 504, 506, 508, 510, 517,
                                                           519, 522, 512, 526, 528};
 
-constexpr std::array<std::string_view, 5> kLiveAttributes = {
-    kDS1LineCounters, kDS1LinePastSeconds, kDS1LinePast, kISDNChannelStates, kISDNSignallingState};
+constexpr std::array<std::string_view, 7> kLiveAttributes = {
+    kDS1LineCounters,     kDS1LinePastSeconds, kDS1LinePast,           kISDNChannelStates,
+    kISDNSignallingState, kISDNCallRecords,    kISDNSignallingCounters};
 
 /// They have a number behind this stem.
 constexpr std::array<std::pair<std::string_view, AttributeKind>, 4> kNumberedAttributes = {

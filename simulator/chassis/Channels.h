@@ -5,8 +5,10 @@
 #include <array>
 #include <cstdint>
 #include <optional>
+#include <span>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "boardplatform/isdn_channels.h"
 
@@ -19,6 +21,20 @@ inline constexpr std::int32_t kMaxT1Bearers = 24;
 inline constexpr std::array<std::string_view, 4> kBearerStateNames = {"idle", "connecting",
                                                                       "connected", "active"};
 inline constexpr std::array<std::string_view, 3> kSignallingStateNames = {"inactive", "l1", "l2"};
+
+/// What a call carries, as commands write it, in the numbers of isdnBearerInfoType from 1 on.
+inline constexpr std::array<std::string_view, 9> kInformationNames = {
+    "unknown",  "speech",  "digital", "digital-56",     "restricted-digital",
+    "audio-31", "audio-7", "video",   "packet-switched"};
+
+/// `CallTerms` say who calls whom, and for what.
+struct CallTerms {
+    bool incoming = false;
+    std::string peer;           ///< at most 31 bytes
+    std::string peerSubAddress; ///< at most 23 bytes
+    std::int32_t information = 2;
+    bool multirate = false;
+};
 
 inline std::string_view nameOf(ISDNBearerState state) {
     return kBearerStateNames[static_cast<std::size_t>(state) - 1];
@@ -34,6 +50,7 @@ class Channels {
     /// All bearer channels are idle. Requires: 1 to kMaxBearers of them.
     Channels(std::int32_t bearers, ISDNSignallingState signalling)
         : m_states(static_cast<std::size_t>(bearers), static_cast<char>(ISDNBearerState::idle)),
+          m_calls(static_cast<std::size_t>(bearers), kNoCall),
           m_signalling(signalling) {}
 
     std::int32_t bearers() const { return static_cast<std::int32_t>(m_states.size()); }
@@ -42,9 +59,14 @@ class Channels {
     ISDNBearerState state(std::int32_t channel) const {
         return static_cast<ISDNBearerState>(m_states[static_cast<std::size_t>(channel - 1)]);
     }
-    void setState(std::int32_t channel, ISDNBearerState state) {
-        m_states[static_cast<std::size_t>(channel - 1)] = static_cast<char>(state);
-    }
+    /// `now`: seconds since the epoch.
+    void setState(std::int32_t channel, ISDNBearerState state, std::uint32_t now);
+    /// The terms of the call that is set up next on `channel`.
+    void setTerms(std::int32_t channel, CallTerms const& terms);
+    /// Charges the call of a channel with more units.
+    void charge(std::int32_t channel, std::uint32_t units);
+    std::span<ISDNCallRecord const> calls() const { return m_calls; }
+    ISDNSignallingCounters const& counters() const { return m_counters; }
     std::optional<std::int32_t> firstIdle() const {
         auto const found = m_states.find(static_cast<char>(ISDNBearerState::idle));
         if (found == std::string::npos) return std::nullopt;
@@ -52,10 +74,19 @@ class Channels {
     }
 
     ISDNSignallingState signalling() const { return m_signalling; }
-    void setSignalling(ISDNSignallingState state) { m_signalling = state; }
+    /// The peer establishes the data link that becomes active.
+    void setSignalling(ISDNSignallingState state) {
+        if (state == ISDNSignallingState::layer2Active && state != m_signalling)
+            ++m_counters.peerSabme;
+        m_signalling = state;
+    }
 
   private:
+    static constexpr ISDNCallRecord kNoCall{{}, {}, 1, 1, 0, 0, 0, 0};
+
     std::string m_states;
+    std::vector<ISDNCallRecord> m_calls;
+    ISDNSignallingCounters m_counters{};
     ISDNSignallingState m_signalling;
 };
 

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The control commands for calls on ISDN channels.
+#include <algorithm>
 #include <cstdint>
+#include <ctime>
 
 #include "simulator/base/Text.h"
 #include "simulator/control/CommandContext.h"
@@ -40,8 +42,17 @@ class Trunk {
     }
 
     void setState(std::int32_t channel, ISDNBearerState state) {
-        m_channels.setState(channel, state);
+        m_channels.setState(channel, state, static_cast<std::uint32_t>(std::time(nullptr)));
         announce(kISDNBearerChanged, channel, static_cast<std::int32_t>(state));
+    }
+
+    void setTerms(std::int32_t channel, CallTerms const& terms) {
+        m_channels.setTerms(channel, terms);
+    }
+
+    void charge(std::int32_t channel, std::uint32_t units) {
+        m_channels.charge(channel, units);
+        announce(kISDNBearerChanged, channel, static_cast<std::int32_t>(m_channels.state(channel)));
     }
 
     void setSignalling(ISDNSignallingState state) {
@@ -85,6 +96,36 @@ ISDNBearerState lastState(CommandContext const& context) {
                        "; choose connecting, connected or active");
 }
 
+/// A text argument that a record holds; empty when it is missing.
+std::string shortText(CommandContext const& context, char const* name, std::size_t most) {
+    if (!context.arguments.has(name)) return {};
+    std::string text = context.arguments.text(name);
+    if (text.size() > most)
+        throw CommandError(std::string(name) + " " + inQuotes(text) + " is too long; " +
+                           std::to_string(most) + " bytes are the most");
+    return text;
+}
+
+CallTerms termsOf(CommandContext const& context) {
+    CallTerms terms;
+    terms.incoming = context.arguments.flag("incoming");
+    terms.peer = shortText(context, "peer", sizeof ISDNCallRecord::peer - 1);
+    terms.peerSubAddress =
+        shortText(context, "subaddress", sizeof ISDNCallRecord::peerSubAddress - 1);
+    terms.multirate = context.arguments.flag("multirate");
+    if (!context.arguments.has("information")) return terms;
+    std::string const name = context.arguments.text("information");
+    auto const* const found = std::ranges::find(kInformationNames, name);
+    if (found == kInformationNames.end()) {
+        std::string known;
+        for (auto const& each : kInformationNames)
+            appendToList(known, each);
+        throw CommandError("a call cannot carry " + inQuotes(name) + "; choose one of " + known);
+    }
+    terms.information = static_cast<std::int32_t>(found - kInformationNames.begin()) + 1;
+    return terms;
+}
+
 std::int32_t idleChannel(CommandContext const& context, Trunk const& trunk) {
     if (!context.arguments.has("channel")) {
         if (auto const idle = trunk.channels().firstIdle()) return *idle;
@@ -124,10 +165,13 @@ Json listCalls(CommandContext const& context) {
 }
 
 Json setUpCall(CommandContext const& context) {
-    context.arguments.allow({"trunk", "channel", "state"});
+    context.arguments.allow({"trunk", "channel", "state", "incoming", "peer", "subaddress",
+                             "information", "multirate"});
     ISDNBearerState const last = lastState(context);
+    CallTerms const terms = termsOf(context);
     return changeTrunk(context, [&](Trunk& trunk) -> Json {
         std::int32_t const channel = idleChannel(context, trunk);
+        trunk.setTerms(channel, terms);
         for (auto const state :
              {ISDNBearerState::connecting, ISDNBearerState::connected, ISDNBearerState::active})
             if (state <= last) trunk.setState(channel, state);
@@ -153,6 +197,20 @@ Json releaseCall(CommandContext const& context) {
             ++released;
         }
         return {{"released", released}};
+    });
+}
+
+Json chargeCall(CommandContext const& context) {
+    context.arguments.allow({"trunk", "channel", "units"});
+    auto const units =
+        static_cast<std::uint32_t>(context.arguments.number("units", 1, 1'000'000'000));
+    return changeTrunk(context, [&](Trunk& trunk) -> Json {
+        std::int32_t const channel = trunk.namedChannel();
+        if (trunk.channels().state(channel) == ISDNBearerState::idle)
+            throw CommandError("channel " + std::to_string(channel) + " of " + trunk.words() +
+                               " is idle; there is no call to charge");
+        trunk.charge(channel, units);
+        return Json::object();
     });
 }
 

@@ -46,6 +46,7 @@ nlohmann::json mendLine(CommandContext const& context);
 nlohmann::json listCalls(CommandContext const& context);
 nlohmann::json setUpCall(CommandContext const& context);
 nlohmann::json releaseCall(CommandContext const& context);
+nlohmann::json chargeCall(CommandContext const& context);
 nlohmann::json setSignalling(CommandContext const& context);
 
 nlohmann::json listProcesses(CommandContext const& context);

@@ -257,7 +257,7 @@ struct Command {
     Json (*run)(Context const&);
 };
 
-constexpr std::array<Command, 30> kCommands = {{{"insert", insert},
+constexpr std::array<Command, 31> kCommands = {{{"insert", insert},
                                                 {"remove", remove},
                                                 {"replace", replace},
                                                 {"start", start},
@@ -283,6 +283,7 @@ constexpr std::array<Command, 30> kCommands = {{{"insert", insert},
                                                 {"call-list", listCalls},
                                                 {"call-setup", setUpCall},
                                                 {"call-release", releaseCall},
+                                                {"call-charge", chargeCall},
                                                 {"call-signalling", setSignalling},
                                                 {"drain", drain},
                                                 {"version", version},

@@ -71,6 +71,12 @@ std::optional<std::int32_t> readLive(DMAttribute& request, std::int32_t capacity
         auto const signalling = object.channels->signalling();
         if (name == kISDNSignallingState)
             return readBytes(request, capacity, &signalling, sizeof signalling);
+        auto const calls = object.channels->calls();
+        if (name == kISDNCallRecords)
+            return readBytes(request, capacity, calls.data(), calls.size_bytes());
+        auto const& counters = object.channels->counters();
+        if (name == kISDNSignallingCounters)
+            return readBytes(request, capacity, &counters, sizeof counters);
     }
     return std::nullopt;
 }

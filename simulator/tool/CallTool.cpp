@@ -27,6 +27,12 @@ struct Options {
     std::string channel;
     std::string state;
     std::string file;
+    std::string peer;
+    std::string subAddress;
+    std::string information;
+    std::string units;
+    bool incoming = false;
+    bool multirate = false;
     bool all = false;
     bool noWait = false;
     bool json = false;
@@ -64,6 +70,11 @@ Json setupCommand(Options const& options) {
     Json command = {{"command", "call-setup"}, {"trunk", options.trunk}};
     if (!options.channel.empty()) command["channel"] = options.channel;
     if (!options.state.empty()) command["state"] = options.state;
+    if (!options.peer.empty()) command["peer"] = options.peer;
+    if (!options.subAddress.empty()) command["subaddress"] = options.subAddress;
+    if (!options.information.empty()) command["information"] = options.information;
+    if (options.incoming) command["incoming"] = true;
+    if (options.multirate) command["multirate"] = true;
     return command;
 }
 
@@ -74,6 +85,13 @@ Json releaseCommand(Options const& options) {
     else
         command["channel"] = options.channel;
     return command;
+}
+
+Json chargeCommand(Options const& options) {
+    return {{"command", "call-charge"},
+            {"trunk", options.trunk},
+            {"channel", options.channel},
+            {"units", options.units}};
 }
 
 Json signallingCommand(Options const& options) {
@@ -95,6 +113,11 @@ void setUp(Options const& options, Connect const& connect) {
 void release(Options const& options, Connect const& connect) {
     auto client = connect();
     change(options, client, releaseCommand(options));
+}
+
+void charge(Options const& options, Connect const& connect) {
+    auto client = connect();
+    change(options, client, chargeCommand(options));
 }
 
 void signalling(Options const& options, Connect const& connect) {
@@ -191,6 +214,13 @@ void addCallCommands(CLI::App& app, Connect connect, std::function<void()>& chos
                         "Bearer channel, from 1 (default: the first idle one)");
     command->add_option("--state", options->state,
                         "How far: connecting, connected or active (default)");
+    command->add_flag("--incoming", options->incoming, "The peer calls (default: it is called)");
+    command->add_option("--peer", options->peer, "Address of the peer, at most 31 characters");
+    command->add_option("--subaddress", options->subAddress,
+                        "Subaddress of the peer, at most 23 characters");
+    command->add_option("--information", options->information,
+                        "What the call carries: speech (default), digital, audio-31 ...");
+    command->add_flag("--multirate", options->multirate, "The call has several channels");
 
     command = addChange("release", "Release a call", release);
     command->add_option("trunk", options->trunk, trunkHelp)->required();
@@ -198,6 +228,11 @@ void addCallCommands(CLI::App& app, Connect connect, std::function<void()>& chos
     which->add_option("channel", options->channel, "Bearer channel, from 1");
     which->add_flag("--all", options->all, "All calls of the trunk");
     which->require_option(1);
+
+    command = addChange("charge", "Charge a call with units", charge);
+    command->add_option("trunk", options->trunk, trunkHelp)->required();
+    command->add_option("channel", options->channel, "Bearer channel, from 1")->required();
+    command->add_option("units", options->units, "How many units more")->required();
 
     command = addChange("signalling", "Set the state of the signalling channel", signalling);
     command->add_option("trunk", options->trunk, trunkHelp)->required();

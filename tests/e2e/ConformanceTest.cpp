@@ -70,12 +70,16 @@ TEST_F(ConformanceTest, NotificationsContainWhatTheirModulesSay) {
     configureSnmp("rwcommunity public 127.0.0.1\ntrap2sink " + trapAddress() + " public\n");
     serve();
     ask("snmpset", {"1.3.6.1.2.1.10.18.6.1.17.1000", "i", "1"});
+    // The signalling channel D1.
+    ask("snmpset", {"1.3.6.1.2.1.10.20.1.3.2.1.7.1034", "i", "1"});
+    sim({"call", "setup", "301"});
     sim({"line", "alarm", "101", "los"});
     sim({"fault", "3", "17"});
     sim({"stop", "2"});
     std::map<std::string, std::string> const wanted{
         {"linkDown", "1.3.6.1.6.3.1.1.5.3"},
         {"dsx1LineStatusChange", "1.3.6.1.2.1.10.18.15.0.1"},
+        {"isdnMibCallInformation", "1.3.6.1.2.1.10.20.2.0.1"},
         {"entConfigChange", "1.3.6.1.2.1.47.2.0.1"},
         {"entStateOperDisabled", "1.3.6.1.2.1.131.0.2"},
         {"kvlBoardStatusChange", "1.3.6.1.4.1.32473.1.0.1"},

@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "board/DS1IntervalValidity.h"
+#include "board/ISDNCall.h"
 #include "board/ISDNChannelOnLine.h"
 #include "platform/ActionScheduler_pthread.h"
 #include "z7/DS1LineFeatureZ7.h"
@@ -198,6 +199,30 @@ class OnLine final : public FakeChannel, public ISDNChannelOnLine {
 
   private:
     ReferenceCounter<DS1LineDevice> m_line;
+};
+
+/// A bearer channel whose call a test chooses.
+class FakeCallingChannel final : public FakeBChannel, public ISDNCallChannel {
+  public:
+    using FakeBChannel::FakeBChannel;
+    ISDNCallDetails call;
+    ISDNCallDetails GetCall() override { return call; }
+};
+
+/// A signalling channel whose counts a test chooses.
+class FakeCountingChannel final : public FakeDChannel, public ISDNCountingChannel {
+  public:
+    using FakeDChannel::FakeDChannel;
+    ISDNSignallingCounts counts;
+    int result = 0; ///< of GetCounts
+    int GetCounts(ISDNSignallingCounts& asked) override {
+        asked = counts;
+        return result;
+    }
+    int GetCallingSubAddress(char* address) override {
+        std::strcpy(address, "sub");
+        return 0;
+    }
 };
 
 class FakeISDNFeature final : public ISDNFeatureZ7 {

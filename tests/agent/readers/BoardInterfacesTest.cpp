@@ -272,6 +272,84 @@ TEST_F(BoardInterfacesTest, NonsensicalNumberOfBearersIsSurvived) {
     EXPECT_THAT(read().bearers, SizeIs(1));
 }
 
+TEST_F(BoardInterfacesTest, CallOfABearerIsRead) {
+    auto* const bearer = new FakeCallingChannel("B1", ISDNBChannelStatusActive);
+    std::strcpy(bearer->call.peerAddress, "5550199");
+    bearer->call.origin = 3;
+    bearer->call.informationType = 9;
+    bearer->call.multirate = 1;
+    bearer->call.setupTime = 70;
+    bearer->call.connectTime = 72;
+    bearer->call.chargedUnits = 12;
+    add(new FakeISDNFeature({}, {bearer}));
+    CallRow const call = read().bearers.at(0).call;
+    EXPECT_EQ(call.peerAddress, "5550199");
+    EXPECT_EQ(call.peerSubAddress, "");
+    EXPECT_EQ(call.origin, 3);
+    EXPECT_EQ(call.informationType, 9);
+    EXPECT_EQ(call.multirate, 1);
+    EXPECT_EQ(call.setupTime, 70U);
+    EXPECT_EQ(call.connectTime, 72U);
+    EXPECT_TRUE(call.connected);
+    EXPECT_EQ(call.chargedUnits, 12U);
+}
+
+TEST_F(BoardInterfacesTest, CallWithNumbersThatTheStandardDoesNotHaveIsUnknown) {
+    auto* const bearer = new FakeCallingChannel("B1", ISDNBChannelStatusActive);
+    bearer->call.origin = 5;
+    bearer->call.informationType = 0;
+    bearer->call.multirate = 3;
+    add(new FakeISDNFeature({}, {bearer}));
+    CallRow const call = read().bearers.at(0).call;
+    EXPECT_EQ(call.origin, 1);
+    EXPECT_EQ(call.informationType, 1);
+    EXPECT_EQ(call.multirate, 2);
+}
+
+TEST_F(BoardInterfacesTest, AddressThatIsNotTerminatedIsBounded) {
+    auto* const bearer = new FakeCallingChannel("B1", ISDNBChannelStatusActive);
+    std::memset(bearer->call.peerAddress, '5', sizeof bearer->call.peerAddress);
+    add(new FakeISDNFeature({}, {bearer}));
+    EXPECT_EQ(read().bearers.at(0).call.peerAddress, std::string(64, '5'));
+}
+
+TEST_F(BoardInterfacesTest, CountsOfASignallingChannelAreSharedWithItsDataLink) {
+    auto* const channel = new FakeCountingChannel("D1", ISDNDChannelStatusL2Active, 0, "");
+    channel->counts = {1, 2, 3, 4, 5, 6, 7};
+    add(new FakeISDNFeature({channel}, {}));
+    auto const rows = read();
+    EXPECT_EQ(rows.signalling.at(0).inCalls, 1U);
+    EXPECT_EQ(rows.signalling.at(0).chargedUnits, 5U);
+    EXPECT_EQ(rows.signalling.at(0).callingSubAddress, "sub");
+    EXPECT_EQ(rows.lapds.at(0).peerSabme, 6U);
+    EXPECT_EQ(rows.lapds.at(0).recvdFrmr, 7U);
+}
+
+TEST_F(BoardInterfacesTest, CountsThatAChannelDoesNotKnowAreLeftOut) {
+    auto* const silent = new FakeCountingChannel("D1", ISDNDChannelStatusL2Active, 0, "");
+    silent->result = 1;
+    add(new FakeISDNFeature({silent, new FakeDChannel("D2", ISDNDChannelStatusL2Active, 0, "")},
+                            {}));
+    auto const rows = read();
+    for (std::size_t i = 0; i < 2; ++i) {
+        EXPECT_EQ(rows.signalling.at(i).inCalls, std::nullopt);
+        EXPECT_EQ(rows.lapds.at(i).peerSabme, std::nullopt);
+    }
+}
+
+TEST_F(BoardInterfacesTest, BearersNameWhatSignalsForThem) {
+    FakeLine& line = addLine("one");
+    add(new FakeISDNFeature({new OnLine<FakeDChannel>(&line, "D1", 3, 1, "")},
+                            {new OnLine<FakeBChannel>(&line, "B1", 1)}));
+    EXPECT_EQ(read().bearers.at(0).signalling, 2U);
+}
+
+TEST_F(BoardInterfacesTest, BearerOfAnUnknownLineHasNoSignallingChannel) {
+    addLine("one");
+    add(new FakeISDNFeature({new FakeDChannel("D1", 3, 5, "one")}, {new FakeBChannel("B1", 1)}));
+    EXPECT_EQ(read().bearers.at(0).signalling, 0U);
+}
+
 TEST_F(BoardInterfacesTest, ChannelIsUpWhenItCarriesSomething) {
     add(new FakeISDNFeature({new FakeDChannel("D1", ISDNDChannelStatusL1Active, 0, ""),
                              new FakeDChannel("D2", ISDNDChannelStatusL2Active, 0, "")},

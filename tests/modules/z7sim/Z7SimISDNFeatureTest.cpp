@@ -8,6 +8,7 @@
 #include "ISDNMonitor.h"
 #include "Z7SimBoard.h"
 #include "Z7SimISDNChannels.h"
+#include "board/ISDNCall.h"
 #include "board/ISDNChannelOnLine.h"
 #include "board/Interface.h"
 #include "core/ReferenceTable.h"
@@ -198,6 +199,65 @@ TEST_F(Z7SimISDNFeatureTest, TrunkWithoutProtocolAndAddressSaysSo) {
     EXPECT_EQ(isdn()->GetFirstDChannel()->GetProtocol(), KVL::kNotSupported);
     EXPECT_EQ(isdn()->GetFirstDChannel()->GetCallingAddress(address), 0);
     EXPECT_STREQ(address, "");
+}
+
+TEST_F(Z7SimISDNFeatureTest, BearerKnowsItsCallAndKeepsIt) {
+    plugIn("", trunk(301, 2));
+    auto const channel = bearer("B1.2");
+    auto* const calling = dynamic_cast<ISDNCallChannel*>(channel.get());
+    ASSERT_NE(calling, nullptr);
+    EXPECT_EQ(calling->GetCall().origin, 1);
+    sim::command({{"command", "call-setup"},
+                  {"trunk", 301},
+                  {"channel", 2},
+                  {"state", "connecting"},
+                  {"incoming", true},
+                  {"peer", "5550199"},
+                  {"subaddress", "7"},
+                  {"information", "audio-31"}});
+    sim::drain();
+    ISDNCallDetails const call = calling->GetCall();
+    EXPECT_STREQ(call.peerAddress, "5550199");
+    EXPECT_STREQ(call.peerSubAddress, "7");
+    EXPECT_EQ(call.origin, 3);
+    EXPECT_EQ(call.informationType, 6);
+    EXPECT_EQ(call.multirate, 2);
+    EXPECT_GT(call.setupTime, 0);
+    EXPECT_EQ(call.connectTime, 0);
+    releaseCall(301, 2);
+    EXPECT_STREQ(calling->GetCall().peerAddress, "5550199");
+}
+
+TEST_F(Z7SimISDNFeatureTest, ChargeOfACallIsKnownWithoutAChangeOfState) {
+    plugIn("", trunk(301, 1));
+    setUpCall(301, 1);
+    auto const channel = bearer("B1.1");
+    listen();
+    sim::command({{"command", "call-charge"}, {"trunk", 301}, {"channel", 1}, {"units", 12}});
+    sim::drain();
+    EXPECT_EQ(dynamic_cast<ISDNCallChannel&>(*channel.get()).GetCall().chargedUnits, 12U);
+    EXPECT_TRUE(m_heard.empty());
+}
+
+TEST_F(Z7SimISDNFeatureTest, SignallingChannelCountsCallsAndLinks) {
+    plugIn("", trunk(301, 2, "CALLING_SUBADDRESS: '42'"));
+    auto const channel = isdn()->GetFirstDChannel();
+    auto* const counting = dynamic_cast<ISDNCountingChannel*>(channel.get());
+    ASSERT_NE(counting, nullptr);
+    setUpCall(301, 1);
+    setUpCall(301, 2, "connecting");
+    setSignalling(301, "l1");
+    setSignalling(301, "l2");
+    ISDNSignallingCounts counts;
+    ASSERT_EQ(counting->GetCounts(counts), 0);
+    EXPECT_EQ(counts.inCalls, 0U);
+    EXPECT_EQ(counts.outCalls, 2U);
+    EXPECT_EQ(counts.outConnected, 1U);
+    EXPECT_EQ(counts.peerSabme, 1U);
+    EXPECT_EQ(counts.recvdFrmr, 0U);
+    char address[64];
+    EXPECT_EQ(counting->GetCallingSubAddress(address), 0);
+    EXPECT_STREQ(address, "42");
 }
 
 TEST_F(Z7SimISDNFeatureTest, StatesAreThoseOfThePlatformAtTheStart) {

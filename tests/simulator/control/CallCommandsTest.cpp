@@ -98,6 +98,13 @@ TEST_F(CallCommandsTest, SignallingIsAnnouncedWhenItChanges) {
                                             "50002 board 3 device 31 channel 0 is 1"));
 }
 
+TEST_F(CallCommandsTest, ChargeIsAnnouncedWithTheStateAsItIs) {
+    succeed(R"({"command": "call-setup", "trunk": 31, "channel": 2, "state": "connected"})");
+    journal.take();
+    succeed(R"({"command": "call-charge", "trunk": 31, "channel": 2, "units": 3})");
+    EXPECT_THAT(journal.take(), ElementsAre("50001 board 3 device 31 channel 2 is 3"));
+}
+
 TEST_F(CallCommandsTest, ChannelEventsKeepTheirOrderAmongTheOthers) {
     succeed(R"({"command": "call-signalling", "trunk": 32, "state": "l2"})");
     succeed(R"({"command": "insert", "board": {"handle": 4,
@@ -173,6 +180,20 @@ INSTANTIATE_TEST_SUITE_P(
         BadCommand{"ReleaseOfAnIdleChannel",
                    R"({"command": "call-release", "trunk": 31, "channel": 1})",
                    "channel 1 of trunk 31 is idle; there is no call to release"},
+        BadCommand{"UnknownInformation",
+                   R"({"command": "call-setup", "trunk": 31, "information": "smoke"})",
+                   "a call cannot carry \"smoke\"; choose one of unknown, speech, digital, "
+                   "digital-56, restricted-digital, audio-31, audio-7, video, packet-switched"},
+        BadCommand{"PeerThatIsTooLong",
+                   R"({"command": "call-setup", "trunk": 31,
+                       "peer": "12345678901234567890123456789012"})",
+                   "peer \"12345678901234567890123456789012\" is too long; 31 bytes are the most"},
+        BadCommand{"ChargeOfAnIdleChannel",
+                   R"({"command": "call-charge", "trunk": 31, "channel": 1, "units": 1})",
+                   "channel 1 of trunk 31 is idle; there is no call to charge"},
+        BadCommand{"ChargeOfNothing",
+                   R"({"command": "call-charge", "trunk": 32, "channel": 1, "units": 0})",
+                   "\"units\" cannot be 0; write a whole number from 1 to 1000000000"},
         BadCommand{"UnknownSignalling",
                    R"({"command": "call-signalling", "trunk": 31, "state": "l3"})",
                    "signalling cannot be the text \"l3\"; choose inactive, l1 or l2"},
