@@ -88,8 +88,12 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     sortBy(all.lines, &LineRow::ifIndex);
     sortBy(all.bearers, &BearerRow::ifIndex);
     sortBy(all.ds0Channels, &Ds0ChannelRow::index);
-    auto const twice = std::ranges::unique(all.ds0Channels, {}, &Ds0ChannelRow::index);
-    all.ds0Channels.erase(twice.begin(), twice.end());
+    // Not std::ranges::unique, whose result clang 14 does not compile.
+    auto const twice = std::unique(all.ds0Channels.begin(), all.ds0Channels.end(),
+                                   [](Ds0ChannelRow const& one, Ds0ChannelRow const& other) {
+                                       return one.index() == other.index();
+                                   });
+    all.ds0Channels.erase(twice, all.ds0Channels.end());
     sortBy(all.signalling, &SignallingRow::ifIndex);
     sortBy(all.lapds, &LapdRow::ifIndex);
     sortBy(all.ethernets, &EthernetRow::ifIndex);
