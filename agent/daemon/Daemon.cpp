@@ -12,6 +12,9 @@
 #include <utility>
 
 #include "access/ExternalFaultEventAdaptor.h"
+#include "agent/alarms/AlarmEvents.h"
+#include "agent/alarms/AlarmSources.h"
+#include "agent/daemon/AlarmReport.h"
 #include "agent/daemon/ConfigCheck.h"
 #include "agent/daemon/FrontChoice.h"
 #include "agent/daemon/InterruptibleStart.h"
@@ -62,13 +65,27 @@ constexpr std::uint32_t kFirstEntity = 1;
 struct Boards {
     explicit Boards(Oid const& enterprise)
         : listener(*manager.get(), source, queue, counters, enterprise),
-          faultListener(*manager.get(), faults, queue, enterprise) {}
+          faultListener(*manager.get(), faults, queue, enterprise) {
+        listener.observe([this](int index, Board& board, BoardStatusEnum status) {
+            alarmEvents.boardStatus(index, board, status);
+        });
+        faultListener.observe([this](FaultChange const& change) {
+            alarmEvents.fault(change.raised, change.boardIndex, change.serialNumber, change.value);
+        });
+        lines.observe(
+            [this](std::uint32_t ifIndex, int status) { alarmEvents.lineStatus(ifIndex, status); });
+    }
 
     ReferenceCounter<BoardManager> manager{new BoardManager};
     Counters counters;
     Settings settings;
     BoardSource source{*manager.get()};
     NotificationQueue queue{counters};
+    AlarmReport alarmReport;
+    AlarmList alarms{{}, [this](AlarmEvent event, Alarm const& alarm) {
+                         return alarmReport.report(event, alarm);
+                     }};
+    AlarmEvents alarmEvents{alarms};
     FaultLog faults;
     StatusListener listener;
     LineListener lines{*manager.get(), settings, queue, counters};
@@ -215,6 +232,8 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             snapshot.processes = readProcesses(statistics);
             snapshot.resources = readResources(*boards.manager.get(), snapshot.boards);
             snapshot.records = platform.read(snapshot.boards);
+            snapshot.platformSilent = !platform.mapperAnswers();
+            snapshot.storeUnreadable = !platform.storeIsReadable();
             boards.lines.listen(snapshot.boards, interfaces.changeTimes());
             snapshot.interfaces = interfaces.read(snapshot.boards);
             boards.faults.compare(shownLineFaults(snapshot.interfaces), Clock::now());
@@ -224,6 +243,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             applySettings(boards.settings, lines);
             links.update(snapshot.interfaces.interfaces, snapshot.begun);
             calls.update(snapshot.interfaces.bearers, snapshot.begun);
+            boards.alarmEvents.update(snapshot);
             snapshot.entities = entities.read(snapshot);
             noteWhereabouts(snapshot);
             if (!options.agentx.empty())
@@ -250,6 +270,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
         nameSubject(notification, trees, {*snapshot, boards.counters, &boards.settings});
     });
     EntityNotices entityNotices(boards.queue);
+    AlarmClock alarmClock(boards.alarms, boards.counters);
     ServiceNotice notice;
     std::string const serving =
         "serving " + std::to_string(collector.newest()->boards.size()) + " boards " + front.place();
@@ -275,7 +296,8 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     front.beforeSleep([&] {
         if (boards.settings.hasUnsaved()) collector.renew();
         auto const nextEntityNotice = entityNotices.update(collector.newest(), Clock::now());
-        return earliest(nextEntityNotice,
+        auto const nextAlarm = alarmClock.advance(*collector.newest(), Instant::now());
+        return earliest(earliest(nextEntityNotice, nextAlarm),
                         earliest(notifier.send(collector.newest()->begun), notice.beat()));
     });
     ListeningScope listening(boards, [&] { collector.renew(); });

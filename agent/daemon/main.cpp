@@ -21,6 +21,7 @@ int main(int argc, char** argv) {
             return exit->status;
         }
         auto const& options = std::get<Options>(parsed);
+        if (standardErrorIsJournal()) logToJournal();
         setLogLevel(options.logLevel);
         if (options.checkSnmpConfig) return checkSnmpConfiguration(options);
         if (options.checkConfig) return checkConfiguration(options);

@@ -22,6 +22,7 @@ int FaultListener::ProcessExternalFaultEvent(ReferenceCounter<ExternalFaultEvent
     change.platformBoard = received->GetBoardID();
     change.value = received->GetFault();
     enter(change);
+    if (m_observer) m_observer(change);
     m_queue.push(faultNotification(m_enterprise, change));
     notifyChanged();
     return 0;

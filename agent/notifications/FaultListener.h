@@ -40,6 +40,11 @@ class FaultListener final : public ExternalFaultEventListener, public BoardStatu
     int ProcessExternalFaultEvent(ReferenceCounter<ExternalFaultEvent> event) override;
     int ProcessBoardStatusEvent(ReferenceCounter<BoardStatusEvent> event) override;
 
+    /// Receives every fault that is not ignored, on the thread that reported it.
+    using Observer = std::function<void(FaultChange const&)>;
+    /// Before faults are reported.
+    void observe(Observer observer) { m_observer = std::move(observer); }
+
     /// From now on calls `changed` after each fault, on the thread that reported it.
     void start(std::function<void()> changed);
     /// From now on faults are ignored. `changed` is not called any more when this returns.
@@ -64,6 +69,7 @@ class FaultListener final : public ExternalFaultEventListener, public BoardStatu
     FaultLog& m_faults;
     NotificationQueue& m_queue;
     Oid const m_enterprise;
+    Observer m_observer; ///< may be empty
 
     /// Guards the next two fields, and that the log holds no fault of a board that has been
     /// removed.

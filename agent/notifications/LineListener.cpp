@@ -65,6 +65,7 @@ void LineListener::place(std::vector<PlacedLine> const& lines) {
 }
 
 void LineListener::enqueue(std::uint32_t ifIndex, Change const& change) {
+    if (m_observer) m_observer(ifIndex, change.status);
     int const enable =
         m_settings.find({Setting::LineStatusChangeTraps, ifIndex}).value_or(change.enable);
     if (enable != kEnabled) return;

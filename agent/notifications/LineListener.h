@@ -35,6 +35,13 @@ class LineListener final : public DS1LineStatusListener {
 
     int ProcessLineStatusEvent(ReferenceCounter<DS1LineStatusEvent> event) override;
 
+    /// Receives every status change of a line that has an ifIndex, with the new dsx1LineStatus, on
+    /// the thread that reported it or the collector's. Called under the listener's lock: it must
+    /// not call the listener.
+    using Observer = std::function<void(std::uint32_t ifIndex, int status)>;
+    /// Before `listen`.
+    void observe(Observer observer) { m_observer = std::move(observer); }
+
     // Called before and after every refresh of the lines. Thread-bound: the collector.
 
     /// Subscribes to the line features of `boards` to which it is not subscribed yet. `times`
@@ -64,6 +71,7 @@ class LineListener final : public DS1LineStatusListener {
     Settings const& m_settings;
     NotificationQueue& m_queue;
     Counters& m_counters;
+    Observer m_observer; ///< may be empty
     /// The features to which it is subscribed. The handles keep the addresses from being reused for
     /// new features, which have no subscription. Of the collector.
     std::map<DS1LineFeature const*, ReferenceCounter<DS1LineFeature>> m_features;

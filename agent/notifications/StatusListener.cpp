@@ -25,6 +25,7 @@ int StatusListener::ProcessBoardStatusEvent(ReferenceCounter<BoardStatusEvent> e
     BoardStatusEnum const status = received->GetBoardStatus();
     if (status == BoardStatusRemoved) m_source.boardHasGone(index);
     ++m_counters.statusChanges;
+    if (m_observer) m_observer(index, *changed, status);
     m_queue.push(boardStatusNotification(m_enterprise, index, readSerialNumber(*changed), status));
     std::scoped_lock const guard(m_mutex);
     if (m_phase == Phase::Running) m_changed();

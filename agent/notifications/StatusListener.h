@@ -35,6 +35,11 @@ class StatusListener final : public BoardStatusListener {
 
     int ProcessBoardStatusEvent(ReferenceCounter<BoardStatusEvent> event) override;
 
+    /// Receives every status change that is not ignored, on the thread that reported it.
+    using Observer = std::function<void(int boardIndex, Board& board, BoardStatusEnum status)>;
+    /// Before the factories are attached.
+    void observe(Observer observer) { m_observer = std::move(observer); }
+
     /// Requires that all factories are attached. From now on calls `changed` after each status
     /// change, on the thread that reported it.
     void start(std::function<void()> changed);
@@ -49,6 +54,7 @@ class StatusListener final : public BoardStatusListener {
     NotificationQueue& m_queue;
     Counters& m_counters;
     Oid const m_enterprise;
+    Observer m_observer; ///< may be empty
     std::thread::id const m_startingThread = std::this_thread::get_id();
     std::mutex m_mutex; ///< guards the next two fields; held while `m_changed` runs
     Phase m_phase = Phase::Starting;

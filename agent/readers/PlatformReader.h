@@ -32,6 +32,10 @@ class PlatformReader {
     /// The records of `boards`, which are ascending by index.
     std::shared_ptr<PlatformRecords const> read(std::vector<BoardRow> const& boards);
 
+    // Whether it worked when it was read last.
+    bool mapperAnswers() const { return m_mapperAnswers; }
+    bool storeIsReadable() const { return m_storeReadable; }
+
   private:
     struct BoardRecords {
         std::string serialNumber;

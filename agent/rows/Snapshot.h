@@ -37,6 +37,8 @@ struct Snapshot {
     EntityRows entities;
     std::uint32_t interfaceConflicts = 0;        ///< of ifIndices with the host's own interfaces
     Persistence persistence = Persistence::Kept; ///< of the indices and settings
+    bool platformSilent = false;                 ///< the device mapper does not list its boards
+    bool storeUnreadable = false;                ///< the attribute store cannot be read
     Clock::time_point begun;                  ///< when reading began: what happened before is in it
     std::uint32_t number = 1;                 ///< how many have been made, this one included
     std::chrono::milliseconds refreshTime{0}; ///< how long reading took

@@ -1,0 +1,61 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// Passes what the platform reports on to the alarm list, at once.
+#pragma once
+
+#include <cstdint>
+#include <map>
+#include <mutex>
+#include <string>
+#include <vector>
+
+#include "agent/alarms/AlarmList.h"
+#include "agent/rows/Snapshot.h"
+#include "board/Board.h"
+
+namespace kvloamd {
+
+/// An `AlarmEvents` object begins and ends conditions as status changes, faults and line status
+/// changes arrive, so that one that is over before the next snapshot is still counted. What has no
+/// event of its own is found by `update`, in the snapshot. Never destroyed, because the platform's
+/// threads use it until the process ends. Thread-safe.
+class AlarmEvents {
+  public:
+    /// `list` lives as long as the process.
+    explicit AlarmEvents(AlarmList& list) : m_list(list) {}
+
+    /// The board has changed its status.
+    void boardStatus(int boardIndex, Board& board, BoardStatusEnum status);
+    /// The platform has reported a fault, or its end. `boardIndex`: 0 when the board is not known.
+    void fault(bool raised, int boardIndex, std::string const& serialNumber, std::uint16_t value);
+    /// dsx1LineStatus of the line has changed. A line that no snapshot has shown yet is left to the
+    /// next snapshot.
+    void lineStatus(std::uint32_t ifIndex, int status);
+
+    /// Compares the alarms with a new snapshot.
+    void update(Snapshot const& snapshot);
+
+  private:
+    /// What identifies a line's conditions.
+    struct Line {
+        Condition condition; ///< of no kind yet
+        int status = 0;      ///< dsx1LineStatus
+    };
+
+    /// What is known of a board before it goes.
+    struct KnownBoard {
+        std::string place;           ///< as `boardPlace`
+        bool stoppedInOrder = false; ///< by events; a board that goes may say that it has stopped
+    };
+
+    void rememberLines(Snapshot const& snapshot);
+    void rememberBoards(Snapshot const& snapshot);
+    void noteStop(std::uint32_t boardIndex, bool inOrder);
+    KnownBoard known(std::uint32_t boardIndex);
+
+    AlarmList& m_list;
+    std::mutex m_mutex;                           ///< guards what follows
+    std::map<std::uint32_t, Line> m_lines;        ///< by ifIndex, of the newest snapshot
+    std::map<std::uint32_t, KnownBoard> m_boards; ///< by board index
+};
+
+} // namespace kvloamd

@@ -1,0 +1,103 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/alarms/AlarmKinds.h"
+
+#include <algorithm>
+#include <array>
+#include <stdexcept>
+
+namespace kvloamd {
+
+namespace {
+
+using enum AlarmKind;
+using enum AlarmSeverity;
+using enum AlarmScope;
+using std::chrono::seconds;
+
+// A line's failure has lasted already when its status shows it, and ends 10 s after the defect, as
+// the rules for DS1 lines require; its hold times are therefore 0.
+constexpr AlarmKindInfo kKinds[] = {
+    {BoardFailed, "boardFailed", Critical, seconds(0), seconds(0), Snapshot,
+     "the platform reports that the board has failed"},
+    {BoardStopped, "boardStopped", Major, seconds(0), seconds(0), Snapshot,
+     "the board has stopped although nobody ordered it"},
+    {BoardGone, "boardGone", Major, seconds(0), seconds(0), Snapshot,
+     "a board that was not stopped before has been removed"},
+    {BoardUnreadable, "boardUnreadable", Major, seconds(0), seconds(0), Snapshot,
+     "the board does not answer queries"},
+    {PlatformFault, "platformFault", Indeterminate, seconds(0), seconds(0), Snapshot,
+     "the platform reports a fault of the board"},
+    {LineLossOfSignal, "dsx1LossOfSignal", Critical, seconds(0), seconds(0), Snapshot,
+     "the line receives no signal"},
+    {LineLossOfFrame, "dsx1LossOfFrame", Critical, seconds(0), seconds(0), Snapshot,
+     "the line receives a signal without frames"},
+    {LineRcvAIS, "dsx1RcvAIS", Major, seconds(0), seconds(0), Snapshot,
+     "the line receives the alarm indication signal"},
+    {LineRcvFarEndLOF, "dsx1RcvFarEndLOF", Minor, seconds(0), seconds(0), Snapshot,
+     "the far end reports that it receives no frames (yellow alarm)"},
+    {LineT16AIS, "dsx1T16AIS", Major, seconds(0), seconds(0), Snapshot,
+     "the line receives the alarm indication signal in time slot 16"},
+    {LineRcvFarEndLOMF, "dsx1RcvFarEndLOMF", Minor, seconds(0), seconds(0), Snapshot,
+     "the far end reports that it receives no multiframe"},
+    {LineUnavailable, "dsx1UnavailSigState", Major, seconds(0), seconds(0), Snapshot,
+     "the line is unavailable: its seconds count as UAS"},
+    {LineOtherFailure, "dsx1OtherFailure", Indeterminate, seconds(0), seconds(0), Snapshot,
+     "the line has a failure that has no name of its own"},
+    {LineNetEquipOOS, "dsx1NetEquipOOS", Indeterminate, seconds(0), seconds(0), Snapshot,
+     "the carrier's equipment is out of service"},
+    {LineRcvPayloadAIS, "dsx1RcvPayloadAIS", Major, seconds(0), seconds(0), Snapshot,
+     "the line receives the alarm indication signal in its payload"},
+    {LineDs2PerfThreshold, "dsx1Ds2PerfThreshold", Warning, seconds(0), seconds(0), Snapshot,
+     "the DS2 has crossed a performance threshold"},
+    {ChannelInactive, "isdnLapdInactive", Minor, seconds(0), seconds(0), Snapshot,
+     "layer 1 of the signalling channel is down"},
+    {ChannelLayer2Down, "isdnLapdLayer2Down", Major, seconds(0), seconds(0), Snapshot,
+     "layer 1 of the signalling channel is up, but layer 2 is not established"},
+    {LinkDown, "linkDown", Major, seconds(0), seconds(0), Snapshot,
+     "the interface is down although nobody switched it off"},
+    {SnapshotStale, "agentSnapshotStale", Major, seconds(0), seconds(0), Health,
+     "the boards have not been read for 30 seconds: a board or the platform hangs"},
+    {PlatformSilent, "agentPlatformSilent", Critical, seconds(0), seconds(0), Snapshot,
+     "the platform's device mapper does not list its boards"},
+    {StoreUnreadable, "agentStoreUnreadable", Warning, seconds(0), seconds(0), Snapshot,
+     "the platform's attribute store cannot be read"},
+    {PersistenceFailing, "agentPersistenceFailing", Minor, seconds(0), seconds(0), Health,
+     "indices and settings are not kept across restarts"},
+    {NotificationsDropped, "agentNotificationsDropped", Minor, seconds(0), seconds(0), Health,
+     "notifications were dropped because too many waited"},
+    {MasterLost, "agentMasterLost", Major, seconds(10), seconds(0), Health,
+     "there is no connection to the SNMP master"},
+};
+
+constexpr std::array<char const*, 7> kSeverities{"",      "cleared", "indeterminate", "critical",
+                                                 "major", "minor",   "warning"};
+
+} // namespace
+
+std::span<AlarmKindInfo const> alarmKinds() {
+    return kKinds;
+}
+
+AlarmKindInfo const& alarmKind(AlarmKind kind) {
+    auto const* const found = std::ranges::find(kKinds, kind, &AlarmKindInfo::kind);
+    if (found == std::end(kKinds)) throw std::invalid_argument("no kind of alarm has this number");
+    return *found;
+}
+
+AlarmKindInfo const* findAlarmKind(std::string_view name) {
+    auto const* const found =
+        std::ranges::find_if(kKinds, [&](AlarmKindInfo const& info) { return name == info.name; });
+    return found == std::end(kKinds) ? nullptr : found;
+}
+
+char const* severityName(AlarmSeverity severity) {
+    return kSeverities.at(static_cast<std::size_t>(severity));
+}
+
+std::optional<AlarmSeverity> findSeverity(std::string_view name) {
+    for (auto const severity : {Indeterminate, Critical, Major, Minor, Warning})
+        if (name == severityName(severity)) return severity;
+    return std::nullopt;
+}
+
+} // namespace kvloamd

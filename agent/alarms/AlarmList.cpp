@@ -1,0 +1,252 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/alarms/AlarmList.h"
+
+#include <algorithm>
+#include <set>
+#include <utility>
+
+namespace kvloamd {
+
+namespace {
+
+std::optional<Clock::time_point> earlier(std::optional<Clock::time_point> one,
+                                         std::optional<Clock::time_point> other) {
+    if (!one || !other) return one ? one : other;
+    return std::min(*one, *other);
+}
+
+/// Takes over what describes the condition; a text or place that is not said now stays. Returns
+/// whether anything has changed.
+bool describe(Condition& known, Condition const& said) {
+    Condition described = said;
+    if (said.text.empty()) described.text = known.text;
+    if (said.place.empty()) described.place = known.place;
+    if (described == known) return false;
+    known = std::move(described);
+    return true;
+}
+
+} // namespace
+
+AlarmList::AlarmList(AlarmPolicies policies, Report report, std::size_t capacity)
+    : m_report(std::move(report)), m_capacity(capacity), m_policies(std::move(policies)) {}
+
+void AlarmList::begin(Condition const& condition, Instant now, bool again) {
+    std::scoped_lock const guard(m_mutex);
+    beginLocked(condition, now, again);
+}
+
+void AlarmList::end(AlarmKey const& key, Instant now) {
+    std::scoped_lock const guard(m_mutex);
+    auto const found = m_records.find(key);
+    if (found == m_records.end() || !found->second.present) return;
+    endLocked(found->second, now);
+    settleAndKeep(found, now);
+}
+
+void AlarmList::compare(AlarmScope scope, std::vector<Condition> const& present,
+                        Clock::time_point read, Instant now) {
+    std::scoped_lock const guard(m_mutex);
+    std::set<AlarmKey> keys;
+    for (Condition const& condition : present) {
+        keys.insert(condition.key);
+        auto const found = m_records.find(condition.key);
+        if (found != m_records.end() && !found->second.present && found->second.changed > read)
+            continue; // it ended after the snapshot was read
+        beginLocked(condition, now, false);
+    }
+    for (auto at = m_records.begin(); at != m_records.end();) {
+        auto const record = at++;
+        if (!record->second.present || alarmKind(record->first.kind).scope != scope ||
+            keys.contains(record->first) || record->second.changed > read)
+            continue;
+        endLocked(record->second, now);
+        settleAndKeep(record, now);
+    }
+}
+
+std::optional<Clock::time_point> AlarmList::advance(Instant now) {
+    std::scoped_lock const guard(m_mutex);
+    if (!m_next || now.steady < *m_next) return m_next;
+    m_next.reset();
+    for (auto at = m_records.begin(); at != m_records.end();)
+        settleAndKeep(at++, now);
+    return m_next;
+}
+
+void AlarmList::apply(AlarmPolicies policies, Instant now) {
+    std::scoped_lock const guard(m_mutex);
+    m_policies = std::move(policies);
+    m_next.reset();
+    for (auto at = m_records.begin(); at != m_records.end();) {
+        auto const entry = at++;
+        Record& record = entry->second;
+        AlarmPolicy const policy = m_policies.of(entry->first.kind, entry->first.number);
+        if (record.raised && !policy.enabled) {
+            clear(record, now);
+        } else if (record.raised && record.alarm.severity != policy.severity) {
+            record.alarm.severity = policy.severity;
+            ++m_version;
+            m_report(AlarmEvent::SeverityChanged, record.alarm);
+        }
+        settleAndKeep(entry, now);
+    }
+}
+
+void AlarmList::restore(std::vector<Alarm> const& alarms, Instant now) {
+    std::scoped_lock const guard(m_mutex);
+    for (Alarm const& alarm : alarms) {
+        Record record;
+        record.alarm = alarm;
+        record.present = record.raised = true;
+        record.changed = now.steady;
+        record.alarm.severity =
+            m_policies.of(alarm.condition.key.kind, alarm.condition.key.number).severity;
+        m_records.insert_or_assign(alarm.condition.key, std::move(record));
+    }
+    ++m_version;
+}
+
+bool AlarmList::isPresent(AlarmKey const& key) const {
+    std::scoped_lock const guard(m_mutex);
+    auto const found = m_records.find(key);
+    return found != m_records.end() && found->second.present;
+}
+
+std::vector<Condition> AlarmList::present(AlarmKind kind) const {
+    std::scoped_lock const guard(m_mutex);
+    std::vector<Condition> conditions;
+    for (auto at = m_records.lower_bound({kind, {}, 0});
+         at != m_records.end() && at->first.kind == kind; ++at)
+        if (at->second.present) conditions.push_back(at->second.alarm.condition);
+    return conditions;
+}
+
+std::vector<Alarm> AlarmList::active() const {
+    std::scoped_lock const guard(m_mutex);
+    std::vector<Alarm> alarms;
+    for (auto const& [key, record] : m_records)
+        if (record.raised) alarms.push_back(record.alarm);
+    return alarms;
+}
+
+std::vector<Alarm> AlarmList::cleared() const {
+    std::scoped_lock const guard(m_mutex);
+    return {m_cleared.begin(), m_cleared.end()};
+}
+
+AlarmList::Counts AlarmList::counts() const {
+    std::scoped_lock const guard(m_mutex);
+    return m_counts;
+}
+
+std::uint64_t AlarmList::version() const {
+    std::scoped_lock const guard(m_mutex);
+    return m_version;
+}
+
+void AlarmList::beginLocked(Condition const& condition, Instant now, bool again) {
+    auto found = m_records.find(condition.key);
+    bool const known = found != m_records.end() && found->second.present;
+    if (!known || again) ++m_counts.begun;
+    if (found == m_records.end()) {
+        if (m_records.size() >= m_capacity) {
+            ++m_counts.unlisted;
+            return;
+        }
+        found = m_records.try_emplace(condition.key).first;
+        found->second.alarm.condition = condition;
+    }
+    Record& record = found->second;
+    if (describe(record.alarm.condition, condition) && record.raised) ++m_version;
+    if (known && !again) return;
+    if (!known) {
+        record.present = true;
+        record.changed = now.steady;
+    }
+    countBeginning(record, now);
+    settleAndKeep(found, now);
+}
+
+void AlarmList::endLocked(Record& record, Instant now) {
+    record.present = false;
+    record.changed = now.steady;
+    auto const& oldest = record.beginnings[record.next];
+    if (!oldest || now.steady - *oldest >= kFlapWindow) record.flapping = false;
+}
+
+void AlarmList::countBeginning(Record& record, Instant now) {
+    if (record.alarm.count == 0) record.alarm.began = now.date;
+    ++record.alarm.count;
+    if (record.raised) ++m_version;
+    record.beginnings[record.next] = now.steady;
+    record.next = (record.next + 1) % kFlaps;
+    auto const& oldest = record.beginnings[record.next];
+    if (oldest && now.steady - *oldest < kFlapWindow) record.flapping = true;
+}
+
+bool AlarmList::settle(Record& record, Instant now) {
+    AlarmKey const& key = record.alarm.condition.key;
+    AlarmPolicy const policy = m_policies.of(key.kind, key.number);
+    Clock::duration const lasted = now.steady - record.changed;
+    if (record.present) {
+        if (!record.raised && policy.enabled && (record.flapping || lasted >= policy.raiseHold))
+            raise(record, now);
+        return true;
+    }
+    Clock::duration const quiet = kFlapWindow;
+    if (record.raised) {
+        Clock::duration const hold = policy.clearHold;
+        if (lasted >= (record.flapping ? std::max(hold, quiet) : hold)) clear(record, now);
+        if (record.raised) return true;
+    }
+    if (lasted < quiet) return true; // remembered, to see whether it flaps
+    m_counts.suppressed += record.alarm.count;
+    return false;
+}
+
+void AlarmList::raise(Record& record, Instant now) {
+    AlarmKey const& key = record.alarm.condition.key;
+    record.raised = true;
+    // Nothing has begun since the last alarm if the kind was switched off meanwhile.
+    if (record.alarm.count == 0) record.alarm.began = now.date;
+    record.alarm.severity = m_policies.of(key.kind, key.number).severity;
+    record.alarm.raised = now.date;
+    ++m_counts.raised;
+    ++m_version;
+    record.alarm.number = m_report(AlarmEvent::Raised, record.alarm);
+}
+
+void AlarmList::clear(Record& record, Instant now) {
+    record.raised = false;
+    record.flapping = false;
+    record.alarm.cleared = now.date;
+    ++m_counts.cleared;
+    ++m_version;
+    m_report(AlarmEvent::Cleared, record.alarm);
+    if (m_cleared.size() >= kClearedCapacity) m_cleared.pop_front();
+    m_cleared.push_back(record.alarm);
+    record.alarm.count = 0;
+}
+
+std::optional<Clock::time_point> AlarmList::deadline(Record const& record) const {
+    AlarmKey const& key = record.alarm.condition.key;
+    AlarmPolicy const policy = m_policies.of(key.kind, key.number);
+    Clock::duration const quiet = kFlapWindow;
+    if (record.present) {
+        if (record.raised || !policy.enabled) return std::nullopt;
+        return record.changed + policy.raiseHold;
+    }
+    if (!record.raised) return record.changed + quiet;
+    Clock::duration const hold = policy.clearHold;
+    return record.changed + (record.flapping ? std::max(hold, quiet) : hold);
+}
+
+void AlarmList::settleAndKeep(Records::iterator at, Instant now) {
+    if (settle(at->second, now))
+        m_next = earlier(m_next, deadline(at->second));
+    else
+        m_records.erase(at);
+}
+
+} // namespace kvloamd
