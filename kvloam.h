@@ -22,6 +22,7 @@
 #include "board/DS1LineFeature.h"
 #include "board/DS1LineImpedance.h"
 #include "board/Ethernet.h"
+#include "board/EthernetDetails.h"
 #include "board/EthernetFeature.h"
 #include "board/Feature.h"
 #include "board/IPInterface.h"

@@ -10,6 +10,8 @@
 #include <string_view>
 #include <utility>
 
+#include "HostMulticast.h"
+#include "HostPause.h"
 #include "PhysAddress.h"
 
 namespace {
@@ -97,7 +99,16 @@ int HostEthernet::GetInOctets() {
 }
 
 int HostEthernet::GetInUcastPkts() {
-    return number("statistics/rx_packets");
+    // Read first, so that no packet is subtracted that is not in the sum.
+    std::int64_t const multicast = m_device.number("statistics/multicast").value_or(0);
+    auto const packets = m_device.number("statistics/rx_packets");
+    if (!packets) return KVL::kNotSupported;
+    std::scoped_lock const guard(m_mutex);
+    // The two numbers are not of the same moment, and a counter must not fall for that.
+    if (*packets < m_lastPackets) m_lastUnicast = 0;
+    m_lastPackets = *packets;
+    m_lastUnicast = std::max(m_lastUnicast, *packets - multicast);
+    return low32(m_lastUnicast);
 }
 
 int HostEthernet::GetInDiscards() {
@@ -155,4 +166,44 @@ int HostEthernet::GetFrameTooLongs() {
 int HostEthernet::GetDuplexStatus() {
     auto const duplex = m_device.text("duplex");
     return duplex ? stateNamed(kDuplexStates, *duplex, KVL::kNotSupported) : KVL::kNotSupported;
+}
+
+int HostEthernet::GetInternalMacTransmitErrors() {
+    return number("statistics/tx_fifo_errors");
+}
+
+int HostEthernet::GetInternalMacReceiveErrors() {
+    auto const fifo = m_device.number("statistics/rx_fifo_errors");
+    auto const overrun = m_device.number("statistics/rx_over_errors");
+    if (!fifo && !overrun) return KVL::kNotSupported;
+    return low32(fifo.value_or(0) + overrun.value_or(0));
+}
+
+int HostEthernet::GetHighSpeed() {
+    auto const megabits = m_device.number("speed");
+    return megabits && *megabits >= 0 ? low32(*megabits) : KVL::kNotSupported;
+}
+
+int HostEthernet::GetPromiscuousMode() {
+    auto const flags = m_device.flags();
+    if (!flags) return KVL::kNotSupported;
+    return (*flags & IFF_PROMISC) != 0 ? 1 : 2;
+}
+
+int HostEthernet::GetInMulticastPkts() {
+    return number("statistics/multicast");
+}
+
+int HostEthernet::GetPauseAdminMode() {
+    auto const pause = readHostPause(m_device.name());
+    return pause ? pauseMode(*pause) : KVL::kNotSupported;
+}
+
+int HostEthernet::GetPauseOperMode() {
+    auto const pause = readHostPause(m_device.name());
+    return pause && !pause->isNegotiated ? pauseMode(*pause) : KVL::kNotSupported;
+}
+
+int HostEthernet::GetMulticastAddresses(std::vector<std::string>& addresses) {
+    return readHostMulticast(m_device.name(), addresses) ? 0 : KVL::kNotSupported;
 }

@@ -152,6 +152,7 @@ void LinePerformance::becomeUnavailable(int seconds, Change& change) {
     }
     m_minute = recent(seconds - 1).before;
     m_unavailable = true;
+    m_decidedAfter = seconds;
     m_run = 0;
 }
 
@@ -164,6 +165,7 @@ void LinePerformance::becomeAvailable(Change& change) {
         interval += each.counts;
     }
     m_unavailable = false;
+    m_decidedAfter = m_run;
     m_run = 0;
 }
 

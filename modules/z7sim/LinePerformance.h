@@ -104,6 +104,9 @@ class LinePerformance {
     void closeInterval();
 
     bool unavailable() const { return m_unavailable; }
+    /// When the line became available or unavailable: how many seconds before the end of the second
+    /// that decided it.
+    int decidedAfter() const { return m_decidedAfter; }
     /// The failures. A line without signal has no frame either.
     LineDefects failures() const { return m_failures; }
 
@@ -149,6 +152,7 @@ class LinePerformance {
     /// Seconds in a row, up to now, that speak for the line's becoming the other: severely errored
     /// while it is available, good while it is unavailable.
     int m_run = 0;
+    int m_decidedAfter = 0;
     int m_remembered = 0; ///< seconds in a row, up to now, that can be corrected
     LineFailure m_signal;
     LineFailure m_frame;

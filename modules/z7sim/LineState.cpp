@@ -61,16 +61,30 @@ int lineStatusOf(std::uint32_t alarms, LinePerformance const& performance) {
 
 LineState::LineState() : m_number(LineStatusDelivery::instance().reserve()) {}
 
+LineState::Date LineState::Date::now(long before) {
+    return {LineClocks::inUse().system() - before, ::clocksApart()};
+}
+
+long LineState::Date::inUse() const {
+    if (seconds == 0) return 0;
+    // Read one after the other, the clocks seem to differ by a second at times.
+    long const shift = ::clocksApart() - clocksApart;
+    return std::labs(shift) <= 1 ? seconds : seconds + shift;
+}
+
 long LineState::lastChange() const {
     std::scoped_lock const guard(m_mutex);
-    if (m_changed == 0) return 0;
-    // Read one after the other, the clocks seem to differ by a second at times.
-    long const shift = clocksApart() - m_clocksApart;
-    return std::labs(shift) <= 1 ? m_changed : m_changed + shift;
+    return m_changed.inUse();
+}
+
+long LineState::availabilityChange() const {
+    std::scoped_lock const guard(m_mutex);
+    return m_availabilityChanged.inUse();
 }
 
 void LineState::begin(std::uint32_t alarms, LinePerformance const& performance) {
     m_madeOf = ingredientsOf(alarms, performance);
+    m_unavailable = performance.unavailable();
     m_status.store(lineStatusOf(alarms, performance), std::memory_order_relaxed);
 }
 
@@ -83,9 +97,11 @@ void LineState::update(std::uint32_t alarms, LinePerformance const& performance)
     if (now == status()) return;
     {
         std::scoped_lock const guard(m_mutex);
-        m_changed = LineClocks::inUse().system();
-        m_clocksApart = clocksApart();
+        m_changed = Date::now();
+        if (performance.unavailable() != m_unavailable)
+            m_availabilityChanged = Date::now(performance.decidedAfter());
     }
+    m_unavailable = performance.unavailable();
     m_status.store(now, std::memory_order_relaxed);
     LineStatusDelivery::instance().post(m_number, static_cast<DS1LineStatusEnum>(now));
 }

@@ -24,6 +24,9 @@ class LineState {
     /// When the status changed last, in seconds since the epoch as the system's clock counts them
     /// now: when the clock has been set since, the date has been, too. 0 until a change.
     long lastChange() const;
+    /// The same of the line's availability: the first second in which it was unavailable, or was
+    /// available again. This is certain only some seconds later.
+    long availabilityChange() const;
     int trapEnable() const { return m_trapEnable.load(std::memory_order_relaxed); }
     void setTrapEnable(int enable) { m_trapEnable.store(enable, std::memory_order_relaxed); }
 
@@ -33,13 +36,25 @@ class LineState {
     void update(std::uint32_t alarms, LinePerformance const& performance);
 
   private:
+    /// A date of the system's clock; 0 until there is one.
+    struct Date {
+        long seconds = 0;
+        long clocksApart = 0; ///< the system's clock minus the monotonic one, at that time
+
+        /// The present, or so many seconds before it.
+        static Date now(long before = 0);
+        /// As the system's clock counts it now.
+        long inUse() const;
+    };
+
     std::uint64_t const m_number;
     std::uint64_t m_madeOf = 0; ///< the alarms and failures that the status shows; for the tick
+    bool m_unavailable = false; ///< for the tick
     std::atomic<int> m_status{1};
     std::atomic<int> m_trapEnable{2};
-    mutable std::mutex m_mutex; ///< guards the two below
-    long m_changed = 0;         ///< of the system's clock
-    long m_clocksApart = 0;     ///< the system's clock minus the monotonic one, at that time
+    mutable std::mutex m_mutex; ///< guards what follows
+    Date m_changed;
+    Date m_availabilityChanged;
 };
 
 /// The status bits of a line with these alarms (`kDS1Alarm...`) and failures. Loss of signal, loss

@@ -35,3 +35,75 @@ int SimulatedEthernet::GetOutOctets() {
 int SimulatedEthernet::GetFCSErrors() {
     return number("ETHERNET_FCS_ERRORS");
 }
+
+int SimulatedEthernet::GetInUcastPkts() {
+    return number("ETHERNET_IN_PACKETS");
+}
+
+int SimulatedEthernet::GetInDiscards() {
+    return number("ETHERNET_IN_DISCARDS");
+}
+
+int SimulatedEthernet::GetInErrors() {
+    return number("ETHERNET_IN_ERRORS");
+}
+
+int SimulatedEthernet::GetInUnknownProtos() {
+    return number("ETHERNET_IN_UNKNOWN_PROTOCOLS");
+}
+
+int SimulatedEthernet::GetOutUcastPkts() {
+    return number("ETHERNET_OUT_PACKETS");
+}
+
+int SimulatedEthernet::GetOutDiscards() {
+    return number("ETHERNET_OUT_DISCARDS");
+}
+
+int SimulatedEthernet::GetOutErrors() {
+    return number("ETHERNET_OUT_ERRORS");
+}
+
+int SimulatedEthernet::GetAlignmentErrors() {
+    return number("ETHERNET_ALIGNMENT_ERRORS");
+}
+
+int SimulatedEthernet::GetInternalMacTransmitErrors() {
+    return number("ETHERNET_MAC_TRANSMIT_ERRORS");
+}
+
+int SimulatedEthernet::GetFrameTooLongs() {
+    return number("ETHERNET_TOO_LONG_FRAMES");
+}
+
+int SimulatedEthernet::GetInternalMacReceiveErrors() {
+    return number("ETHERNET_MAC_RECEIVE_ERRORS");
+}
+
+int SimulatedEthernet::GetSymbolErrors() {
+    return number("ETHERNET_SYMBOL_ERRORS");
+}
+
+int SimulatedEthernet::GetDuplexStatus() {
+    return number("ETHERNET_DUPLEX");
+}
+
+int SimulatedEthernet::GetOperStatus() {
+    return number("ETHERNET_OPER_STATUS");
+}
+
+int SimulatedEthernet::GetInMulticastPkts() {
+    return number("ETHERNET_IN_MULTICASTS");
+}
+
+int SimulatedEthernet::GetInBroadcastPkts() {
+    return number("ETHERNET_IN_BROADCASTS");
+}
+
+int SimulatedEthernet::GetOutMulticastPkts() {
+    return number("ETHERNET_OUT_MULTICASTS");
+}
+
+int SimulatedEthernet::GetOutBroadcastPkts() {
+    return number("ETHERNET_OUT_BROADCASTS");
+}

@@ -6,10 +6,11 @@
 
 #include "PhysAddress.h"
 #include "Z7SimEthernet.h"
+#include "board/EthernetDetails.h"
 
 /// A `SimulatedEthernet` keeps what does not change and asks the platform for every counter,
 /// because the board's attributes hold the counters. A query without an attribute is not supported.
-class SimulatedEthernet final : public Z7SimEthernet {
+class SimulatedEthernet final : public Z7SimEthernet, public KVL::EthernetDetails {
   public:
     /// `board`: its handle in the device mapper. `address`: the value of its attribute.
     SimulatedEthernet(long board, std::string const& address);
@@ -19,9 +20,29 @@ class SimulatedEthernet final : public Z7SimEthernet {
     int GetMTU() override { return m_mtu; }
     int GetSpeed() override { return m_speed; }
     int GetPhysAddress(char* buffer, int& length) override;
+    int GetOperStatus() override;
     int GetInOctets() override;
+    int GetInUcastPkts() override;
+    int GetInDiscards() override;
+    int GetInErrors() override;
+    int GetInUnknownProtos() override;
     int GetOutOctets() override;
+    int GetOutUcastPkts() override;
+    int GetOutDiscards() override;
+    int GetOutErrors() override;
+    int GetAlignmentErrors() override;
     int GetFCSErrors() override;
+    int GetInternalMacTransmitErrors() override;
+    int GetFrameTooLongs() override;
+    int GetInternalMacReceiveErrors() override;
+    int GetSymbolErrors() override;
+    int GetDuplexStatus() override;
+    int GetInMulticastPkts() override;
+    int GetInBroadcastPkts() override;
+    int GetOutMulticastPkts() override;
+    int GetOutBroadcastPkts() override;
+    /// A simulated interface receives what is addressed to it.
+    int GetPromiscuousMode() override { return 2; }
 
   private:
     int number(char const* attribute) const;

@@ -115,7 +115,7 @@ int Z7SimLine::GetOperStatus() {
     return (m_state->status() & carriesNothing) == 0 ? kUp : kDown;
 }
 int Z7SimLine::GetLastChange(int& seconds, int& microseconds) {
-    seconds = static_cast<int>(m_state->lastChange());
+    seconds = static_cast<int>(m_state->availabilityChange());
     microseconds = 0;
     return 0;
 }

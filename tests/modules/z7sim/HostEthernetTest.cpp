@@ -9,6 +9,8 @@
 #include <gtest/gtest.h>
 
 #include "HostEthernet.h"
+#include "HostMulticast.h"
+#include "HostPause.h"
 #include "core/ReferenceCounter.h"
 #include "tests/support/TemporaryDirectory.h"
 
@@ -125,6 +127,7 @@ TEST_F(HostEthernetTest, EveryCounterIsReadFromItsOwnFile) {
         {"tx_aborted_errors", &KVL::Ethernet::GetExcessiveCollisions},
         {"tx_carrier_errors", &KVL::Ethernet::GetCarrierSenseErrors},
         {"rx_length_errors", &KVL::Ethernet::GetFrameTooLongs},
+        {"tx_fifo_errors", &KVL::Ethernet::GetInternalMacTransmitErrors},
     };
     int number = 100;
     for (auto const& counter : counters) {
@@ -133,6 +136,76 @@ TEST_F(HostEthernetTest, EveryCounterIsReadFromItsOwnFile) {
         write(file.c_str(), std::to_string(++number).c_str());
         EXPECT_EQ((m_ethernet->*counter.query)(), number) << counter.file;
     }
+}
+
+TEST_F(HostEthernetTest, MulticastPacketsAreNotCountedAsUnicastOnes) {
+    write("statistics/rx_packets", "1000");
+    EXPECT_EQ(m_ethernet->GetInUcastPkts(), 1000);
+    write("statistics/multicast", "3");
+    write("statistics/rx_packets", "1010");
+    EXPECT_EQ(m_ethernet->GetInMulticastPkts(), 3);
+    EXPECT_EQ(m_ethernet->GetInUcastPkts(), 1007);
+}
+
+TEST_F(HostEthernetTest, UnicastCounterFallsOnlyWhenTheDeviceHasBegunAgain) {
+    write("statistics/rx_packets", "1000");
+    EXPECT_EQ(m_ethernet->GetInUcastPkts(), 1000);
+    // Counted after the packets were.
+    write("statistics/multicast", "5");
+    EXPECT_EQ(m_ethernet->GetInUcastPkts(), 1000);
+    write("statistics/rx_packets", "10");
+    write("statistics/multicast", "1");
+    EXPECT_EQ(m_ethernet->GetInUcastPkts(), 9);
+}
+
+TEST_F(HostEthernetTest, ReceiveErrorsOfTheMacAreThoseOfItsQueues) {
+    EXPECT_EQ(m_ethernet->GetInternalMacReceiveErrors(), kNotSupported);
+    write("statistics/rx_fifo_errors", "4");
+    EXPECT_EQ(m_ethernet->GetInternalMacReceiveErrors(), 4);
+    write("statistics/rx_over_errors", "3");
+    EXPECT_EQ(m_ethernet->GetInternalMacReceiveErrors(), 7);
+}
+
+TEST_F(HostEthernetTest, SpeedBeyond32BitsIsInMegabits) {
+    EXPECT_EQ(m_ethernet->GetHighSpeed(), kNotSupported);
+    write("speed", "100000");
+    EXPECT_EQ(m_ethernet->GetHighSpeed(), 100000);
+    write("speed", "-1");
+    EXPECT_EQ(m_ethernet->GetHighSpeed(), kNotSupported);
+}
+
+TEST_F(HostEthernetTest, PromiscuousModeIsTheKernelsFlag) {
+    EXPECT_EQ(m_ethernet->GetPromiscuousMode(), kNotSupported);
+    write("flags", "0x1103");
+    EXPECT_EQ(m_ethernet->GetPromiscuousMode(), 1);
+    write("flags", "0x1003");
+    EXPECT_EQ(m_ethernet->GetPromiscuousMode(), 2);
+}
+
+TEST(HostPauseTest, ModeIsTheSumOfBothDirections) {
+    EXPECT_EQ(pauseMode({false, false, false}), 1);
+    EXPECT_EQ(pauseMode({false, false, true}), 2);
+    EXPECT_EQ(pauseMode({false, true, false}), 3);
+    EXPECT_EQ(pauseMode({false, true, true}), 4);
+}
+
+TEST(HostPauseTest, DeviceThatIsNotThereHasNone) {
+    EXPECT_FALSE(readHostPause("no-such-device"));
+}
+
+TEST(HostMulticastTest, AddressesOfTheDeviceAreRead) {
+    support::TemporaryDirectory const directory;
+    std::string const list = directory.file("dev_mcast");
+    std::ofstream(list) << "1    lo              1     0     333300000001\n"
+                           "2    net0            1     0     01005e000001\n"
+                           "2    net0            2     0     3333ff5e0001\n"
+                           "2    net0            1     0     nonsense\n"
+                           "3    net01           1     0     01005e000002\n";
+    std::vector<std::string> addresses;
+    EXPECT_TRUE(readHostMulticast("net0", addresses, list));
+    EXPECT_EQ(addresses, (std::vector<std::string>{{"\x01\x00\x5e\x00\x00\x01", 6},
+                                                   {"\x33\x33\xff\x5e\x00\x01", 6}}));
+    EXPECT_FALSE(readHostMulticast("net0", addresses, directory.file("missing")));
 }
 
 TEST_F(HostEthernetTest, CountersWrapAt32Bits) {

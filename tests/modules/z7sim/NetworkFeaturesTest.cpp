@@ -7,6 +7,7 @@
 
 #include <gtest/gtest.h>
 
+#include "board/EthernetDetails.h"
 #include "board/EthernetFeature.h"
 #include "board/IPInterface.h"
 #include "board/InterfaceFeature.h"
@@ -134,6 +135,49 @@ TEST_F(NetworkFeaturesTest, SimulatedInterfaceAnswersItsAttributes) {
     EXPECT_EQ(ethernet()->GetInOctets(), 11);
     EXPECT_EQ(ethernet()->GetOutOctets(), 12);
     EXPECT_EQ(ethernet()->GetFCSErrors(), 13);
+}
+
+TEST_F(NetworkFeaturesTest, SimulatedInterfaceCountsWhatItsAttributesSay) {
+    struct {
+        char const* attribute;
+        int (KVL::Ethernet::*query)();
+    } const counters[] = {
+        {"ETHERNET_IN_PACKETS", &KVL::Ethernet::GetInUcastPkts},
+        {"ETHERNET_IN_DISCARDS", &KVL::Ethernet::GetInDiscards},
+        {"ETHERNET_IN_ERRORS", &KVL::Ethernet::GetInErrors},
+        {"ETHERNET_IN_UNKNOWN_PROTOCOLS", &KVL::Ethernet::GetInUnknownProtos},
+        {"ETHERNET_OUT_PACKETS", &KVL::Ethernet::GetOutUcastPkts},
+        {"ETHERNET_OUT_DISCARDS", &KVL::Ethernet::GetOutDiscards},
+        {"ETHERNET_OUT_ERRORS", &KVL::Ethernet::GetOutErrors},
+        {"ETHERNET_ALIGNMENT_ERRORS", &KVL::Ethernet::GetAlignmentErrors},
+        {"ETHERNET_MAC_TRANSMIT_ERRORS", &KVL::Ethernet::GetInternalMacTransmitErrors},
+        {"ETHERNET_TOO_LONG_FRAMES", &KVL::Ethernet::GetFrameTooLongs},
+        {"ETHERNET_MAC_RECEIVE_ERRORS", &KVL::Ethernet::GetInternalMacReceiveErrors},
+        {"ETHERNET_SYMBOL_ERRORS", &KVL::Ethernet::GetSymbolErrors},
+        {"ETHERNET_DUPLEX", &KVL::Ethernet::GetDuplexStatus},
+        {"ETHERNET_OPER_STATUS", &KVL::Ethernet::GetOperStatus},
+    };
+    plugIn(kSimulated);
+    int number = 100;
+    for (auto const& counter : counters) {
+        EXPECT_EQ((ethernet().get()->*counter.query)(), KVL::kNotSupported) << counter.attribute;
+        sim::set(5, counter.attribute, ++number);
+        EXPECT_EQ((ethernet().get()->*counter.query)(), number) << counter.attribute;
+    }
+}
+
+TEST_F(NetworkFeaturesTest, SimulatedInterfaceKnowsMulticastsAndBroadcasts) {
+    plugIn(std::string(kSimulated) + ", ETHERNET_IN_MULTICASTS: 1, ETHERNET_IN_BROADCASTS: 2, "
+                                     "ETHERNET_OUT_MULTICASTS: 3, ETHERNET_OUT_BROADCASTS: 4");
+    auto const handle = ethernet();
+    auto* const details = dynamic_cast<KVL::EthernetDetails*>(handle.get());
+    ASSERT_NE(details, nullptr);
+    EXPECT_EQ(details->GetInMulticastPkts(), 1);
+    EXPECT_EQ(details->GetInBroadcastPkts(), 2);
+    EXPECT_EQ(details->GetOutMulticastPkts(), 3);
+    EXPECT_EQ(details->GetOutBroadcastPkts(), 4);
+    EXPECT_EQ(details->GetPromiscuousMode(), 2);
+    EXPECT_EQ(details->GetPauseAdminMode(), KVL::kNotSupported);
 }
 
 TEST_F(NetworkFeaturesTest, SimulatedCountersAreLiveAndTheRestIsKept) {

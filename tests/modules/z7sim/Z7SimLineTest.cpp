@@ -326,8 +326,33 @@ TEST_F(Z7SimLineTest, AChangeLeavesItsDate) {
     int seconds = 0;
     int microseconds = -1;
     EXPECT_EQ(m_line->GetLastChange(seconds, microseconds), 0);
-    EXPECT_EQ(seconds, m_line->GetLineStatusLastChange());
     EXPECT_EQ(microseconds, 0);
+    // The line has been unavailable since its signal was lost, which was a failure seconds later.
+    long const declared = m_line->GetLineStatusLastChange() - seconds;
+    EXPECT_GE(declared, 2);
+    EXPECT_LE(declared, 4);
+}
+
+TEST_F(Z7SimLineTest, LineIsAvailableSinceTheFirstOfTenGoodSeconds) {
+    plugIn("type: esf");
+    int seconds = 0;
+    int microseconds = 0;
+    EXPECT_EQ(m_line->GetLastChange(seconds, microseconds), 0);
+    EXPECT_EQ(seconds, 0); // it has not changed yet
+    alarm("los");
+    tick(3);
+    mend();
+    tick(11);
+    ASSERT_EQ(m_line->GetOperStatus(), 1);
+    EXPECT_EQ(m_line->GetLastChange(seconds, microseconds), 0);
+    EXPECT_GE(m_line->GetLineStatusLastChange() - seconds, 10);
+    EXPECT_LE(m_line->GetLineStatusLastChange() - seconds, 11);
+    // An alarm that leaves the line available moves the one date only.
+    int const available = seconds;
+    alarm("rai");
+    tick();
+    EXPECT_EQ(m_line->GetLastChange(seconds, microseconds), 0);
+    EXPECT_EQ(seconds, available);
 }
 
 TEST_F(Z7SimLineTest, AnAlarmFromTheStartIsAStatusAndNoChange) {
