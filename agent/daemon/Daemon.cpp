@@ -219,7 +219,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     entityFile.open();
     EntityReader entities(entityIndices, boards.settings, started,
                           [] { return std::time(nullptr); });
-    LinkWatch links(boards.settings, boards.queue);
+    LinkWatch links(boards.settings, boards.queue, boards.counters);
     CallWatch calls(boards.settings, boards.queue, boards.counters);
     Collector collector(
         [&](Snapshot& snapshot) {
@@ -264,7 +264,8 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
                      ++boards.counters.requests;
                      return collector.snapshot();
                  },
-                 [&] { return collector.newest(); }, boards.settings});
+                 [&] { return collector.newest(); }, boards.settings,
+                 capabilities(options.enterprise, KVLOAM_VERSION)});
     Notifier notifier(boards.queue, front.notifications(), [&](Notification& notification) {
         auto const snapshot = collector.newest();
         nameSubject(notification, trees, {*snapshot, boards.counters, &boards.settings});

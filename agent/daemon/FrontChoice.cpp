@@ -17,7 +17,8 @@ std::unique_ptr<Front> makeFront(Options const& options) {
 }
 
 SnmpFiles snmpFiles(Options const& options) {
-    return {options.snmpConfig, options.persistentDirectory};
+    return {options.snmpConfig, options.persistentDirectory, systemDescription(KVLOAM_VERSION),
+            systemObjectId(options.enterprise)};
 }
 
 } // namespace kvloamd

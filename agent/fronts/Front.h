@@ -9,6 +9,7 @@
 #include <utility>
 #include <vector>
 
+#include "agent/fronts/Capabilities.h"
 #include "agent/fronts/EventLoop.h"
 #include "agent/notifications/NotificationSink.h"
 #include "agent/objects/ServedTree.h"
@@ -26,6 +27,7 @@ struct Served {
     std::function<std::shared_ptr<Snapshot const>()>
         newestSnapshot; ///< without asking for a new one
     Settings& settings;
+    std::vector<Capability> capabilities; ///< rows of sysORTable
 };
 
 /// A `Front` connects the agent to its SNMP clients by one protocol. Thread-bound to the SNMP

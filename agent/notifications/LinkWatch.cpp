@@ -11,9 +11,9 @@ namespace kvloamd {
 namespace {
 
 bool hasChanged(std::optional<int> former, std::optional<int> now) {
-    if (!former || !now || former == now) return false;
+    if (!former || !now) return false;
     if (former == kNotPresent || now == kNotPresent) return false;
-    return former == kDown || now == kDown;
+    return isDown(*former) != isDown(*now);
 }
 
 } // namespace
@@ -28,10 +28,17 @@ void LinkWatch::update(std::vector<InterfaceRow> const& interfaces, Clock::time_
         bool const stayed = former != m_links.end() && former->ifIndex == row.ifIndex &&
                             former->boardIndex == row.boardIndex;
         if (stayed && hasChanged(former->operStatus, row.operStatus) && isEnabled(row))
-            m_queue.push(linkChange(row, begun));
+            m_queue.push(changeOf(row, begun));
         links.push_back({row.ifIndex, row.boardIndex, row.operStatus});
     }
     m_links = std::move(links);
+}
+
+Notification LinkWatch::changeOf(InterfaceRow const& row, Clock::time_point begun) const {
+    Notification change = linkChange(row, begun);
+    if (row.type == kTypeDs1 && row.lastChange)
+        change.sysUpTime = m_counters.sysUpTime(*row.lastChange);
+    return change;
 }
 
 bool LinkWatch::isEnabled(InterfaceRow const& row) const {

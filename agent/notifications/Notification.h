@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <variant>
 #include <vector>
@@ -14,6 +15,9 @@ namespace kvloamd {
 
 /// snmpTrapOID.0, the object that names the notification in which it is sent.
 inline Oid const kSnmpTrapOid{1, 3, 6, 1, 6, 3, 1, 1, 4, 1, 0};
+
+/// sysUpTime.0.
+inline Oid const kSysUpTime{1, 3, 6, 1, 2, 1, 1, 3, 0};
 
 /// An object in a notification. It owns its value, so it does not depend on a snapshot.
 struct NotifiedObject {
@@ -38,6 +42,8 @@ struct Notification {
     std::vector<NotifiedObject> objects;
     Clock::time_point when; ///< the time of the event
     Subject subject = {};
+    /// sysUpTime when the event began, if that is earlier than now; the notification carries it.
+    std::optional<std::uint32_t> sysUpTime = std::nullopt;
 };
 
 /// What became of a notification that was handed over.

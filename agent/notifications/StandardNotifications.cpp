@@ -61,9 +61,8 @@ Notification callInformation(BearerRow const& row, Counters const& counters,
 
 Notification linkChange(InterfaceRow const& row, Clock::time_point when) {
     int const operStatus = row.operStatus.value_or(int{kUp});
-    // The notification requires all three objects. An interface without ifAdminStatus cannot be
-    // taken down, so it is administratively up.
-    return {operStatus == kDown ? kLinkDown : kLinkUp,
+    // The notification requires all three objects.
+    return {isDown(operStatus) ? kLinkDown : kLinkUp,
             {object(ifTable(), 1, row.ifIndex, ValueType::Integer, std::int64_t{row.ifIndex}),
              object(ifTable(), 7, row.ifIndex, ValueType::Integer,
                     std::int64_t{row.adminStatus.value_or(int{kUp})}),

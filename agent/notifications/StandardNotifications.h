@@ -17,7 +17,8 @@ Notification lineStatusChange(std::uint32_t ifIndex, int status, std::uint32_t l
 Notification callInformation(BearerRow const& row, Counters const& counters,
                              Clock::time_point when);
 
-/// Makes a linkDown if `row` is down, else a linkUp.
+/// Makes a linkDown if `row` is down or lowerLayerDown, else a linkUp. Its ifOperStatus is the
+/// present state in both, as a GET answers it.
 Notification linkChange(InterfaceRow const& row, Clock::time_point when);
 
 } // namespace kvloamd

@@ -120,6 +120,7 @@ constexpr Kind kindOf(ValueType type, Details const& details) {
         return Kind::Gauge;
     case ValueType::TimeTicks:
     case ValueType::TimeStamp:
+    case ValueType::BeginStamp:
     case ValueType::Date:
         return Kind::Time;
     default:

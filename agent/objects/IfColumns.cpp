@@ -11,25 +11,18 @@ namespace {
 /// RowStatus's.
 constexpr std::int64_t kActive = 1;
 
+// ifRcvAddressType's.
+constexpr std::int64_t kVolatile = 2;
+constexpr std::int64_t kNonVolatile = 3;
+
 Value index(InterfaceRow const& row) {
     return std::int64_t{row.ifIndex};
 }
 
-template <InterfaceCounter Counter>
-Value count32(InterfaceRow const& row) {
-    auto const& counter = row.counters[Counter];
-    return counter ? Value{std::int64_t{static_cast<std::uint32_t>(*counter)}} : Value{};
-}
-
-template <InterfaceCounter Counter>
-Value count64(InterfaceRow const& row) {
-    auto const& counter = row.counters[Counter];
-    return counter ? Value{static_cast<std::int64_t>(*counter)} : Value{};
-}
-
 /// Millions of bits a second, rounded.
 Value highSpeed(InterfaceRow const& row) {
-    if (!row.speed) return {};
+    if (row.highSpeed) return std::int64_t{*row.highSpeed};
+    if (!row.speed || *row.speed == kMostSpeed) return {};
     return std::int64_t{*row.speed / 1'000'000 + (*row.speed % 1'000'000 >= 500'000 ? 1 : 0)};
 }
 
@@ -48,6 +41,16 @@ Value discontinuity(InterfaceRow const& row) {
 
 Value stackStatus(StackRow const& /*row*/) {
     return kActive;
+}
+
+Value addressStatus(ReceiveAddressRow const& /*row*/) {
+    return kActive;
+}
+
+/// An interface has its own address again after a restart, and all others only if they are asked
+/// for again.
+Value addressType(ReceiveAddressRow const& row) {
+    return row.isOwn ? kNonVolatile : kVolatile;
 }
 
 using enum ValueType;
@@ -75,6 +78,8 @@ constexpr NamedNumber kTruthValues[] = {{1, "true"}, {2, "false"}};
 constexpr NamedNumber kIfStackStatus[] = {{1, "active"},      {2, "notInService"},  {3, "notReady"},
                                           {4, "createAndGo"}, {5, "createAndWait"}, {6, "destroy"}};
 
+constexpr NamedNumber kIfRcvAddressType[] = {{1, "other"}, {2, "volatile"}, {3, "nonVolatile"}};
+
 constexpr Column<Row> kColumns[] = {
     {"ifIndex", 1, Integer, index, about("The number of the interface")},
     {"ifDescr", 2, Text, text<&Row::description>,
@@ -85,7 +90,7 @@ constexpr Column<Row> kColumns[] = {
      about("The largest packet, in octets, that the interface sends or receives").in("octets")},
     {"ifSpeed", 5, Gauge, number<&Row::speed>,
      about("The bandwidth in bits per second").in("bits per second")},
-    {"ifPhysAddress", 6, Octets, textIfKnown<&Row::physAddress>,
+    {"ifPhysAddress", 6, Octets, text<&Row::physAddress>,
      about("The address of the interface in its own layer")},
     {"ifAdminStatus", 7, Integer, number<&Row::adminStatus>,
      about("The state that the interface is meant to have").oneOf(kIfAdminStatus)},
@@ -116,14 +121,30 @@ constexpr Column<Row> kColumns[] = {
 constexpr Column<Row> kMoreColumns[] = {
     {"ifName", 1, Text, text<&Row::name>,
      about("The name of the interface on the system's own console").identifies()},
+    {"ifInMulticastPkts", 2, Counter, count32<kInMulticastPkts>,
+     about("Packets received for a group of receivers and passed up").in("packets")},
+    {"ifInBroadcastPkts", 3, Counter, count32<kInBroadcastPkts>,
+     about("Packets received for all receivers and passed up").in("packets")},
+    {"ifOutMulticastPkts", 4, Counter, count32<kOutMulticastPkts>,
+     about("Packets from above that were meant for a group of receivers").in("packets")},
+    {"ifOutBroadcastPkts", 5, Counter, count32<kOutBroadcastPkts>,
+     about("Packets from above that were meant for all receivers").in("packets")},
     {"ifHCInOctets", 6, Counter64, count64<kInOctets>,
      about("As ifInOctets, with 64 bits").in("octets")},
     {"ifHCInUcastPkts", 7, Counter64, count64<kInUcastPkts>,
      about("As ifInUcastPkts, with 64 bits").in("packets")},
+    {"ifHCInMulticastPkts", 8, Counter64, count64<kInMulticastPkts>,
+     about("As ifInMulticastPkts, with 64 bits").in("packets")},
+    {"ifHCInBroadcastPkts", 9, Counter64, count64<kInBroadcastPkts>,
+     about("As ifInBroadcastPkts, with 64 bits").in("packets")},
     {"ifHCOutOctets", 10, Counter64, count64<kOutOctets>,
      about("As ifOutOctets, with 64 bits").in("octets")},
     {"ifHCOutUcastPkts", 11, Counter64, count64<kOutUcastPkts>,
      about("As ifOutUcastPkts, with 64 bits").in("packets")},
+    {"ifHCOutMulticastPkts", 12, Counter64, count64<kOutMulticastPkts>,
+     about("As ifOutMulticastPkts, with 64 bits").in("packets")},
+    {"ifHCOutBroadcastPkts", 13, Counter64, count64<kOutBroadcastPkts>,
+     about("As ifOutBroadcastPkts, with 64 bits").in("packets")},
     {"ifLinkUpDownTrapEnable", 14, Integer, linkUpDownTraps,
      about("Whether linkUp and linkDown are sent for the interface")
          .oneOf(kEnabling)
@@ -131,17 +152,30 @@ constexpr Column<Row> kMoreColumns[] = {
          .as(Kind::Information)},
     {"ifHighSpeed", 15, Gauge, highSpeed,
      about("The bandwidth in millions of bits per second").in("millions of bits per second")},
+    {"ifPromiscuousMode", 16, Integer, number<&Row::promiscuousMode>,
+     about("Whether the interface receives packets for other receivers too")
+         .oneOf(kTruthValues)
+         .as(Kind::Information)},
     {"ifConnectorPresent", 17, Integer, number<&Row::connectorPresent>,
      about("Whether the interface has a connector").oneOf(kTruthValues).as(Kind::Information)},
     {"ifAlias", 18, Text, alias,
      about("The name that the operator has given to the interface").settable(kAlias)},
-    {"ifCounterDiscontinuityTime", 19, TimeStamp, discontinuity,
+    {"ifCounterDiscontinuityTime", 19, BeginStamp, discontinuity,
      about("The value of sysUpTime when a counter of the interface last jumped")},
 };
 
 constexpr Column<StackRow> kStackColumns[] = {
     {"ifStackStatus", 3, Integer, stackStatus,
      about("The state of the row").oneOf(kIfStackStatus).as(Kind::Information)},
+};
+
+constexpr Column<ReceiveAddressRow> kAddressColumns[] = {
+    {"ifRcvAddressStatus", 2, Integer, addressStatus,
+     about("The state of the row").oneOf(kIfStackStatus).as(Kind::Information)},
+    {"ifRcvAddressType", 3, Integer, addressType,
+     about("Whether the address outlives a restart")
+         .oneOf(kIfRcvAddressType)
+         .as(Kind::Information)},
 };
 
 } // namespace
@@ -161,6 +195,12 @@ Table const& ifXTable() {
 Table const& ifStackTable() {
     static RowTable<StackRow, interfaceRows<&InterfaceRows::stack>> const table(
         "ifStackTable", {31, 1, 2, 1}, kStackColumns);
+    return table;
+}
+
+Table const& ifRcvAddressTable() {
+    static RowTable<ReceiveAddressRow, interfaceRows<&InterfaceRows::receiveAddresses>> const table(
+        "ifRcvAddressTable", {31, 1, 4, 1}, kAddressColumns);
     return table;
 }
 

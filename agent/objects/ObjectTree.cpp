@@ -122,11 +122,14 @@ SetFault ObjectTree::test(Facts const& facts, OidView name, Value const& asked,
 bool ObjectTree::fill(Instance& found, Node const& node, Facts const& facts, Value const& value) {
     found.value = value;
     found.type = node.type;
-    if (node.type == ValueType::TimeStamp) {
+    if (node.type == ValueType::TimeStamp || node.type == ValueType::BeginStamp) {
         found.type = ValueType::TimeTicks;
-        if (auto const* const ticks = std::get_if<std::int64_t>(&value))
-            found.value =
-                std::int64_t{facts.counters.sysUpTime(static_cast<std::uint32_t>(*ticks))};
+        if (auto const* const ticks = std::get_if<std::int64_t>(&value)) {
+            auto const since = static_cast<std::uint32_t>(*ticks);
+            found.value = std::int64_t{node.type == ValueType::BeginStamp
+                                           ? facts.counters.sysUpTimeSince(since)
+                                           : facts.counters.sysUpTime(since)};
+        }
     }
     return isKnown(value);
 }

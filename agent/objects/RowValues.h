@@ -21,6 +21,19 @@ Value textIfKnown(Row const& row) {
     return (row.*Field).empty() ? Value{} : Value{std::string_view(row.*Field)};
 }
 
+/// The low 32 bits of a row's counter, and all 64.
+template <auto Counter, class Row>
+Value count32(Row const& row) {
+    auto const& counter = row.counters[Counter];
+    return counter ? Value{std::int64_t{static_cast<std::uint32_t>(*counter)}} : Value{};
+}
+
+template <auto Counter, class Row>
+Value count64(Row const& row) {
+    auto const& counter = row.counters[Counter];
+    return counter ? Value{static_cast<std::int64_t>(*counter)} : Value{};
+}
+
 /// A number in an `std::optional`.
 template <auto Field, class Row>
 Value number(Row const& row) {

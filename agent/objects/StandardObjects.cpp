@@ -14,14 +14,14 @@ std::span<Scalar const> standardScalars() {
          about("The number of interfaces").in("interfaces").as(Kind::Gauge)},
         {"ifTableLastChange",
          {31, 1, 5},
-         ValueType::TimeStamp,
+         ValueType::BeginStamp,
          [](Facts const& facts) -> Value {
              return std::int64_t{facts.snapshot.interfaces.lastChange};
          },
          about("The value of sysUpTime when a row of ifTable was last added or removed")},
         {"ifStackLastChange",
          {31, 1, 6},
-         ValueType::TimeStamp,
+         ValueType::BeginStamp,
          [](Facts const& facts) -> Value {
              return std::int64_t{facts.snapshot.interfaces.stackLastChange};
          },
@@ -34,7 +34,7 @@ std::span<Scalar const> standardScalars() {
          about("The index for a new signalling channel; 0: none can be created")},
         {"entLastChangeTime",
          {47, 1, 4, 1},
-         ValueType::TimeStamp,
+         ValueType::BeginStamp,
          [](Facts const& facts) -> Value {
              return std::int64_t{facts.snapshot.entities.lastChange};
          },
@@ -47,6 +47,7 @@ std::vector<Table const*> standardTables() {
     return {&ifTable(),
             &ifXTable(),
             &ifStackTable(),
+            &ifRcvAddressTable(),
             &dsx1ConfigTable(),
             &dsx1CurrentTable(),
             &dsx1IntervalTable(),
@@ -58,6 +59,8 @@ std::vector<Table const*> standardTables() {
             &dsx0ConfigTable(),
             &dsx0ChanMappingTable(),
             &dot3StatsTable(),
+            &dot3PauseTable(),
+            &dot3HCStatsTable(),
             &entPhysicalTable(),
             &entAliasMappingTable(),
             &entPhysicalContainsTable(),

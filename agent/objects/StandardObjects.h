@@ -14,15 +14,18 @@ namespace kvloamd {
 inline Oid const kStandardArc{1, 3, 6, 1, 2, 1};
 
 /// The places that the agent takes over, relative, and no others below the arc.
-inline std::array<Place, 12> const kStandardPlaces{{
+inline std::array<Place, 15> const kStandardPlaces{{
     {{2, 1}, "ifNumber", HostHas::All},
     {{2, 2}, "ifTable", HostHas::Rows},
     {{10, 7, 2}, "dot3StatsTable", HostHas::Rows},
+    {{10, 7, 10}, "dot3PauseTable"},
+    {{10, 7, 11}, "dot3HCStatsTable"},
     {{10, 18}, "DS1-MIB"},
     {{10, 20}, "ISDN-MIB"},
     {{10, 81}, "DS0-MIB"},
     {{31, 1, 1}, "ifXTable", HostHas::Rows},
     {{31, 1, 2}, "ifStackTable"},
+    {{31, 1, 4}, "ifRcvAddressTable"},
     {{31, 1, 5}, "ifTableLastChange", HostHas::All},
     {{31, 1, 6}, "ifStackLastChange"},
     {{47, 1}, "ENTITY-MIB"},
@@ -34,6 +37,7 @@ std::span<Scalar const> standardScalars();
 Table const& ifTable();
 Table const& ifXTable();
 Table const& ifStackTable();
+Table const& ifRcvAddressTable();
 Table const& dsx1ConfigTable();
 Table const& dsx1CurrentTable();
 Table const& dsx1IntervalTable();
@@ -45,6 +49,8 @@ Table const& isdnSignalingTable();
 Table const& isdnSignalingStatsTable();
 Table const& isdnLapdTable();
 Table const& dot3StatsTable();
+Table const& dot3PauseTable();
+Table const& dot3HCStatsTable();
 Table const& entPhysicalTable();
 Table const& entAliasMappingTable();
 Table const& entPhysicalContainsTable();

@@ -19,10 +19,13 @@ enum class ValueType {
     Gauge,     ///< unsigned, 32 bits
     TimeTicks, ///< a duration in hundredths of a second
     TimeStamp, ///< sysUpTime at some event; described as a time since the agent's start
-    Text,      ///< printable characters
-    Octets,    ///< any
-    Date,      ///< 11 octets: date, time of day, offset from UTC
-    ObjectId,  ///< a place in the tree of names, absolute
+    /// The same for what began at the agent's start, which is described as 0. If sysUpTime began
+    /// earlier, as beside a master that ran before the agent, that start is an event too.
+    BeginStamp,
+    Text,     ///< printable characters
+    Octets,   ///< any
+    Date,     ///< 11 octets: date, time of day, offset from UTC
+    ObjectId, ///< a place in the tree of names, absolute
 };
 
 /// A name that is a value.

@@ -15,6 +15,7 @@
 #include "agent/rows/StandardNumbers.h"
 #include "board/DS1LineFeature.h"
 #include "board/DS1LineImpedance.h"
+#include "board/EthernetDetails.h"
 #include "board/EthernetFeature.h"
 #include "board/IPInterface.h"
 #include "board/ISDNChannelOnLine.h"
@@ -24,12 +25,6 @@
 namespace kvloamd {
 
 namespace {
-
-// Values of ifType.
-constexpr int kTypeLoopback = 24;
-constexpr int kTypeIsdn = 63;
-constexpr int kTypeLapd = 77;
-constexpr int kTypeDs0 = 81;
 
 /// The speed of a DS0, in bit/s.
 constexpr std::uint32_t kDs0Speed = 64000;
@@ -50,6 +45,12 @@ std::optional<int> bearerNumber(std::optional<int> timeSlot, bool signallingInsi
     int const number = *timeSlot - (signallingInside && *timeSlot > kSignallingSlotOfE1 ? 1 : 0);
     return legal(kBearerNumbers, number);
 }
+
+/// An address for which every Ethernet interface receives packets.
+constexpr char kBroadcastAddress[] = "\xff\xff\xff\xff\xff\xff";
+
+/// The most octets of a receive address; an Ethernet address has 6.
+constexpr std::size_t kLongestAddress = 32;
 
 /// The largest number of bearer channels that is believed of one signalling channel.
 constexpr int kMostBearers = 1024;
@@ -90,6 +91,13 @@ class Reading {
     std::uint32_t readLapd(ISDNDChannel& channel);
     std::uint32_t readBearer(ISDNBChannel& channel);
     bool isE1(std::uint32_t line) const;
+    void readEthernet(KVL::Ethernet& ethernet);
+    static void readDetails(KVL::EthernetDetails& details, InterfaceRow& interface,
+                            EthernetRow& row, std::set<std::string>& addresses);
+    /// Makes the row one of an IP interface, which may stand on an Ethernet interface of its board.
+    void placeIp(InterfaceRow& row);
+    /// The board's only Ethernet interface, or the only one with the address of `ip`; otherwise 0.
+    std::uint32_t ethernetBelow(InterfaceRow const& ip) const;
     void stack(std::uint32_t higher, std::uint32_t lower);
     /// The line that is called `name`, or whose circuit is; 0 when there is none.
     std::uint32_t findLine(std::string const& name) const;
@@ -210,8 +218,10 @@ Reading::Signalling Reading::readSignalling(ReferenceCounter<ISDNDChannel> handl
     interface.name = name;
     interface.type = kTypeIsdn;
     interface.connectorPresent = kFalse;
+    interface.speed = kDs0Speed;
+    interface.physAddress = row.callingAddress;
     if (auto const status = legal(kLapdStatuses, channel.GetOperStatus()))
-        interface.operStatus = status == ISDNDChannelStatusL2Active ? kUp : kDown;
+        interface.operStatus = status == ISDNDChannelStatusL2Active ? kUp : kDormant;
     readCounts(channel, row);
     Signalling found{std::move(handle), row.ifIndex, line};
     m_found.rows.signalling.push_back(std::move(row));
@@ -230,7 +240,7 @@ std::uint32_t Reading::readLapd(ISDNDChannel& channel) {
     interface.speed = kDs0Speed;
     row.operStatus = legal(kLapdStatuses, channel.GetOperStatus());
     if (row.operStatus)
-        interface.operStatus = row.operStatus == ISDNDChannelStatusL2Active ? kUp : kDown;
+        interface.operStatus = row.operStatus == ISDNDChannelStatusL2Active ? kUp : kDormant;
     readCounts(channel, row);
     m_found.rows.lapds.push_back(row);
     return row.ifIndex;
@@ -329,28 +339,60 @@ std::optional<std::uint32_t> Reading::ownLine(Object& channel) const {
 
 void Reading::readEthernets(KVL::EthernetFeature& feature) {
     for (auto handle = feature.GetFirstEthernet(); handle.get() != nullptr;
-         handle = feature.GetNextEthernet(handle)) {
-        KVL::Ethernet& ethernet = *handle.get();
-        InterfaceRow& interface = enterNameless(IndexKind::Ethernet);
-        readInterface(ethernet, interface);
-        interface.connectorPresent = interface.type == kTypeLoopback ? kFalse : kTrue;
-        m_found.rows.ports.push_back({interface.ifIndex, 0, m_found.keys.back()});
-        m_found.rows.ethernets.push_back({interface.ifIndex,
-                                          unsignedNumber(ethernet.GetAlignmentErrors()),
-                                          unsignedNumber(ethernet.GetFCSErrors()),
-                                          unsignedNumber(ethernet.GetSingleCollisionFrames()),
-                                          unsignedNumber(ethernet.GetMultipleCollisionFrames()),
-                                          unsignedNumber(ethernet.GetSQETestErrors()),
-                                          unsignedNumber(ethernet.GetDeferredTransmissions()),
-                                          unsignedNumber(ethernet.GetLateCollisions()),
-                                          unsignedNumber(ethernet.GetExcessiveCollisions()),
-                                          unsignedNumber(ethernet.GetInternalMacTransmitErrors()),
-                                          unsignedNumber(ethernet.GetCarrierSenseErrors()),
-                                          unsignedNumber(ethernet.GetFrameTooLongs()),
-                                          unsignedNumber(ethernet.GetInternalMacReceiveErrors()),
-                                          unsignedNumber(ethernet.GetSymbolErrors()),
-                                          unlessNegative(ethernet.GetDuplexStatus())});
+         handle = feature.GetNextEthernet(handle))
+        readEthernet(*handle.get());
+}
+
+void Reading::readEthernet(KVL::Ethernet& ethernet) {
+    InterfaceRow& interface = enterNameless(IndexKind::Ethernet);
+    readInterface(ethernet, interface);
+    interface.connectorPresent = interface.type == kTypeLoopback ? kFalse : kTrue;
+    m_found.rows.ports.push_back({interface.ifIndex, 0, m_found.keys.back()});
+    EthernetRow row;
+    row.ifIndex = interface.ifIndex;
+    row.speed = interface.speed;
+    row.counters = {unsignedNumber(ethernet.GetAlignmentErrors()),
+                    unsignedNumber(ethernet.GetFCSErrors()),
+                    unsignedNumber(ethernet.GetSingleCollisionFrames()),
+                    unsignedNumber(ethernet.GetMultipleCollisionFrames()),
+                    unsignedNumber(ethernet.GetSQETestErrors()),
+                    unsignedNumber(ethernet.GetDeferredTransmissions()),
+                    unsignedNumber(ethernet.GetLateCollisions()),
+                    unsignedNumber(ethernet.GetExcessiveCollisions()),
+                    unsignedNumber(ethernet.GetInternalMacTransmitErrors()),
+                    unsignedNumber(ethernet.GetCarrierSenseErrors()),
+                    unsignedNumber(ethernet.GetFrameTooLongs()),
+                    unsignedNumber(ethernet.GetInternalMacReceiveErrors()),
+                    unsignedNumber(ethernet.GetSymbolErrors())};
+    row.duplexStatus = unlessNegative(ethernet.GetDuplexStatus());
+    std::set<std::string> addresses;
+    if (auto* const details = dynamic_cast<KVL::EthernetDetails*>(&ethernet))
+        readDetails(*details, interface, row, addresses);
+    if (interface.type == kTypeEthernet && !interface.physAddress.empty()) {
+        addresses.insert({kBroadcastAddress, interface.physAddress});
+        for (std::string const& address : addresses)
+            m_found.rows.receiveAddresses.push_back(
+                {row.ifIndex, address, address == interface.physAddress});
     }
+    m_found.rows.ethernets.push_back(row);
+}
+
+void Reading::readDetails(KVL::EthernetDetails& details, InterfaceRow& interface, EthernetRow& row,
+                          std::set<std::string>& addresses) {
+    interface.highSpeed = unsignedNumber(details.GetHighSpeed());
+    interface.promiscuousMode = unlessNegative(details.GetPromiscuousMode());
+    interface.counters[kInMulticastPkts] = unsignedNumber(details.GetInMulticastPkts());
+    interface.counters[kInBroadcastPkts] = unsignedNumber(details.GetInBroadcastPkts());
+    interface.counters[kOutMulticastPkts] = unsignedNumber(details.GetOutMulticastPkts());
+    interface.counters[kOutBroadcastPkts] = unsignedNumber(details.GetOutBroadcastPkts());
+    row.counters[kInPauseFrames] = unsignedNumber(details.GetInPauseFrames());
+    row.counters[kOutPauseFrames] = unsignedNumber(details.GetOutPauseFrames());
+    row.pauseAdminMode = unlessNegative(details.GetPauseAdminMode());
+    row.pauseOperMode = unlessNegative(details.GetPauseOperMode());
+    std::vector<std::string> multicast;
+    if (details.GetMulticastAddresses(multicast) != 0) return;
+    for (std::string const& address : multicast)
+        if (!address.empty() && address.size() <= kLongestAddress) addresses.insert(address);
 }
 
 void Reading::readOthers(KVL::InterfaceFeature& feature) {
@@ -361,8 +403,33 @@ void Reading::readOthers(KVL::InterfaceFeature& feature) {
         bool const ip = dynamic_cast<KVL::IPInterface*>(handle.get()) != nullptr;
         InterfaceRow& row = enterNameless(ip ? IndexKind::Ip : IndexKind::Other);
         readInterface(*handle.get(), row);
-        if (ip) row.connectorPresent = kFalse;
+        if (ip) placeIp(row);
     }
+}
+
+void Reading::placeIp(InterfaceRow& row) {
+    row.type = kTypeVirtual;
+    row.connectorPresent = kFalse;
+    std::uint32_t const ethernet = ethernetBelow(row);
+    if (ethernet == 0) return;
+    stack(row.ifIndex, ethernet);
+    // They are the Ethernet interface's, and would count twice.
+    row.counters = {};
+    row.physAddress.clear();
+}
+
+std::uint32_t Reading::ethernetBelow(InterfaceRow const& ip) const {
+    auto const& ethernets = m_found.rows.ethernets;
+    std::uint32_t found = 0;
+    for (EthernetRow const& ethernet : ethernets) {
+        InterfaceRow const& interface = m_found.rows.interfaces[ethernet.ifIndex - 1];
+        if (ethernets.size() > 1 &&
+            (ip.physAddress.empty() || interface.physAddress != ip.physAddress))
+            continue;
+        if (found != 0) return 0;
+        found = ethernet.ifIndex;
+    }
+    return found;
 }
 
 } // namespace

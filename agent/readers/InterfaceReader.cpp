@@ -2,6 +2,7 @@
 #include "agent/readers/InterfaceReader.h"
 
 #include <algorithm>
+#include <array>
 #include <functional>
 #include <iterator>
 #include <set>
@@ -10,7 +11,9 @@
 #include "agent/readers/BoardFaults.h"
 #include "agent/readers/BoardKeys.h"
 #include "agent/readers/Courtesy.h"
-#include "agent/rows/StandardNumbers.h"
+#include "agent/readers/InterfaceNames.h"
+#include "agent/readers/InterfaceStates.h"
+#include "agent/readers/LongCounters.h"
 
 namespace kvloamd {
 
@@ -42,13 +45,31 @@ void completeStack(InterfaceRows& all) {
     }
     for (InterfaceRow const& row : all.interfaces)
         if (!lower.contains(row.ifIndex)) all.stack.push_back({0, row.ifIndex});
-    for (InterfaceRow& row : all.interfaces) {
-        bool const stacked = higher.contains(row.ifIndex);
-        if (!stacked) all.stack.push_back({row.ifIndex, 0});
-        // A broken line causes one notification, not another one for each of its channels.
-        row.linkUpDownTraps = stacked ? kDisabled : kEnabled;
-    }
+    for (InterfaceRow const& row : all.interfaces)
+        if (!higher.contains(row.ifIndex)) all.stack.push_back({row.ifIndex, 0});
     sortBy(all.stack);
+}
+
+/// What to call each board in the names of its interfaces, by its index.
+std::unordered_map<std::uint32_t, std::string> boardNames(std::vector<BoardRow> const& boards,
+                                                          std::vector<BoardKey> const& keys) {
+    std::unordered_map<std::uint32_t, std::string> names;
+    for (std::size_t i = 0; i < boards.size(); ++i) {
+        std::uint32_t const index = boards[i].boardIndex;
+        names.emplace(index, keys[i].stable ? keys[i].name : std::to_string(index));
+    }
+    return names;
+}
+
+/// How long after an interface has changed this may become certain, in hundredths of a second.
+constexpr std::uint32_t kLongestDoubt = 6000;
+
+/// Of every counter of an interface.
+std::array<std::uint64_t, kInterfaceCounters> interfaceLimits(CountLimits const& limits) {
+    std::array<std::uint64_t, kInterfaceCounters> all{};
+    all.fill(limits.others);
+    all[kInOctets] = all[kOutOctets] = limits.octets;
+    return all;
 }
 
 } // namespace
@@ -68,6 +89,7 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     m_histories.begin(Clock::now());
     ToTicks const toTicks = [this](long seconds) { return m_uptime.of(seconds); };
     std::vector<BoardKey> const keys = boardKeys(boards);
+    auto const names = boardNames(boards, keys);
     for (std::size_t i = 0; i < boards.size(); ++i) {
         std::uint32_t const boardIndex = boards[i].boardIndex;
         auto const board = m_manager.GetBoardByIndex(static_cast<int>(boardIndex));
@@ -75,6 +97,9 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
         if (asked == nullptr) continue;
         readGuarded(boardIndex, "interfaces", [&] {
             BoardInterfaces found = readInterfaces(*asked, toTicks, m_histories);
+            for (InterfaceRow& row : found.rows.interfaces)
+                completeName(row, found.keys[row.ifIndex - 1], names.at(boardIndex));
+            completeStates(found.rows);
             auto const indices = m_indices.indicesOf(keys[i], found.keys);
             append(all, std::move(found), indices, boardIndex);
         });
@@ -97,7 +122,9 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     sortBy(all.signalling, &SignallingRow::ifIndex);
     sortBy(all.lapds, &LapdRow::ifIndex);
     sortBy(all.ethernets, &EthernetRow::ifIndex);
+    sortBy(all.receiveAddresses, [](auto const& row) { return row.index(); });
     sortBy(all.ports, &PortRow::ifIndex);
+    distinguishNames(all.interfaces, names);
     completeStack(all);
     std::size_t before = 0;
     for (LineRow& line : all.lines) {
@@ -111,11 +138,18 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
 
 void InterfaceReader::append(InterfaceRows& all, BoardInterfaces&& board,
                              std::vector<std::uint32_t> const& indices, std::uint32_t boardIndex) {
-    auto const begin = std::ssize(all.interfaces);
-    moveRows(all.interfaces, board.rows.interfaces, indices);
-    std::for_each(all.interfaces.begin() + begin, all.interfaces.end(),
-                  [&](InterfaceRow& row) { countOn(row, boardIndex); });
     Clock::time_point const now = Clock::now();
+    std::unordered_map<std::uint32_t, EthernetRow*> ethernets;
+    for (EthernetRow& row : board.rows.ethernets)
+        ethernets.emplace(row.ifIndex, &row);
+    for (InterfaceRow& row : board.rows.interfaces) {
+        auto const ethernet = ethernets.find(row.ifIndex);
+        std::uint32_t const index = indices[row.ifIndex - 1];
+        row.boardIndex = boardIndex;
+        if (index != 0)
+            countOn(row, index, ethernet == ethernets.end() ? nullptr : ethernet->second, now);
+    }
+    moveRows(all.interfaces, board.rows.interfaces, indices);
     for (std::size_t i = 0; i < board.lines.size(); ++i) {
         auto const index = indices[board.rows.lines[i].ifIndex - 1];
         if (index == 0) continue;
@@ -130,6 +164,7 @@ void InterfaceReader::append(InterfaceRows& all, BoardInterfaces&& board,
     moveRows(all.signalling, board.rows.signalling, indices);
     moveRows(all.lapds, board.rows.lapds, indices);
     moveRows(all.ethernets, board.rows.ethernets, indices);
+    moveRows(all.receiveAddresses, board.rows.receiveAddresses, indices);
     for (PortRow& port : board.rows.ports)
         port.boardIndex = boardIndex;
     moveRows(all.ports, board.rows.ports, indices);
@@ -143,35 +178,49 @@ void InterfaceReader::append(InterfaceRows& all, BoardInterfaces&& board,
     }
 }
 
-void InterfaceReader::countOn(InterfaceRow& row, std::uint32_t boardIndex) {
-    auto const [place, isNew] = m_counted.try_emplace(row.ifIndex);
+void InterfaceReader::countOn(InterfaceRow& row, std::uint32_t ifIndex, EthernetRow* ethernet,
+                              Clock::time_point now) {
+    auto const [place, isNew] = m_counted.try_emplace(ifIndex);
     Counted& counted = place->second;
-    if (isNew || counted.boardIndex != boardIndex)
-        counted = {boardIndex,     m_read ? m_uptime.now() : 0,
-                   row.counters,   row.operStatus,
-                   row.lastChange, m_reading};
-    counted.reading = m_reading;
-    noteOperStatus(row, counted);
-    for (std::size_t i = 0; i < row.counters.size(); ++i) {
-        if (!row.counters[i]) continue;
-        if (!counted.counters[i]) {
-            counted.counters[i] = row.counters[i];
-            continue;
-        }
-        std::uint64_t& total = *counted.counters[i];
-        total += static_cast<std::uint32_t>(*row.counters[i] - total);
-        row.counters[i] = total;
+    std::uint32_t const ticks = m_read ? m_uptime.at(now) : 0;
+    if (isNew || counted.boardIndex != row.boardIndex) {
+        counted = {};
+        counted.boardIndex = row.boardIndex;
+        counted.since = ticks;
+        counted.operStatus = row.operStatus;
+        counted.lastChange = row.lastChange.value_or(ticks);
     }
+    noteOperStatus(row, counted, now);
+    CountLimits const limits = countLimits(row.speed, now - counted.readAt);
+    auto const limitsOfRow = interfaceLimits(limits);
+    std::array<std::uint64_t, kEthernetCounters> limitsOfEthernet{};
+    limitsOfEthernet.fill(limits.others);
+    if (hasRestarted(counted.counters, row.counters, limitsOfRow) ||
+        (ethernet != nullptr &&
+         hasRestarted(counted.ethernet, ethernet->counters, limitsOfEthernet))) {
+        // Whatever began one of them again has probably begun all of them again.
+        counted.counters = {};
+        counted.ethernet = {};
+        counted.since = ticks;
+    }
+    kvloamd::countOn(counted.counters, row.counters);
+    if (ethernet != nullptr) kvloamd::countOn(counted.ethernet, ethernet->counters);
+    counted.reading = m_reading;
+    counted.readAt = now;
     row.discontinuity = counted.since;
-    row.boardIndex = boardIndex;
 }
 
-void InterfaceReader::noteOperStatus(InterfaceRow& row, Counted& counted) const {
+void InterfaceReader::noteOperStatus(InterfaceRow& row, Counted& counted,
+                                     Clock::time_point now) const {
     if (counted.operStatus != row.operStatus) {
         counted.operStatus = row.operStatus;
-        counted.lastChange = m_uptime.now();
+        std::uint32_t const seen = m_uptime.at(now);
+        // That a line is unavailable, or available again, is certain some seconds later only.
+        bool const isSaid = row.lastChange && *row.lastChange > counted.lastChange &&
+                            *row.lastChange <= seen && seen - *row.lastChange <= kLongestDoubt;
+        counted.lastChange = isSaid ? *row.lastChange : seen;
     }
-    if (row.lastChange) row.lastChange = counted.lastChange;
+    row.lastChange = counted.lastChange;
 }
 
 void InterfaceReader::noteChanges(InterfaceRows& all) {

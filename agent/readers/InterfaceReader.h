@@ -22,8 +22,9 @@ namespace kvloamd {
 /// An `InterfaceReader` gives interfaces their indices, extends their counters beyond 32 bits, and
 /// notes when interfaces appear and disappear. Thread-bound: the collector.
 ///
-/// A counter must be read at least once in 2^32 counts. Counts that are lost because it was not, or
-/// because a board has begun again at 0, cannot be recovered.
+/// A counter must be read at least once in 2^32 counts. A counter that has fallen further than it
+/// can have wrapped has begun again at 0: so do its 64 bits, and the interface's counters have a
+/// discontinuity.
 class InterfaceReader {
   public:
     /// `manager` and `indices` outlive the reader. `started`: the agent's start.
@@ -38,23 +39,25 @@ class InterfaceReader {
     ChangeTimes& changeTimes() { return m_changeTimes; }
 
   private:
-    using Counters = decltype(InterfaceRow::counters);
-
     /// How far an interface's counters have come.
     struct Counted {
-        std::uint32_t boardIndex; ///< a board that comes back has another
-        std::uint32_t since;
-        Counters counters;
+        std::uint32_t boardIndex = 0; ///< a board that comes back has another
+        std::uint32_t since = 0;
+        decltype(InterfaceRow::counters) counters;
+        decltype(EthernetRow::counters) ethernet;
         std::optional<int> operStatus;
-        std::optional<std::uint32_t> lastChange; ///< of `operStatus`
-        std::uint64_t reading;                   ///< the last that found the interface
+        std::uint32_t lastChange = 0; ///< of `operStatus`
+        std::uint64_t reading = 0;    ///< the last that found the interface
+        Clock::time_point readAt;
     };
 
     void append(InterfaceRows& all, BoardInterfaces&& board,
                 std::vector<std::uint32_t> const& indices, std::uint32_t boardIndex);
-    void countOn(InterfaceRow& row, std::uint32_t boardIndex);
+    /// Extends the counters of the interface that gets `ifIndex`. `ethernet`: null if it is none.
+    void countOn(InterfaceRow& row, std::uint32_t ifIndex, EthernetRow* ethernet,
+                 Clock::time_point now);
     /// Says when the row's ifOperStatus changed, whatever else of the interface has changed.
-    void noteOperStatus(InterfaceRow& row, Counted& counted) const;
+    void noteOperStatus(InterfaceRow& row, Counted& counted, Clock::time_point now) const;
     void noteChanges(InterfaceRows& all);
 
     BoardManager& m_manager;

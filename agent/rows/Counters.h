@@ -44,6 +44,13 @@ struct Counters {
         return static_cast<std::uint32_t>(std::max(ticks + sysUpTimeLead, std::int64_t{0}));
     }
 
+    /// The same, but 0 is the agent's start, which is later than sysUpTime's beside a master that
+    /// ran before.
+    std::uint32_t sysUpTimeSince(std::uint32_t ticks) const {
+        if (ticks > 0 || master == Master::None) return sysUpTime(ticks);
+        return static_cast<std::uint32_t>(std::max(sysUpTimeLead.load(), std::int64_t{0}));
+    }
+
     static constexpr std::int64_t kSwing = 10;
 };
 

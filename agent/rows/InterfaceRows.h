@@ -24,7 +24,23 @@ enum InterfaceStatus : int {
     kLowerLayerDown = 7
 };
 
-/// The counters of an interface, in the order of IF-MIB's ifTable.
+/// Whether a link in this state is down for linkDown and linkUp.
+constexpr bool isDown(int operStatus) {
+    return operStatus == kDown || operStatus == kLowerLayerDown;
+}
+
+/// Values of ifType.
+enum InterfaceType : int {
+    kTypeEthernet = 6,
+    kTypeDs1 = 18,
+    kTypeLoopback = 24,
+    kTypeVirtual = 53, ///< propVirtual
+    kTypeIsdn = 63,
+    kTypeLapd = 77,
+    kTypeDs0 = 81
+};
+
+/// The counters of an interface, in the order of IF-MIB's ifTable and ifXTable.
 enum InterfaceCounter : std::size_t {
     kInOctets,
     kInUcastPkts,
@@ -35,8 +51,19 @@ enum InterfaceCounter : std::size_t {
     kOutUcastPkts,
     kOutDiscards,
     kOutErrors,
+    kInMulticastPkts,
+    kInBroadcastPkts,
+    kOutMulticastPkts,
+    kOutBroadcastPkts,
     kInterfaceCounters ///< how many
 };
+
+/// The low 32 bits are the interface's own; the rest counts how often they have wrapped.
+template <std::size_t Counters>
+using LongCounts = std::array<std::optional<std::uint64_t>, Counters>;
+
+/// What ifSpeed is for an interface that is as fast or faster.
+inline constexpr std::uint32_t kMostSpeed = 0xffffffff;
 
 /// Texts are empty and numbers none when they are not known. Every kind of interface has a row of
 /// this one; what only its kind has is in another, of the same index.
@@ -47,16 +74,17 @@ struct InterfaceRow {
     std::string name;
     std::optional<int> type;
     std::optional<int> mtu;
-    std::optional<std::uint32_t> speed; ///< bit/s
+    std::optional<std::uint32_t> speed;     ///< bit/s; `kMostSpeed`: that or more
+    std::optional<std::uint32_t> highSpeed; ///< Mbit/s, if it is not the rounded `speed`
     std::string physAddress;
     std::optional<int> adminStatus;
     std::optional<int> operStatus;
     std::optional<std::uint32_t> lastChange; ///< hundredths of a second since the agent's start
-    /// The low 32 bits are the interface's own; the rest counts how often they have wrapped.
-    std::array<std::optional<std::uint64_t>, kInterfaceCounters> counters;
+    LongCounts<kInterfaceCounters> counters;
     /// Since when the counters have counted on, as `lastChange`; 0: since the agent's start.
     std::uint32_t discontinuity = 0;
-    std::optional<int> connectorPresent; ///< 1: yes, 2: no
+    std::optional<int> promiscuousMode;  ///< 1: yes, 2: no
+    std::optional<int> connectorPresent; ///< the same
     /// The default of ifLinkUpDownTrapEnable: 1 enabled, 2 disabled.
     int linkUpDownTraps = 1;
     // Whose it is, known when the entities are.
@@ -177,24 +205,50 @@ struct LapdRow {
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
 };
 
+/// The counters of an Ethernet interface, in the order of EtherLike-MIB's dot3StatsTable.
+enum EthernetCounter : std::size_t {
+    kAlignmentErrors,
+    kFcsErrors,
+    kSingleCollisionFrames,
+    kMultipleCollisionFrames,
+    kSqeTestErrors,
+    kDeferredTransmissions,
+    kLateCollisions,
+    kExcessiveCollisions,
+    kInternalMacTransmitErrors,
+    kCarrierSenseErrors,
+    kFrameTooLongs,
+    kInternalMacReceiveErrors,
+    kSymbolErrors,
+    kInPauseFrames,
+    kOutPauseFrames,
+    kEthernetCounters ///< how many
+};
+
 struct EthernetRow {
     std::uint32_t ifIndex = 0;
-    std::optional<std::uint32_t> alignmentErrors;
-    std::optional<std::uint32_t> fcsErrors;
-    std::optional<std::uint32_t> singleCollisionFrames;
-    std::optional<std::uint32_t> multipleCollisionFrames;
-    std::optional<std::uint32_t> sqeTestErrors;
-    std::optional<std::uint32_t> deferredTransmissions;
-    std::optional<std::uint32_t> lateCollisions;
-    std::optional<std::uint32_t> excessiveCollisions;
-    std::optional<std::uint32_t> internalMacTransmitErrors;
-    std::optional<std::uint32_t> carrierSenseErrors;
-    std::optional<std::uint32_t> frameTooLongs;
-    std::optional<std::uint32_t> internalMacReceiveErrors;
-    std::optional<std::uint32_t> symbolErrors;
+    LongCounts<kEthernetCounters> counters;
     std::optional<int> duplexStatus;
+    std::optional<int> pauseAdminMode;
+    std::optional<int> pauseOperMode;
+    std::optional<std::uint32_t> speed; ///< of its interface
 
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
+};
+
+/// An address for which an interface receives packets.
+struct ReceiveAddressRow {
+    std::uint32_t ifIndex = 0;
+    std::string address; ///< its octets
+    bool isOwn = false;  ///< the interface's own, which it always has
+
+    /// A text in an index begins with its length.
+    std::vector<std::uint32_t> index() const {
+        std::vector<std::uint32_t> name{ifIndex, static_cast<std::uint32_t>(address.size())};
+        for (char const octet : address)
+            name.push_back(static_cast<unsigned char>(octet));
+        return name;
+    }
 };
 
 /// A line or an Ethernet interface: where a board has a cable.
@@ -214,6 +268,7 @@ struct InterfaceRows {
     std::vector<SignallingRow> signalling;
     std::vector<LapdRow> lapds;
     std::vector<EthernetRow> ethernets;
+    std::vector<ReceiveAddressRow> receiveAddresses;
     std::vector<PortRow> ports;
     // When interfaces last came or went: hundredths of a second since the agent's start.
     std::uint32_t lastChange = 0;

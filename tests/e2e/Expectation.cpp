@@ -20,15 +20,16 @@ constexpr int kRepetitions = 20;
 constexpr std::uint32_t kFirstOwnIndex = 1000;
 
 /// What an agent serves, in ascending order.
-std::array<Oid, 9> const kPlaces{{{1, 3, 6, 1, 2, 1, 2},
-                                  {1, 3, 6, 1, 2, 1, 10, 7, 2},
-                                  {1, 3, 6, 1, 2, 1, 10, 18},
-                                  {1, 3, 6, 1, 2, 1, 10, 20},
-                                  {1, 3, 6, 1, 2, 1, 10, 81},
-                                  {1, 3, 6, 1, 2, 1, 31, 1},
-                                  {1, 3, 6, 1, 2, 1, 47, 1},
-                                  {1, 3, 6, 1, 2, 1, 131, 1},
-                                  {1, 3, 6, 1, 4, 1, 32473, 1, 1}}};
+std::array<Oid, 10> const kPlaces{{{1, 3, 6, 1, 2, 1, 2},
+                                   {1, 3, 6, 1, 2, 1, 10, 7, 2},
+                                   {1, 3, 6, 1, 2, 1, 10, 7, 11},
+                                   {1, 3, 6, 1, 2, 1, 10, 18},
+                                   {1, 3, 6, 1, 2, 1, 10, 20},
+                                   {1, 3, 6, 1, 2, 1, 10, 81},
+                                   {1, 3, 6, 1, 2, 1, 31, 1},
+                                   {1, 3, 6, 1, 2, 1, 47, 1},
+                                   {1, 3, 6, 1, 2, 1, 131, 1},
+                                   {1, 3, 6, 1, 4, 1, 32473, 1, 1}}};
 
 /// The tables in which a master has rows of its own. The last number of a name is an ifIndex.
 std::array<Oid, 3> const kSharedTables{

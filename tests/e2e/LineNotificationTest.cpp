@@ -1,5 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // Lines and links that change, as a notification receiver prints them.
+#include <cstdio>
+
 #include <gmock/gmock.h>
 
 #include "tests/e2e/AgentFixture.h"
@@ -132,6 +134,35 @@ TEST_F(LineNotificationTest, LinkIsToldDownAndUp) {
     expectLinkTold(4, "1000", 1);
 }
 
+TEST_F(LineNotificationTest, LinkIsToldWithTheTimeOfTheFirstUnavailableSecond) {
+    startWithReceiver("rwcommunity");
+    set(kLineTraps, "1");
+    // What began before the agent is at 0.
+    ASSERT_TRUE(eventually([this] {
+        int hundredths = 0;
+        std::sscanf(get("1.3.6.1.2.1.1.3.0").c_str(), "Timeticks: (%d)", &hundredths);
+        return hundredths > 500;
+    }));
+    cut();
+    expectLineTold(kCut);
+    expectLinkTold(3, "1000", 2);
+    // The signal was lost at least two seconds before this was a failure.
+    std::string const output = trapReceiver().output();
+    auto const hundredths = [&](std::size_t before) {
+        std::size_t const at = output.rfind("mib-2.1.3.0 = 0:0:", before);
+        int minutes = 0;
+        double seconds = 0;
+        EXPECT_EQ(std::sscanf(output.c_str() + at, "mib-2.1.3.0 = 0:0:%d:%lf", &minutes, &seconds),
+                  2);
+        return static_cast<long>((minutes * 60 + seconds) * 100 + 0.5);
+    };
+    long const link = hundredths(output.find(kAnyLinkDown));
+    long const line = hundredths(output.find(kAnyLine));
+    EXPECT_GE(line - link, 100);
+    std::string const lastChange = get("1.3.6.1.2.1.2.2.1.9.1000");
+    EXPECT_THAT(lastChange, HasSubstr("(" + std::to_string(link) + ")"));
+}
+
 TEST_F(LineNotificationTest, LinkForWhichItIsDisabledIsNotTold) {
     startWithReceiver("rwcommunity");
     set(kLineTraps, "1");
@@ -148,10 +179,17 @@ TEST_F(LineNotificationTest, ChannelIsToldWhenItIsEnabled) {
     std::string const channel = indexOf("D1");
     ASSERT_NE(channel, "none");
     sim({"call", "signalling", "301", "l2"});
-    ASSERT_TRUE(eventually([&] { return get("1.3.6.1.2.1.2.2.1.8." + channel) == "INTEGER: 1"; }));
+    std::string const state = "1.3.6.1.2.1.2.2.1.8." + channel;
+    ASSERT_TRUE(eventually([&] { return get(state) == "INTEGER: 1"; }));
     set("1.3.6.1.2.1.31.1.1.1.14." + channel, "1");
+    // A signalling channel that is not activated waits, which is not down.
     sim({"call", "signalling", "301", "l1"});
-    expectLinkTold(3, channel, 2);
+    ASSERT_TRUE(eventually([&] { return get(state) == "INTEGER: 5"; }));
+    sim({"line", "alarm", "301", "los"});
+    expectLinkTold(3, channel, 7);
+    EXPECT_EQ(get(state), "INTEGER: 7");
+    sim({"line", "mend", "301"});
+    expectLinkTold(4, channel, 5);
 }
 
 TEST_F(LineNotificationTest, TablesShowTheChangeWhenItsNotificationArrives) {

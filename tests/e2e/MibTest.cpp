@@ -57,6 +57,7 @@ class MibTest : public AgentFixture {
         case ValueType::Gauge:
             return ::testing::AnyOf("Gauge32", "Unsigned32");
         case ValueType::TimeTicks:
+        case ValueType::BeginStamp:
         case ValueType::TimeStamp: // a textual convention of TimeTicks
             return ::testing::Eq("TimeTicks");
         case ValueType::ObjectId:

@@ -21,6 +21,10 @@ using ::testing::SizeIs;
 
 constexpr char kAll[] = "1.3.6.1.4.1.32473";
 constexpr char kProcesses[] = "1.3.6.1.4.1.32473.1.1.7";
+constexpr char kSysUpTime[] = "1.3.6.1.2.1.1.3.0";
+constexpr char kDiscontinuity[] = "1.3.6.1.2.1.31.1.1.1.19.1000";
+constexpr char kEntityChange[] = "1.3.6.1.2.1.47.1.4.1.0";
+constexpr char kStackChange[] = "1.3.6.1.2.1.31.1.6.0";
 constexpr char kSystemContact[] = "1.3.6.1.2.1.1.4.0";
 
 class SubagentTest : public MasterFixture {
@@ -106,6 +110,41 @@ TEST_F(SubagentTest, ObjectsOfTheMasterRemain) {
     start();
     EXPECT_THAT(get(kSystemContact), HasSubstr("the host's own"));
     EXPECT_THAT(walk("1.3.6.1.2.1.1"), Not(IsEmpty()));
+}
+
+TEST_F(SubagentTest, MasterListsOurModulesWhileWeAreThere) {
+    start();
+    auto const isListed = [this](std::string const& id) {
+        auto const rows = walk("1.3.6.1.2.1.1.9.1.2");
+        return std::ranges::find(rows, "OID: " + id, &Answer::value) != rows.end();
+    };
+    for (char const* const id : {".1.3.6.1.4.1.32473.1.3.1", ".1.3.6.1.4.1.32473.1",
+                                 ".1.3.6.1.2.1.10.18", ".1.3.6.1.2.1.131"})
+        EXPECT_TRUE(eventually([&] { return isListed(id); })) << id;
+    EXPECT_EQ(stopAgent(), 0);
+    EXPECT_TRUE(eventually([&] { return !isListed(".1.3.6.1.2.1.10.18"); }));
+}
+
+TEST_F(SubagentTest, WhatBeganWithTheAgentSaysSoOnTheMastersClock) {
+    start();
+    auto const ticks = [this](char const* name) {
+        std::string const value = get(name);
+        auto const open = value.find('(');
+        return open == std::string::npos ? -1 : std::stol(value.substr(open + 1));
+    };
+    EXPECT_EQ(stopAgent(), 0);
+    // The master has run for longer than the agent from now on.
+    ASSERT_TRUE(eventually([&] { return ticks(kSysUpTime) > 200; }));
+    long const before = ticks(kSysUpTime);
+    startSubagent();
+    ASSERT_TRUE(isConnected());
+    ASSERT_TRUE(eventually([&] { return ticks(kDiscontinuity) >= 0; }));
+    long const after = ticks(kSysUpTime);
+    for (char const* const name : {kDiscontinuity, kEntityChange, kStackChange}) {
+        // Its answer, when it opens the session, carries the master's time.
+        EXPECT_TRUE(eventually([&] { return ticks(name) >= before - 50; })) << ticks(name);
+        EXPECT_LE(ticks(name), after + 50) << name;
+    }
 }
 
 TEST_F(SubagentTest, ChangesOfBoardsShow) {

@@ -24,6 +24,7 @@ char const* typeName(ValueType type) {
     case ValueType::TimeTicks:
         return "TimeTicks";
     case ValueType::TimeStamp:
+    case ValueType::BeginStamp:
         return "TimeStamp";
     case ValueType::Text:
         return "Text";

@@ -45,6 +45,7 @@ std::uint16_t typeOf(ValueType type) {
         return kGauge;
     case ValueType::TimeTicks:
     case ValueType::TimeStamp:
+    case ValueType::BeginStamp:
         return kTimeTicks;
     case ValueType::Counter64:
         return kCounter64;

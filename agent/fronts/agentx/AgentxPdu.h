@@ -27,6 +27,7 @@ enum class AgentxKind : std::uint8_t {
     CleanupSet = 11,
     Notify = 12,
     Ping = 13,
+    AddAgentCaps = 16,
     Response = 18,
 };
 

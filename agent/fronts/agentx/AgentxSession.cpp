@@ -55,12 +55,13 @@ void writeRegion(AgentxWriter& packet, OidView name, std::optional<std::uint32_t
 } // namespace
 
 AgentxSession::AgentxSession(AgentxAddress address, std::vector<AgentxRoot> roots, SharedRows& rows,
-                             Answer answer, AgentxPace pace)
+                             Answer answer, AgentxPace pace, std::vector<Capability> capabilities)
     : m_address(std::move(address)),
       m_roots(std::move(roots)),
       m_rows(rows),
       m_answer(std::move(answer)),
       m_pace(pace),
+      m_capabilities(std::move(capabilities)),
       m_pause(pace.retry) {
     connectNow();
 }
@@ -215,11 +216,25 @@ void AgentxSession::takeRegistered(std::size_t root, AgentxFault fault) {
     }
     if (!m_awaited.empty()) return;
     m_stage = Stage::Serving;
+    addCapabilities();
     registerRows();
+}
+
+void AgentxSession::addCapabilities() {
+    // The master removes them with the session.
+    for (Capability const& capability : m_capabilities) {
+        if (m_stage != Stage::Serving) return;
+        AgentxWriter packet = request(AgentxKind::AddAgentCaps);
+        packet.name(capability.id);
+        packet.text(capability.description);
+        queue(packet.take());
+    }
 }
 
 void AgentxSession::send(Notification const& notification, Delivered delivered) {
     AgentxWriter packet = request(AgentxKind::Notify);
+    if (notification.sysUpTime)
+        packet.variable(kSysUpTime, ValueType::TimeTicks, std::int64_t{*notification.sysUpTime});
     packet.variable(kSnmpTrapOid, ValueType::ObjectId, NameView{notification.name});
     for (NotifiedObject const& object : notification.objects)
         packet.variable(object.name, object.type, object.view());
@@ -310,6 +325,13 @@ void AgentxSession::takeResponse(AgentxHeader const& header, std::string_view pa
     case AgentxKind::Register:
     case AgentxKind::Unregister:
         takeRegistered(root, fault);
+        break;
+    case AgentxKind::AddAgentCaps:
+        if (fault != AgentxFault::None) {
+            std::string const line =
+                "the SNMP master does not list the agent in sysORTable: " + nameOf(fault);
+            if (m_repeats.passes(line, Clock::now())) log(LogLevel::Warning, line);
+        }
         break;
     case AgentxKind::Notify:
         // The master would refuse a refused one again.

@@ -9,6 +9,7 @@
 #include <string_view>
 #include <vector>
 
+#include "agent/fronts/Capabilities.h"
 #include "agent/fronts/agentx/AgentxAddress.h"
 #include "agent/fronts/agentx/AgentxPdu.h"
 #include "agent/fronts/agentx/SharedRows.h"
@@ -50,10 +51,10 @@ class AgentxSession final : public NotificationSink {
     /// AgentxError.
     using Answer = std::function<std::string(AgentxHeader const&, std::string_view payload)>;
 
-    /// Registers `roots` and the cells of `rows`, and answers requests for them by `answer`. Begins
-    /// to connect. `rows` outlives the session.
+    /// Registers `roots` and the cells of `rows`, and answers requests for them by `answer`. Adds
+    /// `capabilities` to the master's sysORTable. Begins to connect. `rows` outlives the session.
     AgentxSession(AgentxAddress address, std::vector<AgentxRoot> roots, SharedRows& rows,
-                  Answer answer, AgentxPace pace = {});
+                  Answer answer, AgentxPace pace = {}, std::vector<Capability> capabilities = {});
     /// Closes the session, so that the master removes the agent's objects at once.
     ~AgentxSession() override;
     AgentxSession(AgentxSession const&) = delete;
@@ -108,6 +109,7 @@ class AgentxSession final : public NotificationSink {
     void expireRequests();
     void registerRoots();
     void takeRegistered(std::size_t root, AgentxFault fault);
+    void addCapabilities();
     AgentxWriter request(AgentxKind kind);
     void queue(std::string packet);
     void flush();
@@ -126,6 +128,7 @@ class AgentxSession final : public NotificationSink {
     SharedRows& m_rows;
     Answer m_answer;
     AgentxPace m_pace;
+    std::vector<Capability> m_capabilities;
 
     int m_socket = -1;
     Stage m_stage = Stage::Away;

@@ -22,13 +22,14 @@ void Subagent::serve(Served served) {
     updateRows();
     m_answers.emplace(served.trees, served.counters, std::move(served.takeSnapshot),
                       served.settings);
-    m_session.emplace(m_address, std::move(roots), *m_rows,
-                      [this](AgentxHeader const& header, std::string_view payload) {
-                          m_counters->master =
-                              m_session->isConnected() ? Master::Connected : Master::Lost;
-                          m_counters->masterLosses = m_session->timesLost();
-                          return m_answers->answer(header, payload);
-                      });
+    m_session.emplace(
+        m_address, std::move(roots), *m_rows,
+        [this](AgentxHeader const& header, std::string_view payload) {
+            m_counters->master = m_session->isConnected() ? Master::Connected : Master::Lost;
+            m_counters->masterLosses = m_session->timesLost();
+            return m_answers->answer(header, payload);
+        },
+        AgentxPace{}, std::move(served.capabilities));
     loop().add(*this);
 }
 

@@ -19,6 +19,7 @@
 #include <net-snmp/agent/net-snmp-agent-includes.h>
 #include <net-snmp/agent/mib_modules.h>
 #include <net-snmp/agent/agent_read_config.h>
+#include <net-snmp/agent/agent_sysORTable.h>
 // clang-format on
 
 namespace kvloamd {
@@ -49,6 +50,25 @@ void nameConfiguration(SnmpFiles const& files) {
     unsetenv("SNMPCONFPATH");
     netsnmp_ds_set_string(NETSNMP_DS_LIBRARY_ID, NETSNMP_DS_LIB_OPTIONALCONFIG,
                           files.configuration.c_str());
+}
+
+/// Carries out a directive of the library's configuration, which is not read yet.
+void configure(char const* token, std::string value) {
+    for (config_line* each = read_config_get_handlers(kAppName); each != nullptr; each = each->next)
+        if (std::strcmp(each->config_token, token) == 0) each->parse_line(token, value.data());
+}
+
+/// Sets what the library would otherwise say about itself. The configuration, which is read later,
+/// takes precedence.
+void describeSystem(SnmpFiles const& files) {
+    // sysServices: end-to-end (RFC 3418's layer 4) and applications (layer 7).
+    configure("sysservices", "72");
+    if (!files.systemDescription.empty()) configure("sysdescr", files.systemDescription);
+    if (files.systemObjectId.empty()) return;
+    std::string name;
+    for (std::uint32_t const part : files.systemObjectId)
+        name += "." + std::to_string(part);
+    configure("sysobjectid", name);
 }
 
 /// Saves engine ID, engine boots and users before the first request, so that no end of the process
@@ -90,6 +110,7 @@ std::vector<std::string> startSnmp(SnmpFiles const& files, Receivers& receivers)
     init_agent(kAppName);
     init_mib_modules();
     receivers.takeDirectives();
+    describeSystem(files);
     init_snmp(kAppName);
     started = true;
     keepEngineState(files);
@@ -112,6 +133,11 @@ std::string persistentDirectory(SnmpFiles const& files) {
     if (!files.persistentDirectory.empty()) return files.persistentDirectory;
     char const* const directory = get_persistent_directory();
     return directory == nullptr ? std::string() : std::string(directory);
+}
+
+void addCapability(Capability const& capability) {
+    std::vector<oid> id(capability.id.begin(), capability.id.end());
+    register_sysORTable(id.data(), id.size(), capability.description.c_str());
 }
 
 std::uint32_t snmpUpTime() {

@@ -6,6 +6,9 @@
 #include <string>
 #include <vector>
 
+#include "agent/fronts/Capabilities.h"
+#include "agent/rows/Oid.h"
+
 namespace kvloamd {
 
 class Receivers;
@@ -14,6 +17,9 @@ class Receivers;
 struct SnmpFiles {
     std::string configuration;       ///< empty: in the directories in which the library looks
     std::string persistentDirectory; ///< empty: the library's default
+    // Of the system group, unless the configuration sets them; empty: the library's default.
+    std::string systemDescription;
+    Oid systemObjectId;
 };
 
 /// Starts the library and reads the configuration that `files` name. Returns the configuration's
@@ -28,6 +34,9 @@ std::vector<std::string> readSnmpConfigAgain();
 
 /// The directory of the state that is kept across restarts. Valid after `startSnmp`.
 std::string persistentDirectory(SnmpFiles const& files);
+
+/// Enters a row in sysORTable. After `startSnmp`.
+void addCapability(Capability const& capability);
 
 /// The library's sysUpTime. After `startSnmp`.
 std::uint32_t snmpUpTime();

@@ -32,6 +32,9 @@ void SnmpNotifications::sendStart() {
 
 void SnmpNotifications::send(Notification const& notification, Delivered delivered) {
     netsnmp_variable_list* variables = nullptr;
+    if (notification.sysUpTime)
+        addVariable(variables, kSysUpTime, ValueType::TimeTicks,
+                    std::int64_t{*notification.sysUpTime});
     addVariable(variables, kSnmpTrapOid, ValueType::ObjectId, NameView{notification.name});
     for (NotifiedObject const& object : notification.objects)
         addVariable(variables, object.name, object.type, object.view());

@@ -23,6 +23,7 @@ unsigned char asnTypeOf(ValueType type) {
         return ASN_GAUGE;
     case ValueType::TimeTicks:
     case ValueType::TimeStamp:
+    case ValueType::BeginStamp:
         return ASN_TIMETICKS;
     case ValueType::ObjectId:
         return ASN_OBJECT_ID;

@@ -37,6 +37,8 @@ void StandAlone::serve(Served served) {
                                          "objects; check --enterprise-oid");
     }
     restrictWriters(m_trees);
+    for (Capability const& capability : served.capabilities)
+        addCapability(capability);
     m_sessions.addTo(loop());
     loop().add(m_library);
     loop().add(m_receivers);

@@ -33,7 +33,7 @@ class LinkWatchTest : public ::testing::Test {
     }
     /// The notifications of an interface that changes from one state to another.
     std::string toldOf(std::optional<int> former, std::optional<int> now) {
-        LinkWatch watch(m_settings, m_queue);
+        LinkWatch watch(m_settings, m_queue, m_counters);
         watch.update({interface(7, former)}, Clock::now());
         watch.update({interface(7, now)}, Clock::now());
         return told();
@@ -42,7 +42,7 @@ class LinkWatchTest : public ::testing::Test {
     Settings m_settings;
     Counters m_counters;
     NotificationQueue m_queue{m_counters};
-    LinkWatch m_watch{m_settings, m_queue};
+    LinkWatch m_watch{m_settings, m_queue, m_counters};
 };
 
 TEST_F(LinkWatchTest, FirstSnapshotTellsNothing) {
@@ -51,23 +51,41 @@ TEST_F(LinkWatchTest, FirstSnapshotTellsNothing) {
 }
 
 TEST_F(LinkWatchTest, LinkThatBecomesDownIsTold) {
-    for (int const former : {kUp, kTesting, kUnknownStatus, kDormant, kLowerLayerDown})
-        EXPECT_EQ(toldOf(former, kDown), "down 7 ") << former;
+    for (int const down : {kDown, kLowerLayerDown})
+        for (int const former : {kUp, kTesting, kUnknownStatus, kDormant})
+            EXPECT_EQ(toldOf(former, down), "down 7 ") << former << " " << down;
 }
 
 TEST_F(LinkWatchTest, LinkThatIsDownNoLongerIsTold) {
-    for (int const now : {kUp, kTesting, kUnknownStatus, kDormant, kLowerLayerDown})
-        EXPECT_EQ(toldOf(kDown, now), "up 7 ") << now;
+    for (int const down : {kDown, kLowerLayerDown})
+        for (int const now : {kUp, kTesting, kUnknownStatus, kDormant})
+            EXPECT_EQ(toldOf(down, now), "up 7 ") << down << " " << now;
 }
 
 TEST_F(LinkWatchTest, LinkThatIsNotPresentBeforeOrAfterIsNotTold) {
-    EXPECT_EQ(toldOf(kNotPresent, kDown), "");
-    EXPECT_EQ(toldOf(kDown, kNotPresent), "");
+    for (int const other : {kUp, kDown, kDormant, kLowerLayerDown}) {
+        EXPECT_EQ(toldOf(kNotPresent, other), "") << other;
+        EXPECT_EQ(toldOf(other, kNotPresent), "") << other;
+    }
 }
 
 TEST_F(LinkWatchTest, ChangeBetweenStatesThatAreNotDownIsNotTold) {
     EXPECT_EQ(toldOf(kDormant, kUp), "");
-    EXPECT_EQ(toldOf(kUp, kLowerLayerDown), "");
+    EXPECT_EQ(toldOf(kUp, kTesting), "");
+}
+
+TEST_F(LinkWatchTest, LinkThatIsDownForAnotherReasonIsNotToldAgain) {
+    EXPECT_EQ(toldOf(kDown, kLowerLayerDown), "");
+    EXPECT_EQ(toldOf(kLowerLayerDown, kDown), "");
+}
+
+TEST_F(LinkWatchTest, LinkDownCarriesTheStateThatAGetAnswers) {
+    note({interface(7, kUp)});
+    note({interface(7, kLowerLayerDown)});
+    auto const told = m_queue.pop();
+    ASSERT_TRUE(told);
+    EXPECT_EQ(told->name.back(), 3U); // linkDown
+    EXPECT_EQ(std::get<std::int64_t>(told->objects.at(2).value), kLowerLayerDown);
 }
 
 TEST_F(LinkWatchTest, LinkThatStaysIsNotToldAgain) {
@@ -148,9 +166,35 @@ TEST_F(LinkWatchTest, InterfaceThatNobodyCanTakeDownIsToldAsWantedUp) {
     EXPECT_EQ(std::get<std::int64_t>(told->objects.at(1).value), kUp);
 }
 
+TEST_F(LinkWatchTest, LineIsToldWithTheTimeAtWhichItBecameUnavailable) {
+    m_counters.started = Clock::now();
+    m_counters.setSysUpTime(5000, m_counters.started);
+    InterfaceRow up = interface(7, kUp);
+    InterfaceRow down = interface(7, kDown);
+    up.type = down.type = kTypeDs1;
+    up.lastChange = 0;
+    down.lastChange = 300;
+    note({up});
+    note({down});
+    auto const told = m_queue.pop();
+    ASSERT_TRUE(told);
+    EXPECT_EQ(told->sysUpTime, 5300U);
+}
+
+TEST_F(LinkWatchTest, OtherInterfacesAreToldWithTheTimeAtWhichTheyAreTold) {
+    InterfaceRow down = interface(7, kDown);
+    down.type = kTypeEthernet;
+    down.lastChange = 300;
+    note({interface(7, kUp)});
+    note({down});
+    auto const told = m_queue.pop();
+    ASSERT_TRUE(told);
+    EXPECT_EQ(told->sysUpTime, std::nullopt);
+}
+
 TEST_F(LinkWatchTest, ChangesBeyondTheQueueAreCounted) {
     NotificationQueue queue(m_counters, 1);
-    LinkWatch watch(m_settings, queue);
+    LinkWatch watch(m_settings, queue, m_counters);
     watch.update({interface(7, kUp), interface(8, kUp)}, Clock::now());
     watch.update({interface(7, kDown), interface(8, kDown)}, Clock::now());
     EXPECT_EQ(queue.size(), 1U);

@@ -99,13 +99,114 @@ TEST_F(StandardTablesTest, Ds0IsFoundByLineAndTimeSlot) {
 
 TEST_F(StandardTablesTest, HighSpeedIsRounded) {
     for (auto const& [speed, rounded] :
-         {std::pair{64000U, 0}, {1544000U, 2}, {1499999U, 1}, {4294967295U, 4295}}) {
+         {std::pair{64000U, 0}, {1544000U, 2}, {1499999U, 1}, {4294967294U, 4295}}) {
         InterfaceRow row;
         row.ifIndex = 7;
         row.speed = speed;
         m_snapshot.interfaces.interfaces = {row};
         EXPECT_EQ(numberAt({31, 1, 1, 1, 15, 7}), rounded);
     }
+}
+
+TEST_F(StandardTablesTest, HighSpeedBeyond32BitsIsWhatTheInterfaceSays) {
+    InterfaceRow row;
+    row.ifIndex = 7;
+    row.speed = kMostSpeed;
+    m_snapshot.interfaces.interfaces = {row};
+    EXPECT_EQ(find({31, 1, 1, 1, 15, 7}), Lookup::NoSuchInstance);
+    row.highSpeed = 100000;
+    m_snapshot.interfaces.interfaces = {row};
+    EXPECT_EQ(numberAt({31, 1, 1, 1, 15, 7}), 100000);
+    EXPECT_EQ(numberAt({2, 2, 1, 5, 7}), 4294967295);
+}
+
+TEST_F(StandardTablesTest, AddressThatIsNotThereIsEmpty) {
+    InterfaceRow row;
+    row.ifIndex = 7;
+    m_snapshot.interfaces.interfaces = {row};
+    ASSERT_EQ(find({2, 2, 1, 6, 7}), Lookup::Found);
+    EXPECT_EQ(octetsOf(m_found.value), "");
+}
+
+TEST_F(StandardTablesTest, ReceiveAddressIsInTheIndexWithItsLength) {
+    m_snapshot.interfaces.receiveAddresses = {{7, "\x02\xfe", true}, {7, "\xff\xff", false}};
+    EXPECT_EQ(numberAt({31, 1, 4, 1, 2, 7, 2, 2, 254}), 1);   // active
+    EXPECT_EQ(numberAt({31, 1, 4, 1, 3, 7, 2, 2, 254}), 3);   // nonVolatile
+    EXPECT_EQ(numberAt({31, 1, 4, 1, 3, 7, 2, 255, 255}), 2); // volatile
+    EXPECT_EQ(find({31, 1, 4, 1, 3, 7, 2, 2}), Lookup::NoSuchInstance);
+    EXPECT_EQ(next({31, 1, 4, 1, 2, 7}), (Oid{31, 1, 4, 1, 2, 7, 2, 2, 254}));
+    EXPECT_EQ(next({31, 1, 4, 1, 2, 7, 2, 2, 254}), (Oid{31, 1, 4, 1, 2, 7, 2, 255, 255}));
+}
+
+TEST_F(StandardTablesTest, EthernetOfUnknownDuplexSaysSo) {
+    EthernetRow row;
+    row.ifIndex = 7;
+    m_snapshot.interfaces.ethernets = {row};
+    EXPECT_EQ(numberAt({10, 7, 2, 1, 19, 7}), 1);
+    row.duplexStatus = 3;
+    m_snapshot.interfaces.ethernets = {row};
+    EXPECT_EQ(numberAt({10, 7, 2, 1, 19, 7}), 3);
+}
+
+TEST_F(StandardTablesTest, SlowEthernetHasNoRateControl) {
+    EthernetRow row;
+    row.ifIndex = 7;
+    row.speed = 1'000'000'000;
+    m_snapshot.interfaces.ethernets = {row};
+    EXPECT_EQ(numberAt({10, 7, 2, 1, 20, 7}), 2); // false
+    EXPECT_EQ(numberAt({10, 7, 2, 1, 21, 7}), 1); // off
+    for (std::optional<std::uint32_t> const speed :
+         {std::optional<std::uint32_t>(), std::optional(2'500'000'000U),
+          std::optional(kMostSpeed)}) {
+        row.speed = speed;
+        m_snapshot.interfaces.ethernets = {row};
+        EXPECT_EQ(find({10, 7, 2, 1, 20, 7}), Lookup::NoSuchInstance);
+        EXPECT_EQ(numberAt({10, 7, 2, 1, 21, 7}), 3); // unknown
+    }
+}
+
+TEST_F(StandardTablesTest, EthernetStatisticHas32BitsInOneTableAnd64InTheOther) {
+    EthernetRow row;
+    row.ifIndex = 7;
+    row.counters[kInternalMacReceiveErrors] = 0x100000005U;
+    m_snapshot.interfaces.ethernets = {row};
+    EXPECT_EQ(numberAt({10, 7, 2, 1, 16, 7}), 5);
+    EXPECT_EQ(numberAt({10, 7, 11, 1, 5, 7}), 0x100000005);
+    EXPECT_EQ(find({10, 7, 11, 1, 1, 7}), Lookup::NoSuchInstance);
+}
+
+TEST_F(StandardTablesTest, FlowControlIsShownWhereItIsKnown) {
+    EthernetRow row;
+    row.ifIndex = 7;
+    m_snapshot.interfaces.ethernets = {row};
+    EXPECT_EQ(find({10, 7, 10, 1, 1, 7}), Lookup::NoSuchInstance);
+    row.pauseAdminMode = 4;
+    m_snapshot.interfaces.ethernets = {row};
+    EXPECT_EQ(numberAt({10, 7, 10, 1, 1, 7}), 4);
+    EXPECT_EQ(find({10, 7, 10, 1, 2, 7}), Lookup::NoSuchInstance);
+}
+
+TEST_F(StandardTablesTest, WhatBeganWithTheAgentBeganLaterThanAMasterThatRanBefore) {
+    InterfaceRow row;
+    row.ifIndex = 7;
+    row.lastChange = 0;
+    m_snapshot.interfaces.interfaces = {row};
+    Oid const discontinuity{31, 1, 1, 1, 19, 7};
+    auto const times = [&] {
+        return std::vector{numberAt(discontinuity), numberAt({31, 1, 6, 0}),
+                           numberAt({47, 1, 4, 1, 0}), numberAt({2, 2, 1, 9, 7})};
+    };
+    m_counters.started = Clock::now();
+    m_counters.setSysUpTime(50000, m_counters.started);
+    EXPECT_EQ(times(), (std::vector<std::int64_t>{0, 0, 0, 0})); // alone
+    m_counters.master = Master::Connected;
+    // When the state of an interface began that was there before is not known.
+    EXPECT_EQ(times(), (std::vector<std::int64_t>{50000, 50000, 50000, 0}));
+    m_snapshot.interfaces.interfaces[0].discontinuity = 200;
+    EXPECT_EQ(numberAt(discontinuity), 50200);
+    // A master that has been restarted since.
+    m_counters.setSysUpTime(100, m_counters.started + std::chrono::seconds(10));
+    EXPECT_EQ(numberAt({31, 1, 6, 0}), 0);
 }
 
 TEST_F(StandardTablesTest, InterfaceCountIsThatOfTheRows) {

@@ -71,8 +71,10 @@ TEST_F(InterfaceReaderTest, WhatAnInterfaceDoesNotSupportIsNotKnown) {
     EXPECT_EQ(row.type, 6);
     EXPECT_EQ(row.mtu, std::nullopt);
     EXPECT_EQ(row.speed, std::nullopt);
-    EXPECT_EQ(row.adminStatus, std::nullopt);
-    EXPECT_EQ(row.lastChange, std::nullopt);
+    EXPECT_EQ(row.adminStatus, kUp); // nobody can take it down
+    EXPECT_EQ(row.operStatus, kUnknownStatus);
+    EXPECT_EQ(row.lastChange, 0U);
+    EXPECT_EQ(row.promiscuousMode, std::nullopt);
     EXPECT_EQ(row.counters[kInOctets], std::nullopt);
     EXPECT_EQ(row.physAddress, "");
 }
@@ -80,6 +82,43 @@ TEST_F(InterfaceReaderTest, WhatAnInterfaceDoesNotSupportIsNotKnown) {
 TEST_F(InterfaceReaderTest, DescriptionIsMadePrintable) {
     addPort(m_chassis.insert("A"));
     EXPECT_EQ(readOne().description, "fake?port");
+}
+
+TEST_F(InterfaceReaderTest, InterfacesOfSeveralBoardsWithOneNameAreToldApart) {
+    auto const first = m_chassis.insert("A");
+    addPort(first);
+    EXPECT_EQ(readOne().name, "eth1@A"); // with or without another board
+    addPort(m_chassis.insert("B"));
+    auto const rows = read();
+    ASSERT_THAT(rows.interfaces, SizeIs(2));
+    EXPECT_EQ(rows.interfaces[0].name, "eth1@A");
+    EXPECT_EQ(rows.interfaces[1].name, "eth1@B");
+    EXPECT_EQ(rows.interfaces[1].description, "fake?port of board B");
+}
+
+TEST_F(InterfaceReaderTest, InterfaceThatAppearsLaterHasChangedThen) {
+    addPort(m_chassis.insert("A"));
+    read();
+    addPort(m_chassis.insert("B"));
+    auto const rows = read();
+    ASSERT_THAT(rows.interfaces, SizeIs(2));
+    EXPECT_EQ(rows.interfaces[0].lastChange, 0U);
+    EXPECT_GE(rows.interfaces[1].lastChange, 360000U);
+}
+
+TEST_F(InterfaceReaderTest, AddressesThatAnEthernetReceivesAreItsOwnAndBroadcasts) {
+    addPort(m_chassis.insert("A")).address = std::string("\x02\0\x5e\0\0\x01", 6);
+    auto const rows = read().receiveAddresses;
+    ASSERT_THAT(rows, SizeIs(2));
+    EXPECT_THAT(rows[0].index(), ElementsAre(1000, 6, 2, 0, 0x5e, 0, 0, 1));
+    EXPECT_TRUE(rows[0].isOwn);
+    EXPECT_THAT(rows[1].index(), ElementsAre(1000, 6, 255, 255, 255, 255, 255, 255));
+    EXPECT_FALSE(rows[1].isOwn);
+}
+
+TEST_F(InterfaceReaderTest, EthernetWithoutAnAddressListsNone) {
+    addPort(m_chassis.insert("A"));
+    EXPECT_THAT(read().receiveAddresses, IsEmpty());
 }
 
 TEST_F(InterfaceReaderTest, AddressKeepsItsBytes) {
@@ -97,8 +136,8 @@ TEST_F(InterfaceReaderTest, StatisticsOfEthernetAreReadUnderTheSameIndex) {
     auto const rows = read();
     ASSERT_THAT(rows.ethernets, SizeIs(1));
     EXPECT_EQ(rows.ethernets[0].ifIndex, rows.interfaces[0].ifIndex);
-    EXPECT_EQ(rows.ethernets[0].fcsErrors, 4294967291U);
-    EXPECT_EQ(rows.ethernets[0].symbolErrors, std::nullopt);
+    EXPECT_EQ(rows.ethernets[0].counters[kFcsErrors], 4294967291U);
+    EXPECT_EQ(rows.ethernets[0].counters[kSymbolErrors], std::nullopt);
 }
 
 TEST_F(InterfaceReaderTest, CounterCountsOnWhenItWraps) {
@@ -106,9 +145,57 @@ TEST_F(InterfaceReaderTest, CounterCountsOnWhenItWraps) {
     port.inOctets = -10; // 2^32 - 10
     EXPECT_EQ(readOne().counters[kInOctets], 4294967286U);
     port.inOctets = 5;
+    InterfaceRow const row = readOne();
+    EXPECT_EQ(row.counters[kInOctets], 4294967301U);
+    EXPECT_EQ(row.discontinuity, 0U);
+}
+
+TEST_F(InterfaceReaderTest, CounterThatBeginsAgainIsADiscontinuity) {
+    FakeEthernet& port = addPort(m_chassis.insert("A"));
+    port.inOctets = -10; // 2^32 - 10
+    read();
+    port.inOctets = 5;
     EXPECT_EQ(readOne().counters[kInOctets], 4294967301U);
-    port.inOctets = 4;
-    EXPECT_EQ(readOne().counters[kInOctets], 8589934596U);
+    port.inOctets = 4; // it cannot have wrapped within moments
+    InterfaceRow const row = readOne();
+    EXPECT_EQ(row.counters[kInOctets], 4U);
+    EXPECT_GE(row.discontinuity, 360000U);
+    port.inOctets = 6;
+    EXPECT_EQ(readOne().counters[kInOctets], 6U);
+    EXPECT_EQ(readOne().discontinuity, row.discontinuity);
+}
+
+TEST_F(InterfaceReaderTest, AllCountersOfAnInterfaceBeginAgainTogether) {
+    FakeEthernet& port = addPort(m_chassis.insert("A"));
+    port.inOctets = 100;
+    port.outErrors = -1;
+    port.fcsErrors = 7;
+    read();
+    port.inOctets = 3;
+    port.outErrors = 0; // would have wrapped
+    auto const rows = read();
+    EXPECT_EQ(rows.interfaces.at(0).counters[kInOctets], 3U);
+    EXPECT_EQ(rows.interfaces.at(0).counters[kOutErrors], 0U);
+    EXPECT_EQ(rows.ethernets.at(0).counters[kFcsErrors], 7U);
+}
+
+TEST_F(InterfaceReaderTest, EthernetStatisticThatBeginsAgainIsADiscontinuityToo) {
+    FakeEthernet& port = addPort(m_chassis.insert("A"));
+    port.inOctets = 100;
+    port.fcsErrors = 7;
+    read();
+    port.fcsErrors = 2;
+    auto const rows = read();
+    EXPECT_EQ(rows.ethernets.at(0).counters[kFcsErrors], 2U);
+    EXPECT_GE(rows.interfaces.at(0).discontinuity, 360000U);
+}
+
+TEST_F(InterfaceReaderTest, EthernetStatisticCountsOnWhenItWraps) {
+    FakeEthernet& port = addPort(m_chassis.insert("A"));
+    port.fcsErrors = -5;
+    read();
+    port.fcsErrors = 1;
+    EXPECT_EQ(read().ethernets.at(0).counters[kFcsErrors], 4294967297U);
 }
 
 TEST_F(InterfaceReaderTest, CounterThatIsNotKnownForAWhileCountsOn) {
@@ -212,8 +299,21 @@ TEST_F(InterfaceReaderTest, TimeOfLastChangeStaysWhileTheOperStatusStays) {
     port.operStatus = kDown;
     auto const down = readOne().lastChange;
     ASSERT_TRUE(down);
-    EXPECT_GE(*down, 360000U); // an hour after the start
+    EXPECT_GE(*down, 359900U); // an hour after the start, in whole seconds
     EXPECT_EQ(readOne().lastChange, down);
+}
+
+TEST_F(InterfaceReaderTest, ChangeThatBecomesCertainLaterIsTimedAtItsBeginning) {
+    FakeEthernet& port = addPort(m_chassis.insert("A"));
+    port.operStatus = kUp;
+    read();
+    port.operStatus = kDown;
+    port.lastChange = static_cast<int>(std::time(nullptr)) - 10;
+    auto const down = readOne().lastChange;
+    ASSERT_TRUE(down);
+    EXPECT_LE(*down, 360000U - 800U); // at least 8 seconds before now, an hour after the start
+    port.operStatus = kUp;            // a date that is not of this change
+    EXPECT_GE(readOne().lastChange, 360000U);
 }
 
 TEST_F(InterfaceReaderTest, ClockThatWasSetBackOrAheadMovesNoTimeOfChange) {

@@ -127,7 +127,7 @@ class AgentxSessionFixture : public ::testing::Test {
             [](AgentxHeader const& header, std::string_view) {
                 return agentxResponse(header, AgentxFault::NotWritable);
             },
-            pace);
+            pace, m_capabilities);
     }
     /// Lets the session run until `condition` holds.
     template <class Condition>
@@ -213,8 +213,12 @@ class AgentxSessionFixture : public ::testing::Test {
     Snapshot m_snapshot;
     Counters m_counters;
     Clock::time_point m_now = Clock::now();
-    SharedRows m_rows{{{m_tree, kStandardArc, {{{2, 2}, "ifTable", HostHas::Rows}}}}};
+    SharedRows m_rows{
+        {{m_tree,
+          kStandardArc,
+          {{{2, 2, 1, 1}, "ifTable", HostHas::Rows}, {{2, 2, 1, 2}, "ifTable", HostHas::Rows}}}}};
     bool m_servesOther = false;
+    std::vector<Capability> m_capabilities;
     std::optional<ScriptedMaster> m_master;
     std::optional<AgentxSession> m_session;
     int m_taken = 0;

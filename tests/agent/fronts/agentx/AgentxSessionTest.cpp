@@ -26,6 +26,42 @@ TEST_F(AgentxSessionTest, OpensThenRegistersInTheSessionThatTheMasterNames) {
     EXPECT_TRUE(runUntil([this] { return m_session->isConnected(); }));
 }
 
+TEST_F(AgentxSessionTest, ListsItsCapabilitiesInEverySession) {
+    m_capabilities = {{{1, 3, 6, 1, 2, 1, 31}, "The MIB module IF-MIB"},
+                      {{1, 3, 6, 1, 4, 1, 32473, 1}, "The MIB module KVL-OAM-MIB"}};
+    startMaster();
+    startSession();
+    for (int session = 0; session < 2; ++session) {
+        grant(AgentxKind::Open);
+        grant(AgentxKind::Register);
+        for (Capability const& capability : m_capabilities) {
+            Packet const packet = grant(AgentxKind::AddAgentCaps);
+            EXPECT_EQ(packet.header.session, 77U);
+            AgentxReader reader(packet.payload, true);
+            EXPECT_EQ(reader.name().name, capability.id);
+            std::size_t const length = reader.number();
+            EXPECT_EQ(length, capability.description.size());
+            EXPECT_EQ(packet.payload.substr(packet.payload.size() - (length + 3) / 4 * 4, length),
+                      capability.description);
+        }
+        EXPECT_TRUE(runUntil([this] { return m_session->isConnected(); }));
+        m_master->hangUp();
+        EXPECT_TRUE(runUntil([this] { return !m_session->isConnected(); }));
+    }
+}
+
+TEST_F(AgentxSessionTest, ServesEvenIfTheMasterRefusesItsCapabilities) {
+    m_capabilities = {{{1, 3, 6, 1, 2, 1, 31}, "The MIB module IF-MIB"}};
+    startMaster();
+    startSession();
+    connectSession();
+    m_master->respond(next(), AgentxFault::RequestDenied);
+    notify();
+    grant(AgentxKind::Notify);
+    EXPECT_TRUE(runUntil([this] { return m_taken == 1; }));
+    EXPECT_TRUE(m_session->isConnected());
+}
+
 TEST_F(AgentxSessionTest, ConnectsOnceAMasterIsThere) {
     startSession();
     EXPECT_FALSE(m_session->isConnected());

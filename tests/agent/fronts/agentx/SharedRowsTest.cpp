@@ -23,7 +23,9 @@ class SharedRowsTest : public ::testing::Test {
   protected:
     static std::vector<Place> places() {
         return {{{2, 1}, "ifNumber", HostHas::All},
-                {{2, 2}, "ifTable", HostHas::Rows},
+                {{2, 2, 1, 1}, "ifTable", HostHas::Rows},
+                {{2, 2, 1, 2}, "ifTable", HostHas::Rows},
+                {{2, 2, 1, 5}, "ifTable", HostHas::Rows},
                 {{10, 18}, "DS1-MIB"}};
     }
     /// There are interfaces of these indices, some with a speed.
