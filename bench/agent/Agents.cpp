@@ -38,7 +38,8 @@ void serveFrom(Front& front, Oid const& arc,
                  counters,
                  takeSnapshot,
                  takeSnapshot,
-                 settings});
+                 settings,
+                 {}});
     front.run();
 }
 
@@ -46,7 +47,7 @@ void serveFrom(Front& front, Oid const& arc,
 SnmpFiles readableByAll(Folder const& folder) {
     setLogLevel(LogLevel::Error);
     folder.write("snmp.conf", "rocommunity public 127.0.0.1\n");
-    return {folder.path("snmp.conf"), folder.path("state")};
+    return {folder.path("snmp.conf"), folder.path("state"), {}, {}};
 }
 
 int runIntervalAgent(Folder const& folder, std::string const& address, std::uint32_t lines) {

@@ -58,13 +58,13 @@ class Agent {
                                  "exactEngineID 0x"
                               << kEngine << "\ncreateUser fuzz\nrwuser fuzz noauth\n";
         m_front.emplace(std::vector<std::string>{"udp:127.0.0.1:" + port, "tcp:127.0.0.1:" + port},
-                        SnmpFiles{config, m_folder.path()});
+                        SnmpFiles{config, m_folder.path(), {}, {}});
         if (!m_front->open()) throw std::runtime_error("the agent does not start");
         auto const snapshot = [] {
             static auto const made = sampleSnapshot();
             return made;
         };
-        m_front->serve({m_objects.served(), m_counters, snapshot, snapshot, m_settings});
+        m_front->serve({m_objects.served(), m_counters, snapshot, snapshot, m_settings, {}});
         m_front->beforeSleep([this]() -> std::optional<Clock::time_point> {
             if (m_turns-- == 0) m_front->stop();
             return Clock::now(); // never waits

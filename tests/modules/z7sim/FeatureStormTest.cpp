@@ -110,7 +110,9 @@ class Reader {
             judge(status >= ISDNBChannelStatusIdle && status <= ISDNBChannelStatusActive,
                   "bearer status " + std::to_string(status));
         }
-        judge(count == kTrunks * kBearers, std::to_string(count) + " bearers");
+        // A board that was pulled while its features were made may lack trunks, but not bearers.
+        judge(count % kBearers == 0, std::to_string(count) + " bearers");
+        int const trunks = count / kBearers;
         count = 0;
         for (auto channel = feature.GetFirstDChannel(); channel.get() != nullptr;
              channel = feature.GetNextDChannel(channel), ++count) {
@@ -119,7 +121,7 @@ class Reader {
                   "signalling status " + std::to_string(status));
             channel->AddISDNStatusListener(&m_listener);
         }
-        judge(count == kTrunks, std::to_string(count) + " signalling channels");
+        judge(count == trunks, std::to_string(count) + " signalling channels");
     }
     void devices(Z7ResourceFeature& feature) {
         int count = 0;

@@ -296,7 +296,7 @@ INSTANTIATE_TEST_SUITE_P(
                    "fail, fault, set, unset, event, show, store-list, store-add, store-set, "
                    "store-remove, process-list, process-add, process-end, line-list, line-errors, "
                    "line-rates, line-alarm, line-mend, call-list, call-setup, call-release, "
-                   "call-signalling, drain, version, ping"},
+                   "call-charge, call-signalling, drain, version, ping"},
         BadCommand{"UnknownArgument", R"({"command": "stop", "bord": 5})",
                    "unknown argument \"bord\"; known: board"},
         BadCommand{"ArgumentWhereNoneIsTaken", R"({"command": "drain", "board": 5})",
