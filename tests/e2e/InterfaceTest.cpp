@@ -202,8 +202,8 @@ TEST_F(InterfaceTest, IpInterfaceStandsOnItsEthernetAndCountsNothingTwice) {
         if (type != "INTEGER: 53") continue;
         ++found;
         EXPECT_EQ(std::ranges::count_if(stack,
-                                        [&](auto const& row) {
-                                            return row.first.starts_with(index + ".") &&
+                                        [above = index + "."](auto const& row) {
+                                            return row.first.starts_with(above) &&
                                                    !row.first.ends_with(".0");
                                         }),
                   1);
