@@ -41,10 +41,17 @@ std::int64_t stepped() {
 }
 
 template <class Function>
-Function next(char const* name, char const* version = nullptr) {
-    void* const found =
-        version == nullptr ? dlsym(RTLD_NEXT, name) : dlvsym(RTLD_NEXT, name, version);
-    return reinterpret_cast<Function>(found);
+Function next(char const* name) {
+    return reinterpret_cast<Function>(dlsym(RTLD_NEXT, name));
+}
+
+using TimedWait = int (*)(pthread_cond_t*, pthread_mutex_t*, timespec const*);
+
+/// ThreadSanitizer's own, which it needs to see, or else the C library's.
+TimedWait nextTimedWait() {
+    void* found = dlsym(RTLD_DEFAULT, "__interceptor_pthread_cond_timedwait");
+    if (found == nullptr) found = dlvsym(RTLD_NEXT, "pthread_cond_timedwait", "GLIBC_2.3.2");
+    return reinterpret_cast<TimedWait>(found);
 }
 
 } // namespace
@@ -78,8 +85,7 @@ __attribute__((visibility("default"))) time_t time(time_t* where) noexcept {
 /// The kernel waits by the clock that has not been stepped.
 __attribute__((visibility("default"))) int
 pthread_cond_timedwait(pthread_cond_t* condition, pthread_mutex_t* mutex, timespec const* until) {
-    using Wait = int (*)(pthread_cond_t*, pthread_mutex_t*, timespec const*);
-    static auto const wait = next<Wait>("pthread_cond_timedwait", "GLIBC_2.3.2");
+    static TimedWait const wait = nextTimedWait();
     timespec real = *until;
     real.tv_sec -= static_cast<time_t>(stepped());
     return wait(condition, mutex, &real);
