@@ -9,7 +9,6 @@ namespace {
 
 using ::testing::Each;
 using ::testing::ElementsAre;
-using ::testing::EndsWith;
 using ::testing::HasSubstr;
 using ::testing::IsEmpty;
 using ::testing::Not;

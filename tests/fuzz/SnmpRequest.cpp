@@ -128,14 +128,19 @@ Oid nameFrom(fuzz::FuzzInput& input) {
     return name;
 }
 
+int signedOctet(fuzz::FuzzInput& input) {
+    int const octet = input.octet();
+    return octet < 128 ? octet : octet - 256;
+}
+
 e2e::SnmpPdu pduFrom(fuzz::FuzzInput& input) {
     static constexpr e2e::PduKind kinds[] = {e2e::PduKind::Get, e2e::PduKind::GetNext,
                                              e2e::PduKind::Set, e2e::PduKind::GetBulk};
     e2e::SnmpPdu pdu;
     pdu.kind = kinds[input.choice(std::size(kinds))];
     if (pdu.kind == e2e::PduKind::GetBulk) {
-        pdu.errorStatus = static_cast<std::int8_t>(input.octet());
-        pdu.errorIndex = static_cast<std::int8_t>(input.octet());
+        pdu.errorStatus = signedOctet(input);
+        pdu.errorIndex = signedOctet(input);
     }
     while (!input.atEnd() && pdu.variables.size() < kMaxVariables) {
         e2e::Variable& variable = pdu.variables.emplace_back();
