@@ -87,7 +87,7 @@ class Reading {
         std::uint32_t index = 0;
         std::uint32_t line = 0;
     };
-    Signalling readSignalling(ReferenceCounter<ISDNDChannel> channel);
+    Signalling readSignalling(ReferenceCounter<ISDNDChannel> handle);
     std::uint32_t readLapd(ISDNDChannel& channel);
     std::uint32_t readBearer(ISDNBChannel& channel);
     bool isE1(std::uint32_t line) const;
