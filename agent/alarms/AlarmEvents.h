@@ -41,10 +41,10 @@ class AlarmEvents {
         int status = 0;      ///< dsx1LineStatus
     };
 
-    /// What is known of a board before it goes.
+    /// A `KnownBoard` keeps what alarms need of a board after it was removed.
     struct KnownBoard {
         std::string place;           ///< as `boardPlace`
-        bool stoppedInOrder = false; ///< by events; a board that goes may say that it has stopped
+        bool stoppedInOrder = false; ///< from events: its own status changes during removal
     };
 
     void rememberLines(Snapshot const& snapshot);
