@@ -87,6 +87,7 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
     m_lines.clear();
     ++m_reading;
     m_histories.begin(Clock::now());
+    m_lineTotals.begin();
     ToTicks const toTicks = [this](long seconds) { return m_uptime.of(seconds); };
     std::vector<BoardKey> const keys = boardKeys(boards);
     auto const names = boardNames(boards, keys);
@@ -106,6 +107,7 @@ InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
         yieldBetweenBoards();
     }
     m_indices.save();
+    m_lineTotals.end();
     if (m_counted.size() > all.interfaces.size())
         std::erase_if(m_counted,
                       [this](auto const& entry) { return entry.second.reading != m_reading; });
@@ -153,6 +155,7 @@ void InterfaceReader::append(InterfaceRows& all, BoardInterfaces&& board,
     for (std::size_t i = 0; i < board.lines.size(); ++i) {
         auto const index = indices[board.rows.lines[i].ifIndex - 1];
         if (index == 0) continue;
+        m_lineTotals.add(index, board.rows.lines[i]);
         if (auto const date = board.lineChanges[i])
             board.rows.lines[i].statusLastChange = m_changeTimes.at(index, *date, now);
         m_lines.push_back({index, std::move(board.lines[i]), boardIndex});

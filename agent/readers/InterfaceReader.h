@@ -11,6 +11,7 @@
 #include "agent/readers/BoardInterfaces.h"
 #include "agent/readers/ChangeTimes.h"
 #include "agent/readers/PlacedLine.h"
+#include "agent/readers/SettledTotals.h"
 #include "agent/readers/StableIndices.h"
 #include "agent/rows/BoardRow.h"
 #include "agent/rows/InterfaceRows.h"
@@ -65,6 +66,7 @@ class InterfaceReader {
     Uptime const m_uptime;
     ChangeTimes m_changeTimes;
     LineHistories m_histories;
+    AllSettledTotals m_lineTotals;
     std::vector<PlacedLine> m_lines;
     std::unordered_map<std::uint32_t, Counted> m_counted; ///< by ifIndex
     std::uint64_t m_reading = 0;                          ///< which one this is

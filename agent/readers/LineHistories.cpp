@@ -81,16 +81,38 @@ void LineHistories::read(ReferenceCounter<DS1IntervalTable> const& handle, LineR
     if (isNew) {
         kept.table = handle;
         kept.validity = dynamic_cast<DS1IntervalValidity*>(&table);
+        kept.number = ++m_numbered;
+        kept.formerElapsed = elapsed;
+        kept.readAt = m_now;
     }
     int const closedNow = kept.validity == nullptr ? 0 : kept.validity->GetIntervalsClosed();
+    if (kept.validity == nullptr)
+        countIntervals(kept, elapsed);
+    else
+        kept.allIntervals = closedNow;
     if (isNew || closedNow != kept.intervalsClosed || !isUnchanged(kept, table, elapsed))
         kept.closed = readClosed(table, kept.validity);
     kept.intervalsClosed = closedNow;
     row.closed = kept.closed;
+    row.history = kept.number;
+    row.intervalsClosed = kept.allIntervals;
+    // A table counts a second beginning with the time elapsed, and while it closes an interval that
+    // is 0 or a whole interval.
+    row.isWhole = elapsed > 0 && elapsed < DS1IntervalTable::kIntervalLength &&
+                  readInterval(table, 0) == row.running && table.GetTimeElapsed() == elapsed;
     // An interval that was closed during the reading may be there in part.
     kept.elapsed = table.GetTimeElapsed() < elapsed ? 0 : elapsed;
     kept.readAt = m_now;
     ++m_readSince;
+}
+
+/// The intervals that a table which does not count them has closed: from the time that has passed.
+void LineHistories::countIntervals(Kept& kept, int elapsed) const {
+    auto const passed = std::chrono::duration_cast<std::chrono::seconds>(m_now - kept.readAt);
+    std::int64_t const outside = passed.count() + kept.formerElapsed - elapsed;
+    constexpr std::int64_t kLength = DS1IntervalTable::kIntervalLength;
+    kept.allIntervals += std::max<std::int64_t>((outside + kLength / 2) / kLength, 0);
+    kept.formerElapsed = elapsed;
 }
 
 bool LineHistories::isUnchanged(Kept const& kept, DS1IntervalTable& table, int elapsed) const {

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <chrono>
+#include <cstdint>
 #include <memory>
 #include <unordered_map>
 
@@ -31,14 +32,19 @@ class LineHistories {
         DS1IntervalValidity* validity = nullptr;  ///< the table's; null where it has none
         int intervalsClosed = 0;                  ///< by the table, before `closed` was read
         std::shared_ptr<ClosedIntervals const> closed;
-        int elapsed = 0; ///< 0: an interval may have been closed meanwhile
+        int elapsed = 0;               ///< 0: an interval may have been closed meanwhile
+        std::uint64_t number = 0;      ///< of the table, among all that were ever read
+        std::int64_t allIntervals = 0; ///< closed by the table, as far as it lets one know
+        int formerElapsed = 0;         ///< as read last
         Clock::time_point readAt;
     };
 
     bool isUnchanged(Kept const& kept, DS1IntervalTable& table, int elapsed) const;
+    void countIntervals(Kept& kept, int elapsed) const;
 
     Clock::time_point m_now;
-    std::size_t m_readSince = 0; ///< tables, each once
+    std::size_t m_readSince = 0;  ///< tables, each once
+    std::uint64_t m_numbered = 0; ///< tables
     std::unordered_map<DS1IntervalTable*, Kept> m_kept;
 };
 

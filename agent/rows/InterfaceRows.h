@@ -103,8 +103,34 @@ struct StackRow {
     auto operator<=>(StackRow const&) const = default;
 };
 
-/// The counters of a line's interval, in the order of DS1-MIB's tables; negative: not known.
-using LineCounts = std::array<std::int32_t, 10>;
+/// The performance counters of a line, in the order of DS1-MIB's tables.
+enum LineCounter : std::size_t {
+    kErrorSeconds,
+    kSeverelyErrorSeconds,
+    kSeverelyErrorFramingSeconds,
+    kUnavailableSeconds,
+    kControlledSlipSeconds,
+    kPathCodingViolations,
+    kLineErrorSeconds,
+    kBurstyErrorSeconds,
+    kDegradedMinutes,
+    kLineCodeViolations,
+    kLineCounters ///< how many
+};
+
+/// The counters of a line's interval; negative: not known.
+using LineCounts = std::array<std::int32_t, kLineCounters>;
+
+/// What a line has counted since the agent saw it first. Never falls; `kUnknownTotal`: not known.
+using LineTotals = std::array<std::int64_t, kLineCounters>;
+inline constexpr std::int64_t kUnknownTotal = -1;
+
+/// The totals of a line of which nothing is known.
+constexpr LineTotals unknownTotals() {
+    LineTotals totals{};
+    totals.fill(kUnknownTotal);
+    return totals;
+}
 
 /// Never changed once a row has them: snapshots share them.
 struct ClosedIntervals {
@@ -138,6 +164,11 @@ struct LineRow {
     LineCounts running{};                          ///< good when the line keeps a history
     std::shared_ptr<ClosedIntervals const> closed; ///< none: the line keeps no history
     std::size_t intervalsBefore = 0;               ///< closed ones of all lines before this one
+    std::uint64_t history = 0;        ///< a number of the history; a line may get another one
+    std::int64_t intervalsClosed = 0; ///< ever, by the history
+    /// No second was counted while the history was read, so that its counts fit together.
+    bool isWhole = false;
+    LineTotals totals = unknownTotals();
 
     bool keepsHistory() const { return closed != nullptr; }
     /// `interval`: 1 is the newest closed one. Requires that there is such a one.

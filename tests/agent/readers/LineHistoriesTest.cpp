@@ -105,6 +105,34 @@ TEST_F(LineHistoriesTest, TableThatDoesNotTellTheTimeIsReadEveryTime) {
     EXPECT_EQ(read().closed->counts[0][0], 3);
 }
 
+TEST_F(LineHistoriesTest, ReadingIsNotWholeWhileAnIntervalIsBeingClosed) {
+    m_history->run(1, 100);
+    EXPECT_TRUE(read().isWhole);
+    m_history->run(1, DS1IntervalTable::kIntervalLength);
+    EXPECT_FALSE(read().isWhole);
+    m_history->run(1, 0);
+    EXPECT_FALSE(read().isWhole);
+}
+
+TEST_F(LineHistoriesTest, ClosedIntervalsAreCountedByTheTimeThatHasPassed) {
+    m_history->run(0, 890);
+    EXPECT_EQ(read().intervalsClosed, 0);
+    m_history->run(0, 10);
+    EXPECT_EQ(read(std::chrono::seconds(20)).intervalsClosed, 1);
+    m_history->run(0, 9);
+    EXPECT_EQ(read(std::chrono::seconds(1800)).intervalsClosed, 3);
+    EXPECT_EQ(read(std::chrono::seconds(1)).intervalsClosed, 3);
+}
+
+TEST_F(LineHistoriesTest, AnotherTableHasAnotherNumber) {
+    m_history->run(0, 100);
+    std::uint64_t const first = read().history;
+    EXPECT_NE(first, 0U);
+    EXPECT_EQ(read().history, first);
+    m_table = ReferenceCounter<DS1IntervalTable>(new FakeHistory);
+    EXPECT_NE(read().history, first);
+}
+
 class GapsTest : public LineHistoriesTest {
   protected:
     GapsTest() { m_table = ReferenceCounter<DS1IntervalTable>(m_gaps); }
