@@ -21,8 +21,8 @@ namespace {
 
 using Json = nlohmann::json;
 
-/// `Options` are the options of all commands of `kvlsim call`.
-struct Options {
+/// `CallOptions` are the options of all commands of `kvlsim call`.
+struct CallOptions {
     std::string trunk;
     std::string channel;
     std::string state;
@@ -40,12 +40,7 @@ struct Options {
 
 constexpr double kMaxWait = 86400;
 
-std::string words(Json const& value) {
-    if (value.is_null()) return "-";
-    return value.is_string() ? oneLine(value.get<std::string>()) : value.dump();
-}
-
-void list(Options const& options, Connect const& connect) {
+void listCalls(CallOptions const& options, Connect const& connect) {
     Json const reply = connect().request({{"command", "call-list"}});
     if (options.json) {
         std::cout << reply.dump(2, ' ', false, Json::error_handler_t::replace) << '\n';
@@ -57,7 +52,7 @@ void list(Options const& options, Connect const& connect) {
         Json const& channels = trunk.at("channels");
         TextRow row;
         for (char const* key : {"trunk", "name", "board", "signalling"})
-            row.push_back(words(trunk.at(key)));
+            row.push_back(cellText(trunk.at(key)));
         row.push_back(std::to_string(channels.size()));
         for (auto const& state : kBearerStateNames)
             row.push_back(std::to_string(std::ranges::count(channels, Json(state))));
@@ -66,7 +61,7 @@ void list(Options const& options, Connect const& connect) {
     printColumns(rows, std::cout);
 }
 
-Json setupCommand(Options const& options) {
+Json setupCommand(CallOptions const& options) {
     Json command = {{"command", "call-setup"}, {"trunk", options.trunk}};
     if (!options.channel.empty()) command["channel"] = options.channel;
     if (!options.state.empty()) command["state"] = options.state;
@@ -78,7 +73,7 @@ Json setupCommand(Options const& options) {
     return command;
 }
 
-Json releaseCommand(Options const& options) {
+Json releaseCommand(CallOptions const& options) {
     Json command = {{"command", "call-release"}, {"trunk", options.trunk}};
     if (options.all)
         command["all"] = true;
@@ -87,47 +82,48 @@ Json releaseCommand(Options const& options) {
     return command;
 }
 
-Json chargeCommand(Options const& options) {
+Json chargeCommand(CallOptions const& options) {
     return {{"command", "call-charge"},
             {"trunk", options.trunk},
             {"channel", options.channel},
             {"units", options.units}};
 }
 
-Json signallingCommand(Options const& options) {
+Json signallingCommand(CallOptions const& options) {
     return {{"command", "call-signalling"}, {"trunk", options.trunk}, {"state", options.state}};
 }
 
-Json change(Options const& options, ControlClient& client, Json const& command) {
+Json change(CallOptions const& options, ControlClient& client, Json const& command) {
     Json reply = client.request(command);
     if (!options.noWait) client.request({{"command", "drain"}});
     return reply;
 }
 
-void setUp(Options const& options, Connect const& connect) {
+void setUp(CallOptions const& options, Connect const& connect) {
     auto client = connect();
     Json const reply = change(options, client, setupCommand(options));
     std::cout << "channel " << reply.at("channel").dump() << '\n';
 }
 
-void release(Options const& options, Connect const& connect) {
+void release(CallOptions const& options, Connect const& connect) {
     auto client = connect();
     change(options, client, releaseCommand(options));
 }
 
-void charge(Options const& options, Connect const& connect) {
+void charge(CallOptions const& options, Connect const& connect) {
     auto client = connect();
     change(options, client, chargeCommand(options));
 }
 
-void signalling(Options const& options, Connect const& connect) {
+void signalling(CallOptions const& options, Connect const& connect) {
     auto client = connect();
     change(options, client, signallingCommand(options));
 }
 
 /// Executes one line of a script; throws ToolError when it is wrong.
-void runLine(Options const& options, ControlClient& client, std::vector<std::string> const& line) {
-    Options call = options;
+void runLine(CallOptions const& options, ControlClient& client,
+             std::vector<std::string> const& line) {
+    CallOptions call = options;
     auto const requireWords = [&line](std::size_t least, std::size_t most, char const* usage) {
         if (line.size() < least || line.size() > most)
             throw ToolError("this is no " + line.front() + "; write " + usage);
@@ -165,7 +161,7 @@ void runLine(Options const& options, ControlClient& client, std::vector<std::str
     }
 }
 
-void runScript(Options const& options, Connect const& connect) {
+void runScript(CallOptions const& options, Connect const& connect) {
     bool const standardInput = options.file == "-";
     std::string const name = standardInput ? "standard input" : options.file;
     std::ifstream file;
@@ -195,7 +191,7 @@ void runScript(Options const& options, Connect const& connect) {
 } // namespace
 
 void addCallCommands(CLI::App& app, Connect connect, std::function<void()>& chosen) {
-    CommandGroup<Options> group(app, "call", "Calls on ISDN channels", connect, chosen);
+    CommandGroup<CallOptions> group(app, "call", "Calls on ISDN channels", connect, chosen);
     auto const& options = group.options();
     auto const addChange = [&](char const* name, char const* help, auto run) {
         CLI::App* const command = group.add(name, help, run);
@@ -205,7 +201,7 @@ void addCallCommands(CLI::App& app, Connect connect, std::function<void()>& chos
     };
     constexpr char const* trunkHelp = "Handle or NAME of a device with ISDN channels";
 
-    group.add("list", "List the trunks and the states of their channels", list)
+    group.add("list", "List the trunks and the states of their channels", listCalls)
         ->add_flag("--json", options->json, "Print the reply as JSON");
 
     auto* command = addChange("setup", "Set a call up", setUp);

@@ -17,8 +17,8 @@ namespace {
 
 using Json = nlohmann::json;
 
-/// `Options` are the options of all commands of `kvlsim line`.
-struct Options {
+/// `LineOptions` are the options of all commands of `kvlsim line`.
+struct LineOptions {
     std::string line;
     std::string alarm;
     std::array<std::optional<std::uint32_t>, kLineErrorNames.size()> errors;
@@ -28,7 +28,7 @@ struct Options {
     bool json = false;
 };
 
-void change(Options const& options, Connect const& connect, Json const& command) {
+void change(LineOptions const& options, Connect const& connect, Json const& command) {
     auto client = connect();
     client.request(command);
     if (!options.noWait) client.request({{"command", "drain"}});
@@ -43,18 +43,13 @@ Json given(Values const& values) {
     return json;
 }
 
-std::string words(Json const& value) {
-    if (value.is_null()) return "-";
-    return value.is_string() ? oneLine(value.get<std::string>()) : value.dump();
-}
-
 std::string typeWords(Json const& type) {
-    if (!type.is_number_integer()) return words(type);
+    if (!type.is_number_integer()) return cellText(type);
     auto const name = nameOf(static_cast<DS1LineType>(type.get<std::int32_t>()));
-    return name.empty() ? words(type) : std::string(name);
+    return name.empty() ? cellText(type) : std::string(name);
 }
 
-void list(Options const& options, Connect const& connect) {
+void listLines(LineOptions const& options, Connect const& connect) {
     Json const reply = connect().request({{"command", "line-list"}});
     if (options.json) {
         std::cout << reply.dump(2, ' ', false, Json::error_handler_t::replace) << '\n';
@@ -65,7 +60,7 @@ void list(Options const& options, Connect const& connect) {
     for (auto const& line : reply.at("lines")) {
         TextRow row;
         for (char const* key : {"line", "name", "board"})
-            row.push_back(words(line.at(key)));
+            row.push_back(cellText(line.at(key)));
         row.push_back(typeWords(line.at("type")));
         row.push_back(line.at("seconds").dump());
         for (auto const& name : kLineErrorNames)
@@ -81,17 +76,17 @@ void list(Options const& options, Connect const& connect) {
     printColumns(rows, std::cout);
 }
 
-void addErrors(Options const& options, Connect const& connect) {
+void addErrors(LineOptions const& options, Connect const& connect) {
     change(options, connect,
            {{"command", "line-errors"}, {"line", options.line}, {"errors", given(options.errors)}});
 }
 
-void setRates(Options const& options, Connect const& connect) {
+void setRates(LineOptions const& options, Connect const& connect) {
     change(options, connect,
            {{"command", "line-rates"}, {"line", options.line}, {"rates", given(options.rates)}});
 }
 
-void setAlarm(Options const& options, Connect const& connect) {
+void setAlarm(LineOptions const& options, Connect const& connect) {
     change(options, connect,
            {{"command", "line-alarm"},
             {"line", options.line},
@@ -99,7 +94,7 @@ void setAlarm(Options const& options, Connect const& connect) {
             {"clear", options.clear}});
 }
 
-void mend(Options const& options, Connect const& connect) {
+void mend(LineOptions const& options, Connect const& connect) {
     change(options, connect, {{"command", "line-mend"}, {"line", options.line}});
 }
 
@@ -116,7 +111,7 @@ void addErrorOptions(CLI::App& command, Values& values, CLI::Validator const& ch
 } // namespace
 
 void addLineCommands(CLI::App& app, Connect connect, std::function<void()>& chosen) {
-    CommandGroup<Options> group(app, "line", "DS1 lines: errors and alarms", connect, chosen);
+    CommandGroup<LineOptions> group(app, "line", "DS1 lines: errors and alarms", connect, chosen);
     auto const& options = group.options();
     auto const addChange = [&](char const* name, char const* help, auto run) {
         CLI::App* const command = group.add(name, help, run);
@@ -127,7 +122,7 @@ void addLineCommands(CLI::App& app, Connect connect, std::function<void()>& chos
         return command;
     };
 
-    group.add("list", "List the lines and their counters", list)
+    group.add("list", "List the lines and their counters", listLines)
         ->add_flag("--json", options->json, "Print the reply as JSON");
 
     addErrorOptions(*addChange("errors", "Count errors at once", addErrors), options->errors,

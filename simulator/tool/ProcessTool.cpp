@@ -16,8 +16,8 @@ namespace {
 
 using Json = nlohmann::json;
 
-/// `Options` are the options of all commands of `kvlsim process`.
-struct Options {
+/// `ProcessOptions` are the options of all commands of `kvlsim process`.
+struct ProcessOptions {
     std::string name;
     std::int32_t pid = 0;
     std::string process;
@@ -41,7 +41,7 @@ Json numbersFrom(std::vector<std::string> const& words) {
     return numbers;
 }
 
-void list(Options const& options, Connect const& connect) {
+void listProcesses(ProcessOptions const& options, Connect const& connect) {
     Json const reply = connect().request({{"command", "process-list"}});
     if (options.json) {
         std::cout << reply.dump(2, ' ', false, Json::error_handler_t::replace) << '\n';
@@ -59,7 +59,7 @@ void list(Options const& options, Connect const& connect) {
     printColumns(rows, std::cout);
 }
 
-void add(Options const& options, Connect const& connect) {
+void addProcess(ProcessOptions const& options, Connect const& connect) {
     Json command = {{"command", "process-add"}};
     if (!options.name.empty()) command["name"] = options.name;
     if (options.pid != 0) command["pid"] = options.pid;
@@ -71,7 +71,7 @@ void add(Options const& options, Connect const& connect) {
 }
 
 /// A number is a process id.
-void end(Options const& options, Connect const& connect) {
+void endProcess(ProcessOptions const& options, Connect const& connect) {
     Json command = {{"command", "process-end"}};
     std::int32_t pid = 0;
     char const* const last = options.which.data() + options.which.size();
@@ -85,14 +85,14 @@ void end(Options const& options, Connect const& connect) {
 } // namespace
 
 void addProcessCommands(CLI::App& app, Connect connect, std::function<void()>& chosen) {
-    CommandGroup<Options> group(app, "process", "Processes that use the runtime library", connect,
-                                chosen);
+    CommandGroup<ProcessOptions> group(app, "process", "Processes that use the runtime library",
+                                       connect, chosen);
     auto const& options = group.options();
 
-    auto* command = group.add("list", "List the processes and their counters", list);
+    auto* command = group.add("list", "List the processes and their counters", listProcesses);
     command->add_flag("--json", options->json, "Print the reply as JSON");
 
-    command = group.add("add", "Add a process", add);
+    command = group.add("add", "Add a process", addProcess);
     auto* const which = command->add_option_group("process");
     which->add_option("--name", options->name, "Start a child with this name or path");
     which->add_option("--pid", options->pid, "A process of this host")
@@ -109,7 +109,7 @@ void addProcessCommands(CLI::App& app, Connect connect, std::function<void()>& c
                      "Its change per second as NAME=VALUE, such as TotalQueuedEvents=0.5; repeat")
         ->allow_extra_args(false);
 
-    command = group.add("end", "End a child, or remove other processes from the list", end);
+    command = group.add("end", "End a child, or remove other processes from the list", endProcess);
     command->add_option("process", options->which, "Process id or name")->required();
 }
 

@@ -20,8 +20,7 @@ using Json = nlohmann::json;
 std::string words(Json const& board, char const* attribute) {
     auto const& attributes = board.at("attributes");
     auto const found = attributes.find(attribute);
-    if (found == attributes.end()) return "-";
-    return found->is_string() ? oneLine(found->get<std::string>()) : found->dump();
+    return found == attributes.end() ? "-" : cellText(*found);
 }
 
 std::string condition(Json const& board) {

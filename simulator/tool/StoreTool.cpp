@@ -17,8 +17,8 @@ namespace {
 
 using Json = nlohmann::json;
 
-/// `Options` are the options of all commands of `kvlsim store`.
-struct Options {
+/// `StoreOptions` are the options of all commands of `kvlsim store`.
+struct StoreOptions {
     std::string serial;
     std::vector<std::string> serials;
     std::string family;
@@ -43,38 +43,35 @@ Json fieldsFrom(std::vector<std::string> const& words) {
     return fields;
 }
 
-std::string words(Json const& value) {
-    return value.is_string() ? oneLine(value.get<std::string>()) : value.dump();
-}
-
 void printStore(Json const& reply, std::ostream& out) {
-    out << "file      " << words(reply.at("file")) << "\nfamilies ";
+    out << "file      " << cellText(reply.at("file")) << "\nfamilies ";
     for (auto const& family : reply.at("families"))
-        out << ' ' << words(family.at("name"));
+        out << ' ' << cellText(family.at("name"));
     out << "\n\n";
     std::vector<TextRow> rows = {
         {"INSTANCE", "FAMILY", "SERIAL", "MODEL", "TYPE", "BOARD", "SLOT", "FIRMWARE", "VERSION"}};
     for (auto const& board : reply.at("boards")) {
         Json const& fields = board.at("fields");
-        rows.push_back({board.at("instance").dump(), words(board.at("family")),
-                        words(board.at("serial")), words(fields.at("Model")),
-                        words(fields.at("Type")), words(fields.at("BoardID")),
-                        words(fields.at("PCISlotNumber")), words(fields.at("FirmwareName")),
-                        words(fields.at("FirmwareVersion"))});
+        rows.push_back({board.at("instance").dump(), cellText(board.at("family")),
+                        cellText(board.at("serial")), cellText(fields.at("Model")),
+                        cellText(fields.at("Type")), cellText(fields.at("BoardID")),
+                        cellText(fields.at("PCISlotNumber")), cellText(fields.at("FirmwareName")),
+                        cellText(fields.at("FirmwareVersion"))});
     }
     printColumns(rows, out);
 }
 
 void printRecords(Json const& reply, std::ostream& out) {
     for (auto const& board : reply.at("boards")) {
-        out << "record " << board.at("instance").dump() << ", family " << words(board.at("family"))
-            << ", serial number " << words(board.at("serial")) << '\n';
+        out << "record " << board.at("instance").dump() << ", family "
+            << cellText(board.at("family")) << ", serial number " << cellText(board.at("serial"))
+            << '\n';
         for (auto const& [name, value] : board.at("fields").items())
-            out << "  " << std::left << std::setw(24) << name << words(value) << '\n';
+            out << "  " << std::left << std::setw(24) << name << cellText(value) << '\n';
     }
 }
 
-void list(Options const& options, Connect const& connect) {
+void listRecords(StoreOptions const& options, Connect const& connect) {
     Json command = {{"command", "store-list"}};
     if (!options.serial.empty()) command["serial"] = options.serial;
     Json const reply = connect().request(command);
@@ -86,7 +83,7 @@ void list(Options const& options, Connect const& connect) {
         printRecords(reply, std::cout);
 }
 
-void add(Options const& options, Connect const& connect) {
+void addRecord(StoreOptions const& options, Connect const& connect) {
     Json command = {{"command", "store-add"}};
     if (!options.serial.empty()) command["serial"] = options.serial;
     if (!options.family.empty()) command["family"] = options.family;
@@ -94,13 +91,13 @@ void add(Options const& options, Connect const& connect) {
     connect().request(command);
 }
 
-void set(Options const& options, Connect const& connect) {
+void setRecord(StoreOptions const& options, Connect const& connect) {
     connect().request({{"command", "store-set"},
                        {"serial", options.serial},
                        {"fields", fieldsFrom(options.fields)}});
 }
 
-void remove(Options const& options, Connect const& connect) {
+void removeRecord(StoreOptions const& options, Connect const& connect) {
     ControlClient client = connect();
     // All are looked up before the first is removed: a wrong one removes nothing.
     for (auto const& serial : options.serials)
@@ -114,15 +111,16 @@ void remove(Options const& options, Connect const& connect) {
 } // namespace
 
 void addStoreCommands(CLI::App& app, Connect connect, std::function<void()>& chosen) {
-    CommandGroup<Options> group(app, "store", "Records of the attribute store", connect, chosen);
+    CommandGroup<StoreOptions> group(app, "store", "Records of the attribute store", connect,
+                                     chosen);
     auto const& options = group.options();
     constexpr char const* serialHelp = "Serial number of the board";
 
-    auto* command = group.add("list", "List the records, or show one", list);
+    auto* command = group.add("list", "List the records, or show one", listRecords);
     command->add_option("serial", options->serial, serialHelp);
     command->add_flag("--json", options->json, "Print the reply as JSON");
 
-    command = group.add("add", "Add a board's record, or a family", add);
+    command = group.add("add", "Add a board's record, or a family", addRecord);
     auto* const serial = command->add_option("serial", options->serial, serialHelp);
     auto* const family =
         command->add_option("--family", options->family,
@@ -133,21 +131,21 @@ void addStoreCommands(CLI::App& app, Connect connect, std::function<void()>& cho
     command->callback([&chosen, options, connect, serial, family] {
         if (serial->count() + family->count() == 0)
             throw CLI::RequiredError("a serial number or --family");
-        chosen = [options, connect] { add(*options, connect); };
+        chosen = [options, connect] { addRecord(*options, connect); };
     });
 
-    command = group.add("set", "Set fields of a record", set);
+    command = group.add("set", "Set fields of a record", setRecord);
     command->add_option("serial", options->serial, serialHelp)->required();
     command->add_option("fields", options->fields, kFieldHelp)->required();
 
-    command = group.add("remove", "Remove records", remove);
+    command = group.add("remove", "Remove records", removeRecord);
     auto* const serials = command->add_option("serials", options->serials, serialHelp);
     auto* const whole =
         command->add_option("--family", options->family, "A family, removed with all its boards");
     command->callback([&chosen, options, connect, serials, whole] {
         if (serials->count() + whole->count() == 0)
             throw CLI::RequiredError("a serial number or --family");
-        chosen = [options, connect] { remove(*options, connect); };
+        chosen = [options, connect] { removeRecord(*options, connect); };
     });
 }
 

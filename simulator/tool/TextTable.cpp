@@ -5,6 +5,8 @@
 #include <algorithm>
 #include <iomanip>
 
+#include "simulator/base/Text.h"
+
 namespace kvlsim {
 
 void printColumns(std::vector<TextRow> const& rows, std::ostream& out) {
@@ -17,6 +19,11 @@ void printColumns(std::vector<TextRow> const& rows, std::ostream& out) {
             out << std::left << std::setw(static_cast<int>(widths[i])) << row[i] << "  ";
         out << row.back() << '\n';
     }
+}
+
+std::string cellText(nlohmann::json const& value) {
+    if (value.is_null()) return "-";
+    return value.is_string() ? oneLine(value.get<std::string>()) : value.dump();
 }
 
 } // namespace kvlsim

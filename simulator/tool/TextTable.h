@@ -6,11 +6,16 @@
 #include <string>
 #include <vector>
 
+#include <nlohmann/json.hpp>
+
 namespace kvlsim {
 
 using TextRow = std::vector<std::string>;
 
 /// Requires: rows of one length, and at least one.
 void printColumns(std::vector<TextRow> const& rows, std::ostream& out);
+
+/// The text of a cell: a string on one line, another value as JSON, "-" for null.
+std::string cellText(nlohmann::json const& value);
 
 } // namespace kvlsim
