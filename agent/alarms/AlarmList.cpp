@@ -76,7 +76,10 @@ std::optional<Clock::time_point> AlarmList::advance(Instant now) {
 
 void AlarmList::apply(AlarmPolicies policies, Instant now) {
     std::scoped_lock const guard(m_mutex);
+    if (policies == m_policies) return;
     m_policies = std::move(policies);
+    m_applied = now.steady;
+    ++m_version;
     m_next.reset();
     for (auto at = m_records.begin(); at != m_records.end();) {
         auto const entry = at++;
@@ -86,7 +89,6 @@ void AlarmList::apply(AlarmPolicies policies, Instant now) {
             clear(record, now);
         } else if (record.raised && record.alarm.severity != policy.severity) {
             record.alarm.severity = policy.severity;
-            ++m_version;
             m_report(AlarmEvent::SeverityChanged, record.alarm);
         }
         settleAndKeep(entry, now);
@@ -145,6 +147,16 @@ std::uint64_t AlarmList::version() const {
     return m_version;
 }
 
+AlarmList::Contents AlarmList::contents(std::uint64_t known) const {
+    std::scoped_lock const guard(m_mutex);
+    Contents contents{m_version, {}, {}, m_counts, m_policies, m_applied};
+    if (m_version == known) return contents;
+    for (auto const& [key, record] : m_records)
+        if (record.raised) contents.active.push_back({record.alarm, record.present});
+    contents.cleared.assign(m_cleared.begin(), m_cleared.end());
+    return contents;
+}
+
 void AlarmList::beginLocked(Condition const& condition, Instant now, bool again) {
     auto found = m_records.find(condition.key);
     bool const known = found != m_records.end() && found->second.present;
@@ -152,6 +164,7 @@ void AlarmList::beginLocked(Condition const& condition, Instant now, bool again)
     if (found == m_records.end()) {
         if (m_records.size() >= m_capacity) {
             ++m_counts.unlisted;
+            ++m_version;
             return;
         }
         found = m_records.try_emplace(condition.key).first;
@@ -171,6 +184,7 @@ void AlarmList::beginLocked(Condition const& condition, Instant now, bool again)
 void AlarmList::endLocked(Record& record, Instant now) {
     record.present = false;
     record.changed = now.steady;
+    if (record.raised) ++m_version;
     auto const& oldest = record.beginnings[record.next];
     if (!oldest || now.steady - *oldest >= kFlapWindow) record.flapping = false;
 }
@@ -178,6 +192,7 @@ void AlarmList::endLocked(Record& record, Instant now) {
 void AlarmList::countBeginning(Record& record, Instant now) {
     if (record.alarm.count == 0) record.alarm.began = now.date;
     ++record.alarm.count;
+    // A raised alarm shows its count, and an alarm that is held shows that it is.
     if (record.raised) ++m_version;
     record.beginnings[record.next] = now.steady;
     record.next = (record.next + 1) % kFlaps;
@@ -201,6 +216,7 @@ bool AlarmList::settle(Record& record, Instant now) {
         if (record.raised) return true;
     }
     if (lasted < quiet) return true; // remembered, to see whether it flaps
+    if (record.alarm.count > 0) ++m_version;
     m_counts.suppressed += record.alarm.count;
     return false;
 }
@@ -213,6 +229,7 @@ void AlarmList::raise(Record& record, Instant now) {
     record.alarm.severity = m_policies.of(key.kind, key.number).severity;
     record.alarm.raised = now.date;
     ++m_counts.raised;
+    m_counts.lastRaised = now.steady;
     ++m_version;
     record.alarm.number = m_report(AlarmEvent::Raised, record.alarm);
 }
@@ -222,6 +239,7 @@ void AlarmList::clear(Record& record, Instant now) {
     record.flapping = false;
     record.alarm.cleared = now.date;
     ++m_counts.cleared;
+    m_counts.lastCleared = now.steady;
     ++m_version;
     m_report(AlarmEvent::Cleared, record.alarm);
     if (m_cleared.size() >= kClearedCapacity) m_cleared.pop_front();

@@ -49,6 +49,21 @@ class AlarmList {
         std::uint32_t cleared = 0;    ///< alarms
         std::uint32_t suppressed = 0; ///< beginnings that never became an alarm
         std::uint32_t unlisted = 0;   ///< beginnings that found the list full
+        std::optional<Clock::time_point> lastRaised;
+        std::optional<Clock::time_point> lastCleared;
+    };
+    struct Active {
+        Alarm alarm;
+        bool present = true; ///< the condition; false: the alarm is held
+    };
+    /// Everything that is shown, as it was at one time.
+    struct Contents {
+        std::uint64_t version = 0; ///< grows with every change; the first one is 1
+        std::vector<Active> active;
+        std::vector<Alarm> cleared;
+        Counts counts;
+        AlarmPolicies policies;
+        std::optional<Clock::time_point> applied; ///< when the policies were changed last
     };
 
     AlarmList(AlarmPolicies policies, Report report, std::size_t capacity = kCapacity);
@@ -80,8 +95,10 @@ class AlarmList {
     /// The alarms that were cleared last, the oldest first.
     std::vector<Alarm> cleared() const;
     Counts counts() const;
-    /// Changes whenever `active` or `cleared` does.
+    /// The version of the contents.
     std::uint64_t version() const;
+    /// The contents; only their version if it is `known`.
+    Contents contents(std::uint64_t known) const;
 
   private:
     struct Record {
@@ -111,10 +128,11 @@ class AlarmList {
     std::size_t m_capacity;
     mutable std::mutex m_mutex; ///< guards what follows
     AlarmPolicies m_policies;
+    std::optional<Clock::time_point> m_applied; ///< when they were changed last
     Records m_records;
     std::deque<Alarm> m_cleared;
     Counts m_counts;
-    std::uint64_t m_version = 0;
+    std::uint64_t m_version = 1;
     std::optional<Clock::time_point> m_next; ///< not after the earliest deadline of a record
 };
 

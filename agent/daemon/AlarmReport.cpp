@@ -55,6 +55,7 @@ std::uint32_t AlarmReport::report(AlarmEvent event, Alarm const& alarm) {
 }
 
 Clock::time_point AlarmClock::advance(Snapshot const& newest, Instant now) {
+    std::uint64_t const before = m_alarms.version();
     if (!m_looked || now.steady - *m_looked >= kPause) {
         m_looked = now.steady;
         m_alarms.compare(AlarmScope::Health, m_watch.conditions(newest, now.steady), now.steady,
@@ -62,6 +63,7 @@ Clock::time_point AlarmClock::advance(Snapshot const& newest, Instant now) {
     }
     Clock::time_point const next = *m_looked + kPause;
     auto const held = m_alarms.advance(now);
+    if (m_alarms.version() != before) m_changed();
     return held ? std::min(next, *held) : next;
 }
 

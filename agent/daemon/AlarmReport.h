@@ -5,7 +5,9 @@
 #include <atomic>
 #include <chrono>
 #include <cstdint>
+#include <functional>
 #include <optional>
+#include <utility>
 
 #include "agent/alarms/AlarmList.h"
 #include "agent/alarms/AlarmSources.h"
@@ -29,8 +31,10 @@ class AlarmClock {
     /// The time between two looks at the agent's health.
     static constexpr std::chrono::seconds kPause{2};
 
-    /// Both arguments outlive the clock.
-    AlarmClock(AlarmList& alarms, Counters const& counters) : m_alarms(alarms), m_watch(counters) {}
+    /// `alarms` and `counters` outlive the clock. `changed` is called when the passing of time, or
+    /// the agent's health, has changed the alarms.
+    AlarmClock(AlarmList& alarms, Counters const& counters, std::function<void()> changed)
+        : m_alarms(alarms), m_watch(counters), m_changed(std::move(changed)) {}
 
     /// Returns the time of the next call.
     Clock::time_point advance(Snapshot const& newest, Instant now);
@@ -38,6 +42,7 @@ class AlarmClock {
   private:
     AlarmList& m_alarms;
     HealthWatch m_watch;
+    std::function<void()> m_changed;
     std::optional<Clock::time_point> m_looked; ///< at the agent's health
 };
 

@@ -22,6 +22,7 @@
 #include "agent/daemon/Platform.h"
 #include "agent/daemon/ServiceNotice.h"
 #include "agent/daemon/Signals.h"
+#include "agent/daemon/StaleSnapshot.h"
 #include "agent/fronts/Wakeup.h"
 #include "agent/log/Log.h"
 #include "agent/notifications/CallWatch.h"
@@ -221,6 +222,8 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
                           [] { return std::time(nullptr); });
     LinkWatch links(boards.settings, boards.queue, boards.counters);
     CallWatch calls(boards.settings, boards.queue, boards.counters);
+    AlarmTables alarmTables(boards.alarms, options.enterprise, started);
+    StaleSnapshot staleSnapshot(alarmTables);
     Collector collector(
         [&](Snapshot& snapshot) {
             keptSettings.save();
@@ -244,6 +247,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             links.update(snapshot.interfaces.interfaces, snapshot.begun);
             calls.update(snapshot.interfaces.bearers, snapshot.begun);
             boards.alarmEvents.update(snapshot);
+            snapshot.alarms = alarmTables.rows();
             snapshot.entities = entities.read(snapshot);
             noteWhereabouts(snapshot);
             if (!options.agentx.empty())
@@ -262,7 +266,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     front.serve({trees, boards.counters,
                  [&] {
                      ++boards.counters.requests;
-                     return collector.snapshot();
+                     return staleSnapshot.of(collector.snapshot(), Clock::now());
                  },
                  [&] { return collector.newest(); }, boards.settings,
                  capabilities(options.enterprise, KVLOAM_VERSION)});
@@ -271,7 +275,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
         nameSubject(notification, trees, {*snapshot, boards.counters, &boards.settings});
     });
     EntityNotices entityNotices(boards.queue);
-    AlarmClock alarmClock(boards.alarms, boards.counters);
+    AlarmClock alarmClock(boards.alarms, boards.counters, [&] { collector.renew(); });
     ServiceNotice notice;
     std::string const serving =
         "serving " + std::to_string(collector.newest()->boards.size()) + " boards " + front.place();

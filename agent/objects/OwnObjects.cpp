@@ -4,9 +4,9 @@
 namespace kvloamd {
 
 std::vector<Table const*> tables() {
-    return {&boardTable(),          &moduleTable(),    &serviceTable(),  &deviceTable(),
-            &subDeviceTable(),      &processorTable(), &storeTable(),    &processTable(),
-            &resourceDeviceTable(), &faultTable(),     &interfaceTable()};
+    return {&boardTable(),          &moduleTable(),    &serviceTable(),   &deviceTable(),
+            &subDeviceTable(),      &processorTable(), &storeTable(),     &processTable(),
+            &resourceDeviceTable(), &faultTable(),     &interfaceTable(), &alarmTable()};
 }
 
 } // namespace kvloamd

@@ -29,6 +29,7 @@ Table const& processTable();
 Table const& resourceDeviceTable();
 Table const& faultTable();
 Table const& interfaceTable();
+Table const& alarmTable();
 
 /// Every table.
 std::vector<Table const*> tables();

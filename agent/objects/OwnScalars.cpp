@@ -112,6 +112,25 @@ std::span<Scalar const> scalars() {
          about("How many times a fault was raised that kvlFaultTable does not list because it was "
                "full")
              .in("faults")},
+        {"kvlAlarmCount",
+         {1, 1, 12, 1},
+         ValueType::Gauge,
+         [](Facts const& facts) { return size(facts.snapshot.alarms->alarms); },
+         about("The number of active alarms").in("alarms")},
+        {"kvlAlarmsRaised",
+         {1, 1, 12, 2},
+         ValueType::Counter,
+         [](Facts const& facts) -> Value {
+             return std::int64_t{facts.snapshot.alarms->stats.front().raised};
+         },
+         about("How many alarms have been raised since the agent's start").in("alarms")},
+        {"kvlAlarmsSuppressed",
+         {1, 1, 12, 3},
+         ValueType::Counter,
+         [](Facts const& facts) -> Value {
+             return std::int64_t{facts.snapshot.alarms->suppressed};
+         },
+         about("How many times something was wrong that never became an alarm").in("times")},
         {"kvlAgentUpTime",
          {1, 1, 9, 1},
          ValueType::TimeTicks,

@@ -39,6 +39,32 @@ std::span<Scalar const> standardScalars() {
              return std::int64_t{facts.snapshot.entities.lastChange};
          },
          about("The value of sysUpTime when an entity last changed")},
+        {"alarmModelLastChanged",
+         {118, 1, 1, 1},
+         ValueType::TimeStamp,
+         [](Facts const& facts) -> Value {
+             return std::int64_t{facts.snapshot.alarms->modelChange};
+         },
+         about("The value of sysUpTime when the kinds of alarms last changed")},
+        {"alarmActiveLastChanged",
+         {118, 1, 2, 1},
+         ValueType::TimeStamp,
+         [](Facts const& facts) -> Value {
+             return std::int64_t{facts.snapshot.alarms->lastChange};
+         },
+         about("The value of sysUpTime when an alarm was last raised or cleared")},
+        {"alarmActiveOverflow",
+         {118, 1, 2, 5},
+         ValueType::Counter,
+         [](Facts const& facts) -> Value { return std::int64_t{facts.snapshot.alarms->unlisted}; },
+         about("How many alarms were not listed because the list was full").in("active alarms")},
+        {"alarmClearMaximum",
+         {118, 1, 3, 1},
+         ValueType::Gauge,
+         [](Facts const& facts) -> Value {
+             return std::int64_t{facts.snapshot.alarms->clearedMaximum};
+         },
+         about("How many cleared alarms are kept at most").in("alarms")},
     };
     return described;
 }
@@ -64,7 +90,12 @@ std::vector<Table const*> standardTables() {
             &entPhysicalTable(),
             &entAliasMappingTable(),
             &entPhysicalContainsTable(),
-            &entStateTable()};
+            &entStateTable(),
+            &alarmModelTable(),
+            &alarmActiveTable(),
+            &alarmActiveVariableTable(),
+            &alarmActiveStatsTable(),
+            &alarmClearTable()};
 }
 
 } // namespace kvloamd

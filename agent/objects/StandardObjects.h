@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The objects of the standard MIB modules: lines, channels, interfaces and physical entities.
+// The objects of the standard MIB modules: lines, channels, interfaces, physical entities, alarms.
 #pragma once
 
 #include <array>
@@ -14,7 +14,7 @@ namespace kvloamd {
 inline Oid const kStandardArc{1, 3, 6, 1, 2, 1};
 
 /// The places that the agent takes over, relative, and no others below the arc.
-inline std::array<Place, 15> const kStandardPlaces{{
+inline std::array<Place, 16> const kStandardPlaces{{
     {{2, 1}, "ifNumber", HostHas::All},
     {{2, 2}, "ifTable", HostHas::Rows},
     {{10, 7, 2}, "dot3StatsTable", HostHas::Rows},
@@ -29,6 +29,7 @@ inline std::array<Place, 15> const kStandardPlaces{{
     {{31, 1, 5}, "ifTableLastChange", HostHas::All},
     {{31, 1, 6}, "ifStackLastChange"},
     {{47, 1}, "ENTITY-MIB"},
+    {{118, 1}, "ALARM-MIB"},
     {{131, 1}, "ENTITY-STATE-MIB"},
 }};
 
@@ -55,6 +56,11 @@ Table const& entPhysicalTable();
 Table const& entAliasMappingTable();
 Table const& entPhysicalContainsTable();
 Table const& entStateTable();
+Table const& alarmModelTable();
+Table const& alarmActiveTable();
+Table const& alarmActiveVariableTable();
+Table const& alarmActiveStatsTable();
+Table const& alarmClearTable();
 
 /// Every table.
 std::vector<Table const*> standardTables();

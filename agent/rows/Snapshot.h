@@ -7,6 +7,7 @@
 #include <memory>
 #include <vector>
 
+#include "agent/rows/AlarmRows.h"
 #include "agent/rows/BoardRow.h"
 #include "agent/rows/Clock.h"
 #include "agent/rows/Counters.h"
@@ -32,6 +33,7 @@ struct Snapshot {
     std::vector<ProcessRow> processes;
     std::vector<ResourceRow> resources;
     Faults faults;
+    std::shared_ptr<AlarmRows const> alarms = std::make_shared<AlarmRows>();              ///< set
     std::shared_ptr<PlatformRecords const> records = std::make_shared<PlatformRecords>(); ///< set
     InterfaceRows interfaces;
     EntityRows entities;

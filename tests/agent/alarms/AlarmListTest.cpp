@@ -239,16 +239,16 @@ TEST_F(AlarmListTest, NextDeadlineIsThatOfTheEarliestHeldAlarm) {
 }
 
 TEST_F(AlarmListTest, VersionChangesWithWhatIsShown) {
-    auto const before = m_list.version();
+    auto const before = m_list.contents(0).version;
     begin(m_los);
-    auto const raised = m_list.version();
+    auto const raised = m_list.contents(0).version;
     EXPECT_NE(raised, before);
     begin(m_los);
-    EXPECT_EQ(m_list.version(), raised);
+    EXPECT_EQ(m_list.contents(0).version, raised);
     Condition other = m_los;
     other.text = "something else";
     begin(other);
-    EXPECT_NE(m_list.version(), raised);
+    EXPECT_NE(m_list.contents(0).version, raised);
 }
 
 } // namespace

@@ -1,0 +1,72 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The tables of alarms.
+#include <gmock/gmock.h>
+
+#include "tests/e2e/AgentFixture.h"
+
+namespace kvloamd::e2e {
+namespace {
+
+using ::testing::Contains;
+using ::testing::ElementsAre;
+using ::testing::EndsWith;
+using ::testing::HasSubstr;
+using ::testing::IsEmpty;
+using ::testing::SizeIs;
+using ::testing::UnorderedElementsAre;
+
+class AlarmTest : public AgentFixture {
+  protected:
+    static constexpr char kActiveDescription[] = "1.3.6.1.2.1.118.1.2.2.1.11";
+    static constexpr char kClearLogIndex[] = "1.3.6.1.2.1.118.1.3.2.1.9";
+
+    /// The values of a column, in the order of its rows.
+    std::vector<std::string> column(std::string const& name) const {
+        std::vector<std::string> values;
+        for (Answer const& answer : walk(name))
+            if (!answer.value.starts_with("No Such")) values.push_back(answer.value);
+        return values;
+    }
+};
+
+TEST_F(AlarmTest, FailedBoardIsAnActiveAlarmAndThenACleared) {
+    startAgent();
+    EXPECT_THAT(column("kvlAlarmKind"), IsEmpty());
+    sim({"fail", "2"});
+    ASSERT_TRUE(eventually([this] { return column("kvlAlarmKind").size() == 1; }));
+    EXPECT_THAT(column("kvlAlarmKind"), ElementsAre("STRING: boardFailed"));
+    EXPECT_THAT(column("kvlAlarmSeverity"), ElementsAre("INTEGER: critical(3)"));
+    EXPECT_THAT(column("kvlAlarmBoardIndex"), ElementsAre("INTEGER: 2"));
+    EXPECT_THAT(column("kvlAlarmIfIndex"), IsEmpty());
+    EXPECT_THAT(column(kActiveDescription),
+                ElementsAre(HasSubstr("boardFailed on board QL-77-0420: ")));
+    auto const active = walk(kActiveDescription);
+    auto const number = walk("kvlAlarmKind");
+    EXPECT_EQ(active.front().name.back(), number.front().name.back());
+    sim({"start", "2"});
+    EXPECT_TRUE(eventually([this] { return column("kvlAlarmKind").empty(); }));
+    EXPECT_THAT(column(kActiveDescription), IsEmpty());
+    auto const cleared = walk(kClearLogIndex);
+    ASSERT_THAT(cleared, SizeIs(1));
+    EXPECT_EQ(cleared.front().name.back(), active.front().name.back());
+}
+
+TEST_F(AlarmTest, EveryAlarmOfALineIsARow) {
+    startAgent();
+    sim({"line", "alarm", "101", "los"});
+    ASSERT_TRUE(eventually([this] { return get("kvlAlarmCount.0") == "Gauge32: 5 alarms"; }));
+    EXPECT_THAT(column("kvlAlarmKind"),
+                UnorderedElementsAre("STRING: platformFault", "STRING: platformFault",
+                                     "STRING: dsx1LossOfFrame", "STRING: dsx1LossOfSignal",
+                                     "STRING: dsx1UnavailSigState"));
+}
+
+TEST_F(AlarmTest, ModelDescribesEveryKind) {
+    startAgent();
+    EXPECT_THAT(column("1.3.6.1.2.1.118.1.1.2.1.6"),
+                Contains(EndsWith("\"linkDown (major): the interface is down although "
+                                  "nobody switched it off\"")));
+}
+
+} // namespace
+} // namespace kvloamd::e2e
