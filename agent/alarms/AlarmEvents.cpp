@@ -53,9 +53,10 @@ void AlarmEvents::boardStatus(int boardIndex, Board& board, BoardStatusEnum stat
         return condition;
     };
     bool const ordered = status != BoardStatusStopped || stopWasOrdered(board);
-    log(status == BoardStatusFailed ? LogLevel::Warning : LogLevel::Info,
-        condition.resource + ": " + statusName(status) +
-            (ordered ? "" : ", although nobody ordered it"),
+    std::string const text = condition.resource + ": " + statusName(status) +
+                             (ordered ? "" : ", although nobody ordered it");
+    if (m_note) m_note(text, name);
+    log(status == BoardStatusFailed ? LogLevel::Warning : LogLevel::Info, text,
         {{"KVL_BOARD", name}, {"KVL_BOARD_STATUS", statusName(status)}});
     Instant const now = Instant::now();
     if (status == BoardStatusStopped || status == BoardStatusStarted || status == BoardStatusFailed)

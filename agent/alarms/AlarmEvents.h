@@ -3,9 +3,11 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <map>
 #include <mutex>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "agent/alarms/AlarmList.h"
@@ -20,8 +22,11 @@ namespace kvloamd {
 /// threads use it until the process ends. Thread-safe.
 class AlarmEvents {
   public:
-    /// `list` lives as long as the process.
-    explicit AlarmEvents(AlarmList& list) : m_list(list) {}
+    /// Receives every status change of a board in words, on the thread that reported it.
+    using Note = std::function<void(std::string const& text, std::string const& board)>;
+
+    /// `list` lives as long as the process. `note` may be empty.
+    explicit AlarmEvents(AlarmList& list, Note note = {}) : m_list(list), m_note(std::move(note)) {}
 
     /// The board has changed its status.
     void boardStatus(int boardIndex, Board& board, BoardStatusEnum status);
@@ -53,6 +58,7 @@ class AlarmEvents {
     KnownBoard known(std::uint32_t boardIndex);
 
     AlarmList& m_list;
+    Note const m_note;
     std::mutex m_mutex;                           ///< guards what follows
     std::map<std::uint32_t, Line> m_lines;        ///< by ifIndex, of the newest snapshot
     std::map<std::uint32_t, KnownBoard> m_boards; ///< by board index

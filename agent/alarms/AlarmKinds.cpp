@@ -62,7 +62,7 @@ constexpr AlarmKindInfo kKinds[] = {
     {StoreUnreadable, "agentStoreUnreadable", Warning, seconds(0), seconds(0), Snapshot,
      "the platform's attribute store cannot be read"},
     {PersistenceFailing, "agentPersistenceFailing", Minor, seconds(0), seconds(0), Health,
-     "indices and settings are not kept across restarts"},
+     "indices, settings or the journal are not kept across restarts"},
     {NotificationsDropped, "agentNotificationsDropped", Minor, seconds(0), seconds(0), Health,
      "notifications were dropped because too many waited"},
     {MasterLost, "agentMasterLost", Major, seconds(10), seconds(0), Health,

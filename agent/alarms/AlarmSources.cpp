@@ -189,7 +189,8 @@ std::vector<Condition> conditionsIn(Snapshot const& snapshot, std::vector<Condit
     return reading.take();
 }
 
-std::vector<Condition> HealthWatch::conditions(Snapshot const& newest, Clock::time_point now) {
+std::vector<Condition> HealthWatch::conditions(Snapshot const& newest, Clock::time_point now,
+                                               bool journalFails) {
     std::vector<Condition> conditions;
     if (now - newest.begun >= kStale)
         conditions.push_back(agentCondition(AlarmKind::SnapshotStale));
@@ -198,6 +199,9 @@ std::vector<Condition> HealthWatch::conditions(Snapshot const& newest, Clock::ti
                                             newest.persistence == Persistence::InUse
                                                 ? "another process has locked a file"
                                                 : "a file cannot be read or written"));
+    else if (journalFails)
+        conditions.push_back(
+            agentCondition(AlarmKind::PersistenceFailing, "the journal cannot be written"));
     if (std::uint32_t const dropped = m_counters.notificationsDropped; dropped != m_dropped) {
         m_dropped = dropped;
         m_lastDropped = now;

@@ -52,7 +52,9 @@ class HealthWatch {
     /// `counters` outlives the watch.
     explicit HealthWatch(Counters const& counters) : m_counters(counters) {}
 
-    std::vector<Condition> conditions(Snapshot const& newest, Clock::time_point now);
+    /// `journalFails`: the journal cannot be written.
+    std::vector<Condition> conditions(Snapshot const& newest, Clock::time_point now,
+                                      bool journalFails);
 
   private:
     Counters const& m_counters;

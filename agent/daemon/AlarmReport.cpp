@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <string>
+#include <variant>
 
 #include "agent/log/Log.h"
 
@@ -22,6 +23,18 @@ char const* eventName(AlarmEvent event) {
     return "changed";
 }
 
+JournalEvent journalEvent(AlarmEvent event) {
+    switch (event) {
+    case AlarmEvent::Raised:
+        return JournalEvent::AlarmRaised;
+    case AlarmEvent::Cleared:
+        return JournalEvent::AlarmCleared;
+    case AlarmEvent::SeverityChanged:
+        break;
+    }
+    return JournalEvent::AlarmChanged;
+}
+
 LogLevel levelOf(AlarmEvent event, AlarmSeverity severity) {
     if (event == AlarmEvent::Cleared) return LogLevel::Info;
     if (severity == AlarmSeverity::Critical) return LogLevel::Error;
@@ -39,32 +52,113 @@ std::string textOf(AlarmEvent event, Alarm const& alarm, AlarmKindInfo const& ki
     return text;
 }
 
+std::string textOf(SettingKey const& key) {
+    std::string const index = std::to_string(key.index);
+    switch (key.setting) {
+    case Setting::LineStatusChangeTraps:
+        return "dsx1LineStatusChangeTrapEnable." + index;
+    case Setting::LinkUpDownTraps:
+        return "ifLinkUpDownTrapEnable." + index;
+    case Setting::InterfaceAlias:
+        return "ifAlias." + index;
+    case Setting::CircuitIdentifier:
+        return "dsx1CircuitIdentifier." + index;
+    case Setting::CallInformationTraps:
+        return "isdnSignalingInfoTrapEnable." + index;
+    case Setting::EntityAlias:
+        return "entPhysicalAlias." + index;
+    case Setting::EntityAssetId:
+        return "entPhysicalAssetID." + index;
+    case Setting::EntityUris:
+        return "entPhysicalUris." + index;
+    }
+    return "setting " + std::to_string(static_cast<int>(key.setting)) + "." + index;
+}
+
+std::string textOf(SettingValue const& value) {
+    if (auto const* const number = std::get_if<int>(&value)) return std::to_string(*number);
+    return "'" + std::get<std::string>(value) + "'";
+}
+
+/// The entry with this key of `all`, which are ascending by key; null when there is none.
+SettingEntry const* find(std::vector<SettingEntry> const& all, SettingKey const& key) {
+    auto const found = std::ranges::lower_bound(all, key, {}, &SettingEntry::key);
+    return found == all.end() || found->key != key ? nullptr : &*found;
+}
+
 } // namespace
 
+std::vector<Alarm> AlarmReport::open(std::string const& directory) {
+    m_journal =
+        std::make_unique<Journal>(directory.empty() ? directory : directory + "/journal.sqlite");
+    note(JournalEvent::AgentStarted, "the agent has started");
+    return m_journal->formerAlarms();
+}
+
+void AlarmReport::close(std::vector<Alarm> const& active) {
+    note(JournalEvent::AgentStopped, "the agent stops");
+    m_journal->close(active);
+}
+
+void AlarmReport::note(JournalEvent event, std::string const& text, std::string const& board) {
+    JournalEntry entry;
+    entry.event = event;
+    entry.date = std::chrono::system_clock::now();
+    entry.text = text;
+    entry.board = board;
+    m_journal->append(std::move(entry));
+}
+
 std::uint32_t AlarmReport::report(AlarmEvent event, Alarm const& alarm) {
-    std::uint32_t const number = ++m_last;
     AlarmKindInfo const& kind = alarmKind(alarm.condition.key.kind);
     std::uint32_t const ifIndex = alarm.condition.ifIndex;
-    log(levelOf(event, alarm.severity), textOf(event, alarm, kind),
+    std::string const text = textOf(event, alarm, kind);
+    log(levelOf(event, alarm.severity), text,
         {{"KVL_ALARM", kind.name},
          {"KVL_ALARM_EVENT", eventName(event)},
          {"KVL_SEVERITY", severityName(alarm.severity)},
          {"KVL_BOARD", alarm.condition.key.board},
          {"KVL_LINE", ifIndex == 0 ? std::string() : std::to_string(ifIndex)}});
-    return number;
+    JournalEntry entry;
+    entry.event = journalEvent(event);
+    entry.date = std::chrono::system_clock::now();
+    entry.text = text;
+    entry.board = alarm.condition.key.board;
+    entry.ifIndex = ifIndex;
+    entry.alarm = alarm;
+    return m_journal->append(std::move(entry));
 }
 
 Clock::time_point AlarmClock::advance(Snapshot const& newest, Instant now) {
     std::uint64_t const before = m_alarms.version();
     if (!m_looked || now.steady - *m_looked >= kPause) {
         m_looked = now.steady;
-        m_alarms.compare(AlarmScope::Health, m_watch.conditions(newest, now.steady), now.steady,
-                         now);
+        m_alarms.compare(AlarmScope::Health,
+                         m_watch.conditions(newest, now.steady, m_report.counts().failing),
+                         now.steady, now);
     }
     Clock::time_point const next = *m_looked + kPause;
     auto const held = m_alarms.advance(now);
     if (m_alarms.version() != before) m_changed();
     return held ? std::min(next, *held) : next;
+}
+
+void SettingsWatch::update() {
+    std::vector<SettingEntry> all = m_settings.all(SettingIndex::Interface);
+    for (SettingEntry& entry : m_settings.all(SettingIndex::Entity))
+        all.push_back(std::move(entry));
+    if (m_former) {
+        // Both are ascending by key: settings of interfaces have the lower numbers.
+        for (SettingEntry const& entry : all)
+            if (auto const* const former = find(*m_former, entry.key);
+                former == nullptr || former->value != entry.value)
+                m_report.note(JournalEvent::Setting,
+                              textOf(entry.key) + " is now " + textOf(*entry.value));
+        for (SettingEntry const& entry : *m_former)
+            if (find(all, entry.key) == nullptr)
+                m_report.note(JournalEvent::Setting, textOf(entry.key) + " is not set any more");
+    }
+    m_former = std::move(all);
 }
 
 } // namespace kvloamd

@@ -86,7 +86,9 @@ struct Boards {
     AlarmList alarms{{}, [this](AlarmEvent event, Alarm const& alarm) {
                          return alarmReport.report(event, alarm);
                      }};
-    AlarmEvents alarmEvents{alarms};
+    AlarmEvents alarmEvents{alarms, [this](std::string const& text, std::string const& board) {
+                                alarmReport.note(JournalEvent::BoardStatus, text, board);
+                            }};
     FaultLog faults;
     StatusListener listener;
     LineListener lines{*manager.get(), settings, queue, counters};
@@ -157,7 +159,7 @@ Deadline earliest(Deadline const& one, Deadline const& other) {
 
 /// Reads the options again and applies those that can change while the agent runs. The others need
 /// a restart.
-void reloadOptions(Options const& started, ReadOptions const& readAgain) {
+void reloadOptions(Options const& started, ReadOptions const& readAgain, Boards& boards) {
     auto const read = readAgain();
     auto const* const options = std::get_if<Options>(&read);
     if (options == nullptr) {
@@ -165,11 +167,14 @@ void reloadOptions(Options const& started, ReadOptions const& readAgain) {
         return;
     }
     setLogLevel(options->logLevel);
+    boards.alarms.apply(options->alarmPolicies, Instant::now());
     Options now = *options;
     now.logLevel = started.logLevel;
-    log(LogLevel::Info, now == started ? "the configuration has been read again"
-                                       : "the configuration has been read again; changes other "
-                                         "than the log level take effect at the next start");
+    now.alarmPolicies = started.alarmPolicies;
+    log(LogLevel::Info, now == started
+                            ? "the configuration has been read again"
+                            : "the configuration has been read again; changes other than the log "
+                              "level and alarms take effect at the next start");
 }
 
 /// Reads the SNMP configuration again, of which a check has found `fault`.
@@ -220,12 +225,14 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     entityFile.open();
     EntityReader entities(entityIndices, boards.settings, started,
                           [] { return std::time(nullptr); });
+    SettingsWatch settingsWatch(boards.settings, boards.alarmReport);
     LinkWatch links(boards.settings, boards.queue, boards.counters);
     CallWatch calls(boards.settings, boards.queue, boards.counters);
     AlarmTables alarmTables(boards.alarms, options.enterprise, started);
     StaleSnapshot staleSnapshot(alarmTables);
     Collector collector(
         [&](Snapshot& snapshot) {
+            settingsWatch.update();
             keptSettings.save();
             keptEntitySettings.save();
             snapshot.boards = boards.source.read();
@@ -275,7 +282,8 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
         nameSubject(notification, trees, {*snapshot, boards.counters, &boards.settings});
     });
     EntityNotices entityNotices(boards.queue);
-    AlarmClock alarmClock(boards.alarms, boards.counters, [&] { collector.renew(); });
+    AlarmClock alarmClock(boards.alarms, boards.alarmReport, boards.counters,
+                          [&] { collector.renew(); });
     ServiceNotice notice;
     std::string const serving =
         "serving " + std::to_string(collector.newest()->boards.size()) + " boards " + front.place();
@@ -285,7 +293,9 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
         while (auto const signal = signals.next()) {
             if (*signal == Signal::Stop) return front.stop();
             notice.reloading();
-            reloadOptions(options, readAgain);
+            reloadOptions(options, readAgain, boards);
+            boards.alarmReport.note(JournalEvent::Configuration,
+                                    "the configuration was read again");
             if (options.agentx.empty())
                 configCheck.start();
             else
@@ -348,6 +358,9 @@ int runDaemon(Options const& options, ReadOptions const& readAgain) {
         if (!front->open()) return kExitFailure;
         // The SNMP configuration may name another one.
         if (persistentDirectory(files) != directory) reserved.emplace(persistentDirectory(files));
+        boards->alarms.apply(options.alarmPolicies, Instant::now());
+        boards->alarms.restore(boards->alarmReport.open(persistentDirectory(files)),
+                               Instant::now());
         step = "connecting to the board platform";
         if (!schedulerRuns() || !platformAnswers()) return kExitFailure;
         boards->counters.started = Clock::now();
@@ -355,6 +368,7 @@ int runDaemon(Options const& options, ReadOptions const& readAgain) {
         attachModules(modules, *boards);
         step = "serving";
         serve(options, readAgain, *front, signals, start, *boards);
+        boards->alarmReport.close(boards->alarms.active());
         log(LogLevel::Info, "stopped");
     } catch (std::bad_alloc const&) {
         logLack("memory", step);

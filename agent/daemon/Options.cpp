@@ -36,6 +36,10 @@ std::string checkLogLevel(std::string const& text) {
                : "'" + text + "' is not a log level; write error, warning, info or debug";
 }
 
+std::string checkAlarm(std::string const& text) {
+    return AlarmPolicies().configure(text);
+}
+
 /// The SNMP library takes an empty address for port 161 on all interfaces.
 std::string checkAddress(std::string const& text) {
     return text.empty() ? "the address is empty; write it like udp:127.0.0.1:1161" : std::string();
@@ -187,6 +191,13 @@ std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
         ->type_name("error|warning|info|debug")
         ->check(checkLogLevel)
         ->capture_default_str();
+    std::vector<std::string> alarms;
+    app.add_option(
+           "--alarm", alarms,
+           "Severity and hold times of a kind of alarm, as in linkDown=minor,raise=5,clear=60 "
+           "or agentStoreUnreadable=off; repeatable")
+        ->type_name("KIND=POLICY")
+        ->check(checkAlarm);
     app.add_flag("--check-config", options.checkConfig,
                  "Check options, modules and configuration, then exit")
         ->configurable(false);
@@ -218,6 +229,13 @@ std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
         if (int const line = config->lineOf(text); line > 0)
             return Exit{kExitFailure, inFile(line) + text};
         return Exit{kExitUsage, std::move(text) + "; try kvloamd --help"};
+    }
+    for (std::string const& alarm : alarms) {
+        std::string const fault = options.alarmPolicies.configure(alarm);
+        if (fault.empty()) continue;
+        if (int const line = config->lineOf("--alarm: "); line > 0)
+            return Exit{kExitFailure, inFile(line) + "--alarm: " + fault};
+        return Exit{kExitUsage, "--alarm: " + fault + "; try kvloamd --help"};
     }
     options.logLevel = kLogLevels.at(CLI::detail::to_lower(logLevel));
     if (agentxOption->count() > 0 && options.agentx.empty()) options.agentx = kMasterAddress;

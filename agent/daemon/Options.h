@@ -7,6 +7,7 @@
 #include <variant>
 #include <vector>
 
+#include "agent/alarms/AlarmPolicies.h"
 #include "agent/log/Log.h"
 #include "agent/rows/Oid.h"
 
@@ -22,6 +23,7 @@ struct Options {
     Oid enterprise{1, 3, 6, 1, 4, 1, 32473};
     std::uint32_t interfaceBase = 1000;
     LogLevel logLevel = LogLevel::Info;
+    AlarmPolicies alarmPolicies;
     bool checkConfig = false;
     bool checkSnmpConfig = false; ///< check only what a reload reads; for the agent itself
 

@@ -19,9 +19,10 @@ namespace kvloamd {
 
 namespace {
 
-constexpr char const* kFiles[] = {"kvloamd.conf",   "kvloamd.lock",
-                                  "ifindex.sqlite", "ifindex.sqlite-journal",
-                                  "entity.sqlite",  "entity.sqlite-journal"};
+constexpr char const* kFiles[] = {
+    "kvloamd.conf",           "kvloamd.lock",       "ifindex.sqlite",
+    "ifindex.sqlite-journal", "entity.sqlite",      "entity.sqlite-journal",
+    "journal.sqlite",         "journal.sqlite-wal", "journal.sqlite-shm"};
 
 [[noreturn]] void refuse(std::string const& path, std::string const& why) {
     throw std::runtime_error(path + ": " + why +

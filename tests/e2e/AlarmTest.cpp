@@ -1,5 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The tables of alarms.
+#include <csignal>
+
 #include <gmock/gmock.h>
 
 #include "tests/e2e/AgentFixture.h"
@@ -66,6 +68,63 @@ TEST_F(AlarmTest, ModelDescribesEveryKind) {
     EXPECT_THAT(column("1.3.6.1.2.1.118.1.1.2.1.6"),
                 Contains(EndsWith("\"linkDown (major): the interface is down although "
                                   "nobody switched it off\"")));
+}
+
+TEST_F(AlarmTest, AlarmIsTheSameAfterARestart) {
+    startAgent();
+    sim({"fail", "2"});
+    ASSERT_TRUE(eventually([this] { return column("kvlAlarmKind").size() == 1; }));
+    auto const before = walk(kActiveDescription);
+    EXPECT_EQ(stopAgent(), 0);
+    useChassis(
+        "boards:\n"
+        "  - {handle: 2, attributes: {SERIAL_NUMBER: \"QL-77-0420\", BOARD_CONDITION: 15}}\n");
+    startAgent();
+    EXPECT_EQ(walk(kActiveDescription).front().name, before.front().name);
+}
+
+TEST_F(AlarmTest, AlarmWhoseCauseHasGoneDuringARestartIsCleared) {
+    startAgent();
+    sim({"fail", "2"});
+    ASSERT_TRUE(eventually([this] { return column("kvlAlarmKind").size() == 1; }));
+    agent().signal(SIGKILL);
+    agent().wait();
+    startAgent();
+    EXPECT_THAT(column("kvlAlarmKind"), IsEmpty());
+    EXPECT_THAT(walk(kClearLogIndex), SizeIs(1));
+}
+
+TEST_F(AlarmTest, BoardThatHasGoneIsStillMissedAfterARestart) {
+    startAgent();
+    sim({"remove", "2"});
+    ASSERT_TRUE(eventually([this] { return column("kvlAlarmKind").size() == 1; }));
+    EXPECT_EQ(stopAgent(), 0);
+    useChassis("boards:\n  - {handle: 7, attributes: {SERIAL_NUMBER: \"S7\"}}\n");
+    startAgent();
+    EXPECT_THAT(column("kvlAlarmKind"), ElementsAre("STRING: boardGone"));
+}
+
+TEST_F(AlarmTest, SeverityIsConfiguredAndReadAgain) {
+    auto const configure = [this](std::string const& policy) {
+        write(path("kvloamd.toml"), "alarm = [\"boardFailed=" + policy + "\"]\n");
+    };
+    configure("minor");
+    startAgent({"--config", path("kvloamd.toml")});
+    sim({"fail", "2"});
+    ASSERT_TRUE(eventually([this] { return column("kvlAlarmSeverity").size() == 1; }));
+    EXPECT_THAT(column("kvlAlarmSeverity"), ElementsAre("INTEGER: minor(5)"));
+    configure("warning");
+    agent().signal(SIGHUP);
+    EXPECT_TRUE(eventually([this] {
+        return column("kvlAlarmSeverity") == std::vector<std::string>{"INTEGER: warning(6)"};
+    }));
+    configure("loud");
+    agent().signal(SIGHUP);
+    EXPECT_TRUE(agent().waitFor("kvloamd.toml:1: "));
+    EXPECT_THAT(column("kvlAlarmSeverity"), ElementsAre("INTEGER: warning(6)"));
+    configure("off");
+    agent().signal(SIGHUP);
+    EXPECT_TRUE(eventually([this] { return column("kvlAlarmSeverity").empty(); }));
 }
 
 } // namespace

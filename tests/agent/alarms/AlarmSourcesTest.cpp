@@ -193,7 +193,7 @@ TEST(LineAlarmsTest, AgreeWithTheAlarmsOfEntities) {
 class HealthWatchTest : public ::testing::Test {
   protected:
     std::vector<std::string> conditions(std::chrono::seconds after = {}) {
-        return texts(m_watch.conditions(m_newest, m_now + after));
+        return texts(m_watch.conditions(m_newest, m_now + after, m_journalFails));
     }
 
     Clock::time_point const m_now = Clock::time_point(std::chrono::hours(1));
@@ -202,6 +202,7 @@ class HealthWatchTest : public ::testing::Test {
         snapshot.begun = m_now;
         return snapshot;
     }();
+    bool m_journalFails = false;
     Counters m_counters;
     HealthWatch m_watch{m_counters};
 };
@@ -220,6 +221,12 @@ TEST_F(HealthWatchTest, FileThatIsNotWrittenIsNamed) {
     m_newest.persistence = Persistence::InUse;
     EXPECT_THAT(conditions(), ElementsAre("agentPersistenceFailing of agent "
                                           "(another process has locked a file)"));
+}
+
+TEST_F(HealthWatchTest, JournalThatIsNotWrittenIsNamed) {
+    m_journalFails = true;
+    EXPECT_THAT(conditions(), ElementsAre("agentPersistenceFailing of agent "
+                                          "(the journal cannot be written)"));
 }
 
 TEST_F(HealthWatchTest, DroppedNotificationsAreRememberedForFiveMinutes) {

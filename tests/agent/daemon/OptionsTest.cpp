@@ -185,6 +185,35 @@ TEST_F(OptionsTest, LogLevelOfTheFileThatDoesNotExistIsNamedWithTheOnesThatDo) {
                       HasSubstr("error, warning, info or debug")));
 }
 
+TEST_F(OptionsTest, AlarmsAreConfiguredOnTheCommandLine) {
+    Options const read =
+        options({"--alarm", "linkDown=minor,raise=5", "--alarm", "agentStoreUnreadable=off"});
+    EXPECT_EQ(read.alarmPolicies.of(AlarmKind::LinkDown, 1),
+              (AlarmPolicy{AlarmSeverity::Minor, std::chrono::seconds(5)}));
+    EXPECT_FALSE(read.alarmPolicies.of(AlarmKind::StoreUnreadable, 0).enabled);
+}
+
+TEST_F(OptionsTest, AlarmsAreConfiguredInTheFile) {
+    Options const read = options(
+        {"--config", file("alarm = [\"linkDown=minor,raise=5\", \"platformFault.17=major\"]\n")});
+    EXPECT_EQ(read.alarmPolicies.of(AlarmKind::LinkDown, 1).severity, AlarmSeverity::Minor);
+    EXPECT_EQ(read.alarmPolicies.of(AlarmKind::PlatformFault, 17).severity, AlarmSeverity::Major);
+}
+
+TEST_F(OptionsTest, WrongAlarmOfTheFileIsReportedWithItsLine) {
+    std::string const name = file("# alarms\nalarm = [\"linkDwn=minor\"]\n");
+    EXPECT_THAT(refusal({"--config", name.c_str()}).text,
+                AllOf(HasSubstr(name + ":2: "), HasSubstr("'linkDwn' is no kind of alarm")));
+}
+
+TEST_F(OptionsTest, AlarmThatIsConfiguredTwiceIsReportedWithItsLine) {
+    std::string const name = file("alarm = [\"linkDown=minor\", \"linkDown=major\"]\n");
+    EXPECT_THAT(refusal({"--config", name.c_str()}).text,
+                AllOf(HasSubstr(name + ":1: "), HasSubstr("'linkDown' is configured twice")));
+    EXPECT_EQ(refusal({"--alarm", "linkDown=minor", "--alarm", "linkDown=major"}).status,
+              kExitUsage);
+}
+
 TEST_F(OptionsTest, ModulesAreFoundBesideTheProgram) {
     unsetenv("KVLOAM_MODULE_DIR");
     auto const program = std::filesystem::read_symlink("/proc/self/exe");

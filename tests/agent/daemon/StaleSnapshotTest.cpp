@@ -30,7 +30,7 @@ class StaleSnapshotTest : public ::testing::Test {
 };
 
 TEST_F(StaleSnapshotTest, RecentSnapshotIsServedAsItIs) {
-    raise(AlarmKind::MasterLost);
+    raise(AlarmKind::NotificationsDropped);
     EXPECT_EQ(after(HealthWatch::kStale - std::chrono::milliseconds(1)), m_newest);
 }
 
@@ -46,7 +46,7 @@ TEST_F(StaleSnapshotTest, StaleSnapshotGetsTheAlarmsOfNow) {
 TEST_F(StaleSnapshotTest, StaleSnapshotIsNotCopiedMoreOftenThanOnceInASecond) {
     raise(AlarmKind::SnapshotStale);
     auto const first = after(HealthWatch::kStale);
-    raise(AlarmKind::MasterLost);
+    raise(AlarmKind::NotificationsDropped);
     EXPECT_EQ(after(HealthWatch::kStale + std::chrono::milliseconds(999)), first);
     EXPECT_EQ(after(HealthWatch::kStale + std::chrono::seconds(1))->alarms->alarms.size(), 2U);
 }

@@ -1,0 +1,231 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "agent/journal/Journal.h"
+
+#include <sys/resource.h>
+
+#include <csignal>
+#include <filesystem>
+#include <fstream>
+#include <string>
+#include <vector>
+
+#include <gmock/gmock.h>
+
+#include "tests/support/LogCapture.h"
+#include "tests/support/TemporaryDirectory.h"
+
+namespace kvloamd {
+namespace {
+
+using ::testing::ElementsAre;
+using ::testing::HasSubstr;
+using ::testing::IsEmpty;
+using ::testing::SizeIs;
+
+JournalEntry entryOf(std::string text) {
+    JournalEntry entry;
+    entry.event = JournalEvent::BoardStatus;
+    entry.date = std::chrono::system_clock::now();
+    entry.text = std::move(text);
+    return entry;
+}
+
+JournalEntry alarmEntry(JournalEvent event, std::uint32_t number) {
+    JournalEntry entry = entryOf("alarm");
+    entry.event = event;
+    entry.alarm.emplace();
+    entry.alarm->condition = {
+        {AlarmKind::LineRcvAIS, "S1", number}, "board S1, line", 1, number, "why", "slot 3"};
+    entry.alarm->severity = AlarmSeverity::Major;
+    entry.alarm->count = 4;
+    entry.alarm->began = std::chrono::system_clock::time_point(std::chrono::milliseconds(1234));
+    entry.alarm->raised = std::chrono::system_clock::time_point(std::chrono::milliseconds(5678));
+    return entry;
+}
+
+class JournalTest : public ::testing::Test {
+  protected:
+    std::string file() const { return m_folder.file("journal.sqlite"); }
+    /// The texts of the entries on disk.
+    std::vector<std::string> texts() const {
+        std::vector<std::string> all;
+        for (JournalEntry const& entry : JournalFile(file()).entries(1000000))
+            all.push_back(entry.text);
+        return all;
+    }
+
+    support::TemporaryDirectory m_folder;
+};
+
+TEST_F(JournalTest, EntriesAreOnDiskWithTheirNumbers) {
+    {
+        Journal journal(file());
+        EXPECT_EQ(journal.append(entryOf("first")), 1U);
+        EXPECT_EQ(journal.append(entryOf("second")), 2U);
+        journal.flush();
+        EXPECT_EQ(journal.counts().written, 2U);
+    }
+    EXPECT_THAT(texts(), ElementsAre("first", "second"));
+}
+
+TEST_F(JournalTest, NumbersContinueAfterAnOrderlyStop) {
+    Journal(file()).append(entryOf("first"));
+    {
+        Journal journal(file());
+        journal.append(entryOf("second"));
+        journal.close({});
+    }
+    Journal journal(file());
+    EXPECT_GT(journal.append(entryOf("third")), 2U);
+    journal.close({});
+    EXPECT_EQ(JournalFile(file()).nextSequence(), JournalFile(file()).entries(1)[0].sequence + 1);
+}
+
+TEST_F(JournalTest, JournalWithoutAFileGivesNumbers) {
+    LogCapture log;
+    Journal journal("");
+    EXPECT_EQ(journal.append(entryOf("first")), 1U);
+    EXPECT_EQ(journal.append(entryOf("second")), 2U);
+    journal.flush();
+    EXPECT_EQ(log.take(), "");
+}
+
+TEST_F(JournalTest, RaisedAlarmIsKnownAfterARestartWithEverythingAboutIt) {
+    {
+        Journal journal(file());
+        journal.append(alarmEntry(JournalEvent::AlarmRaised, 1000));
+        journal.append(alarmEntry(JournalEvent::AlarmRaised, 1001));
+        journal.append(alarmEntry(JournalEvent::AlarmCleared, 1001));
+        journal.flush();
+    }
+    Journal const journal(file());
+    ASSERT_THAT(journal.formerAlarms(), SizeIs(1));
+    Alarm const& former = journal.formerAlarms().front();
+    Alarm const raised = *alarmEntry(JournalEvent::AlarmRaised, 1000).alarm;
+    EXPECT_EQ(former.condition, raised.condition);
+    EXPECT_EQ(former.severity, raised.severity);
+    EXPECT_EQ(former.count, raised.count);
+    EXPECT_EQ(former.began, raised.began);
+    EXPECT_EQ(former.raised, raised.raised);
+    EXPECT_EQ(former.number, 1U);
+}
+
+TEST_F(JournalTest, OrderlyStopKeepsTheCountsOfAlarms) {
+    Alarm alarm = *alarmEntry(JournalEvent::AlarmRaised, 1000).alarm;
+    {
+        Journal journal(file());
+        journal.append(alarmEntry(JournalEvent::AlarmRaised, 1000));
+        alarm.count = 99;
+        journal.close({alarm});
+    }
+    EXPECT_EQ(Journal(file()).formerAlarms().front().count, 99U);
+}
+
+TEST_F(JournalTest, OldestEntriesAreDeletedWhenThereAreTooMany) {
+    JournalLimits limits;
+    limits.entries = 100;
+    {
+        Journal journal(file(), limits);
+        for (int i = 1; i <= 2500; ++i)
+            journal.append(entryOf(std::to_string(i)));
+        journal.close({});
+    }
+    auto const kept = texts();
+    ASSERT_THAT(kept, SizeIs(100));
+    EXPECT_EQ(kept.front(), "2401");
+}
+
+TEST_F(JournalTest, EntriesThatAreTooOldAreDeleted) {
+    {
+        Journal journal(file());
+        JournalEntry old = entryOf("old");
+        old.date -= JournalLimits{}.age + std::chrono::hours(1);
+        journal.append(old);
+        journal.append(entryOf("new"));
+        journal.close({});
+    }
+    EXPECT_THAT(texts(), ElementsAre("new"));
+}
+
+TEST_F(JournalTest, DamagedFileIsSetAsideAndNumbersAreNotRepeated) {
+    std::ofstream(file()) << std::string(10000, 'x');
+    LogCapture log;
+    std::uint32_t first = 0;
+    {
+        Journal journal(file());
+        first = journal.append(entryOf("first"));
+        journal.close({});
+    }
+    EXPECT_THAT(log.take(), HasSubstr("the journal is damaged"));
+    // More than any journal can have given: one each second since its first version.
+    EXPECT_GT(first, 20000000U);
+    EXPECT_THAT(texts(), ElementsAre("first"));
+}
+
+TEST_F(JournalTest, DirectoryThatIsMissingCostsEntriesOnly) {
+    LogCapture log;
+    {
+        Journal journal(m_folder.file("no/such/journal.sqlite"), {}, 10,
+                        std::chrono::milliseconds(1));
+        for (int i = 0; i < 30; ++i)
+            EXPECT_NE(journal.append(entryOf("entry")), 0U);
+        journal.flush();
+        EXPECT_TRUE(journal.counts().failing);
+        EXPECT_GE(journal.counts().lost, 20U);
+        journal.close({});
+    }
+    std::string const text = log.take();
+    EXPECT_THAT(text, HasSubstr("the journal cannot be written: "));
+    EXPECT_THAT(text, HasSubstr("entries of the journal that are lost at the stop: 10"));
+}
+
+/// Files cannot grow beyond a limit while it exists, as on a full disk.
+class FullDisk {
+  public:
+    explicit FullDisk(rlim_t limit) {
+        std::signal(SIGXFSZ, SIG_IGN);
+        getrlimit(RLIMIT_FSIZE, &m_former);
+        rlimit const full{limit, m_former.rlim_max};
+        setrlimit(RLIMIT_FSIZE, &full);
+    }
+    ~FullDisk() { setrlimit(RLIMIT_FSIZE, &m_former); }
+    FullDisk(FullDisk const&) = delete;
+    FullDisk& operator=(FullDisk const&) = delete;
+
+  private:
+    rlimit m_former{};
+};
+
+TEST_F(JournalTest, FullDiskCostsEntriesThatAreCountedAndNothingElse) {
+    constexpr std::uint32_t kCapacity = 500;
+    constexpr rlim_t kRoom = 65536;
+    Journal journal(file(), {}, kCapacity, std::chrono::milliseconds(1));
+    journal.append(entryOf("before"));
+    journal.flush();
+    std::uint32_t appended = 1;
+    {
+        LogCapture const log;
+        FullDisk const full(kRoom);
+        // Entries are lost when the queue is full, also before the disk is.
+        while (!journal.counts().failing || journal.counts().lost == 0) {
+            journal.append(entryOf(std::string(1000, 'x')));
+            ++appended;
+        }
+    }
+    // Room again: what waited is written.
+    while (journal.counts().failing)
+        std::this_thread::yield();
+    journal.flush();
+    journal.append(entryOf("after"));
+    ++appended;
+    journal.flush();
+    EXPECT_EQ(journal.counts().written + journal.counts().lost, appended);
+    journal.close({});
+    auto const kept = texts();
+    EXPECT_EQ(kept.size(), journal.counts().written);
+    EXPECT_EQ(kept.front(), "before");
+    EXPECT_EQ(kept.back(), "after");
+}
+
+} // namespace
+} // namespace kvloamd
