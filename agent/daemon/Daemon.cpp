@@ -49,6 +49,7 @@
 #include "agent/readers/StableIndices.h"
 #include "agent/readers/StateDirectory.h"
 #include "agent/readers/StateFile.h"
+#include "agent/readers/StoreReader.h"
 #include "agent/readers/Whereabouts.h"
 #include "platform/ActionScheduler_pthread.h"
 
@@ -77,6 +78,7 @@ struct Boards {
             [this](std::uint32_t ifIndex, int status) { alarmEvents.lineStatus(ifIndex, status); });
     }
 
+    bool const hasStore = storeIsConfigured();
     ReferenceCounter<BoardManager> manager{new BoardManager};
     Counters counters;
     Settings settings;
@@ -209,7 +211,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     Wakeup wakeup;
     ServiceManager& services = *ServiceManager::GetInstance();
     KPXStatisticsTable& statistics = *KPXStatisticsTable::GetInstance();
-    PlatformReader platform;
+    PlatformReader platform(PlatformReader::kMaxAge, boards.hasStore);
     std::string const directory = persistentDirectory(snmpFiles(options));
     StateFile interfaceFile(directory + "/ifindex.sqlite", "interfaces");
     StableIndices indices(interfaceFile, options.interfaceBase);

@@ -76,10 +76,11 @@ void PlatformReader::readObjects(Wanted const& wanted) {
 void PlatformReader::readStore(Wanted const& wanted) {
     StoreReading store;
     bool const readable = store.good();
-    note(m_storeReadable, readable,
-         "the attribute store cannot be read, or has no family of boards; its table stays empty "
-         "(see VQRXCFGPATH)",
-         "the attribute store can be read again");
+    if (m_hasStore)
+        note(m_storeReadable, readable,
+             "the attribute store cannot be read, or has no family of boards; its table stays "
+             "empty (see VQRXCFGPATH)",
+             "the attribute store can be read again");
     if (!readable) {
         for (auto& [index, records] : m_boards)
             records.store.reset();

@@ -19,7 +19,8 @@ namespace kvloamd {
 /// of them when the last such reading is old. A board is found by its serial number.
 ///
 /// While the device mapper does not answer, what it answered last stays; while the attribute store
-/// cannot be read, there are no records of it. The log says when either begins and when it ends.
+/// cannot be read, there are no records of it. The log says when either begins and when it ends. On
+/// a host without an attribute store, it is no fault that there is none.
 ///
 /// Thread-bound: the collector, which alone uses the attribute store.
 class PlatformReader {
@@ -27,12 +28,14 @@ class PlatformReader {
     /// The age at which all is read anew.
     static constexpr std::chrono::milliseconds kMaxAge{10000};
 
-    explicit PlatformReader(std::chrono::milliseconds maxAge = kMaxAge) : m_maxAge(maxAge) {}
+    /// `hasStore`: whether the host has an attribute store.
+    explicit PlatformReader(std::chrono::milliseconds maxAge = kMaxAge, bool hasStore = true)
+        : m_maxAge(maxAge), m_hasStore(hasStore) {}
 
     /// The records of `boards`, which are ascending by index.
     std::shared_ptr<PlatformRecords const> read(std::vector<BoardRow> const& boards);
 
-    // Whether it worked when it was read last.
+    // Whether it worked when it was read last. A store that the host does not have works.
     bool mapperAnswers() const { return m_mapperAnswers; }
     bool storeIsReadable() const { return m_storeReadable; }
 
@@ -51,6 +54,7 @@ class PlatformReader {
     std::shared_ptr<PlatformRecords const> joined() const;
 
     std::chrono::milliseconds m_maxAge;
+    bool m_hasStore;
     std::optional<std::chrono::steady_clock::time_point> m_allRead; ///< when
     std::map<std::uint32_t, BoardRecords> m_boards;                 ///< by board index
     std::shared_ptr<PlatformRecords const> m_records = std::make_shared<PlatformRecords>();

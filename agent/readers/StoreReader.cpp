@@ -1,10 +1,13 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/readers/StoreReader.h"
 
-#include "agent/readers/Answers.h"
-
 #include <algorithm>
+#include <cstdlib>
+#include <filesystem>
 #include <iterator>
+#include <system_error>
+
+#include "agent/readers/Answers.h"
 
 namespace kvloamd {
 
@@ -16,6 +19,12 @@ std::string textUnlessError(std::string const& text) {
 }
 
 } // namespace
+
+bool storeIsConfigured() {
+    if (char const* const directory = std::getenv("VQRXCFGPATH")) return *directory != '\0';
+    std::error_code fault;
+    return std::filesystem::exists("/usr/velquor/cfg", fault);
+}
 
 bool StoreReading::good() {
     // The first name of the list is none.

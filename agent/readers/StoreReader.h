@@ -11,6 +11,10 @@
 
 namespace kvloamd {
 
+/// Whether the host has an attribute store, or should have one: VQRXCFGPATH names a directory, or
+/// the default directory exists. Before the first access to the store, which sets VQRXCFGPATH.
+bool storeIsConfigured();
+
 /// A `StoreReading` keeps the attribute store open while it exists. Thread-bound: the collector.
 class StoreReading {
   public:

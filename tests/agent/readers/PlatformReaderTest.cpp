@@ -11,6 +11,7 @@
 #include <gtest/gtest.h>
 
 #include "access/QSBBoard.h"
+#include "agent/readers/StoreReader.h"
 #include "board/Board.h"
 #include "tests/support/SimulatedPlatform.h"
 
@@ -213,6 +214,26 @@ TEST_F(PlatformReaderTest, StoresStateIsLoggedOncePerChange) {
     std::string const logged = testing::internal::GetCapturedStderr();
     EXPECT_EQ(timesIn(logged, "the attribute store cannot be read"), 1) << logged;
     EXPECT_EQ(timesIn(logged, "the attribute store can be read again"), 1) << logged;
+}
+
+TEST_F(PlatformReaderTest, HostWithoutAStoreIsNoFault) {
+    testing::internal::CaptureStderr();
+    setenv("VQRXCFGPATH", "", 1);
+    PlatformReader reader(0ms, storeIsConfigured());
+    EXPECT_TRUE(reader.read(both())->store.empty());
+    EXPECT_TRUE(reader.storeIsReadable());
+    std::string const logged = testing::internal::GetCapturedStderr();
+    EXPECT_EQ(timesIn(logged, "attribute store"), 0) << logged;
+}
+
+TEST_F(PlatformReaderTest, StoreIsConfiguredByItsDirectory) {
+    EXPECT_TRUE(storeIsConfigured());
+    setenv("VQRXCFGPATH", "/nowhere", 1);
+    EXPECT_TRUE(storeIsConfigured()) << "a wrong directory is a fault";
+    setenv("VQRXCFGPATH", "", 1);
+    EXPECT_FALSE(storeIsConfigured());
+    unsetenv("VQRXCFGPATH");
+    EXPECT_EQ(storeIsConfigured(), std::filesystem::exists("/usr/velquor/cfg"));
 }
 
 } // namespace
