@@ -104,7 +104,8 @@ void AlarmList::restore(std::vector<Alarm> const& alarms, Instant now) {
         record.changed = now.steady;
         record.alarm.severity =
             m_policies.of(alarm.condition.key.kind, alarm.condition.key.number).severity;
-        m_records.insert_or_assign(alarm.condition.key, std::move(record));
+        if (m_records.insert_or_assign(alarm.condition.key, std::move(record)).second)
+            countActive(alarm.condition.key.kind, true, now.steady);
     }
     ++m_version;
 }
@@ -149,7 +150,7 @@ std::uint64_t AlarmList::version() const {
 
 AlarmList::Contents AlarmList::contents(std::uint64_t known) const {
     std::scoped_lock const guard(m_mutex);
-    Contents contents{m_version, {}, {}, m_counts, m_policies, m_applied};
+    Contents contents{m_version, {}, {}, m_counts, m_kinds, m_policies, m_applied};
     if (m_version == known) return contents;
     for (auto const& [key, record] : m_records)
         if (record.raised) contents.active.push_back({record.alarm, record.present});
@@ -229,6 +230,7 @@ void AlarmList::raise(Record& record, Instant now) {
     record.alarm.severity = m_policies.of(key.kind, key.number).severity;
     record.alarm.raised = now.date;
     ++m_counts.raised;
+    ++countActive(key.kind, true, now.steady).raised;
     m_counts.lastRaised = now.steady;
     ++m_version;
     record.alarm.number = m_report(AlarmEvent::Raised, record.alarm);
@@ -239,12 +241,27 @@ void AlarmList::clear(Record& record, Instant now) {
     record.flapping = false;
     record.alarm.cleared = now.date;
     ++m_counts.cleared;
+    ++countActive(record.alarm.condition.key.kind, false, now.steady).cleared;
     m_counts.lastCleared = now.steady;
     ++m_version;
     m_report(AlarmEvent::Cleared, record.alarm);
     if (m_cleared.size() >= kClearedCapacity) m_cleared.pop_front();
     m_cleared.push_back(record.alarm);
     record.alarm.count = 0;
+}
+
+AlarmList::KindCounts& AlarmList::countActive(AlarmKind kind, bool more, Clock::time_point now) {
+    KindCounts& counts = m_kinds[kind];
+    // Threads read the clock before they wait for the lock.
+    if (now > counts.counted) {
+        if (counts.active > 0) counts.lasted += counts.active * (now - counts.counted);
+        counts.counted = now;
+    }
+    if (more)
+        ++counts.active;
+    else
+        --counts.active;
+    return counts;
 }
 
 std::optional<Clock::time_point> AlarmList::deadline(Record const& record) const {

@@ -52,6 +52,14 @@ class AlarmList {
         std::optional<Clock::time_point> lastRaised;
         std::optional<Clock::time_point> lastCleared;
     };
+    /// What has been counted of one kind since the list was made.
+    struct KindCounts {
+        std::uint64_t raised = 0;  ///< alarms
+        std::uint64_t cleared = 0; ///< alarms
+        std::uint32_t active = 0;  ///< now
+        Clock::duration lasted{0}; ///< how long its alarms were active until `counted`, added up
+        Clock::time_point counted;
+    };
     struct Active {
         Alarm alarm;
         bool present = true; ///< the condition; false: the alarm is held
@@ -62,6 +70,7 @@ class AlarmList {
         std::vector<Active> active;
         std::vector<Alarm> cleared;
         Counts counts;
+        std::map<AlarmKind, KindCounts> kinds; ///< those that have had an alarm
         AlarmPolicies policies;
         std::optional<Clock::time_point> applied; ///< when the policies were changed last
     };
@@ -121,6 +130,8 @@ class AlarmList {
     bool settle(Record& record, Instant now);
     void raise(Record& record, Instant now);
     void clear(Record& record, Instant now);
+    /// Counts how long alarms of the kind have been active, and one more or less from now on.
+    KindCounts& countActive(AlarmKind kind, bool more, Clock::time_point now);
     std::optional<Clock::time_point> deadline(Record const& record) const;
     void settleAndKeep(Records::iterator at, Instant now);
 
@@ -132,6 +143,7 @@ class AlarmList {
     Records m_records;
     std::deque<Alarm> m_cleared;
     Counts m_counts;
+    std::map<AlarmKind, KindCounts> m_kinds;
     std::uint64_t m_version = 1;
     std::optional<Clock::time_point> m_next; ///< not after the earliest deadline of a record
 };

@@ -84,6 +84,7 @@ std::shared_ptr<AlarmRows const> AlarmTables::rows() {
         rows->cleared.push_back(std::move(row));
     }
     addModels(*rows, contents.policies);
+    addTotals(*rows, contents.kinds);
     std::ranges::sort(rows->alarms, {}, &AlarmRow::number);
     std::ranges::sort(rows->active, {}, &DatedAlarmRow::place);
     std::ranges::sort(rows->cleared, {}, &DatedAlarmRow::place);
@@ -162,6 +163,23 @@ void AlarmTables::addModels(AlarmRows& rows, AlarmPolicies const& policies) cons
         AlarmSeverity const severity = policies.of(info.kind, 0).severity;
         rows.models.push_back({model, modelState(severity), notification,
                                name + " (" + severityName(severity) + "): " + info.meaning});
+    }
+}
+
+void AlarmTables::addTotals(AlarmRows& rows,
+                            std::map<AlarmKind, AlarmList::KindCounts> const& kinds) {
+    for (AlarmKindInfo const& info : alarmKinds()) {
+        AlarmTotalRow row;
+        row.kind = info.name;
+        if (auto const found = kinds.find(info.kind); found != kinds.end()) {
+            AlarmList::KindCounts const& counts = found->second;
+            row.raised = counts.raised;
+            row.cleared = counts.cleared;
+            row.active = counts.active;
+            row.lasted = std::chrono::duration_cast<std::chrono::milliseconds>(counts.lasted);
+            row.counted = counts.counted;
+        }
+        rows.totals.push_back(std::move(row));
     }
 }
 

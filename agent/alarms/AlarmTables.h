@@ -2,6 +2,7 @@
 // Turns alarms into the rows that the agent serves.
 #pragma once
 
+#include <map>
 #include <memory>
 #include <mutex>
 
@@ -26,6 +27,7 @@ class AlarmTables {
     void addActive(AlarmRows& rows, Alarm const& alarm, bool present) const;
     void addVariables(AlarmRows& rows, AlarmRow const& row) const;
     void addModels(AlarmRows& rows, AlarmPolicies const& policies) const;
+    static void addTotals(AlarmRows& rows, std::map<AlarmKind, AlarmList::KindCounts> const& kinds);
     DatedAlarmRow datedRow(Alarm const& alarm) const;
     Oid notificationOf(AlarmKind kind) const;
     Oid resourceOf(Condition const& condition) const;

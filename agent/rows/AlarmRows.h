@@ -4,10 +4,12 @@
 
 #include <algorithm>
 #include <array>
+#include <chrono>
 #include <cstdint>
 #include <string>
 #include <vector>
 
+#include "agent/rows/Clock.h"
 #include "agent/rows/Oid.h"
 
 namespace kvloamd {
@@ -93,6 +95,23 @@ struct AlarmStatsRow {
     std::array<std::uint32_t, 1> index() const { return {0}; }
 };
 
+/// What has been counted of the alarms of one kind since the agent's start.
+struct AlarmTotalRow {
+    std::string kind;
+    std::uint64_t raised = 0;
+    std::uint64_t cleared = 0;
+    std::uint32_t active = 0;            ///< now
+    std::chrono::milliseconds lasted{0}; ///< how long its alarms were active, added up
+    Clock::time_point counted;           ///< the time until which `lasted` counts
+
+    /// `lasted` at a later time: it grows while alarms are active, without another snapshot.
+    std::chrono::milliseconds lastedAt(Clock::time_point now) const {
+        if (active == 0 || now <= counted) return lasted;
+        return lasted +
+               active * std::chrono::duration_cast<std::chrono::milliseconds>(now - counted);
+    }
+};
+
 /// All ascending by index.
 struct AlarmRows {
     std::vector<AlarmRow> alarms;
@@ -101,9 +120,10 @@ struct AlarmRows {
     std::vector<DatedAlarmRow> cleared;
     std::vector<AlarmModelRow> models;
     std::vector<AlarmStatsRow> stats{1};
-    std::uint32_t suppressed = 0; ///< beginnings of conditions that never became an alarm
-    std::uint32_t unlisted = 0;   ///< beginnings of conditions that found the list full
-    std::uint32_t lastChange = 0; ///< of the active alarms, as `AlarmStatsRow::lastRaise`
+    std::vector<AlarmTotalRow> totals; ///< one for every kind, in the order of their numbers
+    std::uint32_t suppressed = 0;      ///< beginnings of conditions that never became an alarm
+    std::uint32_t unlisted = 0;        ///< beginnings of conditions that found the list full
+    std::uint32_t lastChange = 0;      ///< of the active alarms, as `AlarmStatsRow::lastRaise`
     std::uint32_t modelChange = 0;
     std::uint32_t clearedMaximum = 0; ///< how many cleared alarms are remembered
 };

@@ -251,5 +251,48 @@ TEST_F(AlarmListTest, VersionChangesWithWhatIsShown) {
     EXPECT_NE(m_list.contents(0).version, raised);
 }
 
+TEST_F(AlarmListTest, EveryKindCanBeSwitchedOff) {
+    for (AlarmKindInfo const& info : alarmKinds()) {
+        begin(condition(info.kind));
+        ASSERT_THAT(m_list.active(), SizeIs(info.raiseHold.count() == 0 ? 1 : 0)) << info.name;
+        configure(std::string(info.name) + "=off");
+        EXPECT_THAT(m_list.active(), IsEmpty()) << info.name;
+        pass(AlarmPolicies::kLongestHold);
+        EXPECT_THAT(m_list.active(), IsEmpty()) << info.name;
+    }
+}
+
+TEST_F(AlarmListTest, CountsOfEachKindSayHowLongItsAlarmsWereActive) {
+    begin(m_los);
+    pass(seconds(10));
+    begin(condition(AlarmKind::LineLossOfSignal, 1001));
+    begin(condition(AlarmKind::BoardFailed));
+    pass(seconds(5));
+    end(m_los);
+    auto const kinds = m_list.contents(0).kinds;
+    AlarmList::KindCounts const& signal = kinds.at(AlarmKind::LineLossOfSignal);
+    EXPECT_EQ(signal.raised, 2U);
+    EXPECT_EQ(signal.cleared, 1U);
+    EXPECT_EQ(signal.active, 1U);
+    EXPECT_EQ(signal.lasted, seconds(10 + 2 * 5));
+    EXPECT_EQ(kinds.at(AlarmKind::BoardFailed).active, 1U);
+    EXPECT_FALSE(kinds.contains(AlarmKind::BoardGone));
+}
+
+TEST_F(AlarmListTest, RestoredAlarmIsActiveWithoutBeingRaised) {
+    begin(m_los);
+    AlarmList restarted({}, [](AlarmEvent, Alarm const&) { return 1U; });
+    restarted.restore(m_list.active(), m_now);
+    auto const before = restarted.contents(0).kinds.at(AlarmKind::LineLossOfSignal);
+    EXPECT_EQ(before.raised, 0U);
+    EXPECT_EQ(before.active, 1U);
+    m_now.steady += seconds(7);
+    restarted.end(m_los.key, m_now);
+    auto const after = restarted.contents(0).kinds.at(AlarmKind::LineLossOfSignal);
+    EXPECT_EQ(after.cleared, 1U);
+    EXPECT_EQ(after.active, 0U);
+    EXPECT_EQ(after.lasted, seconds(7));
+}
+
 } // namespace
 } // namespace kvloamd

@@ -160,5 +160,21 @@ TEST_F(AlarmTablesTest, OverriddenSeverityIsInTheModel) {
     EXPECT_EQ(rows->modelChange, 1000U);
 }
 
+TEST_F(AlarmTablesTest, TotalsHaveEveryKindAndGrowWithoutOtherRows) {
+    begin(AlarmKind::LineLossOfSignal);
+    begin(AlarmKind::LineLossOfSignal, 1, 1001);
+    auto const rows = m_tables.rows();
+    EXPECT_EQ(rows->totals.size(), alarmKinds().size());
+    auto const total = std::ranges::find(rows->totals, "dsx1LossOfSignal", &AlarmTotalRow::kind);
+    ASSERT_NE(total, rows->totals.end());
+    EXPECT_EQ(total->raised, 2U);
+    EXPECT_EQ(total->active, 2U);
+    EXPECT_EQ(total->lastedAt(m_now.steady), seconds(0));
+    EXPECT_EQ(total->lastedAt(m_now.steady + seconds(3)), seconds(6));
+    auto const other = std::ranges::find(rows->totals, "boardGone", &AlarmTotalRow::kind);
+    ASSERT_NE(other, rows->totals.end());
+    EXPECT_EQ(other->lastedAt(m_now.steady + seconds(3)), seconds(0));
+}
+
 } // namespace
 } // namespace kvloamd
