@@ -9,6 +9,7 @@
 #include <system_error>
 #include <utility>
 
+#include "agent/journal/JournalReader.h"
 #include "agent/log/Log.h"
 
 namespace kvloamd {
@@ -70,6 +71,7 @@ void Journal::open() {
     }
     m_former = m_file->activeAlarms();
     m_next = std::max(m_next, m_file->nextSequence());
+    m_newest = m_file->newest();
     // Before a number is given.
     m_file->write({}, m_next);
 }
@@ -123,6 +125,14 @@ Journal::Counts Journal::counts() const {
     return m_counts;
 }
 
+std::optional<JournalPage> Journal::entriesAfter(std::uint32_t number, std::size_t limit) const {
+    return readJournal(m_path, number, limit, newest());
+}
+
+std::optional<JournalPage> Journal::newestEntries(std::size_t limit) const {
+    return readJournal(m_path, std::nullopt, limit, newest());
+}
+
 void Journal::run() {
     std::unique_lock lock(m_mutex);
     for (;;) {
@@ -138,6 +148,7 @@ void Journal::run() {
         lock.lock();
         m_writing = false;
         if (written) {
+            m_newest = batch.back().sequence;
             noteSuccess(batch.size());
             m_idle.notify_all();
             continue;

@@ -2,17 +2,20 @@
 // The event journal: what happened while nobody looked.
 #pragma once
 
+#include <atomic>
 #include <condition_variable>
 #include <cstddef>
 #include <cstdint>
 #include <deque>
 #include <memory>
 #include <mutex>
+#include <optional>
 #include <string>
 #include <thread>
 #include <vector>
 
 #include "agent/journal/JournalFile.h"
+#include "agent/rows/JournalRow.h"
 
 namespace kvloamd {
 
@@ -57,6 +60,16 @@ class Journal {
 
     Counts counts() const;
 
+    /// The sequence number of the newest entry that can be read; 0: none. Costs nothing.
+    std::uint32_t newest() const { return m_newest; }
+    /// At most `limit` entries whose numbers are above `number`, the oldest of them first. Entries
+    /// that still wait to be written are not among them. Opens the file anew and may wait for the
+    /// disk, but neither for the writing thread nor for `append`, and delays neither: never call it
+    /// on the SNMP thread. Nothing if the file cannot be read.
+    std::optional<JournalPage> entriesAfter(std::uint32_t number, std::size_t limit) const;
+    /// The same for the newest entries.
+    std::optional<JournalPage> newestEntries(std::size_t limit) const;
+
   private:
     void open();
     void run();
@@ -71,7 +84,8 @@ class Journal {
     std::size_t const m_capacity;
     std::chrono::milliseconds const m_retry;
     std::vector<Alarm> m_former;
-    std::unique_ptr<JournalFile> m_file; ///< of the thread, once it runs; null: not open
+    std::atomic<std::uint32_t> m_newest{0}; ///< on disk
+    std::unique_ptr<JournalFile> m_file;    ///< of the thread, once it runs; null: not open
 
     mutable std::mutex m_mutex; ///< guards what follows
     std::condition_variable m_wake;

@@ -23,6 +23,9 @@ enum class JournalEvent : int {
     Setting = 8        ///< by SNMP
 };
 
+/// "alarmRaised" and so on; "event" for a number of a later version.
+char const* journalEventName(JournalEvent event);
+
 /// One entry. Its sequence number is given by the journal.
 struct JournalEntry {
     JournalEvent event = JournalEvent::AgentStarted;

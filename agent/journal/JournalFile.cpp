@@ -69,6 +69,10 @@ std::uint32_t JournalFile::nextSequence() {
         std::min<std::int64_t>(last + 1, std::numeric_limits<std::uint32_t>::max()));
 }
 
+std::uint32_t JournalFile::newest() {
+    return static_cast<std::uint32_t>(m_database.number("SELECT max(sequence) FROM entry"));
+}
+
 void JournalFile::write(std::span<JournalEntry const> entries, std::uint32_t next) {
     Transaction transaction(m_database, Transaction::Kind::Write);
     std::uint32_t const reserved = m_reserved;

@@ -35,6 +35,8 @@ class JournalFile {
 
     /// The first sequence number that has never been given.
     std::uint32_t nextSequence();
+    /// The number of the newest entry; 0: none.
+    std::uint32_t newest();
     /// Writes entries, all or none. `next`: the sequence number of the next entry.
     void write(std::span<JournalEntry const> entries, std::uint32_t next);
     /// Replaces the active alarms, and gives back the numbers from `next` on.

@@ -6,7 +6,9 @@
 #include <csignal>
 #include <filesystem>
 #include <fstream>
+#include <optional>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include <gmock/gmock.h>
@@ -225,6 +227,105 @@ TEST_F(JournalTest, FullDiskCostsEntriesThatAreCountedAndNothingElse) {
     EXPECT_EQ(kept.size(), journal.counts().written);
     EXPECT_EQ(kept.front(), "before");
     EXPECT_EQ(kept.back(), "after");
+}
+
+class JournalReadingTest : public JournalTest {
+  protected:
+    static std::vector<std::uint32_t> numbers(std::optional<JournalPage> const& page) {
+        std::vector<std::uint32_t> all;
+        if (page)
+            for (JournalRow const& row : page->rows)
+                all.push_back(row.number);
+        return all;
+    }
+
+    Journal m_journal{file()};
+};
+
+TEST_F(JournalReadingTest, NothingIsThereBeforeTheFirstEntry) {
+    EXPECT_EQ(m_journal.newest(), 0U);
+    auto const page = m_journal.entriesAfter(0, 10);
+    ASSERT_TRUE(page);
+    EXPECT_THAT(page->rows, IsEmpty());
+    EXPECT_EQ(page->newest, 0U);
+}
+
+TEST_F(JournalReadingTest, EntriesAreReadInPagesWhileTheyAreWritten) {
+    for (int i = 1; i <= 5; ++i)
+        m_journal.append(entryOf(std::to_string(i)));
+    m_journal.flush();
+    EXPECT_EQ(m_journal.newest(), 5U);
+    EXPECT_THAT(numbers(m_journal.entriesAfter(0, 2)), ElementsAre(1, 2));
+    EXPECT_THAT(numbers(m_journal.entriesAfter(2, 2)), ElementsAre(3, 4));
+    EXPECT_THAT(numbers(m_journal.entriesAfter(4, 2)), ElementsAre(5));
+    EXPECT_THAT(numbers(m_journal.entriesAfter(5, 2)), IsEmpty());
+    EXPECT_THAT(numbers(m_journal.newestEntries(2)), ElementsAre(4, 5));
+    EXPECT_EQ(m_journal.entriesAfter(0, 2)->newest, 5U);
+}
+
+TEST_F(JournalReadingTest, EntryHasWhatWasRecordedOfItsAlarm) {
+    m_journal.append(entryOf("board"));
+    JournalEntry entry = alarmEntry(JournalEvent::AlarmRaised, 1000);
+    entry.date = std::chrono::system_clock::time_point(std::chrono::milliseconds(98765));
+    entry.board = "S1";
+    entry.ifIndex = 1000;
+    m_journal.append(entry);
+    m_journal.flush();
+    auto const page = m_journal.entriesAfter(0, 10);
+    ASSERT_TRUE(page);
+    ASSERT_THAT(page->rows, SizeIs(2));
+    EXPECT_EQ(page->rows[0].event, "boardStatus");
+    EXPECT_EQ(page->rows[0].alarm, "");
+    EXPECT_EQ(page->rows[0].severity, 0);
+    JournalRow const& row = page->rows[1];
+    EXPECT_EQ(row.number, 2U);
+    EXPECT_EQ(row.date, entry.date);
+    EXPECT_EQ(row.event, "alarmRaised");
+    EXPECT_EQ(row.text, "alarm");
+    EXPECT_EQ(row.board, "S1");
+    EXPECT_EQ(row.ifIndex, 1000U);
+    EXPECT_EQ(row.alarm, "dsx1RcvAIS");
+    EXPECT_EQ(row.severity, static_cast<int>(AlarmSeverity::Major));
+    EXPECT_EQ(row.times, 4U);
+}
+
+TEST_F(JournalReadingTest, EntriesOfTheLastRunAreThereAtOnce) {
+    m_journal.append(entryOf("before"));
+    m_journal.close({});
+    Journal const next(file());
+    EXPECT_EQ(next.newest(), 1U);
+    EXPECT_THAT(numbers(next.entriesAfter(0, 10)), ElementsAre(1));
+}
+
+TEST_F(JournalReadingTest, FileThatCannotBeReadIsNoPage) {
+    m_journal.append(entryOf("before"));
+    m_journal.close({});
+    std::ofstream(file()) << std::string(10000, 'x');
+    EXPECT_EQ(m_journal.entriesAfter(0, 10), std::nullopt);
+}
+
+TEST_F(JournalReadingTest, ReaderSeesWholeEntriesInOrderWhileAThreadWrites) {
+    constexpr std::uint32_t kEntries = 3000;
+    std::jthread const writer([this] {
+        for (std::uint32_t i = 1; i <= kEntries; ++i)
+            m_journal.append(entryOf(std::to_string(i)));
+    });
+    std::uint32_t last = 0;
+    while (last < kEntries) {
+        auto const page = m_journal.entriesAfter(last, 100);
+        ASSERT_TRUE(page);
+        for (JournalRow const& row : page->rows) {
+            ASSERT_EQ(row.number, ++last);
+            ASSERT_EQ(row.text, std::to_string(last));
+        }
+    }
+}
+
+TEST_F(JournalTest, JournalWithoutAFileHasNothingToRead) {
+    Journal journal("");
+    journal.append(entryOf("first"));
+    EXPECT_EQ(journal.newest(), 0U);
+    EXPECT_THAT(journal.entriesAfter(0, 10)->rows, IsEmpty());
 }
 
 } // namespace
