@@ -11,6 +11,7 @@
 #include <vector>
 
 #include "agent/daemon/FrontChoice.h"
+#include "agent/daemon/HttpSide.h"
 #include "agent/daemon/ModuleLoader.h"
 #include "agent/daemon/Platform.h"
 #include "agent/fronts/snmp/Receivers.h"
@@ -90,6 +91,10 @@ int checkConfiguration(Options const& options) {
         StateDirectory::check(persistentDirectory(snmpFiles(options)));
     } catch (std::runtime_error const& error) {
         log(LogLevel::Error, error.what());
+        good = false;
+    }
+    for (std::string const& fault : checkHttpSide(options)) {
+        log(LogLevel::Error, fault);
         good = false;
     }
     // A subagent's access control is the master's.

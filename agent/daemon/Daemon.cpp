@@ -17,6 +17,7 @@
 #include "agent/daemon/AlarmReport.h"
 #include "agent/daemon/ConfigCheck.h"
 #include "agent/daemon/FrontChoice.h"
+#include "agent/daemon/HttpSide.h"
 #include "agent/daemon/InterruptibleStart.h"
 #include "agent/daemon/ModuleLoader.h"
 #include "agent/daemon/Platform.h"
@@ -205,7 +206,7 @@ void flushNotifications(Notifier& notifier, NotificationQueue& queue, Front& fro
         log(LogLevel::Warning, "notifications not sent before the stop: " + std::to_string(left));
 }
 
-void serve(Options const& options, ReadOptions const& readAgain, Front& front,
+void serve(Options const& options, ReadOptions const& readAgain, Front& front, HttpSide& http,
            Signals const& signals, InterruptibleStart& start, Boards& boards) {
     Clock::time_point const started = boards.counters.started;
     Wakeup wakeup;
@@ -279,6 +280,12 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
                  },
                  [&] { return collector.newest(); }, boards.settings,
                  capabilities(options.enterprise, KVLOAM_VERSION)});
+    std::vector<Table const*> everyTable = allTables;
+    everyTable.insert(everyTable.end(), allStandardTables.begin(), allStandardTables.end());
+    http.serve({{std::move(everyTable), {scalars(), standardScalars()}},
+                boards.counters,
+                boards.settings,
+                [&] { return collector.snapshot(); }});
     Notifier notifier(boards.queue, front.notifications(), [&](Notification& notification) {
         auto const snapshot = collector.newest();
         nameSubject(notification, trees, {*snapshot, boards.counters, &boards.settings});
@@ -298,6 +305,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
             reloadOptions(options, readAgain, boards);
             boards.alarmReport.note(JournalEvent::Configuration,
                                     "the configuration was read again");
+            http.readTokenAgain();
             if (options.agentx.empty())
                 configCheck.start();
             else
@@ -322,6 +330,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front,
     log(LogLevel::Info, serving);
     notice.ready(serving);
     front.run();
+    http.stop();
     signals.letStopThrough();
     notice.stopping();
     log(LogLevel::Info, "stopping");
@@ -363,13 +372,15 @@ int runDaemon(Options const& options, ReadOptions const& readAgain) {
         boards->alarms.apply(options.alarmPolicies, Instant::now());
         boards->alarms.restore(boards->alarmReport.open(persistentDirectory(files)),
                                Instant::now());
+        step = "opening the HTTP side";
+        HttpSide http(options);
         step = "connecting to the board platform";
         if (!schedulerRuns() || !platformAnswers()) return kExitFailure;
         boards->counters.started = Clock::now();
         step = "reading the boards";
         attachModules(modules, *boards);
         step = "serving";
-        serve(options, readAgain, *front, signals, start, *boards);
+        serve(options, readAgain, *front, http, signals, start, *boards);
         boards->alarmReport.close(boards->alarms.active());
         log(LogLevel::Info, "stopped");
     } catch (std::bad_alloc const&) {

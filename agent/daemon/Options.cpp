@@ -13,6 +13,7 @@
 
 #include "agent/daemon/ConfigFile.h"
 #include "agent/fronts/agentx/AgentxAddress.h"
+#include "agent/fronts/http/HttpSockets.h"
 #include "services/oam.h"
 
 namespace kvloamd {
@@ -61,6 +62,14 @@ std::string defaultModuleDirectory() {
     return KVLOAM_MODULE_DIRECTORY;
 }
 
+/// The Unix socket of a service, whose manager names the directory for it. Otherwise there is none.
+std::string defaultHttpSocket() {
+    char const* const directories = std::getenv("RUNTIME_DIRECTORY");
+    if (directories == nullptr || *directories == '\0') return {};
+    std::string const all = directories;
+    return all.substr(0, all.find(':')) + "/kvloamd.socket";
+}
+
 /// The configuration file, checked line by line before CLI11 reads it.
 class CheckedConfig final : public CLI::ConfigTOML {
   public:
@@ -94,6 +103,10 @@ class CheckedConfig final : public CLI::ConfigTOML {
 
 /// The conflict between options that are valid by themselves; empty: none.
 std::string checkTogether(Options const& options, bool listens) {
+    if (!options.http.empty() && parseHostAndPort(options.http).host.empty())
+        return "--http: '" + options.http + "' is not an address; write it like 127.0.0.1:8161";
+    if (!options.httpTokenFile.empty() && options.http.empty())
+        return "--http-token-file: without --http, no client sends a token; leave it out";
     if (options.agentx.empty()) return {};
     if (listens)
         return "--agentx excludes --port and --listen: a subagent has no port of its own; leave "
@@ -143,6 +156,7 @@ std::optional<Oid> parseOid(std::string_view text) {
 std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
     Options options;
     options.moduleDirectory = defaultModuleDirectory();
+    options.httpSocket = defaultHttpSocket();
     int port = 0;
     std::string enterprise = "1.3.6.1.4.1.32473";
     std::vector<std::string> listen;
@@ -186,6 +200,18 @@ std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
                    "The lowest ifIndex for new interfaces")
         ->check(CLI::Range(1, 1000000000))
         ->capture_default_str();
+    app.add_option("--http-socket", options.httpSocket,
+                   "Answer HTTP at this Unix socket; empty: at none. By default kvloamd.socket in "
+                   "the directory that the service manager provides")
+        ->type_name("PATH")
+        ->capture_default_str();
+    app.add_option("--http", options.http,
+                   "Answer HTTP also at this TCP address, as in 127.0.0.1:8161")
+        ->type_name("HOST:PORT");
+    app.add_option("--http-token-file", options.httpTokenFile,
+                   "File with the token that HTTP clients must send over TCP; required where other "
+                   "hosts can reach the address")
+        ->type_name("FILE");
     std::string logLevel = "info";
     app.add_option("--log-level", logLevel, "The least severe messages to write")
         ->type_name("error|warning|info|debug")

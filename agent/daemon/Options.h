@@ -22,6 +22,9 @@ struct Options {
     std::string persistentDirectory; ///< empty: Net-SNMP's default
     Oid enterprise{1, 3, 6, 1, 4, 1, 32473};
     std::uint32_t interfaceBase = 1000;
+    std::string httpSocket;    ///< the path of a Unix socket; empty: none
+    std::string http;          ///< HOST:PORT; empty: no TCP
+    std::string httpTokenFile; ///< empty: no token
     LogLevel logLevel = LogLevel::Info;
     AlarmPolicies alarmPolicies;
     bool checkConfig = false;

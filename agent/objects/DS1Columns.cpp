@@ -2,6 +2,7 @@
 // DS1-MIB's tables: the lines, their running intervals, their closed ones and the sums of these.
 #include <algorithm>
 
+#include "agent/objects/LineStatusBits.h"
 #include "agent/objects/RowValues.h"
 #include "agent/objects/StandardObjects.h"
 #include "agent/rows/StandardNumbers.h"
@@ -84,6 +85,18 @@ constexpr NamedNumber kDsx1LineBuildOut[] = {
 constexpr NamedNumber kDsx1LineImpedance[] = {
     {1, "notApplicable"}, {2, "unbalanced75ohms"}, {3, "balanced100ohms"}, {4, "balanced120ohms"}};
 
+/// Their sums are no enumerations in the MIB module, which describes the bits in words.
+constexpr NamedNumber kDsx1LoopbackStatus[] = {{1, "dsx1NoLoopback"},
+                                               {2, "dsx1NearEndPayloadLoopback"},
+                                               {4, "dsx1NearEndLineLoopback"},
+                                               {8, "dsx1NearEndOtherLoopback"},
+                                               {16, "dsx1NearEndInwardLoopback"},
+                                               {32, "dsx1FarEndPayloadLoopback"},
+                                               {64, "dsx1FarEndLineLoopback"}};
+
+constexpr NamedNumber kDsx1Fdl[] = {
+    {1, "other"}, {2, "dsx1AnsiT1403"}, {4, "dsx1Att54016"}, {8, "dsx1FdlNone"}};
+
 constexpr NamedNumber kTruthValues[] = {{1, "true"}, {2, "false"}};
 
 constexpr Column<Row> kConfigColumns[] = {
@@ -103,7 +116,9 @@ constexpr Column<Row> kConfigColumns[] = {
     {"dsx1LoopbackConfig", 9, Integer, number<&Row::loopbackConfig>,
      about("The loopback that is switched on").oneOf(kDsx1LoopbackConfig).as(Kind::Information)},
     {"dsx1LineStatus", 10, Integer, number<&Row::lineStatus>,
-     about("The failures, loopbacks and test codes of the line, as a sum of bits").as(Kind::State)},
+     about("The failures, loopbacks and test codes of the line, as a sum of bits")
+         .sumOf(kLineStatusBits)
+         .as(Kind::State)},
     {"dsx1SignalMode", 11, Integer, number<&Row::signalMode>,
      about("How channels are signalled").oneOf(kDsx1SignalMode).as(Kind::Information)},
     {"dsx1TransmitClockSource", 12, Integer, number<&Row::transmitClockSource>,
@@ -111,7 +126,7 @@ constexpr Column<Row> kConfigColumns[] = {
          .oneOf(kDsx1TransmitClockSource)
          .as(Kind::Information)},
     {"dsx1Fdl", 13, Integer, number<&Row::fdl>,
-     about("The uses of the facility data link, as a sum of bits")},
+     about("The uses of the facility data link, as a sum of bits").sumOf(kDsx1Fdl)},
     {"dsx1InvalidIntervals", 14, Integer, invalidIntervals,
      about("How many closed intervals have no valid data").in("intervals").as(Kind::Gauge)},
     {"dsx1LineLength", 15, Integer, number<&Row::lineLength>,
@@ -124,7 +139,9 @@ constexpr Column<Row> kConfigColumns[] = {
          .settable(kTraps)
          .as(Kind::Information)},
     {"dsx1LoopbackStatus", 18, Integer, number<&Row::loopbackStatus>,
-     about("The loopbacks at both ends, as a sum of bits").as(Kind::State)},
+     about("The loopbacks at both ends, as a sum of bits")
+         .sumOf(kDsx1LoopbackStatus)
+         .as(Kind::State)},
     {"dsx1Ds1ChannelNumber", 19, Integer, number<&Row::ds1ChannelNumber>,
      about("Which channel of a DS3 the line is")},
     {"dsx1Channelization", 20, Integer, number<&Row::channelization>,

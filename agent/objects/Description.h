@@ -52,12 +52,14 @@ enum class Kind {
 /// What there is to say about an object beyond its name, type and place. Written as a sentence:
 ///
 ///     about("The state of the line").oneOf(kStates)
+///     about("What is wrong with the line, as a sum of bits").sumOf(kFailures)
 ///     about("Octets received").in("octets")
 ///     about("The name that operators gave").settable(kAlias).identifies()
 struct Details {
     char const* help = "";                           ///< one line for people, without a full stop
     char const* unit = "";                           ///< in the plural; empty: none
     Names names = {};                                ///< of an enumeration, or of the bits of a set
+    Names bits = {};                                 ///< of a sum: its powers of two
     bool hasOtherNumbers = false;                    ///< numbers without a name are legal as well
     std::optional<Writable> writable = std::nullopt; ///< nothing: the object is read-only
     bool isIdentifying = false;                      ///< people recognise the row by it
@@ -71,6 +73,11 @@ struct Details {
     constexpr Details someOf(Names numbers) const {
         Details changed = oneOf(numbers);
         changed.hasOtherNumbers = true;
+        return changed;
+    }
+    constexpr Details sumOf(Names powers) const {
+        Details changed = *this;
+        changed.bits = powers;
         return changed;
     }
     constexpr Details in(char const* what) const {

@@ -99,7 +99,7 @@ constexpr Column<Row> kPhysicalColumns[] = {
      about("Whether the entity can be replaced in the field")
          .oneOf(kTruthValues)
          .as(Kind::Information)},
-    {"entPhysicalMfgDate", 17, Octets, manufacturingDate, about("When the entity was made")},
+    {"entPhysicalMfgDate", 17, Date, manufacturingDate, about("When the entity was made")},
     {"entPhysicalUris", 18, Octets, text<&Row::uris>,
      about("Identifiers of the entity as URIs, separated by white space").settable(kUris)},
     {"entPhysicalUUID", 19, Octets, notKnown,

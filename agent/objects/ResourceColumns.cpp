@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // kvlResourceDeviceTable.
+#include "agent/objects/LineStatusBits.h"
 #include "agent/objects/OwnObjects.h"
 #include "agent/objects/RowValues.h"
 
@@ -61,7 +62,7 @@ constexpr Column<ResourceRow> kColumns[] = {
          .oneOf(kLineTypes)
          .as(Kind::Information)},
     {"kvlResourceDeviceLineStatus", 14, Integer, number<&ResourceRow::lineStatus>,
-     about("The alarms of the trunk's line, a sum of bits").as(Kind::State)},
+     about("The alarms of the trunk's line, a sum of bits").sumOf(kLineStatusBits).as(Kind::State)},
     {"kvlResourceDeviceProtocolType", 15, Integer, number<&ResourceRow::protocolType>,
      about("The platform's number for the trunk's protocol")},
     {"kvlResourceDeviceBearerCount", 16, Integer, number<&ResourceRow::bearerCount>,

@@ -133,6 +133,31 @@ TEST_F(OptionsTest, EnterpriseArcThatIsNoNameIsRefused) {
     }
 }
 
+/// The agent of a test has no service manager.
+TEST_F(OptionsTest, HttpSocketIsInTheServicesDirectory) {
+    unsetenv("RUNTIME_DIRECTORY");
+    EXPECT_EQ(options({}).httpSocket, "");
+    setenv("RUNTIME_DIRECTORY", "/run/kvloam:/run/other", 1);
+    EXPECT_EQ(options({}).httpSocket, "/run/kvloam/kvloamd.socket");
+    EXPECT_EQ(options({"--http-socket", "/tmp/other"}).httpSocket, "/tmp/other");
+    EXPECT_EQ(options({"--http-socket", ""}).httpSocket, "");
+    unsetenv("RUNTIME_DIRECTORY");
+}
+
+TEST_F(OptionsTest, HttpAddressHasAPortAndAHostOfItsOwn) {
+    EXPECT_EQ(options({}).http, "");
+    for (char const* const address : {"127.0.0.1:8161", "8161", "[::1]:8161", "localhost:1"})
+        EXPECT_EQ(options({"--http", address}).http, address);
+    for (char const* const address : {"127.0.0.1", ":8161", "127.0.0.1:", "127.0.0.1:0", "::1:8161",
+                                      "localhost:65536", "localhost:80x", "[]:80"})
+        EXPECT_EQ(refusal({"--http", address}).status, kExitUsage) << address;
+}
+
+TEST_F(OptionsTest, TokenWithoutTcpIsRefused) {
+    EXPECT_EQ(refusal({"--http-token-file", "token"}).status, kExitUsage);
+    EXPECT_EQ(options({"--http", "8161", "--http-token-file", "token"}).httpTokenFile, "token");
+}
+
 TEST_F(OptionsTest, InterfaceBaseIsRead) {
     EXPECT_EQ(options({}).interfaceBase, 1000U);
     EXPECT_EQ(options({"--interface-base", "1"}).interfaceBase, 1U);

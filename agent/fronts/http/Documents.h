@@ -1,0 +1,72 @@
+// SPDX-License-Identifier: BSD-2-Clause
+// The documents of the JSON API.
+#pragma once
+
+#include <cstddef>
+#include <span>
+#include <stdexcept>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "agent/fronts/http/Lists.h"
+#include "agent/fronts/http/Target.h"
+
+namespace kvloamd {
+
+/// Why there is no document, and the HTTP status that says so.
+class HttpFault : public std::runtime_error {
+  public:
+    HttpFault(int status, std::string const& message)
+        : std::runtime_error(message), m_status(status) {}
+
+    int status() const { return m_status; }
+
+  private:
+    int m_status;
+};
+
+/// The objects that the documents show.
+struct DescribedObjects {
+    std::vector<Table const*> tables;
+    std::vector<std::span<Scalar const>> scalars;
+};
+
+/// A `Documents` writes the documents below /api/v1/. Immutable.
+class Documents {
+  public:
+    /// The most rows in one answer of /api/v1/tables/<name>.
+    static constexpr std::size_t kMostRows = 10000;
+
+    /// What is described outlives the documents.
+    explicit Documents(DescribedObjects objects);
+
+    /// The document that `target` names, whose first two segments are "api" and "v1". Throws
+    /// HttpFault when there is none.
+    std::string write(View const& view, Target const& target) const;
+
+  private:
+    struct Lists {
+        std::string_view name; ///< of the resource
+        std::vector<ListWriter> writers;
+    };
+
+    std::string resource(View const& view, Lists const& lists) const;
+    std::string board(View const& view, std::string_view name) const;
+    std::string line(View const& view, std::string_view name) const;
+    std::string health(View const& view) const;
+    std::string scalars(View const& view) const;
+    std::string tables(View const& view) const;
+    std::string table(View const& view, std::string_view name, Target const& target) const;
+    ListWriter const& writerOf(std::string_view key) const;
+
+    DescribedObjects m_objects;
+    std::vector<Lists> m_lists;
+    ListWriter m_intervals;
+};
+
+/// The keys of /api/v1/health's object that come from scalars, with the scalars.
+std::vector<std::pair<std::string, Scalar const*>>
+healthScalars(std::vector<std::span<Scalar const>> const& scalars);
+
+} // namespace kvloamd
