@@ -1,15 +1,14 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The standard tables of lines, channels and interfaces, as the real agent serves them.
+// The tables of interfaces: IF-MIB, EtherLike-MIB and ISDN-MIB, as the real agent serves them.
 #include <algorithm>
-#include <cstdlib>
-#include <filesystem>
 #include <map>
 #include <set>
+#include <string>
+#include <utility>
 
 #include <gmock/gmock.h>
 
-#include "agent/daemon/Options.h"
-#include "tests/e2e/AgentFixture.h"
+#include "tests/e2e/InterfaceFixture.h"
 
 namespace kvloamd::e2e {
 namespace {
@@ -20,71 +19,7 @@ using ::testing::HasSubstr;
 using ::testing::Not;
 using ::testing::SizeIs;
 
-constexpr char kIf[] = "1.3.6.1.2.1.2.2.1.";
-constexpr char kIfX[] = "1.3.6.1.2.1.31.1.1.1.";
-constexpr char kStack[] = "1.3.6.1.2.1.31.1.2.1.3";
-constexpr char kConfig[] = "1.3.6.1.2.1.10.18.6.1.";
-constexpr char kCurrent[] = "1.3.6.1.2.1.10.18.7.1.";
-constexpr char kInterval[] = "1.3.6.1.2.1.10.18.8.1.";
-constexpr char kTotal[] = "1.3.6.1.2.1.10.18.9.1.";
-constexpr char kIsdn[] = "1.3.6.1.2.1.10.20.1.";
-constexpr char kDot3[] = "1.3.6.1.2.1.10.7.2.1.";
-
-class InterfaceTest : public AgentFixture {
-  protected:
-    /// The value of an instance, without names: "INTEGER: 3", "STRING: "x"".
-    std::string at(std::string const& column, std::string const& instance) const {
-        auto const answered = answers("snmpget", {"-Oe", column + "." + instance});
-        return answered.empty() ? "nothing" : answered.front().value;
-    }
-    std::vector<Answer> walkOf(std::string const& from) const {
-        auto all = answers("snmpbulkwalk", {"-Oe", "-Cr50", from});
-        std::erase_if(all,
-                      [](Answer const& answer) { return answer.value.starts_with("No Such"); });
-        return all;
-    }
-    /// The values of a column by index, such as "1000" or "1000.96".
-    std::map<std::string, std::string> column(std::string const& name) const {
-        std::map<std::string, std::string> values;
-        std::size_t const parts = parseOid(name)->size();
-        for (Answer const& answer : walkOf(name)) {
-            std::string index;
-            for (std::size_t i = parts; i < answer.name.size(); ++i)
-                index += (i == parts ? "" : ".") + std::to_string(answer.name[i]);
-            values[index] = answer.value;
-        }
-        return values;
-    }
-    /// The ifIndex of the line of that name; "none" when there is none.
-    std::string lineNamed(std::string const& name) const {
-        for (auto const& [index, value] : column(std::string(kIfX) + "1"))
-            if (value == "STRING: \"" + name + "\"") return index;
-        return "none";
-    }
-    /// Starts the agent and waits until the first line has closed the last interval of its past,
-    /// after which nothing is closed for a quarter of an hour.
-    void startWithFullHistory() {
-        startAgent();
-        ASSERT_TRUE(eventually([&] { return at(c(kConfig, 4), "1000") == "INTEGER: 96"; }));
-    }
-    static long numberIn(std::string const& value) {
-        auto const colon = value.find(": ");
-        return colon == std::string::npos ? -1 : std::atol(value.c_str() + colon + 2);
-    }
-    static bool isStrictlyIncreasing(std::vector<Answer> const& answers) {
-        return std::ranges::adjacent_find(answers, [](Answer const& a, Answer const& b) {
-                   return compare(a.name, b.name) >= 0;
-               }) == answers.end();
-    }
-    /// A board of a chassis with one line, "line-<serial number>".
-    static std::string boardWithLine(int handle, std::string const& serialNumber) {
-        return "  - handle: " + std::to_string(handle) +
-               "\n    attributes: {SERIAL_NUMBER: " + serialNumber +
-               "}\n    devices: [{handle: " + std::to_string(handle * 10) +
-               ", type: 501, attributes: {NAME: line-" + serialNumber + "}, line: {type: esf}}]\n";
-    }
-    static std::string c(char const* entry, int number) { return entry + std::to_string(number); }
-};
+class InterfaceTest : public InterfaceFixture {};
 
 TEST_F(InterfaceTest, EveryInterfaceOfTheExampleChassisHasARow) {
     startAgent();
@@ -109,26 +44,6 @@ TEST_F(InterfaceTest, EveryInterfaceOfTheExampleChassisHasARow) {
     EXPECT_EQ(types["INTEGER: 24"], 1);  // the loopback
     EXPECT_EQ(types["INTEGER: 6"], 1);   // the Ethernet interface
     EXPECT_EQ(types["INTEGER: 53"], 2);  // the IP interfaces on them
-}
-
-TEST_F(InterfaceTest, LineHasTheColumnsThatItCanAnswer) {
-    startAgent();
-    std::string const line = lineNamed("nx5-trunk-1");
-    EXPECT_EQ(line, "1000");
-    EXPECT_EQ(at(c(kIf, 1), line), "INTEGER: 1000");
-    EXPECT_EQ(at(c(kIf, 5), line), "Gauge32: 1544000");
-    EXPECT_EQ(at(c(kIf, 7), line), "INTEGER: 1");
-    EXPECT_EQ(at(c(kIf, 8), line), "INTEGER: 1");
-    EXPECT_THAT(at(c(kIf, 9), line), HasSubstr("Timeticks: (0)"));
-    EXPECT_EQ(at(c(kIfX, 14), line), "INTEGER: 1");
-    EXPECT_EQ(at(c(kIfX, 15), line), "Gauge32: 2");
-    EXPECT_EQ(at(c(kIfX, 17), line), "INTEGER: 1");
-    EXPECT_EQ(at(c(kIfX, 18), line), "\"\"");
-    EXPECT_EQ(at(c(kIf, 6), line), "STRING: \"T1-0001\"");
-    // A line carries bits, not packets, so it has no packet counters.
-    for (int const number : {4, 10, 11, 20})
-        EXPECT_THAT(at(c(kIf, number), line), HasSubstr("No Such Instance"));
-    EXPECT_THAT(at(c(kIfX, 6), line), HasSubstr("No Such Instance"));
 }
 
 TEST_F(InterfaceTest, CountersOfAnInterfaceHave64Bits) {
@@ -274,83 +189,6 @@ TEST_F(InterfaceTest, ChannelsLieAboveTheirLine) {
     EXPECT_FALSE(stack.contains("0." + first));
 }
 
-TEST_F(InterfaceTest, BrokenLineShowsInItsStatusAndIsDown) {
-    startAgent();
-    std::string const line = lineNamed("nx5-trunk-2");
-    EXPECT_EQ(at(c(kConfig, 10), line), "INTEGER: 1"); // no alarm
-    sim({"line", "alarm", "102", "los"});
-    EXPECT_TRUE(eventually([&] { return (numberIn(at(c(kConfig, 10), line)) & 64) != 0; }));
-    EXPECT_TRUE(eventually([&] { return at(c(kIf, 8), line) == "INTEGER: 2"; }));
-    EXPECT_EQ(at(c(kIf, 8), lineNamed("nx5-trunk-1")), "INTEGER: 1");
-    // The line counts, and reports the time of the failure.
-    EXPECT_TRUE(eventually([&] { return numberIn(at(c(kCurrent, 5), line)) > 0; }));
-    EXPECT_THAT(at(c(kConfig, 16), line), HasSubstr("Timeticks: ("));
-    sim({"line", "mend", "102"});
-    EXPECT_TRUE(eventually([&] { return at(c(kConfig, 10), line) == "INTEGER: 1"; }));
-    EXPECT_TRUE(eventually([&] { return at(c(kIf, 8), line) == "INTEGER: 1"; }));
-}
-
-TEST_F(InterfaceTest, SetUpOfALineIsShown) {
-    startAgent();
-    std::string const line = lineNamed("nx5-trunk-1");
-    EXPECT_EQ(at(c(kConfig, 1), line), "INTEGER: " + line);
-    EXPECT_EQ(at(c(kConfig, 5), line), "INTEGER: 2"); // ESF
-    EXPECT_EQ(at(c(kConfig, 6), line), "INTEGER: 2"); // B8ZS
-    EXPECT_EQ(at(c(kConfig, 8), line), "STRING: \"T1-0001\"");
-    EXPECT_EQ(at(c(kConfig, 15), line), "INTEGER: 40");
-    EXPECT_EQ(at(c(kConfig, 17), line), "INTEGER: 2");
-    EXPECT_EQ(at(c(kConfig, 18), line), "INTEGER: 1");
-    EXPECT_EQ(at(c(kConfig, 20), lineNamed("vorn-primary-rate-1")), "INTEGER: 2");
-    EXPECT_EQ(column(c(kConfig, 22)).size(), 5U);
-}
-
-TEST_F(InterfaceTest, LineWithAPastHasItsIntervals) {
-    startWithFullHistory();
-    std::string const line = lineNamed("nx5-trunk-1");
-    EXPECT_EQ(at(c(kConfig, 14), line), "INTEGER: 1");
-    auto const numbers = column(c(kInterval, 2));
-    EXPECT_THAT(numbers, SizeIs(96)); // the other lines have closed none
-    EXPECT_EQ(numbers.at(line + ".1"), "INTEGER: 1");
-    EXPECT_EQ(numbers.at(line + ".96"), "INTEGER: 96");
-    EXPECT_EQ(at(c(kInterval, 13), line + ".95"), "INTEGER: 1");
-    EXPECT_EQ(at(c(kInterval, 13), line + ".96"), "INTEGER: 2");
-    EXPECT_THAT(at(c(kInterval, 3), line + ".97"), HasSubstr("No Such Instance"));
-    EXPECT_EQ(at(c(kConfig, 4), lineNamed("nx5-trunk-2")), "INTEGER: 0");
-}
-
-TEST_F(InterfaceTest, PastOfALineShowsInTheIntervalsThatItWasIn) {
-    startWithFullHistory();
-    // The signal was lost for 240 seconds, 50400 seconds ago: in interval 56, or in two
-    // neighbouring intervals.
-    auto const unavailable = column(c(kInterval, 6));
-    std::string const line = lineNamed("nx5-trunk-1");
-    long seconds = 0;
-    for (int const number : {55, 56, 57})
-        seconds += numberIn(unavailable.at(line + "." + std::to_string(number)));
-    EXPECT_EQ(seconds, 240);
-    EXPECT_EQ(unavailable.at(line + ".50"), "Gauge32: 0");
-}
-
-TEST_F(InterfaceTest, TotalsAreTheSumsOfTheClosedIntervals) {
-    startWithFullHistory();
-    std::string const line = lineNamed("nx5-trunk-1");
-    for (int counter = 2; counter <= 11; ++counter) {
-        long sum = 0;
-        for (auto const& [index, value] : column(c(kInterval, counter + 1)))
-            sum += numberIn(value);
-        EXPECT_EQ(at(c(kTotal, counter), line), "Gauge32: " + std::to_string(sum)) << counter;
-    }
-    EXPECT_EQ(at(c(kTotal, 2), lineNamed("nx5-trunk-2")), "Gauge32: 0");
-}
-
-TEST_F(InterfaceTest, TimeOfTheRunningIntervalGoesOn) {
-    startAgent();
-    std::string const line = lineNamed("nx5-trunk-2");
-    long const before = numberIn(at(c(kConfig, 3), line));
-    EXPECT_GE(before, 0);
-    EXPECT_TRUE(eventually([&] { return numberIn(at(c(kConfig, 3), line)) > before; }));
-}
-
 TEST_F(InterfaceTest, ChannelsHaveTheirStates) {
     startAgent();
     EXPECT_THAT(column(c(kIsdn, 2) + ".1.1.1"), SizeIs(60));
@@ -396,15 +234,6 @@ TEST_F(InterfaceTest, WholeTreeIsWalkedInOrderWhateverTheRequest) {
         })) << entry;
 }
 
-TEST_F(InterfaceTest, BulkWalksOfAnySizeAgreeWithTheWalk) {
-    startWithFullHistory();
-    auto const walked = walk("1.3.6.1.2.1.10.18.8");
-    ASSERT_THAT(walked, SizeIs(13 * 95 + 3)); // the oldest has no counts
-    for (char const* const repetitions : {"-Cr1", "-Cr7", "-Cr50"})
-        EXPECT_EQ(answers("snmpbulkwalk", {repetitions, "1.3.6.1.2.1.10.18.8"}), walked)
-            << repetitions;
-}
-
 TEST_F(InterfaceTest, ViewThatLeavesOutAnInterfaceHoldsForItsInstances) {
     configureSnmp("view some included .1.3.6.1.2.1.2.2.1\n"
                   "view some excluded .1.3.6.1.2.1.2.2.1.2.1001\n"
@@ -422,60 +251,6 @@ TEST_F(InterfaceTest, StateThatIsWantedCanNotBeWritten) {
     EXPECT_NE(result.status, 0);
     EXPECT_THAT(result.output, HasSubstr("notWritable"));
     EXPECT_EQ(at(c(kIf, 7), "1000"), "INTEGER: 1");
-}
-
-TEST_F(InterfaceTest, IndicesAreTheSameAfterARestart) {
-    startAgent();
-    auto const before = column(c(kIfX, 1));
-    EXPECT_THAT(before, SizeIs(73));
-    EXPECT_EQ(stopAgent(), 0);
-    startAgent({"--interface-base", "5000"});
-    EXPECT_EQ(column(c(kIfX, 1)), before);
-}
-
-TEST_F(InterfaceTest, FirstIndexIsTheBase) {
-    startAgent({"--interface-base", "5000"});
-    EXPECT_EQ(column(c(kIf, 1)).begin()->first, "5000");
-}
-
-TEST_F(InterfaceTest, RowsGoWithABoardAndComeBackUnderTheSameIndices) {
-    useChassis("boards:\n" + boardWithLine(1, "ONE") + boardWithLine(2, "TWO"));
-    startAgent();
-    ASSERT_EQ(lineNamed("line-ONE"), "1000");
-    ASSERT_EQ(lineNamed("line-TWO"), "1016");
-    sim({"remove", "1"});
-    EXPECT_TRUE(eventually([&] { return column(c(kConfig, 1)).size() == 1; }));
-    EXPECT_EQ(lineNamed("line-ONE"), "none");
-    EXPECT_EQ(lineNamed("line-TWO"), "1016");
-    // A board with another serial number is another board, even in the same slot.
-    write(path("new.yaml"), "boards:\n" + boardWithLine(1, "NEW"));
-    sim({"insert", path("new.yaml")});
-    EXPECT_TRUE(eventually([&] { return lineNamed("line-NEW") == "1032"; }));
-    write(path("one.yaml"), "boards:\n" + boardWithLine(7, "ONE"));
-    sim({"insert", path("one.yaml")});
-    EXPECT_TRUE(eventually([&] { return lineNamed("line-ONE") == "1000"; }));
-}
-
-TEST_F(InterfaceTest, BoardThatIsAwayDuringARestartHasItsIndicesAgain) {
-    useChassis("boards:\n" + boardWithLine(1, "ONE") + boardWithLine(2, "TWO"));
-    startAgent();
-    EXPECT_EQ(stopAgent(), 0);
-    useChassis("boards:\n" + boardWithLine(3, "NEW"));
-    startAgent();
-    EXPECT_EQ(lineNamed("line-NEW"), "1032");
-    EXPECT_EQ(stopAgent(), 0);
-    useChassis("boards:\n" + boardWithLine(5, "TWO"));
-    startAgent();
-    EXPECT_EQ(lineNamed("line-TWO"), "1016");
-}
-
-TEST_F(InterfaceTest, DamagedIndexFileIsSetAside) {
-    std::filesystem::create_directories(path("persistent"));
-    write(path("persistent/ifindex.sqlite"),
-          "this is no database, and long enough to be taken for one if nobody looks into it");
-    startAgent();
-    EXPECT_THAT(agent().output(), HasSubstr("ifindex.sqlite.damaged-"));
-    EXPECT_EQ(lineNamed("nx5-trunk-1"), "1000");
 }
 
 } // namespace
