@@ -48,7 +48,7 @@ AgentFixture::AgentFixture() {
     // The tools print a message when they create it themselves.
     std::filesystem::create_directories(path("client/cert_indexes"));
     std::filesystem::create_directories(path("store"));
-    configureSnmp("rocommunity public 127.0.0.1\n");
+    configureSnmp(kReader);
 }
 
 AgentFixture::~AgentFixture() {

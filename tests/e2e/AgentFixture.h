@@ -103,6 +103,8 @@ class AgentFixture : public ::testing::Test {
     /// Runs any program; waits for its end.
     Result run(std::vector<std::string> const& command) const;
 
+    /// Lets everybody on loopback read.
+    static constexpr char kReader[] = "rocommunity public 127.0.0.1\n";
     static constexpr char kObjects[] = "1.3.6.1.4.1.32473.1";
     static constexpr char kBoards[] = "1.3.6.1.4.1.32473.1.1.2";
     static constexpr char kTable[] = "1.3.6.1.4.1.32473.1.1.2.4";

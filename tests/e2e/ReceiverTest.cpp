@@ -18,7 +18,6 @@ using ::testing::AllOf;
 using ::testing::HasSubstr;
 using ::testing::Not;
 
-constexpr char kReader[] = "rocommunity public 127.0.0.1\n";
 constexpr char kInformUser[] =
     "trapsess -Ci -v 3 -u op -l authPriv -a SHA -A authpass1 -x AES -X privpass1 ";
 

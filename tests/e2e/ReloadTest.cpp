@@ -14,7 +14,6 @@ using ::testing::AllOf;
 using ::testing::HasSubstr;
 using ::testing::Not;
 
-constexpr char kReader[] = "rocommunity public 127.0.0.1\n";
 constexpr char kReadAgain[] =
     "kvloamd: the SNMP configuration (communities, users, views, receivers) has been read again\n";
 

@@ -122,7 +122,7 @@ TEST_F(SetTest, NoneOfSeveralIsSetWhenOneCanNotBe) {
 }
 
 TEST_F(SetTest, ReaderCanNotSet) {
-    configureSnmp("rocommunity public 127.0.0.1\n");
+    configureSnmp(kReader);
     startAgent();
     EXPECT_THAT(refusal({kLineTraps, "i", "1"}), HasSubstr("noAccess"));
     EXPECT_EQ(get(kLineTraps), "INTEGER: 2");
