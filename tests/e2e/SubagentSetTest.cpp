@@ -13,6 +13,7 @@ constexpr char kLineTraps[] = "1.3.6.1.2.1.10.18.6.1.17.";
 constexpr char kLinkTrapsOfLine[] = "1.3.6.1.2.1.31.1.1.1.14.1000";
 constexpr char kLineTrapsOfLine[] = "1.3.6.1.2.1.10.18.6.1.17.1000";
 constexpr char kAliasOfLine[] = "1.3.6.1.2.1.31.1.1.1.18.1000";
+constexpr char kCircuitOfLine[] = "1.3.6.1.2.1.10.18.6.1.8.1000";
 constexpr char kLineName[] = "1.3.6.1.2.1.31.1.1.1.1.1000";
 
 class SubagentSetTest : public MasterFixture {
@@ -74,6 +75,20 @@ TEST_F(SubagentSetTest, TextAmongTheHostsRowsIsSetAndKept) {
     ASSERT_TRUE(isConnected()) << agent().output();
     EXPECT_TRUE(eventually([this] { return get(kAliasOfLine) == "STRING: \"to Berlin\""; }))
         << get(kAliasOfLine);
+}
+
+TEST_F(SubagentSetTest, CircuitIdentifierIsSetAndKept) {
+    start();
+    EXPECT_EQ(get(kCircuitOfLine), "STRING: \"T1-0001\"");
+    EXPECT_THAT(set({kCircuitOfLine, "s", std::string(256, 'x')}), HasSubstr("wrongLength"));
+    EXPECT_EQ(get(kCircuitOfLine), "STRING: \"T1-0001\"");
+    EXPECT_THAT(set({kCircuitOfLine, "s", "B-4711"}), HasSubstr("B-4711"));
+    EXPECT_EQ(get(kCircuitOfLine), "STRING: \"B-4711\"");
+    EXPECT_EQ(stopAgent(), 0) << agent().output();
+    startSubagent();
+    ASSERT_TRUE(isConnected()) << agent().output();
+    EXPECT_TRUE(eventually([this] { return get(kCircuitOfLine) == "STRING: \"B-4711\""; }))
+        << get(kCircuitOfLine);
 }
 
 TEST_F(SubagentSetTest, VariablesOfSeveralTablesAreSetTogether) {
