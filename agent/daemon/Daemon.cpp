@@ -294,8 +294,9 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front, H
     AlarmClock alarmClock(boards.alarms, boards.alarmReport, boards.counters,
                           [&] { collector.renew(); });
     ServiceNotice notice;
-    std::string const serving =
-        "serving " + std::to_string(collector.newest()->boards.size()) + " boards " + front.place();
+    std::size_t const boardCount = collector.newest()->boards.size();
+    std::string const serving = "serving " + std::to_string(boardCount) +
+                                (boardCount == 1 ? " board " : " boards ") + front.place();
     front.watch(wakeup.descriptor(), [&] { wakeup.clear(); });
     ConfigCheck configCheck(options);
     front.watch(signals.descriptor(), [&] {

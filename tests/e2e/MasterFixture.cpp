@@ -39,7 +39,7 @@ void MasterFixture::killMaster() {
 void MasterFixture::startSubagent(int boards) {
     launchAgent({"--agentx", m_address, "--module", "z7sim", "--module-dir", moduleDirectory()});
     ASSERT_TRUE(agent().waitFor("kvloamd: serving " + std::to_string(boards) +
-                                " boards through the SNMP master"))
+                                (boards == 1 ? " board" : " boards") + " through the SNMP master"))
         << agent().output();
 }
 

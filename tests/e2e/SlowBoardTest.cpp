@@ -24,7 +24,7 @@ class SlowBoardTest : public AgentFixture {
                                      "--module-dir", BROKEN_MODULE_DIR, "--snmp-config",
                                      path("snmp.conf"), "--persistent-dir", path("persistent")},
             variables);
-        ASSERT_TRUE(m_agent->waitFor("serving 1 boards")) << m_agent->output();
+        ASSERT_TRUE(m_agent->waitFor("serving 1 board ")) << m_agent->output();
         // Requests make the agent refresh its snapshot.
         ASSERT_TRUE(eventually([this] {
             askForName();
