@@ -88,6 +88,12 @@ void PlatformReader::readStore(Wanted const& wanted) {
     }
     for (BoardRow const* const board : wanted)
         m_boards[board->boardIndex].store = store.read(board->serialNumber, board->boardIndex);
+    note(m_storeHasBoards,
+         std::ranges::any_of(m_boards,
+                             [](auto const& board) { return board.second.store.has_value(); }),
+         "the attribute store has a record of none of the boards, so its table is empty; it may "
+         "be the store of another chassis (see VQRXCFGPATH)",
+         "the attribute store has records of the boards");
 }
 
 std::shared_ptr<PlatformRecords const> PlatformReader::joined() const {

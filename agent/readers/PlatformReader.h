@@ -19,8 +19,9 @@ namespace kvloamd {
 /// of them when the last such reading is old. A board is found by its serial number.
 ///
 /// While the device mapper does not answer, what it answered last stays; while the attribute store
-/// cannot be read, there are no records of it. The log says when either begins and when it ends. On
-/// a host without an attribute store, it is no fault that there is none.
+/// cannot be read, there are no records of it. The log says when either begins and when it ends,
+/// and when the store has a record of none of the boards. On a host without an attribute store, it
+/// is no fault that there is none.
 ///
 /// Thread-bound: the collector, which alone uses the attribute store.
 class PlatformReader {
@@ -60,6 +61,7 @@ class PlatformReader {
     std::shared_ptr<PlatformRecords const> m_records = std::make_shared<PlatformRecords>();
     bool m_mapperAnswers = true;
     bool m_storeReadable = true;
+    bool m_storeHasBoards = true;
 };
 
 } // namespace kvloamd

@@ -236,5 +236,22 @@ TEST_F(PlatformReaderTest, StoreIsConfiguredByItsDirectory) {
     EXPECT_EQ(storeIsConfigured(), std::filesystem::exists("/usr/velquor/cfg"));
 }
 
+TEST_F(PlatformReaderTest, StoreOfAnotherChassisIsLoggedOnce) {
+    sim::command({{"command", "store-remove"}, {"serial", "S5"}});
+    testing::internal::CaptureStderr();
+    m_always.read(both());
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), ""); // one board has a record
+    sim::command({{"command", "store-remove"}, {"serial", "S7"}});
+    testing::internal::CaptureStderr();
+    for (int reading = 0; reading < 3; ++reading)
+        m_always.read(both());
+    sim::command({{"command", "store-add"}, {"serial", "S7"}});
+    m_always.read(both());
+    std::string const logged = testing::internal::GetCapturedStderr();
+    EXPECT_EQ(timesIn(logged, "the attribute store has a record of none of the boards"), 1)
+        << logged;
+    EXPECT_EQ(timesIn(logged, "the attribute store has records of the boards"), 1) << logged;
+}
+
 } // namespace
 } // namespace kvloamd
