@@ -1,0 +1,157 @@
+# SPDX-License-Identifier: BSD-2-Clause
+"""The code blocks of a document, and the comparison of what they show with what came.
+
+A block that begins with ```sh holds commands, one with ```console commands after "$ " and what each
+prints. A comment on the line before the block may say more, several things separated by ";":
+
+  <!-- not run: REASON -->        a test cannot run it; the reason is printed
+  <!-- file: PATH -->             the block is the contents of this file: it is written there
+  <!-- printed by: COMMAND -->    the lines of the block are among what this command prints, in order
+  <!-- terminal: NAME -->         it is typed in another terminal
+  <!-- stays -->                  its last command keeps running in that terminal
+  <!-- fails -->                  its last command ends with another status than 0
+  <!-- from FILE -->              it is part of this file, which check-snippets tests
+
+Comparison: runs of blanks count as one blank. Times of day, dates, TimeTicks, durations (a number before
+ms, s, milliseconds or seconds) and process ids are not compared, other numbers are. "..." stands for any
+text in a line, a line of its own "..." for any number of lines.
+"""
+import dataclasses
+import re
+
+DIRECTIVES = ("not run", "not compiled", "file", "printed by", "terminal", "stays", "fails", "from")
+COMMAND_LANGUAGES = ("sh", "console")
+MASKS = [
+    (r"Timeticks: \(\d+\) (\d+ days?, )?[\d:.]+", "<ticks>"),
+    (r"\b\d{4}-\d\d?-\d\d?([ T,]\d\d?:\d\d:\d\d(\.\d+)?(Z|,?[+-]\d\d?:\d\d)?)?", "<date>"),
+    (r"\b(\d+:)?\d+:\d\d:\d\d(\.\d+)?\b", "<time>"),
+    (r"\b\d+(\.\d+)? (ms|s|milliseconds|seconds)\b", "<duration>"),
+    (r"\b(process|pid) \d+", r"\1 <process>"),
+]
+
+
+@dataclasses.dataclass
+class Block:
+    line: int
+    language: str
+    text: str
+    directives: dict
+
+
+@dataclasses.dataclass
+class Command:
+    line: int
+    text: str
+    expected: list
+
+
+def directives_of(comment):
+    """What a comment before a block says; nothing if it is a comment of another kind."""
+    found = {}
+    whole = comment.startswith(("not run", "not compiled", "printed by"))
+    for part in [comment] if whole else comment.split(";"):
+        part = part.strip()
+        name = next((d for d in DIRECTIVES if re.match(d + r"\b", part)), None)
+        if name is None:
+            return {}
+        found[name] = part[len(name):].lstrip(":").strip()
+    return found
+
+
+def blocks_of(text):
+    """The blocks of a document, in order."""
+    blocks, lines = [], text.splitlines()
+    directives, at = {}, 0
+    while at < len(lines):
+        line = lines[at]
+        fence = re.match(r"( *)```(\S*)\s*$", line)
+        if fence:
+            indent, start = len(fence[1]), at
+            at += 1
+            content = []
+            while at < len(lines) and lines[at].strip() != "```":
+                content.append(lines[at][indent:])
+                at += 1
+            blocks.append(Block(start + 1, fence[2], "\n".join(content) + "\n", directives))
+            directives = {}
+        else:
+            comment = re.match(r" *<!-- (.*) -->$", line)
+            directives = directives_of(comment[1]) if comment else {}
+        at += 1
+    return blocks
+
+
+def open_ended(text):
+    """Whether a command goes on in the next line."""
+    if text.endswith("\\"):
+        return True
+    here = re.findall(r"<<-?\s*['\"]?(\w+)", text)
+    if here and text.splitlines()[-1].strip() != here[-1]:
+        return True
+    # Quotes that are still open; a "#" after a blank begins a comment.
+    quote = ""
+    for line in ([text] if here == [] else []):
+        at = 0
+        while at < len(line):
+            letter = line[at]
+            if quote:
+                quote = "" if letter == quote else quote
+            elif letter in "'\"":
+                quote = letter
+            elif letter == "\\":
+                at += 1
+            elif letter == "#" and (at == 0 or line[at - 1] in " \n"):
+                newline = line.find("\n", at)
+                at = len(line) if newline < 0 else newline
+            at += 1
+    return quote != ""
+
+
+def commands_of(block):
+    """The commands of a block, with what is shown below each of a console."""
+    commands = []
+    unfinished = False
+    for number, line in enumerate(block.text.splitlines(), block.line + 1):
+        if unfinished:
+            commands[-1].text += "\n" + line
+        elif block.language == "console" and line.startswith("$ "):
+            commands.append(Command(number, line[2:], []))
+        elif block.language == "console":
+            if not commands:
+                raise ValueError(f"{number}: a console block begins with a command after \"$ \"")
+            commands[-1].expected.append(line)
+            continue
+        elif not line.strip() or line.lstrip().startswith("#"):
+            continue
+        else:
+            commands.append(Command(number, line, []))
+        unfinished = open_ended(commands[-1].text)
+    return commands
+
+
+def normal(line):
+    for pattern, replacement in MASKS:
+        line = re.sub(pattern, replacement, line)
+    return re.sub(r"\s+", " ", line).strip()
+
+
+def line_matches(expected, actual):
+    """Whether a line is what the document shows; "..." is any text."""
+    pattern = ".*".join(re.escape(part) for part in normal(expected).split("..."))
+    return re.fullmatch(pattern, normal(actual)) is not None
+
+
+def matches(expected, actual):
+    """Whether the lines are those of the document; a line "..." is any number of lines."""
+    if not expected:
+        return not actual
+    if expected[0].strip() == "...":
+        return any(matches(expected[1:], actual[at:]) for at in range(len(actual) + 1))
+    return bool(actual) and line_matches(expected[0], actual[0]) and matches(expected[1:], actual[1:])
+
+
+def contains(expected, actual):
+    """Whether the lines of the document are among these lines, in their order."""
+    rest = iter(actual)
+    return all(any(line_matches(line, other) for other in rest)
+               for line in expected if line.strip() not in ("", "..."))
