@@ -7,6 +7,7 @@ prints. A comment on the line before the block may say more, several things sepa
   <!-- not run: REASON -->        a test cannot run it; the reason is printed
   <!-- file: PATH -->             the block is the contents of this file: it is written there
   <!-- printed by: COMMAND -->    the lines of the block are among what this command prints, in order
+  <!-- printed in: NAME -->       the same for what the terminal of this name has shown so far
   <!-- terminal: NAME -->         it is typed in another terminal
   <!-- stays -->                  its last command keeps running in that terminal
   <!-- fails -->                  its last command ends with another status than 0
@@ -19,7 +20,7 @@ text in a line, a line of its own "..." for any number of lines.
 import dataclasses
 import re
 
-DIRECTIVES = ("not run", "not compiled", "file", "printed by", "terminal", "stays", "fails", "from")
+DIRECTIVES = ("not run", "not compiled", "file", "printed by", "printed in", "terminal", "stays", "fails", "from")
 COMMAND_LANGUAGES = ("sh", "console")
 MASKS = [
     (r"Timeticks: \(\d+\) (\d+ days?, )?[\d:.]+", "<ticks>"),
