@@ -11,6 +11,7 @@
 #include <CLI/CLI.hpp>
 
 #include "cli/Commands.h"
+#include "shells/Completion.h"
 
 namespace kvloam {
 
@@ -186,6 +187,8 @@ void addOthers(CLI::App& app, Options& options) {
         return printNames(session, options.kind);
     });
     names->group(""); // of the completion scripts
+    // A user who presses Tab does not wait.
+    names->preparse_callback([&options](std::size_t) { options.timeout = 2; });
     names->add_option("kind", options.kind)->check(CLI::IsMember({"board", "line", "table"}));
 }
 
@@ -202,6 +205,8 @@ int run(int argc, char const* const* argv, std::function<Screen()> const& screen
     app.require_subcommand(0, 1);
     addViews(app, options);
     addOthers(app, options);
+    std::function<void()> printScript;
+    shells::addCompletionCommands(app, printScript, {"BOARD", "LINE", "TABLE"});
     auto const isCheck = [&] { return app.got_subcommand("check"); };
     try {
         app.parse(argc, argv);
@@ -217,6 +222,10 @@ int run(int argc, char const* const* argv, std::function<Screen()> const& screen
         }
         errors << "kvloam: " << what << "; kvloam --help explains\n";
         return kUsage;
+    }
+    if (printScript) {
+        printScript();
+        return kSuccess;
     }
     try {
         Client client(addressOf(options));

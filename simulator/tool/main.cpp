@@ -9,6 +9,7 @@
 
 #include <CLI/CLI.hpp>
 
+#include "shells/Completion.h"
 #include "simulator/base/Text.h"
 #include "simulator/chassis/AttributeSchema.h"
 #include "simulator/chassis/Chassis.h"
@@ -17,7 +18,6 @@
 #include "simulator/description/Generator.h"
 #include "simulator/tool/BoardDescriptions.h"
 #include "simulator/tool/CallTool.h"
-#include "simulator/tool/Completion.h"
 #include "simulator/tool/ControlClient.h"
 #include "simulator/tool/LineTool.h"
 #include "simulator/tool/OutputFile.h"
@@ -362,7 +362,7 @@ int main(int argc, char** argv) {
     kvlsim::addProcessCommands(app, toPlatform, chosenNested);
     kvlsim::addLineCommands(app, toPlatform, chosenNested);
     kvlsim::addCallCommands(app, toPlatform, chosenNested);
-    kvlsim::addCompletionCommands(app, chosenNested);
+    shells::addCompletionCommands(app, chosenNested);
     try {
         app.parse(argc, argv);
     } catch (CLI::Success const& success) {

@@ -2,12 +2,13 @@
 // The words that a command line may have, as its parser knows them.
 #pragma once
 
+#include <set>
 #include <string>
 #include <vector>
 
 #include <CLI/CLI.hpp>
 
-namespace kvlsim {
+namespace shells {
 
 /// A `CompletionOption` is an option that a command takes.
 struct CompletionOption {
@@ -25,10 +26,14 @@ struct CompletionCommand {
     std::vector<CompletionOption> options; ///< those of the commands above it included
     std::vector<std::string> commands;     ///< the paths of the commands directly below it
     bool takesFile = false;                ///< one of its arguments is a file name
+    std::string
+        names; ///< what one of its arguments is, such as "board"; empty: nothing that is listed
 };
 
-/// The program first, each command before those below it. An option or argument whose type is named
-/// "FILE" takes a file name.
-std::vector<CompletionCommand> completionCommands(CLI::App const& app);
+/// The program first, each command before those below it, without commands that the help hides. An
+/// option or argument whose type is named "FILE" takes a file name. An argument whose type is one
+/// of `namedTypes` takes a name that the program lists.
+std::vector<CompletionCommand> completionCommands(CLI::App const& app,
+                                                  std::set<std::string> const& namedTypes = {});
 
-} // namespace kvlsim
+} // namespace shells

@@ -1,20 +1,46 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // Writes the completion scripts. Each script walks the words before the cursor, by a table of what
 // a word means behind a command ("line list" or " --socket"), and offers what may follow there.
-#include "simulator/tool/Completion.h"
+#include "shells/Completion.h"
 
 #include <algorithm>
 #include <iostream>
 #include <ostream>
 #include <string>
+#include <string_view>
 
-#include "simulator/tool/CompletionWords.h"
+#include "shells/CompletionWords.h"
 
-namespace kvlsim {
+namespace shells {
 
 namespace {
 
 using Commands = std::vector<CompletionCommand>;
+
+/// A text of a script, in which PROGRAM stands for the program's name.
+std::string forProgram(std::string text, Commands const& commands) {
+    constexpr std::string_view kPlace = "PROGRAM";
+    std::string const& name = commands.front().name;
+    for (auto at = text.find(kPlace); at != std::string::npos;
+         at = text.find(kPlace, at + name.size()))
+        text.replace(at, kPlace.size(), name);
+    return text;
+}
+
+/// Whether the program lists names for some argument.
+bool hasNames(Commands const& commands) {
+    return std::ranges::any_of(commands,
+                               [](auto const& command) { return !command.names.empty(); });
+}
+
+/// The program's own options that take a value.
+std::vector<std::string> programOptions(Commands const& commands) {
+    std::vector<std::string> options;
+    for (auto const& option : commands.front().options)
+        if (option.takesValue)
+            options.insert(options.end(), option.names.begin(), option.names.end());
+    return options;
+}
 
 /// `text` as one word of a POSIX shell, between single quotes.
 std::string quoted(std::string const& text) {
@@ -73,17 +99,29 @@ void branch(std::ostream& out, std::vector<std::string> const& keys, char const*
 }
 
 void printBash(std::ostream& out, Commands const& commands) {
-    out << R"(# bash completion for kvlsim, printed by "kvlsim completion bash"
+    out << forProgram(R"(# bash completion for PROGRAM, printed by "PROGRAM completion bash"
 
-_kvlsim() {
+_PROGRAM() {
     local word=${COMP_WORDS[COMP_CWORD]} command='' value='' words='' options='' file='' i
-    COMPREPLY=()
+)",
+                      commands);
+    if (hasNames(commands)) out << "    local names='' option='' given=()\n";
+    out << R"(    COMPREPLY=()
     for ((i = 1; i < COMP_CWORD; ++i)); do
         if [[ -n $value ]]; then # of the option before; bash makes "=" a word of its own
-            [[ ${COMP_WORDS[i]} == '=' ]] || value=''
-            continue
+            [[ ${COMP_WORDS[i]} == '=' ]] && continue
+            value=''
+)";
+    if (hasNames(commands)) {
+        out << "            case \"$option\" in\n            ";
+        join(out, programOptions(commands), " | ");
+        out << ") given+=(\"$option\" \"${COMP_WORDS[i]}\") ;;\n            esac\n";
+    }
+    out << R"(            continue
         fi
-        case "$command ${COMP_WORDS[i]}" in
+)";
+    if (hasNames(commands)) out << "        option=${COMP_WORDS[i]}\n";
+    out << R"(        case "$command ${COMP_WORDS[i]}" in
 )";
     branch(out, valueKeys(commands, true), "value=file");
     branch(out, valueKeys(commands, false), "value=other");
@@ -107,20 +145,29 @@ _kvlsim() {
         join(out, words, " ");
         out << "'\n            options='";
         join(out, options, " ");
-        out << "'\n            file=" << (command.takesFile ? "yes" : "''") << " ;;\n";
+        out << "'\n";
+        if (!command.names.empty()) out << "            names=" << command.names << '\n';
+        out << "            file=" << (command.takesFile ? "yes" : "''") << " ;;\n";
     }
     out << R"(    esac
     if [[ $word == -* ]]; then
         COMPREPLY=($(compgen -W "$options" -- "$word"))
     elif [[ -n $words ]]; then
         COMPREPLY=($(compgen -W "$words" -- "$word"))
-    elif [[ -n $file ]]; then
+)";
+    if (hasNames(commands))
+        out << forProgram(R"script(    elif [[ -n $names ]]; then
+        COMPREPLY=($(compgen -W "$(PROGRAM "${given[@]}" names "$names" 2>/dev/null)" -- "$word"))
+)script",
+                          commands);
+    out << forProgram(R"(    elif [[ -n $file ]]; then
         compopt -o default 2>/dev/null
     fi
 }
 
-complete -F _kvlsim kvlsim
-)";
+complete -F _PROGRAM PROGRAM
+)",
+                      commands);
 }
 
 /// "word:help", as zsh's `_describe` reads it.
@@ -129,19 +176,30 @@ std::string described(std::string const& word, std::string const& help) {
 }
 
 void printZsh(std::ostream& out, Commands const& commands) {
-    out << R"(#compdef kvlsim
-# zsh completion for kvlsim, printed by "kvlsim completion zsh"
+    out << forProgram(R"(#compdef PROGRAM
+# zsh completion for PROGRAM, printed by "PROGRAM completion zsh"
 
-_kvlsim() {
+_PROGRAM() {
     local cmd='' value='' file=''
-    local -a subcommands switches
+)",
+                      commands);
+    if (hasNames(commands)) out << "    local names='' option=''\n    local -a given found\n";
+    out << R"(    local -a subcommands switches
     integer i
     for ((i = 2; i < CURRENT; ++i)); do
         if [[ -n $value ]]; then
             value=''
-            continue
+)";
+    if (hasNames(commands)) {
+        out << "            case \"$option\" in\n            ";
+        join(out, programOptions(commands), " | ");
+        out << ") given+=(\"$option\" \"${(Q)words[i]}\") ;;\n            esac\n";
+    }
+    out << R"(            continue
         fi
-        case "$cmd ${words[i]}" in
+)";
+    if (hasNames(commands)) out << "        option=${words[i]}\n";
+    out << R"(        case "$cmd ${words[i]}" in
 )";
     branch(out, valueKeys(commands, true), "value=file");
     branch(out, valueKeys(commands, false), "value=other");
@@ -164,25 +222,35 @@ _kvlsim() {
         for (auto const& option : command.options)
             for (auto const& name : option.names)
                 out << "\n                " << described(name, option.help);
-        out << ")\n            file=" << (command.takesFile ? "yes" : "''") << " ;;\n";
+        out << ")\n";
+        if (!command.names.empty()) out << "            names=" << command.names << '\n';
+        out << "            file=" << (command.takesFile ? "yes" : "''") << " ;;\n";
     }
     out << R"(    esac
     if [[ $PREFIX == -* ]]; then
         _describe -o option switches
     elif (( $#subcommands )); then
         _describe command subcommands
-    elif [[ -n $file ]]; then
+)";
+    if (hasNames(commands))
+        out << forProgram(R"script(    elif [[ -n $names ]]; then
+        found=(${(f)"$(PROGRAM "${given[@]}" names "$names" 2>/dev/null)"})
+        compadd -a found
+)script",
+                          commands);
+    out << forProgram(R"(    elif [[ -n $file ]]; then
         _files
     fi
 }
 
 # zsh runs the file as the function when it is in $fpath; otherwise the file is sourced.
-if [[ ${funcstack[1]} == _kvlsim ]]; then
-    _kvlsim "$@"
+if [[ ${funcstack[1]} == _PROGRAM ]]; then
+    _PROGRAM "$@"
 else
-    compdef _kvlsim kvlsim
+    compdef _PROGRAM PROGRAM
 fi
-)";
+)",
+                      commands);
 }
 
 /// One branch of fish's `switch`.
@@ -194,10 +262,10 @@ void fishBranch(std::ostream& out, std::vector<std::string> const& keys, char co
 }
 
 void printFish(std::ostream& out, Commands const& commands) {
-    out << R"(# fish completion for kvlsim, printed by "kvlsim completion fish"
+    out << forProgram(R"(# fish completion for PROGRAM, printed by "PROGRAM completion fish"
 
 # Whether the words before the cursor name this command and end with no option that takes a value.
-function __kvlsim_at
+function __PROGRAM_at
     set -l words (commandline -opc)
     set -e words[1]
     set -l command ''
@@ -208,7 +276,8 @@ function __kvlsim_at
             continue
         end
         switch "$command $word"
-)";
+)",
+                      commands);
     auto values = valueKeys(commands, true);
     auto const others = valueKeys(commands, false);
     values.insert(values.end(), others.begin(), others.end());
@@ -218,13 +287,34 @@ function __kvlsim_at
     end
     test -z "$value"; and test "$command" = "$argv"
 end
-
-complete -c kvlsim -f
 )";
+    if (hasNames(commands)) {
+        out << forProgram(R"(
+# The names of things of a kind, from the program with those of its options that the command line has.
+function __PROGRAM_names
+    set -l given
+    set -l option ''
+    for word in (commandline -opc)
+        switch "$option"
+            case )",
+                          commands);
+        join(out, programOptions(commands), " ");
+        out << forProgram(R"(
+                set given $given $option $word
+        end
+        set option $word
+    end
+    PROGRAM $given names $argv 2>/dev/null
+end
+)",
+                          commands);
+    }
+    out << forProgram("\ncomplete -c PROGRAM -f\n", commands);
     for (auto const& command : commands) {
         std::string const here =
-            "complete -c kvlsim -n " +
-            fishQuoted("__kvlsim_at" + (command.path.empty() ? command.path : " " + command.path));
+            forProgram("complete -c PROGRAM -n ", commands) +
+            fishQuoted(forProgram("__PROGRAM_at", commands) +
+                       (command.path.empty() ? command.path : " " + command.path));
         for (auto const& path : command.commands) {
             auto const& below = commandAt(commands, path);
             out << here << " -a " << below.name << " -d " << fishQuoted(below.help) << '\n';
@@ -237,12 +327,17 @@ complete -c kvlsim -f
             out << " -d " << fishQuoted(option.help) << '\n';
         }
         if (command.takesFile) out << here << " -F\n";
+        if (!command.names.empty())
+            out << here << " -a "
+                << fishQuoted(forProgram("(__PROGRAM_names ", commands) + command.names + ")")
+                << '\n';
     }
 }
 
 } // namespace
 
-void addCompletionCommands(CLI::App& app, std::function<void()>& chosen) {
+void addCompletionCommands(CLI::App& app, std::function<void()>& chosen,
+                           std::set<std::string> namedTypes) {
     CLI::App* const group =
         app.add_subcommand("completion", "Print a script that completes commands in a shell");
     group->fallthrough()->require_subcommand(1);
@@ -256,10 +351,12 @@ void addCompletionCommands(CLI::App& app, std::function<void()>& chosen) {
     for (auto const& [shell, help, print] : shells) {
         CLI::App* const command = group->add_subcommand(shell, help);
         command->fallthrough();
-        command->callback([&app, &chosen, print = print] {
-            chosen = [&app, print] { print(std::cout, completionCommands(app)); };
+        command->callback([&app, &chosen, namedTypes, print = print] {
+            chosen = [&app, namedTypes, print] {
+                print(std::cout, completionCommands(app, namedTypes));
+            };
         });
     }
 }
 
-} // namespace kvlsim
+} // namespace shells
