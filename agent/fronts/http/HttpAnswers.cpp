@@ -145,6 +145,8 @@ HttpAnswer HttpAnswers::answerOrThrow(HttpRequest const& request) {
     if (segments.size() == 2 && segments[0] == "page") return pageAnswer(segments[1]);
     if (segments.size() > 2 && segments[0] == "api" && segments[1] == "v1")
         return fromSnapshot(*target);
+    if (segments.size() == 1 && segments[0] == "metrics")
+        return metrics(*target, request.accept.value_or(""));
     throw HttpFault(404, "there is nothing at this address");
 }
 
@@ -178,6 +180,18 @@ HttpAnswer HttpAnswers::fromSnapshot(Target const& target) {
     answer.body = std::make_shared<std::string const>(m_documents.write(view, target));
     if (isKept) m_written.emplace(key, answer.body);
     return answer;
+}
+
+/// Has no ETag: the agent's own counters go on while its snapshot stays.
+HttpAnswer HttpAnswers::metrics(Target const& target, std::string_view accept) {
+    MetricOptions options{metricFormat(accept), false};
+    if (std::string const* const channels = target.parameter("channels"))
+        options.channels = *channels == "1";
+    return {200,
+            contentType(options.format),
+            m_metrics.text(m_served.takeSnapshot(), m_served.counters, &m_served.settings, options),
+            {},
+            {{"Vary", "Accept"}}};
 }
 
 std::string HttpAnswers::etag() const {

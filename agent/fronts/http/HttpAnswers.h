@@ -14,6 +14,7 @@
 #include <vector>
 
 #include "agent/fronts/http/Documents.h"
+#include "agent/fronts/metrics/Metrics.h"
 #include "agent/rows/Counters.h"
 #include "agent/rows/Settings.h"
 #include "agent/rows/Snapshot.h"
@@ -35,6 +36,7 @@ struct HttpRequest {
     std::optional<std::string_view> host = {};
     std::optional<std::string_view> authorization = {};
     std::optional<std::string_view> ifNoneMatch = {};
+    std::optional<std::string_view> accept = {};
     std::size_t headerOctets = 0; ///< names and values of all header fields
     bool isLocal = false;         ///< came by the Unix socket, whose mode controls access
 };
@@ -69,6 +71,7 @@ class HttpAnswers {
     HttpAnswer answerOrThrow(HttpRequest const& request);
     void checkAccess(HttpRequest const& request);
     HttpAnswer fromSnapshot(Target const& target);
+    HttpAnswer metrics(Target const& target, std::string_view accept);
     std::string etag() const;
 
     HttpServed m_served;
@@ -78,6 +81,7 @@ class HttpAnswers {
     std::unique_ptr<Moment const> m_moment;
     /// Of the moment: the documents of whole lists, by the last segments of their addresses.
     std::map<std::string, std::shared_ptr<std::string const>> m_written;
+    MetricsCache m_metrics;
 
     std::mutex m_mutex; ///< guards what follows
     std::string m_token;

@@ -171,6 +171,7 @@ class HttpServer::Listener {
                                                 field(connection, MHD_HTTP_HEADER_HOST),
                                                 field(connection, MHD_HTTP_HEADER_AUTHORIZATION),
                                                 field(connection, MHD_HTTP_HEADER_IF_NONE_MATCH),
+                                                field(connection, MHD_HTTP_HEADER_ACCEPT),
                                                 fields.octets, self.m_isLocal}));
         } catch (...) {
             return MHD_NO; // closes the connection

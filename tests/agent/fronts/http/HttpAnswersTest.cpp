@@ -356,5 +356,28 @@ TEST_F(HttpAnswersTest, FailureIsAnsweredWithoutItsReason) {
     EXPECT_THAT(*answer.body, Not(HasSubstr("secret")));
 }
 
+TEST_F(HttpAnswersTest, MetricsComeInTheFormatThatTheRequestPrefers) {
+    HttpAnswer const plain = get("/metrics");
+    EXPECT_EQ(plain.status, 200);
+    EXPECT_EQ(plain.contentType, "text/plain; version=0.0.4; charset=utf-8");
+    EXPECT_THAT(*plain.body, HasSubstr("\nkvloam_board_status{board=\"NX50001\",state="
+                                       "\"started\"} 1\n"));
+    EXPECT_EQ(get("/metrics").body, plain.body);
+    HttpAnswer const open = ask({.method = "GET",
+                                 .target = "/metrics",
+                                 .accept = "application/openmetrics-text;version=1.0.0",
+                                 .isLocal = true});
+    EXPECT_EQ(open.contentType, "application/openmetrics-text; version=1.0.0; charset=utf-8");
+    EXPECT_THAT(*open.body, HasSubstr("# TYPE kvloam_requests counter\n"));
+}
+
+TEST_F(HttpAnswersTest, MetricsOfChannelsComeIfAskedFor) {
+    m_snapshot->interfaces.interfaces[1].type = kTypeDs0;
+    m_snapshot->interfaces.bearers[0].operStatus = 1;
+    EXPECT_THAT(*get("/metrics").body, Not(HasSubstr("trunk-1/1")));
+    EXPECT_THAT(*get("/metrics?channels=1").body, HasSubstr("channel=\"trunk-1/1\""));
+    EXPECT_EQ(get("/metrics/more").status, 404);
+}
+
 } // namespace
 } // namespace kvloamd
