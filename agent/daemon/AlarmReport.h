@@ -35,6 +35,8 @@ class AlarmReport {
     void note(JournalEvent event, std::string const& text, std::string const& board = {});
 
     Journal::Counts counts() const { return m_journal->counts(); }
+    /// To read from. Once the journal is open.
+    Journal const& journal() const { return *m_journal; }
 
   private:
     std::unique_ptr<Journal> m_journal = std::make_unique<Journal>("");

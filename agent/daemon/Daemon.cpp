@@ -282,10 +282,17 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front, H
                  capabilities(options.enterprise, KVLOAM_VERSION)});
     std::vector<Table const*> everyTable = allTables;
     everyTable.insert(everyTable.end(), allStandardTables.begin(), allStandardTables.end());
+    StaleSnapshot staleForHttp(alarmTables);
+    Journal const& journal = boards.alarmReport.journal();
     http.serve({{std::move(everyTable), {scalars(), standardScalars()}},
                 boards.counters,
                 boards.settings,
-                [&] { return collector.snapshot(); }});
+                [&] { return staleForHttp.of(collector.snapshot(), Clock::now()); },
+                [&](JournalQuery const& query) {
+                    return query.after ? journal.entriesAfter(*query.after, query.limit)
+                                       : journal.newestEntries(query.limit);
+                },
+                [&] { return journal.newest(); }});
     Notifier notifier(boards.queue, front.notifications(), [&](Notification& notification) {
         auto const snapshot = collector.newest();
         nameSubject(notification, trees, {*snapshot, boards.counters, &boards.settings});

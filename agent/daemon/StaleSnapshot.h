@@ -14,7 +14,7 @@ namespace kvloamd {
 
 /// A `StaleSnapshot` shows alarms that are raised while the collector hangs, first of all the alarm
 /// that says so: it copies the stale snapshot with the alarms of now, at most once in `kPause`,
-/// because a copy of many boards takes a while. Thread-bound: the SNMP thread.
+/// because a copy of many boards takes a while. Thread-bound: the thread that answers from it.
 class StaleSnapshot {
   public:
     static constexpr std::chrono::seconds kPause{1};

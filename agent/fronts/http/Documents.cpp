@@ -7,8 +7,9 @@
 #include <array>
 #include <charconv>
 #include <chrono>
-#include <optional>
+#include <initializer_list>
 
+#include "agent/objects/OwnObjects.h"
 #include "agent/objects/StandardObjects.h"
 
 namespace kvloamd {
@@ -17,6 +18,7 @@ namespace {
 
 constexpr std::int64_t kInterval = 900'000; // milliseconds
 constexpr std::int64_t kSecond = 1000;
+constexpr std::uint32_t kMostIndex = 0xffffffff;
 
 /// When a closed interval of a line began.
 void intervalStart(JsonWriter& json, View const& view, OidView index) {
@@ -24,7 +26,7 @@ void intervalStart(JsonWriter& json, View const& view, OidView index) {
     auto const line = std::ranges::lower_bound(lines, index[0], {}, &LineRow::ifIndex);
     std::int64_t const start = view.moment().taken - line->timeElapsed.value_or(0) * kSecond -
                                std::int64_t{index[1]} * kInterval;
-    json.key("start").text(rfc3339(start / kSecond * kSecond));
+    json.text(rfc3339(start / kSecond * kSecond));
 }
 
 /// The rows of one line's history. Their index is in the address.
@@ -32,7 +34,7 @@ List const& intervals() {
     static List const list{"intervals",
                            {},
                            {{&dsx1IntervalTable(), "dsx1Interval", {}, {"dsx1IntervalIndex"}}},
-                           intervalStart};
+                           {{"start", intervalStart}}};
     return list;
 }
 
@@ -85,8 +87,94 @@ std::string hostName() {
     return name.data();
 }
 
+/// Refuses parameters that the address does not know, which are misspelt as likely as not.
+void checkParameters(Target const& target, std::initializer_list<std::string_view> known) {
+    for (auto const& [name, value] : target.query)
+        if (std::ranges::find(known, name) == known.end())
+            throw HttpFault(400, "this address has no parameter '" + name + "'");
+}
+
+/// A parameter that is a number from `lowest` to `highest`; nothing when it is not there.
+template <class Number>
+std::optional<Number> numberParameter(Target const& target, std::string const& name, Number lowest,
+                                      Number highest) {
+    std::string const* const asked = target.parameter(name);
+    if (asked == nullptr) return std::nullopt;
+    auto const number = numberIn<Number>(*asked);
+    if (!number || *number < lowest || *number > highest)
+        throw HttpFault(400, "'" + name + "' is not a number from " + std::to_string(lowest) +
+                                 " to " + std::to_string(highest));
+    return number;
+}
+
+/// The words of a parameter between commas; none when it is not there.
+std::vector<std::string> wordsParameter(Target const& target, std::string const& name) {
+    std::vector<std::string> words;
+    std::string const* const asked = target.parameter(name);
+    if (asked == nullptr) return words;
+    for (std::size_t begin = 0; begin <= asked->size();) {
+        std::size_t const end = std::min(asked->find(',', begin), asked->size());
+        words.push_back(asked->substr(begin, end - begin));
+        begin = end + 1;
+    }
+    return words;
+}
+
 std::string noSuch(std::string_view what, std::string_view name) {
     return "there is no " + std::string(what) + " '" + std::string(name) + "'";
+}
+
+/// The board that has `name` as its serial number, else as its index. Throws when there is none.
+BoardRow const& findBoard(View const& view, std::string_view name) {
+    auto const& boards = view.snapshot().boards;
+    auto found = std::ranges::find(boards, name, &BoardRow::serialNumber);
+    if (auto const index = numberIn<std::uint32_t>(name); found == boards.end() && index)
+        found = std::ranges::find(boards, *index, &BoardRow::boardIndex);
+    if (found == boards.end()) throw HttpFault(404, noSuch("board", name));
+    return *found;
+}
+
+/// The keys that `target` asks for. Throws when no list has one of them.
+Fields fieldsIn(Target const& target, std::vector<ListWriter> const& writers) {
+    Fields fields = wordsParameter(target, "fields");
+    std::vector<std::string> known;
+    for (ListWriter const& writer : writers)
+        for (std::string& field : fieldsOf(writer.list()))
+            known.push_back(std::move(field));
+    for (std::string const& field : fields)
+        if (std::ranges::find(known, field) == known.end())
+            throw HttpFault(400, "'fields': rows have no key '" + field + "'");
+    return fields;
+}
+
+RowFilter filterIn(View const& view, Target const& target) {
+    RowFilter filter;
+    if (std::string const* const name = target.parameter("board"); name != nullptr)
+        filter.boardIndex = findBoard(view, *name).boardIndex;
+    filter.line = numberParameter<std::uint32_t>(target, "line", 1, kMostIndex).value_or(0);
+    for (std::string const& word : wordsParameter(target, "ifIndex")) {
+        auto const number = numberIn<std::uint32_t>(word);
+        if (!number) throw HttpFault(400, "'ifIndex' is not a list of numbers like 1000,1001");
+        filter.ifIndices.push_back(*number);
+    }
+    std::ranges::sort(filter.ifIndices);
+    return filter;
+}
+
+/// The name of a number of kvlAlarmSeverity, or null.
+void writeSeverity(JsonWriter& json, View const& view, int severity) {
+    Table const& table = alarmTable();
+    for (std::size_t column = 0; column < table.columnCount(); ++column) {
+        ColumnHead const head = table.column(column);
+        if (std::string_view(head.name) == "kvlAlarmSeverity")
+            writeValue(json, head.type, head.details,
+                       severity == 0 ? Value{} : Value{std::int64_t{severity}}, view.counters(),
+                       Manner::People);
+    }
+}
+
+void writeText(JsonWriter& json, std::string_view text) {
+    text.empty() ? json.null() : json.text(text);
 }
 
 } // namespace
@@ -105,13 +193,16 @@ std::string Documents::write(View const& view, Target const& target) const {
     auto const& segments = target.segments;
     if (segments.size() == 3) {
         std::string const& name = segments[2];
+        bool const hasLists = name != "health" && name != "scalars" && name != "tables";
+        if (!hasLists) checkParameters(target, {});
         if (name == "health") return health(view);
         if (name == "scalars") return scalars(view);
         if (name == "tables") return tables(view);
         for (Lists const& lists : m_lists)
-            if (lists.name == name) return resource(view, lists);
+            if (lists.name == name) return resource(view, lists, target);
     }
     if (segments.size() == 4) {
+        if (segments[2] != "tables") checkParameters(target, {});
         if (segments[2] == "boards") return board(view, segments[3]);
         if (segments[2] == "lines") return line(view, segments[3]);
         if (segments[2] == "tables") return table(view, segments[3], target);
@@ -119,28 +210,77 @@ std::string Documents::write(View const& view, Target const& target) const {
     throw HttpFault(404, "there is nothing at this address");
 }
 
-std::string Documents::resource(View const& view, Lists const& lists) const {
+std::string Documents::resource(View const& view, Lists const& lists, Target const& target) {
+    std::string_view const first = lists.writers.front().list().index.front();
+    if (lists.name == "channels")
+        checkParameters(target, {"fields", "board", "line", "ifIndex"});
+    else if (first == "ifIndex")
+        checkParameters(target, {"fields", "board", "ifIndex"});
+    else if (first == "boardIndex")
+        checkParameters(target, {"fields", "board"});
+    else
+        checkParameters(target, {"fields"});
+    Fields const fields = fieldsIn(target, lists.writers);
+    RowFilter const filter = filterIn(view, target);
     JsonWriter json = begun(view);
     for (ListWriter const& writer : lists.writers) {
         json.key(writer.key());
-        writer.writeAll(json, view);
+        if (fields.empty())
+            writer.writeAll(json, view, filter);
+        else
+            ListWriter(writer.list(), fields).writeAll(json, view, filter);
     }
     return ended(json);
 }
 
+JournalQuery Documents::journalQuery(Target const& target) {
+    checkParameters(target, {"after", "limit"});
+    JournalQuery query;
+    query.after = numberParameter<std::uint32_t>(target, "after", 0, kMostIndex);
+    query.limit =
+        numberParameter<std::size_t>(target, "limit", 1, kMostEntries).value_or(query.limit);
+    return query;
+}
+
+std::string Documents::journal(View const& view, JournalPage const& page) {
+    JsonWriter json = begun(view);
+    json.key("newest").number(std::int64_t{page.newest});
+    json.key("entries").beginArray();
+    for (JournalRow const& row : page.rows) {
+        InterfaceRow const* const interface = view.interface(row.ifIndex);
+        auto const date = std::chrono::floor<std::chrono::milliseconds>(row.date);
+        json.beginObject().key("number").number(std::int64_t{row.number});
+        json.key("date").text(rfc3339(std::int64_t{date.time_since_epoch().count()}));
+        json.key("event").text(row.event).key("text").text(row.text);
+        json.key("board");
+        writeText(json, row.board);
+        json.key("ifIndex");
+        row.ifIndex == 0 ? json.null() : json.number(std::int64_t{row.ifIndex});
+        json.key("line");
+        writeText(json, interface == nullptr ? std::string_view() : interface->name);
+        json.key("kind");
+        writeText(json, row.alarm);
+        json.key("severity");
+        writeSeverity(json, view, row.severity);
+        json.key("times");
+        row.alarm.empty() ? json.null() : json.number(std::int64_t{row.times});
+        json.endObject();
+    }
+    json.endArray();
+    return ended(json);
+}
+
 std::string Documents::board(View const& view, std::string_view name) const {
-    auto const& boards = view.snapshot().boards;
-    auto found = std::ranges::find(boards, name, &BoardRow::serialNumber);
-    if (auto const index = numberIn<std::uint32_t>(name); found == boards.end() && index)
-        found = std::ranges::find(boards, *index, &BoardRow::boardIndex);
-    if (found == boards.end()) throw HttpFault(404, noSuch("board", name));
+    BoardRow const& found = findBoard(view, name);
+    RowFilter filter;
+    filter.boardIndex = found.boardIndex;
     JsonWriter json = begun(view);
     json.key("board").beginObject();
-    writerOf("boards").writeKeys(json, view, found->index());
+    writerOf("boards").writeKeys(json, view, found.index());
     json.endObject();
     for (std::string_view const key : {"lines", "devices", "processors"}) {
         json.key(key);
-        writerOf(key).writeAll(json, view, found->boardIndex);
+        writerOf(key).writeAll(json, view, filter);
     }
     return ended(json);
 }
@@ -179,6 +319,8 @@ std::string Documents::health(View const& view) const {
     auto const started = system_clock::now() - (Clock::now() - view.counters().started);
     json.key("agentStarted")
         .text(rfc3339(floor<seconds>(started.time_since_epoch()).count() * kSecond));
+    View::Channels const channels = view.allChannels();
+    json.key("channels").number(channels.all).key("channelsInUse").number(channels.inUse);
     Facts const facts = view.facts();
     for (auto const& [key, scalar] : healthScalars(m_objects.scalars)) {
         json.key(key);
@@ -219,19 +361,15 @@ std::string Documents::table(View const& view, std::string_view name, Target con
     auto const found = std::ranges::find(
         m_objects.tables, name, [](Table const* table) { return std::string_view(table->name()); });
     if (found == m_objects.tables.end()) throw HttpFault(404, noSuch("table", name));
+    checkParameters(target, {"after", "limit"});
     Oid after;
     if (std::string const* const asked = target.parameter("after"); asked != nullptr) {
         auto index = indexIn(*asked);
         if (!index) throw HttpFault(400, "'after' is not an index; write it like 1000.5");
         after = *std::move(index);
     }
-    std::size_t most = kMostRows;
-    if (std::string const* const asked = target.parameter("limit"); asked != nullptr) {
-        auto const number = numberIn<std::size_t>(*asked);
-        if (!number || *number < 1 || *number > kMostRows)
-            throw HttpFault(400, "'limit' is not a number from 1 to " + std::to_string(kMostRows));
-        most = *number;
-    }
+    std::size_t const most =
+        numberParameter<std::size_t>(target, "limit", 1, kMostRows).value_or(kMostRows);
     JsonWriter json;
     json.beginObject().key("snapshot").number(std::int64_t{view.moment().number});
     json.key("table").text((*found)->name()).key("rows");

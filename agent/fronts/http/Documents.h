@@ -3,14 +3,18 @@
 #pragma once
 
 #include <cstddef>
+#include <cstdint>
+#include <optional>
 #include <span>
 #include <stdexcept>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 #include "agent/fronts/http/Lists.h"
 #include "agent/fronts/http/Target.h"
+#include "agent/rows/JournalRow.h"
 
 namespace kvloamd {
 
@@ -32,6 +36,12 @@ struct DescribedObjects {
     std::vector<std::span<Scalar const>> scalars;
 };
 
+/// Which entries of the journal are asked for.
+struct JournalQuery {
+    std::optional<std::uint32_t> after; ///< those above this number; nothing: the newest
+    std::size_t limit = 200;
+};
+
 /// A `Documents` writes the documents below /api/v1/. Immutable.
 class Documents {
   public:
@@ -42,8 +52,14 @@ class Documents {
     explicit Documents(DescribedObjects objects);
 
     /// The document that `target` names, whose first two segments are "api" and "v1". Throws
-    /// HttpFault when there is none.
+    /// HttpFault when there is none. Not the journal, which is in no snapshot.
     std::string write(View const& view, Target const& target) const;
+
+    /// The most entries of the journal in one answer.
+    static constexpr std::size_t kMostEntries = 1000;
+    /// Throws HttpFault when the query of `target` is none.
+    static JournalQuery journalQuery(Target const& target);
+    static std::string journal(View const& view, JournalPage const& page);
 
   private:
     struct Lists {
@@ -51,7 +67,7 @@ class Documents {
         std::vector<ListWriter> writers;
     };
 
-    std::string resource(View const& view, Lists const& lists) const;
+    static std::string resource(View const& view, Lists const& lists, Target const& target);
     std::string board(View const& view, std::string_view name) const;
     std::string line(View const& view, std::string_view name) const;
     std::string health(View const& view) const;

@@ -135,26 +135,32 @@ HttpAnswer HttpAnswers::answerOrThrow(HttpRequest const& request) {
     if (request.headerOctets > kMostHeaders)
         throw HttpFault(431,
                         "the header has more than " + std::to_string(kMostHeaders) + " octets");
-    checkAccess(request);
+    checkHost(request);
     if (request.method != "GET" && request.method != "HEAD")
         throw HttpFault(405, "the agent can only be read, by GET and HEAD");
     auto const target = parseTarget(request.target);
     if (!target) throw HttpFault(400, "the address is not well-formed");
     auto const& segments = target->segments;
+    // The page's files are no secret, and a browser sends no token of its own accord.
     if (segments.empty()) return pageAnswer("index.html");
     if (segments.size() == 2 && segments[0] == "page") return pageAnswer(segments[1]);
+    checkToken(request);
     if (segments.size() > 2 && segments[0] == "api" && segments[1] == "v1")
-        return fromSnapshot(*target);
+        return fromSnapshot(request, *target);
     if (segments.size() == 1 && segments[0] == "metrics")
         return metrics(*target, request.accept.value_or(""));
     throw HttpFault(404, "there is nothing at this address");
 }
 
-void HttpAnswers::checkAccess(HttpRequest const& request) {
+void HttpAnswers::checkHost(HttpRequest const& request) const {
     if (request.isLocal) return;
     if (!request.host || !isOwnHost(*request.host, m_hostName))
         throw HttpFault(403, "the agent does not answer to the name in the Host field; use an "
                              "address, localhost, or the name in --http");
+}
+
+void HttpAnswers::checkToken(HttpRequest const& request) {
+    if (request.isLocal) return;
     std::scoped_lock const guard(m_mutex);
     if (m_token.empty()) return;
     auto const token = bearerToken(request.authorization);
@@ -162,23 +168,30 @@ void HttpAnswers::checkAccess(HttpRequest const& request) {
         throw HttpFault(401, "send the token of --http-token-file: Authorization: Bearer <token>");
 }
 
-HttpAnswer HttpAnswers::fromSnapshot(Target const& target) {
-    auto const snapshot = m_served.takeSnapshot();
-    if (!m_moment || m_moment->number != snapshot->number) {
-        m_written.clear();
-        m_moment = std::make_unique<Moment const>(*snapshot, m_served.settings);
-    }
+std::shared_ptr<Snapshot const> HttpAnswers::takeSnapshot() {
+    auto snapshot = m_served.takeSnapshot();
+    bool const isKnown =
+        m_moment && m_moment->number == snapshot->number && m_moment->alarms == snapshot->alarms;
+    if (isKnown) return snapshot;
+    m_written.clear();
+    m_writtenOctets = 0;
+    m_moment = std::make_unique<Moment const>(*snapshot, m_served.settings);
+    ++m_moments;
+    return snapshot;
+}
+
+HttpAnswer HttpAnswers::fromSnapshot(HttpRequest const& request, Target const& target) {
+    auto const snapshot = takeSnapshot();
+    View const view(*snapshot, *m_moment, m_served.counters);
+    if (target.segments.size() == 3 && target.segments[2] == "journal")
+        return journal(view, target);
     HttpAnswer answer{200, kJson, {}, etag()};
-    // Whole lists: few, and expensive to write.
-    bool const isKept = target.segments.size() == 3 && target.query.empty();
-    std::string const& key = target.segments[2];
-    if (auto const written = m_written.find(key); isKept && written != m_written.end()) {
+    if (auto const written = m_written.find(request.target); written != m_written.end()) {
         answer.body = written->second;
         return answer;
     }
-    View const view(*snapshot, *m_moment, m_served.counters);
     answer.body = std::make_shared<std::string const>(m_documents.write(view, target));
-    if (isKept) m_written.emplace(key, answer.body);
+    keep(request.target, answer.body);
     return answer;
 }
 
@@ -187,15 +200,33 @@ HttpAnswer HttpAnswers::metrics(Target const& target, std::string_view accept) {
     MetricOptions options{metricFormat(accept), false};
     if (std::string const* const channels = target.parameter("channels"))
         options.channels = *channels == "1";
+    auto const snapshot = takeSnapshot();
     return {200,
             contentType(options.format),
-            m_metrics.text(m_served.takeSnapshot(), m_served.counters, &m_served.settings, options),
+            m_metrics.text(snapshot, m_served.counters, &m_moment->settings, options),
             {},
             {{"Vary", "Accept"}}};
 }
 
-std::string HttpAnswers::etag() const {
-    return '"' + std::to_string(m_moment->number) + '.' + m_run + '"';
+HttpAnswer HttpAnswers::journal(View const& view, Target const& target) {
+    JournalQuery const query = Documents::journalQuery(target);
+    // Read first: an entry that is added meanwhile makes the next answer another one.
+    std::string const newest = std::to_string(m_served.newestEntry());
+    auto const page = m_served.readJournal(query);
+    if (!page) throw HttpFault(503, "the journal cannot be read now");
+    return {200, kJson, std::make_shared<std::string const>(Documents::journal(view, *page)),
+            etag('-' + newest)};
+}
+
+void HttpAnswers::keep(std::string_view target, std::shared_ptr<std::string const> const& body) {
+    if (m_written.size() >= kMostKept || m_writtenOctets + body->size() > kMostKeptOctets) return;
+    m_written.emplace(target, body);
+    m_writtenOctets += body->size();
+}
+
+std::string HttpAnswers::etag(std::string const& more) const {
+    return '"' + std::to_string(m_moment->number) + more + '.' + std::to_string(m_moments) + '.' +
+           m_run + '"';
 }
 
 bool isOwnHost(std::string_view host, std::string_view ownName) {

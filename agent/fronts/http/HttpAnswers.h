@@ -26,7 +26,10 @@ struct HttpServed {
     DescribedObjects objects;
     Counters const& counters;
     Settings const& settings;
-    std::function<std::shared_ptr<Snapshot const>()> takeSnapshot; ///< thread-safe
+    std::function<std::shared_ptr<Snapshot const>()> takeSnapshot; ///< on the HTTP thread
+    /// Reads entries of the journal; nothing when it cannot be read. On the HTTP thread.
+    std::function<std::optional<JournalPage>(JournalQuery const&)> readJournal;
+    std::function<std::uint32_t()> newestEntry; ///< the number of the journal's newest entry
 };
 
 /// What the answer to a request depends on. Refers to the request's octets.
@@ -50,12 +53,15 @@ struct HttpAnswer {
 };
 
 /// An `HttpAnswers` answers requests from the newest snapshot. The first answer from a snapshot
-/// fixes what all others from it show; lists are written once for each snapshot. Thread-bound to
-/// the HTTP thread, except where noted.
+/// fixes what all others from it show. Documents are kept until the next snapshot, within limits.
+/// Thread-bound to the HTTP thread, except where noted.
 class HttpAnswers {
   public:
     static constexpr std::size_t kLongestTarget = 2048;
     static constexpr std::size_t kMostHeaders = 8192;
+    /// What is kept of the documents of a moment.
+    static constexpr std::size_t kMostKept = 64;
+    static constexpr std::size_t kMostKeptOctets = std::size_t{32} << 20U;
 
     /// `hostName`: a name by which clients may address the agent over TCP, beside the names and
     /// addresses that no other site can take; may be empty.
@@ -69,18 +75,24 @@ class HttpAnswers {
 
   private:
     HttpAnswer answerOrThrow(HttpRequest const& request);
-    void checkAccess(HttpRequest const& request);
-    HttpAnswer fromSnapshot(Target const& target);
+    void checkHost(HttpRequest const& request) const;
+    void checkToken(HttpRequest const& request);
+    std::shared_ptr<Snapshot const> takeSnapshot();
+    HttpAnswer fromSnapshot(HttpRequest const& request, Target const& target);
+    HttpAnswer journal(View const& view, Target const& target);
     HttpAnswer metrics(Target const& target, std::string_view accept);
-    std::string etag() const;
+    void keep(std::string_view target, std::shared_ptr<std::string const> const& body);
+    std::string etag(std::string const& more = {}) const;
 
     HttpServed m_served;
     Documents m_documents;
     std::string m_hostName;
     std::string const m_run; ///< distinguishes the snapshots of this run of the agent
     std::unique_ptr<Moment const> m_moment;
-    /// Of the moment: the documents of whole lists, by the last segments of their addresses.
-    std::map<std::string, std::shared_ptr<std::string const>> m_written;
+    std::uint64_t m_moments = 0; ///< how many there have been
+    /// Documents of the moment, by their targets.
+    std::map<std::string, std::shared_ptr<std::string const>, std::less<>> m_written;
+    std::size_t m_writtenOctets = 0;
     MetricsCache m_metrics;
 
     std::mutex m_mutex; ///< guards what follows

@@ -35,14 +35,10 @@ struct Pending {
     bool hasNoBody = false;
 };
 
-struct Fields {
-    std::size_t octets = 0;
-};
-
-MHD_Result addField(void* closure, MHD_ValueKind /*kind*/, char const* name, char const* value) {
-    auto& fields = *static_cast<Fields*>(closure);
-    fields.octets += std::string_view(name).size();
-    if (value != nullptr) fields.octets += std::string_view(value).size();
+MHD_Result addOctets(void* closure, MHD_ValueKind /*kind*/, char const* name, char const* value) {
+    auto& octets = *static_cast<std::size_t*>(closure);
+    octets += std::string_view(name).size();
+    if (value != nullptr) octets += std::string_view(value).size();
     return MHD_YES;
 }
 
@@ -164,15 +160,15 @@ class HttpServer::Listener {
         }
         try {
             auto& self = *static_cast<Listener*>(closure);
-            Fields fields;
-            MHD_get_connection_values(connection, MHD_HEADER_KIND, addField, &fields);
+            std::size_t headerOctets = 0;
+            MHD_get_connection_values(connection, MHD_HEADER_KIND, addOctets, &headerOctets);
             return queue(connection,
                          self.m_answers.answer({method, request->target,
                                                 field(connection, MHD_HTTP_HEADER_HOST),
                                                 field(connection, MHD_HTTP_HEADER_AUTHORIZATION),
                                                 field(connection, MHD_HTTP_HEADER_IF_NONE_MATCH),
                                                 field(connection, MHD_HTTP_HEADER_ACCEPT),
-                                                fields.octets, self.m_isLocal}));
+                                                headerOctets, self.m_isLocal}));
         } catch (...) {
             return MHD_NO; // closes the connection
         }

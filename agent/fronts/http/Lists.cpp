@@ -12,37 +12,41 @@ bool isWanted(Part const& part, std::string_view column) {
     return std::ranges::find(part.without, column) == part.without.end();
 }
 
-void writeBoard(JsonWriter& json, View const& view, std::uint32_t boardIndex) {
-    BoardRow const* const board = view.board(boardIndex);
-    json.key("board");
-    board == nullptr ? json.null() : json.text(board->serialNumber);
-    json.key("boardIndex");
-    boardIndex == 0 ? json.null() : json.number(std::int64_t{boardIndex});
-}
-
-void writeInterface(JsonWriter& json, View const& view, std::uint32_t ifIndex) {
-    InterfaceRow const* const row = view.interface(ifIndex);
-    json.key("name");
-    row == nullptr ? json.null() : json.text(row->name);
-    json.key("ifIndex").number(std::int64_t{ifIndex});
-    writeBoard(json, view, row == nullptr ? 0 : row->boardIndex);
+bool isWanted(Fields const& fields, std::string_view key, bool isOnRequest = false) {
+    return fields.empty() ? !isOnRequest : std::ranges::find(fields, key) != fields.end();
 }
 
 } // namespace
 
-ListWriter::ListWriter(List const& list) : m_list(list) {
+ListWriter::ListWriter(List const& list, Fields const& fields) : m_list(list) {
+    using enum Lead::What;
+    auto const lead = [&](Lead::What what, std::string_view key, std::size_t position) {
+        if (isWanted(fields, key)) m_leads.push_back({what, std::string(key), position});
+    };
+    for (std::size_t position = 0; position < list.index.size(); ++position) {
+        std::string_view const number = list.index[position];
+        if (number == "ifIndex") lead(Name, "name", position);
+        if (number != "boardIndex") lead(Number, number, position);
+        if (number != "ifIndex" && number != "boardIndex") continue;
+        lead(Serial, "board", position);
+        lead(Board, "boardIndex", position);
+    }
+    for (Extra const& extra : list.extras)
+        if (isWanted(fields, extra.key, extra.isOnRequest)) m_extras.push_back(extra);
     for (Part const& part : list.parts) {
         Section section{part, {}};
         for (std::size_t number = 0; number < part.table->columnCount(); ++number) {
             ColumnHead const head = part.table->column(number);
-            if (isWanted(part, head.name))
-                section.columns.push_back({number, keyOf(head.name, part.prefix, head.type), head});
+            std::string key = keyOf(head.name, part.prefix, head.type);
+            if (isWanted(part, head.name) &&
+                isWanted(fields, part.object.empty() ? std::string_view(key) : part.object))
+                section.columns.push_back({number, std::move(key), head});
         }
-        m_sections.push_back(std::move(section));
+        if (!section.columns.empty()) m_sections.push_back(std::move(section));
     }
 }
 
-void ListWriter::writeAll(JsonWriter& json, View const& view, std::uint32_t boardIndex) const {
+void ListWriter::writeAll(JsonWriter& json, View const& view, RowFilter const& filter) const {
     Table const& table = *m_list.parts.front().table;
     Facts const facts = view.facts();
     json.beginArray();
@@ -51,7 +55,7 @@ void ListWriter::writeAll(JsonWriter& json, View const& view, std::uint32_t boar
     for (std::size_t row = 0; row < rows; ++row) {
         index.clear();
         table.appendIndex(facts, row, index);
-        if (boardIndex != 0 && boardOf(view, index) != boardIndex) continue;
+        if (!passes(view, index, filter)) continue;
         json.beginObject();
         writeKeys(json, view, index);
         json.endObject();
@@ -60,8 +64,12 @@ void ListWriter::writeAll(JsonWriter& json, View const& view, std::uint32_t boar
 }
 
 void ListWriter::writeKeys(JsonWriter& json, View const& view, OidView index) const {
-    writeIndex(json, view, index);
-    if (m_list.more != nullptr) m_list.more(json, view, index);
+    for (Lead const& lead : m_leads)
+        writeLead(json, view, lead, index);
+    for (Extra const& extra : m_extras) {
+        json.key(extra.key);
+        extra.write(json, view, index);
+    }
     for (auto section = m_sections.begin(); section != m_sections.end();) {
         std::string_view const object = section->part.object;
         if (object.empty()) {
@@ -79,28 +87,41 @@ void ListWriter::writeKeys(JsonWriter& json, View const& view, OidView index) co
 
 std::vector<std::string> ListWriter::keys() const {
     std::vector<std::string> keys;
-    for (std::string_view const number : m_list.index) {
-        if (number == "ifIndex") keys.insert(keys.end(), {"name", "board", "boardIndex"});
-        if (number == "boardIndex") keys.emplace_back("board");
-        keys.emplace_back(number);
-    }
-    for (Section const& section : m_sections) {
-        std::string const object =
-            section.part.object.empty() ? "" : std::string(section.part.object) + '.';
+    auto const add = [&](std::string_view key) {
+        if (keys.empty() || keys.back() != key) keys.emplace_back(key);
+    };
+    for (Lead const& lead : m_leads)
+        add(lead.key);
+    for (Extra const& extra : m_extras)
+        add(extra.key);
+    for (Section const& section : m_sections)
         for (Column const& column : section.columns)
-            keys.push_back(object + column.key);
-    }
+            add(section.part.object.empty() ? std::string_view(column.key) : section.part.object);
     return keys;
 }
 
-void ListWriter::writeIndex(JsonWriter& json, View const& view, OidView index) const {
-    for (std::size_t i = 0; i < std::min(index.size(), m_list.index.size()); ++i) {
-        if (m_list.index[i] == "ifIndex")
-            writeInterface(json, view, index[i]);
-        else if (m_list.index[i] == "boardIndex")
-            writeBoard(json, view, index[i]);
-        else
-            json.key(m_list.index[i]).number(std::int64_t{index[i]});
+void ListWriter::writeLead(JsonWriter& json, View const& view, Lead const& lead,
+                           OidView index) const {
+    json.key(lead.key);
+    std::uint32_t const number = index[lead.position];
+    bool const isInterface = m_list.index[lead.position] == "ifIndex";
+    InterfaceRow const* const interface = isInterface ? view.interface(number) : nullptr;
+    std::uint32_t const interfacesBoard = interface == nullptr ? 0 : interface->boardIndex;
+    std::uint32_t const boardIndex = isInterface ? interfacesBoard : number;
+    BoardRow const* const board = view.board(boardIndex);
+    switch (lead.what) {
+    case Lead::What::Number:
+        json.number(std::int64_t{number});
+        return;
+    case Lead::What::Name:
+        interface == nullptr ? json.null() : json.text(interface->name);
+        return;
+    case Lead::What::Serial:
+        board == nullptr ? json.null() : json.text(board->serialNumber);
+        return;
+    case Lead::What::Board:
+        boardIndex == 0 ? json.null() : json.number(std::int64_t{boardIndex});
+        return;
     }
 }
 
@@ -117,11 +138,27 @@ void ListWriter::writeColumns(JsonWriter& json, View const& view, Section const&
     }
 }
 
+bool ListWriter::passes(View const& view, OidView index, RowFilter const& filter) const {
+    if (filter.boardIndex != 0 && boardOf(view, index) != filter.boardIndex) return false;
+    if (!filter.ifIndices.empty() && !std::ranges::binary_search(filter.ifIndices, index[0]))
+        return false;
+    if (filter.line == 0) return true;
+    Ds0ChannelRow const* const slot = view.timeSlot(index[0]);
+    return slot != nullptr && slot->line == filter.line;
+}
+
 std::uint32_t ListWriter::boardOf(View const& view, OidView index) const {
     std::string_view const first = m_list.index.empty() ? "" : m_list.index.front();
     if (first == "boardIndex") return index[0];
     InterfaceRow const* const row = first == "ifIndex" ? view.interface(index[0]) : nullptr;
     return row == nullptr ? 0 : row->boardIndex;
+}
+
+std::vector<std::string> fieldsOf(List const& list) {
+    std::vector<std::string> fields = ListWriter(list).keys();
+    for (Extra const& extra : list.extras)
+        if (extra.isOnRequest) fields.emplace_back(extra.key);
+    return fields;
 }
 
 Oid writeTable(JsonWriter& json, View const& view, Table const& table, OidView after,

@@ -21,8 +21,12 @@ struct Part {
     std::string_view object = {};
 };
 
-/// Writes keys that are no column.
-using MoreKeys = void (*)(JsonWriter&, View const&, OidView index);
+/// A key whose value is no column's.
+struct Extra {
+    std::string_view key;
+    void (*write)(JsonWriter&, View const&, OidView index);
+    bool isOnRequest = false; ///< only in answers to requests that name it
+};
 
 /// A list of rows, each joined from the rows of its parts that have the same index.
 struct List {
@@ -31,7 +35,7 @@ struct List {
     /// number, and `ifIndex` the interface's name and its board.
     std::vector<std::string_view> index;
     std::vector<Part> parts; ///< the first one has the rows
-    MoreKeys more = nullptr;
+    std::vector<Extra> extras = {};
 };
 
 /// One address below /api/v1/ and the lists that it answers with.

@@ -21,6 +21,8 @@ struct Moment {
     Settings settings;        ///< a copy: what is set meanwhile appears with the next snapshot
     std::int64_t taken = 0;   ///< when the snapshot was begun: milliseconds since the epoch
     std::int64_t age = 0;     ///< the snapshot's, in milliseconds
+    /// The snapshot's: a stale snapshot is shown again with other alarms.
+    std::shared_ptr<AlarmRows const> alarms;
 
     Moment(Snapshot const& snapshot, Settings const& current);
 };
@@ -42,6 +44,17 @@ class View {
     InterfaceRow const* interface(std::uint32_t ifIndex) const;
     /// The time slot that a bearer channel is in; null if none is known.
     Ds0ChannelRow const* timeSlot(std::uint32_t ifIndex) const;
+    LineRow const* line(std::uint32_t ifIndex) const;
+    AlarmRow const* alarm(std::uint32_t number) const;
+
+    /// How many bearer channels there are, and how many of them are not idle.
+    struct Channels {
+        std::int64_t all = 0;
+        std::int64_t inUse = 0;
+    };
+    /// Those whose time slots of a line are known.
+    Channels channelsOf(std::uint32_t lineIfIndex) const;
+    Channels allChannels() const;
 
   private:
     Snapshot const& m_snapshot;

@@ -10,6 +10,7 @@
 #include "agent/objects/OwnObjects.h"
 #include "agent/objects/StandardObjects.h"
 #include "board/Board.h"
+#include "board/ISDNChannel.h"
 
 namespace kvloamd {
 namespace {
@@ -84,7 +85,15 @@ class HttpAnswersTest : public ::testing::Test {
     std::shared_ptr<Snapshot> m_snapshot = std::make_shared<Snapshot>();
     Counters m_counters;
     Settings m_settings;
-    HttpAnswers m_answers{{allObjects(), m_counters, m_settings, [this] { return m_snapshot; }},
+    JournalQuery m_asked;
+    std::optional<JournalPage> m_journal = JournalPage{};
+    std::uint32_t m_newest = 0;
+    HttpAnswers m_answers{{allObjects(), m_counters, m_settings, [this] { return m_snapshot; },
+                           [this](JournalQuery const& query) {
+                               m_asked = query;
+                               return m_journal;
+                           },
+                           [this] { return m_newest; }},
                           "gw1.example"};
 };
 
@@ -302,10 +311,10 @@ TEST_F(HttpAnswersTest, NameThatIsNoTextIsAnsweredInUtf8) {
 
 TEST_F(HttpAnswersTest, SizesAreLimited) {
     HttpRequest request{.method = "GET", .isLocal = true};
-    std::string target = "/api/v1/boards?";
+    std::string target = "/api/v1/boards/";
     target.resize(HttpAnswers::kLongestTarget, 'x');
     request.target = target;
-    EXPECT_EQ(ask(request).status, 200);
+    EXPECT_EQ(ask(request).status, 404);
     target += 'x';
     request.target = target;
     EXPECT_EQ(ask(request).status, 414);
@@ -346,10 +355,159 @@ TEST_F(HttpAnswersTest, TokenIsRequiredOverTcpOnly) {
     EXPECT_EQ(get("/api/v1/boards").status, 200);
 }
 
+TEST_F(HttpAnswersTest, PageNeedsNoToken) {
+    m_answers.requireToken("0123456789abcdef");
+    HttpRequest request = byTcp("localhost");
+    request.target = "/";
+    HttpAnswer const page = ask(request);
+    EXPECT_EQ(page.status, 200);
+    EXPECT_EQ(page.contentType, "text/html; charset=utf-8");
+    EXPECT_THAT(page.headers, Contains(Key("Content-Security-Policy")));
+    request.target = "/page/style.css";
+    EXPECT_EQ(ask(request).contentType, "text/css; charset=utf-8");
+    std::string const etag = ask(request).etag;
+    request.ifNoneMatch = etag;
+    EXPECT_EQ(ask(request).status, 304);
+    request.target = "/api/v1/health";
+    EXPECT_EQ(ask(request).status, 401);
+}
+
+TEST_F(HttpAnswersTest, RowsHaveTheAskedKeysOnly) {
+    EXPECT_EQ(document("/api/v1/lines?fields=name,current,boardIndex")["lines"][0].size(), 3U);
+    EXPECT_EQ(document("/api/v1/boards?fields=board,status")["boards"][0],
+              (Json{{"board", "NX50001"}, {"status", "started"}}));
+    for (char const* const fields : {"nothing", "", "name,", "current.es", "es"})
+        EXPECT_EQ(get(std::string("/api/v1/lines?fields=") + fields).status, 400) << fields;
+}
+
+TEST_F(HttpAnswersTest, KeyOfOneListOfSeveralIsKnownToAll) {
+    Json const answer = document("/api/v1/channels?fields=timeSlot");
+    EXPECT_EQ(answer["channels"][0], (Json{{"timeSlot", 5}}));
+    EXPECT_EQ(answer["signallingChannels"], Json::array());
+}
+
+TEST_F(HttpAnswersTest, StripIsShownOnRequest) {
+    EXPECT_FALSE(document("/api/v1/lines")["lines"][0].contains("strip"));
+    EXPECT_EQ(document("/api/v1/lines?fields=strip")["lines"][0]["strip"],
+              Json::parse("[[3,2,0],null]"));
+    m_snapshot->number = 8;
+    m_snapshot->interfaces.lines[0].closed = nullptr;
+    EXPECT_EQ(document("/api/v1/lines?fields=strip")["lines"][0]["strip"], nullptr);
+}
+
+TEST_F(HttpAnswersTest, RowsAreFilteredByBoardLineAndIndex) {
+    EXPECT_EQ(document("/api/v1/lines?board=NX50001")["lines"].size(), 1U);
+    EXPECT_EQ(document("/api/v1/lines?board=77")["lines"].size(), 0U);
+    EXPECT_EQ(get("/api/v1/lines?board=none").status, 404);
+    EXPECT_EQ(document("/api/v1/interfaces?ifIndex=1001,7")["interfaces"].size(), 1U);
+    EXPECT_EQ(document("/api/v1/interfaces?ifIndex=1001,1000")["interfaces"].size(), 2U);
+    EXPECT_EQ(document("/api/v1/channels?line=1000")["channels"].size(), 1U);
+    EXPECT_EQ(document("/api/v1/channels?line=1001")["channels"].size(), 0U);
+    for (char const* const query : {"lines?ifIndex=", "lines?ifIndex=x", "channels?line=0",
+                                    "lines?line=1000", "boards?ifIndex=1", "lines?filds=name"})
+        EXPECT_EQ(get(std::string("/api/v1/") + query).status, 400) << query;
+}
+
+TEST_F(HttpAnswersTest, ChannelsInUseAreCounted) {
+    Json const idle = document("/api/v1/lines")["lines"][0];
+    EXPECT_EQ(idle["channels"], 1);
+    EXPECT_EQ(idle["channelsInUse"], 0);
+    m_snapshot->number = 8;
+    m_snapshot->interfaces.bearers[0].operStatus = ISDNBChannelStatusActive;
+    EXPECT_EQ(document("/api/v1/lines")["lines"][0]["channelsInUse"], 1);
+    EXPECT_EQ(document("/api/v1/health")["health"]["channelsInUse"], 1);
+}
+
+TEST_F(HttpAnswersTest, AlarmNamesItsBoardAndLine) {
+    auto alarms = std::make_shared<AlarmRows>();
+    AlarmRow alarm;
+    alarm.number = 12;
+    alarm.kind = "lossOfSignal";
+    alarm.severity = 4;
+    alarm.boardIndex = 1;
+    alarm.ifIndex = 1000;
+    alarms->alarms = {alarm};
+    m_snapshot->alarms = alarms;
+    Json const row = document("/api/v1/alarms")["alarms"][0];
+    EXPECT_EQ(row["number"], 12);
+    EXPECT_EQ(row["severity"], "major");
+    EXPECT_EQ(row["board"], "NX50001");
+    EXPECT_EQ(row["line"], "trunk-1");
+}
+
+TEST_F(HttpAnswersTest, SnapshotWithOtherAlarmsIsAnotherOne) {
+    std::string const etag = get("/api/v1/alarms").etag;
+    EXPECT_EQ(get("/api/v1/alarms").etag, etag);
+    m_snapshot->alarms = std::make_shared<AlarmRows>();
+    EXPECT_NE(get("/api/v1/alarms").etag, etag);
+}
+
+TEST_F(HttpAnswersTest, JournalIsReadAfterAnEntry) {
+    JournalRow entry;
+    entry.number = 41;
+    entry.event = "alarmRaised";
+    entry.text = "alarm raised";
+    entry.board = "NX50001";
+    entry.ifIndex = 1000;
+    entry.alarm = "lossOfSignal";
+    entry.severity = 4;
+    JournalRow start;
+    start.number = 42;
+    start.event = "agentStarted";
+    m_journal = JournalPage{{entry, start}, 42};
+    Json const answer = document("/api/v1/journal?after=40&limit=5");
+    EXPECT_EQ(m_asked.after, 40U);
+    EXPECT_EQ(m_asked.limit, 5U);
+    EXPECT_EQ(answer["newest"], 42);
+    EXPECT_EQ(answer["entries"][0]["severity"], "major");
+    EXPECT_EQ(answer["entries"][0]["line"], "trunk-1");
+    EXPECT_EQ(answer["entries"][0]["date"], "1970-01-01T00:00:00Z");
+    EXPECT_EQ(answer["entries"][1]["severity"], nullptr);
+    EXPECT_EQ(answer["entries"][1]["board"], nullptr);
+    document("/api/v1/journal");
+    EXPECT_EQ(m_asked.after, std::nullopt);
+    for (char const* const query :
+         {"after=", "after=-1", "after=4294967296", "limit=0", "limit=1001"})
+        EXPECT_EQ(get(std::string("/api/v1/journal?") + query).status, 400) << query;
+}
+
+TEST_F(HttpAnswersTest, JournalsEtagChangesWithANewEntry) {
+    std::string const etag = get("/api/v1/journal").etag;
+    EXPECT_EQ(get("/api/v1/journal").etag, etag);
+    m_newest = 1;
+    EXPECT_NE(get("/api/v1/journal").etag, etag);
+}
+
+TEST_F(HttpAnswersTest, JournalThatCannotBeReadIsUnavailable) {
+    m_journal = std::nullopt;
+    EXPECT_EQ(get("/api/v1/journal").status, 503);
+}
+
+TEST_F(HttpAnswersTest, DocumentIsWrittenOnceForASnapshot) {
+    auto const first = get("/api/v1/lines").body;
+    EXPECT_EQ(get("/api/v1/lines").body, first);
+    m_snapshot->number = 8;
+    EXPECT_NE(get("/api/v1/lines").body, first);
+}
+
+TEST_F(HttpAnswersTest, FewDocumentsAreKept) {
+    auto const bodyOf = [&](std::size_t limit) {
+        return get("/api/v1/tables/ifTable?limit=" + std::to_string(limit)).body;
+    };
+    for (std::size_t limit = 1; limit <= HttpAnswers::kMostKept + 1; ++limit)
+        bodyOf(limit);
+    EXPECT_EQ(bodyOf(HttpAnswers::kMostKept), bodyOf(HttpAnswers::kMostKept));
+    EXPECT_NE(bodyOf(HttpAnswers::kMostKept + 1), bodyOf(HttpAnswers::kMostKept + 1));
+}
+
 TEST_F(HttpAnswersTest, FailureIsAnsweredWithoutItsReason) {
     HttpAnswers failing(
-        {allObjects(), m_counters, m_settings,
-         []() -> std::shared_ptr<Snapshot const> { throw std::runtime_error("secret"); }});
+        {allObjects(),
+         m_counters,
+         m_settings,
+         []() -> std::shared_ptr<Snapshot const> { throw std::runtime_error("secret"); },
+         {},
+         {}});
     HttpAnswer const answer =
         failing.answer({.method = "GET", .target = "/api/v1/boards", .isLocal = true});
     EXPECT_EQ(answer.status, 500);
