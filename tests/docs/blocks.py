@@ -6,6 +6,8 @@ prints. A comment on the line before the block may say more, several things sepa
 
   <!-- not run: REASON -->        a test cannot run it; the reason is printed
   <!-- file: PATH -->             the block is the contents of this file: it is written there
+  <!-- checked by: COMMAND -->    this command, with the name of a file with the block in the place of
+                                  FILE, finds no fault
   <!-- printed by: COMMAND -->    the lines of the block are among what this command prints, in order
   <!-- printed in: NAME -->       the same for what the terminal of this name has shown so far
   <!-- terminal: NAME -->         it is typed in another terminal
@@ -20,7 +22,7 @@ text in a line, a line of its own "..." for any number of lines.
 import dataclasses
 import re
 
-DIRECTIVES = ("not run", "not compiled", "file", "printed by", "printed in", "terminal", "stays", "fails", "from")
+DIRECTIVES = ("not run", "not compiled", "file", "checked by", "printed by", "printed in", "terminal", "stays", "fails", "from")
 COMMAND_LANGUAGES = ("sh", "console")
 MASKS = [
     (r"Timeticks: \(\d+\) (\d+ days?, )?[\d:.]+", "<ticks>"),
@@ -49,7 +51,7 @@ class Command:
 def directives_of(comment):
     """What a comment before a block says; nothing if it is a comment of another kind."""
     found = {}
-    whole = comment.startswith(("not run", "not compiled", "printed by"))
+    whole = comment.startswith(("not run", "not compiled", "checked by", "printed by"))
     for part in [comment] if whole else comment.split(";"):
         part = part.strip()
         name = next((d for d in DIRECTIVES if re.match(d + r"\b", part)), None)
