@@ -80,9 +80,8 @@ void printFields(View const& view, Json const& object) {
 void printBoard(View const& view, Json const& answer) {
     Json const& board = objectIn(answer, "board");
     Cell const state = boardState(board);
-    view.out << view.screen.painted(view.screen.clean("Board " + textIn(board, "serialNumber")),
-                                    Paint::Heading)
-             << ": " << view.screen.painted(view.screen.clean(state.text), state.paint) << '\n';
+    printWords(view.out, view.screen,
+               {"Board " + textIn(board, "serialNumber") + ": " + state.text, state.paint});
     printFields(view, board);
     printSections(view, "lines", answer);
     printSections(view, "devices", answer);
@@ -91,9 +90,8 @@ void printBoard(View const& view, Json const& answer) {
 void printLine(View const& view, Json const& answer) {
     Json const& line = objectIn(answer, "line");
     Cell const status = lineStatus(line);
-    view.out << view.screen.painted(view.screen.clean("Line " + textIn(line, "name")),
-                                    Paint::Heading)
-             << ": " << view.screen.painted(view.screen.clean(status.text), status.paint) << '\n';
+    printWords(view.out, view.screen,
+               {"Line " + textIn(line, "name") + ": " + status.text, status.paint});
     printFields(view, line);
     if (!field(line, "current").is_object()) {
         view.out << "\nThe line keeps no counters.\n";

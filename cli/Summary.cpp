@@ -88,13 +88,13 @@ void printSome(View const& view, char const* command, char const* heading, Json 
     std::size_t const shown = std::min(rows.size(), room - kAround);
     Json some = Json::array();
     std::copy_n(rows.begin(), shown, std::back_inserter(some));
-    view.out << '\n' << view.screen.painted(heading, Paint::Heading) << '\n';
+    view.out << '\n';
+    printWords(view.out, view.screen, {heading, Paint::Heading});
     printRows(view, listNamed(command).sections.front(), some);
     if (shown < rows.size())
-        view.out << view.screen.painted("and " + std::to_string(rows.size() - shown) +
-                                            " more, see: kvloam " + command,
-                                        Paint::Faint)
-                 << '\n';
+        printWords(view.out, view.screen,
+                   {"and " + std::to_string(rows.size() - shown) + " more, see: kvloam " + command,
+                    Paint::Faint});
     room -= std::min(room, shown + kAround);
 }
 

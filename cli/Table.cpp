@@ -82,19 +82,27 @@ void Table::print(std::ostream& out, Screen const& screen) const {
     }
 }
 
+void printWords(std::ostream& out, Screen const& screen, Cell const& line) {
+    out << screen.painted(cut(screen.clean(line.text), screen.width, screen.mark()), line.paint)
+        << '\n';
+}
+
 void printPairs(std::ostream& out, Screen const& screen,
                 std::vector<std::pair<std::string, Cell>> const& pairs) {
-    std::size_t widest = 0;
+    std::size_t widest = 1;
     for (auto const& pair : pairs)
         widest = std::max(widest, width(screen.clean(pair.first)));
+    // Half of a narrow screen is for the values.
+    widest = std::min(widest, std::max<std::size_t>(screen.width / 2, 1));
+    std::size_t const used = widest + kGap;
     for (auto const& [name, cell] : pairs) {
-        std::string const shown = screen.clean(name);
-        std::string const left = shown + std::string(widest + kGap - width(shown), ' ');
-        std::string const text = screen.clean(cell.text);
-        std::size_t const room =
-            screen.width > left.size() ? screen.width - left.size() : std::size_t{1};
-        out << screen.painted(left, Paint::Faint)
-            << screen.painted(cut(text, room, screen.mark()), cell.paint) << '\n';
+        std::string const shown = cut(screen.clean(name), widest, screen.mark());
+        out << screen.painted(shown, Paint::Faint);
+        if (screen.width > used)
+            out << std::string(used - width(shown), ' ')
+                << screen.painted(cut(screen.clean(cell.text), screen.width - used, screen.mark()),
+                                  cell.paint);
+        out << '\n';
     }
 }
 

@@ -43,6 +43,9 @@ class Table {
     std::vector<std::vector<Cell>> m_rows;
 };
 
+/// Prints a line of our own and others' words, which is cut to the screen.
+void printWords(std::ostream& out, Screen const& screen, Cell const& line);
+
 /// Prints names and what they stand for, one pair in a line.
 void printPairs(std::ostream& out, Screen const& screen,
                 std::vector<std::pair<std::string, Cell>> const& pairs);
