@@ -24,7 +24,13 @@ Cell known(Json const& row, Date) {
     return {value.is_string() ? shortName(valueText(value)) : valueText(value)};
 }
 
-/// The number of seconds since a date.
+/// The same with the whole name, as the documents have it.
+template <Key Name>
+Cell wholeName(Json const& row, Date) {
+    return {valueText(field(row, Name.text))};
+}
+
+/// The time since a date.
 template <Key Name>
 Cell age(Json const& row, Date now) {
     auto const date = dateIn(row, Name.text);
@@ -205,7 +211,7 @@ std::vector<ListColumn> const kInterfaces = {
 
 std::vector<ListColumn> const kAlarms = {
     {column("SEVERITY", 1), by<severity>},
-    {column("KIND", 0), known<"kind">},
+    {column("KIND", 0), wholeName<"kind">},
     {column("RESOURCE", 2, Align::Left, 12), known<"resource">},
     {column("RAISED", 6), local<"date">},
     {column("AGE", 3, kRight), age<"date">},
