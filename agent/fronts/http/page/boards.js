@@ -8,6 +8,8 @@ import {
 import { Rows } from "/page/rows.js";
 import { boardState, lineState, makeState, rank, showState } from "/page/states.js";
 
+const kList = "boards?fields=boardIndex,status,secondaryStatus,name,model,serialNumber,errorMessage,shelfId," +
+    "pciSlotNumber";
 const kCellWidth = 150; // of a slot, in pixels, at least
 const kMostSlots = 64; // of a shelf that is drawn with the slots between its boards
 
@@ -87,7 +89,7 @@ export class BoardsView {
     }
 
     addresses() {
-        return ["boards", ...(this.chosen === null ? [] : [`boards/${encodeURIComponent(this.chosen)}`])];
+        return [kList, ...(this.chosen === null ? [] : [`boards/${encodeURIComponent(this.chosen)}`])];
     }
 
     /** @param chosen the index or serial number of the board to show in detail */
@@ -165,7 +167,7 @@ export class BoardsView {
     }
 
     render() {
-        const boards = this.agent.body("boards")?.boards ?? null;
+        const boards = this.agent.body(kList)?.boards ?? null;
         const alarms = this.agent.body("alarms")?.alarms ?? null;
         renderSummary(this.agent.body("health")?.health ?? null, boards, alarms);
         this.alarms.render(alarms);

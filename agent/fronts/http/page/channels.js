@@ -31,13 +31,13 @@ export class ChannelsView {
             },
             update: (row, line) => {
                 const [name, used, share, board] = row.children;
-                setText(name, line.name);
+                setText(name, shown(line.name));
                 setText(used, `${shown(line.channelsInUse)} of ${shown(line.channels)}`);
                 const meter = share.firstElementChild;
                 setAttribute(meter, "max", Math.max(1, line.channels ?? 0));
                 setAttribute(meter, "value", line.channelsInUse ?? 0);
                 setAttribute(meter, "aria-label", `channels in use on ${line.name}`);
-                setText(board, line.board);
+                setText(board, shown(line.board));
             },
             choose: (line) => { location.hash = `#/channels/${line.ifIndex}`; },
         });
@@ -67,15 +67,18 @@ export class ChannelsView {
         this.renderSlots();
     }
 
+    /** The line's channels, by time slot. */
     renderSlots() {
         setHidden(byId("slots"), this.chosen === null);
         if (this.chosen === null) return;
         const body = this.agent.body(this.slotsAddress());
         const channels = body?.channels ?? [];
         const refusal = this.agent.error(this.slotsAddress());
-        const line = channels[0]?.line ?? this.chosen;
+        const known = this.agent.body(kList)?.lines.find((line) => String(line.ifIndex) === this.chosen);
+        const line = known?.name ?? this.chosen;
         setText(byId("slots-heading"),
             refusal === null ? `Channels of line ${line}` : `The line is not there (${refusal})`);
+        setHidden(byId("no-slots"), body === null || channels.length > 0);
         patchList(byId("slot-list"), channels, (channel) => channel.ifIndex,
             () => {
                 const slot = make("li");

@@ -35,6 +35,7 @@ export class JournalView {
         this.began = null; // when the agent that wrote the entries was started
         this.rows = new Rows(byId("journal"), {
             height: 44,
+            narrow: 66,
             keyOf: (entry) => entry.number,
             create: () => {
                 const row = make("div", "", "", { role: "row" });
@@ -48,9 +49,9 @@ export class JournalView {
                 const [event, resource, time, text, number] = row.children;
                 showState(event.firstElementChild, eventState(entry), "severity");
                 const place = [entry.board, entry.line].filter(Boolean).join(", ");
-                setText(resource, entry.resource || place || words(entry.event));
+                setText(resource, place || words(entry.event));
                 setTime(time.firstElementChild, entry.date, this.agent.now());
-                setText(text, entry.text);
+                setText(text, shown(entry.text));
                 setText(number, `no. ${shown(entry.number)}`);
             },
             choose: (entry) => {
@@ -101,7 +102,7 @@ export class JournalView {
         const wanted = byId("journal-filter").value.trim().toLowerCase();
         const has = (text) => (text ?? "").toLowerCase().includes(wanted);
         const entries = wanted === "" ? this.entries : this.entries.filter((entry) =>
-            [entry.text, entry.board, entry.line, entry.resource].some(has));
+            [entry.text, entry.board, entry.line].some(has));
         const all = `${shown(this.entries.length)} ${this.entries.length === 1 ? "entry" : "entries"}`;
         setText(byId("journal-count"),
             entries.length === this.entries.length ? all : `${shown(entries.length)} of ${all}`);

@@ -95,7 +95,8 @@ export class LineDetails {
 
     renderNow(line) {
         const now = line.current;
-        patchTerms(byId("line-now"), now === null ? [["History", "the line keeps none"]] : [
+        const keepsHistory = now !== null && (now.es !== null || line.intervals.length > 0);
+        patchTerms(byId("line-now"), !keepsHistory ? [["History", "the line keeps none"]] : [
             ["Began", line.timeElapsed === null ? null : `${span(line.timeElapsed)} ago`],
             ["ES, errored", now.es], ["SES, severely errored", now.ses], ["UAS, unavailable", now.uas],
             ["SEFS, severe framing", now.sefs], ["CSS, slips", now.css], ["LES, line errored", now.les],

@@ -72,18 +72,20 @@ export class LinesView {
 
     update(row, line) {
         const [name, state, strip, now, board] = row.children;
-        setText(name, line.name);
-        showState(state.firstElementChild, lineState(line));
+        setText(name, shown(line.name));
+        const known = lineState(line);
+        showState(state.firstElementChild, known);
+        setAttribute(state, "title", known[2]);
         const counts = line.current ? [line.current.es, line.current.ses, line.current.uas] : [null];
         setText(now, counts.map(shown).join(" / "));
-        setText(board, line.board);
-        const known = this.strips.of(line.ifIndex);
+        setText(board, shown(line.board));
+        const day = this.strips.of(line.ifIndex);
         const canvas = strip.firstElementChild;
-        if (row.drawn === known && row.drawnFor === line.ifIndex) return;
-        row.drawn = known;
+        if (row.drawn === day && row.drawnFor === line.ifIndex) return;
+        row.drawn = day;
         row.drawnFor = line.ifIndex;
-        drawStrip(canvas, known);
-        setAttribute(canvas, "aria-label", stripText(known));
+        drawStrip(canvas, day);
+        setAttribute(canvas, "aria-label", stripText(day));
     }
 
     render() {

@@ -15,7 +15,7 @@ const kMargin = 3; // rows beyond each edge, so that slow painting does not show
 export class Rows {
     /**
      * @param box the scrolling element
-     * @param height of a row in pixels
+     * @param height of a row in pixels; @param narrow the same where the window is narrow
      * @param create makes a row's element; its children with the role "gridcell" are the cells
      * @param update brings an element up to a row
      * @param choose (row, column) what happens to a chosen row
@@ -23,12 +23,21 @@ export class Rows {
      * @param header a row of column headers, the first child of `box`, which stays in sight
      * @param wraps whether Right goes on from the last cell of a row to the next row, as Left goes back
      */
-    constructor(box, { height, create, update, keyOf, choose = () => {}, header = null, wraps = false }) {
-        Object.assign(this, { box, height, create, update, keyOf, choose, header, wraps });
+    constructor(box, {
+        height, narrow = height, create, update, keyOf, choose = () => {}, header = null, wraps = false,
+    }) {
+        Object.assign(this, { box, create, update, keyOf, choose, header, wraps });
         this.rows = [];
         this.pool = [];
         this.current = { row: 0, column: 0 };
         this.currentKey = null;
+        const isNarrow = matchMedia("(max-width: 48rem)");
+        const setHeight = () => { this.height = isNarrow.matches ? narrow : height; };
+        setHeight();
+        isNarrow.addEventListener("change", () => {
+            setHeight();
+            this.set(this.rows);
+        });
         this.space = make("div", "rows-space", "", { role: "presentation" });
         box.append(this.space);
         box.addEventListener("scroll", () => this.show(), { passive: true });
@@ -118,7 +127,7 @@ export class Rows {
 
     cellsOf(element) {
         return [...element.children].filter((child) =>
-            child.getAttribute("role") === "gridcell" && child.getAttribute("aria-hidden") !== "true");
+            child.getAttribute("role") === "gridcell" && !child.hidden && child.getAttribute("aria-hidden") !== "true");
     }
 
     cells(place) {

@@ -22,6 +22,8 @@ const kFailures = {
     dsx1XmtAIS: "sending AIS", dsx1LoopbackState: "in loopback", dsx1UnavailSigState: "unavailable",
     dsx1RcvTestCode: "receiving a test code", dsx1NetEquipOOS: "carrier out of service",
 };
+// What is named first, because it explains the rest.
+const kFirst = ["dsx1LossOfSignal", "dsx1LossOfFrame", "dsx1RcvAIS", "dsx1RcvFarEndLOF", "dsx1UnavailSigState"];
 // What a line reports that is no trouble.
 const kHarmless = new Set(["dsx1NoAlarm", "dsx1LoopbackState", "dsx1RcvTestCode"]);
 
@@ -35,7 +37,8 @@ export function lineState(line) {
     if (status === null || status === undefined) return ["off", "?", words(line.operStatus)];
     if (status.length === 0 || (status.length === 1 && status[0] === "dsx1NoAlarm"))
         return line.operStatus === "down" ? ["bad", "✖", "down"] : ["good", "●", "no alarm"];
-    const text = status.filter((name) => name !== "dsx1NoAlarm")
+    const weight = (name) => (kFirst.includes(name) ? kFirst.indexOf(name) : kFirst.length);
+    const text = status.filter((name) => name !== "dsx1NoAlarm").sort((a, b) => weight(a) - weight(b))
         .map((name) => kFailures[name] ?? words(name)).join(", ");
     if (line.operStatus === "down" || status.includes("dsx1UnavailSigState")) return ["bad", "✖", text];
     return hasTrouble(line) ? ["major", "▲", text] : ["info", "◆", text];

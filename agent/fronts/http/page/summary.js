@@ -5,7 +5,6 @@ import { byId, count, make, patchList, setClass, setHidden, setText, setTime, sh
 import { Rows } from "/page/rows.js";
 import { boardState, makeState, rank, severityState, showState } from "/page/states.js";
 
-const kHeight = 44; // of an alarm, in pixels
 const kMostSeen = 4; // alarms that are seen without scrolling
 
 /** The alarms in the order in which they need attention: the worst first, then the newest. */
@@ -26,7 +25,8 @@ export class Alarms {
     constructor(agent) {
         this.agent = agent;
         this.rows = new Rows(byId("alarms"), {
-            height: kHeight,
+            height: 44,
+            narrow: 66,
             keyOf: (alarm) => alarm.number,
             create: () => {
                 const row = make("div", "", "", { role: "row" });
@@ -49,7 +49,7 @@ export class Alarms {
     update(row, alarm) {
         const [severity, resource, since, text, more] = row.children;
         showState(severity.firstElementChild, severityState(alarm.severity), "severity");
-        setText(resource, alarm.resource);
+        setText(resource, shown(alarm.resource));
         const now = this.agent.now();
         setTime(since.firstElementChild, alarm.date, now);
         const age = (now - new Date(alarm.date)) / 1000;
@@ -60,13 +60,14 @@ export class Alarms {
         if (alarm.times > 1) notes.push(`${shown(alarm.times)} times`);
         if (alarm.state === "ending") notes.push("ending");
         setText(more, notes.join(", "));
+        setHidden(more, notes.length === 0);
     }
 
     render(alarms) {
         setText(byId("alarm-count"), alarms ? count(alarms.length, "active alarm") : "");
         setHidden(byId("no-alarms"), !alarms || alarms.length > 0);
         setHidden(byId("alarms"), !alarms || alarms.length === 0);
-        byId("alarms").style.height = `${Math.min(kMostSeen, alarms?.length ?? 0) * kHeight + 2}px`;
+        byId("alarms").style.height = `${Math.min(kMostSeen, alarms?.length ?? 0) * this.rows.height + 2}px`;
         this.rows.set(inOrder(alarms ?? []));
     }
 }

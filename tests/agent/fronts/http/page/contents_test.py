@@ -214,7 +214,7 @@ class OtherViewsTest(PageCase):
         self.tab.wait_for_text("#journal", "board status 2300")
         with self.agent.change():
             self.agent.journal.append(fake.entry(2301, "alarmRaised", "the line receives no signal",
-                                                 severity="critical", resource="board NX50001, T1 line trunk-11"))
+                                                 severity="critical", board="NX50001", line="trunk-11"))
         self.tab.wait_for_text("#journal .rows-row:not([hidden])", "no signal")
         first = self.tab.text("#journal [aria-rowindex='1']")
         self.assertRegex(first, r"(?s)critical.*trunk-11.*no signal.*2,301")
@@ -236,9 +236,8 @@ class OtherViewsTest(PageCase):
 
     def test_health_shows_the_agent_its_modules_and_processes(self):
         with self.agent.change():
-            self.agent.modules = [{"index": 1, "name": "z7sim", "purpose": "boards", "version": "1.2", "date": None}]
-            self.agent.processes = [{"id": 4711, "name": "callserver", "opens": 3, "closes": 1, "eventQueueSize": 100,
-                                     "currentEvents": 2, "maxEvents": 9, "totalEvents": 12345, "handlers": 1}]
+            self.agent.modules = [fake.module(1, name="z7sim", purpose="boards", version="1.2")]
+            self.agent.processes = [fake.process(4711, name="callserver")]
         self.show("health")
         self.tab.wait_for_text("#health-terms", "4,711")
         self.tab.wait_for_text("#modules", "z7sim, 1.2, boards")

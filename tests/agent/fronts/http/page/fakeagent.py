@@ -24,7 +24,7 @@ def now():
 
 def board(index, shelf=1, slot=None, **changes):
     serial = f"NX5{index:04}"
-    return {"boardIndex": index, "status": "started", "secondaryStatus": "none", "name": "NX5-T1",
+    return {"boardIndex": index, "board": serial, "status": "started", "secondaryStatus": "none", "name": "NX5-T1",
             "model": "NX5-T1", "family": "NX5", "firmwareName": "nx5.fw", "firmwareVersion": "4.2",
             "serialNumber": serial, "logicalId": index - 1, "errorMessage": "", "changeDate": rfc3339(now()),
             "functionalDescription": "T1 trunk board", "hardwareId": 16, "sharedMemoryAddress": "0xD0000000",
@@ -77,7 +77,20 @@ def alarm(number, severity, resource, text, **changes):
 
 def entry(number, event, text, **changes):
     return {"number": number, "date": rfc3339(now()), "event": event, "text": text, "board": None, "ifIndex": None,
-            "line": None, "kind": None, "severity": None, "resource": None, **changes}
+            "line": None, "kind": None, "severity": None, "times": None, **changes}
+
+
+def process(number, **changes):
+    return {"id": number, "name": "callserver", "opens": 3, "closes": 1, "eventQueueSize": 100, "currentEvents": 2,
+            "maxEvents": 9, "totalEvents": 12345, "handlers": 1, **changes}
+
+
+def module(index, **changes):
+    return {"index": index, "name": "z7sim", "purpose": "boards", "version": "1.0", "date": None, **changes}
+
+
+def service(index, **changes):
+    return {"index": index, "name": "service", "scmName": "svc", "status": 1, "changeDate": None, **changes}
 
 
 class Refused(Exception):
@@ -215,7 +228,7 @@ class FakeAgent:
                 return {"entries": self.journal[-limit:]}
             return {"entries": [one for one in self.journal if one["number"] > int(query["after"])][:limit]}
         if name == "boards" and not rest:
-            return {"boards": self.boards}
+            return {"boards": [self.pick(one, query) for one in self.boards]}
         if name == "boards":
             found = self.find(self.boards, rest[0], "boardIndex", "serialNumber")
             return {"board": found, "devices": [], "processors": [],
@@ -253,7 +266,7 @@ class FakeAgent:
             elif field in row:
                 picked[field] = row[field]
             else:
-                raise Refused(400, f"lines have no {field}")
+                raise Refused(400, f"there is no field {field}")
         return picked
 
     def intervals_of(self, row):
@@ -267,6 +280,9 @@ class FakeAgent:
                 "agentUpTimeSeconds": 18000.5, "notificationsSent": 12, "notificationsWaiting": 0, "requests": 4711,
                 "snapshots": self.snapshot, "snapshotAge": 3, "refreshTime": 7, "longestRefreshTime": 31,
                 "interfaceCount": len(self.lines), "lineCount": len(self.lines), "agentFront": "standAlone",
+                "alarmCount": len(self.alarms), "alarmsRaised": 9, "alarmsSuppressed": 1,
+                "channels": sum(one["channels"] for one in self.lines),
+                "channelsInUse": sum(one["channelsInUse"] for one in self.lines),
                 "masterState": None, "masterLosses": None, "interfaceConflicts": None, "persistence": "kept"}
 
 
