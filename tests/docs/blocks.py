@@ -10,6 +10,7 @@ prints. A comment on the line before the block may say more, several things sepa
                                   FILE, finds no fault
   <!-- printed by: COMMAND -->    the lines of the block are among what this command prints, in order
   <!-- printed in: NAME -->       the same for what the terminal of this name has shown so far
+  <!-- commands in the table -->  a table follows, whose first column holds commands: they are typed
   <!-- terminal: NAME -->         it is typed in another terminal
   <!-- stays -->                  its last command keeps running in that terminal
   <!-- fails -->                  its last command ends with another status than 0
@@ -22,7 +23,8 @@ text in a line, a line of its own "..." for any number of lines.
 import dataclasses
 import re
 
-DIRECTIVES = ("not run", "not compiled", "file", "checked by", "printed by", "printed in", "terminal", "stays", "fails", "from")
+DIRECTIVES = ("not run", "not compiled", "file", "checked by", "printed by", "printed in", "terminal", "stays", "fails", "from",
+              "commands in the table")
 COMMAND_LANGUAGES = ("sh", "console")
 MASKS = [
     (r"Timeticks: \(\d+\) (\d+ days?, )?[\d:.]+", "<ticks>"),
@@ -76,6 +78,14 @@ def blocks_of(text):
                 content.append(lines[at][indent:])
                 at += 1
             blocks.append(Block(start + 1, fence[2], "\n".join(content) + "\n", directives))
+            directives = {}
+        elif "commands in the table" in directives and line.startswith("|"):
+            start = at
+            while at < len(lines) and lines[at].startswith("|"):
+                at += 1
+            cells = [re.match(r"\| `([^`]*)` \|", row) for row in lines[start + 2:at]]
+            text = "".join(cell[1].replace("\\|", "|") + "\n" for cell in cells if cell)
+            blocks.append(Block(start + 2, "sh", text, {}))
             directives = {}
         else:
             comment = re.match(r" *<!-- (.*) -->$", line)
