@@ -16,6 +16,14 @@ std::string padded(std::string const& text, std::size_t columns) {
     return shown + std::string(columns - width(shown), ' ');
 }
 
+/// What the entry says beside its event and severity, which have columns of their own.
+std::string textOf(Json const& entry) {
+    std::string const text = textIn(entry, "text");
+    std::string const kind = textIn(entry, "kind");
+    std::size_t const at = kind.empty() ? std::string::npos : text.find(kind);
+    return at == std::string::npos ? text : text.substr(at);
+}
+
 } // namespace
 
 std::int64_t newestEntry(Json const& answer) {
@@ -48,7 +56,8 @@ std::int64_t printJournal(View const& view, Json const& answer, std::int64_t las
                                             grave.paint);
         }
         std::size_t const used = kDate + (hasEvent ? kEvent : 0) + (hasSeverity ? kSeverity : 0);
-        view.out << cut(view.screen.clean(textIn(entry, "text")),
+        view.out << cut(view.screen.clean(hasSeverity && hasEvent ? textOf(entry)
+                                                                  : textIn(entry, "text")),
                         screenWidth - std::min(screenWidth, used), view.screen.mark())
                  << '\n';
     }

@@ -28,7 +28,9 @@ std::string print(std::string const& answer, Screen const& screen = {}) {
 TEST(JournalTest, EntriesAreLines) {
     EXPECT_EQ(print(samples::kJournal),
               "2026-11-22 17:00:00  agentStarted                 started\n"
-              "2026-11-22 17:19:00  alarmRaised   critical       the board has failed\n");
+              "2026-11-22 17:19:00  alarmRaised   critical       boardFailed on board Z70002: the "
+              "board has "
+              "failed\n");
 }
 
 TEST(JournalTest, EntriesAreCutToTheScreen) {

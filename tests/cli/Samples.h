@@ -62,6 +62,7 @@ inline std::string const kJournal = answer(
     R"("entries":[{"number":7,"date":"2026-11-22T17:00:00Z","event":"agentStarted","text":"started",)"
     R"("board":null,"severity":null},)"
     R"({"number":8,"date":"2026-11-22T17:19:00Z","event":"alarmRaised","severity":"critical",)"
-    R"("kind":"boardFailed","resource":"board Z70002","board":"Z70002","text":"the board has failed"}])");
+    R"("kind":"boardFailed","resource":"board Z70002","board":"Z70002",)"
+    R"("text":"alarm raised: critical boardFailed on board Z70002: the board has failed"}])");
 
 } // namespace samples
