@@ -102,7 +102,13 @@ class HttpServer::Listener {
     /// Does what the library can do now, and closes connections that take too long. Returns when
     /// to come back at the latest.
     Clock::time_point turn() {
-        MHD_run(m_daemon);
+        // A connection that ends makes room for one that waits, which the library notices only when
+        // it runs again.
+        std::size_t before = 0;
+        do {
+            before = m_connections.size();
+            MHD_run(m_daemon);
+        } while (m_connections.size() < before);
         auto const now = Clock::now();
         auto next = Clock::time_point::max();
         for (auto& [connection, known] : m_connections) {
