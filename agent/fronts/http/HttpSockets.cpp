@@ -87,7 +87,11 @@ void giveToGroup(std::string const& path, std::string const& group) {
     // Not thread-safe, but nothing else reads groups.
     // NOLINTNEXTLINE(concurrency-mt-unsafe)
     ::group const* const found = getgrnam(group.c_str());
-    if (found == nullptr || chown(path.c_str(), static_cast<uid_t>(-1), found->gr_gid) == 0) return;
+    if (found == nullptr) return;
+    // A service that runs as this group may not even ask for it.
+    struct stat file {};
+    if (stat(path.c_str(), &file) == 0 && file.st_gid == found->gr_gid) return;
+    if (chown(path.c_str(), static_cast<uid_t>(-1), found->gr_gid) == 0) return;
     log(LogLevel::Warning, "the socket " + path + " cannot be given to the group " + group + ": " +
                                std::strerror(errno) + "; only the agent's own user can use it");
 }
