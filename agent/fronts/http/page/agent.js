@@ -4,6 +4,7 @@
 const kPeriod = 1000; // milliseconds from one round of requests to the next
 const kHiddenPeriod = 15000; // the same while nobody sees the page
 const kPatience = 8000; // for an answer
+const kOfAll = new Set([401, 403, 429]); // statuses that do not depend on the address
 const kTokenName = "kvloam-token";
 
 /** An answer that is not the wanted one. */
@@ -27,6 +28,7 @@ export class Agent {
         this.failure = null; // what the last round met, when it failed as a whole
         this.needsToken = false;
         this.lastAnswer = null; // performance.now() of the last round that succeeded
+        this.lastTime = null; // the same by the browser's clock
         this.clock = null; // the agent's time of day at that time, in milliseconds
         this.timer = null;
         this.running = false;
@@ -91,6 +93,7 @@ export class Agent {
             this.failure = null;
             this.needsToken = false;
             this.lastAnswer = performance.now();
+            this.lastTime = new Date();
             this.changed(changes.includes(true));
         } catch (failure) {
             this.needsToken = failure.status === 401;
@@ -114,8 +117,8 @@ export class Agent {
             return true;
         }
         const message = body?.error?.message ?? `the agent answered with status ${status}`;
-        // A thing that has gone is an answer; a token that is missing, or a fault, concerns everything.
-        if (status !== 404) throw new Refusal(status, message);
+        // A thing that is not there concerns itself; a missing token or a fault concerns everything.
+        if (status < 400 || status >= 500 || kOfAll.has(status)) throw new Refusal(status, message);
         const isNew = kept?.error !== message;
         this.answers.set(address, { etag: null, body: null, error: message });
         return isNew;

@@ -13,6 +13,11 @@ const kList = "boards?fields=boardIndex,status,secondaryStatus,name,model,serial
 const kCellWidth = 150; // of a slot, in pixels, at least
 const kMostSlots = 64; // of a shelf that is drawn with the slots between its boards
 
+/** What the agent finds a board by. A serial number goes before an index of the same digits. */
+function nameOf(board) {
+    return board.serialNumber || String(board.boardIndex);
+}
+
 /** A board's name for people. */
 function title(board) {
     return board.model || board.name || `board ${board.boardIndex}`;
@@ -82,7 +87,7 @@ export class BoardsView {
             update: (element, row) => this.update(element, row),
             choose: (row, column) => {
                 const board = row.slots[column]?.board;
-                if (board) location.hash = `#/boards/${board.boardIndex}`;
+                if (board) location.hash = `#/boards/${encodeURIComponent(nameOf(board))}`;
             },
         });
         new ResizeObserver(() => this.measure()).observe(byId("chassis"));
@@ -92,7 +97,7 @@ export class BoardsView {
         return [kList, ...(this.chosen === null ? [] : [`boards/${encodeURIComponent(this.chosen)}`])];
     }
 
-    /** @param chosen the index or serial number of the board to show in detail */
+    /** @param chosen the serial number or index of the board to show in detail */
     choose(chosen) {
         this.chosen = chosen || null;
         return this.chosen === null ? null : byId("board-heading");
@@ -142,6 +147,7 @@ export class BoardsView {
             setText(serial, place.gone ? `was ${place.gone.serialNumber || title(place.gone)}` : "");
             showState(state, place.gone ? ["off", "○", "removed"] : ["off", "", ""]);
             setAttribute(cell, "aria-selected", null);
+            setAttribute(cell, "title", null);
             return;
         }
         const known = boardState(board);
@@ -149,12 +155,8 @@ export class BoardsView {
         setText(model, title(board));
         setText(serial, board.serialNumber);
         showState(state, known);
-        setAttribute(cell, "aria-selected", String(this.isChosen(board)));
+        setAttribute(cell, "aria-selected", String(nameOf(board) === this.chosen));
         setAttribute(cell, "title", board.errorMessage || null);
-    }
-
-    isChosen(board) {
-        return this.chosen !== null && (String(board.boardIndex) === this.chosen || board.serialNumber === this.chosen);
     }
 
     /** Boards that were in slots which have none now. */
@@ -191,7 +193,7 @@ export class BoardsView {
         const body = this.agent.body(address);
         const refusal = this.agent.error(address);
         setHidden(byId("board-gone"), refusal === null);
-        setText(byId("board-gone"), refusal === null ? "" : `The board is not there (${refusal}).`);
+        setText(byId("board-gone"), refusal === null ? "" : `The agent says: ${refusal}.`);
         setHidden(byId("board-terms"), !body);
         if (!body) {
             setText(byId("board-heading"), `Board ${this.chosen}`);

@@ -77,7 +77,7 @@ export class ChannelsView {
         const known = this.agent.body(kList)?.lines.find((line) => String(line.ifIndex) === this.chosen);
         const line = known?.name ?? this.chosen;
         setText(byId("slots-heading"),
-            refusal === null ? `Channels of line ${line}` : `The line is not there (${refusal})`);
+            refusal === null ? `Channels of line ${line}` : `The agent says: ${refusal}`);
         setHidden(byId("no-slots"), body === null || channels.length > 0);
         patchList(byId("slot-list"), channels, (channel) => channel.ifIndex,
             () => {

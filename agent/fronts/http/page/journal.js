@@ -4,6 +4,7 @@
 import { byId, make, setText, setTime, shown, words } from "/page/dom.js";
 import { Rows } from "/page/rows.js";
 import { makeState, severityState, showState } from "/page/states.js";
+import { subjectOf } from "/page/summary.js";
 
 const kLimit = 1000; // entries in one answer
 const kMost = 20000; // entries kept
@@ -55,8 +56,8 @@ export class JournalView {
                 setText(number, `no. ${shown(entry.number)}`);
             },
             choose: (entry) => {
-                if (entry.ifIndex !== null && entry.line) location.hash = `#/lines/${entry.ifIndex}`;
-                else if (entry.board) location.hash = `#/boards/${encodeURIComponent(entry.board)}`;
+                const subject = subjectOf(entry);
+                if (subject) location.hash = subject;
             },
         });
         byId("journal-filter").addEventListener("input", () => this.show());

@@ -71,7 +71,7 @@ export class LineDetails {
         const line = this.agent.body(this.address())?.line ?? null;
         const refusal = this.agent.error(this.address());
         setHidden(byId("line-gone"), refusal === null);
-        setText(byId("line-gone"), refusal === null ? "" : `The line is not there (${refusal}).`);
+        setText(byId("line-gone"), refusal === null ? "" : `The agent says: ${refusal}.`);
         setHidden(byId("line-known"), line === null);
         if (line === null) {
             if (refusal !== null || byId("line-heading").textContent === "")

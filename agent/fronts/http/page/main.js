@@ -89,8 +89,7 @@ function awayText(silence) {
     const reason = agent.failure instanceof Refusal
         ? `The agent refuses: ${agent.failure.message}.` : "The agent does not answer.";
     if (silence === null) return reason;
-    const since = new Date(Date.now() - silence * 1000).toTimeString().slice(0, 8);
-    return `${reason} What is shown is what it said last, at ${since}.`;
+    return `${reason} What is shown is what it said last, at ${agent.lastTime.toTimeString().slice(0, 8)}.`;
 }
 
 function startTheme() {

@@ -85,13 +85,8 @@ export class Rows {
     show() {
         if (this.box.clientHeight === 0) return; // of a view that is not shown
         const { first, end } = this.visible();
-        while (this.pool.length < end - first) {
-            const element = this.create();
-            element.classList.add("rows-row");
-            this.pool.push(element);
-            this.space.append(element);
-        }
         const hadFocus = this.space.contains(document.activeElement);
+        this.grow(end - first);
         // A row's element follows from its place, so that scrolling by one row changes one element.
         const used = new Set();
         for (let place = first; place < end; ++place) {
@@ -100,10 +95,30 @@ export class Rows {
             this.put(element, place);
         }
         for (const element of this.pool) setHidden(element, !used.has(element));
+        if (first < end) this.rotate(this.pool[first % this.pool.length]);
         const isSeen = this.current.row >= first && this.current.row < end;
         // While the current cell is out of sight, the list takes the focus in its place.
         setAttribute(this.box, "tabindex", isSeen ? "-1" : "0");
         if (hadFocus) this.keepFocus(isSeen);
+    }
+
+    grow(size) {
+        if (this.pool.length >= size) return;
+        while (this.pool.length < size) {
+            const element = this.create();
+            element.classList.add("rows-row");
+            this.pool.push(element);
+        }
+        this.space.append(...this.pool);
+    }
+
+    /** Brings the elements into the order of their rows, in which they are read out: `first` is the first one. */
+    rotate(first) {
+        const elements = [...this.space.children];
+        const place = elements.indexOf(first);
+        if (place === 0) return;
+        if (place <= elements.length / 2) this.space.append(...elements.slice(0, place));
+        else this.space.prepend(...elements.slice(place));
     }
 
     /** The focus stays with the current cell while rows move to other elements. */

@@ -16,8 +16,8 @@ export function inOrder(alarms) {
 /** The address of the view of what an alarm or a journal entry is about; null: the agent itself. */
 export function subjectOf(row) {
     if (row.ifIndex !== null && row.line) return `#/lines/${row.ifIndex}`;
-    if (row.boardIndex) return `#/boards/${row.boardIndex}`;
-    return null;
+    const board = row.board || row.boardIndex;
+    return board ? `#/boards/${encodeURIComponent(board)}` : null;
 }
 
 /** An `Alarms` is the list of active alarms. */

@@ -56,12 +56,22 @@ class BoardsTest(PageCase):
         self.tab.click("#board-lines li:nth-child(2) a")
         self.tab.wait_for_text("#line-heading", "trunk-12")
 
+    def test_of_which_one_s_serial_number_is_another_s_index_are_told_apart(self):
+        with self.agent.change():
+            self.agent.boards[0].update(serialNumber="3", board="3")
+        self.tab.wait_for_text("#chassis", "NX50003")
+        self.tab.run("[...document.querySelectorAll('#chassis [role=gridcell]')]"
+                     ".find((cell) => cell.innerText.includes('NX50003')).click()")
+        self.tab.wait_for_text("#board-heading", "NX50003")
+        slot = self.tab.run("document.querySelector('#chassis [aria-selected=true]').innerText.match(/Slot \\d+/)[0]")
+        self.assertEqual(slot, "Slot 3")
+
     def test_that_have_gone_while_they_are_shown_in_detail_are_said_to_have_gone(self):
         self.show("boards/3")
         self.tab.wait_for_text("#board-heading", "NX50003")
         with self.agent.change():
             del self.agent.boards[2]
-        self.tab.wait_for_text("#board-gone", "not there")
+        self.tab.wait_for_text("#board-gone", "there is no")
 
     expected_errors = ("status of 404",)  # the browser logs them all
 
@@ -189,7 +199,8 @@ class LinesTest(PageCase):
 
     def test_that_are_not_there_are_said_to_be_missing(self):
         self.show("lines/99999")
-        self.tab.wait_for_text("#line-gone", "not there")
+        self.tab.wait_for_text("#line-gone", "there is no")
+        self.tab.wait_for_text("#connection", "live")
 
 
 class OtherViewsTest(PageCase):

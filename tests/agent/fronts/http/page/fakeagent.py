@@ -230,25 +230,26 @@ class FakeAgent:
         if name == "boards" and not rest:
             return {"boards": [self.pick(one, query) for one in self.boards]}
         if name == "boards":
-            found = self.find(self.boards, rest[0], "boardIndex", "serialNumber")
+            found = self.find(self.boards, rest[0], "serialNumber", "boardIndex")
             return {"board": found, "devices": [], "processors": [],
                     "lines": [one for one in self.lines if one["boardIndex"] == found["boardIndex"]]}
         if name == "lines" and rest:
-            found = self.find(self.lines, rest[0], "ifIndex", "name")
+            found = self.find(self.lines, rest[0], "name", "ifIndex")
             return {"line": {**found, "intervals": self.intervals_of(found)}}
         if name == "lines":
             return {"lines": [self.pick(one, query) for one in self.lines if self.is_wanted(one, query)]}
         if name == "channels":
-            found = self.find(self.lines, query["line"], "ifIndex", "name")
+            found = self.find(self.lines, query["line"], "name", "ifIndex")
             return {"channels": [one for one in self.channels if one["lineIfIndex"] == found["ifIndex"]],
                     "signallingChannels": [], "dataLinks": []}
         raise Refused(404, "no such resource")
 
     @staticmethod
     def find(rows, name, *keys):
-        for row in rows:
-            if name in (str(row[key]) for key in keys):
-                return row
+        for key in keys:
+            for row in rows:
+                if str(row[key]) == name:
+                    return row
         raise Refused(404, f"there is no {name}")
 
     @staticmethod

@@ -214,6 +214,20 @@ class KeyboardTest(PageCase):
         self.tab.press("Enter")
         self.tab.wait_for_text("#line-heading", "trunk-12")
 
+    def test_rows_are_in_their_order_in_the_document_wherever_the_list_is(self):
+        self.show("lines")
+        self.tab.wait_for_text("#lines", "trunk-11")
+        for top in (0, 36, 700, 100000, 650, 0):
+            self.tab.run(f"document.querySelector('#lines').scrollTop = {top}")
+            self.tab.wait_for("new Promise((resolve) => requestAnimationFrame(() => setTimeout(resolve, 0, true)))")
+            places = self.tab.run("""[...document.querySelectorAll("#lines .rows-row:not([hidden])")]
+                .map((row) => Number(row.getAttribute("aria-rowindex")))""")
+            self.assertEqual(places, list(range(places[0], places[0] + len(places))), top)
+        self.tab.run("document.querySelector('#lines [tabindex=\"0\"]').focus()")
+        for _ in range(40):
+            self.tab.press("ArrowDown")
+        self.assertEqual(self.tab.focus(), "trunk-111")
+
     def test_keeps_the_focus_with_its_row_while_rows_go(self):
         self.show("lines")
         self.tab.wait_for_text("#lines", "trunk-11")
