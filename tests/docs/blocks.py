@@ -2,7 +2,7 @@
 """The code blocks of a document, and the comparison of what they show with what came.
 
 A block that begins with ```sh holds commands, one with ```console commands after "$ " and what each
-prints. A comment on the line before the block may say more, several things separated by ";":
+prints. A comment on the line before the block may say more, separated by ";":
 
   <!-- not run: REASON -->        a test cannot run it; the reason is printed
   <!-- file: PATH -->             the block is the contents of this file: it is written there
@@ -23,8 +23,8 @@ text in a line, a line of its own "..." for any number of lines.
 import dataclasses
 import re
 
-DIRECTIVES = ("not run", "not compiled", "file", "checked by", "printed by", "printed in", "terminal", "stays", "fails", "from",
-              "commands in the table")
+DIRECTIVES = ("not run", "not compiled", "file", "checked by", "printed by", "printed in",
+              "commands in the table", "terminal", "stays", "fails", "from")
 COMMAND_LANGUAGES = ("sh", "console")
 MASKS = [
     (r"Timeticks: \(\d+\) (\d+ days?, )?[\d:.]+", "<ticks>"),
@@ -51,14 +51,14 @@ class Command:
 
 
 def directives_of(comment):
-    """What a comment before a block says; nothing if it is a comment of another kind."""
+    """What a comment before a block says."""
     found = {}
     whole = comment.startswith(("not run", "not compiled", "checked by", "printed by"))
     for part in [comment] if whole else comment.split(";"):
         part = part.strip()
         name = next((d for d in DIRECTIVES if re.match(d + r"\b", part)), None)
         if name is None:
-            return {}
+            return {"unknown": comment}
         found[name] = part[len(name):].lstrip(":").strip()
     return found
 
@@ -87,6 +87,7 @@ def blocks_of(text):
             text = "".join(cell[1].replace("\\|", "|") + "\n" for cell in cells if cell)
             blocks.append(Block(start + 2, "sh", text, {}))
             directives = {}
+            continue
         else:
             comment = re.match(r" *<!-- (.*) -->$", line)
             directives = directives_of(comment[1]) if comment else {}
@@ -99,24 +100,22 @@ def open_ended(text):
     if text.endswith("\\"):
         return True
     here = re.findall(r"<<-?\s*['\"]?(\w+)", text)
-    if here and text.splitlines()[-1].strip() != here[-1]:
-        return True
-    # Quotes that are still open; a "#" after a blank begins a comment.
-    quote = ""
-    for line in ([text] if here == [] else []):
-        at = 0
-        while at < len(line):
-            letter = line[at]
-            if quote:
-                quote = "" if letter == quote else quote
-            elif letter in "'\"":
-                quote = letter
-            elif letter == "\\":
-                at += 1
-            elif letter == "#" and (at == 0 or line[at - 1] in " \n"):
-                newline = line.find("\n", at)
-                at = len(line) if newline < 0 else newline
+    if here:
+        return text.splitlines()[-1].strip() != here[-1]
+    # Quotes that are still open. A "#" after a blank begins a comment.
+    quote, at = "", 0
+    while at < len(text):
+        letter = text[at]
+        if quote:
+            quote = "" if letter == quote else quote
+        elif letter in "'\"":
+            quote = letter
+        elif letter == "\\":
             at += 1
+        elif letter == "#" and (at == 0 or text[at - 1] in " \n"):
+            newline = text.find("\n", at)
+            at = len(text) if newline < 0 else newline
+        at += 1
     return quote != ""
 
 
