@@ -21,14 +21,6 @@ constexpr char kJson[] = "application/json";
 constexpr char kPagePolicy[] =
     "default-src 'self'; base-uri 'none'; form-action 'none'; frame-ancestors 'none'";
 
-HttpAnswer faultAnswer(int status, std::string_view message) {
-    JsonWriter json;
-    json.beginObject().key("error").beginObject();
-    json.key("status").number(std::int64_t{status}).key("message").text(message);
-    json.endObject().endObject();
-    return {status, kJson, std::make_shared<std::string const>(json.take()), {}};
-}
-
 bool isBlank(char character) {
     return character == ' ' || character == '\t';
 }
@@ -227,6 +219,14 @@ void HttpAnswers::keep(std::string_view target, std::shared_ptr<std::string cons
 std::string HttpAnswers::etag(std::string const& more) const {
     return '"' + std::to_string(m_moment->number) + more + '.' + std::to_string(m_moments) + '.' +
            m_run + '"';
+}
+
+HttpAnswer faultAnswer(int status, std::string_view message) {
+    JsonWriter json;
+    json.beginObject().key("error").beginObject();
+    json.key("status").number(std::int64_t{status}).key("message").text(message);
+    json.endObject().endObject();
+    return {status, kJson, std::make_shared<std::string const>(json.take()), {}};
 }
 
 bool isOwnHost(std::string_view host, std::string_view ownName) {

@@ -99,6 +99,9 @@ class HttpAnswers {
     std::string m_token;
 };
 
+/// An answer that says what is wrong.
+HttpAnswer faultAnswer(int status, std::string_view message);
+
 /// Whether a Host field names this host in a way that no other site can: by an address or
 /// "localhost", or by `ownName`, with or without a port.
 bool isOwnHost(std::string_view host, std::string_view ownName);

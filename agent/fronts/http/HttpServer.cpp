@@ -47,13 +47,28 @@ std::optional<std::string_view> field(MHD_Connection* connection, char const* na
     return value == nullptr ? std::nullopt : std::optional<std::string_view>(value);
 }
 
-using Body = std::shared_ptr<std::string const>;
+/// A `HeldBody` is the body of an answer that is being sent, and counts its octets meanwhile.
+class HeldBody {
+  public:
+    HeldBody(std::shared_ptr<std::string const> body, std::size_t& octets)
+        : m_body(std::move(body)), m_octets(octets) {
+        m_octets += m_body->size();
+    }
+    ~HeldBody() { m_octets -= m_body->size(); }
+    HeldBody(HeldBody const&) = delete;
+    HeldBody& operator=(HeldBody const&) = delete;
 
-MHD_Result queue(MHD_Connection* connection, HttpAnswer const& answer) {
-    auto kept = std::make_unique<Body>(answer.body);
+  private:
+    std::shared_ptr<std::string const> m_body;
+    std::size_t& m_octets;
+};
+
+/// Queues the answer. `octets`: those of all bodies that are being sent.
+MHD_Result queue(MHD_Connection* connection, HttpAnswer const& answer, std::size_t& octets) {
+    auto kept = std::make_unique<HeldBody>(answer.body, octets);
     auto* const response = MHD_create_response_from_buffer_with_free_callback_cls(
         answer.body->size(), const_cast<char*>(answer.body->data()),
-        [](void* body) { delete static_cast<Body*>(body); }, kept.get());
+        [](void* body) { delete static_cast<HeldBody*>(body); }, kept.get());
     if (response == nullptr) return MHD_NO;
     (void)kept.release(); // the response's
     auto const add = [&](char const* name, std::string const& value) {
@@ -168,13 +183,18 @@ class HttpServer::Listener {
             auto& self = *static_cast<Listener*>(closure);
             std::size_t headerOctets = 0;
             MHD_get_connection_values(connection, MHD_HEADER_KIND, addOctets, &headerOctets);
-            return queue(connection,
-                         self.m_answers.answer({method, request->target,
-                                                field(connection, MHD_HTTP_HEADER_HOST),
-                                                field(connection, MHD_HTTP_HEADER_AUTHORIZATION),
-                                                field(connection, MHD_HTTP_HEADER_IF_NONE_MATCH),
-                                                field(connection, MHD_HTTP_HEADER_ACCEPT),
-                                                headerOctets, self.m_isLocal}));
+            HttpRequest const asked{method,
+                                    request->target,
+                                    field(connection, MHD_HTTP_HEADER_HOST),
+                                    field(connection, MHD_HTTP_HEADER_AUTHORIZATION),
+                                    field(connection, MHD_HTTP_HEADER_IF_NONE_MATCH),
+                                    field(connection, MHD_HTTP_HEADER_ACCEPT),
+                                    headerOctets,
+                                    self.m_isLocal};
+            HttpAnswer answer = self.m_answers.answer(asked);
+            if (self.m_octets + answer.body->size() > self.m_limits.octets)
+                answer = faultAnswer(503, "clients do not read their answers; ask again later");
+            return queue(connection, answer, self.m_octets);
         } catch (...) {
             return MHD_NO; // closes the connection
         }
@@ -209,6 +229,7 @@ class HttpServer::Listener {
     HttpLimits m_limits;
     bool m_isLocal;
     std::map<MHD_Connection*, Known> m_connections;
+    std::size_t m_octets = 0; ///< of the bodies that are being sent
     MHD_Daemon* m_daemon = nullptr;
 };
 

@@ -21,6 +21,8 @@ struct HttpLimits {
     /// A connection on which a request and its answer take longer, or which waits longer for the
     /// next request, is closed.
     std::chrono::milliseconds patience{30000};
+    /// All answers of a socket that clients have not read yet; another one is then refused.
+    std::size_t octets = std::size_t{256} << 20U;
 };
 
 /// An `HttpServer` answers the requests that arrive at its sockets, on a thread of its own. The

@@ -138,6 +138,30 @@ TEST_F(HttpServerTest, ClientThatDoesNotReadIsCut) {
     EXPECT_EQ(idle.read().status, 0);
 }
 
+TEST_F(HttpServerTest, AnswersThatNobodyReadsAreLimited) {
+    auto snapshot = std::make_shared<Snapshot>();
+    snapshot->boards.resize(10000);
+    m_snapshot = snapshot;
+    start({.patience = std::chrono::hours(1), .octets = 1U << 20U});
+    EXPECT_EQ(HttpClient(path()).ask(kBoards).status, 503);
+    EXPECT_EQ(HttpClient(path()).ask("/api/v1/health").status, 200);
+    EXPECT_EQ(HttpClient(path()).ask(kBoards, {}, "HEAD").status, 503);
+}
+
+TEST_F(HttpServerTest, AnswersThatWereReadCountNoMore) {
+    auto snapshot = std::make_shared<Snapshot>();
+    snapshot->boards.resize(1000);
+    m_snapshot = snapshot;
+    start();
+    std::size_t const size = HttpClient(path()).ask(kBoards).body.size();
+    m_server.reset();
+    m_sockets.clear();
+    start({.octets = size + size / 2});
+    HttpClient client(path());
+    for (int i = 0; i < 10; ++i)
+        EXPECT_EQ(client.ask(kBoards).status, 200);
+}
+
 TEST_F(HttpServerTest, ConnectionThatAsksAgainInTimeStays) {
     start({.patience = std::chrono::seconds(20)});
     HttpClient client(path());
