@@ -195,7 +195,7 @@ HttpAnswer HttpAnswers::metrics(Target const& target, std::string_view accept) {
     auto const snapshot = takeSnapshot();
     return {200,
             contentType(options.format),
-            m_metrics.text(snapshot, m_served.counters, &m_moment->settings, options),
+            m_metrics.text({*snapshot, m_served.counters, &m_moment->settings}, options),
             {},
             {{"Vary", "Accept"}}};
 }

@@ -337,12 +337,10 @@ MetricFormat metricFormat(std::string_view accept) {
                : MetricFormat::OpenMetrics;
 }
 
-MetricsCache::Text MetricsCache::text(std::shared_ptr<Snapshot const> const& snapshot,
-                                      Counters const& counters, Settings const* settings,
-                                      MetricOptions const& options) {
+MetricsCache::Text MetricsCache::text(Facts const& facts, MetricOptions const& options) {
     using namespace std::chrono;
-    if (snapshot != m_snapshot) {
-        m_snapshot = snapshot;
+    if (facts.snapshot.number != m_number) {
+        m_number = facts.snapshot.number;
         m_texts.clear();
     }
     Key const key{options.format, options.channels};
@@ -352,13 +350,14 @@ MetricsCache::Text MetricsCache::text(std::shared_ptr<Snapshot const> const& sna
     auto const now = system_clock::now().time_since_epoch();
     moment.now = duration_cast<milliseconds>(now).count();
     // The two clocks are read one after the other: dates must not swing by that.
-    auto const started = duration_cast<seconds>(now - (Clock::now() - counters.started)).count();
+    auto const started =
+        duration_cast<seconds>(now - (Clock::now() - facts.counters.started)).count();
     if (started < m_started - 1 || started > m_started + 1) m_started = started;
     moment.started = m_started;
     moment.process = readProcessUsage();
     std::size_t& size = m_sizes[key];
-    text = std::make_shared<std::string const>(
-        metricsText({*snapshot, counters, settings}, moment, options, size + size / 16));
+    text =
+        std::make_shared<std::string const>(metricsText(facts, moment, options, size + size / 16));
     size = text->size();
     return text;
 }

@@ -43,13 +43,12 @@ class MetricsCache {
   public:
     using Text = std::shared_ptr<std::string const>;
 
-    Text text(std::shared_ptr<Snapshot const> const& snapshot, Counters const& counters,
-              Settings const* settings, MetricOptions const& options);
+    Text text(Facts const& facts, MetricOptions const& options);
 
   private:
     using Key = std::pair<MetricFormat, bool>;
 
-    std::shared_ptr<Snapshot const> m_snapshot; ///< which the texts show
+    std::uint32_t m_number = 0; ///< of the snapshot that the texts show, if there are any
     std::map<Key, Text> m_texts;
     std::map<Key, std::size_t> m_sizes; ///< of the last texts
     std::int64_t m_started = 0;         ///< the agent's start, as `MetricMoment::started`

@@ -252,11 +252,13 @@ TEST_F(MetricsTest, FormatFollowsTheRequest) {
 
 TEST_F(MetricsTest, SnapshotIsWrittenOnceInEachForm) {
     MetricsCache cache;
-    auto const first = cache.text(m_snapshot, m_counters, nullptr, {});
-    EXPECT_EQ(cache.text(m_snapshot, m_counters, nullptr, {}), first);
-    EXPECT_NE(cache.text(m_snapshot, m_counters, nullptr, {MetricFormat::OpenMetrics, false}),
-              first);
-    EXPECT_NE(cache.text(sampleBoards({1, 1, 0}), m_counters, nullptr, {}), first);
+    Facts const facts{*m_snapshot, m_counters};
+    auto const first = cache.text(facts, {});
+    EXPECT_EQ(cache.text(facts, {}), first);
+    EXPECT_NE(cache.text(facts, {MetricFormat::OpenMetrics, false}), first);
+    EXPECT_EQ(cache.text(facts, {}), first);
+    ++m_snapshot->number;
+    EXPECT_NE(cache.text(facts, {}), first);
     EXPECT_THAT(*first, HasSubstr("\nprocess_resident_memory_bytes "));
     EXPECT_THAT(*first, HasSubstr("\nprocess_open_fds "));
 }
