@@ -284,15 +284,16 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front, H
     everyTable.insert(everyTable.end(), allStandardTables.begin(), allStandardTables.end());
     StaleSnapshot staleForHttp(alarmTables);
     Journal const& journal = boards.alarmReport.journal();
-    http.serve({{std::move(everyTable), {scalars(), standardScalars()}},
-                boards.counters,
-                boards.settings,
-                [&] { return staleForHttp.of(collector.snapshot(), Clock::now()); },
-                [&](JournalQuery const& query) {
-                    return query.after ? journal.entriesAfter(*query.after, query.limit)
-                                       : journal.newestEntries(query.limit);
-                },
-                [&] { return journal.newest(); }});
+    HttpScope const httpScope(
+        http, {{std::move(everyTable), {scalars(), standardScalars()}},
+               boards.counters,
+               boards.settings,
+               [&] { return staleForHttp.of(collector.snapshot(), Clock::now()); },
+               [&](JournalQuery const& query) {
+                   return query.after ? journal.entriesAfter(*query.after, query.limit)
+                                      : journal.newestEntries(query.limit);
+               },
+               [&] { return journal.newest(); }});
     Notifier notifier(boards.queue, front.notifications(), [&](Notification& notification) {
         auto const snapshot = collector.newest();
         nameSubject(notification, trees, {*snapshot, boards.counters, &boards.settings});
