@@ -257,11 +257,11 @@ class AccessibilityTest(PageCase):
             agent.journal = [fake.entry(1, "alarmRaised", "raised", severity="minor"),
                              fake.entry(2, "alarmCleared", "cleared"),
                              fake.entry(3, "agentStarted", "started"), fake.entry(4, "setting", "set")]
-        for scheme in ("light", "dark"):
-            self.tab.scheme(scheme)
-            for view in ("boards", "boards/1", "lines", "lines/1011", "channels", "channels/1011", "journal", "health"):
-                self.show(view)
-                self.wait_for_rounds(2)
+        for view in ("boards", "boards/1", "lines", "lines/1011", "channels", "channels/1011", "journal", "health"):
+            self.show(view)
+            self.wait_for_rounds(2)
+            for scheme in ("light", "dark"):
+                self.tab.scheme(scheme)
                 self.assertEqual(accessibility.faults(self.tab), [], f"{view}, {scheme}")
 
     def test_of_an_agent_that_is_away_has_no_faults(self):
