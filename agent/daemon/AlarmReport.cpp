@@ -5,6 +5,7 @@
 #include <string>
 #include <variant>
 
+#include "agent/alarms/TypeLimits.h"
 #include "agent/log/Log.h"
 
 namespace kvloamd {
@@ -52,8 +53,18 @@ std::string textOf(AlarmEvent event, Alarm const& alarm, AlarmKindInfo const& ki
     return text;
 }
 
+/// "kvlThresholdES15m" for the setting of that limit; empty for any other setting.
+std::string thresholdColumn(Setting setting) {
+    for (std::size_t threshold = 0; threshold < kThresholds; ++threshold)
+        if (thresholdSetting(threshold) == setting)
+            return "kvlT" + std::string(alarmKind(thresholdKind(threshold)).name).substr(1);
+    return {};
+}
+
 std::string textOf(SettingKey const& key) {
     std::string const index = std::to_string(key.index);
+    if (std::string const column = thresholdColumn(key.setting); !column.empty())
+        return column + "." + index;
     switch (key.setting) {
     case Setting::LineStatusChangeTraps:
         return "dsx1LineStatusChangeTrapEnable." + index;

@@ -14,6 +14,7 @@
 #include "access/ExternalFaultEventAdaptor.h"
 #include "agent/alarms/AlarmEvents.h"
 #include "agent/alarms/AlarmSources.h"
+#include "agent/alarms/ThresholdWatch.h"
 #include "agent/daemon/AlarmReport.h"
 #include "agent/daemon/ConfigCheck.h"
 #include "agent/daemon/FrontChoice.h"
@@ -162,7 +163,8 @@ Deadline earliest(Deadline const& one, Deadline const& other) {
 
 /// Reads the options again and applies those that can change while the agent runs. The others need
 /// a restart.
-void reloadOptions(Options const& started, ReadOptions const& readAgain, Boards& boards) {
+void reloadOptions(Options const& started, ReadOptions const& readAgain, Boards& boards,
+                   ThresholdWatch& thresholds) {
     auto const read = readAgain();
     auto const* const options = std::get_if<Options>(&read);
     if (options == nullptr) {
@@ -171,13 +173,15 @@ void reloadOptions(Options const& started, ReadOptions const& readAgain, Boards&
     }
     setLogLevel(options->logLevel);
     boards.alarms.apply(options->alarmPolicies, Instant::now());
+    thresholds.configure(options->typeLimits);
     Options now = *options;
     now.logLevel = started.logLevel;
     now.alarmPolicies = started.alarmPolicies;
+    now.typeLimits = started.typeLimits;
     log(LogLevel::Info, now == started
                             ? "the configuration has been read again"
                             : "the configuration has been read again; changes other than the log "
-                              "level and alarms take effect at the next start");
+                              "level, alarms and thresholds take effect at the next start");
 }
 
 /// Reads the SNMP configuration again, of which a check has found `fault`.
@@ -233,6 +237,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front, H
     CallWatch calls(boards.settings, boards.queue, boards.counters);
     AlarmTables alarmTables(boards.alarms, options.enterprise, started);
     StaleSnapshot staleSnapshot(alarmTables);
+    ThresholdWatch thresholds(boards.alarms, boards.settings, options.typeLimits);
     Collector collector(
         [&](Snapshot& snapshot) {
             settingsWatch.update();
@@ -256,6 +261,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front, H
             applySettings(boards.settings, lines);
             links.update(snapshot.interfaces.interfaces, snapshot.begun);
             calls.update(snapshot.interfaces.bearers, snapshot.begun);
+            thresholds.update(snapshot, lines);
             boards.alarmEvents.update(snapshot);
             snapshot.alarms = alarmTables.rows();
             snapshot.entities = entities.read(snapshot);
@@ -311,7 +317,8 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front, H
         while (auto const signal = signals.next()) {
             if (*signal == Signal::Stop) return front.stop();
             notice.reloading();
-            reloadOptions(options, readAgain, boards);
+            reloadOptions(options, readAgain, boards, thresholds);
+            collector.renew();
             boards.alarmReport.note(JournalEvent::Configuration,
                                     "the configuration was read again");
             http.readTokenAgain();
@@ -335,6 +342,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front, H
                         earliest(notifier.send(collector.newest()->begun), notice.beat()));
     });
     ListeningScope listening(boards, [&] { collector.renew(); });
+    thresholds.start();
     start.end();
     log(LogLevel::Info, serving);
     notice.ready(serving);
