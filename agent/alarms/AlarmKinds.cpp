@@ -5,6 +5,8 @@
 #include <array>
 #include <stdexcept>
 
+#include "agent/rows/FaultRow.h"
+
 namespace kvloamd {
 
 namespace {
@@ -13,6 +15,13 @@ using enum AlarmKind;
 using enum AlarmSeverity;
 using enum AlarmScope;
 using std::chrono::seconds;
+
+/// Signalling channels may report what follows from a failure of their line before the line
+/// declares it, and recover after the line.
+constexpr seconds kChannelHold{5};
+/// A line declares its failure some seconds after the platform has reported the fault. A fault that
+/// no line shows stays listed for 30 s, because its end may have been lost.
+constexpr seconds kLineFaultHold{40};
 
 // A line's failure has lasted already when its status shows it, and ends 10 s after the defect, as
 // the rules for DS1 lines require; its hold times are therefore 0.
@@ -49,9 +58,9 @@ constexpr AlarmKindInfo kKinds[] = {
      "the line receives the alarm indication signal in its payload"},
     {LineDs2PerfThreshold, "dsx1Ds2PerfThreshold", Warning, seconds(0), seconds(0), Snapshot,
      "the DS2 has crossed a performance threshold"},
-    {ChannelInactive, "isdnLapdInactive", Minor, seconds(0), seconds(0), Snapshot,
+    {ChannelInactive, "isdnLapdInactive", Minor, kChannelHold, seconds(0), Snapshot,
      "layer 1 of the signalling channel is down"},
-    {ChannelLayer2Down, "isdnLapdLayer2Down", Major, seconds(0), seconds(0), Snapshot,
+    {ChannelLayer2Down, "isdnLapdLayer2Down", Major, kChannelHold, seconds(0), Snapshot,
      "layer 1 of the signalling channel is up, but layer 2 is not established"},
     {LinkDown, "linkDown", Major, seconds(0), seconds(0), Snapshot,
      "the interface is down although nobody switched it off"},
@@ -96,6 +105,11 @@ constexpr std::array<char const*, 7> kSeverities{"",      "cleared", "indetermin
 
 std::span<AlarmKindInfo const> alarmKinds() {
     return kKinds;
+}
+
+std::chrono::seconds defaultRaiseHold(AlarmKindInfo const& kind, std::uint32_t number) {
+    bool const ofLine = kind.kind == PlatformFault && faultKind(number) != kOtherFault;
+    return ofLine ? kLineFaultHold : kind.raiseHold;
 }
 
 AlarmKindInfo const& alarmKind(AlarmKind kind) {

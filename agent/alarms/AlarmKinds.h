@@ -79,6 +79,9 @@ struct AlarmKindInfo {
 
 /// All kinds, ascending by number.
 std::span<AlarmKindInfo const> alarmKinds();
+/// How long the raise hold of an alarm is by default. `number`: of the alarm; the fault value of a
+/// platform fault. A fault of a line waits for the line to declare its failure.
+std::chrono::seconds defaultRaiseHold(AlarmKindInfo const& kind, std::uint32_t number);
 AlarmKindInfo const& alarmKind(AlarmKind kind);
 /// The kind with this name; null when there is none.
 AlarmKindInfo const* findAlarmKind(std::string_view name);
