@@ -53,7 +53,7 @@ std::string AlarmPolicies::configure(std::string_view entry) {
     std::string_view number = name;
     AlarmKindInfo const* const kind = findAlarmKind(takeUntil(number, '.'));
     if (kind == nullptr)
-        return quoted(name) + " is no kind of alarm; see the list of kinds in docs/alarms.md";
+        return quoted(name) + " is no kind of alarm; see the list of kinds in docs/operating.md";
     std::optional<std::uint32_t> value;
     if (name.find('.') != std::string_view::npos) {
         constexpr std::uint32_t kHighestFault = 65535;
