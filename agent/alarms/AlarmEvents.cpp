@@ -58,7 +58,7 @@ void AlarmEvents::boardStatus(int boardIndex, Board& board, BoardStatusEnum stat
     if (m_note) m_note(text, name);
     log(status == BoardStatusFailed ? LogLevel::Warning : LogLevel::Info, text,
         {{"KVL_BOARD", name}, {"KVL_BOARD_STATUS", statusName(status)}});
-    Instant const now = Instant::now();
+    Instant const now = m_now();
     if (status == BoardStatusStopped || status == BoardStatusStarted || status == BoardStatusFailed)
         noteStop(index, status == BoardStatusStopped && ordered);
     std::vector<Condition> begun;
@@ -109,7 +109,7 @@ void AlarmEvents::fault(bool raised, int boardIndex, std::string const& serialNu
                       0,
                       text,
                       {}},
-                     Instant::now(), true);
+                     m_now(), true);
 }
 
 void AlarmEvents::lineStatus(std::uint32_t ifIndex, int status) {
@@ -121,7 +121,7 @@ void AlarmEvents::lineStatus(std::uint32_t ifIndex, int status) {
         line = found->second;
         found->second.status = status;
     }
-    Instant const now = Instant::now();
+    Instant const now = m_now();
     unsigned alarmBits = 0;
     std::vector<Condition> begun;
     std::vector<AlarmKey> ended;
@@ -147,7 +147,7 @@ void AlarmEvents::update(Snapshot const& snapshot) {
     m_list.compare(AlarmScope::Snapshot,
                    conditionsIn(snapshot, m_list.present(AlarmKind::BoardStopped),
                                 m_list.present(AlarmKind::BoardGone)),
-                   snapshot.begun, Instant::now());
+                   snapshot.begun, m_now());
 }
 
 void AlarmEvents::rememberLines(Snapshot const& snapshot) {
