@@ -58,40 +58,36 @@ void AlarmEvents::boardStatus(int boardIndex, Board& board, BoardStatusEnum stat
     if (m_note) m_note(text, name);
     log(status == BoardStatusFailed ? LogLevel::Warning : LogLevel::Info, text,
         {{"KVL_BOARD", name}, {"KVL_BOARD_STATUS", statusName(status)}});
-    Instant const now = m_now();
+    Instant const now = Instant::now();
     if (status == BoardStatusStopped || status == BoardStatusStarted || status == BoardStatusFailed)
         noteStop(index, status == BoardStatusStopped && ordered);
-    std::vector<Condition> begun;
-    std::vector<AlarmKey> ended;
-    auto const end = [&](AlarmKind kind) { ended.push_back(of(kind).key); };
     switch (status) {
     case BoardStatusFailed:
-        begun.push_back(of(AlarmKind::BoardFailed));
-        end(AlarmKind::BoardStopped);
+        m_list.begin(of(AlarmKind::BoardFailed), now);
+        m_list.end(of(AlarmKind::BoardStopped).key, now);
         break;
     case BoardStatusStopped:
-        if (!ordered) begun.push_back(of(AlarmKind::BoardStopped));
+        if (!ordered) m_list.begin(of(AlarmKind::BoardStopped), now);
         break;
     case BoardStatusRemoved:
-        end(AlarmKind::BoardFailed);
-        end(AlarmKind::BoardStopped);
+        m_list.end(of(AlarmKind::BoardFailed).key, now);
+        m_list.end(of(AlarmKind::BoardStopped).key, now);
         if (KnownBoard const last = known(index); !last.stoppedInOrder) {
             Condition gone = of(AlarmKind::BoardGone);
             gone.place = last.place;
-            begun.push_back(std::move(gone));
+            m_list.begin(gone, now);
         }
         break;
     case BoardStatusStarted:
-        end(AlarmKind::BoardFailed);
-        end(AlarmKind::BoardStopped);
+        m_list.end(of(AlarmKind::BoardFailed).key, now);
+        m_list.end(of(AlarmKind::BoardStopped).key, now);
         [[fallthrough]];
     case BoardStatusAdded:
-        end(AlarmKind::BoardGone);
+        m_list.end(of(AlarmKind::BoardGone).key, now);
         break;
     default:
         break;
     }
-    m_list.change(begun, ended, now);
 }
 
 void AlarmEvents::fault(bool raised, int boardIndex, std::string const& serialNumber,
@@ -109,7 +105,7 @@ void AlarmEvents::fault(bool raised, int boardIndex, std::string const& serialNu
                       0,
                       text,
                       {}},
-                     m_now(), true);
+                     Instant::now(), true);
 }
 
 void AlarmEvents::lineStatus(std::uint32_t ifIndex, int status) {
@@ -121,19 +117,16 @@ void AlarmEvents::lineStatus(std::uint32_t ifIndex, int status) {
         line = found->second;
         found->second.status = status;
     }
-    Instant const now = m_now();
+    Instant const now = Instant::now();
     unsigned alarmBits = 0;
-    std::vector<Condition> begun;
-    std::vector<AlarmKey> ended;
     for (LineAlarm const& alarm : lineAlarms()) {
         alarmBits |= alarm.bit;
         line->condition.key.kind = alarm.kind;
         if ((static_cast<unsigned>(status) & alarm.bit) != 0)
-            begun.push_back(line->condition);
+            m_list.begin(line->condition, now);
         else
-            ended.push_back(line->condition.key);
+            m_list.end(line->condition.key, now);
     }
-    m_list.change(begun, ended, now);
     // Alarms are logged by the list. Loopbacks, test codes and what the line sends are not.
     unsigned const others = ~(alarmBits | 1U);
     if (((static_cast<unsigned>(status) ^ static_cast<unsigned>(line->status)) & others) != 0)
@@ -147,7 +140,7 @@ void AlarmEvents::update(Snapshot const& snapshot) {
     m_list.compare(AlarmScope::Snapshot,
                    conditionsIn(snapshot, m_list.present(AlarmKind::BoardStopped),
                                 m_list.present(AlarmKind::BoardGone)),
-                   snapshot.begun, m_now());
+                   snapshot.begun, Instant::now());
 }
 
 void AlarmEvents::rememberLines(Snapshot const& snapshot) {

@@ -14,6 +14,8 @@
 #include "agent/alarms/AlarmList.h"
 #include "agent/alarms/AlarmSources.h"
 #include "agent/journal/Journal.h"
+#include "agent/journal/NotificationLog.h"
+#include "agent/notifications/Notification.h"
 #include "agent/rows/Counters.h"
 #include "agent/rows/Settings.h"
 
@@ -23,6 +25,9 @@ namespace kvloamd {
 /// other events. Thread-safe once the journal is open.
 class AlarmReport {
   public:
+    /// `enterprise`: the arc above KVL-OAM-MIB.
+    explicit AlarmReport(Oid enterprise = {}) : m_enterprise(std::move(enterprise)) {}
+
     /// Opens the journal in `directory`; without one, events are only numbered. Before any other
     /// operation. Returns the alarms that were active at the end of the last run.
     std::vector<Alarm> open(std::string const& directory);
@@ -31,14 +36,22 @@ class AlarmReport {
     void close(std::vector<Alarm> const& active);
 
     std::uint32_t report(AlarmEvent event, Alarm const& alarm);
+    /// Gives a notification its number, which it appends, and records it in the journal and the log
+    /// of notifications. `dropped`: it is not sent.
+    void record(Notification& notification, bool dropped);
     /// Records another event.
     void note(JournalEvent event, std::string const& text, std::string const& board = {});
 
     Journal::Counts counts() const { return m_journal->counts(); }
     /// To read from. Once the journal is open.
     Journal const& journal() const { return *m_journal; }
+    NotificationLog& notifications() { return m_notifications; }
 
   private:
+    void addNumber(JournalEntry& entry) const;
+
+    Oid const m_enterprise;
+    NotificationLog m_notifications{JournalLimits{}.age};
     std::unique_ptr<Journal> m_journal = std::make_unique<Journal>("");
 };
 

@@ -14,7 +14,6 @@
 #include "access/ExternalFaultEventAdaptor.h"
 #include "agent/alarms/AlarmEvents.h"
 #include "agent/alarms/AlarmSources.h"
-#include "agent/alarms/ThresholdWatch.h"
 #include "agent/daemon/AlarmReport.h"
 #include "agent/daemon/ConfigCheck.h"
 #include "agent/daemon/FrontChoice.h"
@@ -68,8 +67,13 @@ constexpr std::uint32_t kFirstEntity = 1;
 /// Everything that the library's threads may access until the process ends. Never destroyed.
 struct Boards {
     explicit Boards(Oid const& enterprise)
-        : listener(*manager.get(), source, queue, counters, enterprise),
+        : alarmReport(enterprise),
+          listener(*manager.get(), source, queue, counters, enterprise),
           faultListener(*manager.get(), faults, queue, enterprise) {
+        queue.observeDrops([this](Notification const& notification) {
+            Notification dropped = notification;
+            alarmReport.record(dropped, true);
+        });
         listener.observe([this](int index, Board& board, BoardStatusEnum status) {
             alarmEvents.boardStatus(index, board, status);
         });
@@ -163,8 +167,7 @@ Deadline earliest(Deadline const& one, Deadline const& other) {
 
 /// Reads the options again and applies those that can change while the agent runs. The others need
 /// a restart.
-void reloadOptions(Options const& started, ReadOptions const& readAgain, Boards& boards,
-                   ThresholdWatch& thresholds) {
+void reloadOptions(Options const& started, ReadOptions const& readAgain, Boards& boards) {
     auto const read = readAgain();
     auto const* const options = std::get_if<Options>(&read);
     if (options == nullptr) {
@@ -173,15 +176,13 @@ void reloadOptions(Options const& started, ReadOptions const& readAgain, Boards&
     }
     setLogLevel(options->logLevel);
     boards.alarms.apply(options->alarmPolicies, Instant::now());
-    thresholds.configure(options->typeLimits);
     Options now = *options;
     now.logLevel = started.logLevel;
     now.alarmPolicies = started.alarmPolicies;
-    now.typeLimits = started.typeLimits;
     log(LogLevel::Info, now == started
                             ? "the configuration has been read again"
                             : "the configuration has been read again; changes other than the log "
-                              "level, alarms and thresholds take effect at the next start");
+                              "level and alarms take effect at the next start");
 }
 
 /// Reads the SNMP configuration again, of which a check has found `fault`.
@@ -237,7 +238,6 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front, H
     CallWatch calls(boards.settings, boards.queue, boards.counters);
     AlarmTables alarmTables(boards.alarms, options.enterprise, started);
     StaleSnapshot staleSnapshot(alarmTables);
-    ThresholdWatch thresholds(boards.alarms, boards.settings, options.typeLimits);
     Collector collector(
         [&](Snapshot& snapshot) {
             settingsWatch.update();
@@ -261,9 +261,10 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front, H
             applySettings(boards.settings, lines);
             links.update(snapshot.interfaces.interfaces, snapshot.begun);
             calls.update(snapshot.interfaces.bearers, snapshot.begun);
-            thresholds.update(snapshot, lines);
             boards.alarmEvents.update(snapshot);
             snapshot.alarms = alarmTables.rows();
+            snapshot.notifications =
+                boards.alarmReport.notifications().rows(started, std::chrono::system_clock::now());
             snapshot.entities = entities.read(snapshot);
             noteWhereabouts(snapshot);
             if (!options.agentx.empty())
@@ -290,19 +291,20 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front, H
     everyTable.insert(everyTable.end(), allStandardTables.begin(), allStandardTables.end());
     StaleSnapshot staleForHttp(alarmTables);
     Journal const& journal = boards.alarmReport.journal();
-    HttpScope const httpScope(
-        http, {{std::move(everyTable), {scalars(), standardScalars()}},
-               boards.counters,
-               boards.settings,
-               [&] { return staleForHttp.of(collector.snapshot(), Clock::now()); },
-               [&](JournalQuery const& query) {
-                   return query.after ? journal.entriesAfter(*query.after, query.limit)
-                                      : journal.newestEntries(query.limit);
-               },
-               [&] { return journal.newest(); }});
+    http.serve({{std::move(everyTable), {scalars(), standardScalars()}},
+                boards.counters,
+                boards.settings,
+                [&] { return staleForHttp.of(collector.snapshot(), Clock::now()); },
+                [&](JournalQuery const& query) {
+                    return query.after ? journal.entriesAfter(*query.after, query.limit)
+                                       : journal.newestEntries(query.limit);
+                },
+                [&] { return journal.newest(); }});
     Notifier notifier(boards.queue, front.notifications(), [&](Notification& notification) {
         auto const snapshot = collector.newest();
         nameSubject(notification, trees, {*snapshot, boards.counters, &boards.settings});
+        boards.alarmReport.record(notification, false);
+        collector.renew(); // the snapshot shows the log of notifications
     });
     EntityNotices entityNotices(boards.queue);
     AlarmClock alarmClock(boards.alarms, boards.alarmReport, boards.counters,
@@ -317,8 +319,7 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front, H
         while (auto const signal = signals.next()) {
             if (*signal == Signal::Stop) return front.stop();
             notice.reloading();
-            reloadOptions(options, readAgain, boards, thresholds);
-            collector.renew();
+            reloadOptions(options, readAgain, boards);
             boards.alarmReport.note(JournalEvent::Configuration,
                                     "the configuration was read again");
             http.readTokenAgain();
@@ -338,11 +339,12 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front, H
         if (boards.settings.hasUnsaved()) collector.renew();
         auto const nextEntityNotice = entityNotices.update(collector.newest(), Clock::now());
         auto const nextAlarm = alarmClock.advance(*collector.newest(), Instant::now());
+        auto const nextNotification = notifier.send(collector.newest()->begun);
+        boards.counters.events = boards.alarmReport.counts().last;
         return earliest(earliest(nextEntityNotice, nextAlarm),
-                        earliest(notifier.send(collector.newest()->begun), notice.beat()));
+                        earliest(nextNotification, notice.beat()));
     });
     ListeningScope listening(boards, [&] { collector.renew(); });
-    thresholds.start();
     start.end();
     log(LogLevel::Info, serving);
     notice.ready(serving);
@@ -391,6 +393,8 @@ int runDaemon(Options const& options, ReadOptions const& readAgain) {
                                Instant::now());
         step = "opening the HTTP side";
         HttpSide http(options);
+        // The master announces its own start.
+        if (options.agentx.empty()) boards->queue.push(startNotification());
         step = "connecting to the board platform";
         if (!schedulerRuns() || !platformAnswers()) return kExitFailure;
         boards->counters.started = Clock::now();

@@ -19,12 +19,13 @@ struct StandardModule {
     Oid identity; ///< absolute
 };
 
-std::array<StandardModule, 8> const kModules{{{"IF-MIB", {1, 3, 6, 1, 2, 1, 31}},
+std::array<StandardModule, 9> const kModules{{{"IF-MIB", {1, 3, 6, 1, 2, 1, 31}},
                                               {"EtherLike-MIB", {1, 3, 6, 1, 2, 1, 35}},
                                               {"DS1-MIB", {1, 3, 6, 1, 2, 1, 10, 18}},
                                               {"DS0-MIB", {1, 3, 6, 1, 2, 1, 10, 81}},
                                               {"ISDN-MIB", {1, 3, 6, 1, 2, 1, 10, 20}},
                                               {"ENTITY-MIB", {1, 3, 6, 1, 2, 1, 47}},
+                                              {"NOTIFICATION-LOG-MIB", {1, 3, 6, 1, 2, 1, 92}},
                                               {"ALARM-MIB", {1, 3, 6, 1, 2, 1, 118}},
                                               {"ENTITY-STATE-MIB", {1, 3, 6, 1, 2, 1, 131}}}};
 

@@ -10,6 +10,7 @@
 #include <utility>
 
 #include "agent/journal/JournalReader.h"
+#include "agent/journal/NotificationLog.h"
 #include "agent/log/Log.h"
 
 namespace kvloamd {
@@ -70,6 +71,7 @@ void Journal::open() {
         m_next = std::max(m_next, numberByTime());
     }
     m_former = m_file->activeAlarms();
+    m_formerNotifications = m_file->notifications(NotificationLog::kCapacity);
     m_next = std::max(m_next, m_file->nextSequence());
     m_newest = m_file->newest();
     // Before a number is given.
@@ -114,7 +116,7 @@ void Journal::close(std::vector<Alarm> const& active) {
     m_file.reset();
 }
 
-void Journal::flush() {
+void Journal::flush() const {
     std::unique_lock lock(m_mutex);
     m_idle.wait(lock,
                 [this] { return m_closed || m_counts.failing || (m_queue.empty() && !m_writing); });

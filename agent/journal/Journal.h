@@ -12,6 +12,7 @@
 #include <optional>
 #include <string>
 #include <thread>
+#include <utility>
 #include <vector>
 
 #include "agent/journal/JournalFile.h"
@@ -27,7 +28,8 @@ namespace kvloamd {
 /// `<name>.damaged-<date>`, and begun anew. Thread-safe.
 class Journal {
   public:
-    static constexpr std::size_t kQueue = 16384;
+    /// Twice what a chassis reports that loses 4,000 lines at once, with their notifications.
+    static constexpr std::size_t kQueue = 65536;
     /// The pause before a write that has failed is tried again.
     static constexpr std::chrono::milliseconds kRetry{1000};
 
@@ -49,6 +51,12 @@ class Journal {
     /// The alarms that were active at the end of the last run.
     std::vector<Alarm> const& formerAlarms() const { return m_former; }
 
+    /// The newest notifications of earlier runs, the oldest first, at most
+    /// `NotificationLog::kCapacity`. To be taken once.
+    std::vector<JournalEntry> takeFormerNotifications() {
+        return std::exchange(m_formerNotifications, {});
+    }
+
     /// Gives the entry the next sequence number, which it returns, and queues it. After `close` it
     /// only gives numbers.
     std::uint32_t append(JournalEntry entry);
@@ -56,7 +64,7 @@ class Journal {
     /// retry.
     void close(std::vector<Alarm> const& active);
     /// Waits until everything that has been appended is written, or writing has failed.
-    void flush();
+    void flush() const;
 
     Counts counts() const;
 
@@ -84,12 +92,13 @@ class Journal {
     std::size_t const m_capacity;
     std::chrono::milliseconds const m_retry;
     std::vector<Alarm> m_former;
+    std::vector<JournalEntry> m_formerNotifications;
     std::atomic<std::uint32_t> m_newest{0}; ///< on disk
     std::unique_ptr<JournalFile> m_file;    ///< of the thread, once it runs; null: not open
 
     mutable std::mutex m_mutex; ///< guards what follows
     std::condition_variable m_wake;
-    std::condition_variable m_idle;
+    mutable std::condition_variable m_idle;
     std::deque<JournalEntry> m_queue;
     std::uint32_t m_next = 1;
     Counts m_counts;

@@ -8,6 +8,7 @@
 #include <string>
 
 #include "agent/alarms/Alarm.h"
+#include "agent/rows/NotificationLogRows.h"
 
 namespace kvloamd {
 
@@ -20,7 +21,8 @@ enum class JournalEvent : int {
     AlarmChanged = 5, ///< its severity
     BoardStatus = 6,
     Configuration = 7, ///< was read again
-    Setting = 8        ///< by SNMP
+    Setting = 8,       ///< by SNMP
+    Notification = 9   ///< was sent, or dropped
 };
 
 /// "alarmRaised" and so on; "event" for a number of a later version.
@@ -33,7 +35,8 @@ struct JournalEntry {
     std::string text; ///< one line, for people
     std::string board;
     std::uint32_t ifIndex = 0;
-    std::optional<Alarm> alarm; ///< of the three events of alarms
+    std::optional<Alarm> alarm;                     ///< of the three events of alarms
+    std::optional<LoggedNotification> notification; ///< of that event
 
     std::uint32_t sequence = 0; ///< set by the journal
 };

@@ -2,7 +2,9 @@
 #include "agent/journal/JournalFile.h"
 
 #include <algorithm>
+#include <charconv>
 #include <limits>
+#include <utility>
 
 namespace kvloamd {
 
@@ -25,6 +27,10 @@ constexpr char kCreate[] =
     "NULL,"
     " began INTEGER NOT NULL, raised INTEGER NOT NULL, times INTEGER NOT NULL,"
     " PRIMARY KEY (kind, board, number)) WITHOUT ROWID;"
+    // A variable of a notification; the one at position 0 is the notification itself.
+    "CREATE TABLE variable (sequence INTEGER NOT NULL, position INTEGER NOT NULL, name TEXT NOT "
+    "NULL,"
+    " type INTEGER NOT NULL, value NOT NULL, PRIMARY KEY (sequence, position)) WITHOUT ROWID;"
     "CREATE TABLE state (reserved INTEGER NOT NULL);"
     "INSERT INTO state VALUES (0);";
 static_assert(kApplicationId == 1266043500 && kVersion == 1);
@@ -34,6 +40,28 @@ constexpr std::size_t kPrunePause = 1000;
 
 std::int64_t milliseconds(Date date) {
     return std::chrono::duration_cast<std::chrono::milliseconds>(date.time_since_epoch()).count();
+}
+
+/// "1.3.6", and back.
+std::string textOf(Oid const& name) {
+    std::string text;
+    for (std::uint32_t const part : name)
+        text += (text.empty() ? "" : ".") + std::to_string(part);
+    return text;
+}
+
+Oid oidOf(std::string const& text) {
+    Oid name;
+    char const* at = text.data();
+    char const* const end = at + text.size();
+    while (at < end) {
+        std::uint32_t part = 0;
+        auto const [next, error] = std::from_chars(at, end, part);
+        if (error != std::errc()) break;
+        name.push_back(part);
+        at = next + 1;
+    }
+    return name;
 }
 
 Date dateOf(std::int64_t milliseconds) {
@@ -105,8 +133,14 @@ void JournalFile::reserve(std::uint32_t upTo) {
     m_reserved = upTo;
 }
 
+Statement& JournalFile::prepared(std::optional<Statement>& statement, char const* sql) {
+    if (!statement) statement.emplace(m_database, sql);
+    return *statement;
+}
+
 void JournalFile::insert(JournalEntry const& entry) {
-    Statement statement(m_database, "INSERT INTO entry VALUES (?, ?, ?, ?, ?, ?, ?, ?, ?)");
+    Statement& statement =
+        prepared(m_insert, "INSERT INTO entry VALUES (?, ?, ?, ?, ?, ?, ?, ?, ?)");
     statement.bind(1, std::int64_t{entry.sequence})
         .bind(2, milliseconds(entry.date))
         .bind(3, static_cast<std::int64_t>(entry.event))
@@ -118,6 +152,12 @@ void JournalFile::insert(JournalEntry const& entry) {
         .bind(8, std::int64_t{alarm == nullptr ? 0 : int(alarm->severity)})
         .bind(9, std::int64_t{alarm == nullptr ? 0 : alarm->count})
         .run();
+    if (entry.notification) {
+        insertVariable(entry.sequence, 0, {{}, VariableType::ObjectId, entry.notification->name});
+        int position = 0;
+        for (LoggedVariable const& variable : entry.notification->variables)
+            insertVariable(entry.sequence, ++position, variable);
+    }
     if (alarm == nullptr) return;
     if (entry.event == JournalEvent::AlarmCleared) return dropAlarm(alarm->condition.key);
     Alarm kept = *alarm;
@@ -125,9 +165,30 @@ void JournalFile::insert(JournalEntry const& entry) {
     keepAlarm(kept);
 }
 
+void JournalFile::insertVariable(std::uint32_t sequence, int position,
+                                 LoggedVariable const& variable) {
+    Statement& statement =
+        prepared(m_insertVariable, "INSERT INTO variable VALUES (?, ?, ?, ?, ?)");
+    std::string const name = textOf(variable.name);
+    statement.bind(1, std::int64_t{sequence})
+        .bind(2, std::int64_t{position})
+        .bind(3, name)
+        .bind(4, static_cast<std::int64_t>(variable.type));
+    std::string text;
+    if (auto const* const number = std::get_if<std::int64_t>(&variable.value)) {
+        statement.bind(5, *number);
+    } else if (auto const* const octets = std::get_if<std::string>(&variable.value)) {
+        statement.bindBlob(5, *octets);
+    } else {
+        text = textOf(std::get<Oid>(variable.value));
+        statement.bind(5, text);
+    }
+    statement.run();
+}
+
 void JournalFile::keepAlarm(Alarm const& alarm) {
-    Statement statement(
-        m_database, "INSERT OR REPLACE INTO alarm VALUES (?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?)");
+    Statement& statement = prepared(
+        m_keepAlarm, "INSERT OR REPLACE INTO alarm VALUES (?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?, ?)");
     Condition const& condition = alarm.condition;
     statement.bind(1, static_cast<std::int64_t>(condition.key.kind))
         .bind(2, condition.key.board)
@@ -146,8 +207,8 @@ void JournalFile::keepAlarm(Alarm const& alarm) {
 }
 
 void JournalFile::dropAlarm(AlarmKey const& key) {
-    Statement statement(m_database,
-                        "DELETE FROM alarm WHERE kind = ? AND board = ? AND number = ?");
+    Statement& statement =
+        prepared(m_dropAlarm, "DELETE FROM alarm WHERE kind = ? AND board = ? AND number = ?");
     statement.bind(1, static_cast<std::int64_t>(key.kind))
         .bind(2, key.board)
         .bind(3, std::int64_t{key.number})
@@ -161,6 +222,8 @@ void JournalFile::prune(Date now) {
     byNumber.bind(1, static_cast<std::int64_t>(m_limits.entries)).run();
     Statement byAge(m_database, "DELETE FROM entry WHERE date < ?");
     byAge.bind(1, milliseconds(now - m_limits.age)).run();
+    m_database.execute("DELETE FROM variable WHERE sequence < "
+                       "(SELECT ifnull(min(sequence), 4294967296) FROM entry)");
     m_unpruned = 0;
 }
 
@@ -188,6 +251,45 @@ std::vector<Alarm> JournalFile::activeAlarms() {
         alarms.push_back(std::move(alarm));
     }
     return alarms;
+}
+
+std::vector<JournalEntry> JournalFile::notifications(std::size_t most) {
+    Statement statement(
+        m_database,
+        "SELECT entry.sequence, date, text, name, type, value FROM entry JOIN variable USING "
+        "(sequence) WHERE sequence >= (SELECT ifnull(min(sequence), 0) FROM (SELECT sequence FROM "
+        "variable WHERE position = 0 ORDER BY sequence DESC LIMIT ?)) ORDER BY sequence, position");
+    statement.bind(1, static_cast<std::int64_t>(most));
+    std::vector<JournalEntry> all;
+    while (statement.step()) {
+        auto const sequence = static_cast<std::uint32_t>(statement.number(0));
+        if (all.empty() || all.back().sequence != sequence) {
+            JournalEntry entry;
+            entry.event = JournalEvent::Notification;
+            entry.sequence = sequence;
+            entry.date = dateOf(statement.number(1));
+            entry.text = statement.text(2);
+            entry.notification = {oidOf(statement.text(5)), {}};
+            all.push_back(std::move(entry));
+            continue;
+        }
+        LoggedVariable variable;
+        variable.name = oidOf(statement.text(3));
+        variable.type = static_cast<VariableType>(statement.number(4));
+        switch (variable.type) {
+        case VariableType::OctetString:
+            variable.value = statement.blob(5);
+            break;
+        case VariableType::ObjectId:
+            variable.value = oidOf(statement.text(5));
+            break;
+        default:
+            variable.value = statement.number(5);
+            break;
+        }
+        all.back().notification->variables.push_back(std::move(variable));
+    }
+    return all;
 }
 
 std::vector<JournalEntry> JournalFile::entries(std::size_t most) {

@@ -5,6 +5,7 @@
 #include <chrono>
 #include <cstddef>
 #include <cstdint>
+#include <optional>
 #include <span>
 #include <string>
 #include <vector>
@@ -43,18 +44,27 @@ class JournalFile {
     void close(std::vector<Alarm> const& active, std::uint32_t next);
 
     std::vector<Alarm> activeAlarms();
-    /// The newest entries, the oldest first; without their alarms.
+    /// The newest entries with notifications, the oldest first.
+    std::vector<JournalEntry> notifications(std::size_t most);
+    /// The newest entries, the oldest first; without their alarms and notifications.
     std::vector<JournalEntry> entries(std::size_t most);
 
   private:
-    void create();
     void reserve(std::uint32_t upTo);
     void insert(JournalEntry const& entry);
+    void insertVariable(std::uint32_t sequence, int position, LoggedVariable const& variable);
     void keepAlarm(Alarm const& alarm);
     void dropAlarm(AlarmKey const& key);
     void prune(std::chrono::system_clock::time_point now);
 
+    /// The statement, prepared when it is used for the first time.
+    Statement& prepared(std::optional<Statement>& statement, char const* sql);
+
     Database m_database;
+    std::optional<Statement> m_insert; ///< entries, as the next ones variables and alarms
+    std::optional<Statement> m_insertVariable;
+    std::optional<Statement> m_keepAlarm;
+    std::optional<Statement> m_dropAlarm;
     JournalLimits m_limits;
     std::uint32_t m_reserved = 0;
     std::size_t m_unpruned = 0; ///< entries since the last pruning

@@ -59,6 +59,8 @@ char const* journalEventName(JournalEvent event) {
         return "configuration";
     case JournalEvent::Setting:
         return "setting";
+    case JournalEvent::Notification:
+        return "notification";
     }
     return "event";
 }

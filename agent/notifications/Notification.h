@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "agent/objects/Value.h"
+#include "agent/rows/NotificationLogRows.h"
 #include "agent/rows/Snapshot.h"
 
 namespace kvloamd {
@@ -46,10 +47,26 @@ struct Notification {
     std::optional<std::uint32_t> sysUpTime = std::nullopt;
 };
 
+/// The notification that the agent has started.
+Notification startNotification();
+
+/// The name of kvlEventNumber's instance. `enterprise`: the arc above KVL-OAM-MIB.
+Oid eventNumberName(Oid const& enterprise);
+
+/// What the log of notifications keeps of one.
+LoggedNotification logged(Notification const& notification);
+
+/// The name of a notification in its MIB module, or its numbers if it is not one of the agent's.
+std::string notificationName(Oid const& enterprise, Oid const& name);
+
 /// What became of a notification that was handed over.
 enum class Delivery {
-    Sent,   ///< to every receiver
-    Dropped ///< at least one receiver does not get it
+    Sent,    ///< to every receiver
+    Dropped, ///< at least one receiver does not get it
+    Awaited, ///< it was sent to every receiver, of whom some have yet to acknowledge it
+    // What becomes of one that is awaited.
+    Acknowledged,  ///< by all who should
+    Unacknowledged ///< at least one has not, however often it was asked
 };
 
 /// Makes a kvlBoardStatusChange. `enterprise`: the arc above KVL-OAM-MIB.

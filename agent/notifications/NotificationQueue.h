@@ -4,6 +4,7 @@
 
 #include <cstddef>
 #include <deque>
+#include <functional>
 #include <mutex>
 #include <optional>
 #include <utility>
@@ -13,7 +14,7 @@
 namespace kvloamd {
 
 /// A `NotificationQueue` is a bounded first-in, first-out queue. When it is full, new notifications
-/// are dropped. It counts the notifications that wait, were sent, or were dropped. Thread-safe.
+/// are dropped. It counts the notifications that wait, and what became of the others. Thread-safe.
 class NotificationQueue {
   public:
     static constexpr std::size_t kCapacity = 4096;
@@ -22,13 +23,21 @@ class NotificationQueue {
     explicit NotificationQueue(Counters& counters, std::size_t capacity = kCapacity)
         : m_counters(counters), m_capacity(capacity) {}
 
+    using Observer = std::function<void(Notification const&)>;
+    /// Calls `dropped` with every notification that finds the queue full, on the thread that pushes
+    /// it. Before the first one is pushed.
+    void observeDrops(Observer dropped) { m_dropped = std::move(dropped); }
+
     void push(Notification notification) {
-        std::scoped_lock const guard(m_mutex);
-        if (m_notifications.size() < m_capacity)
-            m_notifications.push_back(std::move(notification));
-        else
+        {
+            std::scoped_lock const guard(m_mutex);
+            bool const hasRoom = m_notifications.size() < m_capacity;
+            if (hasRoom) m_notifications.push_back(std::move(notification));
+            countWaiting();
+            if (hasRoom) return;
             ++m_counters.notificationsDropped;
-        countWaiting();
+        }
+        if (m_dropped) m_dropped(notification);
     }
 
     /// The oldest notification, which stays in the queue; nothing when the queue is empty.
@@ -45,11 +54,13 @@ class NotificationQueue {
         if (m_notifications.empty()) return std::nullopt;
         Notification notification = std::move(m_notifications.front());
         m_notifications.pop_front();
-        ++(delivery == Delivery::Sent ? m_counters.notificationsSent
-                                      : m_counters.notificationsDropped);
+        count(delivery);
         countWaiting();
         return notification;
     }
+
+    /// Counts what became of a notification that was awaited when it left the queue.
+    void settle(Delivery delivery) { count(delivery); }
 
     std::size_t size() {
         std::scoped_lock const guard(m_mutex);
@@ -57,12 +68,29 @@ class NotificationQueue {
     }
 
   private:
+    void count(Delivery delivery) {
+        switch (delivery) {
+        case Delivery::Sent:
+        case Delivery::Acknowledged:
+            ++m_counters.notificationsSent;
+            break;
+        case Delivery::Dropped:
+            ++m_counters.notificationsDropped;
+            break;
+        case Delivery::Unacknowledged:
+            ++m_counters.notificationsUnacknowledged;
+            break;
+        case Delivery::Awaited:
+            break;
+        }
+    }
     void countWaiting() {
         m_counters.notificationsWaiting = static_cast<std::uint32_t>(m_notifications.size());
     }
 
     Counters& m_counters;
     std::size_t m_capacity;
+    Observer m_dropped; ///< may be empty
     std::mutex m_mutex;
     std::deque<Notification> m_notifications;
 };

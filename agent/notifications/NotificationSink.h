@@ -18,8 +18,9 @@ class NotificationSink {
     /// Whether `send` may be called now.
     virtual bool ready() const = 0;
     /// Sends a notification. Calls `delivered`, during this call or later, when the notification
-    /// has been handed over, or given up, and is not to be sent again. If the connection is lost
-    /// before, `delivered` is never called, and the caller sends the notification again.
+    /// has been handed over, or given up, and is not to be sent again; if it is awaited then, calls
+    /// it once more, later. If the connection is lost before, `delivered` is never called, and the
+    /// caller sends the notification again.
     virtual void send(Notification const& notification, Delivered delivered) = 0;
 };
 

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/notifications/Notifier.h"
 
+#include <utility>
+
 namespace kvloamd {
 
 std::optional<Clock::time_point> Notifier::send(Clock::time_point snapshotBegun) {
@@ -8,7 +10,7 @@ std::optional<Clock::time_point> Notifier::send(Clock::time_point snapshotBegun)
         if (!m_sink.ready()) return std::nullopt;
         if (oldest->when > snapshotBegun && Clock::now() < oldest->when + kPatience)
             return oldest->when + kPatience;
-        handOver(*oldest);
+        handOver(std::move(*oldest));
     }
     return std::nullopt;
 }
@@ -16,14 +18,24 @@ std::optional<Clock::time_point> Notifier::send(Clock::time_point snapshotBegun)
 bool Notifier::sendAll() {
     while (auto oldest = m_queue.oldest()) {
         if (!m_sink.ready()) return false;
-        handOver(*oldest);
+        handOver(std::move(*oldest));
     }
     return true;
 }
 
-void Notifier::handOver(Notification& notification) {
-    m_complete(notification);
-    m_sink.send(notification, [this](Delivery delivery) { m_queue.pop(delivery); });
+void Notifier::handOver(Notification&& notification) {
+    if (!m_current) {
+        m_current = std::move(notification);
+        m_complete(*m_current);
+    }
+    // The sink may deliver it during the call.
+    Notification const sent = *m_current;
+    m_sink.send(sent, [this](Delivery delivery) {
+        if (delivery == Delivery::Acknowledged || delivery == Delivery::Unacknowledged)
+            return m_queue.settle(delivery);
+        m_current.reset();
+        m_queue.pop(delivery);
+    });
 }
 
 } // namespace kvloamd

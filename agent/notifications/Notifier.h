@@ -20,7 +20,7 @@ class Notifier {
     /// the notification longer than this.
     static constexpr std::chrono::milliseconds kPatience{1000};
 
-    /// Appends objects to a notification that is about to be sent.
+    /// Completes a notification that is about to be sent for the first time, and records it.
     using Complete = std::function<void(Notification&)>;
 
     /// `queue` and `sink` outlive the notifier. `complete` is called on the calling thread.
@@ -37,11 +37,12 @@ class Notifier {
     bool sendAll();
 
   private:
-    void handOver(Notification& notification);
+    void handOver(Notification&& notification);
 
     NotificationQueue& m_queue;
     NotificationSink& m_sink;
     Complete m_complete;
+    std::optional<Notification> m_current; ///< completed, and perhaps to be sent again
 };
 
 } // namespace kvloamd

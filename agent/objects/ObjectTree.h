@@ -41,11 +41,10 @@ enum class SetFault {
     NoCreation   ///< there is no such instance, and setting it would not make one
 };
 
-/// A setting and what it is to be; nothing: it is forgotten. `Settings::exchange` makes the change,
-/// and undoes it.
+/// A setting and what it is to be. `Settings::exchange` makes the change, and undoes it.
 struct Change {
     SettingKey key;
-    std::optional<SettingValue> value;
+    SettingValue value;
 };
 
 /// An `ObjectTree` holds all scalars and columns in the order of their places. Immutable. Every

@@ -6,8 +6,7 @@ namespace kvloamd {
 std::vector<Table const*> tables() {
     return {&boardTable(),          &moduleTable(),    &serviceTable(),   &deviceTable(),
             &subDeviceTable(),      &processorTable(), &storeTable(),     &processTable(),
-            &resourceDeviceTable(), &faultTable(),     &interfaceTable(), &alarmTable(),
-            &thresholdTable()};
+            &resourceDeviceTable(), &faultTable(),     &interfaceTable(), &alarmTable()};
 }
 
 } // namespace kvloamd

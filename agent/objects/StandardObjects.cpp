@@ -39,6 +39,38 @@ std::span<Scalar const> standardScalars() {
              return std::int64_t{facts.snapshot.entities.lastChange};
          },
          about("The value of sysUpTime when an entity last changed")},
+        {"nlmConfigGlobalEntryLimit",
+         {92, 1, 1, 1},
+         ValueType::Gauge,
+         [](Facts const& facts) -> Value {
+             return std::int64_t{facts.snapshot.notifications->limit};
+         },
+         about("How many notifications are kept in the log")
+             .in("notifications")
+             .as(Kind::Information)},
+        {"nlmConfigGlobalAgeOut",
+         {92, 1, 1, 2},
+         ValueType::Gauge,
+         [](Facts const& facts) -> Value {
+             return std::int64_t{facts.snapshot.notifications->age};
+         },
+         about("After how long a notification is removed from the log")
+             .in("minutes")
+             .as(Kind::Information)},
+        {"nlmStatsGlobalNotificationsLogged",
+         {92, 1, 2, 1},
+         ValueType::Counter,
+         [](Facts const& facts) -> Value {
+             return std::int64_t{facts.snapshot.notifications->logs.front().logged};
+         },
+         about("Notifications that were entered since the agent's start").in("notifications")},
+        {"nlmStatsGlobalNotificationsBumped",
+         {92, 1, 2, 2},
+         ValueType::Counter,
+         [](Facts const& facts) -> Value {
+             return std::int64_t{facts.snapshot.notifications->logs.front().bumped};
+         },
+         about("Notifications that were removed to make room for others").in("notifications")},
         {"alarmModelLastChanged",
          {118, 1, 1, 1},
          ValueType::TimeStamp,
@@ -95,7 +127,11 @@ std::vector<Table const*> standardTables() {
             &alarmActiveTable(),
             &alarmActiveVariableTable(),
             &alarmActiveStatsTable(),
-            &alarmClearTable()};
+            &alarmClearTable(),
+            &nlmConfigLogTable(),
+            &nlmStatsLogTable(),
+            &nlmLogTable(),
+            &nlmLogVariableTable()};
 }
 
 } // namespace kvloamd

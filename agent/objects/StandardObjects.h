@@ -14,7 +14,7 @@ namespace kvloamd {
 inline Oid const kStandardArc{1, 3, 6, 1, 2, 1};
 
 /// The places that the agent takes over, relative, and no others below the arc.
-inline std::array<Place, 16> const kStandardPlaces{{
+inline std::array<Place, 17> const kStandardPlaces{{
     {{2, 1}, "ifNumber", HostHas::All},
     {{2, 2}, "ifTable", HostHas::Rows},
     {{10, 7, 2}, "dot3StatsTable", HostHas::Rows},
@@ -29,6 +29,7 @@ inline std::array<Place, 16> const kStandardPlaces{{
     {{31, 1, 5}, "ifTableLastChange", HostHas::All},
     {{31, 1, 6}, "ifStackLastChange"},
     {{47, 1}, "ENTITY-MIB"},
+    {{92, 1}, "NOTIFICATION-LOG-MIB", HostHas::All},
     {{118, 1}, "ALARM-MIB"},
     {{131, 1}, "ENTITY-STATE-MIB"},
 }};
@@ -61,6 +62,10 @@ Table const& alarmActiveTable();
 Table const& alarmActiveVariableTable();
 Table const& alarmActiveStatsTable();
 Table const& alarmClearTable();
+Table const& nlmConfigLogTable();
+Table const& nlmStatsLogTable();
+Table const& nlmLogTable();
+Table const& nlmLogVariableTable();
 
 /// Every table.
 std::vector<Table const*> standardTables();

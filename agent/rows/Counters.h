@@ -25,7 +25,9 @@ struct Counters {
     std::atomic<std::uint32_t> statusChanges{0};
     std::atomic<std::uint32_t> notificationsDropped{0};
     std::atomic<std::uint32_t> notificationsSent{0};
+    std::atomic<std::uint32_t> notificationsUnacknowledged{0};
     std::atomic<std::uint32_t> notificationsWaiting{0};
+    std::atomic<std::uint32_t> events{0}; ///< the sequence number given last
     std::atomic<Master> master{Master::None};
     std::atomic<std::uint32_t> masterLosses{0};
     /// What sysUpTime is ahead of the agent's own time since its start, in hundredths of a second.

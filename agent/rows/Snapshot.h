@@ -14,13 +14,13 @@
 #include "agent/rows/EntityRows.h"
 #include "agent/rows/FaultRow.h"
 #include "agent/rows/InterfaceRows.h"
+#include "agent/rows/NotificationLogRows.h"
 #include "agent/rows/Persistence.h"
 #include "agent/rows/PlatformRecords.h"
 #include "agent/rows/ProcessRow.h"
 #include "agent/rows/ResourceRow.h"
 #include "agent/rows/ServiceRows.h"
 #include "agent/rows/Settings.h"
-#include "agent/rows/ThresholdRow.h"
 
 namespace kvloamd {
 
@@ -34,10 +34,11 @@ struct Snapshot {
     std::vector<ProcessRow> processes;
     std::vector<ResourceRow> resources;
     Faults faults;
-    std::shared_ptr<AlarmRows const> alarms = std::make_shared<AlarmRows>();              ///< set
+    std::shared_ptr<AlarmRows const> alarms = std::make_shared<AlarmRows>(); ///< set
+    std::shared_ptr<NotificationLogRows const> notifications =
+        std::make_shared<NotificationLogRows>();                                          ///< set
     std::shared_ptr<PlatformRecords const> records = std::make_shared<PlatformRecords>(); ///< set
     InterfaceRows interfaces;
-    std::vector<ThresholdRow> thresholds; ///< of the lines that keep a history
     EntityRows entities;
     std::uint32_t interfaceConflicts = 0;        ///< of ifIndices with the host's own interfaces
     Persistence persistence = Persistence::Kept; ///< of the indices and settings

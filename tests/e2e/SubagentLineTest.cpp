@@ -39,6 +39,16 @@ TEST_F(SubagentLineTest, CutLineAndItsLinkAreTold) {
     expectCutTold();
 }
 
+TEST_F(SubagentLineTest, NotificationsAreInTheMastersLogWithTheirNumbers) {
+    start();
+    sim({"line", "alarm", "101", "los"});
+    expectCutTold();
+    bool isLogged = false;                                        // kvlEventNumber.0
+    for (Answer const& answer : walk("1.3.6.1.2.1.92.1.3.2.1.2")) // nlmLogVariableID
+        isLogged = isLogged || answer.value == "OID: .1.3.6.1.4.1.32473.1.1.12.5.0";
+    EXPECT_TRUE(isLogged);
+}
+
 TEST_F(SubagentLineTest, WhatHappensWhileTheMasterIsAwayIsToldWhenItIsBack) {
     start();
     killMaster();

@@ -6,7 +6,8 @@ import textwrap
 
 # In the order of the documents.
 MODULES = ('KVL-OAM-MIB', 'SNMPv2-MIB', 'SNMP-FRAMEWORK-MIB', 'IF-MIB', 'DS1-MIB', 'DS0-MIB', 'ISDN-MIB',
-           'EtherLike-MIB', 'ENTITY-MIB', 'ALARM-MIB', 'ENTITY-STATE-MIB')
+           'EtherLike-MIB', 'ENTITY-MIB', 'NOTIFICATION-LOG-MIB',
+           'ALARM-MIB', 'ENTITY-STATE-MIB')
 # What the SNMP library serves, not our description.
 LIBRARY = ('SNMPv2-MIB', 'SNMP-FRAMEWORK-MIB')
 STATES = ('not served', 'not yet', 'read-only', 'some rows', 'at times', 'not here')

@@ -78,6 +78,7 @@ ReceiverLine::Word ReceiverLine::expectWord(std::size_t from, std::string const&
 }
 
 void ReceiverLine::readSink() {
+    m_isForInforms = m_directive == "informsink";
     std::string const missing =
         m_directive + " names no host; write it like " + m_directive + " 192.0.2.7:162 community";
     Word word = expectWord(0, missing);
@@ -127,6 +128,7 @@ void ReceiverLine::readSession(bool thirdByDefault) {
     }
     readHost(word);
     m_asksEngine = third && informs && !namesEngine;
+    m_isForInforms = informs;
 }
 
 void ReceiverLine::readHost(Word const& word) {

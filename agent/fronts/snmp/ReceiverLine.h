@@ -41,6 +41,8 @@ class ReceiverLine {
     std::string where() const { return m_text.substr(m_hostBegin, m_hostEnd - m_hostBegin); }
     /// Whether the receiver's SNMPv3 engine ID must be known before the first inform.
     bool asksEngine() const { return m_asksEngine; }
+    /// Whether the receiver acknowledges notifications.
+    bool isForInforms() const { return m_isForInforms; }
     /// The text with the host's number in place of its name, and with the octets of the engine ID
     /// unless they are empty.
     std::string resolved(std::string const& number, std::string_view engine) const;
@@ -65,6 +67,7 @@ class ReceiverLine {
     std::size_t m_hostEnd = 0;
     bool m_portIsApart = false;
     bool m_asksEngine = false;
+    bool m_isForInforms = false;
 };
 
 } // namespace kvloamd

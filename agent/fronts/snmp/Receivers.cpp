@@ -68,6 +68,7 @@ void Receivers::forget() {
     if (current != nullptr) {
         current->m_waiting.clear();
         current->m_resolver.dropQuestions();
+        current->m_informs.closeAll();
     }
     snmpd_free_trapsinks();
 }
@@ -173,8 +174,14 @@ void Receivers::fail(Waiting& waiting, std::string const& why, Clock::time_point
 void Receivers::openByLibrary(ReceiverLine const& line, std::string const& number,
                               std::string_view engine) {
     std::string text = line.resolved(number, engine);
-    for (Directive const& directive : kDirectives)
-        if (directive.name == line.directive()) directive.parse(directive.name.data(), text.data());
+    for (Directive const& directive : kDirectives) {
+        if (directive.name != line.directive()) continue;
+        auto const parse = [&] { directive.parse(directive.name.data(), text.data()); };
+        if (line.isForInforms())
+            m_informs.takeOver(parse);
+        else
+            parse();
+    }
 }
 
 void Receivers::settleIfDue(Clock::time_point now) {

@@ -15,6 +15,7 @@
 
 #include "agent/fronts/EventLoop.h"
 #include "agent/fronts/snmp/EngineProbe.h"
+#include "agent/fronts/snmp/Informs.h"
 #include "agent/fronts/snmp/NameResolver.h"
 #include "agent/fronts/snmp/ReceiverLine.h"
 
@@ -49,6 +50,8 @@ class Receivers final : public EventLoop::Source {
     bool isSettled() const { return m_begun && !m_whenSettled; }
     /// Whether every receiver is open.
     bool allOpen() const { return m_waiting.empty(); }
+    /// The receivers that acknowledge notifications.
+    Informs& informs() { return m_informs; }
 
     std::optional<Clock::time_point> prepare(std::vector<pollfd>& polled) override;
     void handle(std::span<pollfd const> polled) override;
@@ -73,8 +76,8 @@ class Receivers final : public EventLoop::Source {
     /// Forgets all receivers, before the configuration is read again.
     static void forget();
     /// Lets the library open a receiver that delays nothing.
-    static void openByLibrary(ReceiverLine const& line, std::string const& number,
-                              std::string_view engine);
+    void openByLibrary(ReceiverLine const& line, std::string const& number,
+                       std::string_view engine);
 
     void add(ReceiverLine line);
     void takeAnswers(Clock::time_point now);
@@ -86,6 +89,7 @@ class Receivers final : public EventLoop::Source {
     void settleIfDue(Clock::time_point now);
 
     std::vector<Waiting> m_waiting;
+    Informs m_informs;
     NameResolver m_resolver;
     bool m_begun = false;
     Clock::time_point m_deadline; ///< of the first attempts

@@ -26,10 +26,6 @@ void addVariable(netsnmp_variable_list*& variables, Oid const& name, ValueType t
 
 } // namespace
 
-void SnmpNotifications::sendStart() {
-    send_easy_trap(SNMP_TRAP_COLDSTART, 0);
-}
-
 void SnmpNotifications::send(Notification const& notification, Delivered delivered) {
     netsnmp_variable_list* variables = nullptr;
     if (notification.sysUpTime)
@@ -38,9 +34,17 @@ void SnmpNotifications::send(Notification const& notification, Delivered deliver
     addVariable(variables, kSnmpTrapOid, ValueType::ObjectId, NameView{notification.name});
     for (NotifiedObject const& object : notification.objects)
         addVariable(variables, object.name, object.type, object.view());
-    send_v2trap(variables);
+    bool const reachesAll = m_receivers.allOpen();
+    auto const settled = [reachesAll, delivered](bool acknowledged) {
+        if (reachesAll) delivered(acknowledged ? Delivery::Acknowledged : Delivery::Unacknowledged);
+    };
+    auto const fate =
+        m_receivers.informs().follow([variables] { send_v2trap(variables); }, settled);
     snmp_free_varbind(variables);
-    delivered(m_receivers.allOpen() ? Delivery::Sent : Delivery::Dropped);
+    if (!reachesAll || fate == Informs::Fate::Refused)
+        delivered(Delivery::Dropped);
+    else
+        delivered(fate == Informs::Fate::Pending ? Delivery::Awaited : Delivery::Sent);
 }
 
 } // namespace kvloamd

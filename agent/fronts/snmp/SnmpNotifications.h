@@ -12,17 +12,15 @@ namespace kvloamd {
 class SnmpNotifications final : public NotificationSink {
   public:
     /// `receivers` outlives this object.
-    explicit SnmpNotifications(Receivers const& receivers) : m_receivers(receivers) {}
-
-    /// Sends coldStart.
-    static void sendStart();
+    explicit SnmpNotifications(Receivers& receivers) : m_receivers(receivers) {}
 
     bool ready() const override { return m_receivers.isSettled(); }
-    /// A notification counts as dropped while a receiver is not open.
+    /// A notification counts as dropped while a receiver is not open, or if too many informs wait
+    /// to be acknowledged.
     void send(Notification const& notification, Delivered delivered) override;
 
   private:
-    Receivers const& m_receivers;
+    Receivers& m_receivers;
 };
 
 } // namespace kvloamd

@@ -10,6 +10,7 @@
 namespace kvloamd {
 
 StandAlone::~StandAlone() {
+    m_receivers.informs().stop();
     stopSnmp();
 }
 
@@ -42,7 +43,7 @@ void StandAlone::serve(Served served) {
     m_sessions.addTo(loop());
     loop().add(m_library);
     loop().add(m_receivers);
-    m_receivers.begin(SnmpNotifications::sendStart);
+    m_receivers.begin([] {});
 }
 
 std::vector<std::string> StandAlone::readConfigurationAgain() {

@@ -328,5 +328,65 @@ TEST_F(JournalTest, JournalWithoutAFileHasNothingToRead) {
     EXPECT_THAT(journal.entriesAfter(0, 10)->rows, IsEmpty());
 }
 
+LoggedNotification const kNotification{
+    {1, 3, 6, 1, 4},
+    {{{1, 3, 1}, VariableType::Integer32, std::int64_t{-5}},
+     {{1, 3, 2}, VariableType::OctetString, std::string("a\0b", 3)},
+     {{1, 3, 3}, VariableType::OctetString, std::string()},
+     {{1, 3, 4}, VariableType::ObjectId, Oid{1, 3, 4294967295}},
+     {{1, 3, 5}, VariableType::Counter64, static_cast<std::int64_t>(0xffffffffffffffffU)}}};
+
+JournalEntry notificationEntry() {
+    JournalEntry entry = entryOf("notification");
+    entry.event = JournalEvent::Notification;
+    entry.notification = kNotification;
+    return entry;
+}
+
+TEST_F(JournalTest, NotificationsAreKnownAfterARestartWithTheirVariables) {
+    {
+        Journal journal(file());
+        journal.append(entryOf("before"));
+        journal.append(notificationEntry());
+        journal.append(entryOf("between"));
+        JournalEntry bare = notificationEntry();
+        bare.notification->variables.clear();
+        journal.append(bare);
+        journal.flush();
+    }
+    auto const former = Journal(file()).takeFormerNotifications();
+    ASSERT_THAT(former, SizeIs(2));
+    EXPECT_EQ(former[0].sequence, 2U);
+    EXPECT_EQ(former[0].notification, kNotification);
+    EXPECT_EQ(former[1].sequence, 4U);
+    EXPECT_THAT(former[1].notification->variables, IsEmpty());
+}
+
+TEST_F(JournalTest, OnlyTheNewestNotificationsAreReadAgain) {
+    {
+        Journal journal(file());
+        for (int i = 0; i < 10; ++i)
+            journal.append(notificationEntry());
+    }
+    auto const newest = JournalFile(file()).notifications(3);
+    ASSERT_THAT(newest, SizeIs(3));
+    EXPECT_EQ(newest.front().sequence, 8U);
+    EXPECT_EQ(newest.back().notification, kNotification);
+}
+
+TEST_F(JournalTest, VariablesAreDeletedWithTheirNotification) {
+    JournalLimits limits;
+    limits.entries = 10;
+    {
+        Journal journal(file(), limits);
+        for (int i = 0; i < 30; ++i)
+            journal.append(notificationEntry());
+        journal.close({});
+    }
+    Database database(file());
+    EXPECT_EQ(database.number("SELECT count(*) FROM entry"), 10);
+    EXPECT_EQ(database.number("SELECT count(DISTINCT sequence) FROM variable"), 10);
+}
+
 } // namespace
 } // namespace kvloamd

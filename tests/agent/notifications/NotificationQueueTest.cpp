@@ -56,5 +56,14 @@ TEST_F(NotificationQueueTest, ThoseThatWaitAndThoseThatHaveLeftAreCounted) {
     EXPECT_EQ(m_counters.notificationsSent, 1U);
 }
 
+TEST_F(NotificationQueueTest, DroppedNotificationIsReported) {
+    std::vector<std::uint32_t> dropped;
+    m_queue.observeDrops(
+        [&](Notification const& notification) { dropped.push_back(notification.name.back()); });
+    for (std::uint32_t number = 1; number <= 4; ++number)
+        push(number);
+    EXPECT_EQ(dropped, (std::vector<std::uint32_t>{3, 4}));
+}
+
 } // namespace
 } // namespace kvloamd

@@ -35,7 +35,9 @@ class NotifierTest : public ::testing::Test {
     Counters m_counters;
     NotificationQueue m_queue{m_counters};
     ScriptedSink m_sink;
-    Notifier m_notifier{m_queue, m_sink, [](Notification& notification) {
+    int m_completed = 0;
+    Notifier m_notifier{m_queue, m_sink, [this](Notification& notification) {
+                            ++m_completed;
                             notification.objects.push_back({{1, 7}, ValueType::Integer, 7});
                         }};
 };
@@ -57,7 +59,7 @@ TEST_F(NotifierTest, ChangeThatTheSnapshotDoesNotShowWaits) {
     EXPECT_TRUE(m_sink.sent.empty());
 }
 
-TEST_F(NotifierTest, NotificationIsCompletedOnceForEachTimeItIsSent) {
+TEST_F(NotifierTest, NotificationThatIsSentAgainIsTheSameAndCompletedOnce) {
     m_sink.takesAtOnce = false;
     change(1);
     announceShown();
@@ -67,6 +69,13 @@ TEST_F(NotifierTest, NotificationIsCompletedOnceForEachTimeItIsSent) {
     announceShown();
     EXPECT_EQ(m_sink.sent, (std::vector<std::uint32_t>{1, 1}));
     EXPECT_EQ(m_sink.objects, 1U);
+    EXPECT_EQ(m_completed, 1);
+    // The next one is another.
+    m_sink.underWay(Delivery::Sent);
+    m_sink.isReady = true;
+    change(2);
+    announceShown();
+    EXPECT_EQ(m_completed, 2);
 }
 
 TEST_F(NotifierTest, ChangeStaysUntilItIsTaken) {
@@ -125,6 +134,25 @@ TEST_F(NotifierTest, LastWordsThatAreNotTakenAreLeft) {
     change(1);
     EXPECT_FALSE(m_notifier.sendAll());
     EXPECT_EQ(m_queue.size(), 1U);
+}
+
+TEST_F(NotifierTest, NotificationThatIsAwaitedCountsWhenItsFateIsKnown) {
+    m_sink.takesAtOnce = false;
+    std::vector<Delivered> awaited;
+    for (std::uint32_t number = 1; number <= 2; ++number) {
+        change(number);
+        m_sink.isReady = true;
+        announceShown();
+        m_sink.underWay(Delivery::Awaited);
+        awaited.push_back(m_sink.underWay);
+    }
+    EXPECT_EQ(m_queue.size(), 0U) << "others do not wait for it";
+    EXPECT_EQ(m_counters.notificationsSent, 0U);
+    awaited[1](Delivery::Unacknowledged);
+    awaited[0](Delivery::Acknowledged);
+    EXPECT_EQ(m_counters.notificationsSent, 1U);
+    EXPECT_EQ(m_counters.notificationsUnacknowledged, 1U);
+    EXPECT_EQ(m_counters.notificationsDropped, 0U);
 }
 
 } // namespace
