@@ -6,6 +6,7 @@ import collections
 import json
 import os
 import shutil
+import signal
 import subprocess
 import tempfile
 import threading
@@ -26,7 +27,7 @@ class Browser:
         program = shutil.which(PROGRAM)
         if program is None:
             raise BrowserError(f"{PROGRAM} is not installed; scripts/install-packages browser installs it")
-        self._folder = tempfile.TemporaryDirectory(prefix="kvloam-browser-")
+        self._folder = tempfile.TemporaryDirectory(prefix="kvloam-browser-", ignore_cleanup_errors=True)
         # It reads commands from descriptor 3 and writes answers and events to descriptor 4.
         command_end, self._commands = os.pipe()
         self._answers, answer_end = os.pipe()
@@ -48,7 +49,8 @@ class Browser:
         environment = {**os.environ, "HOME": self._folder.name, "XDG_RUNTIME_DIR": self._folder.name,
                        "DBUS_SESSION_BUS_ADDRESS": "unix:path=/nonexistent"}
         self._process = subprocess.Popen(arguments, preexec_fn=connect, close_fds=False, env=environment,
-                                         stdin=subprocess.DEVNULL, stdout=self._log, stderr=self._log)
+                                         stdin=subprocess.DEVNULL, stdout=self._log, stderr=self._log,
+                                         start_new_session=True)
         os.close(command_end)
         os.close(answer_end)
         self._next = 0
@@ -118,9 +120,12 @@ class Browser:
             self._process.wait(20)
         except (BrowserError, OSError, subprocess.TimeoutExpired):
             pass
-        if self._process.poll() is None:
-            self._process.kill()
-            self._process.wait()
+        # What it has started may outlive it, and writes to its profile.
+        try:
+            os.killpg(self._process.pid, signal.SIGKILL)
+        except ProcessLookupError:
+            pass
+        self._process.wait()
         self._reader.join()
         os.close(self._commands)
         os.close(self._answers)
