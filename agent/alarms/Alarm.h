@@ -37,6 +37,7 @@ struct Condition {
     std::uint32_t ifIndex = 0;    ///< 0: none
     std::string text;             ///< what was said about it last; may be empty
     std::string place;            ///< of a board that has gone: its slot; empty: not known
+    std::uint32_t line = 0;       ///< of a channel: the ifIndex of its line; 0: not known
 
     bool operator==(Condition const&) const = default;
 };
@@ -49,9 +50,13 @@ struct Alarm {
     std::chrono::system_clock::time_point raised;  ///< when it became an alarm
     std::chrono::system_clock::time_point cleared; ///< good when it has been cleared
     std::uint32_t count = 0; ///< how often the condition has begun, from `began` on
+    /// What the condition follows from, such as "dsx1LossOfSignal on board NX50001, T1 line
+    /// trunk-1"; empty: nothing.
+    std::string cause;
 };
 
-/// What happens to an alarm.
-enum class AlarmEvent { Raised, Cleared, SeverityChanged };
+/// What happens to an alarm. `Explained`: its condition turns out to follow from an alarm's, so it
+/// is none, or none any more.
+enum class AlarmEvent { Raised, Cleared, SeverityChanged, Explained };
 
 } // namespace kvloamd

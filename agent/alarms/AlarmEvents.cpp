@@ -58,36 +58,40 @@ void AlarmEvents::boardStatus(int boardIndex, Board& board, BoardStatusEnum stat
     if (m_note) m_note(text, name);
     log(status == BoardStatusFailed ? LogLevel::Warning : LogLevel::Info, text,
         {{"KVL_BOARD", name}, {"KVL_BOARD_STATUS", statusName(status)}});
-    Instant const now = Instant::now();
+    Instant const now = m_now();
     if (status == BoardStatusStopped || status == BoardStatusStarted || status == BoardStatusFailed)
         noteStop(index, status == BoardStatusStopped && ordered);
+    std::vector<Condition> begun;
+    std::vector<AlarmKey> ended;
+    auto const end = [&](AlarmKind kind) { ended.push_back(of(kind).key); };
     switch (status) {
     case BoardStatusFailed:
-        m_list.begin(of(AlarmKind::BoardFailed), now);
-        m_list.end(of(AlarmKind::BoardStopped).key, now);
+        begun.push_back(of(AlarmKind::BoardFailed));
+        end(AlarmKind::BoardStopped);
         break;
     case BoardStatusStopped:
-        if (!ordered) m_list.begin(of(AlarmKind::BoardStopped), now);
+        if (!ordered) begun.push_back(of(AlarmKind::BoardStopped));
         break;
     case BoardStatusRemoved:
-        m_list.end(of(AlarmKind::BoardFailed).key, now);
-        m_list.end(of(AlarmKind::BoardStopped).key, now);
+        end(AlarmKind::BoardFailed);
+        end(AlarmKind::BoardStopped);
         if (KnownBoard const last = known(index); !last.stoppedInOrder) {
             Condition gone = of(AlarmKind::BoardGone);
             gone.place = last.place;
-            m_list.begin(gone, now);
+            begun.push_back(std::move(gone));
         }
         break;
     case BoardStatusStarted:
-        m_list.end(of(AlarmKind::BoardFailed).key, now);
-        m_list.end(of(AlarmKind::BoardStopped).key, now);
+        end(AlarmKind::BoardFailed);
+        end(AlarmKind::BoardStopped);
         [[fallthrough]];
     case BoardStatusAdded:
-        m_list.end(of(AlarmKind::BoardGone).key, now);
+        end(AlarmKind::BoardGone);
         break;
     default:
         break;
     }
+    m_list.change(begun, ended, now);
 }
 
 void AlarmEvents::fault(bool raised, int boardIndex, std::string const& serialNumber,
@@ -105,7 +109,7 @@ void AlarmEvents::fault(bool raised, int boardIndex, std::string const& serialNu
                       0,
                       text,
                       {}},
-                     Instant::now(), true);
+                     m_now(), true);
 }
 
 void AlarmEvents::lineStatus(std::uint32_t ifIndex, int status) {
@@ -117,16 +121,19 @@ void AlarmEvents::lineStatus(std::uint32_t ifIndex, int status) {
         line = found->second;
         found->second.status = status;
     }
-    Instant const now = Instant::now();
+    Instant const now = m_now();
     unsigned alarmBits = 0;
+    std::vector<Condition> begun;
+    std::vector<AlarmKey> ended;
     for (LineAlarm const& alarm : lineAlarms()) {
         alarmBits |= alarm.bit;
         line->condition.key.kind = alarm.kind;
         if ((static_cast<unsigned>(status) & alarm.bit) != 0)
-            m_list.begin(line->condition, now);
+            begun.push_back(line->condition);
         else
-            m_list.end(line->condition.key, now);
+            ended.push_back(line->condition.key);
     }
+    m_list.change(begun, ended, now);
     // Alarms are logged by the list. Loopbacks, test codes and what the line sends are not.
     unsigned const others = ~(alarmBits | 1U);
     if (((static_cast<unsigned>(status) ^ static_cast<unsigned>(line->status)) & others) != 0)
@@ -140,7 +147,7 @@ void AlarmEvents::update(Snapshot const& snapshot) {
     m_list.compare(AlarmScope::Snapshot,
                    conditionsIn(snapshot, m_list.present(AlarmKind::BoardStopped),
                                 m_list.present(AlarmKind::BoardGone)),
-                   snapshot.begun, Instant::now());
+                   snapshot.begun, m_now());
 }
 
 void AlarmEvents::rememberLines(Snapshot const& snapshot) {

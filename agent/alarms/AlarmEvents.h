@@ -25,8 +25,10 @@ class AlarmEvents {
     /// Receives every status change of a board in words, on the thread that reported it.
     using Note = std::function<void(std::string const& text, std::string const& board)>;
 
-    /// `list` lives as long as the process. `note` may be empty.
-    explicit AlarmEvents(AlarmList& list, Note note = {}) : m_list(list), m_note(std::move(note)) {}
+    /// `list` lives as long as the process. `note` may be empty. `now`: the time of what happens.
+    explicit AlarmEvents(AlarmList& list, Note note = {},
+                         std::function<Instant()> now = Instant::now)
+        : m_list(list), m_note(std::move(note)), m_now(std::move(now)) {}
 
     /// The board has changed its status.
     void boardStatus(int boardIndex, Board& board, BoardStatusEnum status);
@@ -59,6 +61,7 @@ class AlarmEvents {
 
     AlarmList& m_list;
     Note const m_note;
+    std::function<Instant()> const m_now;
     std::mutex m_mutex;                           ///< guards what follows
     std::map<std::uint32_t, Line> m_lines;        ///< by ifIndex, of the newest snapshot
     std::map<std::uint32_t, KnownBoard> m_boards; ///< by board index

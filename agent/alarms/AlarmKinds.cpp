@@ -5,6 +5,8 @@
 #include <array>
 #include <stdexcept>
 
+#include "agent/rows/FaultRow.h"
+
 namespace kvloamd {
 
 namespace {
@@ -13,6 +15,13 @@ using enum AlarmKind;
 using enum AlarmSeverity;
 using enum AlarmScope;
 using std::chrono::seconds;
+
+/// Signalling channels may report what follows from a failure of their line before the line
+/// declares it, and recover after the line.
+constexpr seconds kChannelHold{5};
+/// A line declares its failure some seconds after the platform has reported the fault. A fault that
+/// no line shows stays listed for 30 s, because its end may have been lost.
+constexpr seconds kLineFaultHold{40};
 
 // A line's failure has lasted already when its status shows it, and ends 10 s after the defect, as
 // the rules for DS1 lines require; its hold times are therefore 0.
@@ -49,9 +58,9 @@ constexpr AlarmKindInfo kKinds[] = {
      "the line receives the alarm indication signal in its payload"},
     {LineDs2PerfThreshold, "dsx1Ds2PerfThreshold", Warning, seconds(0), seconds(0), Snapshot,
      "the DS2 has crossed a performance threshold"},
-    {ChannelInactive, "isdnLapdInactive", Minor, seconds(0), seconds(0), Snapshot,
+    {ChannelInactive, "isdnLapdInactive", Minor, kChannelHold, seconds(0), Snapshot,
      "layer 1 of the signalling channel is down"},
-    {ChannelLayer2Down, "isdnLapdLayer2Down", Major, seconds(0), seconds(0), Snapshot,
+    {ChannelLayer2Down, "isdnLapdLayer2Down", Major, kChannelHold, seconds(0), Snapshot,
      "layer 1 of the signalling channel is up, but layer 2 is not established"},
     {LinkDown, "linkDown", Major, seconds(0), seconds(0), Snapshot,
      "the interface is down although nobody switched it off"},
@@ -67,6 +76,26 @@ constexpr AlarmKindInfo kKinds[] = {
      "notifications were dropped because too many waited"},
     {MasterLost, "agentMasterLost", Major, seconds(10), seconds(0), Health,
      "there is no connection to the SNMP master"},
+    {ThresholdES15m, "thresholdES15m", Warning, seconds(0), seconds(0), Thresholds,
+     "the line has counted as many errored seconds in 15 minutes as its limit"},
+    {ThresholdES24h, "thresholdES24h", Warning, seconds(0), seconds(0), Thresholds,
+     "the line has counted as many errored seconds in 24 hours as its limit"},
+    {ThresholdSES15m, "thresholdSES15m", Warning, seconds(0), seconds(0), Thresholds,
+     "the line has counted as many severely errored seconds in 15 minutes as its limit"},
+    {ThresholdSES24h, "thresholdSES24h", Warning, seconds(0), seconds(0), Thresholds,
+     "the line has counted as many severely errored seconds in 24 hours as its limit"},
+    {ThresholdUAS15m, "thresholdUAS15m", Warning, seconds(0), seconds(0), Thresholds,
+     "the line has counted as many unavailable seconds in 15 minutes as its limit"},
+    {ThresholdUAS24h, "thresholdUAS24h", Warning, seconds(0), seconds(0), Thresholds,
+     "the line has counted as many unavailable seconds in 24 hours as its limit"},
+    {ThresholdCSS15m, "thresholdCSS15m", Warning, seconds(0), seconds(0), Thresholds,
+     "the line has counted as many controlled slip seconds in 15 minutes as its limit"},
+    {ThresholdCSS24h, "thresholdCSS24h", Warning, seconds(0), seconds(0), Thresholds,
+     "the line has counted as many controlled slip seconds in 24 hours as its limit"},
+    {ThresholdCV15m, "thresholdCV15m", Warning, seconds(0), seconds(0), Thresholds,
+     "the line has counted as many path coding violations in 15 minutes as its limit"},
+    {ThresholdCV24h, "thresholdCV24h", Warning, seconds(0), seconds(0), Thresholds,
+     "the line has counted as many path coding violations in 24 hours as its limit"},
 };
 
 constexpr std::array<char const*, 7> kSeverities{"",      "cleared", "indeterminate", "critical",
@@ -76,6 +105,11 @@ constexpr std::array<char const*, 7> kSeverities{"",      "cleared", "indetermin
 
 std::span<AlarmKindInfo const> alarmKinds() {
     return kKinds;
+}
+
+std::chrono::seconds defaultRaiseHold(AlarmKindInfo const& kind, std::uint32_t number) {
+    bool const ofLine = kind.kind == PlatformFault && faultKind(number) != kOtherFault;
+    return ofLine ? kLineFaultHold : kind.raiseHold;
 }
 
 AlarmKindInfo const& alarmKind(AlarmKind kind) {

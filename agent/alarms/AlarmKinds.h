@@ -46,13 +46,25 @@ enum class AlarmKind : int {
     StoreUnreadable = 52,
     PersistenceFailing = 53,
     NotificationsDropped = 54,
-    MasterLost = 55
+    MasterLost = 55,
+    // In the order of `Threshold`.
+    ThresholdES15m = 60,
+    ThresholdES24h = 61,
+    ThresholdSES15m = 62,
+    ThresholdSES24h = 63,
+    ThresholdUAS15m = 64,
+    ThresholdUAS24h = 65,
+    ThresholdCSS15m = 66,
+    ThresholdCSS24h = 67,
+    ThresholdCV15m = 68,
+    ThresholdCV24h = 69
 };
 
 /// Where the present state of a kind's conditions is read from.
 enum class AlarmScope {
-    Snapshot, ///< boards, lines and channels of the newest snapshot
-    Health    ///< the agent itself
+    Snapshot,  ///< boards, lines and channels of the newest snapshot
+    Health,    ///< the agent itself
+    Thresholds ///< the counters of lines
 };
 
 struct AlarmKindInfo {
@@ -67,6 +79,9 @@ struct AlarmKindInfo {
 
 /// All kinds, ascending by number.
 std::span<AlarmKindInfo const> alarmKinds();
+/// How long the raise hold of an alarm is by default. `number`: of the alarm; the fault value of a
+/// platform fault. A fault of a line waits for the line to declare its failure.
+std::chrono::seconds defaultRaiseHold(AlarmKindInfo const& kind, std::uint32_t number);
 AlarmKindInfo const& alarmKind(AlarmKind kind);
 /// The kind with this name; null when there is none.
 AlarmKindInfo const* findAlarmKind(std::string_view name);

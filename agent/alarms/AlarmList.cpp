@@ -5,9 +5,14 @@
 #include <set>
 #include <utility>
 
+#include "agent/alarms/AlarmCauses.h"
+
 namespace kvloamd {
 
 namespace {
+
+/// More than there are causes one above the other.
+constexpr int kTurns = 8;
 
 std::optional<Clock::time_point> earlier(std::optional<Clock::time_point> one,
                                          std::optional<Clock::time_point> other) {
@@ -33,7 +38,8 @@ AlarmList::AlarmList(AlarmPolicies policies, Report report, std::size_t capacity
 
 void AlarmList::begin(Condition const& condition, Instant now, bool again) {
     std::scoped_lock const guard(m_mutex);
-    beginLocked(condition, now, again);
+    if (auto const begun = beginLocked(condition, now, again); begun != m_records.end())
+        explainAndSettle(begun, now);
 }
 
 void AlarmList::end(AlarmKey const& key, Instant now) {
@@ -44,33 +50,63 @@ void AlarmList::end(AlarmKey const& key, Instant now) {
     settleAndKeep(found, now);
 }
 
+void AlarmList::change(std::vector<Condition> const& begun, std::vector<AlarmKey> const& ended,
+                       Instant now) {
+    std::scoped_lock const guard(m_mutex);
+    // Settled when all are known, so that no consequence is an alarm for a moment.
+    std::vector<Records::iterator> changed;
+    for (Condition const& condition : begun)
+        if (auto const at = beginLocked(condition, now, false); at != m_records.end())
+            changed.push_back(at);
+    for (AlarmKey const& key : ended) {
+        auto const found = m_records.find(key);
+        if (found == m_records.end() || !found->second.present) continue;
+        endLocked(found->second, now);
+        changed.push_back(found);
+    }
+    for (auto const& record : changed)
+        explainAndSettle(record, now);
+}
+
 void AlarmList::compare(AlarmScope scope, std::vector<Condition> const& present,
                         Clock::time_point read, Instant now) {
     std::scoped_lock const guard(m_mutex);
     std::set<AlarmKey> keys;
+    std::vector<Records::iterator> changed; // settled as in `change`
     for (Condition const& condition : present) {
         keys.insert(condition.key);
         auto const found = m_records.find(condition.key);
         if (found != m_records.end() && !found->second.present && found->second.changed > read)
             continue; // it ended after the snapshot was read
-        beginLocked(condition, now, false);
+        if (auto const at = beginLocked(condition, now, false); at != m_records.end())
+            changed.push_back(at);
     }
-    for (auto at = m_records.begin(); at != m_records.end();) {
-        auto const record = at++;
+    for (auto record = m_records.begin(); record != m_records.end(); ++record) {
         if (!record->second.present || alarmKind(record->first.kind).scope != scope ||
             keys.contains(record->first) || record->second.changed > read)
             continue;
         endLocked(record->second, now);
-        settleAndKeep(record, now);
+        changed.push_back(record);
     }
+    for (auto const& record : changed)
+        explainAndSettle(record, now);
 }
 
 std::optional<Clock::time_point> AlarmList::advance(Instant now) {
     std::scoped_lock const guard(m_mutex);
-    if (!m_next || now.steady < *m_next) return m_next;
-    m_next.reset();
-    for (auto at = m_records.begin(); at != m_records.end();)
-        settleAndKeep(at++, now);
+    // An alarm that is cleared may have consequences that have been settled before it.
+    for (int turn = 0; turn < kTurns && m_next && now.steady >= *m_next; ++turn) {
+        m_next.reset();
+        std::set<std::string> const boards = std::exchange(m_changedBoards, {});
+        bool const all = boards.contains({});
+        for (auto at = m_records.begin(); at != m_records.end();) {
+            auto const record = at++;
+            if (all || boards.contains(record->first.board))
+                explainAndSettle(record, now);
+            else
+                settleAndKeep(record, now);
+        }
+    }
     return m_next;
 }
 
@@ -93,6 +129,9 @@ void AlarmList::apply(AlarmPolicies policies, Instant now) {
         }
         settleAndKeep(entry, now);
     }
+    // What has been switched off or on may be a cause.
+    m_changedBoards.insert(std::string());
+    m_next = now.steady;
 }
 
 void AlarmList::restore(std::vector<Alarm> const& alarms, Instant now) {
@@ -101,12 +140,14 @@ void AlarmList::restore(std::vector<Alarm> const& alarms, Instant now) {
         Record record;
         record.alarm = alarm;
         record.present = record.raised = true;
-        record.changed = now.steady;
+        record.changed = record.held = now.steady;
         record.alarm.severity =
             m_policies.of(alarm.condition.key.kind, alarm.condition.key.number).severity;
         if (m_records.insert_or_assign(alarm.condition.key, std::move(record)).second)
             countActive(alarm.condition.key.kind, true, now.steady);
     }
+    m_changedBoards.insert(std::string());
+    m_next = now.steady;
     ++m_version;
 }
 
@@ -158,7 +199,8 @@ AlarmList::Contents AlarmList::contents(std::uint64_t known) const {
     return contents;
 }
 
-void AlarmList::beginLocked(Condition const& condition, Instant now, bool again) {
+AlarmList::Records::iterator AlarmList::beginLocked(Condition const& condition, Instant now,
+                                                    bool again) {
     auto found = m_records.find(condition.key);
     bool const known = found != m_records.end() && found->second.present;
     if (!known || again) ++m_counts.begun;
@@ -166,25 +208,28 @@ void AlarmList::beginLocked(Condition const& condition, Instant now, bool again)
         if (m_records.size() >= m_capacity) {
             ++m_counts.unlisted;
             ++m_version;
-            return;
+            return m_records.end();
         }
         found = m_records.try_emplace(condition.key).first;
         found->second.alarm.condition = condition;
     }
     Record& record = found->second;
     if (describe(record.alarm.condition, condition) && record.raised) ++m_version;
-    if (known && !again) return;
+    if (known && !again) return m_records.end();
     if (!known) {
         record.present = true;
-        record.changed = now.steady;
+        record.changed = record.held = now.steady;
+        causeChanged(condition.key, now);
     }
     countBeginning(record, now);
-    settleAndKeep(found, now);
+    return found;
 }
 
 void AlarmList::endLocked(Record& record, Instant now) {
     record.present = false;
     record.changed = now.steady;
+    record.cause.reset();
+    causeChanged(record.alarm.condition.key, now);
     if (record.raised) ++m_version;
     auto const& oldest = record.beginnings[record.next];
     if (!oldest || now.steady - *oldest >= kFlapWindow) record.flapping = false;
@@ -201,15 +246,63 @@ void AlarmList::countBeginning(Record& record, Instant now) {
     if (oldest && now.steady - *oldest < kFlapWindow) record.flapping = true;
 }
 
+void AlarmList::causeChanged(AlarmKey const& key, Instant now) {
+    if (!isCause(key.kind)) return;
+    m_changedBoards.insert(key.board);
+    m_next = now.steady;
+}
+
+bool AlarmList::stands(Record const& record) const {
+    AlarmKey const& key = record.alarm.condition.key;
+    return record.raised || (record.present && m_policies.of(key.kind, key.number).enabled);
+}
+
+AlarmList::Record const* AlarmList::causeOf(Condition const& condition) const {
+    AlarmKey const& key = condition.key;
+    for (AlarmCause const& cause : causesOf(key.kind, key.number)) {
+        AlarmKey sought{cause.cause, key.board, 0};
+        if (cause.where == CausedBy::Interface) sought.number = key.number;
+        if (cause.where == CausedBy::LineBelow) sought.number = condition.line;
+        if (cause.where == CausedBy::Agent) sought.board.clear();
+        bool const ofAnyLine = cause.where == CausedBy::LineOfBoard;
+        for (auto at = m_records.lower_bound(sought);
+             at != m_records.end() && at->first.kind == sought.kind &&
+             at->first.board == sought.board && (ofAnyLine || at->first.number == sought.number);
+             ++at)
+            if (stands(at->second)) return &at->second;
+    }
+    return nullptr;
+}
+
+void AlarmList::explain(Record& record, Instant now) {
+    Record const* const cause = causeOf(record.alarm.condition);
+    if (cause == nullptr) {
+        if (record.cause) record.held = now.steady;
+        record.cause.reset();
+        record.alarm.cause.clear();
+        return;
+    }
+    Condition const& condition = cause->alarm.condition;
+    if (record.cause == condition.key) return;
+    record.cause = condition.key;
+    record.alarm.cause =
+        std::string(alarmKind(condition.key.kind).name) + " on " + condition.resource;
+    m_report(AlarmEvent::Explained, record.alarm);
+}
+
 bool AlarmList::settle(Record& record, Instant now) {
     AlarmKey const& key = record.alarm.condition.key;
     AlarmPolicy const policy = m_policies.of(key.kind, key.number);
-    Clock::duration const lasted = now.steady - record.changed;
     if (record.present) {
-        if (!record.raised && policy.enabled && (record.flapping || lasted >= policy.raiseHold))
-            raise(record, now);
+        if (record.cause) {
+            if (record.raised) clear(record, now);
+            return true;
+        }
+        bool const isHeld = !record.flapping && now.steady - record.held < policy.raiseHold;
+        if (!record.raised && policy.enabled && !isHeld) raise(record, now);
         return true;
     }
+    Clock::duration const lasted = now.steady - record.changed;
     Clock::duration const quiet = kFlapWindow;
     if (record.raised) {
         Clock::duration const hold = policy.clearHold;
@@ -248,6 +341,7 @@ void AlarmList::clear(Record& record, Instant now) {
     if (m_cleared.size() >= kClearedCapacity) m_cleared.pop_front();
     m_cleared.push_back(record.alarm);
     record.alarm.count = 0;
+    causeChanged(record.alarm.condition.key, now);
 }
 
 AlarmList::KindCounts& AlarmList::countActive(AlarmKind kind, bool more, Clock::time_point now) {
@@ -269,8 +363,8 @@ std::optional<Clock::time_point> AlarmList::deadline(Record const& record) const
     AlarmPolicy const policy = m_policies.of(key.kind, key.number);
     Clock::duration const quiet = kFlapWindow;
     if (record.present) {
-        if (record.raised || !policy.enabled) return std::nullopt;
-        return record.changed + policy.raiseHold;
+        if (record.raised || !policy.enabled || record.cause) return std::nullopt;
+        return record.held + policy.raiseHold;
     }
     if (!record.raised) return record.changed + quiet;
     Clock::duration const hold = policy.clearHold;
@@ -282,6 +376,11 @@ void AlarmList::settleAndKeep(Records::iterator at, Instant now) {
         m_next = earlier(m_next, deadline(at->second));
     else
         m_records.erase(at);
+}
+
+void AlarmList::explainAndSettle(Records::iterator at, Instant now) {
+    if (at->second.present) explain(at->second, now);
+    settleAndKeep(at, now);
 }
 
 } // namespace kvloamd

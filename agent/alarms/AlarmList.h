@@ -9,6 +9,8 @@
 #include <map>
 #include <mutex>
 #include <optional>
+#include <set>
+#include <string>
 #include <vector>
 
 #include "agent/alarms/Alarm.h"
@@ -23,6 +25,11 @@ namespace kvloamd {
 /// begins `kFlaps` times within `kFlapWindow` flaps: its alarm is raised at once, and is not
 /// cleared before the condition has been absent for `kFlapWindow`, too. Every beginning of a
 /// condition is counted: in an alarm's `count`, or in `suppressed` if it never became an alarm.
+///
+/// A condition that follows from another (`causesOf`) is a consequence. While its cause is present
+/// or its cause's alarm is raised, it is no alarm, and ceases to be one if it came first. When the
+/// cause has gone and the consequence has not, its raise hold begins anew. A cause whose kind is
+/// switched off has no consequences.
 ///
 /// Conditions arrive in two ways. Events report each beginning and end at once, so that nothing is
 /// missed, however short. A comparison with everything that is wrong in a snapshot corrects what no
@@ -82,11 +89,15 @@ class AlarmList {
     void begin(Condition const& condition, Instant now, bool again = false);
     /// The condition has ended. No effect if it is absent.
     void end(AlarmKey const& key, Instant now);
+    /// Several conditions have begun, several have ended, at the same time.
+    void change(std::vector<Condition> const& begun, std::vector<AlarmKey> const& ended,
+                Instant now);
     /// Compares the conditions of the kinds of `scope` with those that are `present`, read at
     /// `read`: begins and ends what no event has reported.
     void compare(AlarmScope scope, std::vector<Condition> const& present, Clock::time_point read,
                  Instant now);
-    /// Raises and clears what has been held long enough. Returns when to call again at the latest;
+    /// Raises and clears what has been held long enough, and what has lost or got a cause. Returns
+    /// when to call again at the latest;
     /// nothing when no alarm is held.
     std::optional<Clock::time_point> advance(Instant now);
     /// Takes over another configuration.
@@ -115,7 +126,9 @@ class AlarmList {
         bool present = false;
         bool raised = false;
         bool flapping = false;
-        Clock::time_point changed; ///< when it began or ended last
+        Clock::time_point changed;     ///< when it began or ended last
+        Clock::time_point held;        ///< from when its raise hold counts
+        std::optional<AlarmKey> cause; ///< what it is a consequence of
         std::array<std::optional<Clock::time_point>, kFlaps>
             beginnings;       ///< the latest ones, as a ring
         std::size_t next = 0; ///< the oldest of `beginnings`
@@ -123,8 +136,16 @@ class AlarmList {
     using Records = std::map<AlarmKey, Record>;
 
     // All require `m_mutex`.
-    void beginLocked(Condition const& condition, Instant now, bool again);
+    /// Returns the record to settle; none if there is nothing to do.
+    Records::iterator beginLocked(Condition const& condition, Instant now, bool again);
     void endLocked(Record& record, Instant now);
+    /// A condition or alarm has come or gone: the next `advance` looks for its consequences.
+    void causeChanged(AlarmKey const& key, Instant now);
+    /// What the condition is a consequence of now; null if nothing.
+    Record const* causeOf(Condition const& condition) const;
+    bool stands(Record const& record) const;
+    /// Finds the cause of a condition that is present.
+    void explain(Record& record, Instant now);
     void countBeginning(Record& record, Instant now);
     /// Raises or clears, if it is time to. Returns false if the record is of no use any more.
     bool settle(Record& record, Instant now);
@@ -134,6 +155,8 @@ class AlarmList {
     KindCounts& countActive(AlarmKind kind, bool more, Clock::time_point now);
     std::optional<Clock::time_point> deadline(Record const& record) const;
     void settleAndKeep(Records::iterator at, Instant now);
+    /// The same, with a look at its cause.
+    void explainAndSettle(Records::iterator at, Instant now);
 
     Report m_report;
     std::size_t m_capacity;
@@ -145,6 +168,8 @@ class AlarmList {
     Counts m_counts;
     std::map<AlarmKind, KindCounts> m_kinds;
     std::uint64_t m_version = 1;
+    /// Whose conditions may have another cause now; empty: everybody's.
+    std::set<std::string> m_changedBoards;
     std::optional<Clock::time_point> m_next; ///< not after the earliest deadline of a record
 };
 

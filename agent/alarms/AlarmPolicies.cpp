@@ -53,7 +53,7 @@ std::string AlarmPolicies::configure(std::string_view entry) {
     std::string_view number = name;
     AlarmKindInfo const* const kind = findAlarmKind(takeUntil(number, '.'));
     if (kind == nullptr)
-        return quoted(name) + " is no kind of alarm; see the list of kinds in docs/alarms.md";
+        return quoted(name) + " is no kind of alarm; see the list of kinds in docs/operating.md";
     std::optional<std::uint32_t> value;
     if (name.find('.') != std::string_view::npos) {
         constexpr std::uint32_t kHighestFault = 65535;
@@ -64,7 +64,7 @@ std::string AlarmPolicies::configure(std::string_view entry) {
     }
     std::pair const key(kind->kind, value);
     if (m_configured.contains(key)) return quoted(name) + " is configured twice";
-    AlarmPolicy policy{kind->severity, kind->raiseHold, kind->clearHold};
+    AlarmPolicy policy{kind->severity, defaultRaiseHold(*kind, value.value_or(0)), kind->clearHold};
     if (rest.empty())
         return quoted(entry) + " configures nothing; write it like " + kind->name + "=major";
     while (!rest.empty()) {
@@ -85,7 +85,7 @@ AlarmPolicy AlarmPolicies::of(AlarmKind kind, std::uint32_t number) const {
     if (auto const found = m_configured.find({kind, std::nullopt}); found != m_configured.end())
         return found->second;
     AlarmKindInfo const& info = alarmKind(kind);
-    return {info.severity, info.raiseHold, info.clearHold};
+    return {info.severity, defaultRaiseHold(info, number), info.clearHold};
 }
 
 } // namespace kvloamd

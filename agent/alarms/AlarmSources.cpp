@@ -92,9 +92,9 @@ class Reading {
     void readChannels() {
         for (LapdRow const& channel : m_snapshot.interfaces.lapds) {
             if (channel.operStatus == ISDNDChannelStatusInactive)
-                addOfInterface(AlarmKind::ChannelInactive, channel.ifIndex);
+                addOfInterface(AlarmKind::ChannelInactive, channel.ifIndex, lineBelow(channel));
             else if (channel.operStatus == ISDNDChannelStatusL1Active)
-                addOfInterface(AlarmKind::ChannelLayer2Down, channel.ifIndex);
+                addOfInterface(AlarmKind::ChannelLayer2Down, channel.ifIndex, lineBelow(channel));
         }
     }
     /// Of lines and channels, their own alarms say what is wrong.
@@ -119,9 +119,17 @@ class Reading {
         auto const found = std::ranges::lower_bound(all, ifIndex, {}, &InterfaceRow::ifIndex);
         return found == all.end() || found->ifIndex != ifIndex ? nullptr : &*found;
     }
-    void addOfInterface(AlarmKind kind, std::uint32_t ifIndex) {
-        if (InterfaceRow const* const row = interface(ifIndex))
-            add(interfaceCondition(kind, *row, findBoard(m_snapshot, row->boardIndex)));
+    void addOfInterface(AlarmKind kind, std::uint32_t ifIndex, std::uint32_t line = 0) {
+        InterfaceRow const* const row = interface(ifIndex);
+        if (row == nullptr) return;
+        add(interfaceCondition(kind, *row, findBoard(m_snapshot, row->boardIndex)));
+        m_conditions.back().line = line;
+    }
+    /// What the channel stands on; 0 if that is not known.
+    std::uint32_t lineBelow(LapdRow const& channel) const {
+        auto const& stack = m_snapshot.interfaces.stack;
+        auto const found = std::ranges::lower_bound(stack, StackRow{channel.ifIndex, 1});
+        return found == stack.end() || found->higher != channel.ifIndex ? 0 : found->lower;
     }
 
     Snapshot const& m_snapshot;

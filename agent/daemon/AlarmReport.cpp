@@ -5,6 +5,7 @@
 #include <string>
 #include <variant>
 
+#include "agent/alarms/TypeLimits.h"
 #include "agent/log/Log.h"
 
 namespace kvloamd {
@@ -18,6 +19,7 @@ char const* eventName(AlarmEvent event) {
     case AlarmEvent::Cleared:
         return "cleared";
     case AlarmEvent::SeverityChanged:
+    case AlarmEvent::Explained:
         break;
     }
     return "changed";
@@ -30,6 +32,7 @@ JournalEvent journalEvent(AlarmEvent event) {
     case AlarmEvent::Cleared:
         return JournalEvent::AlarmCleared;
     case AlarmEvent::SeverityChanged:
+    case AlarmEvent::Explained:
         break;
     }
     return JournalEvent::AlarmChanged;
@@ -42,18 +45,34 @@ LogLevel levelOf(AlarmEvent event, AlarmSeverity severity) {
 }
 
 std::string textOf(AlarmEvent event, Alarm const& alarm, AlarmKindInfo const& kind) {
+    std::string const detail =
+        alarm.condition.text.empty() ? std::string() : " (" + alarm.condition.text + ")";
+    if (event == AlarmEvent::Explained)
+        return std::string(kind.name) + " on " + alarm.condition.resource + detail +
+               " follows from " + alarm.cause;
     std::string text = "alarm " + std::string(eventName(event)) + ": " +
                        severityName(alarm.severity) + " " + kind.name + " on " +
                        alarm.condition.resource;
     if (event == AlarmEvent::Raised) text += std::string(": ") + kind.meaning;
-    if (event != AlarmEvent::Cleared && !alarm.condition.text.empty())
-        text += " (" + alarm.condition.text + ")";
+    if (event != AlarmEvent::Cleared) text += detail;
+    if (event == AlarmEvent::Cleared && !alarm.cause.empty())
+        text += ", because it follows from " + alarm.cause;
     if (alarm.count > 1) text += ", " + std::to_string(alarm.count) + " times";
     return text;
 }
 
+/// "kvlThresholdES15m" for the setting of that limit; empty for any other setting.
+std::string thresholdColumn(Setting setting) {
+    for (std::size_t threshold = 0; threshold < kThresholds; ++threshold)
+        if (thresholdSetting(threshold) == setting)
+            return "kvlT" + std::string(alarmKind(thresholdKind(threshold)).name).substr(1);
+    return {};
+}
+
 std::string textOf(SettingKey const& key) {
     std::string const index = std::to_string(key.index);
+    if (std::string const column = thresholdColumn(key.setting); !column.empty())
+        return column + "." + index;
     switch (key.setting) {
     case Setting::LineStatusChangeTraps:
         return "dsx1LineStatusChangeTrapEnable." + index;
@@ -71,6 +90,8 @@ std::string textOf(SettingKey const& key) {
         return "entPhysicalAssetID." + index;
     case Setting::EntityUris:
         return "entPhysicalUris." + index;
+    case Setting::FirstThreshold: // has its column's name already
+        break;
     }
     return "setting " + std::to_string(static_cast<int>(key.setting)) + "." + index;
 }
@@ -139,6 +160,10 @@ std::uint32_t AlarmReport::report(AlarmEvent event, Alarm const& alarm) {
     AlarmKindInfo const& kind = alarmKind(alarm.condition.key.kind);
     std::uint32_t const ifIndex = alarm.condition.ifIndex;
     std::string const text = textOf(event, alarm, kind);
+    if (event == AlarmEvent::Explained) {
+        log(LogLevel::Info, text, {{"KVL_BOARD", alarm.condition.key.board}});
+        return 0; // no event of an alarm
+    }
     log(levelOf(event, alarm.severity), text,
         {{"KVL_ALARM", kind.name},
          {"KVL_ALARM_EVENT", eventName(event)},

@@ -4,6 +4,7 @@
 
 #include <optional>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "agent/daemon/Options.h"
@@ -32,6 +33,18 @@ class HttpSide {
     std::string m_token;
     std::vector<ListeningSocket> m_sockets;
     std::optional<HttpServer> m_server;
+};
+
+/// A scope during which requests are answered. What they are answered from outlives the scope.
+class HttpScope {
+  public:
+    HttpScope(HttpSide& side, HttpServed served) : m_side(side) { m_side.serve(std::move(served)); }
+    ~HttpScope() { m_side.stop(); }
+    HttpScope(HttpScope const&) = delete;
+    HttpScope& operator=(HttpScope const&) = delete;
+
+  private:
+    HttpSide& m_side;
 };
 
 /// What stands against the HTTP side that the options describe, one line for each fault.

@@ -8,6 +8,7 @@
 #include <set>
 #include <sstream>
 #include <system_error>
+#include <utility>
 
 #include <CLI/CLI.hpp>
 
@@ -39,6 +40,18 @@ std::string checkLogLevel(std::string const& text) {
 
 std::string checkAlarm(std::string const& text) {
     return AlarmPolicies().configure(text);
+}
+
+std::string checkThreshold(std::string const& text) {
+    return TypeLimits().configure(text);
+}
+
+/// Enters `entries`, which are right one by one, in `configured`. Returns the first fault.
+template <class Configured>
+std::string configureAll(Configured& configured, std::vector<std::string> const& entries) {
+    for (std::string const& entry : entries)
+        if (std::string fault = configured.configure(entry); !fault.empty()) return fault;
+    return {};
 }
 
 /// The SNMP library takes an empty address for port 161 on all interfaces.
@@ -224,6 +237,12 @@ std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
            "or agentStoreUnreadable=off; repeatable")
         ->type_name("KIND=POLICY")
         ->check(checkAlarm);
+    std::vector<std::string> thresholds;
+    app.add_option("--threshold", thresholds,
+                   "Limits on what lines of a type (t1, e1, j1) may count before that is an alarm, "
+                   "as in t1=es15m=65,es24h=648,uas15m=10; repeatable")
+        ->type_name("TYPE=LIMITS")
+        ->check(checkThreshold);
     app.add_flag("--check-config", options.checkConfig,
                  "Check options, modules and configuration, then exit")
         ->configurable(false);
@@ -256,12 +275,13 @@ std::variant<Options, Exit> parseOptions(int argc, char const* const* argv) {
             return Exit{kExitFailure, inFile(line) + text};
         return Exit{kExitUsage, std::move(text) + "; try kvloamd --help"};
     }
-    for (std::string const& alarm : alarms) {
-        std::string const fault = options.alarmPolicies.configure(alarm);
+    for (auto const& [option, fault] :
+         {std::pair("--alarm: ", configureAll(options.alarmPolicies, alarms)),
+          std::pair("--threshold: ", configureAll(options.typeLimits, thresholds))}) {
         if (fault.empty()) continue;
-        if (int const line = config->lineOf("--alarm: "); line > 0)
-            return Exit{kExitFailure, inFile(line) + "--alarm: " + fault};
-        return Exit{kExitUsage, "--alarm: " + fault + "; try kvloamd --help"};
+        if (int const line = config->lineOf(option); line > 0)
+            return Exit{kExitFailure, inFile(line) + option + fault};
+        return Exit{kExitUsage, option + fault + "; try kvloamd --help"};
     }
     options.logLevel = kLogLevels.at(CLI::detail::to_lower(logLevel));
     if (agentxOption->count() > 0 && options.agentx.empty()) options.agentx = kMasterAddress;

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "agent/alarms/AlarmPolicies.h"
+#include "agent/alarms/TypeLimits.h"
 #include "agent/log/Log.h"
 #include "agent/rows/Oid.h"
 
@@ -27,6 +28,7 @@ struct Options {
     std::string httpTokenFile; ///< empty: no token
     LogLevel logLevel = LogLevel::Info;
     AlarmPolicies alarmPolicies;
+    TypeLimits typeLimits;
     bool checkConfig = false;
     bool checkSnmpConfig = false; ///< check only what a reload reads; for the agent itself
 

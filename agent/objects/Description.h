@@ -29,6 +29,8 @@ struct Writable {
     int lowest; ///< an enumeration without gaps is the range of its numbers; of a text: its length
     int highest;
     Characters characters = Characters::Utf8; ///< of a text
+    /// The number that means: forget what was set, so that the row says what counts.
+    std::optional<int> forgetting = std::nullopt;
 };
 
 /// A number of an enumeration, and its name in the MIB module.

@@ -15,13 +15,14 @@ namespace {
 /// A scalar's one instance.
 constexpr std::uint32_t kScalarIndex[] = {0};
 
-/// Whether a column that is `writable` takes `asked`; then `value` is it.
-SetFault accept(Writable const& writable, ValueType type, Value const& asked, SettingValue& value) {
+/// Whether a column that is `writable` takes `asked`; then `value` is what to set.
+SetFault accept(Writable const& writable, ValueType type, Value const& asked,
+                std::optional<SettingValue>& value) {
     if (type == ValueType::Integer) {
         auto const* const integer = std::get_if<std::int64_t>(&asked);
         if (integer == nullptr) return SetFault::WrongType;
         if (*integer < writable.lowest || *integer > writable.highest) return SetFault::WrongValue;
-        value = static_cast<int>(*integer);
+        if (writable.forgetting != *integer) value = static_cast<int>(*integer);
         return SetFault::None;
     }
     auto const octets = octetsOf(asked);
@@ -110,7 +111,7 @@ SetFault ObjectTree::test(Facts const& facts, OidView name, Value const& asked,
     if (node == nullptr || node->table == nullptr) return SetFault::NotWritable;
     auto const writable = node->table->column(node->column).details.writable;
     if (!writable) return SetFault::NotWritable;
-    SettingValue value;
+    std::optional<SettingValue> value;
     if (SetFault const fault = accept(*writable, node->type, asked, value); fault != SetFault::None)
         return fault;
     Instance present;

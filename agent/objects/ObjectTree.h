@@ -41,10 +41,11 @@ enum class SetFault {
     NoCreation   ///< there is no such instance, and setting it would not make one
 };
 
-/// A setting and what it is to be. `Settings::exchange` makes the change, and undoes it.
+/// A setting and what it is to be; nothing: it is forgotten. `Settings::exchange` makes the change,
+/// and undoes it.
 struct Change {
     SettingKey key;
-    SettingValue value;
+    std::optional<SettingValue> value;
 };
 
 /// An `ObjectTree` holds all scalars and columns in the order of their places. Immutable. Every

@@ -6,7 +6,8 @@ namespace kvloamd {
 std::vector<Table const*> tables() {
     return {&boardTable(),          &moduleTable(),    &serviceTable(),   &deviceTable(),
             &subDeviceTable(),      &processorTable(), &storeTable(),     &processTable(),
-            &resourceDeviceTable(), &faultTable(),     &interfaceTable(), &alarmTable()};
+            &resourceDeviceTable(), &faultTable(),     &interfaceTable(), &alarmTable(),
+            &thresholdTable()};
 }
 
 } // namespace kvloamd

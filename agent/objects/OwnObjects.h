@@ -30,6 +30,7 @@ Table const& resourceDeviceTable();
 Table const& faultTable();
 Table const& interfaceTable();
 Table const& alarmTable();
+Table const& thresholdTable();
 
 /// Every table.
 std::vector<Table const*> tables();

@@ -22,6 +22,7 @@ enum class Setting : int {
     InterfaceAlias = 3,        ///< of an interface: a text
     CircuitIdentifier = 10,    ///< of a line: a text
     CallInformationTraps = 11, ///< of a signalling channel: 1 enabled, 2 disabled
+    FirstThreshold = 20,       ///< of a line: a limit; with those that follow, see ThresholdRow.h
     EntityAlias = 1000,        ///< of a physical entity: a text, as the next two
     EntityAssetId = 1001,
     EntityUris = 1002

@@ -21,6 +21,7 @@
 #include "agent/rows/ResourceRow.h"
 #include "agent/rows/ServiceRows.h"
 #include "agent/rows/Settings.h"
+#include "agent/rows/ThresholdRow.h"
 
 namespace kvloamd {
 
@@ -39,6 +40,7 @@ struct Snapshot {
         std::make_shared<NotificationLogRows>();                                          ///< set
     std::shared_ptr<PlatformRecords const> records = std::make_shared<PlatformRecords>(); ///< set
     InterfaceRows interfaces;
+    std::vector<ThresholdRow> thresholds; ///< of the lines that keep a history
     EntityRows entities;
     std::uint32_t interfaceConflicts = 0;        ///< of ifIndices with the host's own interfaces
     Persistence persistence = Persistence::Kept; ///< of the indices and settings

@@ -45,6 +45,16 @@ class SubagentSetTest : public MasterFixture {
     std::string m_linkTraps;
 };
 
+TEST_F(SubagentSetTest, LimitOfALineIsSetAndForgotten) {
+    constexpr char kLimit[] = "1.3.6.1.4.1.32473.1.1.13.1.1.2.1000";
+    start();
+    EXPECT_EQ(get(kLimit), "INTEGER: 0 seconds");
+    set({kLimit, "i", "65"});
+    EXPECT_EQ(get(kLimit), "INTEGER: 65 seconds");
+    set({kLimit, "i", "-1"});
+    EXPECT_EQ(get(kLimit), "INTEGER: 0 seconds");
+}
+
 TEST_F(SubagentSetTest, LinesTrapsAreSwitched) {
     start();
     for (int round = 0; round < 2; ++round) {

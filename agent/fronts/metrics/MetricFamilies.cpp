@@ -69,6 +69,7 @@ constexpr char kInventory[] = "inventory, which does not change by itself; see t
 constexpr char kFromSettled[] = "falls, and begins anew every 15 minutes; see the totals of lines";
 constexpr char kStructure[] = "structure, which does not change by itself; see the JSON API";
 constexpr char kAlarms[] = "see kvloam_alarm_active";
+constexpr char kLimits[] = "limits, which operators set; see the JSON API";
 constexpr char kFollows[] = "follows from the states of boards and lines";
 
 constexpr Hidden kHidden[] = {
@@ -88,6 +89,7 @@ constexpr Hidden kHidden[] = {
     {"kvlProcessorTable", kInventory},
     {"kvlStoreTable", kInventory},
     {"kvlResourceDeviceTable", kInventory},
+    {"kvlThresholdTable", kLimits},
     {"kvlAlarmTable", kAlarms},
     {"alarmActiveTable", kAlarms},
     {"alarmActiveVariableTable", kAlarms},

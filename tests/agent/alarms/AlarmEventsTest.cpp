@@ -120,14 +120,24 @@ TEST_F(AlarmEventsTest, ReturningBoardIsNotGone) {
 }
 
 TEST_F(AlarmEventsTest, LineStatusBeginsAndEndsAlarmsBeforeTheNextSnapshot) {
-    m_events.lineStatus(1000, DS1LineStatusLossOfSignal | DS1LineStatusUnavailSigState);
-    EXPECT_THAT(active(), UnorderedElementsAre("dsx1LossOfSignal of board S1, T1 line trunk-1",
+    m_events.lineStatus(1000, DS1LineStatusRcvFarEndLOF | DS1LineStatusUnavailSigState);
+    EXPECT_THAT(active(), UnorderedElementsAre("dsx1RcvFarEndLOF of board S1, T1 line trunk-1",
                                                "dsx1UnavailSigState of board S1, T1 line trunk-1"));
     m_events.lineStatus(1000, DS1LineStatusUnavailSigState);
     EXPECT_THAT(active(), ElementsAre("dsx1UnavailSigState of board S1, T1 line trunk-1"));
     m_events.lineStatus(1000, DS1LineStatusNoAlarm);
     EXPECT_THAT(active(), IsEmpty());
     EXPECT_EQ(m_list.counts().begun, 2U);
+}
+
+TEST_F(AlarmEventsTest, FailuresThatBeginAndEndTogetherAreOneAlarm) {
+    m_events.lineStatus(1000, DS1LineStatusUnavailSigState | DS1LineStatusLossOfFrame |
+                                  DS1LineStatusLossOfSignal);
+    EXPECT_THAT(active(), ElementsAre("dsx1LossOfSignal of board S1, T1 line trunk-1"));
+    m_events.lineStatus(1000, DS1LineStatusNoAlarm);
+    m_list.advance(Instant::now());
+    EXPECT_THAT(active(), IsEmpty());
+    EXPECT_EQ(m_list.counts().raised, 1U);
 }
 
 TEST_F(AlarmEventsTest, AlarmThatIsOverBeforeTheNextSnapshotIsCounted) {
@@ -150,12 +160,12 @@ TEST_F(AlarmEventsTest, LoopbackIsLoggedButNoAlarm) {
 }
 
 TEST_F(AlarmEventsTest, FaultStaysUntilTheSnapshotDoesNotListIt) {
-    m_events.fault(true, 1, "S1", 256);
-    m_events.fault(true, 1, "S1", 256);
-    m_events.fault(false, 1, "S1", 256);
+    m_events.fault(true, 1, "S1", 17);
+    m_events.fault(true, 1, "S1", 17);
+    m_events.fault(false, 1, "S1", 17);
     FaultRow fault;
     fault.boardIndex = 1;
-    fault.value = 256;
+    fault.value = 17;
     m_snapshot.faults.rows = {fault};
     update();
     EXPECT_THAT(active(), ElementsAre("platformFault of board S1"));
@@ -163,7 +173,7 @@ TEST_F(AlarmEventsTest, FaultStaysUntilTheSnapshotDoesNotListIt) {
     m_snapshot.faults.rows.clear();
     update();
     EXPECT_THAT(active(), IsEmpty());
-    EXPECT_THAT(m_log.take(), HasSubstr("board S1: fault 256 raised"));
+    EXPECT_THAT(m_log.take(), HasSubstr("board S1: fault 17 raised"));
 }
 
 } // namespace

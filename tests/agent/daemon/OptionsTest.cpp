@@ -231,6 +231,24 @@ TEST_F(OptionsTest, WrongAlarmOfTheFileIsReportedWithItsLine) {
                 AllOf(HasSubstr(name + ":2: "), HasSubstr("'linkDwn' is no kind of alarm")));
 }
 
+TEST_F(OptionsTest, LimitsOfLinesAreConfiguredInTheFile) {
+    constexpr int kT1 = 2;
+    EXPECT_EQ(options({}).typeLimits, TypeLimits{});
+    Options const read =
+        options({"--config", file("threshold = [\"t1=es15m=65,css24h=4\", \"e1=uas15m=10\"]\n")});
+    EXPECT_EQ(read.typeLimits.of(kT1)[kErroredSeconds15m], 65);
+    EXPECT_EQ(read.typeLimits.of(kT1)[kControlledSlipSeconds24h], 4);
+}
+
+TEST_F(OptionsTest, WrongLimitsOfTheFileAreReportedWithTheirLine) {
+    std::string const wrong = file("\nthreshold = [\"t1=es15m=many\"]\n");
+    EXPECT_THAT(refusal({"--config", wrong.c_str()}).text,
+                AllOf(HasSubstr(wrong + ":2: "), HasSubstr("'es15m=many'")));
+    std::string const twice = file("threshold = [\"t1=es15m=1\", \"t1=es24h=1\"]\n");
+    EXPECT_THAT(refusal({"--config", twice.c_str()}).text,
+                AllOf(HasSubstr(twice + ":1: "), HasSubstr("'t1' is configured twice")));
+}
+
 TEST_F(OptionsTest, AlarmThatIsConfiguredTwiceIsReportedWithItsLine) {
     std::string const name = file("alarm = [\"linkDown=minor\", \"linkDown=major\"]\n");
     EXPECT_THAT(refusal({"--config", name.c_str()}).text,

@@ -237,6 +237,7 @@ TEST_F(PlatformReaderTest, StoreIsConfiguredByItsDirectory) {
 }
 
 TEST_F(PlatformReaderTest, StoreOfAnotherChassisIsLoggedOnce) {
+    m_always.read(both()); // which opens this test's store
     sim::command({{"command", "store-remove"}, {"serial", "S5"}});
     testing::internal::CaptureStderr();
     m_always.read(both());

@@ -1,7 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The view of the journal, live.
 
-import { byId, make, setText, setTime, shown, words } from "/page/dom.js";
+import { byId, make, setAttribute, setText, setTime, shown, words } from "/page/dom.js";
 import { Rows } from "/page/rows.js";
 import { makeState, severityState, showState } from "/page/states.js";
 import { subjectOf } from "/page/summary.js";
@@ -40,20 +40,20 @@ export class JournalView {
             keyOf: (entry) => entry.number,
             create: () => {
                 const row = make("div", "", "", { role: "row" });
-                const cells = Array.from({ length: 5 }, () => make("span", "", "", { role: "gridcell" }));
+                const cells = Array.from({ length: 4 }, () => make("span", "", "", { role: "gridcell" }));
                 cells[0].append(makeState("severity"));
                 cells[2].append(make("time"));
                 row.append(...cells);
                 return row;
             },
             update: (row, entry) => {
-                const [event, resource, time, text, number] = row.children;
+                const [event, resource, time, text] = row.children;
                 showState(event.firstElementChild, eventState(entry), "severity");
                 const place = [entry.board, entry.line].filter(Boolean).join(", ");
                 setText(resource, place || words(entry.event));
                 setTime(time.firstElementChild, entry.date, this.agent.now());
                 setText(text, shown(entry.text));
-                setText(number, `no. ${shown(entry.number)}`);
+                setAttribute(text, "title", entry.text);
             },
             choose: (entry) => {
                 const subject = subjectOf(entry);

@@ -26,6 +26,7 @@ export class LinesView {
         this.stripAddress = null;
         this.rows = new Rows(byId("lines"), {
             height: 36,
+            narrow: 76,
             header: byId("lines").firstElementChild,
             keyOf: (line) => line.ifIndex,
             create: () => this.create(),

@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The alarms, and how many boards, lines and alarms there are.
 
-import { byId, count, make, patchList, setClass, setHidden, setText, setTime, shown, span, words } from "/page/dom.js";
+import {
+    byId, count, make, patchList, setAttribute, setClass, setHidden, setText, setTime, shown, span, words,
+} from "/page/dom.js";
 import { Rows } from "/page/rows.js";
 import { boardState, makeState, rank, severityState, showState } from "/page/states.js";
 
@@ -56,6 +58,7 @@ export class Alarms {
         setText(since.lastElementChild, Number.isNaN(age) ? "" : ` for ${span(age)}`);
         setClass(since.firstElementChild, "wide-only");
         setText(text, alarm.text || words(alarm.kind));
+        setAttribute(text, "title", alarm.text);
         const notes = [];
         if (alarm.times > 1) notes.push(`${shown(alarm.times)} times`);
         if (alarm.state === "ending") notes.push("ending");

@@ -252,16 +252,17 @@ class AccessibilityTest(PageCase):
             agent.lines[1].update(lineStatus=["dsx1RcvFarEndLOF"])
             agent.channels = [fake.channel(agent.lines[0], slot, operStatus="active") for slot in range(1, 25)]
             severities = ("critical", "major", "minor", "warning", "indeterminate")
-            agent.alarms = [fake.alarm(number, severity, f"board NX5{number:04}", "text", boardIndex=number, times=number)
+            agent.alarms = [fake.alarm(number, severity, f"board NX5{number:04}", "text", boardIndex=number,
+                                       times=number)
                             for number, severity in enumerate(severities, 1)]
             agent.journal = [fake.entry(1, "alarmRaised", "raised", severity="minor"),
                              fake.entry(2, "alarmCleared", "cleared"),
                              fake.entry(3, "agentStarted", "started"), fake.entry(4, "setting", "set")]
-        for scheme in ("light", "dark"):
-            self.tab.scheme(scheme)
-            for view in ("boards", "boards/1", "lines", "lines/1011", "channels", "channels/1011", "journal", "health"):
-                self.show(view)
-                self.wait_for_rounds(2)
+        for view in ("boards", "boards/1", "lines", "lines/1011", "channels", "channels/1011", "journal", "health"):
+            self.show(view)
+            self.wait_for_rounds(2)
+            for scheme in ("light", "dark"):
+                self.tab.scheme(scheme)
                 self.assertEqual(accessibility.faults(self.tab), [], f"{view}, {scheme}")
 
     def test_of_an_agent_that_is_away_has_no_faults(self):
@@ -319,6 +320,10 @@ class AppearanceTest(PageCase):
             self.wait_for_rounds(2)
             width = self.tab.run("document.documentElement.scrollWidth")
             self.assertLessEqual(width, 360, view)
+            cut = self.tab.run("""[...document.querySelectorAll(".rows-row [role=gridcell]")]
+                .filter((cell) => cell.checkVisibility() && cell.getBoundingClientRect().right > 360)
+                .map((cell) => cell.innerText || cell.innerHTML)""")
+            self.assertEqual(cut, [], view)
 
 
 class LargeTest(PageCase):
