@@ -70,6 +70,7 @@ constexpr char kFromSettled[] = "falls, and begins anew every 15 minutes; see th
 constexpr char kStructure[] = "structure, which does not change by itself; see the JSON API";
 constexpr char kAlarms[] = "see kvloam_alarm_active";
 constexpr char kLimits[] = "limits, which operators set; see the JSON API";
+constexpr char kLog[] = "a log of what was sent; see kvloam_notifications_sent_total";
 constexpr char kFollows[] = "follows from the states of boards and lines";
 
 constexpr Hidden kHidden[] = {
@@ -96,6 +97,10 @@ constexpr Hidden kHidden[] = {
     {"alarmActiveStatsTable", "the same as kvlAlarmCount and kvlAlarmsRaised"},
     {"alarmClearTable", "past; see kvloam_alarm_transitions_total"},
     {"alarmModelTable", kStructure},
+    {"nlmConfigLogTable", kLog},
+    {"nlmStatsLogTable", kLog},
+    {"nlmLogTable", kLog},
+    {"nlmLogVariableTable", kLog},
 };
 
 /// Objects whose metric has another name than the rule gives, or that have none.
@@ -187,8 +192,13 @@ class Catalogue {
         for (auto const& all : {tables(), standardTables()})
             for (Table const* const table : all)
                 hide(*table);
-        for (Scalar const& scalar : standardScalars())
-            unshown.push_back({scalar.name, "says how many rows there are, or when they changed"});
+        for (Scalar const& scalar : standardScalars()) {
+            std::string_view const name = scalar.name;
+            unshown.push_back({scalar.name, name.starts_with("nlm") ? kLog
+                                            : name.starts_with("alarm")
+                                                ? kAlarms
+                                                : "the size of a table, or its changes"});
+        }
     }
 
     std::vector<MetricGroup> groups;
