@@ -130,7 +130,7 @@ Cell operStatus(Json const& interface) {
 int gravity(std::string const& severity) {
     static constexpr std::array<std::string_view, 6> kAscending = {
         "cleared", "indeterminate", "warning", "minor", "major", "critical"};
-    auto const found = std::ranges::find(kAscending, severity);
+    auto const* const found = std::ranges::find(kAscending, severity);
     return found == kAscending.end() ? 0 : static_cast<int>(found - kAscending.begin());
 }
 

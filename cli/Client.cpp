@@ -148,7 +148,7 @@ Client::Response Client::perform(std::string const& url, std::string const& etag
     auto const addHeader = [&](std::string const& header) {
         curl_slist* const longer = curl_slist_append(headers.get(), header.c_str());
         if (longer == nullptr) throw CliError(kFailure, "out of memory");
-        headers.release();
+        static_cast<void>(headers.release()); // it is part of the longer list
         headers.reset(longer);
     };
     addHeader("Accept: application/json");

@@ -35,6 +35,9 @@ struct Options {
     std::vector<std::string> lines;
     bool asOpenMetrics = false;
     JournalOptions journal;
+    std::string input;
+    std::string output;
+    int port = 8161;
     CheckLimits limits;
     Action action = showOverview;
 };
@@ -134,6 +137,25 @@ void addViews(CLI::App& app, Options& options) {
     }
 }
 
+void addFleet(CLI::App& app, Options& options) {
+    auto* const fleet = app.add_subcommand("fleet", "What monitoring engines need to know");
+    fleet->fallthrough()->require_subcommand(1);
+    auto* const targets = addCommand(
+        *fleet, options, "targets", "Make Prometheus's file of targets from a list of agents",
+        [&options](Session& session) {
+            return makeTargets(session, options.input, options.output, options.port);
+        });
+    targets
+        ->add_option("list", options.input,
+                     "Lines of ADDRESS [SITE [CHASSIS]] (default: standard input)")
+        ->type_name("FILE");
+    targets->add_option("--output", options.output, "File (default: standard output)")
+        ->type_name("FILE");
+    targets->add_option("--port", options.port, "Port of addresses that have none (default: 8161)")
+        ->type_name("NUMBER")
+        ->check(CLI::Range(1, 65535));
+}
+
 void addOthers(CLI::App& app, Options& options) {
     auto* const journal =
         addCommand(app, options, "journal", "What has happened, the newest entry last",
@@ -205,6 +227,7 @@ int run(int argc, char const* const* argv, std::function<Screen()> const& screen
     app.require_subcommand(0, 1);
     addViews(app, options);
     addOthers(app, options);
+    addFleet(app, options);
     std::function<void()> printScript;
     shells::addCompletionCommands(app, printScript, {"BOARD", "LINE", "TABLE"});
     auto const isCheck = [&] { return app.got_subcommand("check"); };

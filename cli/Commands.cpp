@@ -3,10 +3,13 @@
 
 #include <algorithm>
 #include <chrono>
+#include <fstream>
+#include <iostream>
 #include <thread>
 
 #include "cli/Cells.h"
 #include "cli/Details.h"
+#include "cli/FleetTargets.h"
 #include "cli/History.h"
 #include "cli/Journal.h"
 #include "cli/Text.h"
@@ -240,6 +243,21 @@ int showScalars(Session& session) {
     for (auto const& [name, value] : objectIn(answer, "scalars").items())
         pairs.emplace_back(name, Cell{valueText(value)});
     printPairs(session.out, session.screen, pairs);
+    return kSuccess;
+}
+
+int makeTargets(Session& session, std::string const& input, std::string const& output, int port) {
+    std::ifstream file;
+    if (!input.empty()) {
+        file.open(input);
+        if (!file) throw CliError(kFailure, input + ": cannot be read");
+    }
+    std::string const text = input.empty() ? discoveryFile(std::cin, "standard input", port)
+                                           : discoveryFile(file, input, port);
+    if (output.empty())
+        session.out << text;
+    else
+        replaceFile(output, text);
     return kSuccess;
 }
 

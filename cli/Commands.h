@@ -39,6 +39,10 @@ int showTables(Session& session);
 int showTable(Session& session, std::string const& table);
 int showScalars(Session& session);
 
+/// Makes of the list of agents in `input` the file `output` for Prometheus; empty names are
+/// standard input and output. Asks no agent.
+int makeTargets(Session& session, std::string const& input, std::string const& output, int port);
+
 /// Prints the names of things of a kind, for completion: "board", "line" or "table". It fails
 /// without a word.
 int printNames(Session& session, std::string const& kind);

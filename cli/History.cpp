@@ -114,7 +114,7 @@ void printTimes(View const& view, LineHistory const& history, std::size_t group)
         if (!isEdge && step <= kLabel) continue;
         std::size_t place = kMargin + i / group;
         // The last label ends where the plot does.
-        if (i > 0 && i == LineHistory::kIntervals) place -= std::min(place, kLabel);
+        if (i == LineHistory::kIntervals) place -= std::min(place, kLabel);
         if (place < times.size() + (i > 0 ? 1 : 0)) continue;
         times.resize(place, ' ');
         times += localTime(begin + lengthOf(i));

@@ -58,7 +58,7 @@ Cell octets(Json const& row, Date) {
     auto const number = numberIn(row, Name.text);
     if (!number) return {"-"};
     constexpr char const* kUnits[] = {"", " k", " M", " G", " T", " P", " E"};
-    double rest = static_cast<double>(*number);
+    auto rest = static_cast<double>(*number);
     std::size_t unit = 0;
     for (; rest >= 10000 && unit + 1 < std::size(kUnits); ++unit)
         rest /= 1000;

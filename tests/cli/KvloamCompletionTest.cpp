@@ -79,20 +79,22 @@ TEST_F(KvloamCompletionTest, BashOffersTheAgentsNames) {
     FakeAgent agent(m_directory.file("socket"), {{"boards", samples::kBoards},
                                                  {"lines", samples::kLines},
                                                  {"tables", R"({"tables":["ifTable"]})"}});
-    EXPECT_THAT(complete({"board", ""}), ElementsAre("NX50001", "Z70002"));
-    EXPECT_THAT(complete({"board", "NX"}), ElementsAre("NX50001"));
-    EXPECT_THAT(complete({"line", "nx5-trunk-2"}), ElementsAre("nx5-trunk-2"));
-    EXPECT_THAT(complete({"history", "--openmetrics", "nx5-trunk-1", "nx"}),
+    EXPECT_THAT(complete({"--timeout", "60", "board", ""}), ElementsAre("NX50001", "Z70002"));
+    EXPECT_THAT(complete({"board", "--timeout", "60", "NX"}), ElementsAre("NX50001"));
+    EXPECT_THAT(complete({"--timeout", "60", "line", "nx5-trunk-2"}), ElementsAre("nx5-trunk-2"));
+    EXPECT_THAT(complete({"--timeout", "60", "history", "--openmetrics", "nx5-trunk-1", "nx"}),
                 ElementsAre("nx5-trunk-1", "nx5-trunk-2"));
-    EXPECT_THAT(complete({"table", "if"}), ElementsAre("ifTable"));
+    EXPECT_THAT(complete({"--timeout", "60", "table", "if"}), ElementsAre("ifTable"));
 }
 
 TEST_F(KvloamCompletionTest, BashAsksTheAgentThatTheCommandLineNames) {
     FakeAgent agent;
     agent.answerApi("boards", samples::kBoards);
-    EXPECT_THAT(complete({"--host", agent.host(), "board", "Z"}), ElementsAre("Z70002"));
+    EXPECT_THAT(complete({"--timeout", "60", "--host", agent.host(), "board", "Z"}),
+                ElementsAre("Z70002"));
     // bash makes words of "=" and ":".
-    EXPECT_THAT(complete({"board", "--host", "=", agent.host(), "Z"}), ElementsAre("Z70002"));
+    EXPECT_THAT(complete({"--timeout", "60", "board", "--host", "=", agent.host(), "Z"}),
+                ElementsAre("Z70002"));
 }
 
 TEST_F(KvloamCompletionTest, WithoutAnAgentBashOffersNothing) {

@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The real kvloam against an agent whose answers the test chooses.
+#include <fstream>
 #include <map>
 #include <memory>
 #include <sstream>
@@ -277,12 +278,27 @@ TEST_F(KvloamToolTest, AHostileAgentDoesNotReachTheTerminal) {
     }
 }
 
+TEST_F(KvloamToolTest, TargetsAreMadeWithoutAnAgent) {
+    m_agent.reset();
+    std::string const list = m_directory.file("hosts");
+    std::string const made = m_directory.file("targets.yml");
+    std::ofstream(list) << "192.0.2.11 north gw1\n";
+    std::string const printed = succeed({"fleet", "targets", list});
+    EXPECT_THAT(printed, HasSubstr("- targets: [\"192.0.2.11:8161\"]\n"));
+    EXPECT_EQ(succeed({"fleet", "targets", list, "--output", made}), "");
+    std::ostringstream written;
+    written << std::ifstream(made).rdbuf();
+    EXPECT_EQ(written.str(), printed);
+    expectRefusal({"fleet", "targets"}, 1, "standard input: lists no agent;");
+    expectRefusal({"fleet", "targets", m_directory.file("none")}, 1, "cannot be read\n");
+}
+
 TEST_F(KvloamToolTest, NamesForCompletionAreOneInALine) {
-    EXPECT_EQ(succeed({"names", "board"}), "NX50001\nZ70002\n");
-    EXPECT_EQ(succeed({"names", "line"}), "nx5-trunk-1\nnx5-trunk-2\n");
+    EXPECT_EQ(succeed({"--timeout", "60", "names", "board"}), "NX50001\nZ70002\n");
+    EXPECT_EQ(succeed({"--timeout", "60", "names", "line"}), "nx5-trunk-1\nnx5-trunk-2\n");
     m_agent->answerApi("boards", R"-({"boards":[{"serialNumber":"a b"},{"serialNumber":"$(x)"},)-"
                                  R"({"serialNumber":"C"}]})");
-    EXPECT_EQ(succeed({"names", "board"}), "C\n");
+    EXPECT_EQ(succeed({"--timeout", "60", "names", "board"}), "C\n");
     m_agent.reset();
     Finished const away = kvloam({"names", "board"});
     EXPECT_EQ(away.out + away.err, "");
