@@ -5,10 +5,9 @@
 
 #include <algorithm>
 #include <array>
-#include <charconv>
 #include <chrono>
-#include <initializer_list>
 
+#include "agent/fronts/http/Parameters.h"
 #include "agent/objects/OwnObjects.h"
 #include "agent/objects/StandardObjects.h"
 
@@ -38,35 +37,6 @@ List const& intervals() {
     return list;
 }
 
-/// The number that the whole of `text` is.
-template <class Number>
-std::optional<Number> numberIn(std::string_view text) {
-    Number number = 0;
-    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-    if (error != std::errc() || end != text.data() + text.size()) return std::nullopt;
-    return number;
-}
-
-/// A relative name such as "1000.5".
-std::optional<Oid> indexIn(std::string_view text) {
-    Oid index;
-    for (;;) {
-        std::size_t const end = std::min(text.find('.'), text.size());
-        auto const number = numberIn<std::uint32_t>(text.substr(0, end));
-        if (!number) return std::nullopt;
-        index.push_back(*number);
-        if (end == text.size()) return index;
-        text.remove_prefix(end + 1);
-    }
-}
-
-std::string dotted(OidView name) {
-    std::string text;
-    for (std::uint32_t const number : name)
-        text += (text.empty() ? "" : ".") + std::to_string(number);
-    return text;
-}
-
 /// Begins a document and says which snapshot it shows.
 JsonWriter begun(View const& view) {
     JsonWriter json;
@@ -85,39 +55,6 @@ std::string hostName() {
     std::array<char, 256> name{};
     gethostname(name.data(), name.size() - 1);
     return name.data();
-}
-
-/// Refuses parameters that the address does not know, which are misspelt as likely as not.
-void checkParameters(Target const& target, std::initializer_list<std::string_view> known) {
-    for (auto const& [name, value] : target.query)
-        if (std::ranges::find(known, name) == known.end())
-            throw HttpFault(400, "this address has no parameter '" + name + "'");
-}
-
-/// A parameter that is a number from `lowest` to `highest`; nothing when it is not there.
-template <class Number>
-std::optional<Number> numberParameter(Target const& target, std::string const& name, Number lowest,
-                                      Number highest) {
-    std::string const* const asked = target.parameter(name);
-    if (asked == nullptr) return std::nullopt;
-    auto const number = numberIn<Number>(*asked);
-    if (!number || *number < lowest || *number > highest)
-        throw HttpFault(400, "'" + name + "' is not a number from " + std::to_string(lowest) +
-                                 " to " + std::to_string(highest));
-    return number;
-}
-
-/// The words of a parameter between commas; none when it is not there.
-std::vector<std::string> wordsParameter(Target const& target, std::string const& name) {
-    std::vector<std::string> words;
-    std::string const* const asked = target.parameter(name);
-    if (asked == nullptr) return words;
-    for (std::size_t begin = 0; begin <= asked->size();) {
-        std::size_t const end = std::min(asked->find(',', begin), asked->size());
-        words.push_back(asked->substr(begin, end - begin));
-        begin = end + 1;
-    }
-    return words;
 }
 
 std::string noSuch(std::string_view what, std::string_view name) {

@@ -6,29 +6,17 @@
 #include <cstdint>
 #include <optional>
 #include <span>
-#include <stdexcept>
 #include <string>
 #include <string_view>
 #include <utility>
 #include <vector>
 
+#include "agent/fronts/http/HttpFault.h"
 #include "agent/fronts/http/Lists.h"
 #include "agent/fronts/http/Target.h"
 #include "agent/rows/JournalRow.h"
 
 namespace kvloamd {
-
-/// Why there is no document, and the HTTP status that says so.
-class HttpFault : public std::runtime_error {
-  public:
-    HttpFault(int status, std::string const& message)
-        : std::runtime_error(message), m_status(status) {}
-
-    int status() const { return m_status; }
-
-  private:
-    int m_status;
-};
 
 /// The objects that the documents show.
 struct DescribedObjects {

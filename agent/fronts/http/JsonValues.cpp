@@ -61,13 +61,6 @@ std::string hexadecimal(std::string_view octets) {
     return text;
 }
 
-std::string dotted(OidView name) {
-    std::string text;
-    for (std::uint32_t const number : name)
-        text += (text.empty() ? "" : ".") + std::to_string(number);
-    return text;
-}
-
 void writeOctets(JsonWriter& json, ValueType type, Details const& details,
                  std::string_view octets) {
     if (type == ValueType::Date) {
@@ -149,6 +142,13 @@ void writeValue(JsonWriter& json, ValueType type, Details const& details, Value 
         json.text(dotted(name->name));
     else
         json.null();
+}
+
+std::string dotted(OidView name) {
+    std::string text;
+    for (std::uint32_t const number : name)
+        text += (text.empty() ? "" : ".") + std::to_string(number);
+    return text;
 }
 
 std::optional<std::string> rfc3339(std::string_view octets) {

@@ -30,6 +30,9 @@ std::string keyOf(std::string_view name, std::string_view prefix, ValueType type
 void writeValue(JsonWriter& json, ValueType type, Details const& details, Value const& value,
                 Counters const& counters, Manner manner);
 
+/// A name as "1.3.6.1".
+std::string dotted(OidView name);
+
 /// A date of 8 or 11 octets in the form of RFC 3339, in UTC; nothing when it is none.
 std::optional<std::string> rfc3339(std::string_view octets);
 /// The same for milliseconds since the epoch.
