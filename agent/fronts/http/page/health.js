@@ -40,6 +40,7 @@ export class HealthView {
             ["Longest", milliseconds(health.longestRefreshTime)],
             ["Requests", health.requests], ["Notifications sent", health.notificationsSent],
             ["Notifications waiting", health.notificationsWaiting],
+            ["Informs not acknowledged", health.notificationsUnacknowledged],
             ["Notifications dropped", health.notificationsDropped],
             ["Conflicts of interface numbers", health.interfaceConflicts],
         ]);

@@ -278,7 +278,7 @@ class FakeAgent:
                 "agentVersion": "0.9.0", "notificationsDropped": 0, "boardCount": len(self.boards), "boardTableLastChangeSeconds": 0,
                 "boardStatusChanges": 0, "platformServiceStatus": 0, "platformServiceChangeDate": self.started,
                 "faultCount": 0, "faultsRaised": 0, "faultTableLastChangeSeconds": 0, "faultsUnlisted": 0,
-                "agentUpTimeSeconds": 18000.5, "notificationsSent": 12, "notificationsWaiting": 0, "requests": 4711,
+                "agentUpTimeSeconds": 18000.5, "notificationsSent": 12, "notificationsWaiting": 0, "notificationsUnacknowledged": 0, "requests": 4711,
                 "snapshots": self.snapshot, "snapshotAge": 3, "refreshTime": 7, "longestRefreshTime": 31,
                 "interfaceCount": len(self.lines), "lineCount": len(self.lines), "agentFront": "standAlone",
                 "alarmCount": len(self.alarms), "alarmsRaised": 9, "alarmsSuppressed": 1,
