@@ -2,8 +2,9 @@
 #include "agent/alarms/AlarmCauses.h"
 
 #include <algorithm>
+#include <cstddef>
 #include <iterator>
-#include <tuple>
+#include <utility>
 #include <vector>
 
 #include "agent/rows/FaultRow.h"
@@ -49,8 +50,10 @@ class Causes {
         std::ranges::stable_sort(m_all, {}, key);
     }
     std::span<AlarmCause const> of(AlarmKind kind, std::uint32_t fault) const {
-        auto const found = std::ranges::equal_range(m_all, std::pair(kind, fault), {}, key);
-        return {found.begin(), found.end()};
+        std::pair const sought(kind, fault);
+        auto const first = std::ranges::lower_bound(m_all, sought, {}, key);
+        auto const last = std::ranges::upper_bound(m_all, sought, {}, key);
+        return {m_all.data() + (first - m_all.begin()), static_cast<std::size_t>(last - first)};
     }
     bool isCause(AlarmKind kind) const {
         return std::ranges::find(m_all, kind, &AlarmCause::cause) != m_all.end();
@@ -80,9 +83,9 @@ class Causes {
         }
     }
     void addLines() {
-        for (auto failure = std::begin(kLineFailures); failure != std::end(kLineFailures);
+        for (auto const* failure = std::begin(kLineFailures); failure != std::end(kLineFailures);
              ++failure) {
-            for (auto later = std::next(failure); later != std::end(kLineFailures); ++later)
+            for (auto const* later = std::next(failure); later != std::end(kLineFailures); ++later)
                 add(*later, *failure, CausedBy::Interface);
             for (AlarmKind const kind : kOfLines)
                 add(kind, *failure, CausedBy::Interface);

@@ -33,8 +33,8 @@ Condition conditionOf(Snapshot const& snapshot, std::uint32_t ifIndex) {
 
 } // namespace
 
-ThresholdWatch::ThresholdWatch(AlarmList& list, Settings const& settings, TypeLimits limits)
-    : m_list(list), m_settings(settings), m_limits(std::move(limits)) {}
+ThresholdWatch::ThresholdWatch(AlarmList& list, Settings const& settings, TypeLimits const& limits)
+    : m_list(list), m_settings(settings), m_limits(limits) {}
 
 ThresholdWatch::~ThresholdWatch() {
     {
@@ -45,9 +45,9 @@ ThresholdWatch::~ThresholdWatch() {
     if (m_thread.joinable()) m_thread.join();
 }
 
-void ThresholdWatch::configure(TypeLimits limits) {
+void ThresholdWatch::configure(TypeLimits const& limits) {
     std::scoped_lock const guard(m_mutex);
-    m_limits = std::move(limits);
+    m_limits = limits;
 }
 
 void ThresholdWatch::update(Snapshot& snapshot, std::vector<PlacedLine> const& lines) {

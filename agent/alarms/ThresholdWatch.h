@@ -27,14 +27,14 @@ namespace kvloamd {
 class ThresholdWatch {
   public:
     /// `list` and `settings` outlive the watch.
-    ThresholdWatch(AlarmList& list, Settings const& settings, TypeLimits limits);
+    ThresholdWatch(AlarmList& list, Settings const& settings, TypeLimits const& limits);
     /// Ends the thread, after a look that has begun.
     ~ThresholdWatch();
     ThresholdWatch(ThresholdWatch const&) = delete;
     ThresholdWatch& operator=(ThresholdWatch const&) = delete;
 
     /// Takes over other limits of the types. They hold from the next `update` on.
-    void configure(TypeLimits limits);
+    void configure(TypeLimits const& limits);
     /// Takes over the lines of a refresh, and fills their rows in `snapshot`. Thread-bound: the
     /// collector.
     void update(Snapshot& snapshot, std::vector<PlacedLine> const& lines);
