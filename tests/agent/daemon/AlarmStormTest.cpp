@@ -23,12 +23,13 @@ namespace {
 using ::testing::IsEmpty;
 using ::testing::SizeIs;
 
-constexpr std::uint32_t kLines = 4000;
-constexpr std::uint32_t kFirstLine = 1000;
-constexpr std::uint32_t kThreads = 4;
-constexpr int kCut =
+constexpr std::uint32_t kStormLines = 4000;
+constexpr std::uint32_t kFirstStormLine = 1000;
+constexpr std::uint32_t kStormThreads = 4;
+constexpr int kCutOff =
     DS1LineStatusLossOfSignal | DS1LineStatusLossOfFrame | DS1LineStatusUnavailSigState;
-constexpr std::size_t kAlarms = 3 * kLines;
+/// One for each line: what follows from the loss of signal is no alarm of its own.
+constexpr std::size_t kStormAlarms = kStormLines;
 
 class AlarmStormTest : public ::testing::Test {
   protected:
@@ -40,9 +41,9 @@ class AlarmStormTest : public ::testing::Test {
         });
         Snapshot snapshot;
         snapshot.begun = Clock::now();
-        for (std::uint32_t line = 0; line < kLines; ++line) {
+        for (std::uint32_t line = 0; line < kStormLines; ++line) {
             InterfaceRow interface;
-            interface.ifIndex = kFirstLine + line;
+            interface.ifIndex = kFirstStormLine + line;
             snapshot.interfaces.interfaces.push_back(interface);
             LineRow row;
             row.ifIndex = interface.ifIndex;
@@ -54,11 +55,11 @@ class AlarmStormTest : public ::testing::Test {
     /// Reports this status of every line, and a notification for it, on several threads at once.
     void setAll(int status) {
         std::vector<std::jthread> threads;
-        for (std::uint32_t first = 0; first < kThreads; ++first)
+        for (std::uint32_t first = 0; first < kStormThreads; ++first)
             threads.emplace_back([this, first, status] {
-                for (std::uint32_t line = first; line < kLines; line += kThreads) {
-                    m_events.lineStatus(kFirstLine + line, status);
-                    m_queue.push(lineStatusChange(kFirstLine + line, status, 0, Clock::now()));
+                for (std::uint32_t line = first; line < kStormLines; line += kStormThreads) {
+                    m_events.lineStatus(kFirstStormLine + line, status);
+                    m_queue.push(lineStatusChange(kFirstStormLine + line, status, 0, Clock::now()));
                 }
             });
     }
@@ -89,36 +90,36 @@ class AlarmStormTest : public ::testing::Test {
 };
 
 TEST_F(AlarmStormTest, EveryAlarmIsInTheJournalAndInTheTables) {
-    setAll(kCut);
+    setAll(kCutOff);
     auto const rows = m_tables.rows();
-    EXPECT_THAT(rows->alarms, SizeIs(kAlarms));
-    EXPECT_THAT(rows->active, SizeIs(kAlarms));
+    EXPECT_THAT(rows->alarms, SizeIs(kStormAlarms));
+    EXPECT_THAT(rows->active, SizeIs(kStormAlarms));
     auto const entries = journal();
     EXPECT_EQ(m_report.counts().lost, 0U);
     std::set<std::pair<std::string, std::uint32_t>> raised;
     for (JournalRow const& row : entries)
         if (row.event == "alarmRaised") raised.insert({row.alarm, row.ifIndex});
-    EXPECT_THAT(raised, SizeIs(kAlarms));
-    EXPECT_EQ(countOf(entries, "alarmRaised"), kAlarms) << "none twice";
+    EXPECT_THAT(raised, SizeIs(kStormAlarms));
+    EXPECT_EQ(countOf(entries, "alarmRaised"), kStormAlarms) << "none twice";
     EXPECT_TRUE(std::ranges::is_sorted(entries, std::ranges::less_equal{}, &JournalRow::number));
 }
 
 TEST_F(AlarmStormTest, NotificationsThatFindTheQueueFullAreCountedAndInTheJournal) {
-    setAll(kCut);
+    setAll(kCutOff);
     setAll(DS1LineStatusNoAlarm);
     EXPECT_EQ(m_queue.size(), NotificationQueue::kCapacity);
-    EXPECT_EQ(m_counters.notificationsDropped, 2 * kLines - NotificationQueue::kCapacity);
+    EXPECT_EQ(m_counters.notificationsDropped, 2 * kStormLines - NotificationQueue::kCapacity);
     EXPECT_EQ(countOf(journal(), "notification"), m_counters.notificationsDropped);
     EXPECT_EQ(m_report.counts().lost, 0U);
 }
 
 TEST_F(AlarmStormTest, EveryAlarmIsClearedWhenTheLinesAreBack) {
-    setAll(kCut);
+    setAll(kCutOff);
     setAll(DS1LineStatusNoAlarm);
     auto const rows = m_tables.rows();
     EXPECT_THAT(rows->alarms, IsEmpty());
     EXPECT_THAT(rows->cleared, SizeIs(AlarmList::kClearedCapacity)) << "their number is bounded";
-    EXPECT_EQ(countOf(journal(), "alarmCleared"), kAlarms);
+    EXPECT_EQ(countOf(journal(), "alarmCleared"), kStormAlarms);
     m_report.close(m_alarms.active());
     EXPECT_THAT(Journal(m_folder.file("") + "/journal.sqlite").formerAlarms(), IsEmpty());
 }
