@@ -15,9 +15,15 @@ class Failure(Exception):
 
 
 def eventually(condition, patience, what):
-    """Waits until `condition` returns nothing; it returns what is still wrong."""
+    """Waits until `condition` returns nothing; it returns what is still wrong. A server that does not
+    answer on a busy machine is something to wait for, too."""
+    def attempt():
+        try:
+            return condition()
+        except OSError as error:
+            return str(error)
     limit = time.monotonic() + patience
-    while wrong := condition():
+    while wrong := attempt():
         if time.monotonic() > limit:
             raise Failure(f"{what}: {wrong}")
         time.sleep(0.2)
@@ -77,13 +83,8 @@ class Program:
         self.wait_for(lambda: None if text in self.log.read_text() else f"'{text}' is not in the log", patience)
 
     def wait_for_answer(self, url, patience):
-        def wrong():
-            try:
-                fetch(url)
-            except OSError as error:
-                return f"{url}: {error}"
-            return None
-        self.wait_for(wrong, patience)
+        # fetch() raises OSError until there is an answer.
+        self.wait_for(lambda: fetch(url, timeout=5) and None, patience)
 
     def processor(self):
         with open(f"/proc/{self._child.pid}/stat", encoding="ascii") as stat:
