@@ -105,7 +105,7 @@ _PROGRAM() {
     local word=${COMP_WORDS[COMP_CWORD]} command='' value='' words='' options='' file='' i
 )",
                       commands);
-    if (hasNames(commands)) out << "    local names='' option='' given=()\n";
+    if (hasNames(commands)) out << "    local names='' option='' text='' given=()\n";
     out << R"(    COMPREPLY=()
     for ((i = 1; i < COMP_CWORD; ++i)); do
         if [[ -n $value ]]; then # of the option before; bash makes "=" a word of its own
@@ -113,9 +113,15 @@ _PROGRAM() {
             value=''
 )";
     if (hasNames(commands)) {
-        out << "            case \"$option\" in\n            ";
+        out << R"(            text=${COMP_WORDS[i]}
+            while ((i + 2 < COMP_CWORD)) && [[ ${COMP_WORDS[i + 1]} == ':' ]]; do # of HOST:PORT
+                text+=:${COMP_WORDS[i + 2]}
+                ((i += 2))
+            done
+            case "$option" in
+            )";
         join(out, programOptions(commands), " | ");
-        out << ") given+=(\"$option\" \"${COMP_WORDS[i]}\") ;;\n            esac\n";
+        out << ") given+=(\"$option\" \"$text\") ;;\n            esac\n";
     }
     out << R"(            continue
         fi
