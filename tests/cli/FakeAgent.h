@@ -26,6 +26,7 @@ class FakeAgent {
                        std::map<std::string, std::string> const& answers = {});
     /// At a free port of the loopback address.
     FakeAgent();
+    // NOLINTNEXTLINE(bugprone-exception-escape): a test whose agent cannot be stopped may end
     ~FakeAgent();
     FakeAgent(FakeAgent const&) = delete;
     FakeAgent& operator=(FakeAgent const&) = delete;
