@@ -2,6 +2,7 @@
 // An agent that answers HTTP, and its clients.
 #pragma once
 
+#include <algorithm>
 #include <string>
 #include <vector>
 
@@ -27,6 +28,12 @@ class HttpFixture : public AgentFixture {
         auto const reply = support::HttpClient(socketPath()).ask("/api/v1/" + target);
         EXPECT_EQ(reply.status, 200) << target << ": " << reply.body;
         return reply.status == 200 ? Json::parse(reply.body) : Json();
+    }
+    /// Whether a value that was read between two others can be right.
+    static bool isBetween(Json const& before, Json const& value, Json const& after) {
+        if (value == before || value == after) return true;
+        return before.is_number() && value.is_number() && after.is_number() &&
+               std::min(before, after) <= value && value <= std::max(before, after);
     }
 };
 

@@ -131,13 +131,6 @@ Json expected(ColumnHead const& head, Walked const& walked) {
     return nameOf(head.details.names, number);
 }
 
-/// Whether a value that was read between two others can be right.
-bool isBetween(Json const& before, Json const& value, Json const& after) {
-    if (value == before || value == after) return true;
-    return before.is_number() && value.is_number() && after.is_number() &&
-           std::min(before, after) <= value && value <= std::max(before, after);
-}
-
 class HttpValuesTest : public HttpFixture {
   protected:
     struct Served {

@@ -8,7 +8,7 @@
 #include <gmock/gmock.h>
 #include <nlohmann/json.hpp>
 
-#include "tests/e2e/AgentFixture.h"
+#include "tests/e2e/HttpFixture.h"
 
 namespace kvloamd::e2e {
 namespace {
@@ -16,16 +16,15 @@ namespace {
 using ::testing::HasSubstr;
 using ::testing::Not;
 using ::testing::StartsWith;
-using Json = nlohmann::json;
 
-class KvloamTest : public AgentFixture {
+class KvloamTest : public HttpFixture {
   protected:
     KvloamTest() {
-        setVariable("KVLOAM_SOCKET", path("http.socket"));
+        setVariable("KVLOAM_SOCKET", socketPath());
         setVariable("LC_ALL", "C.UTF-8");
         setVariable("TZ", "UTC");
     }
-    void serve() { startAgent({"--http-socket", path("http.socket")}); }
+    void serve() { startHttpAgent(); }
 
     Result kvloam(std::vector<std::string> arguments) const {
         arguments.insert(arguments.begin(), KVLOAM);
@@ -158,6 +157,42 @@ TEST_F(KvloamTest, PrometheusTakesTheHistory) {
         valid += interval.at("validData") == true ? 1U : 0U;
     ASSERT_GT(valid, 50U);
     EXPECT_EQ(static_cast<std::size_t>(std::ranges::count(dumped.output, '{')), 10 * valid);
+}
+
+TEST_F(KvloamTest, EveryTableHasTheValuesThatTheAgentHas) {
+    serve();
+    sim({"fail", "3"}); // so that there is an alarm
+    ASSERT_TRUE(comesToShow({"alarms"}, "boardFailed"));
+    std::size_t values = 0;
+    // What differs between the two, unless rows have come or gone meanwhile.
+    auto const differences = [&](std::string const& table) -> std::vector<std::string> {
+        Json const before = document("tables/" + table)["rows"];
+        Json const shown = json({"table", table})["rows"];
+        Json const after = document("tables/" + table)["rows"];
+        if (before.size() != shown.size() || shown.size() != after.size())
+            return {"rows come and go"};
+        std::vector<std::string> found;
+        for (std::size_t row = 0; row < shown.size(); ++row) {
+            if (shown[row].size() != before[row].size()) found.push_back(shown[row].dump());
+            for (auto const& [key, value] : shown[row].items()) {
+                ++values;
+                if (!isBetween(before[row].value(key, Json("none")), value, after[row][key]))
+                    found.push_back(key + ": " + value.dump());
+            }
+        }
+        return found;
+    };
+    auto const tables = json({"tables"})["tables"].get<std::vector<std::string>>();
+    for (std::string const& table : tables) {
+        std::vector<std::string> found;
+        for (int attempt = 0; attempt < 3; ++attempt) {
+            found = differences(table);
+            if (found.empty()) break;
+        }
+        EXPECT_THAT(found, ::testing::IsEmpty()) << table;
+    }
+    EXPECT_GT(tables.size(), 40U);
+    EXPECT_GT(values, 2000U);
 }
 
 } // namespace
