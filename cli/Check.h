@@ -13,19 +13,20 @@ enum class PluginState : int { Ok = 0, Warning = 1, Critical = 2, Unknown = 3 };
 
 struct CheckLimits {
     std::string warning = "indeterminate"; ///< the least severity of an alarm that warns
-    std::string critical = "major";        ///< and that is critical
+    std::string critical = "major";        ///< the least severity of an alarm that is critical
     double oldest = 60;                    ///< seconds; an older snapshot is critical
 };
 
 struct CheckResult {
     PluginState state = PluginState::Unknown;
-    /// One line of state, a bar and performance data; then one line for each alarm, at most 20.
+    /// The state in one line, then "|" and performance data; then a line for each of up to 20
+    /// alarms.
     std::string text;
 };
 
-/// Throws CliError when the answers are none.
+/// Throws CliError when an answer lacks what it must have.
 CheckResult check(Overview const& overview, CheckLimits const& limits);
-/// The result when there is no answer.
+/// The result when the agent does not answer: unknown, because of `why`.
 CheckResult unknownResult(std::string const& why);
 
 } // namespace kvloam
