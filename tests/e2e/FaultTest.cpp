@@ -22,7 +22,8 @@ class FaultTest : public AgentFixture {
             "\tKVL-OAM-MIB::kvlNotifyFaultValue.0 = " + std::to_string(fault) +
             "\tKVL-OAM-MIB::kvlNotifyFaultPlatformBoard.0 = " + std::to_string(platformBoard) +
             "\tKVL-OAM-MIB::kvlNotifyFaultKind.0 = " + kindOf(fault) +
-            (index == 0 ? "\n" : "\tKVL-OAM-MIB::kvlBoardName." + std::to_string(index) + " = ");
+            (index == 0 ? "\tKVL-OAM-MIB::kvlEventNumber.0 = "
+                        : "\tKVL-OAM-MIB::kvlBoardName." + std::to_string(index) + " = ");
         EXPECT_TRUE(trapReceiver().waitFor(text)) << text << "not in:\n" << trapReceiver().output();
     }
     static std::string kindOf(int fault) {

@@ -192,12 +192,13 @@ TEST_F(PeerTest, WriterWithoutAViewReachesTheSettingsOnly) {
     Oid const usmUser{1, 3, 6, 1, 6, 3, 15, 1, 2, 2, 1, 13, 5, 1, 2, 3, 4, 5, 1, 97};
     cells.push_back({usmUser, integerValue(4)});
     // dsx1CircuitIdentifier, trap enables of lines, signalling channels and interfaces, ifAlias;
-    // entPhysicalAlias, AssetID and Uris.
+    // entPhysicalAlias, AssetID and Uris; kvlThresholdTable.
     std::vector<Oid> const settings{
         {1, 3, 6, 1, 2, 1, 10, 18, 6, 1, 8},       {1, 3, 6, 1, 2, 1, 10, 18, 6, 1, 17},
         {1, 3, 6, 1, 2, 1, 10, 20, 1, 3, 2, 1, 7}, {1, 3, 6, 1, 2, 1, 31, 1, 1, 1, 14},
         {1, 3, 6, 1, 2, 1, 31, 1, 1, 1, 18},       {1, 3, 6, 1, 2, 1, 47, 1, 1, 1, 1, 14},
-        {1, 3, 6, 1, 2, 1, 47, 1, 1, 1, 1, 15},    {1, 3, 6, 1, 2, 1, 47, 1, 1, 1, 1, 18}};
+        {1, 3, 6, 1, 2, 1, 47, 1, 1, 1, 1, 15},    {1, 3, 6, 1, 2, 1, 47, 1, 1, 1, 1, 18},
+        {1, 3, 6, 1, 4, 1, 32473, 1, 1, 13, 1, 1}};
     int settable = 0;
     for (Variable const& cell : cells) {
         udp.send(communityMessage(1, "private", {PduKind::Set, 0, 0, {cell}}));
