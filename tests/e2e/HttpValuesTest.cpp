@@ -90,7 +90,10 @@ Json dateOf(std::string const& octets) {
     date.tm_min = at(5);
     date.tm_sec = at(6);
     std::time_t time = timegm(&date);
-    if (octets.size() > 8) time -= (octets[8] == '+' ? 1 : -1) * (at(9) * 3600 + at(10) * 60);
+    if (octets.size() > 8) {
+        long const zone = at(9) * 3600L + at(10) * 60L;
+        time -= octets[8] == '+' ? zone : -zone;
+    }
     gmtime_r(&time, &date);
     char text[32];
     std::strftime(text, sizeof text, "%Y-%m-%dT%H:%M:%S", &date);

@@ -53,7 +53,7 @@ class InterfaceFixture : public AgentFixture {
     }
     /// The ifIndex of the line of that name; "none" when there is none.
     std::string lineNamed(std::string const& name) const {
-        for (auto const& [index, value] : column(std::string(kIfX) + "1"))
+        for (auto const& [index, value] : column(c(kIfX, 1)))
             if (value == "STRING: \"" + name + "\"") return index;
         return "none";
     }
