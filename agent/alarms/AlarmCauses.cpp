@@ -17,8 +17,8 @@ using enum AlarmKind;
 
 constexpr AlarmKind kBoardFailures[] = {BoardGone, BoardFailed, BoardStopped};
 
-/// What cuts a line off, the furthest from its consequences first. Whoever receives AIS has no
-/// frame.
+/// Failures that interrupt a line. Each causes those after it: without a signal there is no AIS,
+/// and a line that receives AIS has no frame alignment.
 constexpr AlarmKind kLineFailures[] = {LineLossOfSignal, LineRcvAIS, LineLossOfFrame};
 
 /// What only a line with frames can tell, or what follows from a failure.

@@ -17,15 +17,6 @@ namespace kvloamd {
 
 namespace {
 
-std::string dateText() {
-    std::time_t const now = std::time(nullptr);
-    std::tm utc{};
-    gmtime_r(&now, &utc);
-    char text[32];
-    std::strftime(text, sizeof text, "%Y%m%dT%H%M%SZ", &utc);
-    return text;
-}
-
 /// A number above all that a journal has given whose last number is not known: the seconds since
 /// the beginning of 2026. No journal gets more than one entry a second for years.
 std::uint32_t numberByTime() {
@@ -190,7 +181,7 @@ bool Journal::tryToWrite(std::vector<JournalEntry> const& batch, std::uint32_t n
 
 void Journal::setAside(std::string const& why) {
     m_file.reset();
-    std::string const aside = m_path + ".damaged-" + dateText();
+    std::string const aside = nameForDamaged(m_path);
     std::error_code fault;
     std::filesystem::rename(m_path, aside, fault);
     if (fault) throw DatabaseFault(why + ", and it cannot be renamed: " + fault.message());

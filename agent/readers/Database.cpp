@@ -2,6 +2,7 @@
 #include "agent/readers/Database.h"
 
 #include <algorithm>
+#include <ctime>
 #include <utility>
 
 #include <sqlite3.h>
@@ -133,6 +134,15 @@ Transaction::~Transaction() {
 void Transaction::commit() {
     m_database.execute("COMMIT");
     m_done = true;
+}
+
+std::string nameForDamaged(std::string const& path) {
+    std::time_t const now = std::time(nullptr);
+    std::tm utc{};
+    gmtime_r(&now, &utc);
+    char text[32];
+    std::strftime(text, sizeof text, "%Y%m%dT%H%M%SZ", &utc);
+    return path + ".damaged-" + text;
 }
 
 } // namespace kvloamd

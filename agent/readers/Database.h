@@ -101,4 +101,8 @@ class Transaction {
     bool m_done = false;
 };
 
+/// What a damaged file at `path` is renamed to: `<path>.damaged-<date>`, with the present time in
+/// UTC.
+std::string nameForDamaged(std::string const& path);
+
 } // namespace kvloamd

@@ -2,7 +2,6 @@
 #include "agent/readers/StateFile.h"
 
 #include <algorithm>
-#include <ctime>
 #include <filesystem>
 #include <system_error>
 #include <utility>
@@ -23,15 +22,6 @@ class NewerFile : public std::runtime_error {
   public:
     using std::runtime_error::runtime_error;
 };
-
-std::string dateText() {
-    std::time_t const now = std::time(nullptr);
-    std::tm utc{};
-    gmtime_r(&now, &utc);
-    char text[32];
-    std::strftime(text, sizeof text, "%Y%m%dT%H%M%SZ", &utc);
-    return text;
-}
 
 bool isEmpty(Database& database) {
     return database.number("SELECT count(*) FROM sqlite_master") == 0 &&
@@ -152,7 +142,7 @@ void StateFile::setAside(std::string const& why) {
         m_leftAlone = true;
         throw DatabaseFault(why);
     }
-    std::string const aside = m_path + ".damaged-" + dateText();
+    std::string const aside = nameForDamaged(m_path);
     std::error_code fault;
     std::filesystem::rename(m_path, aside, fault);
     if (fault) throw DatabaseFault(why + ", and it cannot be renamed: " + fault.message());

@@ -45,7 +45,7 @@ class HistoryTest : public testing::Test {
             lines.push_back(line);
         return lines;
     }
-    /// A line with every interval, without errors but for one second in each of `errored`.
+    /// A line with all 96 intervals. Those in `errored` have one errored second, the others none.
     static LineHistory wholeDay(std::vector<int> const& errored) {
         std::string intervals;
         for (int number = 1; number <= 96; ++number)

@@ -37,7 +37,7 @@ def counts(**changes):
 
 
 def intervals(**special):
-    """96 closed intervals, clean but for `i<number>`: counts, or None for one without valid data."""
+    """96 closed intervals without errors. `i5={...}` gives interval 5 counts, `i5=None` makes it invalid."""
     begin = now().replace(microsecond=0) - datetime.timedelta(seconds=300)
     result = []
     for number in range(1, 97):
