@@ -1,101 +1,16 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Requests and their answers, from a snapshot that the test makes.
-#include "agent/fronts/http/HttpAnswers.h"
-
-#include <set>
-
+// What the answers to HTTP requests contain.
 #include <gmock/gmock.h>
-#include <nlohmann/json.hpp>
 
-#include "agent/objects/OwnObjects.h"
-#include "agent/objects/StandardObjects.h"
-#include "board/Board.h"
-#include "board/ISDNChannel.h"
+#include "tests/agent/fronts/http/HttpAnswersFixture.h"
 
 namespace kvloamd {
 namespace {
 
-using Json = nlohmann::json;
-using ::testing::Contains;
 using ::testing::HasSubstr;
-using ::testing::Key;
 using ::testing::Not;
 
-DescribedObjects allObjects() {
-    DescribedObjects objects{tables(), {scalars(), standardScalars()}};
-    auto const standard = standardTables();
-    objects.tables.insert(objects.tables.end(), standard.begin(), standard.end());
-    return objects;
-}
-
-/// Board NX50001 with line trunk-1, which has two closed intervals and a channel; board 77.
-class HttpAnswersTest : public ::testing::Test {
-  protected:
-    HttpAnswersTest() {
-        m_snapshot->number = 7;
-        m_snapshot->begun = Clock::now();
-        BoardRow board;
-        board.boardIndex = 1;
-        board.status = BoardStatusStarted;
-        board.serialNumber = "NX50001";
-        BoardRow other;
-        other.boardIndex = 2;
-        other.serialNumber = "77";
-        m_snapshot->boards = {board, other};
-        InterfaceRow line;
-        line.ifIndex = 1000;
-        line.boardIndex = 1;
-        line.name = "trunk-1";
-        line.operStatus = kUp;
-        line.counters[kInOctets] = 0xfffffffffffffffeU;
-        InterfaceRow channel;
-        channel.ifIndex = 1001;
-        channel.boardIndex = 1;
-        channel.name = "trunk-1/1";
-        m_snapshot->interfaces.interfaces = {line, channel};
-        auto closed = std::make_shared<ClosedIntervals>();
-        closed->counts = {LineCounts{3, 2, 1}, LineCounts{}};
-        closed->valid = {true, false};
-        LineRow row;
-        row.ifIndex = 1000;
-        row.lineStatus = 64;
-        row.timeElapsed = 100;
-        row.closed = closed;
-        m_snapshot->interfaces.lines = {row};
-        BearerRow bearer;
-        bearer.ifIndex = 1001;
-        m_snapshot->interfaces.bearers = {bearer};
-        m_snapshot->interfaces.stack = {{0, 1001}, {1000, 0}, {1001, 1000}};
-        m_snapshot->interfaces.ds0Channels = {{1000, 5, 1001}};
-    }
-
-    HttpAnswer ask(HttpRequest const& request) { return m_answers.answer(request); }
-    HttpAnswer get(std::string_view target) {
-        return ask({.method = "GET", .target = target, .isLocal = true});
-    }
-    Json document(std::string_view target) {
-        HttpAnswer const answer = get(target);
-        EXPECT_EQ(answer.status, 200) << target << ": " << *answer.body;
-        return Json::parse(*answer.body);
-    }
-    static HttpRequest byTcp(std::string_view host) {
-        return {.method = "GET", .target = "/api/v1/boards", .host = host};
-    }
-
-    std::shared_ptr<Snapshot> m_snapshot = std::make_shared<Snapshot>();
-    Counters m_counters;
-    Settings m_settings;
-    JournalQuery m_asked;
-    std::optional<JournalPage> m_journal = JournalPage{};
-    std::uint32_t m_newest = 0;
-    HttpAnswers m_answers{{allObjects(), m_counters, m_settings, [this] { return m_snapshot; },
-                           [this](JournalQuery const& query) {
-                               m_asked = query;
-                               return m_journal;
-                           },
-                           [this] { return m_newest; }},
-                          "gw1.example"};
-};
+using HttpAnswersTest = HttpAnswersFixture;
 
 TEST_F(HttpAnswersTest, BoardsAreListedWithShortKeys) {
     Json const answer = document("/api/v1/boards");
@@ -250,127 +165,6 @@ TEST_F(HttpAnswersTest, AllOfASnapshotsAnswersShowTheSameSettings) {
     m_snapshot->number = 8;
     EXPECT_EQ(alias(), "to the carrier");
     EXPECT_EQ(document("/api/v1/tables/ifXTable")["rows"][0]["ifAlias"], "to the carrier");
-}
-
-TEST_F(HttpAnswersTest, KnownEtagIsAnsweredWithoutABody) {
-    std::string const etag = get("/api/v1/boards").etag;
-    HttpRequest request{.method = "GET", .target = "/api/v1/boards", .isLocal = true};
-    for (std::string const& known : {etag, "\"x\", W/" + etag, std::string("*")}) {
-        request.ifNoneMatch = known;
-        HttpAnswer const answer = ask(request);
-        EXPECT_EQ(answer.status, 304) << known;
-        EXPECT_TRUE(answer.body->empty());
-        EXPECT_EQ(answer.etag, etag);
-    }
-    m_snapshot->number = 8;
-    request.ifNoneMatch = "*";
-    EXPECT_EQ(ask(request).status, 304);
-    request.ifNoneMatch = etag;
-    HttpAnswer const renewed = ask(request);
-    EXPECT_EQ(renewed.status, 200);
-    EXPECT_NE(renewed.etag, etag);
-}
-
-TEST_F(HttpAnswersTest, AnotherRunsEtagIsUnknown) {
-    HttpRequest request{.method = "GET", .target = "/api/v1/boards", .isLocal = true};
-    request.ifNoneMatch = "\"7\"";
-    EXPECT_EQ(ask(request).status, 200);
-}
-
-TEST_F(HttpAnswersTest, OtherMethodsAreRefusedEverywhere) {
-    for (char const* const target : {"/api/v1/boards", "/nothing", "/"})
-        for (char const* const method : {"POST", "PUT", "DELETE", "OPTIONS", "get", ""}) {
-            HttpAnswer const answer = ask({.method = method, .target = target, .isLocal = true});
-            EXPECT_EQ(answer.status, 405) << method << ' ' << target;
-            EXPECT_THAT(answer.headers,
-                        Contains(std::pair<std::string, std::string>("Allow", "GET, HEAD")));
-        }
-}
-
-TEST_F(HttpAnswersTest, OtherAddressesAreNotFound) {
-    for (char const* const target :
-         {"/api", "/api/v1", "/api/v1/", "/api/v2/boards", "/api/v1/boards/", "/api/v1/boards/1/x",
-          "/api/v1/lines/x", "/page", "/page/", "/page/../Daemon.cpp", "/page/%2e%2e", "/boards",
-          "//api/v1/boards", "/API/v1/boards"}) {
-        HttpAnswer const answer = get(target);
-        EXPECT_EQ(answer.status, 404) << target;
-        EXPECT_EQ(Json::parse(*answer.body)["error"]["status"], 404);
-        EXPECT_EQ(answer.contentType, "application/json");
-    }
-}
-
-TEST_F(HttpAnswersTest, MalformedAddressIsABadRequest) {
-    EXPECT_EQ(get("/api/v1/%zz").status, 400);
-    EXPECT_EQ(get("*").status, 400);
-}
-
-TEST_F(HttpAnswersTest, NameThatIsNoTextIsAnsweredInUtf8) {
-    HttpAnswer const answer = get("/api/v1/lines/%ff%00%22");
-    EXPECT_EQ(answer.status, 404);
-    EXPECT_TRUE(Json::accept(*answer.body));
-}
-
-TEST_F(HttpAnswersTest, SizesAreLimited) {
-    HttpRequest request{.method = "GET", .isLocal = true};
-    std::string target = "/api/v1/boards/";
-    target.resize(HttpAnswers::kLongestTarget, 'x');
-    request.target = target;
-    EXPECT_EQ(ask(request).status, 404);
-    target += 'x';
-    request.target = target;
-    EXPECT_EQ(ask(request).status, 414);
-    request.target = "/api/v1/boards";
-    request.headerOctets = HttpAnswers::kMostHeaders;
-    EXPECT_EQ(ask(request).status, 200);
-    request.headerOctets = HttpAnswers::kMostHeaders + 1;
-    EXPECT_EQ(ask(request).status, 431);
-}
-
-TEST_F(HttpAnswersTest, HostOverTcpMustBeThisOne) {
-    for (char const* const host :
-         {"127.0.0.1", "127.0.0.1:8161", "localhost", "LocalHost:80", "[::1]", "[::1]:8161",
-          "10.1.2.3", "gw1.example", "GW1.example:8161"})
-        EXPECT_EQ(ask(byTcp(host)).status, 200) << host;
-    for (char const* const host :
-         {"evil.example", "localhost.evil.example", "127.0.0.1.evil.example", "", ":80", "[::1",
-          "[evil]", "gw1.example.evil", "1", "[", "[]"})
-        EXPECT_EQ(ask(byTcp(host)).status, 403) << host;
-    EXPECT_EQ(ask({.method = "GET", .target = "/api/v1/boards"}).status, 403);
-}
-
-TEST_F(HttpAnswersTest, TokenIsRequiredOverTcpOnly) {
-    m_answers.requireToken("0123456789abcdef");
-    HttpRequest request = byTcp("localhost");
-    HttpAnswer const refused = ask(request);
-    EXPECT_EQ(refused.status, 401);
-    EXPECT_THAT(refused.headers, Contains(Key("WWW-Authenticate")));
-    EXPECT_THAT(*refused.body, Not(HasSubstr("0123456789abcdef")));
-    for (char const* const wrong :
-         {"Bearer 0123456789abcdeg", "Bearer 0123456789abcde", "Bearer ",
-          "Bearer 0123456789abcdef0", "Basic 0123456789abcdef", "", "0123456789abcdef"}) {
-        request.authorization = wrong;
-        EXPECT_EQ(ask(request).status, 401) << wrong;
-    }
-    request.authorization = "bearer 0123456789abcdef";
-    EXPECT_EQ(ask(request).status, 200);
-    EXPECT_EQ(get("/api/v1/boards").status, 200);
-}
-
-TEST_F(HttpAnswersTest, PageNeedsNoToken) {
-    m_answers.requireToken("0123456789abcdef");
-    HttpRequest request = byTcp("localhost");
-    request.target = "/";
-    HttpAnswer const page = ask(request);
-    EXPECT_EQ(page.status, 200);
-    EXPECT_EQ(page.contentType, "text/html; charset=utf-8");
-    EXPECT_THAT(page.headers, Contains(Key("Content-Security-Policy")));
-    request.target = "/page/style.css";
-    EXPECT_EQ(ask(request).contentType, "text/css; charset=utf-8");
-    std::string const etag = ask(request).etag;
-    request.ifNoneMatch = etag;
-    EXPECT_EQ(ask(request).status, 304);
-    request.target = "/api/v1/health";
-    EXPECT_EQ(ask(request).status, 401);
 }
 
 TEST_F(HttpAnswersTest, RowsHaveTheAskedKeysOnly) {
