@@ -120,15 +120,15 @@ void StateFile::write() {
 void StateFile::checkContents() {
     if (m_database->number("PRAGMA application_id") != kApplicationId)
         throw DatabaseDamaged("it is another program's");
-    if (auto const version = m_database->number("PRAGMA user_version"); version > kVersion) {
+    auto const version = m_database->number("PRAGMA user_version");
+    if (version > kVersion) {
         m_leftAlone = true;
         throw NewerFile("a newer version of kvloamd has written it (its format is " +
                         std::to_string(version) + ", this version knows " +
                         std::to_string(kVersion) +
                         "); it is left alone: install that version again, or move the file away");
-    } else if (version != kVersion) {
-        throw DatabaseDamaged("it has no known format");
     }
+    if (version != kVersion) throw DatabaseDamaged("it has no known format");
     Statement check(*m_database, "PRAGMA quick_check(1)");
     check.step();
     if (check.text(0) != "ok") throw DatabaseDamaged(check.text(0));
