@@ -41,7 +41,7 @@ std::vector<LineAlarm> const& lineAlarms();
 std::vector<Condition> conditionsIn(Snapshot const& snapshot, std::vector<Condition> const& stopped,
                                     std::vector<Condition> const& gone);
 
-/// A `HealthWatch` finds out what is wrong with the agent itself. Thread-bound: the SNMP thread.
+/// A `HealthWatch` finds out what is wrong with the agent itself. Thread-bound: the alarm thread.
 class HealthWatch {
   public:
     /// The age of a snapshot that counts as stale: three times the longest pause between refreshes.

@@ -56,7 +56,7 @@ class AlarmReport {
 };
 
 /// An `AlarmClock` makes the alarm list follow the time, and watches the agent's own health.
-/// Thread-bound: the SNMP thread.
+/// Thread-bound: the alarm thread.
 class AlarmClock {
   public:
     /// The time between two looks at the agent's health.

@@ -16,6 +16,7 @@
 #include "agent/alarms/AlarmSources.h"
 #include "agent/alarms/ThresholdWatch.h"
 #include "agent/daemon/AlarmReport.h"
+#include "agent/daemon/AlarmThread.h"
 #include "agent/daemon/ConfigCheck.h"
 #include "agent/daemon/FrontChoice.h"
 #include "agent/daemon/HttpSide.h"
@@ -316,11 +317,16 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front, H
     EntityNotices entityNotices(boards.queue);
     AlarmClock alarmClock(boards.alarms, boards.alarmReport, boards.counters,
                           [&] { collector.renew(); });
+    AlarmThread alarmThread(
+        [&] { return alarmClock.advance(*collector.newest(), Instant::now()); });
     ServiceNotice notice;
     std::size_t const boardCount = collector.newest()->boards.size();
     std::string const serving = "serving " + std::to_string(boardCount) +
                                 (boardCount == 1 ? " board " : " boards ") + front.place();
-    front.watch(wakeup.descriptor(), [&] { wakeup.clear(); });
+    front.watch(wakeup.descriptor(), [&] {
+        wakeup.clear();
+        alarmThread.wake();
+    });
     ConfigCheck configCheck(options);
     front.watch(signals.descriptor(), [&] {
         while (auto const signal = signals.next()) {
@@ -346,23 +352,26 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front, H
     front.beforeSleep([&] {
         if (boards.settings.hasUnsaved()) collector.renew();
         auto const nextEntityNotice = entityNotices.update(collector.newest(), Clock::now());
-        auto const nextAlarm = alarmClock.advance(*collector.newest(), Instant::now());
         auto const nextNotification = notifier.send(collector.newest()->begun);
         boards.counters.events = boards.alarmReport.counts().last;
-        return earliest(earliest(nextEntityNotice, nextAlarm),
-                        earliest(nextNotification, notice.beat()));
+        return earliest(nextEntityNotice, earliest(nextNotification, notice.beat()));
     });
-    ListeningScope listening(boards, [&] { collector.renew(); });
+    ListeningScope listening(boards, [&] {
+        collector.renew();
+        alarmThread.wake();
+    });
     thresholds.start();
     start.end();
     log(LogLevel::Info, serving);
     notice.ready(serving);
+    alarmThread.wake();
     front.run();
     http.stop();
     signals.letStopThrough();
     notice.stopping();
     log(LogLevel::Info, "stopping");
     listening.stop();
+    entityNotices.finish();
     flushNotifications(notifier, boards.queue, front);
 }
 

@@ -17,20 +17,11 @@ constexpr std::uint32_t kOperDisabled[] = {131, 0, 2};
 constexpr std::uint32_t kAdmin[] = {131, 1, 1, 1, 2};
 constexpr std::uint32_t kAlarm[] = {131, 1, 1, 1, 5};
 
-NotifiedObject objectOf(EntityStateRow const& row, OidView column, ValueType type,
+NotifiedObject objectOf(std::uint32_t entity, OidView column, ValueType type,
                         std::variant<std::int64_t, std::string, Oid> value) {
     Oid name = joined(kStandardArc, column);
-    name.push_back(row.entity);
+    name.push_back(entity);
     return {std::move(name), type, std::move(value)};
-}
-
-Notification stateNotice(EntityStateRow const& row, OidView which, Clock::time_point when) {
-    return {
-        joined(kStandardArc, which),
-        {objectOf(row, kAdmin, ValueType::Integer, std::int64_t{static_cast<int>(row.state.admin)}),
-         objectOf(row, kAlarm, ValueType::Octets, std::string(1, row.state.alarm))},
-        when,
-        {.entity = row.entity}};
 }
 
 } // namespace
@@ -39,9 +30,11 @@ std::optional<Clock::time_point> EntityNotices::update(std::shared_ptr<Snapshot 
                                                        Clock::time_point now) {
     if (m_former && m_former != newest) {
         if (m_former->entities.lastChange != newest->entities.lastChange) m_changed = true;
-        queueStateChanges(*m_former, *newest);
+        findStateChanges(*m_former, *newest);
     }
     m_former = std::move(newest);
+    queueStateChanges(kBatch);
+    if (!m_stateChanges.empty()) return now;
     if (!m_changed) return std::nullopt;
     if (m_lastConfigChange && now < *m_lastConfigChange + kPause)
         return *m_lastConfigChange + kPause;
@@ -52,7 +45,7 @@ std::optional<Clock::time_point> EntityNotices::update(std::shared_ptr<Snapshot 
     return std::nullopt;
 }
 
-void EntityNotices::queueStateChanges(Snapshot const& former, Snapshot const& newest) {
+void EntityNotices::findStateChanges(Snapshot const& former, Snapshot const& newest) {
     auto before = former.entities.states.begin();
     auto const end = former.entities.states.end();
     for (EntityStateRow const& row : newest.entities.states) {
@@ -60,10 +53,26 @@ void EntityNotices::queueStateChanges(Snapshot const& former, Snapshot const& ne
             ++before;
         if (before == end) return;
         if (before->entity != row.entity || before->state.oper == row.state.oper) continue;
-        if (row.state.oper == OperState::Enabled)
-            m_queue.push(stateNotice(row, kOperEnabled, newest.begun));
-        else if (row.state.oper == OperState::Disabled)
-            m_queue.push(stateNotice(row, kOperDisabled, newest.begun));
+        if (row.state.oper == OperState::Enabled || row.state.oper == OperState::Disabled)
+            m_stateChanges.push_back({row.entity, row.state, newest.begun});
+    }
+}
+
+void EntityNotices::finish() {
+    queueStateChanges(m_stateChanges.size());
+}
+
+void EntityNotices::queueStateChanges(std::size_t most) {
+    for (std::size_t queued = 0; queued < most && !m_stateChanges.empty(); ++queued) {
+        auto const& [entity, state, when] = m_stateChanges.front();
+        OidView const which = state.oper == OperState::Enabled ? kOperEnabled : kOperDisabled;
+        m_queue.push({joined(kStandardArc, which),
+                      {objectOf(entity, kAdmin, ValueType::Integer,
+                                std::int64_t{static_cast<int>(state.admin)}),
+                       objectOf(entity, kAlarm, ValueType::Octets, std::string(1, state.alarm))},
+                      when,
+                      {.entity = entity}});
+        m_stateChanges.pop_front();
     }
 }
 

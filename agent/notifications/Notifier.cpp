@@ -6,8 +6,9 @@
 namespace kvloamd {
 
 std::optional<Clock::time_point> Notifier::send(Clock::time_point snapshotBegun) {
-    while (auto oldest = m_queue.oldest()) {
+    for (std::size_t sent = 0; auto oldest = m_queue.oldest(); ++sent) {
         if (!m_sink.ready()) return std::nullopt;
+        if (sent == kBatch) return Clock::now();
         if (oldest->when > snapshotBegun && Clock::now() < oldest->when + kPatience)
             return oldest->when + kPatience;
         handOver(std::move(*oldest));

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <chrono>
+#include <cstddef>
 #include <functional>
 #include <optional>
 #include <utility>
@@ -20,6 +21,10 @@ class Notifier {
     /// the notification longer than this.
     static constexpr std::chrono::milliseconds kPatience{1000};
 
+    /// How many notifications one call sends at most. What follows waits for the next call, so that
+    /// requests are answered in between.
+    static constexpr std::size_t kBatch = 32;
+
     /// Completes a notification that is about to be sent for the first time, and records it.
     using Complete = std::function<void(Notification&)>;
 
@@ -30,10 +35,11 @@ class Notifier {
     /// Sends, while the sink is ready, the notifications whose change a snapshot that was begun at
     /// `snapshotBegun` shows, and those that have waited for `kPatience`. A notification stays in
     /// the queue until the sink has delivered it. Returns the time of the next call if a
-    /// notification only waits for time to pass.
+    /// notification only waits for time to pass, or for the next batch.
     std::optional<Clock::time_point> send(Clock::time_point snapshotBegun);
 
-    /// Sends without waiting for a snapshot. Returns whether the queue is empty.
+    /// Sends without waiting for a snapshot or for the next batch. Returns whether the queue is
+    /// empty.
     bool sendAll();
 
   private:

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // A chassis loses its lines: everything that is wrong with 4000 of them is raised at once.
 #include <algorithm>
+#include <functional>
+#include <future>
 #include <set>
 #include <thread>
 #include <utility>
@@ -11,7 +13,11 @@
 #include "agent/alarms/AlarmEvents.h"
 #include "agent/alarms/AlarmTables.h"
 #include "agent/daemon/AlarmReport.h"
+#include "agent/daemon/AlarmThread.h"
+#include "agent/fronts/EventLoop.h"
+#include "agent/fronts/Wakeup.h"
 #include "agent/notifications/NotificationQueue.h"
+#include "agent/notifications/Notifier.h"
 #include "agent/notifications/StandardNotifications.h"
 #include "board/DS1LineDevice.h"
 #include "tests/support/LogCapture.h"
@@ -122,6 +128,73 @@ TEST_F(AlarmStormTest, EveryAlarmIsClearedWhenTheLinesAreBack) {
     EXPECT_EQ(countOf(journal(), "alarmCleared"), kStormAlarms);
     m_report.close(m_alarms.active());
     EXPECT_THAT(Journal(m_folder.file("") + "/journal.sqlite").formerAlarms(), IsEmpty());
+}
+
+/// A sink that takes everything at once.
+class OpenSink final : public NotificationSink {
+  public:
+    bool ready() const override { return true; }
+    void send(Notification const&, Delivered delivered) override { delivered(Delivery::Sent); }
+};
+
+TEST_F(AlarmStormTest, RequestsAreAnsweredBetweenBatchesOfNotifications) {
+    setAll(kCutOff);
+    OpenSink sink;
+    Notifier notifier(m_queue, sink,
+                      [this](Notification& notification) { m_report.record(notification, false); });
+    EventLoop loop;
+    loop.beforeSleep([&] { return notifier.send(Clock::now()); });
+    // A client that asks without a pause.
+    Wakeup client;
+    client.wake();
+    std::size_t waiting = m_queue.size();
+    std::size_t mostAtOnce = 0;
+    loop.watch(client.descriptor(), [&] {
+        mostAtOnce = std::max(mostAtOnce, waiting - m_queue.size());
+        waiting = m_queue.size();
+        if (waiting == 0) loop.stop();
+    });
+    loop.run(Clock::time_point::max());
+    EXPECT_EQ(mostAtOnce, Notifier::kBatch);
+    EXPECT_EQ(countOf(journal(), "notification"), kStormLines);
+}
+
+TEST_F(AlarmStormTest, AlarmsThatAreSettledKeepNobodyWaiting) {
+    // The journal takes the first alarm that time raises when the test says so.
+    std::promise<void> settling;
+    std::promise<void> goOn;
+    bool isFirst = true;
+    AlarmList alarms({}, [&](AlarmEvent event, Alarm const& alarm) {
+        if (std::exchange(isFirst, false)) {
+            settling.set_value();
+            goOn.get_future().wait();
+        }
+        return m_report.report(event, alarm);
+    });
+    // All of them are held.
+    Instant const begun = Instant::now();
+    for (std::uint32_t channel = 1; channel <= kStormLines; ++channel)
+        alarms.begin({{AlarmKind::ChannelInactive, "B", channel}, "channel", 1, channel, {}, {}},
+                     begun);
+    Instant const later{begun.steady + std::chrono::hours(1), begun.date};
+    std::vector<std::uint32_t> asked;
+    {
+        AlarmThread thread(
+            [&] { return alarms.advance(later).value_or(Clock::time_point::max()); });
+        thread.wake();
+        settling.get_future().wait();
+        // The thread is in the middle of it. A new reading wakes it, and others are recorded.
+        thread.wake();
+        m_report.note(JournalEvent::Configuration, "meanwhile");
+        asked.push_back(m_report.counts().last);
+        goOn.set_value();
+        // The end of the agent waits for it.
+    }
+    EXPECT_THAT(alarms.active(), SizeIs(kStormLines));
+    auto const entries = journal();
+    EXPECT_EQ(countOf(entries, "alarmRaised"), kStormLines);
+    EXPECT_TRUE(std::ranges::is_sorted(entries, std::ranges::less_equal{}, &JournalRow::number));
+    EXPECT_LT(asked.front(), alarms.active().front().number) << "recorded before the first alarm";
 }
 
 } // namespace

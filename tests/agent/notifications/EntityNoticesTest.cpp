@@ -1,6 +1,10 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/notifications/EntityNotices.h"
 
+#include <algorithm>
+#include <functional>
+#include <optional>
+
 #include <gmock/gmock.h>
 
 namespace kvloamd {
@@ -142,6 +146,83 @@ TEST_F(EntityNoticesTest, EntityThatBecomesEnabledFromAnyOtherStateIsTold) {
     setOper({{1, OperState::Enabled}, {2, OperState::Enabled}, {3, OperState::Enabled}});
     tell();
     EXPECT_THAT(told(), ElementsAre(kEnabled, kEnabled, kEnabled));
+}
+
+/// Many entities change their state at once.
+class EntityNoticesBurstTest : public EntityNoticesTest {
+  protected:
+    static constexpr std::uint32_t kMany = 2 * EntityNotices::kBatch + 1;
+
+    void setAll(OperState oper) {
+        std::vector<std::pair<std::uint32_t, OperState>> states;
+        for (std::uint32_t entity = 1; entity <= kMany; ++entity)
+            states.emplace_back(entity, oper);
+        setOper(states);
+    }
+    /// The entities of the notifications queued since the last call.
+    std::vector<std::uint32_t> entitiesTold() {
+        std::vector<std::uint32_t> entities;
+        while (auto const notification = m_queue.pop())
+            entities.push_back(notification->subject.entity);
+        return entities;
+    }
+    /// Calls again, as long as that is wanted at once, with the snapshot that was published last.
+    void tellTheRest(std::shared_ptr<Snapshot const> const& newest) {
+        while (m_notices.update(newest, m_now) == m_now) {
+        }
+    }
+};
+
+TEST_F(EntityNoticesBurstTest, StatesAreToldInBatchesInTheirOrder) {
+    setAll(OperState::Enabled);
+    tell();
+    setAll(OperState::Disabled);
+    auto const newest = std::make_shared<Snapshot const>(m_next);
+    std::vector<std::uint32_t> all;
+    for (std::optional<Clock::time_point> again = m_now; again;) {
+        again = m_notices.update(newest, m_now);
+        auto const batch = entitiesTold();
+        EXPECT_LE(batch.size(), EntityNotices::kBatch);
+        EXPECT_EQ(again.has_value(), batch.size() == EntityNotices::kBatch);
+        all.insert(all.end(), batch.begin(), batch.end());
+    }
+    ASSERT_THAT(all, SizeIs(kMany));
+    EXPECT_TRUE(std::ranges::is_sorted(all, std::ranges::less_equal{}));
+}
+
+TEST_F(EntityNoticesBurstTest, SnapshotThatArrivesMeanwhileIsToldAfterTheOneBefore) {
+    setAll(OperState::Enabled);
+    tell();
+    setAll(OperState::Disabled);
+    EXPECT_EQ(tell(), m_now);
+    setAll(OperState::Enabled);
+    auto const newest = std::make_shared<Snapshot const>(m_next);
+    tellTheRest(newest);
+    std::vector<Oid> const all = told();
+    ASSERT_THAT(all, SizeIs(2 * kMany));
+    EXPECT_EQ(std::count(all.begin(), all.begin() + kMany, kDisabled), kMany);
+    EXPECT_EQ(std::count(all.begin() + kMany, all.end(), kEnabled), kMany);
+}
+
+TEST_F(EntityNoticesBurstTest, ChangeOfTheEntitiesIsToldAfterTheirStates) {
+    setAll(OperState::Enabled);
+    tell();
+    setAll(OperState::Disabled);
+    ++m_next.entities.lastChange;
+    auto const newest = std::make_shared<Snapshot const>(m_next);
+    tellTheRest(newest);
+    std::vector<Oid> const all = told();
+    ASSERT_THAT(all, SizeIs(kMany + 1));
+    EXPECT_EQ(all.back(), kConfigChange);
+}
+
+TEST_F(EntityNoticesBurstTest, NothingIsLeftWhenTheAgentStops) {
+    setAll(OperState::Enabled);
+    tell();
+    setAll(OperState::Disabled);
+    EXPECT_EQ(tell(), m_now);
+    m_notices.finish();
+    EXPECT_THAT(told(), SizeIs(kMany));
 }
 
 TEST_F(EntityNoticesTest, OtherStatesAreNotTold) {

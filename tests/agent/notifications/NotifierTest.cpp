@@ -1,10 +1,15 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/notifications/Notifier.h"
 
-#include <gtest/gtest.h>
+#include <algorithm>
+#include <numeric>
+
+#include <gmock/gmock.h>
 
 namespace kvloamd {
 namespace {
+
+using ::testing::SizeIs;
 
 /// A sink that is ready when the test says so.
 class ScriptedSink final : public NotificationSink {
@@ -48,6 +53,34 @@ TEST_F(NotifierTest, ChangesThatTheSnapshotShowsAreSentInOrder) {
     EXPECT_EQ(announceShown(), std::nullopt);
     EXPECT_EQ(m_sink.sent, (std::vector<std::uint32_t>{1, 2}));
     EXPECT_EQ(m_queue.size(), 0U);
+}
+
+TEST_F(NotifierTest, BurstIsSentInBatchesInItsOrder) {
+    std::vector<std::uint32_t> all(2 * Notifier::kBatch + 1);
+    std::iota(all.begin(), all.end(), 1);
+    std::ranges::for_each(all, [this](std::uint32_t number) { change(number); });
+    for (std::size_t batches = 1; batches <= 2; ++batches) {
+        auto const again = announceShown();
+        EXPECT_THAT(m_sink.sent, SizeIs(batches * Notifier::kBatch));
+        ASSERT_TRUE(again.has_value());
+        EXPECT_LE(*again, Clock::now()) << "the next batch waits for nothing";
+    }
+    EXPECT_EQ(announceShown(), std::nullopt);
+    EXPECT_EQ(m_sink.sent, all);
+}
+
+TEST_F(NotifierTest, BatchThatLeavesNothingIsTheLast) {
+    for (std::uint32_t number = 1; number <= Notifier::kBatch; ++number)
+        change(number);
+    EXPECT_EQ(announceShown(), std::nullopt);
+    EXPECT_EQ(m_queue.size(), 0U);
+}
+
+TEST_F(NotifierTest, LastWordsAreNoBatches) {
+    for (std::uint32_t number = 1; number <= 3 * Notifier::kBatch; ++number)
+        change(number);
+    EXPECT_TRUE(m_notifier.sendAll());
+    EXPECT_THAT(m_sink.sent, SizeIs(3 * Notifier::kBatch));
 }
 
 TEST_F(NotifierTest, ChangeThatTheSnapshotDoesNotShowWaits) {
