@@ -1,11 +1,9 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Runs the library's benchmarks and prints the ratios to their peers.
+// Runs the library's benchmarks and compares them with their limits.
 #include <thread>
 
-#include <benchmark/benchmark.h>
-
+#include "BenchRun.h"
 #include "HugePages.h"
-#include "RatioReporter.h"
 
 int main(int argc, char** argv) {
     startWithHugePages(argv);
@@ -13,27 +11,40 @@ int main(int argc, char** argv) {
     // always has one.
     std::thread([] {}).join();
 
-    benchmark::Initialize(&argc, argv);
-    if (benchmark::ReportUnrecognizedArguments(argc, argv)) return 2;
-    RatioReporter reporter({
-        {"copy and drop", 2.2},
-        {"copy and drop, own objects/threads:2", 2.2},
-        {"copy and drop, one object/threads:2", 3.5},
-        {"new object, first handle, drop", 2.0},
-        {"new object, first handle, drop, two threads/threads:2", 4.0},
-        {"made here, dropped there/real_time", 2.5},
-        {"second handle from the pointer", 3.3},
-        {"walk of 10,000 boards by index", 5.0},
-        {"one administrative event to the agent's listener", 4.0},
-        {"one status to all of 10,000 boards", 5.0},
-        {"one second of 1,000 tables", 2.0},
-        {"one second of 10,000 tables", 2.0},
-        {"one second of 10,000 lines", 2.0},
-        {"one second, from 1,000 to 10,000 lines", 12.0},
-        {"one second, from 1,000 to 10,000 tables", 12.0},
-        {"entry and removal, from 10,000 to 100,000 tables", 15.0},
-    });
-    benchmark::RunSpecifiedBenchmarks(&reporter);
-    benchmark::Shutdown();
-    return reporter.printRatios() ? 0 : 1;
+    constexpr double kBoards = 10'000;
+    constexpr double kLines = 10'000;
+    return runBenchmarks(
+        argc, argv,
+        {
+            {"copy and drop", 1.3, "2 lock pairs", {{2, kLockPair}}},
+            {"copy and drop, own objects/threads:2", 2.2},
+            {"copy and drop, one object/threads:2", 3.5},
+            {"new object, first handle, drop", 2.0},
+            {"new object, first handle, drop",
+             1.3,
+             "4 lock pairs and an allocation",
+             {{4, kLockPair}, {1, kAllocation}}},
+            {"new object, first handle, drop, two threads/threads:2", 4.0},
+            {"made here, dropped there/real_time", 2.5},
+            {"second handle from the pointer",
+             1.15,
+             "2 lock pairs and a look-up",
+             {{2, kLockPair}, {1, kLookUp}}},
+            {"walk of 10,000 boards by index", 5.0},
+            {"walk of 10,000 boards by index",
+             1.5,
+             "4 lock pairs and a cache miss each",
+             {{4 * kBoards, kLockPair}, {kBoards, kCacheMiss}}},
+            {"one administrative event to the agent's listener", 4.0},
+            {"one status to all of 10,000 boards", 5.0},
+            {"one second of 1,000 tables", 2.0},
+            {"one second of 10,000 tables", 2.0},
+            {"one second of 10,000 lines", 2.0},
+            {"one second, from 1,000 to 10,000 lines",
+             1.0,
+             "10 x 1,000, a cache miss each",
+             {{10, "one second, from 1,000 to 10,000 lines/peer"}, {kLines, kCacheMiss}}},
+            {"one second, from 1,000 to 10,000 tables", 12.0},
+            {"entry and removal, from 10,000 to 100,000 tables", 15.0},
+        });
 }

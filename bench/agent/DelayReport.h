@@ -1,7 +1,9 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// How long requests take while boards are read anew, and while they are not.
+// How long requests take while boards are read.
 #pragma once
 
-/// Prints the distributions for a chassis of `boards` boards. Returns whether reading anew delays
-/// requests by less than a request's own time.
-bool reportDelays(int boards);
+#include "Judgement.h"
+
+/// Asks an agent that reads `boards` boards all the time, in turns with one that reads none. Prints
+/// the distribution of the times, and enters how much longer those of the first agent are.
+void reportDelays(int boards, Judgement& judgement);

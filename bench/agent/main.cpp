@@ -12,13 +12,13 @@
 #include <benchmark/benchmark.h>
 
 #include "Agents.h"
+#include "BenchRun.h"
 #include "Child.h"
 #include "DelayReport.h"
 #include "GrowthReport.h"
 #include "HugePages.h"
 #include "IntervalRows.h"
 #include "LeanClient.h"
-#include "RatioReporter.h"
 #include "Requests.h"
 
 namespace {
@@ -104,9 +104,13 @@ void addColumns(std::string const& name, Target const& target) {
     addRequests(name, target, requests);
 }
 
-/// All counters together.
-void addRows(std::string const& name, Target const& target) {
-    addRequests(name, target, requestsFor(target.entry, counterColumns(), target.lines));
+/// So many columns together; beyond the counters, some twice.
+void addColumnsAtOnce(std::string const& name, Target const& target, std::size_t columns) {
+    auto const counters = counterColumns();
+    std::vector<std::uint32_t> together;
+    for (std::size_t i = 0; i < columns; ++i)
+        together.push_back(counters[i % counters.size()]);
+    addRequests(name, target, requestsFor(target.entry, together, target.lines));
 }
 
 void addWalk(std::string const& name, Target const& target) {
@@ -142,24 +146,35 @@ int run(int argc, char** argv) {
     addColumns("a column, from 28 to 280 lines/peer", ours);
     addColumns("a column through a master, table_data/ours", ourThroughMaster);
     addColumns("a column through a master, table_data/peer", tableDataThroughMaster);
-    addRows("through a master, ten columns at once or singly/ours", ourThroughMaster);
-    addColumns("through a master, ten columns at once or singly/peer", ourThroughMaster);
-    benchmark::Initialize(&argc, argv);
-    if (benchmark::ReportUnrecognizedArguments(argc, argv)) return 2;
-    RatioReporter reporter({
-        {"a column, table_data/real_time", 1 / 2.5},
-        {"a column, table_iterator/real_time", 1 / 40.0},
-        {"snmpbulkwalk, table_data/real_time", 1 / 1.8},
-        {"a column, from 28 to 280 lines/real_time", 1.15},
-        {"a column through a master, table_data/real_time", 1.0},
-        {"through a master, ten columns at once or singly/real_time", 1 / 4.0},
-    });
-    benchmark::RunSpecifiedBenchmarks(&reporter);
-    benchmark::Shutdown();
-    bool const ratiosKept = reporter.printRatios();
-    bool const growthKept = reportGrowth();
-    bool const delaysKept = reportDelays(1000);
-    return ratiosKept && growthKept && delaysKept ? 0 : 1;
+    for (std::size_t const columns : {2U, 5U, 10U, 20U}) {
+        std::string const topic =
+            "through a master, " + std::to_string(columns) + " columns at once or singly";
+        addColumnsAtOnce(topic + "/ours", ourThroughMaster, columns);
+        addColumns(topic + "/peer", ourThroughMaster);
+    }
+    addColumnsAtOnce("ten columns, through a master or alone/ours", ourThroughMaster, 10);
+    addColumnsAtOnce("ten columns, through a master or alone/peer", ours, 10);
+    addColumns("a column, through a master or alone/ours", ourThroughMaster);
+    addColumns("a column, through a master or alone/peer", ours);
+    return runBenchmarks(
+        argc, argv,
+        {
+            {"a column, table_data/real_time", 1 / 2.5},
+            {"a column, table_data/real_time", 4.0, "a round trip", {{1, kRoundTrip}}},
+            {"a column, table_iterator/real_time", 1 / 40.0},
+            {"snmpbulkwalk, table_data/real_time", 1 / 1.8},
+            {"a column, from 28 to 280 lines/real_time", 1.15},
+            {"a column through a master, table_data/real_time", 1.0},
+            {"a column through a master, table_data/real_time",
+             2.0,
+             "1 round trip, 50 local ones",
+             {{1, kRoundTrip}, {kRepetitions, kLocalRoundTrip}}},
+            {"through a master, 10 columns at once or singly/real_time", 0.3},
+        },
+        [](Judgement& judgement) {
+            reportGrowth(judgement);
+            reportDelays(1000, judgement);
+        });
 }
 
 } // namespace
