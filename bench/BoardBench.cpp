@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // Boards: walks, and the road of an administrative event.
+#include <algorithm>
 #include <map>
 #include <memory>
 
@@ -103,6 +104,22 @@ void walkSharedPeer(benchmark::State& state) {
         }
 }
 
+/// The search for the last of the boards.
+void indexOfLastOurs(benchmark::State& state) {
+    BoardManager& manager = largeChassis().manager;
+    ReferenceCounter<Board> const last = manager.GetBoardByIndex(kBoards);
+    for (auto _ : state)
+        benchmark::DoNotOptimize(manager.GetIndexByBoard(last));
+}
+
+void indexOfLastPeer(benchmark::State& state) {
+    auto const& boards = largePeerChassis().factory.boards();
+    auto const last = boards.rbegin()->second;
+    for (auto _ : state)
+        benchmark::DoNotOptimize(std::find_if(
+            boards.begin(), boards.end(), [&](auto const& entry) { return entry.second == last; }));
+}
+
 /// A walk by `GetNextBoard(int)` over the first `range` boards: grows as n log n.
 void walkByNextBoard(benchmark::State& state) {
     auto const boards = static_cast<int>(state.range(0));
@@ -158,6 +175,8 @@ BENCHMARK(walkByIndexOurs)->Name("walk of 10,000 boards by index/ours");
 BENCHMARK(walkByIndexPeer)->Name("walk of 10,000 boards by index/peer");
 BENCHMARK(walkByIndexOurs)->Name("the same walk, peer of shared pointers/ours");
 BENCHMARK(walkSharedPeer)->Name("the same walk, peer of shared pointers/peer");
+BENCHMARK(indexOfLastOurs)->Name("index of the last of 10,000 boards/ours");
+BENCHMARK(indexOfLastPeer)->Name("index of the last of 10,000 boards/peer");
 BENCHMARK(oneEventOurs)->Name("one administrative event to the agent's listener/ours");
 BENCHMARK(oneEventPeer)->Name("one administrative event to the agent's listener/peer");
 BENCHMARK(notifyAllOurs)->Name("one status to all of 10,000 boards/ours");

@@ -1,8 +1,12 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // Handles against std::shared_ptr.
+#include <array>
+#include <chrono>
 #include <condition_variable>
+#include <cstddef>
 #include <memory>
 #include <mutex>
+#include <optional>
 #include <thread>
 #include <vector>
 
@@ -137,6 +141,25 @@ void secondHandleOurs(benchmark::State& state) {
     }
 }
 
+/// Without dropping it, which takes the record's lock once more.
+void secondHandleMaking(benchmark::State& state) {
+    constexpr std::size_t kBatch = 64;
+    using Clock = std::chrono::steady_clock;
+    Ours const handle = make<Ours>();
+    Thing* const object = handle.get();
+    std::array<std::optional<Ours>, kBatch> seconds;
+    for (auto _ : state) {
+        auto const begun = Clock::now();
+        for (auto& second : seconds)
+            second.emplace(object);
+        benchmark::ClobberMemory();
+        state.SetIterationTime(std::chrono::duration<double>(Clock::now() - begun).count());
+        for (auto& second : seconds)
+            second.reset();
+    }
+    state.counters["items"] = kBatch;
+}
+
 void secondHandlePeer(benchmark::State& state) {
     Theirs const handle = make<Theirs>();
     Peer* const object = handle.get();
@@ -159,6 +182,7 @@ BENCHMARK(makeDrop<Theirs>)->Name("new object, first handle, drop, two threads/p
 BENCHMARK(makeHereDropThere<Ours>)->Name("made here, dropped there/ours")->UseRealTime();
 BENCHMARK(makeHereDropThere<Theirs>)->Name("made here, dropped there/peer")->UseRealTime();
 BENCHMARK(secondHandleOurs)->Name("second handle from the pointer/ours");
+BENCHMARK(secondHandleMaking)->Name("second handle, making only/ours")->UseManualTime();
 BENCHMARK(secondHandlePeer)->Name("second handle from the pointer/peer");
 
 } // namespace

@@ -12,7 +12,7 @@ Board::~Board() = default;
 namespace {
 
 bool answersTo(ReferenceCounter<Feature> const& feature, KVL::IID const& iid) {
-    Feature const* const object = feature.get();
+    Feature const* const object = feature.unlocked();
     return object != nullptr && object->interfaces()->is_element(iid);
 }
 

@@ -17,11 +17,11 @@ BoardManager::~BoardManager() {
 }
 
 ReferenceCounter<Board> BoardManager::GetFirstBoard() {
-    return KVL::first_entry(*m_boards.operator->());
+    return KVL::first_entry(*m_boards.unlocked());
 }
 
 ReferenceCounter<Board> BoardManager::GetNextBoard(int index) {
-    return KVL::entry_after(*m_boards.operator->(), index);
+    return KVL::entry_after(*m_boards.unlocked(), index);
 }
 
 ReferenceCounter<Board> BoardManager::GetNextBoard(ReferenceCounter<Board> board) {
@@ -29,23 +29,23 @@ ReferenceCounter<Board> BoardManager::GetNextBoard(ReferenceCounter<Board> board
 }
 
 ReferenceCounter<Board> BoardManager::GetBoardByIndex(int index) {
-    return KVL::entry_at(*m_boards.operator->(), index);
+    return KVL::entry_at(*m_boards.unlocked(), index);
 }
 
 int BoardManager::GetNumberOfBoards() {
-    return KVL::number_of_entries(*m_boards.operator->());
+    return KVL::number_of_entries(*m_boards.unlocked());
 }
 
 int BoardManager::GetFirstBoardIndex() {
-    return m_boards->first_index();
+    return m_boards.unlocked()->first_index();
 }
 
 int BoardManager::GetIndexByBoard(ReferenceCounter<Board> board) {
-    return KVL::index_of(*m_boards.operator->(), board);
+    return KVL::index_of(*m_boards.unlocked(), board);
 }
 
 int BoardManager::GetNextBoardIndex(int index) {
-    return m_boards->next_index(index);
+    return m_boards.unlocked()->next_index(index);
 }
 
 int BoardManager::Attach(ReferenceCounter<BoardFactory> factory) {

@@ -11,17 +11,16 @@ namespace KVL {
 
 template <class T>
 T* object_of(ReferenceCounter<T> const& handle) {
-    return handle.get();
+    return handle.unlocked();
 }
 
 template <class Index, class T>
 T* object_of(std::pair<Index const, ReferenceCounter<T>> const& entry) {
-    return entry.second.get();
+    return entry.second.unlocked();
 }
 
 /// The first element that refers to `object`, or the end. `elements` are handles, or a map's
-/// entries with handles. Takes the object and not its handle, whose `get()` locks, so that only the
-/// elements are locked.
+/// entries with handles. Takes no record's lock.
 template <class Elements, class T>
 auto find_object(Elements& elements, T const* object) {
     return std::find_if(elements.begin(), elements.end(),

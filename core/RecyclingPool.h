@@ -32,6 +32,7 @@ template <class T>
 class RecyclingPool {
   public:
 #ifdef KVLOAM_NO_POOL
+    static void reserve() {}
     static T* take() {
         return new T;
     }
@@ -39,6 +40,13 @@ class RecyclingPool {
         delete object;
     }
 #else
+    /// Has the thread's next `take` need no memory, unless the thread is ending: allocates before
+    /// the caller takes a lock.
+    static void reserve() {
+        if (s_cache.head == nullptr) [[unlikely]]
+            give(refill());
+    }
+
     static T* take() {
         Cache& cache = s_cache;
         Block* block = cache.head;

@@ -22,13 +22,8 @@ class ReferenceCounter : public Object {
     ReferenceCounter(T* object = nullptr) try
         : Object(false),
           m_record(object == nullptr ? nullptr
-                                     : ReferenceTable::get_instance()->find_or_make(object)),
+                                     : ReferenceTable::get_instance()->add_handle(object)),
           m_object(object) {
-        if (m_record != nullptr) {
-            m_record->lock();
-            m_record->raise();
-            m_record->unlock();
-        }
     } catch (...) {
         if (ReferenceTable::get_instance()->ReferenceTable::get_refinfo(object) == nullptr)
             delete object;
@@ -88,6 +83,10 @@ class ReferenceCounter : public Object {
 
     /// The object, or null for an empty handle. The pointer is valid while a handle of it exists.
     T* get() const { return m_record == nullptr ? nullptr : locked(); }
+
+    /// As `get()`, but does not take the record's lock. For searches and for handles that never
+    /// change, where locking every record would take most of the time.
+    T* unlocked() const { return m_record == nullptr ? nullptr : m_object; }
 
   private:
     T* locked() const {

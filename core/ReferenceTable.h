@@ -68,8 +68,8 @@ class KVLOAM_API ReferenceTable : public Object {
     /// Removes and destroys the record of `object`, if it has one. The record's lock must not be
     /// held.
     virtual void destroy_refcount(Object* object);
-    /// Prints every entry, in the order of addresses, on standard output. Handles are not blocked
-    /// while the text is written.
+    /// Prints every entry, in the order of addresses, on standard output. Entries are read a few at
+    /// a time, without the lock in between; an object that comes or goes meanwhile may be missing.
     virtual void dump();
     /// The number of objects that have handles.
     virtual int referenced_objects();
@@ -84,9 +84,11 @@ class KVLOAM_API ReferenceTable : public Object {
 
     explicit ReferenceTable(Records* records);
 
-    /// The record of `object`, which is not null, made with count 0 when it has none. Handles call
-    /// this instead of `create_refinfo`: one search, and no virtual call.
+    /// The record of `object`, which is not null, made with count 0 when it has none.
     ReferenceInfo* find_or_make(Object* object);
+    /// The record of `object`, which is not null, with one handle more. A new record is counted
+    /// before another thread can see it, and therefore without its lock.
+    ReferenceInfo* add_handle(Object* object);
 
     static ReferenceTable* m_referenceTable;
 

@@ -18,7 +18,8 @@ Value first_entry(IndexedTable<int, Value>& table) {
 template <class Value>
 Value entry_at(IndexedTable<int, Value>& table, int index) {
     ObjectGuard const guard(table);
-    return table[index];
+    auto const entry = table.entries().find(index);
+    return entry == table.entries().end() ? table[index] : entry->second;
 }
 
 /// The entry at the next index above `index`; an empty handle when `index` is the highest or is not
@@ -26,7 +27,10 @@ Value entry_at(IndexedTable<int, Value>& table, int index) {
 template <class Value>
 Value entry_after(IndexedTable<int, Value>& table, int index) {
     ObjectGuard const guard(table);
-    return table[table.next_index(index)];
+    auto entry = table.entries().find(index);
+    if (entry == table.entries().end() || ++entry == table.entries().end())
+        return table[table.next_index(index)];
+    return entry->second;
 }
 
 template <class Value>
@@ -38,7 +42,7 @@ int number_of_entries(IndexedTable<int, Value>& table) {
 /// The index of the first entry of the same object as `value`; 0 when there is none.
 template <class Value>
 int index_of(IndexedTable<int, Value>& table, Value const& value) {
-    auto* const wanted = value.get();
+    auto* const wanted = value.unlocked();
     ObjectGuard const guard(table);
     auto const found = find_object(table.entries(), wanted);
     return found == table.entries().end() ? 0 : found->first;

@@ -38,11 +38,11 @@ void ServiceManager::AddModule(char const* name) {
 }
 
 ReferenceCounter<Module> ServiceManager::GetFirstModule() {
-    return KVL::first_entry(*m_modules.operator->());
+    return KVL::first_entry(*m_modules.unlocked());
 }
 
 ReferenceCounter<Module> ServiceManager::GetNextModule(int index) {
-    return KVL::entry_after(*m_modules.operator->(), index);
+    return KVL::entry_after(*m_modules.unlocked(), index);
 }
 
 ReferenceCounter<Module> ServiceManager::GetNextModule(ReferenceCounter<Module> module) {
@@ -50,31 +50,31 @@ ReferenceCounter<Module> ServiceManager::GetNextModule(ReferenceCounter<Module> 
 }
 
 ReferenceCounter<Module> ServiceManager::GetModuleByIndex(int index) {
-    return KVL::entry_at(*m_modules.operator->(), index);
+    return KVL::entry_at(*m_modules.unlocked(), index);
 }
 
 int ServiceManager::GetNumberOfModules() {
-    return KVL::number_of_entries(*m_modules.operator->());
+    return KVL::number_of_entries(*m_modules.unlocked());
 }
 
 int ServiceManager::GetFirstModuleIndex() {
-    return m_modules->first_index();
+    return m_modules.unlocked()->first_index();
 }
 
 int ServiceManager::GetIndexByModule(ReferenceCounter<Module> module) {
-    return KVL::index_of(*m_modules.operator->(), module);
+    return KVL::index_of(*m_modules.unlocked(), module);
 }
 
 int ServiceManager::GetNextModuleIndex(int index) {
-    return m_modules->next_index(index);
+    return m_modules.unlocked()->next_index(index);
 }
 
 ReferenceCounter<Service> ServiceManager::GetFirstService() {
-    return KVL::first_entry(*m_services.operator->());
+    return KVL::first_entry(*m_services.unlocked());
 }
 
 ReferenceCounter<Service> ServiceManager::GetNextService(int index) {
-    return KVL::entry_after(*m_services.operator->(), index);
+    return KVL::entry_after(*m_services.unlocked(), index);
 }
 
 ReferenceCounter<Service> ServiceManager::GetNextService(ReferenceCounter<Service> service) {
@@ -82,23 +82,23 @@ ReferenceCounter<Service> ServiceManager::GetNextService(ReferenceCounter<Servic
 }
 
 ReferenceCounter<Service> ServiceManager::GetServiceByIndex(int index) {
-    return KVL::entry_at(*m_services.operator->(), index);
+    return KVL::entry_at(*m_services.unlocked(), index);
 }
 
 int ServiceManager::GetNumberOfServices() {
-    return KVL::number_of_entries(*m_services.operator->());
+    return KVL::number_of_entries(*m_services.unlocked());
 }
 
 int ServiceManager::GetFirstServiceIndex() {
-    return m_services->first_index();
+    return m_services.unlocked()->first_index();
 }
 
 int ServiceManager::GetIndexByService(ReferenceCounter<Service> service) {
-    return KVL::index_of(*m_services.operator->(), service);
+    return KVL::index_of(*m_services.unlocked(), service);
 }
 
 int ServiceManager::GetNextServiceIndex(int index) {
-    return m_services->next_index(index);
+    return m_services.unlocked()->next_index(index);
 }
 
 long ServiceManager::GetVelquorServiceChangeDate() {

@@ -15,7 +15,7 @@ namespace {
 
 /// Every board in a factory's map was created by `MakeBoard`.
 Z7Board* z7(ReferenceCounter<Board> const& board) {
-    return static_cast<Z7Board*>(board.get());
+    return static_cast<Z7Board*>(board.unlocked());
 }
 
 std::string serialNumberOf(Z7Board& board) {

@@ -2,6 +2,11 @@
 // Handles shared, copied and dropped by many threads lose no count.
 #include <atomic>
 #include <barrier>
+#include <cstddef>
+#include <cstdint>
+#include <iostream>
+#include <sstream>
+#include <string>
 #include <thread>
 #include <vector>
 
@@ -114,6 +119,78 @@ TEST_F(HandleThreadsTest, HandlesOfAThreadThatEndsAreDroppedCleanly) {
             late = Handle(new Counted);
         }).join();
     EXPECT_EQ(s_alive, 0);
+}
+
+class TableThreadsTest : public HandleThreadsTest {
+  protected:
+    class OwnTable : public ReferenceTable {
+      public:
+        OwnTable() = default;
+    };
+
+    OwnTable m_table;
+};
+
+TEST_F(TableThreadsTest, TableThatGrowsAndShrinksOnManyThreadsLosesNoEntry) {
+    constexpr std::size_t kObjects = 5000;
+    std::vector<std::vector<std::max_align_t>> addresses(kThreads);
+    for (auto& some : addresses)
+        some.resize(kObjects);
+    auto const object = [&](int thread, std::size_t i) { // the table looks only at the address
+        return reinterpret_cast<Object*>(&addresses[static_cast<std::size_t>(thread)][i]);
+    };
+    for (int round = 0; round < 3; ++round) {
+        together([&](int thread) {
+            for (std::size_t i = 0; i < kObjects; ++i) {
+                ReferenceInfo* const record = m_table.create_refinfo(object(thread, i));
+                ASSERT_NE(m_table.get_refinfo(object(thread, i / 2)), nullptr);
+                ASSERT_EQ(record->count(), 0);
+            }
+        });
+        EXPECT_EQ(m_table.referenced_objects(), kThreads * static_cast<int>(kObjects));
+        together([&](int thread) {
+            for (std::size_t i = 0; i < kObjects; ++i) {
+                m_table.destroy_refcount(object(thread, i));
+                ASSERT_EQ(m_table.get_refinfo(object(thread, i)), nullptr);
+            }
+        });
+        EXPECT_EQ(m_table.referenced_objects(), 0);
+    }
+}
+
+TEST_F(TableThreadsTest, DumpShowsWhatStaysOnceWhileOtherObjectsComeAndGo) {
+    std::vector<Counted> stay(300);
+    for (Counted& object : stay)
+        m_table.create_refinfo(&object);
+    std::atomic<bool> end{false};
+    std::thread others([&] {
+        std::vector<Counted> come(1000);
+        while (!end) {
+            for (Counted& object : come)
+                m_table.create_refinfo(&object);
+            for (Counted& object : come)
+                m_table.destroy_refcount(&object);
+        }
+    });
+    for (int round = 0; round < 3; ++round) {
+        std::ostringstream text;
+        auto* const before = std::cout.rdbuf(text.rdbuf());
+        m_table.dump();
+        std::cout.rdbuf(before);
+        std::string const lines = text.str();
+        for (Counted const& object : stay) {
+            std::string const address =
+                " 0x" + std::to_string(reinterpret_cast<std::uintptr_t>(&object)) + '[';
+            std::size_t const found = lines.find(address);
+            EXPECT_NE(found, std::string::npos);
+            EXPECT_EQ(lines.find(address, found + 1), std::string::npos);
+        }
+    }
+    end = true;
+    others.join();
+    for (Counted& object : stay)
+        m_table.destroy_refcount(&object);
+    stay.clear();
 }
 
 } // namespace

@@ -2,6 +2,7 @@
 // Handles: one count per object, however the handles were made.
 #include <functional>
 #include <string>
+#include <thread>
 #include <type_traits>
 #include <utility>
 #include <vector>
@@ -164,6 +165,36 @@ TEST_F(ReferenceCounterTest, EmptyHandleHasNoObject) {
     EXPECT_EQ(Handle().get(), nullptr);
     EXPECT_EQ(Handle(nullptr).get(), nullptr);
     EXPECT_EQ(Handle(Handle()).get(), nullptr);
+}
+
+TEST_F(ReferenceCounterTest, ObjectIsReadWithoutWaitingForTheRecordsLock) {
+    Handle const handle(new Tracked(m_deleted));
+    ReferenceInfo* const record = table().get_refinfo(handle.get());
+    record->lock();
+    Tracked* read = nullptr;
+    std::thread([&] { read = handle.unlocked(); }).join();
+    record->unlock();
+    EXPECT_EQ(read, handle.get());
+    EXPECT_EQ(Handle().unlocked(), nullptr);
+}
+
+TEST_F(ReferenceCounterTest, HandleIsEmptyWhenTheDestructorOfItsObjectRuns) {
+    class Asking : public Object {
+      public:
+        Asking() : Object(false) {}
+        ~Asking() override {
+            *m_empty = m_handle->get() == nullptr && m_handle->unlocked() == nullptr;
+        }
+        ReferenceCounter<Asking>* m_handle = nullptr;
+        bool* m_empty = nullptr;
+    };
+    bool empty = false;
+    {
+        ReferenceCounter<Asking> handle(new Asking);
+        handle->m_handle = &handle;
+        handle->m_empty = &empty;
+    }
+    EXPECT_TRUE(empty);
 }
 
 TEST_F(ReferenceCounterTest, EmptyHandleMakesNoEntry) {

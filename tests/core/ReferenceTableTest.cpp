@@ -10,7 +10,6 @@
 
 #include <gtest/gtest.h>
 
-#include "core/AddressMap.h"
 #include "core/ReferenceCounter.h"
 
 class ReferenceTableTestObject : public Object {
@@ -193,42 +192,6 @@ TEST_F(ReferenceTableTest, AddressOfADeletedObjectHasNoRecord) {
     { Handle const handle(object); }
     EXPECT_EQ(ReferenceTable::get_instance()->get_refinfo(object),
               nullptr); // NOLINT: only compared
-}
-
-TEST(AddressMapTest, FindsWhatWasInsertedThroughGrowthAndErasure) {
-    // The model: which of the addresses are in the map.
-    std::vector<char> addresses(5000);
-    std::vector<bool> in(addresses.size(), false);
-    KVL::AddressMap<char*> map;
-    std::size_t size = 0;
-    std::uint32_t random = 12345;
-    for (int step = 0; step < 60000; ++step) {
-        random = random * 1664525U + 1013904223U;
-        std::size_t const i = (random >> 8) % addresses.size();
-        if (in[i]) {
-            EXPECT_EQ(map.erase(&addresses[i]), &addresses[i]);
-            --size;
-        } else {
-            EXPECT_EQ(map.find_or_insert(&addresses[i], [&] { return &addresses[i]; }),
-                      &addresses[i]);
-            ++size;
-        }
-        in[i] = !in[i];
-    }
-    EXPECT_EQ(map.size(), size);
-    EXPECT_EQ(map.entries().size(), size);
-    for (std::size_t i = 0; i < addresses.size(); ++i)
-        EXPECT_EQ(map.find(&addresses[i]), in[i] ? &addresses[i] : nullptr) << i;
-}
-
-TEST(AddressMapTest, EraseOfAnAbsentAddressAnswersNull) {
-    KVL::AddressMap<char*> map;
-    char one = 0;
-    char two = 0;
-    EXPECT_EQ(map.erase(&one), nullptr);
-    map.find_or_insert(&one, [&] { return &one; });
-    EXPECT_EQ(map.erase(&two), nullptr);
-    EXPECT_EQ(map.size(), 1U);
 }
 
 } // namespace

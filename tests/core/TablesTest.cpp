@@ -8,6 +8,7 @@
 #include "core/IndexedTable.h"
 #include "core/ListenerTable.h"
 #include "core/ReferenceCounter.h"
+#include "core/TableWalk.h"
 #include "core/kvlvector.h"
 
 namespace {
@@ -100,6 +101,27 @@ TEST_F(IndexedTableTest, SubscriptAnswersTheEntryItself) {
     Handle const other(new Thing);
     m_table[1] = other;
     EXPECT_EQ(m_table[1].get(), other.get());
+}
+
+TEST_F(IndexedTableTest, StepsOfAWalkCopyEntriesAndEndEmpty) {
+    Handle const first = enter();
+    Handle const second = enter();
+    EXPECT_EQ(KVL::first_entry(m_table).get(), first.get());
+    EXPECT_EQ(KVL::entry_at(m_table, 2).get(), second.get());
+    EXPECT_EQ(KVL::entry_at(m_table, 3).get(), nullptr);
+    EXPECT_EQ(KVL::entry_after(m_table, 1).get(), second.get());
+    EXPECT_EQ(KVL::entry_after(m_table, 2).get(), nullptr);
+    EXPECT_EQ(KVL::entry_after(m_table, 0).get(), nullptr);
+    EXPECT_EQ(KVL::index_of(m_table, second), 2);
+    EXPECT_EQ(KVL::index_of(m_table, Handle(new Thing)), 0);
+}
+
+TEST_F(IndexedTableTest, StepsOfAWalkAnswerTheEmptyValueWhenItWasAssigned) {
+    enter();
+    Handle const other(new Thing);
+    m_table[5] = other; // absent: this is the table's empty value
+    EXPECT_EQ(KVL::entry_at(m_table, 7).get(), other.get());
+    EXPECT_EQ(KVL::entry_after(m_table, 1).get(), other.get());
 }
 
 TEST_F(IndexedTableTest, TableIsLockable) {
