@@ -11,10 +11,6 @@ namespace kvloamd {
 
 namespace {
 
-// alarmActiveVariableValueType.
-constexpr int kInteger32 = 4;
-constexpr int kOctetString = 6;
-
 Oid const kZeroDotZero{0, 0};
 Oid const kLinkDown{1, 3, 6, 1, 6, 3, 1, 1, 5, 3};
 Oid const kLineStatusChange{1, 3, 6, 1, 2, 1, 10, 18, 15, 0, 1};
@@ -138,9 +134,11 @@ void AlarmTables::addVariables(AlarmRows& rows, AlarmRow const& row) const {
     auto const name = [&](std::uint32_t column) {
         return own(joined(kAlarmEntry, Oid{column, row.number}));
     };
-    rows.variables.push_back({row.number, 1, name(kKind), kOctetString, 0, row.kind});
-    rows.variables.push_back({row.number, 2, name(kSeverity), kInteger32, row.severity, {}});
-    rows.variables.push_back({row.number, 3, name(kResource), kOctetString, 0, row.resource});
+    rows.variables.push_back({row.number, 1, name(kKind), VariableType::OctetString, 0, row.kind});
+    rows.variables.push_back(
+        {row.number, 2, name(kSeverity), VariableType::Integer32, row.severity, {}});
+    rows.variables.push_back(
+        {row.number, 3, name(kResource), VariableType::OctetString, 0, row.resource});
 }
 
 void AlarmTables::addModels(AlarmRows& rows, AlarmPolicies const& policies) const {

@@ -2,6 +2,7 @@
 // kvlAlarmTable, and the tables of ALARM-MIB.
 #include "agent/objects/OwnObjects.h"
 #include "agent/objects/RowValues.h"
+#include "agent/objects/SharedNames.h"
 #include "agent/objects/StandardObjects.h"
 
 namespace kvloamd {
@@ -16,11 +17,6 @@ auto const& alarmRows(Snapshot const& snapshot) {
 }
 
 template <auto Field, class Row>
-Value plain(Row const& row) {
-    return std::int64_t{row.*Field};
-}
-
-template <auto Field, class Row>
 Value name(Row const& row) {
     return NameView{row.*Field};
 }
@@ -28,16 +24,6 @@ Value name(Row const& row) {
 template <auto Field>
 Value unlessZero(AlarmRow const& row) {
     return row.*Field == 0 ? Value{} : Value{std::int64_t{row.*Field}};
-}
-
-template <std::int64_t Number, class Row>
-Value always(Row const&) {
-    return Number;
-}
-
-template <class Row>
-Value noText(Row const&) {
-    return std::string_view();
 }
 
 Oid const kZeroDotZero{0, 0};
@@ -121,38 +107,28 @@ constexpr Column<DatedAlarmRow> kClearColumns[] = {
      about("The row of alarmModelTable for this kind, cleared")},
 };
 
-// alarmActiveVariableValueType.
-constexpr int kInteger32 = 4;
-constexpr int kOctetString = 6;
-
-constexpr NamedNumber kVariableTypes[] = {{1, "counter32"}, {2, "unsigned32"}, {3, "timeTicks"},
-                                          {4, "integer32"}, {5, "ipAddress"},  {6, "octetString"},
-                                          {7, "objectId"},  {8, "counter64"},  {9, "opaque"}};
-
 using Variable = AlarmVariableRow;
 
 // A variable has a value of its type only. There are no variables of the other types.
 constexpr Column<Variable> kVariableColumns[] = {
     {"alarmActiveVariableID", 2, ObjectId, name<&Variable::name>,
      about("The name of the variable")},
-    {"alarmActiveVariableValueType", 3, Integer, plain<&Variable::type>,
+    {"alarmActiveVariableValueType", 3, Integer,
+     [](Variable const& row) -> Value { return static_cast<std::int64_t>(row.type); },
      about("The type of the variable, which says which column has its value")
          .oneOf(kVariableTypes)
          .as(Kind::Information)},
     {"alarmActiveVariableInteger32Val", 7, Integer,
      [](Variable const& row) {
-         return row.type == kInteger32 ? plain<&Variable::integer>(row) : Value{};
+         return row.type == VariableType::Integer32 ? plain<&Variable::integer>(row) : Value{};
      },
      about("The value of a variable of the type integer32")},
     {"alarmActiveVariableOctetStringVal", 8, Octets,
      [](Variable const& row) {
-         return row.type == kOctetString ? text<&Variable::octets>(row) : Value{};
+         return row.type == VariableType::OctetString ? text<&Variable::octets>(row) : Value{};
      },
      about("The value of a variable of the type octetString")},
 };
-
-constexpr NamedNumber kRowStates[] = {{1, "active"},      {2, "notInService"},  {3, "notReady"},
-                                      {4, "createAndGo"}, {5, "createAndWait"}, {6, "destroy"}};
 
 constexpr Column<AlarmModelRow> kModelColumns[] = {
     {"alarmModelNotificationId", 3, ObjectId, name<&AlarmModelRow::notification>,

@@ -9,11 +9,6 @@ namespace {
 
 using enum ValueType;
 
-template <auto Field>
-Value plain(FaultRow const& row) {
-    return std::int64_t{row.*Field};
-}
-
 Value kind(FaultRow const& row) {
     return std::int64_t{faultKind(row.value)};
 }

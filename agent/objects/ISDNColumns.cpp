@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // ISDN-MIB's tables: the bearer channels, the signalling channels and their data links.
 #include "agent/objects/RowValues.h"
+#include "agent/objects/SharedNames.h"
 #include "agent/objects/StandardObjects.h"
 #include "agent/rows/StandardNumbers.h"
 
@@ -46,9 +47,6 @@ constexpr Writable kTraps{Setting::CallInformationTraps, kEnabled, kDisabled};
 constexpr NamedNumber kTruthValues[] = {{1, "true"}, {2, "false"}};
 
 constexpr NamedNumber kTrapEnables[] = {{1, "enabled"}, {2, "disabled"}};
-
-constexpr NamedNumber kRowStatuses[] = {{1, "active"},      {2, "notInService"},  {3, "notReady"},
-                                        {4, "createAndGo"}, {5, "createAndWait"}, {6, "destroy"}};
 
 constexpr NamedNumber kIsdnBearerCallOrigin[] = {
     {1, "unknown"}, {2, "originate"}, {3, "answer"}, {4, "callback"}};
@@ -126,7 +124,7 @@ constexpr Column<SignallingRow> kSignallingColumns[] = {
          .oneOf(kTrapEnables)
          .settable(kTraps)
          .as(Kind::Information)},
-    {"isdnSignalingStatus", 8, Integer, active, about("The status of the row").oneOf(kRowStatuses)},
+    {"isdnSignalingStatus", 8, Integer, active, about("The status of the row").oneOf(kRowStates)},
 };
 
 constexpr Column<Signalling> kStatisticsColumns[] = {

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // IF-MIB's tables: the interfaces.
 #include "agent/objects/RowValues.h"
+#include "agent/objects/SharedNames.h"
 #include "agent/objects/StandardObjects.h"
 #include "agent/rows/StandardNumbers.h"
 
@@ -74,9 +75,6 @@ constexpr NamedNumber kIfOperStatus[] = {
 constexpr NamedNumber kEnabling[] = {{1, "enabled"}, {2, "disabled"}};
 
 constexpr NamedNumber kTruthValues[] = {{1, "true"}, {2, "false"}};
-
-constexpr NamedNumber kIfStackStatus[] = {{1, "active"},      {2, "notInService"},  {3, "notReady"},
-                                          {4, "createAndGo"}, {5, "createAndWait"}, {6, "destroy"}};
 
 constexpr NamedNumber kIfRcvAddressType[] = {{1, "other"}, {2, "volatile"}, {3, "nonVolatile"}};
 
@@ -166,12 +164,12 @@ constexpr Column<Row> kMoreColumns[] = {
 
 constexpr Column<StackRow> kStackColumns[] = {
     {"ifStackStatus", 3, Integer, stackStatus,
-     about("The state of the row").oneOf(kIfStackStatus).as(Kind::Information)},
+     about("The state of the row").oneOf(kRowStates).as(Kind::Information)},
 };
 
 constexpr Column<ReceiveAddressRow> kAddressColumns[] = {
     {"ifRcvAddressStatus", 2, Integer, addressStatus,
-     about("The state of the row").oneOf(kIfStackStatus).as(Kind::Information)},
+     about("The state of the row").oneOf(kRowStates).as(Kind::Information)},
     {"ifRcvAddressType", 3, Integer, addressType,
      about("Whether the address outlives a restart")
          .oneOf(kIfRcvAddressType)

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The tables of NOTIFICATION-LOG-MIB.
 #include "agent/objects/RowValues.h"
+#include "agent/objects/SharedNames.h"
 #include "agent/objects/StandardObjects.h"
 
 namespace kvloamd {
@@ -14,27 +15,10 @@ auto const& logRows(Snapshot const& snapshot) {
     return (*snapshot.notifications).*Rows;
 }
 
-template <auto Field, class Row>
-Value plain(Row const& row) {
-    return std::int64_t{row.*Field};
-}
-
-template <std::int64_t Number, class Row>
-Value always(Row const&) {
-    return Number;
-}
-
-template <class Row>
-Value noText(Row const&) {
-    return std::string_view();
-}
-
 constexpr NamedNumber kAdminStates[] = {{1, "enabled"}, {2, "disabled"}};
 constexpr NamedNumber kOperStates[] = {{1, "disabled"}, {2, "operational"}, {3, "noFilter"}};
 constexpr NamedNumber kStorageTypes[] = {
     {1, "other"}, {2, "volatile"}, {3, "nonVolatile"}, {4, "permanent"}, {5, "readOnly"}};
-constexpr NamedNumber kRowStates[] = {{1, "active"},      {2, "notInService"},  {3, "notReady"},
-                                      {4, "createAndGo"}, {5, "createAndWait"}, {6, "destroy"}};
 
 constexpr Column<NotificationLogRow> kConfigColumns[] = {
     {"nlmConfigLogFilterName", 2, Octets, noText,
@@ -70,10 +54,6 @@ constexpr Column<NotificationRow> kLogColumns[] = {
 };
 
 using Variable = NotificationVariableRow;
-
-constexpr NamedNumber kVariableTypes[] = {{1, "counter32"}, {2, "unsigned32"}, {3, "timeTicks"},
-                                          {4, "integer32"}, {5, "ipAddress"},  {6, "octetString"},
-                                          {7, "objectId"},  {8, "counter64"},  {9, "opaque"}};
 
 /// The value of a variable of this type; a variable of another type has none.
 template <VariableType Type>

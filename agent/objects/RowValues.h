@@ -5,10 +5,29 @@
 #include <cstdint>
 #include <optional>
 #include <string>
+#include <string_view>
 
 #include "agent/objects/Value.h"
 
 namespace kvloamd {
+
+/// A number that is always known.
+template <auto Field, class Row>
+Value plain(Row const& row) {
+    return std::int64_t{row.*Field};
+}
+
+/// The same number for every row.
+template <std::int64_t Number, class Row>
+Value always(Row const&) {
+    return Number;
+}
+
+/// The empty text for every row.
+template <class Row>
+Value noText(Row const&) {
+    return std::string_view();
+}
 
 template <auto Field, class Row>
 Value text(Row const& row) {

@@ -11,6 +11,7 @@
 
 #include "agent/rows/Clock.h"
 #include "agent/rows/Oid.h"
+#include "agent/rows/VariableType.h"
 
 namespace kvloamd {
 
@@ -68,9 +69,9 @@ struct AlarmVariableRow {
     std::uint32_t alarm = 0;
     std::uint32_t variable = 0; ///< from 1
     Oid name;                   ///< absolute
-    int type = 0;               ///< as alarmActiveVariableValueType
-    std::int64_t integer = 0;   ///< good for integer32
-    std::string octets;         ///< good for octetString
+    VariableType type = VariableType::Integer32;
+    std::int64_t integer = 0; ///< good for Integer32
+    std::string octets;       ///< good for OctetString
 
     std::array<std::uint32_t, 3> index() const { return {0, alarm, variable}; }
 };

@@ -9,21 +9,9 @@
 #include <vector>
 
 #include "agent/rows/Oid.h"
+#include "agent/rows/VariableType.h"
 
 namespace kvloamd {
-
-/// The types of nlmLogVariableValueType.
-enum class VariableType : int {
-    Counter32 = 1,
-    Unsigned32 = 2,
-    TimeTicks = 3,
-    Integer32 = 4,
-    IpAddress = 5,
-    OctetString = 6,
-    ObjectId = 7,
-    Counter64 = 8,
-    Opaque = 9
-};
 
 /// A variable of a notification.
 struct LoggedVariable {
