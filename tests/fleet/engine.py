@@ -1,0 +1,63 @@
+# SPDX-License-Identifier: BSD-2-Clause
+"""A real Prometheus with the configuration in fleet/, but faster."""
+import contextlib
+import json
+import os
+import re
+import socket
+import subprocess
+import urllib.parse
+import urllib.request
+
+
+def free_port():
+    with socket.socket() as probe:
+        probe.bind(('127.0.0.1', 0))
+        return probe.getsockname()[1]
+
+
+def configure(tree, folder, targets, replaced=(), relabelled=''):
+    """Writes the configuration into the folder: scrapes come every 2 seconds, and alerts fire at once.
+    `targets` is what a file of discovery has. `replaced` are more pairs of texts, old and new, and
+    `relabelled` are more relabelling rules of the one job."""
+    with open(tree + '/fleet/prometheus/prometheus.yml', encoding='utf-8') as file:
+        text = file.read()
+    for old, new in (('scrape_interval: 1m', 'scrape_interval: 2s'),
+                     ('scrape_timeout: 20s', 'scrape_timeout: 1s'),
+                     ('evaluation_interval: 1m', 'evaluation_interval: 1s'), *replaced):
+        assert old in text, old
+        text = text.replace(old, new)
+    with open(folder + '/prometheus.yml', 'w', encoding='utf-8') as file:
+        file.write(text + relabelled)
+    os.mkdir(folder + '/rules')
+    for name in ('kvloam-recording.yml', 'kvloam-alerts.yml'):
+        with open(tree + '/fleet/prometheus/rules/' + name, encoding='utf-8') as file:
+            rules = re.sub(r'^ +for: .*\n', '', file.read(), flags=re.M)
+        with open(folder + '/rules/' + name, 'w', encoding='utf-8') as file:
+            file.write(rules)
+    os.mkdir(folder + '/targets')
+    with open(folder + '/targets/targets.yml', 'w', encoding='utf-8') as file:
+        json.dump(targets, file)
+
+
+@contextlib.contextmanager
+def prometheus(tree, folder):
+    """A Prometheus with the configuration in the folder; the base address of its pages."""
+    base = '127.0.0.1:%d' % free_port()
+    process = subprocess.Popen(
+        ['prometheus', '--config.file=' + folder + '/prometheus.yml', '--web.listen-address=' + base,
+         '--storage.tsdb.path=' + folder + '/data', '--enable-feature=extra-scrape-metrics',
+         '--web.console.templates=' + tree + '/fleet/prometheus/consoles'],
+        stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
+    try:
+        yield 'http://%s/' % base
+    finally:
+        process.terminate()
+        process.wait()
+
+
+def ask(base, path, **parameters):
+    """The data of an answer of Prometheus's API."""
+    query = urllib.parse.urlencode(parameters, doseq=True)
+    with urllib.request.urlopen(base + 'api/v1/' + path + '?' + query, timeout=30) as answer:
+        return json.load(answer)['data']
