@@ -39,21 +39,24 @@ class Network:
 
 
 class Agent:
-    """An `Agent` is a real kvloamd with a chassis, a store and a state of its own."""
+    """An `Agent` is a real kvloamd with a chassis, a store and a state of its own. The chassis is the one in
+    the file `chassis`, or one that is generated."""
 
-    def __init__(self, folder, build, network, number, receiver):
+    def __init__(self, folder, build, network, number, receiver, chassis=None):
         folder.mkdir()
         self.name = f"agent-{number:05}"
         self.address = network.agent(number)
         self._tool = build / "bin/kvlsim"
         self._socket = str(folder / "socket")
-        chassis, access, store = folder / "chassis.yaml", folder / "access.conf", folder / "store"
+        access, store = folder / "access.conf", folder / "store"
         store.mkdir()
-        generated = subprocess.run(
-            [self._tool, "generate", "--boards", str(BOARDS), "--lines", str(LINES), "--seed", str(number)],
-            check=True, capture_output=True, text=True).stdout
-        # Serial numbers of the generator are unique in one chassis; here they are in all.
-        chassis.write_text(re.sub(r'(SERIAL_NUMBER: "..)\d{4}', rf"\g<1>{number:04}", generated))
+        if not chassis:
+            chassis = folder / "chassis.yaml"
+            generated = subprocess.run(
+                [self._tool, "generate", "--boards", str(BOARDS), "--lines", str(LINES), "--seed", str(number)],
+                check=True, capture_output=True, text=True).stdout
+            # Serial numbers of the generator are unique in one chassis; here they are in all.
+            chassis.write_text(re.sub(r'(SERIAL_NUMBER: "..)\d{4}', rf"\g<1>{number:04}", generated))
         access.write_text("rocommunity public 127.0.0.0/8\n" +
                           (f"trap2sink {receiver} public\n" if receiver else ""))
         self.program = Program(
