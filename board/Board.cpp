@@ -5,7 +5,7 @@
 
 #include "core/FindObject.h"
 
-Board::Board() : Object(true) {}
+Board::Board() : Object(Adopt(), new KVLLockable_pthread(RecursiveLock)) {}
 
 Board::~Board() = default;
 

@@ -19,7 +19,7 @@ bool hasHandle(Schedulable* table) {
 
 } // namespace
 
-DS1IntervalTable::DS1IntervalTable() {
+DS1IntervalTable::DS1IntervalTable() : Object(Adopt(), new KVLLockable_pthread(RecursiveLock)) {
     // Every tick looks into the reference table, which must be made before another thread does so.
     ReferenceTable::get_instance();
     ActionScheduler_pthread::GetScheduler()->AddPeriodicWhileReady(this, 1, hasHandle);

@@ -2,7 +2,6 @@
 // Which intervals of a DS1 line's history have all of their data.
 #pragma once
 
-#include "core/IID.h"
 #include "platform/Export.h"
 
 /// A `DS1IntervalValidity` answers which intervals of a line's history missed data. An interval
@@ -18,8 +17,6 @@ class KVLOAM_API DS1IntervalValidity {
     /// How many intervals were ever closed, those included that the history has forgotten. Tells
     /// two readings of the history whether an interval was closed in between.
     virtual int GetIntervalsClosed() = 0;
-
-    static KVL::IID iid() { return KVL::IID("19DS1IntervalValidity"); }
 
   protected:
     DS1IntervalValidity();

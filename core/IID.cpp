@@ -3,6 +3,8 @@
 
 #include <cstring>
 
+#include "core/HandleLists.h"
+
 namespace KVL {
 
 IID::IID(char const* name) {
@@ -27,7 +29,9 @@ bool IID::operator==(IID const& other) const {
 }
 
 void IIDList::add(IID id) {
-    if (m_count < kCapacity && !is_element(id)) m_entries[m_count++] = id;
+    if (m_count >= kCapacity || is_element(id)) return;
+    if (HandleLists::made(this)) HandleLists::noteChange();
+    m_entries[m_count++] = id;
 }
 
 bool IIDList::is_element(IID id) const {

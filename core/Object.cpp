@@ -3,32 +3,39 @@
 
 #include <cstdio>
 
+#include "core/HandleLists.h"
 #include "core/RecyclingPool.h"
 
 namespace {
-
-/// A `RootedIIDList` is a list that begins with the identifier of `Object`, as every object's does.
-class RootedIIDList : public KVL::IIDList {
-  public:
-    RootedIIDList() { add(KVL::IID("6Object")); }
-};
-
-using ListPool = KVL::RecyclingPool<RootedIIDList>;
-
+using ListPool = KVL::RecyclingPool<KVL::RootedIIDList>;
 } // namespace
 
 Object::Object(bool lockable)
-    : Object(Adopt(), lockable ? new KVLLockable_pthread(RecursiveLock) : nullptr) {}
+    : m_lock(nullptr), m_interfaces(lockable ? ListPool::take() : KVL::HandleLists::take()) {
+    if (!lockable) return;
+    try {
+        m_lock = new KVLLockable_pthread(RecursiveLock);
+    } catch (...) {
+        ListPool::give(static_cast<KVL::RootedIIDList*>(m_interfaces));
+        throw;
+    }
+}
 
+// Classes with many objects bring their lock: classes that answer to the identifier of the root
+// alone.
 Object::Object(Adopt, KVLLockable_pthread* lock) try
-    : m_lock(lock), m_interfaces(ListPool::take()) {
+    : m_lock(lock), m_interfaces(KVL::HandleLists::take()) {
 } catch (...) {
     delete lock;
 }
 
 Object::~Object() {
-    m_interfaces->shrink(1);
-    ListPool::give(static_cast<RootedIIDList*>(m_interfaces));
+    if (m_lock == nullptr || KVL::HandleLists::made(m_interfaces)) {
+        KVL::HandleLists::give(m_interfaces);
+    } else {
+        m_interfaces->shrink(1);
+        ListPool::give(static_cast<KVL::RootedIIDList*>(m_interfaces));
+    }
     delete m_lock;
 }
 

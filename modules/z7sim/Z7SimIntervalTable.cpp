@@ -30,7 +30,6 @@ Z7SimIntervalTable::Z7SimIntervalTable(LineFormat format, FailureTimes const& ti
                                        std::shared_ptr<LineState> state,
                                        std::vector<DS1LineCounters> const& past)
     : m_source(std::move(source)), m_state(std::move(state)), m_performance(format, times) {
-    interfaces()->add(DS1IntervalValidity::iid());
     // The base class has entered the table with the process's scheduler.
     ActionScheduler_pthread::GetScheduler()->Remove(this);
     LineScheduler& scheduler = LineScheduler::instance();

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // Every allocation of a storm of handles and tables fails once; the library stays usable.
 #include <malloc.h>
+#include <sys/resource.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -36,6 +37,22 @@ class FailingAllocation {
     FailingAllocation& operator=(FailingAllocation const&) = delete;
 
     bool failed() const { return s_untilFailure == kNone; }
+};
+
+/// While a `NoAddressSpace` exists, the system refuses mappings.
+class NoAddressSpace {
+  public:
+    NoAddressSpace() {
+        getrlimit(RLIMIT_AS, &m_before);
+        rlimit const none{0, m_before.rlim_max};
+        setrlimit(RLIMIT_AS, &none);
+    }
+    ~NoAddressSpace() { setrlimit(RLIMIT_AS, &m_before); }
+    NoAddressSpace(NoAddressSpace const&) = delete;
+    NoAddressSpace& operator=(NoAddressSpace const&) = delete;
+
+  private:
+    rlimit m_before{};
 };
 
 void* allocate(std::size_t size, std::size_t alignment) {
@@ -178,7 +195,7 @@ TEST(AllocationFailureTest, HandlesSurviveTheFailureOfAnyAllocation) {
             handles.back() = moved;
             handles.front() = std::move(moved);
         },
-        60);
+        45);
 }
 
 TEST(AllocationFailureTest, NewObjectThatNoHandleCanTakeIsDeleted) {
@@ -202,6 +219,7 @@ TEST(AllocationFailureTest, ObjectWithAHandleOutlivesTheFailureToMakeAnother) {
     others.reserve(kMoreThanAreRecycled);
     EXPECT_THROW(
         {
+            NoAddressSpace const noSpace;
             FailingAllocation const failing(0);
             for (int i = 0; i < kMoreThanAreRecycled; ++i)
                 others.emplace_back(handle.get());
@@ -227,7 +245,7 @@ TEST(AllocationFailureTest, TablesSurviveTheFailureOfAnyAllocation) {
             }
             table->remove((*vector.get())[3]);
         },
-        60);
+        45);
 }
 
 TEST(AllocationFailureTest, IndexThatCouldNotBeEnteredIsHandedOutNext) {
