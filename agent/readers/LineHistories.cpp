@@ -49,15 +49,16 @@ std::shared_ptr<ClosedIntervals const> readClosed(DS1IntervalTable& table,
                                                   DS1IntervalValidity* validity) {
     auto closed = std::make_shared<ClosedIntervals>();
     int const count = closedOf(table);
-    closed->counts.reserve(static_cast<std::size_t>(count));
     closed->valid.reserve(static_cast<std::size_t>(count));
     for (int n = 1; n <= count; ++n) {
-        closed->counts.push_back(readInterval(table, n));
+        LineCounts const counts = readInterval(table, n);
+        closed->counts.push_back(counts);
         // The oldest record of a full history is cleared for the interval to come.
         closed->valid.push_back(validity == nullptr ? n < DS1IntervalTable::kIntervals
                                                     : validity->IsIntervalValid(n));
-        if (closed->valid.back()) add(closed->counts.back(), closed->total);
+        if (closed->valid.back()) add(counts, closed->total);
     }
+    closed->counts.shrink_to_fit();
     return closed;
 }
 

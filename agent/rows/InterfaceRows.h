@@ -9,6 +9,7 @@
 #include <string>
 #include <vector>
 
+#include "agent/rows/ClosedIntervals.h"
 #include "agent/rows/IndexKey.h"
 
 namespace kvloamd {
@@ -103,24 +104,6 @@ struct StackRow {
     auto operator<=>(StackRow const&) const = default;
 };
 
-/// The performance counters of a line, in the order of DS1-MIB's tables.
-enum LineCounter : std::size_t {
-    kErrorSeconds,
-    kSeverelyErrorSeconds,
-    kSeverelyErrorFramingSeconds,
-    kUnavailableSeconds,
-    kControlledSlipSeconds,
-    kPathCodingViolations,
-    kLineErrorSeconds,
-    kBurstyErrorSeconds,
-    kDegradedMinutes,
-    kLineCodeViolations,
-    kLineCounters ///< how many
-};
-
-/// The counters of a line's interval; negative: not known.
-using LineCounts = std::array<std::int32_t, kLineCounters>;
-
 /// What a line has counted since the agent saw it first. Never falls; `kUnknownTotal`: not known.
 using LineTotals = std::array<std::int64_t, kLineCounters>;
 inline constexpr std::int64_t kUnknownTotal = -1;
@@ -131,13 +114,6 @@ constexpr LineTotals unknownTotals() {
     totals.fill(kUnknownTotal);
     return totals;
 }
-
-/// Never changed once a row has them: snapshots share them.
-struct ClosedIntervals {
-    std::vector<LineCounts> counts; ///< from the newest
-    std::vector<bool> valid;        ///< of each, whether no data is missing
-    LineCounts total{};             ///< of the valid ones
-};
 
 struct LineRow {
     std::uint32_t ifIndex = 0;

@@ -14,11 +14,13 @@ kvloamd::Snapshot makeIntervals(std::uint32_t lines) {
         kvloamd::LineRow line;
         line.ifIndex = kFirstLine + i;
         auto const closed = std::make_shared<kvloamd::ClosedIntervals>();
-        closed->counts.resize(kIntervalsOfALine);
         closed->valid.resize(kIntervalsOfALine, true);
-        for (kvloamd::LineCounts& interval : closed->counts)
+        for (std::size_t n = 0; n < kIntervalsOfALine; ++n) {
+            kvloamd::LineCounts interval{};
             for (std::int32_t& count : interval)
                 count = static_cast<std::int32_t>(counts(random));
+            closed->counts.push_back(interval);
+        }
         line.closed = closed;
         line.intervalsBefore = before;
         before += line.closedIntervals();

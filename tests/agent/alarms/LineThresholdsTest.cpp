@@ -2,6 +2,8 @@
 #include "agent/alarms/LineThresholds.h"
 
 #include <memory>
+#include <utility>
+#include <vector>
 
 #include <gtest/gtest.h>
 
@@ -25,15 +27,11 @@ class LineThresholdsTest : public ::testing::Test {
     }
     /// Closes the running interval.
     void close(bool valid = true) {
-        m_closed.counts.insert(m_closed.counts.begin(), m_running);
-        m_closed.valid.insert(m_closed.valid.begin(), valid);
+        m_closed.insert(m_closed.begin(), {m_running, valid});
         m_running = {};
         ++m_number;
         constexpr std::size_t kDay = 95;
-        if (m_closed.counts.size() > kDay) {
-            m_closed.counts.resize(kDay);
-            m_closed.valid.resize(kDay);
-        }
+        if (m_closed.size() > kDay) m_closed.resize(kDay);
     }
     void run(int erroredSeconds) { m_running[kES] = erroredSeconds; }
     LineRow row() const {
@@ -41,11 +39,13 @@ class LineThresholdsTest : public ::testing::Test {
         row.running = m_running;
         row.history = m_history;
         row.intervalsClosed = m_number;
-        auto closed = std::make_shared<ClosedIntervals>(m_closed);
-        for (std::size_t n = 0; n < closed->counts.size(); ++n)
-            if (closed->valid[n])
-                for (std::size_t counter = 0; counter < closed->total.size(); ++counter)
-                    closed->total[counter] += closed->counts[n][counter];
+        auto closed = std::make_shared<ClosedIntervals>();
+        for (auto const& [counts, valid] : m_closed) {
+            closed->counts.push_back(counts);
+            closed->valid.push_back(valid);
+            for (std::size_t counter = 0; valid && counter < kLineCounters; ++counter)
+                closed->total[counter] += counts[counter];
+        }
         row.closed = closed;
         return row;
     }
@@ -56,7 +56,7 @@ class LineThresholdsTest : public ::testing::Test {
 
     LineLimits m_limits{};
     LineCounts m_running{};
-    ClosedIntervals m_closed;
+    std::vector<std::pair<LineCounts, bool>> m_closed; ///< from the newest; whether they are valid
     int m_number = 0;
     std::uint64_t m_history = 1;
     LineThresholds m_thresholds;
@@ -140,7 +140,7 @@ TEST_F(QuarterHourTest, CorrectionOfTheClosedIntervalCrossesInIt) {
     run(9);
     close();
     EXPECT_FALSE(crosses15m());
-    m_closed.counts.front() = counts(10);
+    m_closed.front().first = counts(10);
     EXPECT_TRUE(crosses15m());
     close();
     EXPECT_FALSE(crosses15m());

@@ -300,7 +300,9 @@ TEST_F(StandardTablesTest, RunningIntervalIsTheFirstRecord) {
 TEST_F(StandardTablesTest, CountThatALineDoesNotKnowHasNoInstance) {
     LineRow& line = m_snapshot.interfaces.lines[0];
     auto const closed = std::make_shared<ClosedIntervals>(*line.closed);
-    closed->counts[0][9] = -2;
+    LineCounts newest = closed->counts[0];
+    newest[9] = -2;
+    closed->counts = {newest, closed->counts[1]};
     line.closed = closed;
     EXPECT_EQ(find(with(kLineCodeViolations, {10, 1})), Lookup::NoSuchInstance);
     EXPECT_EQ(find(with(kErroredSeconds, {10, 1})), Lookup::Found);
