@@ -236,14 +236,32 @@ class Tab:
         self.call("Input.insertText", text=text)
 
     def click(self, selector):
-        place = self.run(f"""(() => {{
-            const element = document.querySelector({json.dumps(selector)});
-            element.scrollIntoView({{block: "nearest"}});
-            const box = element.getBoundingClientRect();
-            return [box.x + box.width / 2, box.y + box.height / 2];
-        }})()""")
-        for kind in ("mousePressed", "mouseReleased"):
-            self.call("Input.dispatchMouseEvent", type=kind, x=place[0], y=place[1], button="left", clickCount=1)
+        """Clicks an element once it has stopped moving, and again if the page moved it away all the same."""
+        began = time.monotonic()
+        while True:
+            place = self.run(f"""new Promise((resolve) => {{
+                document.querySelector({json.dumps(selector)}).scrollIntoView({{block: "nearest"}});
+                const limit = performance.now() + 5000;
+                const look = (former) => {{
+                    const element = document.querySelector({json.dumps(selector)});
+                    const box = element.getBoundingClientRect();
+                    const place = [box.x + box.width / 2, box.y + box.height / 2];
+                    const still = place.join() === former && element.contains(document.elementFromPoint(...place));
+                    if (still || performance.now() > limit) resolve(place); else setTimeout(look, 50, place.join());
+                }};
+                look();
+                window.hit = undefined;
+                document.addEventListener("click", (event) => {{
+                    window.hit = event.target.closest({json.dumps(selector)}) !== null;
+                }}, {{capture: true, once: true}});
+            }})""")
+            for kind in ("mousePressed", "mouseReleased"):
+                self.call("Input.dispatchMouseEvent", type=kind, x=place[0], y=place[1], button="left", clickCount=1)
+            if self.run("window.hit"):
+                return
+            if time.monotonic() - began > PATIENCE:
+                shown = self.run("document.body.innerText")[:2000]
+                raise BrowserError(f"{selector} cannot be clicked at {place}\nshown: {shown}")
 
     def focus(self):
         """The text of the element that has the focus."""
