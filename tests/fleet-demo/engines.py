@@ -11,6 +11,9 @@ from programs import Program, fetch, samples
 
 RULES = pathlib.Path(__file__).with_name("rules.yml")
 
+# How many seconds of samples VictoriaMetrics may hold in memory only, which it loses when it is killed.
+UNWRITTEN = 15
+
 SCRAPES = """\
 global:
   evaluation_interval: {evaluation}s
@@ -52,6 +55,7 @@ class PrometheusPair:
 
     TITLE = "two Prometheus servers"
     COPIES = 2  # how often each target is scraped
+    SELECTOR = 'job="kvloam"'  # the samples of one scrape of each target
 
     def __init__(self, folder, options, network, targets, alertmanager, programs):
         folder.mkdir()
@@ -79,7 +83,7 @@ class PrometheusPair:
         return self._addresses
 
     def survivor(self):
-        """The store that kill() leaves."""
+        """The store that kill() leaves, if it leaves one."""
         return self._addresses[1]
 
     def kill(self):
@@ -89,6 +93,10 @@ class PrometheusPair:
 
     def restart(self):
         """Prometheus does not fetch what it has missed."""
+        return []
+
+    def check_complete(self, *_):
+        """Nothing has all samples that the store should have."""
 
     def counts(self):
         """Series that are stored, and samples that have been, by one of the servers."""
@@ -118,6 +126,7 @@ class VictoriaCluster:
 
     TITLE = "three vmagent, two VictoriaMetrics"
     COPIES = 2
+    SELECTOR = 'job="kvloam"'
 
     def __init__(self, folder, options, network, targets, alertmanager, programs):
         folder.mkdir()
@@ -187,12 +196,15 @@ class VictoriaCluster:
         return "one of three vmagent, and one of two stores with its vmalert"
 
     def restart(self):
-        """Starts the killed store again, and returns where it answers: the collectors then send what
-        it has missed."""
+        """Starts the killed store again: the collectors then send what it has missed. Returns where each
+        store that was killed answers, and how many seconds of samples it may have lost for good."""
         self._stores[0] = self._start_store(0)
         self._wait_store(0)
         self._rulers[0] = self._start_ruler(0)
-        return self._addresses[0]
+        return [(self._addresses[0], UNWRITTEN)]
+
+    def check_complete(self, *_):
+        """Nothing has all samples that the store should have."""
 
     def counts(self):
         text = fetch(f"http://{self._addresses[1]}/metrics")
@@ -211,6 +223,3 @@ class VictoriaCluster:
     def slot(self, seconds):
         """The store keeps one sample for each interval."""
         return math.ceil(round(seconds * 1000) / (self._options.interval * 1000))
-
-
-ENGINES = {"prometheus": PrometheusPair, "victoria": VictoriaCluster}
