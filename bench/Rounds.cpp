@@ -28,10 +28,13 @@ class Collector final : public benchmark::BenchmarkReporter {
         bool const inProcessorTime = run.threads == 1 && run.run_name.time_type.empty();
         double const seconds =
             inProcessorTime ? run.cpu_accumulated_time : run.real_accumulated_time;
-        auto const items = run.counters.find("items");
-        return {seconds * 1e9 / static_cast<double>(run.iterations),
-                items == run.counters.end() ? 1 : items->second.value,
-                {}};
+        double const nanoseconds = seconds * 1e9 / static_cast<double>(run.iterations);
+        return {counterOf(run, kTimeOfARun, nanoseconds), counterOf(run, kItems, 1), {}};
+    }
+
+    static double counterOf(Run const& run, char const* name, double otherwise) {
+        auto const counter = run.counters.find(name);
+        return counter == run.counters.end() ? otherwise : counter->second.value;
     }
 
     Round m_round;

@@ -6,11 +6,16 @@
 #include <string>
 #include <vector>
 
+/// Counters that a benchmark may set: the nanoseconds that count as the time of a run, and the
+/// number of things that a run does.
+inline constexpr char const* kTimeOfARun = "nanoseconds";
+inline constexpr char const* kItems = "items";
+
 /// What one benchmark took in one round.
 struct Taken {
     double nanoseconds = 0; ///< of one run; processor time where one thread does all the work
-    double items = 1;       ///< how many things one run does
-    std::string failure;    ///< why it has measured nothing; empty: it has
+    double items = 1;
+    std::string failure; ///< why it has measured nothing; empty: it has
 };
 
 /// By the benchmarks' names.

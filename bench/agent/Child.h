@@ -19,6 +19,7 @@ class Child {
     Child(Child const&) = delete;
     Child& operator=(Child const&) = delete;
 
+    pid_t process() const { return m_pid; }
     /// Waits for the end; returns the exit status, 128 and the signal when one ended it.
     int wait();
 

@@ -24,7 +24,7 @@ using kvloamd::Oid;
 struct Row {
     long line;
     long interval;
-    LineCounts const* counts;
+    LineCounts counts;
 };
 
 constexpr unsigned kLastColumn = kFirstCounterColumn + kCounters;
@@ -42,7 +42,7 @@ void answer(netsnmp_request_info* request, Row const* row) {
         value = row->interval < static_cast<long>(kIntervalsOfALine) ? 1 : 2;
     } else {
         type = ASN_GAUGE;
-        value = (*row->counts)[asked->colnum - kFirstCounterColumn];
+        value = row->counts[asked->colnum - kFirstCounterColumn];
     }
     snmp_set_var_typed_value(request->requestvb, type, &value, sizeof value);
 }
@@ -69,7 +69,7 @@ std::vector<Row>& allRows(InterfaceRows const& lines) {
     if (!rows.empty()) return rows;
     for (LineRow const& line : lines.lines)
         for (std::size_t n = 0; n < line.closedIntervals(); ++n)
-            rows.push_back({line.ifIndex, static_cast<long>(n + 1), &line.closed->counts[n]});
+            rows.push_back({line.ifIndex, static_cast<long>(n + 1), line.closed->counts[n]});
     return rows;
 }
 

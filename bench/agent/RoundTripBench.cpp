@@ -14,6 +14,7 @@
 
 #include "Child.h"
 #include "Limit.h"
+#include "ProcessorTime.h"
 
 namespace {
 
@@ -71,12 +72,14 @@ void ask(benchmark::State& state, Ends ends, std::size_t request, std::size_t re
         return 0;
     });
     std::array<char, kResponse> message{};
+    ProcessorTime const time({process.process()});
     for (auto _ : state)
         if (send(ends.near, message.data(), request, 0) < 0 ||
             recv(ends.near, message.data(), message.size(), 0) != static_cast<ssize_t>(response)) {
             state.SkipWithError("no answer comes");
             break;
         }
+    time.enter(state);
     close(ends.near);
     close(ends.far);
 }
