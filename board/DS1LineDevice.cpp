@@ -4,7 +4,7 @@
 #include <cstring>
 
 DS1LineDevice::DS1LineDevice() {
-    interfaces()->add(iid());
+    answer_to(iid());
 }
 
 DS1LineDevice::~DS1LineDevice() = default;

@@ -20,7 +20,7 @@ ReferenceCounter<DS1LineDevice> DS1LineStatusEvent::GetLine() {
 }
 
 DS1LineFeature::DS1LineFeature() {
-    interfaces()->add(iid());
+    answer_to(iid());
 }
 
 DS1LineFeature::~DS1LineFeature() = default;

@@ -4,7 +4,7 @@
 namespace KVL {
 
 Ethernet::Ethernet() {
-    interfaces()->add(iid());
+    answer_to(iid());
 }
 
 Ethernet::~Ethernet() = default;

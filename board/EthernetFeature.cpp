@@ -4,7 +4,7 @@
 namespace KVL {
 
 EthernetFeature::EthernetFeature() {
-    interfaces()->add(iid());
+    answer_to(iid());
 }
 
 EthernetFeature::~EthernetFeature() = default;

@@ -46,7 +46,7 @@ IPAddressConfig::IPAddressConfig(char* text) : m_address(text), m_mask(0), m_bro
 IPAddressConfig::~IPAddressConfig() = default;
 
 IPInterface::IPInterface() {
-    interfaces()->add(iid());
+    answer_to(iid());
 }
 
 IPInterface::~IPInterface() = default;

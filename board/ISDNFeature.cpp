@@ -6,7 +6,7 @@
 #include "core/HandleWalk.h"
 
 ISDNFeature::ISDNFeature() {
-    interfaces()->add(iid());
+    answer_to(iid());
 }
 
 ISDNFeature::~ISDNFeature() = default;

@@ -4,7 +4,7 @@
 namespace KVL {
 
 Interface::Interface() : Object(true) {
-    interfaces()->add(iid());
+    answer_to(iid());
 }
 
 Interface::~Interface() = default;

@@ -4,7 +4,7 @@
 namespace KVL {
 
 InterfaceFeature::InterfaceFeature() {
-    interfaces()->add(iid());
+    answer_to(iid());
 }
 
 InterfaceFeature::~InterfaceFeature() = default;

@@ -3,15 +3,12 @@
 
 #ifndef KVLOAM_NO_POOL
 
-#include <fcntl.h>
-#include <sys/mman.h>
-#include <sys/stat.h>
-#include <unistd.h>
-
 #include <algorithm>
 #include <cstddef>
 #include <mutex>
 #include <new>
+
+#include "core/ListFile.h"
 
 namespace KVL {
 
@@ -22,51 +19,13 @@ constexpr std::int32_t kCacheLimit = 2 * kBatch;
 
 /// How many lists are mapped at a time. So many fill whole pages where a pointer has 8 bytes.
 constexpr std::size_t kMapped = 256;
-constexpr std::size_t kMappedSize = kMapped * sizeof(HandleList);
 
-/// A `ListFile` is the file in memory of which all lists are private copies. Unsynchronised.
-class ListFile {
-  public:
-    /// Maps one more copy. Null where the system refuses.
-    HandleList* map() {
-        if (!m_isMade) make();
-        // A program that closes all descriptors may have opened another file in the place of this.
-        if (m_file < 0 || !isOurs()) return nullptr;
-        void* const lists = mmap(nullptr, kMappedSize, PROT_READ | PROT_WRITE,
-                                 MAP_PRIVATE | MAP_NORESERVE, m_file, 0);
-        return lists == MAP_FAILED ? nullptr : static_cast<HandleList*>(lists);
-    }
-
-  private:
-    void make() {
-        m_isMade = true;
-        int const file = memfd_create("kvloam-handles", MFD_CLOEXEC | MFD_ALLOW_SEALING);
-        if (file < 0) return;
-        if (fill(file) && fcntl(file, F_ADD_SEALS, F_SEAL_SHRINK | F_SEAL_GROW | F_SEAL_WRITE) == 0)
-            m_file = file;
-        else
-            close(file);
-    }
-
-    bool fill(int file) {
-        if (ftruncate(file, kMappedSize) != 0 || fstat(file, &m_status) != 0) return false;
-        void* const lists = mmap(nullptr, kMappedSize, PROT_READ | PROT_WRITE, MAP_SHARED, file, 0);
-        if (lists == MAP_FAILED) return false;
+ListPlace appendLists() {
+    return ListFile::instance().append(kMapped * sizeof(HandleList), [](void* block) {
         for (std::size_t i = 0; i < kMapped; ++i)
-            new (static_cast<HandleList*>(lists) + i) HandleList;
-        return munmap(lists, kMappedSize) == 0;
-    }
-
-    bool isOurs() const {
-        struct stat now {};
-        return fstat(m_file, &now) == 0 && now.st_dev == m_status.st_dev &&
-               now.st_ino == m_status.st_ino;
-    }
-
-    int m_file = -1;
-    bool m_isMade = false;
-    struct stat m_status {};
-};
+            new (static_cast<HandleList*>(block) + i) HandleList;
+    });
+}
 
 /// Lists on their way from one thread to another.
 struct Batch {
@@ -91,7 +50,7 @@ class Stock {
             return count;
         }
         if (m_next == m_end) {
-            m_next = m_file.map();
+            m_next = static_cast<HandleList*>(ListFile::map(m_place));
             m_end = m_next == nullptr ? nullptr : m_next + kMapped;
         }
         if (m_next == nullptr) {
@@ -118,7 +77,7 @@ class Stock {
   private:
     std::mutex m_mutex;
     Batch* m_batches = nullptr;
-    ListFile m_file;
+    ListPlace const m_place = appendLists();
     HandleList* m_next = nullptr; ///< of those mapped last, the first that was never handed out
     HandleList* m_end = nullptr;
 };

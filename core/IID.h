@@ -56,6 +56,7 @@ class KVLOAM_API IIDList {
     }
 
   private:
+    friend class ListKinds;
     std::int32_t m_count = 0;
     IID m_entries[kCapacity];
 };

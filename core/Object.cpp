@@ -4,6 +4,7 @@
 #include <cstdio>
 
 #include "core/HandleLists.h"
+#include "core/ListKinds.h"
 #include "core/RecyclingPool.h"
 
 namespace {
@@ -30,13 +31,34 @@ Object::Object(Adopt, KVLLockable_pthread* lock) try
 }
 
 Object::~Object() {
-    if (m_lock == nullptr || KVL::HandleLists::made(m_interfaces)) {
+    if (m_lock == nullptr)
         KVL::HandleLists::give(m_interfaces);
-    } else {
-        m_interfaces->shrink(1);
-        ListPool::give(static_cast<KVL::RootedIIDList*>(m_interfaces));
-    }
+    else
+        give_back(m_interfaces);
     delete m_lock;
+}
+
+void Object::answer_to(KVL::IID const& id) {
+    // Objects without a lock give their list back to where handles have theirs from.
+    KVL::IIDList* const list =
+        m_lock == nullptr ? nullptr : KVL::ListKinds::take(*m_interfaces, id);
+    if (list == nullptr) {
+        m_interfaces->add(id);
+        return;
+    }
+    give_back(m_interfaces);
+    m_interfaces = list;
+}
+
+void Object::give_back(KVL::IIDList* list) {
+    if (KVL::HandleLists::made(list)) {
+        KVL::HandleLists::give(list);
+    } else if (KVL::ListKinds::made(list)) {
+        KVL::ListKinds::give(list);
+    } else {
+        list->shrink(1);
+        ListPool::give(static_cast<KVL::RootedIIDList*>(list));
+    }
 }
 
 int Object::lock() {

@@ -37,6 +37,11 @@ class KVLOAM_API Object {
     /// An object with the lock `lock`, which it owns from the call on, even if construction fails.
     Object(Adopt, KVLLockable_pthread* lock);
 
+    /// Adds `id` to the identifiers that the object answers to. Only for constructors of the
+    /// library's own classes: the list may become another one, with the same identifiers before
+    /// `id`.
+    [[gnu::visibility("hidden")]] void answer_to(KVL::IID const& id);
+
     /// The lock itself; null when the object was made without one.
     KVLLockable* lockable() const { return m_lock; }
 
@@ -45,6 +50,8 @@ class KVLOAM_API Object {
 
   private:
     friend class ObjectGuard;
+
+    [[gnu::visibility("hidden")]] static void give_back(KVL::IIDList* list);
 
     KVLLockable_pthread* m_lock;
     KVL::IIDList* m_interfaces;

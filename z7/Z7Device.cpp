@@ -5,7 +5,7 @@
 #include <cstring>
 
 Z7Device::Z7Device(char const* name) {
-    interfaces()->add(iid());
+    answer_to(iid());
     SetName(name);
 }
 
@@ -18,25 +18,25 @@ void Z7Device::SetName(char const* name) {
 }
 
 Z7VoiceDevice::Z7VoiceDevice(char const* name) : Z7Device(name) {
-    interfaces()->add(iid());
+    answer_to(iid());
 }
 
 Z7VoiceDevice::~Z7VoiceDevice() = default;
 
 Z7TRKDevice::Z7TRKDevice(char const* name) : Z7Device(name) {
-    interfaces()->add(iid());
+    answer_to(iid());
 }
 
 Z7TRKDevice::~Z7TRKDevice() = default;
 
 Z7ISDNDevice::Z7ISDNDevice(char const* name) : Z7TRKDevice(name) {
-    interfaces()->add(iid());
+    answer_to(iid());
 }
 
 Z7ISDNDevice::~Z7ISDNDevice() = default;
 
 Z7STNDevice::Z7STNDevice(char const* name) : Z7Device(name) {
-    interfaces()->add(iid());
+    answer_to(iid());
 }
 
 Z7STNDevice::~Z7STNDevice() = default;

@@ -4,7 +4,7 @@
 #include "core/HandleWalk.h"
 
 Z7ResourceFeature::Z7ResourceFeature() {
-    interfaces()->add(iid());
+    answer_to(iid());
 }
 
 Z7ResourceFeature::~Z7ResourceFeature() = default;

@@ -51,7 +51,7 @@ long anonymousMemory() {
 int listFile() {
     for (auto const& entry : std::filesystem::directory_iterator("/proc/self/fd")) {
         std::error_code ignored;
-        if (read_symlink(entry, ignored).string().find("kvloam-handles") != std::string::npos)
+        if (read_symlink(entry, ignored).string().find("kvloam-lists") != std::string::npos)
             return std::atoi(entry.path().filename().c_str());
     }
     return -1;
