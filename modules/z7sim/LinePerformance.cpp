@@ -43,6 +43,33 @@ LineCounts& LineCounts::operator-=(LineCounts const& other) {
     return *this;
 }
 
+LinePerformance::Recent::Recent(LineCounts const& counts, Minute const& before)
+    : m_pathCodingViolations(counts.pathCodingViolations),
+      m_lineCodeViolations(counts.lineCodeViolations),
+      m_before(before) {
+    unsigned bit = 1;
+    for (std::int32_t const count :
+         {counts.errorSeconds, counts.severelyErrorSeconds, counts.severelyErrorFramingSeconds,
+          counts.controlledSlipSeconds, counts.lineErrorSeconds, counts.burstyErrorSeconds,
+          counts.degradedMinutes}) {
+        if (count != 0) m_ones = static_cast<std::uint16_t>(m_ones | bit);
+        bit <<= 1U;
+    }
+}
+
+LineCounts LinePerformance::Recent::counts() const {
+    auto const one = [this](unsigned place) { return m_ones >> place & 1; };
+    return {.errorSeconds = one(0),
+            .severelyErrorSeconds = one(1),
+            .severelyErrorFramingSeconds = one(2),
+            .controlledSlipSeconds = one(3),
+            .pathCodingViolations = m_pathCodingViolations,
+            .lineErrorSeconds = one(4),
+            .burstyErrorSeconds = one(5),
+            .degradedMinutes = one(6),
+            .lineCodeViolations = m_lineCodeViolations};
+}
+
 LinePerformance::LinePerformance(LineFormat format, FailureTimes const& times)
     : m_format(format), m_times(times) {}
 
@@ -78,7 +105,7 @@ LinePerformance::Change LinePerformance::countClosely(LineSecond const& second, 
         if (int const seconds = secondsToTakeBack(); seconds > 0)
             becomeUnavailable(seconds, change);
     } else if (isSevere || sustainsFailure(second)) {
-        m_minute = recent(m_run).before;
+        m_minute = recent(m_run).before();
         m_run = 0;
     } else if (++m_run >= kDecidingRun && failures() == LineDefects()) {
         becomeAvailable(change);
@@ -87,7 +114,7 @@ LinePerformance::Change LinePerformance::countClosely(LineSecond const& second, 
 }
 
 void LinePerformance::interrupt() {
-    if (m_unavailable && m_run > 0) m_minute = recent(m_run - 1).before;
+    if (m_unavailable && m_run > 0) m_minute = recent(m_run - 1).before();
     m_run = 0;
     m_remembered = 0;
     m_signal.interrupt();
@@ -98,7 +125,7 @@ void LinePerformance::interrupt() {
 
 void LinePerformance::closeInterval() {
     for (int ago = 0; ago < m_remembered; ++ago)
-        ++recent(ago).intervalsAgo;
+        recent(ago).closeInterval();
 }
 
 void LinePerformance::countFailures(LineSecond const& second) {
@@ -130,7 +157,7 @@ int LinePerformance::secondsToTakeBack() const {
 
 /// So many of the last seconds, and the severely errored ones directly before them.
 int LinePerformance::withSevereBefore(int seconds) const {
-    while (seconds < m_remembered && recent(seconds).severe)
+    while (seconds < m_remembered && recent(seconds).severe())
         ++seconds;
     return seconds;
 }
@@ -145,12 +172,12 @@ bool LinePerformance::sustainsFailure(LineSecond const& second) const {
 void LinePerformance::becomeUnavailable(int seconds, Change& change) {
     for (int ago = 0; ago < seconds; ++ago) {
         Recent const& each = recent(ago);
-        if (each.intervalsAgo > 1) continue;
-        LineCounts& interval = each.intervalsAgo == 0 ? change.running : change.previous;
-        interval -= each.counts;
+        if (each.isForgotten()) continue;
+        LineCounts& interval = each.isRunning() ? change.running : change.previous;
+        interval -= each.counts();
         interval += kUnavailableSecond;
     }
-    m_minute = recent(seconds - 1).before;
+    m_minute = recent(seconds - 1).before();
     m_unavailable = true;
     m_decidedAfter = seconds;
     m_run = 0;
@@ -159,10 +186,10 @@ void LinePerformance::becomeUnavailable(int seconds, Change& change) {
 void LinePerformance::becomeAvailable(Change& change) {
     for (int ago = 0; ago < m_run; ++ago) {
         Recent const& each = recent(ago);
-        if (each.intervalsAgo > 1) continue;
-        LineCounts& interval = each.intervalsAgo == 0 ? change.running : change.previous;
+        if (each.isForgotten()) continue;
+        LineCounts& interval = each.isRunning() ? change.running : change.previous;
         interval -= kUnavailableSecond;
-        interval += each.counts;
+        interval += each.counts();
     }
     m_unavailable = false;
     m_decidedAfter = m_run;
@@ -177,7 +204,7 @@ LinePerformance::Recent& LinePerformance::recent(int ago) {
 void LinePerformance::remember(LineCounts const& counts, Minute const& before) {
     m_newest = (m_newest + 1) % kRecent;
     m_remembered = std::min(m_remembered + 1, kRecent);
-    recent(0) = {counts, before, counts.severelyErrorSeconds != 0, 0};
+    recent(0) = Recent(counts, before);
 }
 
 bool LinePerformance::hasCrc() const {

@@ -114,14 +114,34 @@ class LinePerformance {
     /// The seconds so far of the sixty that may become a degraded minute.
     struct Minute {
         std::int32_t seconds = 0;
-        std::int64_t errors = 0;
+        std::int32_t errors = 0;
     };
-    /// A second that may still be corrected.
-    struct Recent {
-        LineCounts counts; ///< if the line is available
-        Minute before;     ///< the minute without this second
-        bool severe = false;
-        int intervalsAgo = 0;
+    /// A second that may still be corrected. Every line has two dozen of them, so they are small:
+    /// what a second counts is 0 or 1, but for the violations.
+    class Recent {
+      public:
+        Recent() = default;
+        /// `counts`: if the line is available. `before`: the minute without this second.
+        Recent(LineCounts const& counts, Minute const& before);
+
+        LineCounts counts() const;
+        Minute const& before() const { return m_before; }
+        bool severe() const { return (m_ones & kSevere) != 0; }
+        /// Whether it belongs to the running interval, or to the one before that.
+        bool isRunning() const { return m_intervalsAgo == 0; }
+        bool isForgotten() const { return m_intervalsAgo > 1; }
+        void closeInterval() {
+            if (!isForgotten()) ++m_intervalsAgo;
+        }
+
+      private:
+        static constexpr unsigned kSevere = 2;
+
+        std::int32_t m_pathCodingViolations = 0;
+        std::int32_t m_lineCodeViolations = 0;
+        Minute m_before;
+        std::uint16_t m_ones = 0; ///< the other counts, a bit each
+        std::uint8_t m_intervalsAgo = 0;
     };
     /// Corrections go back a failure's declaration or clearing and nine severely errored seconds.
     static constexpr int kRecent = 24;
