@@ -143,6 +143,7 @@ enum Outcome : int { NothingFailed, Failed, Unusable };
 template <class Storm>
 Outcome outcomeOf(Storm const& storm, long successes, std::vector<Handle> const& kept) {
     long const blocks = s_blocks;
+    long const largeBlocks = s_largeBlocks;
     bool failed = false;
     {
         FailingAllocation const failing(successes);
@@ -153,9 +154,11 @@ Outcome outcomeOf(Storm const& storm, long successes, std::vector<Handle> const&
         failed = failing.failed();
     }
 #ifdef KVLOAM_NO_POOL
-    if (s_blocks != blocks) return Unusable; // a block has leaked
+    // The table keeps a segment of buckets that it has got, and a list of its segments.
+    if (s_blocks != blocks + 2 * (s_largeBlocks - largeBlocks)) return Unusable; // one has leaked
 #else
     static_cast<void>(blocks); // the pool keeps blocks
+    static_cast<void>(largeBlocks);
 #endif
     if (!isUsable(kept)) return Unusable;
     return failed ? Failed : NothingFailed;
