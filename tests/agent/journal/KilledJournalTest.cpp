@@ -89,8 +89,10 @@ class KilledJournalTest : public ::testing::Test {
     void expectSound() {
         JournalFile file(m_file);
         std::uint32_t last = 0;
+        int unsaid = 0;
         std::map<std::uint32_t, bool> raised;
         for (JournalEntry const& entry : file.entries(1000000)) {
+            unsaid += entry.sequence > m_highest ? 1 : 0;
             EXPECT_GT(entry.sequence, last);
             last = entry.sequence;
             bool const raises = entry.event == JournalEvent::AlarmRaised;
@@ -99,7 +101,9 @@ class KilledJournalTest : public ::testing::Test {
             is = raises;
         }
         EXPECT_GE(last, m_written) << "an entry that had been written is missing";
-        EXPECT_GE(m_highest, last);
+        // The journal may write an entry before its writer comes to say the number.
+        EXPECT_LE(unsaid, 1) << "entries that no writer appended";
+        m_highest = std::max(m_highest, last);
         std::map<std::uint32_t, bool> active;
         for (Alarm const& alarm : file.activeAlarms())
             active[alarm.condition.key.number] = true;
