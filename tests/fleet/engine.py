@@ -1,9 +1,10 @@
 # SPDX-License-Identifier: BSD-2-Clause
-"""A real Prometheus with the configuration in fleet/, but faster."""
+"""A real Prometheus with the configuration in fleet/, but faster, or VictoriaMetrics with the same."""
 import contextlib
 import json
 import os
 import re
+import shlex
 import socket
 import subprocess
 import urllib.parse
@@ -54,6 +55,38 @@ def prometheus(tree, folder):
     finally:
         process.terminate()
         process.wait()
+
+
+@contextlib.contextmanager
+def victoria(tree, folder):
+    """The same with VictoriaMetrics: a collector, a store, and what evaluates the rules. They have the options
+    of docs/fleet.md."""
+    store, collector, ruler = ('127.0.0.1:%d' % free_port() for _ in range(3))
+    with open(tree + '/docs/fleet.md', encoding='utf-8') as file:
+        text = file.read().replace('\\\n', ' ')
+    replaced = {
+        r'^victoria-metrics .*': (
+            ('/var/lib/victoria-metrics', folder + '/store'), ('=60s', '=2s'), ('$', ' -httpListenAddr=' + store)),
+        r'^vmalert .*': (
+            ('/etc/prometheus', folder), ('localhost:8428', store), ('alerts:9093', '127.0.0.1:9'),
+            ('=1m', '=1s'), ('$', ' -httpListenAddr=' + ruler)),
+        r'^vmagent .*': (
+            ('/etc/prometheus', folder), ('s1:8428', store), (r' -remoteWrite.url=http://s2\S*', ''),
+            (r' -promscrape.cluster\S*', ''),
+            ('$', ' -remoteWrite.tmpDataPath=%s/queue -httpListenAddr=%s' % (folder, collector)))}
+    with contextlib.ExitStack() as stack:
+        for pattern, changes in replaced.items():
+            command = re.search(pattern, text, re.M)[0]
+            for old, new in changes:
+                command, count = re.subn(old, new, command)
+                assert count, old
+            process = subprocess.Popen(shlex.split(command), stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
+            stack.callback(process.wait)
+            stack.callback(process.terminate)
+        yield 'http://%s/' % store
+
+
+ENGINES = {'prometheus': prometheus, 'victoria': victoria}
 
 
 def ask(base, path, **parameters):
