@@ -69,8 +69,8 @@ enum class AlarmScope {
 
 struct AlarmKindInfo {
     AlarmKind kind;
-    char const* name; ///< in the log, the configuration and the tables
     AlarmSeverity severity;
+    char const* name; ///< in the log, the configuration and the tables
     std::chrono::seconds raiseHold; ///< how long the condition lasts before the alarm is raised
     std::chrono::seconds clearHold; ///< how long it has gone before the alarm is cleared
     AlarmScope scope;
