@@ -34,7 +34,7 @@ int FaultListener::ProcessBoardStatusEvent(ReferenceCounter<BoardStatusEvent> ev
     ReferenceCounter<Board> const handle = received->GetBoard();
     Board* const board = handle.get();
     if (board == nullptr) return 0;
-    int const index = m_manager.GetIndexByBoard(handle);
+    int const index = indexOf(handle);
     if (index == 0) return 0;
     if (received->GetBoardStatus() == BoardStatusRemoved) {
         forgetBoard(index);
@@ -43,6 +43,20 @@ int FaultListener::ProcessBoardStatusEvent(ReferenceCounter<BoardStatusEvent> ev
         noteBoard({index, readSerialNumber(*board), unlessNegative(board->GetLogicalID())});
     }
     return 0;
+}
+
+int FaultListener::indexOf(ReferenceCounter<Board> const& board) {
+    // The manager searches its whole table. While the agent starts, thousands of boards appear one
+    // after the other, each under the next index.
+    int const newest = m_newest;
+    for (int const index : {newest, newest + 1}) {
+        if (m_manager.GetBoardByIndex(index).get() != board.get()) continue;
+        m_newest = index;
+        return index;
+    }
+    int const index = m_manager.GetIndexByBoard(board);
+    if (index > newest) m_newest = index;
+    return index;
 }
 
 void FaultListener::start(std::function<void()> changed) {

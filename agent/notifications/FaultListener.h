@@ -2,6 +2,7 @@
 // Receives the faults that the board platform reports.
 #pragma once
 
+#include <atomic>
 #include <cstdint>
 #include <functional>
 #include <map>
@@ -57,6 +58,8 @@ class FaultListener final : public ExternalFaultEventListener, public BoardStatu
         std::optional<int> logicalId;
     };
 
+    /// The board index of `board`; 0 if it has none.
+    int indexOf(ReferenceCounter<Board> const& board);
     /// Fills in the board and enters the fault in the log, both before the board can be removed.
     void enter(FaultChange& change);
     void noteBoard(KnownBoard board);
@@ -69,7 +72,8 @@ class FaultListener final : public ExternalFaultEventListener, public BoardStatu
     FaultLog& m_faults;
     NotificationQueue& m_queue;
     Oid const m_enterprise;
-    Observer m_observer; ///< may be empty
+    Observer m_observer;          ///< may be empty
+    std::atomic<int> m_newest{0}; ///< the highest board index found
 
     /// Guards the next two fields, and that the log holds no fault of a board that has been
     /// removed.

@@ -122,6 +122,23 @@ TEST_F(FaultListenerTest, LogicalIdentifierThatComesWithTheStartCounts) {
     EXPECT_EQ(rows().at(0).boardIndex, 1U);
 }
 
+TEST_F(FaultListenerTest, BoardsAreKnownInWhateverOrderTheyAreAnnounced) {
+    std::vector<ReferenceCounter<Board>> boards;
+    for (int number = 0; number < 5; ++number) {
+        boards.push_back(m_chassis.insert("B" + std::to_string(number)));
+        FakeChassis::fake(boards.back()).number = number;
+    }
+    for (std::size_t const place : {2U, 0U, 1U, 4U, 3U})
+        announce(boards[place], BoardStatusAdded);
+    remove(boards[4]);
+    insert("new", 5);
+    announce(boards[1], BoardStatusStarted);
+    for (int const number : {0, 1, 2, 3, 5}) {
+        tell(FaultRaised, number, 17);
+        EXPECT_EQ(numbersSent().at(0), number + 1) << "board number " << number;
+    }
+}
+
 TEST_F(FaultListenerTest, FaultThatIsToldBeforeItsBoardBecomesTheBoards) {
     tell(FaultRaised, 6, 17);
     insert("A", 6);
