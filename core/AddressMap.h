@@ -69,11 +69,13 @@ class AddressMap {
 
     /// Whether the map would grow if it had another segment.
     bool wantsSegment() const { return wantsBuckets() && m_buckets == capacity(); }
-    /// Takes over `segment` if the map wants one. When memory runs out, nothing changes.
+    /// Takes over `segment`, and grows, if the map wants one. When memory runs out, nothing
+    /// changes.
     void provide(std::unique_ptr<Segment>& segment) {
         if (!wantsSegment()) return;
         m_segments.push_back(nullptr);
         m_segments.back() = std::move(segment);
+        split();
     }
 
     /// Merges a few buckets if there are too many for the entries. Returns a segment that is no

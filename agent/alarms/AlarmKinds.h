@@ -70,7 +70,7 @@ enum class AlarmScope {
 struct AlarmKindInfo {
     AlarmKind kind;
     AlarmSeverity severity;
-    char const* name; ///< in the log, the configuration and the tables
+    char const* name;               ///< in the log, the configuration and the tables
     std::chrono::seconds raiseHold; ///< how long the condition lasts before the alarm is raised
     std::chrono::seconds clearHold; ///< how long it has gone before the alarm is cleared
     AlarmScope scope;

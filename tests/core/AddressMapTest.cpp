@@ -200,6 +200,15 @@ TEST_F(AddressMapTest, SegmentsAreReturnedWhenEntriesGo) {
     EXPECT_EQ(m_segments, 0);
 }
 
+TEST_F(AddressMapTest, SegmentThatTheLastEntryAskedForIsReturned) {
+    have(Map::kSegmentSize / 2 + 1);
+    insertAll();
+    EXPECT_EQ(m_segments, 1);
+    for (std::size_t i = 0; i < m_entries.size(); ++i)
+        erase(i);
+    EXPECT_EQ(m_segments, 0);
+}
+
 TEST_F(AddressMapTest, MapThatGetsNoSegmentFindsEverythingAndCatchesUpWhenItDoes) {
     have(20'000);
     m_provides = false;

@@ -98,7 +98,7 @@ TEST_F(HandleThreadsTest, ObjectsMadeOnOneThreadAreDeletedByOthers) {
         handles.emplace_back(new Counted);
     EXPECT_EQ(s_alive, kObjects);
     together([&](int thread) {
-        for (std::size_t i = static_cast<std::size_t>(thread); i < handles.size(); i += kThreads)
+        for (auto i = static_cast<std::size_t>(thread); i < handles.size(); i += kThreads)
             handles[i] = Handle();
     });
 }
