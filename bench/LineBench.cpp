@@ -1,93 +1,181 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // One second of DS1 lines as the reference module counts them.
+#include <chrono>
 #include <cstddef>
+#include <cstdint>
 #include <memory>
+#include <span>
 #include <string>
 #include <vector>
 
 #include <benchmark/benchmark.h>
 
-#include "DrivenScheduler.h"
-#include "LineScheduler.h"
+#include "DrivenLineScheduler.h"
+#include "LineRecords.h"
 #include "LineSource.h"
 #include "LineState.h"
+#include "LineTicks.h"
 #include "Z7SimIntervalTable.h"
 #include "core/ReferenceCounter.h"
 #include "simulator/exports/Control.h"
 
 namespace {
 
-/// A line's counters in memory: a few errors every second.
+constexpr std::size_t kLinesOfABoard = 4;
+
+/// What a line counts in a second.
+void second(DS1LineCounters& counters, std::uint32_t errors) {
+    ++counters.seconds;
+    counters.pathCodeViolations += errors;
+    counters.lineCodeViolations += errors;
+}
+
+/// A line's counters in memory.
 class CountingLine final : public LineSource {
   public:
+    explicit CountingLine(std::uint32_t errors) : m_errors(errors) {}
+
     bool read(DS1LineCounters& counters) override {
-        ++m_counters.seconds;
-        m_counters.pathCodeViolations += 3;
-        m_counters.lineCodeViolations += 2;
+        second(m_counters, m_errors);
         counters = m_counters;
         return true;
     }
 
   private:
+    std::uint32_t m_errors;
     DS1LineCounters m_counters{};
 };
 
-using Table = ReferenceCounter<DS1IntervalTable>;
+/// The same of all lines of a board. Their devices are 0, 1, 2 ...
+class CountingBoard final : public LineBatch {
+  public:
+    explicit CountingBoard(std::uint32_t errors) : m_errors(errors) {}
 
-/// The benchmark ticks the table, not the scheduler of lines.
-Table tableOf(std::shared_ptr<LineSource> source) {
-    Table table(new Z7SimIntervalTable(LineFormat::esf, {}, std::move(source),
-                                       std::make_shared<LineState>(), {}));
-    LineScheduler::instance().Remove(table.get());
-    return table;
+    std::size_t read(std::span<DS1BoardLine> lines) override {
+        for (std::size_t i = 0; i < lines.size(); ++i) {
+            second(m_counters[i], m_errors);
+            lines[i] = {static_cast<std::int32_t>(i), m_counters[i]};
+        }
+        return lines.size();
+    }
+
+  private:
+    std::uint32_t m_errors;
+    DS1LineCounters m_counters[kLinesOfABoard]{};
+};
+
+using Table = ReferenceCounter<Z7SimIntervalTable>;
+
+Table tableOf(std::shared_ptr<LineSource> source, Z7SimIntervalTable::Ticked ticked) {
+    DrivenLineScheduler::install();
+    return Table(new Z7SimIntervalTable(LineFormat::esf, {}, std::move(source),
+                                        std::make_shared<LineState>(), {}, ticked));
 }
 
-constexpr std::size_t kLines = 10000;
+/// A board of lines whose counters are in memory.
+struct MemoryBoard {
+    explicit MemoryBoard(std::uint32_t errors) {
+        DrivenLineScheduler::install();
+        ticks = std::make_unique<LineTicks>(std::make_unique<CountingBoard>(errors));
+        for (std::size_t i = 0; i < kLinesOfABoard; ++i) {
+            tables.push_back(tableOf(std::make_shared<CountingLine>(errors),
+                                     Z7SimIntervalTable::Ticked::withBoard));
+            ticks->add(static_cast<long>(i), *tables.back().get());
+        }
+    }
 
-/// The lines of all passes, made once and one after the other, as those of a host are.
-std::vector<Table>& lines() {
-    static std::vector<Table> tables;
-    if (tables.empty())
-        for (std::size_t i = 0; i < kLines; ++i)
-            tables.push_back(tableOf(std::make_shared<CountingLine>()));
-    return tables;
+    std::vector<Table> tables;
+    std::unique_ptr<LineTicks> ticks; ///< after the tables, which it uses
+};
+
+constexpr std::size_t kLines = 10000;
+constexpr std::uint32_t kErrors = 3;
+
+/// The boards of all passes, made once and one after the other, as those of a host are.
+std::vector<std::unique_ptr<MemoryBoard>>& boards() {
+    static std::vector<std::unique_ptr<MemoryBoard>> all;
+    if (all.empty())
+        for (std::size_t i = 0; i < kLines / kLinesOfABoard; ++i)
+            all.push_back(std::make_unique<MemoryBoard>(kErrors));
+    return all;
 }
 
 /// Other benchmarks do without ten thousand objects beside theirs.
 void dropLines(benchmark::State const&) {
-    lines().clear();
+    boards().clear();
 }
 
 template <std::size_t count>
 void oneSecondOfLinesOurs(benchmark::State& state) {
-    DrivenScheduler scheduler;
-    for (std::size_t i = 0; i < count; ++i)
-        scheduler.enter(lines()[i].get());
+    DrivenLineScheduler scheduler;
+    for (std::size_t i = 0; i < count / kLinesOfABoard; ++i)
+        scheduler.AddPeriodic(boards()[i]->ticks.get(), 1);
+    for (auto _ : state)
+        scheduler.passOfNextSecond();
+}
+
+template <std::uint32_t errors>
+void oneSecondOfAThousandLines(benchmark::State& state) {
+    std::vector<std::unique_ptr<MemoryBoard>> all;
+    DrivenLineScheduler scheduler;
+    for (std::size_t i = 0; i < 1000 / kLinesOfABoard; ++i) {
+        all.push_back(std::make_unique<MemoryBoard>(errors));
+        scheduler.AddPeriodic(all.back()->ticks.get(), 1);
+    }
     for (auto _ : state)
         scheduler.passOfNextSecond();
 }
 
 void oneSecondOfLinesPeer(benchmark::State& state) {
-    std::vector<DS1IntervalTable*> list;
-    for (auto const& table : lines())
-        list.push_back(table.get());
-    for (auto _ : state)
-        for (DS1IntervalTable* const table : list)
-            table->ScheduledAction();
+    DrivenLineScheduler scheduler; // gives the time
+    std::vector<LineTicks*> list;
+    for (auto const& board : boards())
+        list.push_back(board->ticks.get());
+    for (auto _ : state) {
+        scheduler.passOfNextSecond();
+        for (LineTicks* const ticks : list)
+            ticks->ScheduledAction();
+    }
 }
 
+template <std::uint32_t errors>
 void oneLineInMemory(benchmark::State& state) {
-    Table const table = tableOf(std::make_shared<CountingLine>());
+    Table const table =
+        tableOf(std::make_shared<CountingLine>(errors), Z7SimIntervalTable::Ticked::withBoard);
+    DrivenLineScheduler scheduler;
+    scheduler.AddPeriodic(table.get(), 1);
     for (auto _ : state)
-        table->ScheduledAction();
+        scheduler.passOfNextSecond();
 }
 
-void oneLineOfThePlatform(benchmark::State& state) {
-    kvlsim::loadChassis("boards: [{handle: 1, attributes: {SERIAL_NUMBER: A}, devices: [{handle: "
-                        "11, type: 501, line: {type: esf}}]}]");
-    Table const table = tableOf(std::make_shared<PlatformLine>(11));
+template <std::uint32_t errors>
+void oneBoardInMemory(benchmark::State& state) {
+    MemoryBoard const board(errors);
+    DrivenLineScheduler scheduler;
+    scheduler.AddPeriodic(board.ticks.get(), 1);
     for (auto _ : state)
-        table->ScheduledAction();
+        scheduler.passOfNextSecond();
+}
+
+std::chrono::nanoseconds platformTime{};
+
+/// A board of the simulated platform. `line`: how each of its lines is described.
+void oneBoardOfThePlatform(benchmark::State& state, std::string const& line) {
+    kvlsim::setLineClock([] { return platformTime; });
+    std::string devices;
+    for (std::size_t i = 0; i < kLinesOfABoard; ++i)
+        devices += "{handle: 1" + std::to_string(i) + ", type: 501, line: " + line + "}, ";
+    kvlsim::loadChassis("boards: [{handle: 1, attributes: {SERIAL_NUMBER: A}, devices: [" +
+                        devices + "]}]");
+    DrivenLineScheduler::install();
+    LineRecords records(1, {});
+    for (std::size_t i = 0; i < kLinesOfABoard; ++i)
+        records.of(static_cast<long>(10 + i), LineFormat::esf);
+    for (auto _ : state) {
+        platformTime += std::chrono::seconds(1);
+        DrivenLineScheduler::install().passOfNextSecond();
+    }
+    kvlsim::setLineClock(nullptr);
 }
 
 BENCHMARK(oneSecondOfLinesOurs<kLines>)->Name("one second of 10,000 lines/ours");
@@ -95,7 +183,17 @@ BENCHMARK(oneSecondOfLinesPeer)->Name("one second of 10,000 lines/peer");
 // The same pass at two sizes: how it grows.
 BENCHMARK(oneSecondOfLinesOurs<kLines>)->Name("one second, from 1,000 to 10,000 lines/ours");
 BENCHMARK(oneSecondOfLinesOurs<1000>)->Name("one second, from 1,000 to 10,000 lines/peer");
-BENCHMARK(oneLineInMemory)->Name("one second of a line, counters in memory")->Setup(dropLines);
-BENCHMARK(oneLineOfThePlatform)->Name("one second of a line, counters of the simulated platform");
+BENCHMARK(oneSecondOfAThousandLines<kErrors>)->Name("one second of 1,000 lines");
+BENCHMARK(oneSecondOfAThousandLines<0>)->Name("one second of 1,000 lines without errors");
+BENCHMARK(oneLineInMemory<kErrors>)
+    ->Name("one second of a line, counters in memory")
+    ->Setup(dropLines);
+BENCHMARK(oneLineInMemory<0>)->Name("one second of a line without errors, counters in memory");
+BENCHMARK(oneBoardInMemory<kErrors>)->Name("one second of four lines, counters in memory");
+BENCHMARK(oneBoardInMemory<0>)->Name("one second of four lines without errors, counters in memory");
+BENCHMARK_CAPTURE(oneBoardOfThePlatform, errored, "{type: esf, errors: {path-violations: 3}}")
+    ->Name("one second of four lines, counters of the simulated platform");
+BENCHMARK_CAPTURE(oneBoardOfThePlatform, clean, "{type: esf}")
+    ->Name("one second of four lines without errors, counters of the simulated platform");
 
 } // namespace

@@ -17,6 +17,11 @@ inline constexpr char const* kDS1LinePast = "LINE_PAST";
 /// A `DS1LineType`, in 4 bytes.
 inline constexpr char const* kDS1LineType = "LINE_TYPE";
 
+/// Attribute of a board: a `DS1BoardLine` for each of its devices that is a line, in the order of
+/// the board's devices, all at one and the same moment; as many as the buffer holds. Absent when
+/// the board has no lines.
+inline constexpr char const* kDS1BoardCounters = "BOARD_LINE_COUNTERS";
+
 /// What LINE_TYPE answers; the numbers are those of dsx1LineType.
 enum class DS1LineType : std::int32_t {
     esf = 2,
@@ -54,6 +59,14 @@ static_assert(offsetof(DS1LineCounters, lossOfSignalSeconds) == 20);
 static_assert(offsetof(DS1LineCounters, outOfFrameSeconds) == 24);
 static_assert(offsetof(DS1LineCounters, alarmIndicationSeconds) == 28);
 static_assert(offsetof(DS1LineCounters, alarms) == 32);
+
+/// One line of a board: the handle of its device, and what that answers to LINE_COUNTERS.
+struct DS1BoardLine {
+    std::int32_t device;
+    DS1LineCounters counters;
+};
+
+static_assert(sizeof(DS1BoardLine) == 40 && offsetof(DS1BoardLine, counters) == 4);
 
 // A line that has lost its signal, or receives AIS, does not by that report the loss of frame: only
 // the root is named. With any of the three the platform sends RAI to the far end.

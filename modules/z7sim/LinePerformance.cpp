@@ -6,7 +6,6 @@
 namespace {
 
 constexpr std::int32_t kDecidingRun = 10;
-constexpr std::int32_t kMinute = 60;
 constexpr LineCounts kUnavailableSecond{.unavailableSeconds = 1};
 
 bool hasDefect(LineSecond const& second) {

@@ -95,6 +95,15 @@ class LinePerformance {
     void begin(LineDefects const& defects);
     /// Counts one second of the running interval.
     Change count(LineSecond const& second);
+    /// Counts a second in which the line counted nothing and had no defect, if it changes nothing
+    /// but time. Returns false, and does nothing, if it may change more: `count` it then.
+    bool countClean() {
+        if (m_unavailable || !m_isQuiet || m_minute.seconds + 1 >= kMinute) return false;
+        m_run = 0;
+        m_remembered = 0;
+        ++m_minute.seconds;
+        return true;
+    }
     /// Some seconds were missed: nothing in a row goes on across them. The line stays available or
     /// unavailable, with the failures that it has.
     void interrupt();
@@ -111,6 +120,8 @@ class LinePerformance {
     LineDefects failures() const { return m_failures; }
 
   private:
+    static constexpr std::int32_t kMinute = 60;
+
     /// The seconds so far of the sixty that may become a degraded minute.
     struct Minute {
         std::int32_t seconds = 0;

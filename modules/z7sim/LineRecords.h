@@ -10,7 +10,8 @@
 #include "LinePerformance.h"
 #include "LineSource.h"
 #include "LineState.h"
-#include "board/DS1IntervalTable.h"
+#include "LineTicks.h"
+#include "Z7SimIntervalTable.h"
 #include "core/ReferenceCounter.h"
 
 /// The status and the history of one line.
@@ -18,7 +19,7 @@ struct LineRecord {
     LineFormat format = LineFormat::esf;
     std::shared_ptr<PlatformLine> source;
     std::shared_ptr<LineState> state;
-    ReferenceCounter<DS1IntervalTable> intervals;
+    ReferenceCounter<Z7SimIntervalTable> intervals;
 };
 
 /// The `LineRecords` of a board keep the status and the history of each of its lines. A line
@@ -29,7 +30,11 @@ struct LineRecord {
 /// Unsynchronised. The records must not be dropped in a scheduled action.
 class LineRecords {
   public:
-    explicit LineRecords(FailureTimes const& times) : m_times(times) {}
+    /// `board`: its handle in the device mapper.
+    LineRecords(long board, FailureTimes const& times) : m_board(board), m_times(times) {}
+    ~LineRecords();
+    LineRecords(LineRecords const&) = delete;
+    LineRecords& operator=(LineRecords const&) = delete;
 
     /// The record of the line of a device, by its handle in the device mapper. It is made when
     /// there is none, or when the line has another format than it had.
@@ -41,9 +46,14 @@ class LineRecords {
     /// taken the place of theirs.
     void suspend();
     void resume();
-    void clear() { m_records.clear(); }
+    void clear();
 
   private:
+    void setSilent(bool silent);
+    void release(LineRecord const& record);
+
+    long const m_board;
     FailureTimes const m_times;
+    std::unique_ptr<LineTicks> m_ticks;   ///< null while there was no line
     std::map<long, LineRecord> m_records; ///< by device
 };

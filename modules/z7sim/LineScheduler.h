@@ -23,6 +23,14 @@ class LineScheduler : public ActionScheduler_pthread {
     /// The time of the pass under way, or of the last one: whole seconds of the monotonic clock.
     static long time() { return s_time.load(std::memory_order_relaxed); }
 
+    /// Calls `change` while no pass is under way, so that it can change what a scheduled action
+    /// uses. `change` must not call the scheduler.
+    template <class Change>
+    void betweenPasses(Change const& change) {
+        ListLock const lock(*this);
+        change();
+    }
+
     /// The thread's body. Does not return.
     void Run() override;
 

@@ -27,6 +27,17 @@ class LineSeconds {
     /// The same for a line that did not answer.
     void begin(std::int64_t time);
 
+    /// Whether a tick at `time` that reads this age is simply the next second, which is seen.
+    bool isNext(std::uint32_t age, std::int64_t time) const {
+        return m_hasBeginning && !m_isStill && time == m_time + 1 &&
+               std::int64_t{age} == std::int64_t{m_age} + 1;
+    }
+    /// The same as `answered`. Requires that `isNext`.
+    void goOn() {
+        ++m_time;
+        ++m_age;
+    }
+
     LineTick answered(std::uint32_t age, std::int64_t time);
     LineTick silent(std::int64_t time);
 

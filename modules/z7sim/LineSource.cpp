@@ -36,10 +36,13 @@ std::vector<DS1LineCounters> PlatformLine::past() {
     return records;
 }
 
+std::size_t PlatformBoard::read(std::span<DS1BoardLine> lines) {
+    return bytesAttribute(m_board, kDS1BoardCounters, lines.data(), lines.size_bytes()) /
+           sizeof(DS1BoardLine);
+}
+
 LineDefects defectsOf(DS1LineCounters const& now) {
-    constexpr std::uint32_t frameLosing =
-        kDS1AlarmLossOfSignal | kDS1AlarmLossOfFrame | kDS1AlarmIndication;
-    return {(now.alarms & kDS1AlarmLossOfSignal) != 0, (now.alarms & frameLosing) != 0,
+    return {(now.alarms & kDS1AlarmLossOfSignal) != 0, (now.alarms & kFrameLosingAlarms) != 0,
             (now.alarms & kDS1AlarmIndication) != 0};
 }
 

@@ -3,6 +3,9 @@
 #pragma once
 
 #include <atomic>
+#include <cstddef>
+#include <cstdint>
+#include <span>
 #include <vector>
 
 #include "LinePerformance.h"
@@ -34,8 +37,48 @@ class PlatformLine final : public LineSource {
     std::atomic<bool> m_silent{false};
 };
 
+/// A `LineBatch` answers the counters of several lines of one board in one request.
+class LineBatch {
+  public:
+    virtual ~LineBatch() = default;
+    /// Fills the beginning of `lines` with the lines that answer, in any order. Returns how many
+    /// there are.
+    virtual std::size_t read(std::span<DS1BoardLine> lines) = 0;
+};
+
+/// The lines of a board of the device mapper. Thread-safe.
+class PlatformBoard final : public LineBatch {
+  public:
+    /// `board`: the board's handle.
+    explicit PlatformBoard(long board) : m_board(board) {}
+
+    std::size_t read(std::span<DS1BoardLine> lines) override;
+
+  private:
+    long m_board;
+};
+
 /// The defects that are there at the moment of a reading.
 LineDefects defectsOf(DS1LineCounters const& now);
+
+/// The alarms of a line that has no frame.
+inline constexpr std::uint32_t kFrameLosingAlarms =
+    kDS1AlarmLossOfSignal | kDS1AlarmLossOfFrame | kDS1AlarmIndication;
+
+/// Whether nothing was counted between two readings, at whose end there is no defect: then
+/// `secondBetween` is all zero, and the alarms are the same.
+inline bool isCleanBetween(DS1LineCounters const& before, DS1LineCounters const& now) {
+    // Without a branch for each.
+    std::uint32_t const different = (before.lineCodeViolations ^ now.lineCodeViolations) |
+                                    (before.pathCodeViolations ^ now.pathCodeViolations) |
+                                    (before.framingErrors ^ now.framingErrors) |
+                                    (before.controlledSlips ^ now.controlledSlips) |
+                                    (before.lossOfSignalSeconds ^ now.lossOfSignalSeconds) |
+                                    (before.outOfFrameSeconds ^ now.outOfFrameSeconds) |
+                                    (before.alarmIndicationSeconds ^ now.alarmIndicationSeconds) |
+                                    (before.alarms ^ now.alarms);
+    return different == 0 && (now.alarms & kFrameLosingAlarms) == 0;
+}
 
 /// What a line counted between two readings. Requires that it has not begun anew in between.
 LineSecond secondBetween(DS1LineCounters const& before, DS1LineCounters const& now);

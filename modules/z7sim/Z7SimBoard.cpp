@@ -18,7 +18,7 @@ constexpr char const* kReportedFailed = "board is reported failed by the platfor
 
 } // namespace
 
-Z7SimBoard::Z7SimBoard(long id, FailureTimes const& times) : Z7Board(id), m_lines(times) {
+Z7SimBoard::Z7SimBoard(long id, FailureTimes const& times) : Z7Board(id), m_lines(id, times) {
     readLogicalID();
 }
 

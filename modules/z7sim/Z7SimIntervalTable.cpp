@@ -2,12 +2,15 @@
 #include "Z7SimIntervalTable.h"
 
 #include <algorithm>
+#include <cstddef>
 #include <utility>
 
 #include "LineScheduler.h"
 #include "platform/ActionScheduler_pthread.h"
 
 namespace {
+
+constexpr std::size_t kCacheLine = 64;
 
 void add(LineCounts const& counts, DS1Interval& interval) {
     if (counts == LineCounts()) return;
@@ -28,13 +31,13 @@ void add(LineCounts const& counts, DS1Interval& interval) {
 Z7SimIntervalTable::Z7SimIntervalTable(LineFormat format, FailureTimes const& times,
                                        std::shared_ptr<LineSource> source,
                                        std::shared_ptr<LineState> state,
-                                       std::vector<DS1LineCounters> const& past)
+                                       std::vector<DS1LineCounters> const& past, Ticked ticked)
     : m_source(std::move(source)), m_state(std::move(state)), m_performance(format, times) {
     // The base class has entered the table with the process's scheduler.
     ActionScheduler_pthread::GetScheduler()->Remove(this);
     LineScheduler& scheduler = LineScheduler::instance();
     begin(past);
-    scheduler.AddPeriodic(this, 1);
+    if (ticked == Ticked::alone) scheduler.AddPeriodic(this, 1);
 }
 
 Z7SimIntervalTable::~Z7SimIntervalTable() {
@@ -58,6 +61,7 @@ void Z7SimIntervalTable::begin(std::vector<DS1LineCounters> const& past) {
     }
     m_seconds.begin(m_last.seconds, LineScheduler::time());
     m_state->begin(now.alarms, m_performance);
+    m_last.alarms = now.alarms; // which the status shows
 }
 
 int Z7SimIntervalTable::GetControlledSlipSeconds(int n) {
@@ -70,17 +74,49 @@ int Z7SimIntervalTable::GetDegradedMinutes(int n) {
     return record == nullptr ? 0 : static_cast<int>(record->DegradedMinutes);
 }
 
+/// Without the base's look for a handle: a table is complete when it enters a list, and leaves it
+/// before it is destroyed.
+int Z7SimIntervalTable::ScheduledAction() {
+    return m_timeElapsed < kIntervalLength ? CollectSecond() : CloseInterval();
+}
+
 int Z7SimIntervalTable::CollectSecond() {
     DS1LineCounters now{};
-    bool const answered = m_source->read(now);
-    LineTick const tick = answered ? m_seconds.answered(now.seconds, LineScheduler::time())
-                                   : m_seconds.silent(LineScheduler::time());
+    if (m_source->read(now))
+        answered(now);
+    else
+        miss(m_seconds.silent(LineScheduler::time()).missed);
+    return 0;
+}
+
+void Z7SimIntervalTable::tick(DS1LineCounters const& now) {
+    if (m_timeElapsed >= kIntervalLength) close();
+    answered(now);
+}
+
+void Z7SimIntervalTable::fetch() const {
+    auto const* const first = reinterpret_cast<char const*>(&m_timeElapsed);
+    __builtin_prefetch(first, 1);
+    auto const* const own = reinterpret_cast<char const*>(&m_last);
+    for (std::size_t offset = 0; offset <= 2 * kCacheLine; offset += kCacheLine)
+        __builtin_prefetch(own + offset, 1);
+}
+
+void Z7SimIntervalTable::answered(DS1LineCounters const& now) {
+    long const time = LineScheduler::time();
+    // Nearly every second is clean, and follows the one before.
+    if (isCleanBetween(m_last, now) && m_seconds.isNext(now.seconds, time) &&
+        m_performance.countClean()) {
+        m_seconds.goOn();
+        m_last.seconds = now.seconds;
+        m_timeElapsed += 1;
+        return;
+    }
+    LineTick const tick = m_seconds.answered(now.seconds, time);
     if (tick.missed > 0) miss(tick.missed);
     if (tick.counts) count(now);
-    if (!answered) return 0;
     m_last = now;
     m_state->update(now.alarms, m_performance);
-    return 0;
 }
 
 int Z7SimIntervalTable::CloseInterval() {

@@ -15,19 +15,30 @@
 #include "board/DS1IntervalTable.h"
 #include "board/DS1IntervalValidity.h"
 
-/// A `Z7SimIntervalTable` reads its line's counters once a second and counts what the second was.
-/// The `LineScheduler` ticks it, not the process's scheduler.
+/// A `Z7SimIntervalTable` gets its line's counters once a second and counts what the second was.
+/// The `LineScheduler` ticks it, not the process's scheduler: either alone, and then it reads the
+/// counters itself, or with the other lines of its board (`LineTicks`).
 ///
 /// Seconds that were not seen (see `LineSeconds`) pass time and count nothing, and the intervals
 /// that they belong to are not valid. The status is then the one that was known last.
 class Z7SimIntervalTable final : public DS1IntervalTable, public DS1IntervalValidity {
   public:
+    enum class Ticked : std::uint8_t { alone, withBoard };
+
     /// `past`: the counters of the seconds before, oldest first, which are counted as live ones
     /// are; may be empty. `source` and `state` are shared with the line's other users.
     Z7SimIntervalTable(LineFormat format, FailureTimes const& times,
                        std::shared_ptr<LineSource> source, std::shared_ptr<LineState> state,
-                       std::vector<DS1LineCounters> const& past);
+                       std::vector<DS1LineCounters> const& past, Ticked ticked = Ticked::alone);
     ~Z7SimIntervalTable() override;
+
+    /// A tick at which the line answered this.
+    void tick(DS1LineCounters const& now);
+    /// Prefetches what a tick uses.
+    void fetch() const;
+
+    /// A tick at which the table asks its line.
+    int ScheduledAction() override;
 
     int GetControlledSlipSeconds(int n) override;
     int GetDegradedMinutes(int n) override;
@@ -39,6 +50,7 @@ class Z7SimIntervalTable final : public DS1IntervalTable, public DS1IntervalVali
   private:
     void begin(std::vector<DS1LineCounters> const& past);
     void replay(std::vector<DS1LineCounters> const& past);
+    void answered(DS1LineCounters const& now);
     void count(DS1LineCounters const& now);
     void miss(std::int64_t seconds);
     void close();

@@ -84,7 +84,7 @@ void Z7SimLineFeature::add(long device, LineRecords& records) {
     if (!PlatformLine(device).read(counters)) return;
     LineSetup setup = readSetup(device, static_cast<int>(m_lines.size()) + 1);
     LineRecord const& record = records.of(device, setup.format());
-    m_lines.emplace_back(new Z7SimLine(std::move(setup), record.state, record.intervals));
+    m_lines.emplace_back(new Z7SimLine(std::move(setup), record.state, {record.intervals.get()}));
     m_devices.push_back(device);
     m_numbers.push_back(record.state->number());
 }

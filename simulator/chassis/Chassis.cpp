@@ -163,7 +163,12 @@ void Chassis::add(ObjectDraft draft, std::int32_t parent) {
         object.ds1Line = std::make_unique<LiveLine>(std::move(*draft.ds1Line), lineTime());
     if (draft.channels) object.channels = std::make_unique<Channels>(std::move(*draft.channels));
     ChassisObject const& added = m_objects.emplace(draft.handle, std::move(object)).first->second;
-    m_objects.at(parent).children.push_back(draft.handle);
+    ChassisObject& above = m_objects.at(parent);
+    above.children.push_back(draft.handle);
+    if (added.ds1Line) {
+        if (!above.lines) above.lines = std::make_unique<std::vector<LineOfBoard>>();
+        above.lines->push_back({draft.handle, added.ds1Line.get()});
+    }
     index(added, kName);
     index(added, kSerialNumber);
     for (auto& child : draft.children)

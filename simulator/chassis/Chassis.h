@@ -40,6 +40,12 @@ struct ObjectDraft {
     std::vector<ObjectDraft> children;
 };
 
+/// A device that is a line, with its handle.
+struct LineOfBoard {
+    std::int32_t device = 0;
+    LiveLine const* line = nullptr;
+};
+
 /// A `ChassisObject` is an object of the chassis: its root, a board, or an object of a board.
 struct ChassisObject {
     ObjectKind kind = ObjectKind::root;
@@ -50,6 +56,8 @@ struct ChassisObject {
     std::vector<std::int32_t> children; ///< in the order of the chassis
     std::unique_ptr<LiveLine> ds1Line;  ///< null: it is no line
     std::unique_ptr<Channels> channels; ///< null: it has no ISDN channels
+    /// The lines among the children, in their order; null: there are none.
+    std::unique_ptr<std::vector<LineOfBoard>> lines;
 
     AttributeValue const* attribute(std::string_view name) const {
         auto const found = attributes.find(name);

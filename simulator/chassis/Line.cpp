@@ -20,6 +20,7 @@ std::string_view nameOf(DS1LineType type) {
 }
 
 Line::Count Line::Count::after(std::uint64_t rate, Time time) const {
+    if (rate == 0) return *this;
     // Whole seconds and their rest, whole errors and billionths are multiplied separately, so that
     // every product fits.
     auto const nanoseconds = static_cast<std::uint64_t>(std::max(time, Time::zero()).count());
@@ -35,9 +36,10 @@ Line::Count Line::Count::after(std::uint64_t rate, Time time) const {
 }
 
 std::uint32_t Line::TouchedSeconds::at(Time age) const {
+    if (!m_present) return m_counted;
     // Up to, but not at, this moment: a second is touched by what lies behind its beginning.
     std::int64_t const end = std::chrono::ceil<std::chrono::seconds>(age).count();
-    if (!m_present || end <= m_next) return m_counted;
+    if (end <= m_next) return m_counted;
     return m_counted + static_cast<std::uint32_t>(end - m_next);
 }
 

@@ -48,10 +48,28 @@ std::int32_t readBytes(DMAttribute& request, std::int32_t capacity, void const* 
     return 0;
 }
 
-/// The answer of a line or ISDN channels; none for an attribute that they do not answer.
+/// As many lines of a board as the buffer holds.
+std::int32_t readLines(DMAttribute& request, std::int32_t capacity,
+                       std::vector<LineOfBoard> const& lines, LiveLine::Time now) {
+    std::size_t const count =
+        std::min(lines.size(), static_cast<std::size_t>(capacity) / sizeof(DS1BoardLine));
+    auto* to = static_cast<unsigned char*>(request.value);
+    for (std::size_t i = 0; i < count; ++i) {
+        DS1BoardLine const line{lines[i].device, lines[i].line->counters(now)};
+        std::memcpy(to, &line, sizeof line);
+        to += sizeof line;
+    }
+    request.size = static_cast<std::int32_t>(count * sizeof(DS1BoardLine));
+    return 0;
+}
+
+/// The answer of a board's lines, a line or ISDN channels; none for an attribute that they do not
+/// answer.
 std::optional<std::int32_t> readLive(DMAttribute& request, std::int32_t capacity,
                                      ChassisObject const& object, Chassis const& chassis) {
     std::string_view const name = request.name;
+    if (object.lines && object.kind == ObjectKind::board && name == kDS1BoardCounters)
+        return readLines(request, capacity, *object.lines, chassis.lineTime());
     if (object.ds1Line) {
         LinePast const& past = object.ds1Line->draft().past;
         if (name == kDS1LineCounters) {

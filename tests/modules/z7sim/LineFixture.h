@@ -53,10 +53,7 @@ class StillScheduler final : public LineScheduler {
 /// Board 5 with line 51, as the reference factory makes it.
 class LineTest : public testing::Test {
   protected:
-    LineTest() {
-        StillScheduler::install();
-        m_factory->SetPingInterval(0);
-    }
+    LineTest() { m_factory->SetPingInterval(0); }
     ~LineTest() override {
         if (m_feature.get() != nullptr) m_feature->Withdraw();
     }
@@ -108,7 +105,7 @@ class LineTest : public testing::Test {
     void tick(int count = 1) {
         for (int i = 0; i < count; ++i) {
             LineClock::advance(std::chrono::seconds(1));
-            m_table->ScheduledAction();
+            m_scheduler.pass(LineScheduler::time() + 1);
         }
     }
     static void errors(sim::Json const& counts) {
@@ -129,6 +126,7 @@ class LineTest : public testing::Test {
                                   "}, line: {" + line + "}}]")});
     }
 
+    StillScheduler& m_scheduler = StillScheduler::install();
     LineClock m_clock;
     ReferenceCounter<BoardManager> m_manager{new BoardManager};
     OpenFactory* m_factory = new OpenFactory;

@@ -244,7 +244,7 @@ TEST_F(LineHistoryTest, NothingOfAnotherBoardIsCountedBeforeItIsFound) {
     static_cast<Z7Board*>(m_board.get())->ProcessExternalEvent(BoardStatusStarted);
     for (int i = 0; i < 10; ++i) {
         LineClock::advance(std::chrono::seconds(1));
-        history->ScheduledAction();
+        m_scheduler.pass(LineScheduler::time() + 1);
     }
     EXPECT_EQ(history->GetPathCodingViolations(0), 0);
     EXPECT_EQ(history->GetTimeElapsed(), 20);
@@ -272,22 +272,32 @@ TEST_F(LineHistoryTest, HistoryEndsWithItsBoard) {
 TEST_F(LineHistoryTest, ProcessesSchedulerDoesNotTickTheModulesTables) {
     plugIn("type: esf");
     EXPECT_EQ(ActionScheduler_pthread::GetScheduler()->Remove(m_table.get()), 1);
-    EXPECT_EQ(LineScheduler::instance().Remove(m_table.get()), 0);
+    EXPECT_EQ(LineScheduler::instance().Remove(m_table.get()), 1) << "its board is ticked";
+}
+
+TEST_F(LineHistoryTest, TableThatOutlivesItsBoardMissesSeconds) {
+    plugIn("type: esf, errors: {path-violations: 1}");
+    tick(5);
+    m_feature = {};
+    m_line = {};
+    m_board = {};
+    sim::command({{"command", "remove"}, {"board", 5}});
+    sim::drain();
+    tick(3);
+    EXPECT_EQ(m_table->GetTimeElapsed(), 8);
+    EXPECT_EQ(m_table->GetPathCodingViolations(0), 5);
+    EXPECT_FALSE(isValid(0));
 }
 
 TEST_F(LineHistoryTest, PassOfTheLinesSchedulerTicksThemOnce) {
     plugIn("type: esf");
-    StillScheduler& scheduler = StillScheduler::install();
     long const time = LineScheduler::time();
-    for (int i = 1; i <= 5; ++i) {
-        LineClock::advance(std::chrono::seconds(1));
-        scheduler.pass(time + i);
-    }
+    tick(5);
     EXPECT_EQ(m_table->GetTimeElapsed(), 5);
     EXPECT_TRUE(isValid(0));
     // One pass is left out, and the clocks agree on it.
     LineClock::advance(std::chrono::seconds(2));
-    scheduler.pass(time + 7);
+    m_scheduler.pass(time + 7);
     EXPECT_EQ(m_table->GetTimeElapsed(), 7);
     EXPECT_FALSE(isValid(0));
 }

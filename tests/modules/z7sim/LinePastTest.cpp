@@ -38,6 +38,23 @@ class LinePastTest : public LineTest {
     }
 };
 
+TEST_F(LinePastTest, DayOfHistoryGoesOnAcrossARestart) {
+    plugIn("type: esf, past: {hours: 24, errors: {path-violations: 1}}, "
+           "errors: {path-violations: 1}");
+    ASSERT_EQ(m_table->GetValidIntervals(), 95);
+    ASSERT_EQ(m_table->GetTimeElapsed(), 900);
+    tick(10);
+    restart();
+    tick(895);
+    EXPECT_EQ(m_table->GetValidIntervals(), 96);
+    EXPECT_EQ(m_table->GetTimeElapsed(), 5);
+    EXPECT_EQ(m_table->GetPathCodingViolations(0), 5);
+    for (int n = 0; n <= 95; ++n) {
+        EXPECT_TRUE(isValid(n)) << n;
+        EXPECT_EQ(m_table->GetPathCodingViolations(n), n == 0 ? 5 : 900) << n;
+    }
+}
+
 TEST_F(LinePastTest, IsWhatLiveSecondsWouldHaveCounted) {
     plugIn("type: esf, past: {seconds: 3600, errors: {path-violations: 0.25, slips: 0.0625}, "
            "spells: [{ago: 3000, seconds: 40, alarms: [los]}, "

@@ -397,6 +397,37 @@ TEST_P(LinePerformanceHistoryTest, CountsAreRightAfterEverySecond) {
     }
 }
 
+/// `countClean` is a shorter way for seconds of which nothing was counted, and leaves no trace.
+TEST_P(LinePerformanceHistoryTest, CleanSecondIsTheSameAsOneThatIsCounted) {
+    Histories histories(4805 + static_cast<unsigned>(GetParam()));
+    std::mt19937 random(7);
+    int taken = 0;
+    for (int round = 0; round < 60 && !HasFailure(); ++round) {
+        SCOPED_TRACE(round);
+        History const history = histories.next(250);
+        LinePerformance longer(GetParam(), history.times);
+        LinePerformance shorter(GetParam(), history.times);
+        auto const count = [&](LineSecond const& second, bool isClean) {
+            LinePerformance::Change const expected = longer.count(second);
+            LinePerformance::Change change;
+            if (isClean && shorter.countClean())
+                ++taken;
+            else
+                change = shorter.count(second);
+            ASSERT_EQ(change.running, expected.running);
+            ASSERT_EQ(change.previous, expected.previous);
+            ASSERT_EQ(shorter.unavailable(), longer.unavailable());
+            ASSERT_EQ(shorter.failures(), longer.failures());
+        };
+        for (LineSecond const& second : history.seconds) {
+            count(second, false);
+            for (std::size_t clean = random() % 20 == 0 ? random() % 150 : 0; clean > 0; --clean)
+                count(LineSecond(), true);
+        }
+    }
+    EXPECT_GT(taken, 10'000);
+}
+
 INSTANTIATE_TEST_SUITE_P(Formats, LinePerformanceHistoryTest,
                          testing::Values(LineFormat::esf, LineFormat::d4, LineFormat::e1,
                                          LineFormat::e1Crc),

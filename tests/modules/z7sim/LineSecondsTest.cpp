@@ -1,5 +1,9 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // Which seconds of a line were seen: each way to miss one, worked out by hand.
+#include <cstdint>
+
+#include <random>
+
 #include <gtest/gtest.h>
 
 #include "LineSeconds.h"
@@ -50,6 +54,48 @@ TEST_F(LineSecondsTest, ClocksOfDifferentSpeedMissNothing) {
     m_seconds.begin(kAge, kTime);
     for (int i = 1; i <= 400; ++i)
         expectSeen(tick(i, i - i / 20));
+}
+
+/// `goOn` is a shorter way for ticks that are nothing special, and leaves no trace of itself.
+TEST(LineSecondsShortcutTest, NextSecondIsTheSameAsAnAnswer) {
+    std::minstd_rand engine(1);
+    auto const below = [&engine](std::uint32_t limit) {
+        return std::uniform_int_distribution<std::uint32_t>(0, limit - 1)(engine);
+    };
+    LineSeconds shorter;
+    LineSeconds longer;
+    shorter.begin(500, 9000);
+    longer.begin(500, 9000);
+    std::uint32_t age = 500;
+    std::int64_t time = 9000;
+    int taken = 0;
+    for (int i = 0; i < 100'000; ++i) {
+        bool const isSpecial = below(4) == 0;
+        time += std::int64_t{isSpecial ? below(3) : 1};
+        age += isSpecial ? below(4) : 1;
+        if (below(50) == 0) age = below(10);
+        LineTick expected;
+        LineTick tick;
+        if (below(20) == 0) {
+            expected = longer.silent(time);
+            tick = shorter.silent(time);
+        } else {
+            expected = longer.answered(age, time);
+            bool const isNext = shorter.isNext(age, time);
+            if (isNext) shorter.goOn();
+            tick = isNext ? LineTick{0, true} : shorter.answered(age, time);
+            taken += isNext ? 1 : 0;
+        }
+        ASSERT_EQ(tick.missed, expected.missed) << i;
+        ASSERT_EQ(tick.counts, expected.counts) << i;
+    }
+    EXPECT_GT(taken, 20'000);
+}
+
+TEST(LineSecondsShortcutTest, AgeThatBeginsAnewAfterItsLastNumberIsSpecial) {
+    LineSeconds seconds;
+    seconds.begin(0xFFFFFFFF, 9000);
+    EXPECT_FALSE(seconds.isNext(0, 9001));
 }
 
 TEST_F(LineSecondsTest, SecondsBetweenTicksThatWereLeftOutAreMissed) {

@@ -78,6 +78,20 @@ class LineAttributesTest : public testing::Test {
         return records;
     }
 
+    static std::vector<DS1BoardLine> lines(long board, std::size_t capacity = 65536) {
+        std::string const bytes = read(board, kDS1BoardCounters, capacity);
+        std::vector<DS1BoardLine> all(bytes.size() / sizeof(DS1BoardLine));
+        std::memcpy(all.data(), bytes.data(), all.size() * sizeof(DS1BoardLine));
+        return all;
+    }
+    /// What the board answers for its lines is what each of them answers.
+    static void expectTheSameAlone(std::vector<DS1BoardLine> const& lines) {
+        for (DS1BoardLine const& line : lines) {
+            DS1LineCounters const alone = readLine(line.device);
+            EXPECT_EQ(std::memcmp(&line.counters, &alone, sizeof alone), 0) << line.device;
+        }
+    }
+
     static void run(char const* command) {
         json const reply = kvlsim::execute(json::parse(command));
         ASSERT_EQ(reply["ok"], true) << reply;
@@ -106,6 +120,62 @@ TEST_F(LineAttributesTest, DevicesWithoutALineHaveNoCounters) {
     for (char const* name : {kDS1LineCounters, kDS1LinePast, kDS1LinePastSeconds, kDS1LineType,
                              kISDNChannelStates, kISDNSignallingState})
         EXPECT_EQ(read(13, name), "status 1") << name;
+}
+
+TEST_F(LineAttributesTest, BoardAnswersForAllItsLines) {
+    auto const handles = [](auto const& lines) {
+        std::vector<std::int32_t> devices;
+        for (DS1BoardLine const& line : lines)
+            devices.push_back(line.device);
+        return devices;
+    };
+    EXPECT_THAT(handles(lines(1)), ElementsAre(10, 11));
+    expectTheSameAlone(lines(1));
+    clock.advance(10s + 1ms);
+    expectTheSameAlone(lines(1));
+    EXPECT_EQ(lines(1)[0].counters.controlledSlips, 20U);
+    EXPECT_EQ(lines(1)[1].counters.seconds, 50U);
+}
+
+TEST_F(LineAttributesTest, BoardAnswersForAsManyLinesAsTheBufferHolds) {
+    EXPECT_EQ(lines(1, 2 * sizeof(DS1BoardLine)).size(), 2U);
+    EXPECT_EQ(lines(1, 2 * sizeof(DS1BoardLine) - 1).size(), 1U);
+    EXPECT_EQ(lines(1, 3).size(), 0U);
+}
+
+TEST_F(LineAttributesTest, OnlyBoardsWithLinesAnswerForThem) {
+    run(R"({"command": "insert", "board": {"handle": 2, "attributes": {"SERIAL_NUMBER": "S2"},
+            "devices": [{"handle": 20, "type": 503}]}})");
+    EXPECT_EQ(read(2, kDS1BoardCounters), "status 1");
+    EXPECT_EQ(read(10, kDS1BoardCounters), "status 1");
+}
+
+TEST_F(LineAttributesTest, BoardThatReturnsAnswersForItsNewLines) {
+    run(R"({"command": "remove", "board": 1})");
+    DS1BoardLine line{};
+    DMAttribute request{kDS1BoardCounters, &line, 0, 0, sizeof line};
+    EXPECT_EQ(dm_getDeviceMapperClient()->GetAttributes(1, 1, &request), 201);
+    run(R"({"command": "insert", "board": {"handle": 1, "attributes": {"SERIAL_NUMBER": "S1"},
+            "devices": [{"handle": 11, "type": 501, "line": {"type": "esf"}}]}})");
+    ASSERT_EQ(lines(1).size(), 1U);
+    EXPECT_EQ(lines(1)[0].device, 11);
+    EXPECT_EQ(lines(1)[0].counters.seconds, 0U);
+}
+
+TEST_F(LineAttributesTest, LineThatCountsNoMoreKeepsItsCounts) {
+    clock.advance(10s);
+    run(R"({"command": "line-alarm", "line": 10, "alarm": "los"})");
+    clock.advance(2s);
+    run(R"({"command": "line-mend", "line": 10})");
+    run(R"({"command": "line-rates", "line": 10, "rates": {"slips": 0, "code-violations": 0}})");
+    DS1LineCounters const then = lines(1)[0].counters;
+    EXPECT_EQ(then.controlledSlips, 24U);
+    EXPECT_EQ(then.lossOfSignalSeconds, 2U);
+    clock.advance(100s);
+    DS1LineCounters now = lines(1)[0].counters;
+    EXPECT_EQ(now.seconds, 112U);
+    now.seconds = then.seconds;
+    EXPECT_EQ(std::memcmp(&now, &then, sizeof now), 0);
 }
 
 TEST_F(LineAttributesTest, LineTellsItsType) {

@@ -1,0 +1,64 @@
+// SPDX-License-Identifier: BSD-2-Clause
+#include "LineTicks.h"
+
+#include <algorithm>
+#include <cstddef>
+#include <span>
+#include <utility>
+
+#include "LineScheduler.h"
+#include "Z7SimIntervalTable.h"
+
+namespace {
+
+/// The answer of `device`. Answers usually stand in the order in which they are looked for: `next`
+/// is where to look first, and where to go on. Null if there is none.
+DS1BoardLine const* find(std::span<DS1BoardLine const> answers, long device, std::size_t& next) {
+    if (next >= answers.size() || answers[next].device != device) {
+        auto const found = std::ranges::find(answers, device, &DS1BoardLine::device);
+        if (found == answers.end()) return nullptr;
+        next = static_cast<std::size_t>(found - answers.begin());
+    }
+    return &answers[next++];
+}
+
+} // namespace
+
+LineTicks::LineTicks(std::unique_ptr<LineBatch> batch) : m_batch(std::move(batch)) {
+    LineScheduler::instance().AddPeriodic(this, 1);
+}
+
+LineTicks::~LineTicks() {
+    LineScheduler::instance().Remove(this);
+}
+
+void LineTicks::add(long device, Z7SimIntervalTable& table) {
+    LineScheduler::instance().betweenPasses([&] {
+        m_answers.resize(m_lines.size() + 1);
+        m_lines.push_back({device, &table});
+    });
+}
+
+void LineTicks::remove(Z7SimIntervalTable const& table) {
+    LineScheduler::instance().betweenPasses([&] {
+        std::erase_if(m_lines, [&](Line const& line) { return line.table == &table; });
+        m_answers.resize(m_lines.size());
+    });
+}
+
+int LineTicks::ScheduledAction() {
+    if (m_lines.empty()) return 0;
+    // The tables lie all over memory; they are fetched while the platform answers.
+    for (Line const& line : m_lines)
+        line.table->fetch();
+    std::size_t const count = m_isTogether ? m_batch->read(m_answers) : 0;
+    auto const answers = std::span(m_answers).first(std::min(count, m_answers.size()));
+    std::size_t next = 0;
+    for (Line const& line : m_lines) {
+        if (auto const* const answer = find(answers, line.device, next))
+            line.table->tick(answer->counters);
+        else
+            line.table->ScheduledAction();
+    }
+    return 0;
+}
