@@ -36,6 +36,7 @@ bool isAsMade(Object const& object) {
            !list->is_element(KVL::IID()) && !list->is_element(KVL::IID("7Feature"));
 }
 
+#ifndef KVLOAM_NO_POOL
 long anonymousMemory() {
     std::ifstream rollup("/proc/self/smaps_rollup");
     for (std::string line; std::getline(rollup, line);)
@@ -43,6 +44,7 @@ long anonymousMemory() {
     ADD_FAILURE() << "the system does not tell a process's memory";
     return 0;
 }
+#endif
 
 TEST(ListKindsTest, EveryObjectHasAListOfItsOwn) {
     Interfaces const all = interfaces(kMany);

@@ -38,6 +38,7 @@ bool isPristine(Object const& object) {
            !list->is_element(KVL::IID("7Feature"));
 }
 
+#ifndef KVLOAM_NO_POOL
 /// The process's memory that is not shared with a file, in bytes.
 long anonymousMemory() {
     std::ifstream rollup("/proc/self/smaps_rollup");
@@ -56,6 +57,7 @@ int listFile() {
     }
     return -1;
 }
+#endif
 
 TEST(HandleListsTest, EveryHandleHasAListOfItsOwn) {
     Handles const handles = emptyHandles(kMany);
@@ -86,6 +88,9 @@ TEST(HandleListsTest, IdentifierThatAHandleWasGivenIsGoneWhenItsListIsUsedAgain)
 }
 
 TEST(HandleListsTest, ListsThatOneThreadGivesBackServeOthers) {
+#ifdef KVLOAM_NO_POOL
+    GTEST_SKIP() << "with a sanitizer, lists come from the heap";
+#else
     Handles handles = emptyHandles(kMany);
     std::set<KVL::IIDList const*> lists;
     for (auto const& handle : handles)
@@ -94,7 +99,6 @@ TEST(HandleListsTest, ListsThatOneThreadGivesBackServeOthers) {
     int again = 0;
     for (auto const& handle : emptyHandles(kMany))
         again += lists.contains(handle->interfaces()) ? 1 : 0;
-#ifndef KVLOAM_NO_POOL
     EXPECT_GT(again, kMany / 2);
 #endif
 }
@@ -117,6 +121,7 @@ TEST(HandleListsTest, HandlesNeedHardlyAnyMemoryForTheirLists) {
 #endif
 }
 
+#ifndef KVLOAM_NO_POOL
 /// Replaces the library's descriptor, as a program may that closes all descriptors, and makes
 /// handles.
 [[noreturn]] void makeHandlesWithAForeignDescriptor() {
@@ -128,6 +133,7 @@ TEST(HandleListsTest, HandlesNeedHardlyAnyMemoryForTheirLists) {
         if (!isPristine(*handle)) std::exit(1);
     std::exit(0);
 }
+#endif
 
 TEST(HandleListsDeathTest, HandlesAreMadeThoughTheProgramHasReplacedTheDescriptor) {
 #ifdef KVLOAM_NO_POOL
