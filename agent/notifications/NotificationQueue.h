@@ -31,10 +31,11 @@ class NotificationQueue {
     void push(Notification notification) {
         {
             std::scoped_lock const guard(m_mutex);
-            bool const hasRoom = m_notifications.size() < m_capacity;
-            if (hasRoom) m_notifications.push_back(std::move(notification));
-            countWaiting();
-            if (hasRoom) return;
+            if (m_notifications.size() < m_capacity) {
+                m_notifications.push_back(std::move(notification));
+                countWaiting();
+                return;
+            }
             ++m_counters.notificationsDropped;
         }
         if (m_dropped) m_dropped(notification);
