@@ -17,7 +17,7 @@ constexpr std::chrono::seconds kPause{1};
 
 /// The row of this index; null if there is none.
 template <class Row, auto Index>
-Row const* find(std::vector<Row> const& rows, std::uint32_t index) {
+Row const* find(Rows<Row> const& rows, std::uint32_t index) {
     auto const found = std::ranges::lower_bound(rows, index, {}, Index);
     return found == rows.end() || (*found).*Index != index ? nullptr : &*found;
 }

@@ -40,6 +40,7 @@
 #include "agent/objects/OwnObjects.h"
 #include "agent/objects/StandardObjects.h"
 #include "agent/readers/BoardSource.h"
+#include "agent/readers/BoardTurns.h"
 #include "agent/readers/Collector.h"
 #include "agent/readers/EntityReader.h"
 #include "agent/readers/HostInterfaces.h"
@@ -77,6 +78,7 @@ struct Boards {
             alarmReport.record(dropped, true);
         });
         listener.observe([this](int index, Board& board, BoardStatusEnum status) {
+            turns.note(static_cast<std::uint32_t>(index));
             alarmEvents.boardStatus(index, board, status);
         });
         faultListener.observe([this](FaultChange const& change) {
@@ -90,7 +92,8 @@ struct Boards {
     ReferenceCounter<BoardManager> manager{new BoardManager};
     Counters counters;
     Settings settings;
-    BoardSource source{*manager.get()};
+    BoardTurns turns;
+    BoardSource source{*manager.get(), &turns};
     NotificationQueue queue{counters};
     AlarmReport alarmReport;
     AlarmList alarms{{}, [this](AlarmEvent event, Alarm const& alarm) {
@@ -230,7 +233,8 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front, H
     interfaceFile.open();
     HostInterfaces host;
     if (!options.agentx.empty()) indices.skipTo(host.highest() + 1);
-    InterfaceReader interfaces(*boards.manager.get(), indices, started);
+    InterfaceReader interfaces(*boards.manager.get(), indices, started, &boards.turns);
+    ResourceReader resources(*boards.manager.get(), &boards.turns);
     StateFile entityFile(directory + "/entity.sqlite", "physical entities");
     StableIndices entityIndices(entityFile, kFirstEntity);
     KeptSettings keptEntitySettings(entityFile, entityIndices, boards.settings,
@@ -254,15 +258,16 @@ void serve(Options const& options, ReadOptions const& readAgain, Front& front, H
             snapshot.services = readServices(services);
             snapshot.platformService = readPlatformService(services);
             snapshot.processes = readProcesses(statistics);
-            snapshot.resources = readResources(*boards.manager.get(), snapshot.boards);
             snapshot.records = platform.read(snapshot.boards);
             snapshot.platformSilent = !platform.mapperAnswers();
             snapshot.storeUnreadable = !platform.storeIsReadable();
             boards.lines.listen(snapshot.boards, interfaces.changeTimes());
             snapshot.interfaces = interfaces.read(snapshot.boards);
+            // After the interfaces, which tell which lines and channels have changed.
+            snapshot.resources = resources.read(snapshot.boards);
             boards.faults.compare(shownLineFaults(snapshot.interfaces), Clock::now());
             snapshot.faults = boards.faults.read(started);
-            std::vector<PlacedLine> const lines = interfaces.takeLines();
+            std::vector<PlacedLine> const& lines = interfaces.lines();
             boards.lines.place(lines);
             applySettings(boards.settings, lines);
             links.update(snapshot.interfaces.interfaces, snapshot.begun);

@@ -22,7 +22,7 @@ bool hasFailed(BearerRow const& row) {
 
 } // namespace
 
-void CallWatch::update(std::vector<BearerRow> const& bearers, Clock::time_point begun) {
+void CallWatch::update(Rows<BearerRow> const& bearers, Clock::time_point begun) {
     std::vector<Call> calls;
     calls.reserve(bearers.size());
     auto former = m_calls.begin();

@@ -9,6 +9,7 @@
 
 #include "agent/notifications/NotificationQueue.h"
 #include "agent/rows/InterfaceRows.h"
+#include "agent/rows/Rows.h"
 #include "agent/rows/Settings.h"
 
 namespace kvloamd {
@@ -26,7 +27,7 @@ class CallWatch {
         : m_settings(settings), m_queue(queue), m_counters(counters) {}
 
     /// Compares with the bearers of a snapshot that was begun at `begun`, ascending by index.
-    void update(std::vector<BearerRow> const& bearers, Clock::time_point begun);
+    void update(Rows<BearerRow> const& bearers, Clock::time_point begun);
 
   private:
     /// How far a bearer channel's call had come.

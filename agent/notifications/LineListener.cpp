@@ -29,7 +29,7 @@ int LineListener::ProcessLineStatusEvent(ReferenceCounter<DS1LineStatusEvent> ev
     return 0;
 }
 
-void LineListener::listen(std::vector<BoardRow> const& boards, ChangeTimes& times) {
+void LineListener::listen(Rows<BoardRow> const& boards, ChangeTimes& times) {
     {
         std::scoped_lock const guard(m_mutex);
         m_times = &times;

@@ -14,6 +14,7 @@
 #include "agent/readers/ChangeTimes.h"
 #include "agent/readers/PlacedLine.h"
 #include "agent/rows/BoardRow.h"
+#include "agent/rows/Rows.h"
 #include "agent/rows/Settings.h"
 #include "board/BoardManager.h"
 #include "board/DS1LineFeature.h"
@@ -46,7 +47,7 @@ class LineListener final : public DS1LineStatusListener {
 
     /// Subscribes to the line features of `boards` to which it is not subscribed yet. `times`
     /// outlives the process's last line event.
-    void listen(std::vector<BoardRow> const& boards, ChangeTimes& times);
+    void listen(Rows<BoardRow> const& boards, ChangeTimes& times);
     /// Takes over the ifIndex of every line, and queues the changes that waited for one.
     void place(std::vector<PlacedLine> const& lines);
 

@@ -18,7 +18,7 @@ bool hasChanged(std::optional<int> former, std::optional<int> now) {
 
 } // namespace
 
-void LinkWatch::update(std::vector<InterfaceRow> const& interfaces, Clock::time_point begun) {
+void LinkWatch::update(Rows<InterfaceRow> const& interfaces, Clock::time_point begun) {
     std::vector<Link> links;
     links.reserve(interfaces.size());
     auto former = m_links.begin();

@@ -8,6 +8,7 @@
 
 #include "agent/notifications/NotificationQueue.h"
 #include "agent/rows/InterfaceRows.h"
+#include "agent/rows/Rows.h"
 #include "agent/rows/Settings.h"
 
 namespace kvloamd {
@@ -25,7 +26,7 @@ class LinkWatch {
         : m_settings(settings), m_queue(queue), m_counters(counters) {}
 
     /// Compares with the interfaces of a snapshot that was begun at `begun`, ascending by index.
-    void update(std::vector<InterfaceRow> const& interfaces, Clock::time_point begun);
+    void update(Rows<InterfaceRow> const& interfaces, Clock::time_point begun);
 
   private:
     struct Link {

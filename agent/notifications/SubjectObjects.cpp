@@ -22,7 +22,7 @@ constexpr std::uint32_t kBoardSerialNumber = 9;
 
 /// The row with this index; null if there is none.
 template <class Row>
-Row const* find(std::vector<Row> const& rows, std::uint32_t index) {
+Row const* find(Rows<Row> const& rows, std::uint32_t index) {
     auto const found =
         std::ranges::partition_point(rows, [&](Row const& row) { return row.index()[0] < index; });
     return found == rows.end() || found->index()[0] != index ? nullptr : &*found;

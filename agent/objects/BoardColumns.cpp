@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // kvlBoardTable: the boards, with every query of the abstract board.
+#include "agent/objects/EntityColumnTable.h"
 #include "agent/objects/OwnObjects.h"
 #include "agent/objects/RowValues.h"
 #include "board/Board.h"
@@ -23,10 +24,6 @@ constexpr NamedNumber kStates[] = {
 template <auto Field>
 Value status(BoardRow const& row) {
     return std::int64_t{row.*Field};
-}
-
-Value entity(BoardRow const& row) {
-    return row.entity == 0 ? Value{} : Value{std::int64_t{row.entity}};
 }
 
 using enum ValueType;
@@ -66,14 +63,15 @@ constexpr Column<BoardRow> kColumns[] = {
     {"kvlBoardPciSlotNumber", 19, Integer, number<&BoardRow::pciSlotNumber>,
      about("The board's slot on its PCI bus")},
     {"kvlBoardBusNumber", 20, Integer, number<&BoardRow::busNumber>, about("The board's PCI bus")},
-    {"kvlBoardPhysicalIndex", 21, Integer, entity, about("The physical entity that the board is")},
+    {"kvlBoardPhysicalIndex", 21, Integer, notOfTheRow<BoardRow>,
+     about("The physical entity that the board is")},
 };
 
 } // namespace
 
 Table const& boardTable() {
-    static RowTable<BoardRow, &Snapshot::boards> const table("kvlBoardTable", {1, 1, 2, 4, 1},
-                                                             kColumns);
+    static EntityColumnTable<BoardRow, &Snapshot::boards, &EntityRows::ofBoards> const table(
+        "kvlBoardTable", {1, 1, 2, 4, 1}, kColumns);
     return table;
 }
 

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // DS1-MIB's tables: the lines, their running intervals, their closed ones and the sums of these.
 #include <algorithm>
+#include <atomic>
 
 #include "agent/objects/LineStatusBits.h"
 #include "agent/objects/RowValues.h"
@@ -251,8 +252,7 @@ class IntervalTable final : public Table {
     ColumnHead column(std::size_t column) const override { return kIntervalColumns[column]; }
 
     std::size_t rowCount(Facts const& facts) const override {
-        auto const& all = facts.snapshot.interfaces.lines;
-        return all.empty() ? 0 : all.back().intervalsBefore + all.back().closedIntervals();
+        return facts.snapshot.interfaces.intervalsBefore.back();
     }
 
     void appendIndex(Facts const& facts, std::size_t row, Oid& name) const override {
@@ -262,15 +262,17 @@ class IntervalTable final : public Table {
     }
 
     std::size_t firstRow(Facts const& facts, OidView index, bool orEqual) const override {
-        auto const& all = facts.snapshot.interfaces.lines;
+        InterfaceRows const& rows = facts.snapshot.interfaces;
         if (index.empty()) return 0;
-        auto const line = std::ranges::lower_bound(all, index[0], {}, &LineRow::ifIndex);
-        if (line == all.end()) return rowCount(facts);
-        if (line->ifIndex != index[0] || index.size() < 2) return line->intervalsBefore;
+        std::size_t const place = firstLine(rows.lines, index[0]);
+        if (place == rows.lines.size()) return rowCount(facts);
+        LineRow const& line = rows.lines[place];
+        std::size_t const before = rows.intervalsBefore[place];
+        if (line.ifIndex != index[0] || index.size() < 2) return before;
         // Intervals are numbered from 1; a longer index follows the index that it begins with.
         std::size_t passed = index[1];
         if (passed > 0 && orEqual && index.size() == 2) --passed;
-        return line->intervalsBefore + std::min(passed, line->closedIntervals());
+        return before + std::min(passed, line.closedIntervals());
     }
 
     Value value(Facts const& facts, std::size_t column, std::size_t row) const override {
@@ -290,15 +292,26 @@ class IntervalTable final : public Table {
         std::size_t interval;
     };
 
+    /// The place of the first line of this ifIndex or above.
+    std::size_t firstLine(Rows<LineRow> const& lines, std::uint32_t ifIndex) const {
+        // A walk mostly stays with a line.
+        std::size_t place = m_lastLine.load(std::memory_order_relaxed);
+        if (place < lines.size() && lines[place].ifIndex == ifIndex) return place;
+        auto const found = std::ranges::lower_bound(lines, ifIndex, {}, &LineRow::ifIndex);
+        place = static_cast<std::size_t>(found - lines.begin());
+        m_lastLine.store(place, std::memory_order_relaxed);
+        return place;
+    }
     static Place find(Facts const& facts, std::size_t row) {
-        auto const& all = facts.snapshot.interfaces.lines;
+        InterfaceRows const& rows = facts.snapshot.interfaces;
         // The last line whose rows begin at `row` or before: lines without rows are passed over.
-        auto const behind = std::ranges::upper_bound(all, row, {}, &LineRow::intervalsBefore);
-        LineRow const& line = *std::prev(behind);
-        return {line, row - line.intervalsBefore + 1};
+        auto const behind = std::ranges::upper_bound(rows.intervalsBefore, row);
+        auto const line = static_cast<std::size_t>(behind - rows.intervalsBefore.begin()) - 1;
+        return {rows.lines[line], row - rows.intervalsBefore[line] + 1};
     }
 
     Oid m_entry{10, 18, 8, 1};
+    mutable std::atomic<std::size_t> m_lastLine{0}; ///< where to look first
 };
 
 } // namespace

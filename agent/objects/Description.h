@@ -5,6 +5,7 @@
 #pragma once
 
 #include <algorithm>
+#include <atomic>
 #include <cstddef>
 #include <cstdint>
 #include <functional>
@@ -181,10 +182,10 @@ struct Column {
     Details details = {}; ///< if the column can be set, `get` says what counts until it is
 };
 
-/// A table whose rows lie in a sorted vector of the snapshot; a row says its own `index()`.
-/// `Rows`: what gives the vector of a snapshot, a member or a function.
-template <class Row, auto Rows>
-class RowTable final : public Table {
+/// A table whose rows lie in a sorted sequence of the snapshot; a row says its own `index()`.
+/// `From`: what gives the sequence of a snapshot, a member or a function.
+template <class Row, auto From>
+class RowTable : public Table {
   public:
     RowTable(char const* name, Oid entry, std::span<Column<Row> const> columns)
         : m_name(name), m_entry(std::move(entry)), m_columns(columns) {}
@@ -203,11 +204,18 @@ class RowTable final : public Table {
     }
     std::size_t firstRow(Facts const& facts, OidView index, bool orEqual) const override {
         auto const& all = rows(facts);
-        auto const found = std::partition_point(all.begin(), all.end(), [&](Row const& row) {
+        auto const isBefore = [&](Row const& row) {
             auto const order = compare(row.index(), index);
             return std::is_lt(order) || (std::is_eq(order) && !orEqual);
-        });
-        return static_cast<std::size_t>(found - all.begin());
+        };
+        // A walk asks for the row after the last one, or for another column of it.
+        std::size_t const last = m_lastFound.load(std::memory_order_relaxed);
+        for (std::size_t const guess : {last + 1, last})
+            if (guess > 0 && guess < all.size() && isBefore(all[guess - 1]) &&
+                !isBefore(all[guess]))
+                return found(guess);
+        return found(static_cast<std::size_t>(
+            std::partition_point(all.begin(), all.end(), isBefore) - all.begin()));
     }
     Value value(Facts const& facts, std::size_t column, std::size_t row) const override {
         Column<Row> const& described = m_columns[column];
@@ -223,13 +231,16 @@ class RowTable final : public Table {
     }
 
   private:
-    static std::vector<Row> const& rows(Facts const& facts) {
-        return std::invoke(Rows, facts.snapshot);
+    std::size_t found(std::size_t row) const {
+        m_lastFound.store(row, std::memory_order_relaxed);
+        return row;
     }
+    static auto const& rows(Facts const& facts) { return std::invoke(From, facts.snapshot); }
 
     char const* m_name;
     Oid m_entry;
     std::span<Column<Row> const> m_columns;
+    mutable std::atomic<std::size_t> m_lastFound{0}; ///< where to look first, in whatever snapshot
 };
 
 } // namespace kvloamd

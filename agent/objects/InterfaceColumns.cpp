@@ -1,5 +1,6 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // kvlInterfaceTable: which board an interface belongs to.
+#include "agent/objects/EntityColumnTable.h"
 #include "agent/objects/OwnObjects.h"
 #include "agent/objects/RowValues.h"
 
@@ -21,18 +22,19 @@ constexpr Column<Row> kColumns[] = {
      about("The interface's board")},
     {"kvlInterfaceBoardSerialNumber", 3, Text, text<&Row::boardSerialNumber>,
      about("The serial number of the interface's board").identifies()},
-    {"kvlInterfacePhysicalIndex", 4, Integer, reference<&Row::entity>,
+    {"kvlInterfacePhysicalIndex", 4, Integer, notOfTheRow<Row>,
      about("The physical entity that the interface is or belongs to")},
 };
 
-std::vector<Row> const& rows(Snapshot const& snapshot) {
+auto const& rows(Snapshot const& snapshot) {
     return snapshot.interfaces.interfaces;
 }
 
 } // namespace
 
 Table const& interfaceTable() {
-    static RowTable<Row, rows> const table("kvlInterfaceTable", {1, 1, 10, 1, 1}, kColumns);
+    static EntityColumnTable<Row, rows, &EntityRows::ofInterfaces> const table(
+        "kvlInterfaceTable", {1, 1, 10, 1, 1}, kColumns);
     return table;
 }
 

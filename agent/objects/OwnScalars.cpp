@@ -24,8 +24,8 @@ Value milliseconds(Clock::duration time) {
         std::numeric_limits<std::uint32_t>::max());
 }
 
-template <class Row>
-Value size(std::vector<Row> const& rows) {
+template <class All>
+Value sizeOf(All const& rows) {
     return static_cast<std::int64_t>(rows.size());
 }
 
@@ -61,7 +61,7 @@ std::span<Scalar const> scalars() {
         {"kvlBoardCount",
          {1, 1, 2, 1},
          ValueType::Gauge,
-         [](Facts const& facts) { return size(facts.snapshot.boards); },
+         [](Facts const& facts) { return sizeOf(facts.snapshot.boards); },
          about("The number of boards present, which is the number of rows of kvlBoardTable")
              .in("boards")},
         {"kvlBoardTableLastChange",
@@ -91,7 +91,7 @@ std::span<Scalar const> scalars() {
         {"kvlFaultCount",
          {1, 1, 8, 1},
          ValueType::Gauge,
-         [](Facts const& facts) { return size(facts.snapshot.faults.rows); },
+         [](Facts const& facts) { return sizeOf(facts.snapshot.faults.rows); },
          about("The number of faults that are raised now, which is the number of rows of "
                "kvlFaultTable")
              .in("faults")},
@@ -115,7 +115,7 @@ std::span<Scalar const> scalars() {
         {"kvlAlarmCount",
          {1, 1, 12, 1},
          ValueType::Gauge,
-         [](Facts const& facts) { return size(facts.snapshot.alarms->alarms); },
+         [](Facts const& facts) { return sizeOf(facts.snapshot.alarms->alarms); },
          about("The number of active alarms").in("alarms")},
         {"kvlAlarmsRaised",
          {1, 1, 12, 2},
@@ -186,12 +186,12 @@ std::span<Scalar const> scalars() {
         {"kvlInterfaceCount",
          {1, 1, 9, 9},
          ValueType::Gauge,
-         [](Facts const& facts) { return size(facts.snapshot.interfaces.interfaces); },
+         [](Facts const& facts) { return sizeOf(facts.snapshot.interfaces.interfaces); },
          about("The number of interfaces of all boards").in("interfaces")},
         {"kvlLineCount",
          {1, 1, 9, 10},
          ValueType::Gauge,
-         [](Facts const& facts) { return size(facts.snapshot.interfaces.lines); },
+         [](Facts const& facts) { return sizeOf(facts.snapshot.interfaces.lines); },
          about("The number of DS1 lines of all boards").in("lines")},
         {"kvlAgentFront",
          {1, 1, 9, 11},
@@ -238,7 +238,7 @@ std::span<Scalar const> scalars() {
         {"kvlHealthFaultCount",
          {1, 1, 9, 17},
          ValueType::Gauge,
-         [](Facts const& facts) { return size(facts.snapshot.faults.rows); },
+         [](Facts const& facts) { return sizeOf(facts.snapshot.faults.rows); },
          about("The number of faults that are raised now").in("faults")},
         {"kvlHealthFaultsUnlisted",
          {1, 1, 9, 18},

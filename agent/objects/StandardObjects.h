@@ -71,9 +71,9 @@ Table const& nlmLogVariableTable();
 std::vector<Table const*> standardTables();
 
 /// The rows of one kind among the interfaces.
-template <auto Rows>
+template <auto Table>
 auto const& interfaceRows(Snapshot const& snapshot) {
-    return snapshot.interfaces.*Rows;
+    return snapshot.interfaces.*Table;
 }
 
 } // namespace kvloamd

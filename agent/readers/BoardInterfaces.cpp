@@ -52,7 +52,7 @@ class Reading {
 
   private:
     void readInterface(KVL::Interface& interface, InterfaceRow& row) const;
-    void readLine(DS1LineDevice& line);
+    void readLine(ReferenceCounter<DS1LineDevice> const& handle);
     void readEthernet(KVL::Ethernet& ethernet);
     static void readDetails(KVL::EthernetDetails& details, InterfaceRow& interface,
                             EthernetRow& row, std::set<std::string>& addresses);
@@ -91,7 +91,10 @@ void Reading::readInterface(KVL::Interface& interface, InterfaceRow& row) const 
         unsignedNumber(interface.GetOutErrors())};
 }
 
-void Reading::readLine(DS1LineDevice& line) {
+void Reading::readLine(ReferenceCounter<DS1LineDevice> const& handle) {
+    DS1LineDevice& line = *handle.get();
+    // Before the row: what changes meanwhile is then seen by the next check.
+    KnownLine known{handle, line.GetIntervalTable(), checkLine(line)};
     std::string const name = askText(line, &DS1LineDevice::GetName);
     LineRow row;
     row.circuitIdentifier = askText(line, &DS1LineDevice::GetCircuitIdentifier);
@@ -110,8 +113,6 @@ void Reading::readLine(DS1LineDevice& line) {
     row.transmitClockSource = legal(kTransmitClockSources, line.GetTransmitClockSource());
     row.fdl = legal(kFdls, line.GetFdl());
     row.lineLength = legal(kLineLengths, line.GetLineLength());
-    long const change = line.GetLineStatusLastChange();
-    m_found.lineChanges.push_back(change < 0 ? std::nullopt : std::optional(change));
     row.statusChangeTrapEnable = legal(kTrapEnables, line.GetLineStatusChangeTrapEnable());
     row.loopbackStatus = legal(kLoopbackStatuses, line.GetLoopbackStatus());
     row.ds1ChannelNumber = legal(kDs1ChannelNumbers, line.GetDs1ChannelNumber());
@@ -123,18 +124,16 @@ void Reading::readLine(DS1LineDevice& line) {
     row.lineImpedance = legal(kLineImpedances, impedance == nullptr ? kImpedanceNotApplicable
                                                                     : impedance->GetLineImpedance())
                             .value_or(kImpedanceNotApplicable);
-    auto const history = line.GetIntervalTable();
-    if (history.get() != nullptr) m_histories.read(history, row);
+    if (known.history.get() != nullptr) m_histories.read(known.history, row);
     m_draft.addLine(line, name, row.circuitIdentifier, row.ifIndex);
     m_found.rows.lines.push_back(std::move(row));
+    m_found.lines.push_back(std::move(known));
 }
 
 void Reading::readLines(DS1LineFeature& feature) {
     for (auto line = feature.GetFirstDevice(); line.get() != nullptr;
-         line = feature.GetNextDevice(line)) {
-        readLine(*line.get());
-        m_found.lines.push_back(line);
-    }
+         line = feature.GetNextDevice(line))
+        readLine(line);
 }
 
 void Reading::readEthernets(KVL::EthernetFeature& feature) {
@@ -234,6 +233,11 @@ std::uint32_t Reading::ethernetBelow(InterfaceRow const& ip) const {
 
 } // namespace
 
+LineCheck checkLine(DS1LineDevice& line) {
+    return {line.GetLineStatus(), line.GetOperStatus(), line.GetAdminStatus(),
+            line.GetLineStatusChangeTrapEnable(), line.GetLineStatusLastChange()};
+}
+
 BoardInterfaces readInterfaces(Board& board, ToTicks const& toTicks, LineHistories& histories) {
     InterfaceDraft draft;
     Reading reading(toTicks, histories, draft);
@@ -244,7 +248,9 @@ BoardInterfaces readInterfaces(Board& board, ToTicks const& toTicks, LineHistori
                                          [&](auto& feature) { reading.readEthernets(feature); });
     forEachFeature<KVL::InterfaceFeature>(board,
                                           [&](auto& feature) { reading.readOthers(feature); });
-    return draft.take();
+    BoardInterfaces found = draft.take();
+    found.hasOnlyLines = found.rows.interfaces.size() == found.lines.size();
+    return found;
 }
 
 } // namespace kvloamd

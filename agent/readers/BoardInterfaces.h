@@ -3,26 +3,45 @@
 #pragma once
 
 #include <functional>
-#include <optional>
 #include <vector>
 
 #include "agent/readers/LineHistories.h"
 #include "agent/rows/IndexKey.h"
 #include "agent/rows/InterfaceRows.h"
 #include "board/Board.h"
+#include "board/DS1IntervalTable.h"
 #include "board/DS1LineDevice.h"
 #include "core/ReferenceCounter.h"
 
 namespace kvloamd {
 
+/// What tells at once that a line has changed, apart from its history.
+struct LineCheck {
+    int status = 0;
+    int operStatus = 0;
+    int adminStatus = 0;
+    int trapEnable = 0;
+    long lastChange = 0; ///< of the status: since the epoch; negative: not known
+
+    bool operator==(LineCheck const&) const = default;
+};
+
+LineCheck checkLine(DS1LineDevice& line);
+
+/// A line of a board, and what it answered before its row was read.
+struct KnownLine {
+    ReferenceCounter<DS1LineDevice> line;
+    ReferenceCounter<DS1IntervalTable> history; ///< may be empty
+    LineCheck check;
+};
+
 /// The rows of one board. In the place of every ifIndex is the interface's number on the board,
 /// from 1 in the order of `keys`; the rows are in no order.
 struct BoardInterfaces {
     std::vector<IndexKey> keys; ///< all different
-    InterfaceRows rows;
-    // In the order of `rows.lines`.
-    std::vector<ReferenceCounter<DS1LineDevice>> lines;
-    std::vector<std::optional<long>> lineChanges; ///< when their status changed: since the epoch
+    BoardInterfaceRows rows;
+    std::vector<KnownLine> lines; ///< in the order of `rows.lines`
+    bool hasOnlyLines = true;     ///< everything there is, is a line
 };
 
 /// Seconds since the epoch as hundredths of a second since the agent's start.

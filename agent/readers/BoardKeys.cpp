@@ -43,7 +43,7 @@ std::string slotName(BoardRow const& board) {
     return name + "slot " + std::to_string(*board.pciSlotNumber);
 }
 
-std::vector<BoardKey> boardKeys(std::vector<BoardRow> const& boards) {
+std::vector<BoardKey> boardKeys(Rows<BoardRow> const& boards) {
     std::map<std::string, BoardRow const*> owners;
     for (BoardRow const& board : boards) {
         auto const [owner, isNew] = owners.emplace(knownSerialNumber(board), &board);
@@ -65,6 +65,19 @@ std::vector<BoardKey> boardKeys(std::vector<BoardRow> const& boards) {
             keys.push_back({std::move(name), true});
     }
     return keys;
+}
+
+std::vector<BoardKey> const& KnownBoardKeys::of(Rows<BoardRow> const& boards) {
+    auto const isIdentifiedAs = [](BoardRow const& one, BoardRow const& other) {
+        return &one == &other ||
+               (one.boardIndex == other.boardIndex && one.serialNumber == other.serialNumber &&
+                one.shelfId == other.shelfId && one.busNumber == other.busNumber &&
+                one.pciSlotNumber == other.pciSlotNumber && one.logicalId == other.logicalId);
+    };
+    m_areAsBefore = std::ranges::equal(boards, m_boards, isIdentifiedAs);
+    if (!m_areAsBefore) m_keys = boardKeys(boards);
+    m_boards = boards;
+    return m_keys;
 }
 
 } // namespace kvloamd

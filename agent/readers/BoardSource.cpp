@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <exception>
 #include <string>
+#include <utility>
 
 #include "agent/readers/Answers.h"
 #include "agent/readers/BoardFaults.h"
@@ -12,44 +13,86 @@
 
 namespace kvloamd {
 
-std::vector<BoardRow> BoardSource::read() {
+Rows<BoardRow> BoardSource::read() {
     std::vector<int> const present = indices();
     forgetGoneBoards(present);
-    std::erase_if(m_answered, [&](auto const& entry) {
-        return !std::ranges::binary_search(present, static_cast<int>(entry.first));
-    });
-    std::vector<BoardRow> rows;
+    if (m_turns != nullptr) m_turns->begin(present, Clock::now());
+    std::vector<std::shared_ptr<BoardRow const>> rows;
     rows.reserve(present.size());
+    auto const drop = [](Known const&) {};
+    m_known.begin();
     for (int const index : present) {
-        ReferenceCounter<Board> const board = m_manager.GetBoardByIndex(index);
-        if (Board* const asked = board.get(); asked != nullptr)
-            rows.push_back(readRow(*asked, index));
+        auto const boardIndex = static_cast<std::uint32_t>(index);
+        Known& known = m_known.at(boardIndex, drop);
+        // No other board ever gets its index.
+        if (known.board.get() == nullptr) known.board = m_manager.GetBoardByIndex(index);
+        if (Board* const asked = known.board.get(); asked != nullptr) {
+            if (isDue(m_turns, boardIndex) || !known.check || hasChanged(*asked, *known.check)) {
+                if (m_turns != nullptr) m_turns->add(boardIndex);
+                readRow(*asked, index, known);
+            }
+            rows.push_back(known.shown);
+        }
         yieldBetweenBoards();
     }
-    std::erase_if(
-        rows, [this](BoardRow const& row) { return hasGone(static_cast<int>(row.boardIndex)); });
-    return rows;
+    m_known.end(drop);
+    if (std::set<int> const gone = goneBoards(); !gone.empty())
+        std::erase_if(rows, [&](std::shared_ptr<BoardRow const> const& row) {
+            return gone.contains(static_cast<int>(row->boardIndex));
+        });
+    auto const address = [](auto const& row) { return row.get(); };
+    auto const addressOf = [](BoardRow const& row) { return &row; };
+    if (!std::ranges::equal(rows, m_rows, {}, address, addressOf)) {
+        m_rows.clear();
+        m_rows.reserve(rows.size());
+        for (auto const& row : rows)
+            m_rows.append({row.get(), 1}, row);
+    }
+    return m_rows;
 }
 
-BoardRow BoardSource::readRow(Board& board, int index) {
+BoardSource::Check BoardSource::check(Board& board) {
+    return {board.GetStatus(), board.GetSecondaryStatus(), board.GetFeatureListSize(),
+            board.GetDeviceChangeDate()};
+}
+
+bool BoardSource::hasChanged(Board& board, Check const& before) {
+    try {
+        return check(board) != before;
+    } catch (...) {
+        // The full reading finds out, and says so.
+        return true;
+    }
+}
+
+void BoardSource::readRow(Board& board, int index, Known& known) {
     auto const boardIndex = static_cast<std::uint32_t>(index);
-    BoardRow& answered = m_answered[boardIndex];
-    answered.boardIndex = boardIndex;
+    known.check.reset();
     std::string fault;
-    if (readGuarded(boardIndex, "answers", [&] {
-            try {
-                answered = readBoard(board, index);
-            } catch (std::exception const& error) {
-                fault = error.what();
-                throw;
-            }
-        }))
-        return answered;
-    BoardRow row = answered;
+    bool const answers = readGuarded(boardIndex, "answers", [&] {
+        try {
+            // Before the row, so that the next check sees what changes meanwhile.
+            Check const now = check(board);
+            BoardRow row = readBoard(board, index);
+            if (known.answered == nullptr || *known.answered != row)
+                known.answered = std::make_shared<BoardRow const>(std::move(row));
+            known.check = now;
+        } catch (std::exception const& error) {
+            fault = error.what();
+            throw;
+        }
+    });
+    if (answers) {
+        known.shown = known.answered;
+        return;
+    }
+    BoardRow row = known.answered == nullptr ? BoardRow{} : *known.answered;
+    row.boardIndex = boardIndex;
     row.status = BoardStatusNone;
     row.secondaryStatus = BoardStatusNone;
     row.errorMessage = printable("does not answer: " + fault);
-    return row;
+    if (known.shown == nullptr || *known.shown != row)
+        known.shown = std::make_shared<BoardRow const>(std::move(row));
 }
 
 void BoardSource::boardHasGone(int index) {
@@ -80,9 +123,9 @@ void BoardSource::forgetGoneBoards(std::vector<int> const& indices) {
     std::erase_if(m_gone, [&](int index) { return !std::ranges::binary_search(indices, index); });
 }
 
-bool BoardSource::hasGone(int index) {
+std::set<int> BoardSource::goneBoards() {
     std::scoped_lock const guard(m_mutex);
-    return m_gone.contains(index);
+    return m_gone;
 }
 
 } // namespace kvloamd

@@ -6,6 +6,7 @@
 #include <utility>
 
 #include "agent/readers/Answers.h"
+#include "agent/rows/RowFinder.h"
 #include "board/Board.h"
 #include "board/DS1LineDevice.h"
 
@@ -53,13 +54,6 @@ unsigned alarmsOf(int lineStatus) {
     if (has(lineStatus, DS1LineStatusOtherFailure | DS1LineStatusNetEquipOOS))
         alarms |= kAlarmIndeterminate;
     return alarms;
-}
-
-template <class Row>
-Row const* find(std::vector<Row> const& rows, std::uint32_t index) {
-    auto const found =
-        std::ranges::partition_point(rows, [&](Row const& row) { return row.index()[0] < index; });
-    return found == rows.end() || found->index()[0] != index ? nullptr : &*found;
 }
 
 } // namespace
@@ -119,30 +113,46 @@ EntityState portState(InterfaceRow const& interface, LineRow const* line) {
 
 EntityStates::EntityStates(Now now) : m_now(std::move(now)), m_started(dateOctets(m_now())) {}
 
-std::vector<EntityStateRow> EntityStates::read(std::vector<PhysicalRow> const& entities,
-                                               std::vector<BoardRow> const& boards,
-                                               InterfaceRows const& interfaces,
-                                               std::vector<FaultRow> const& faults) {
+Rows<EntityStateRow> EntityStates::read(Rows<PhysicalRow> const& entities,
+                                        Rows<BoardRow> const& boards,
+                                        InterfaceRows const& interfaces,
+                                        std::vector<FaultRow> const& faults) {
+    if (m_read && entities.shares(m_entities) && boards.shares(m_boards) &&
+        interfaces.interfaces.shares(m_interfaces) && interfaces.lines.shares(m_lines) &&
+        faults == m_faults)
+        return m_former;
+    m_entities = entities;
+    m_boards = boards;
+    m_interfaces = interfaces.interfaces;
+    m_lines = interfaces.lines;
+    m_faults = faults;
     std::vector<EntityStateRow> rows;
+    rows.reserve(m_former.size());
     std::string const now = m_read ? dateOctets(m_now()) : m_started;
+    RowFinder const boardRows(boards);
+    RowFinder const interfaceRows(interfaces.interfaces);
+    RowFinder const lineRows(interfaces.lines);
+    RowFinder const faultRows(faults);
+    RowFinder const formerRows(m_former);
+    bool changed = false;
     for (PhysicalRow const& entity : entities) {
         EntityState state;
-        if (BoardRow const* const board = find(boards, entity.boardIndex)) {
-            state = boardState(*board, find(faults, entity.boardIndex) != nullptr);
-        } else if (InterfaceRow const* const interface =
-                       find(interfaces.interfaces, entity.ifIndex)) {
-            state = portState(*interface, find(interfaces.lines, entity.ifIndex));
+        if (BoardRow const* const board = boardRows.find(entity.boardIndex)) {
+            state = boardState(*board, faultRows.find(entity.boardIndex) != nullptr);
+        } else if (InterfaceRow const* const interface = interfaceRows.find(entity.ifIndex)) {
+            state = portState(*interface, lineRows.find(entity.ifIndex));
         } else if (entity.physicalClass != PhysicalClass::Cpu) {
             // The platform does not tell how a processor is.
             continue;
         }
-        EntityStateRow const* const former = find(m_former, entity.entity);
+        EntityStateRow const* const former = formerRows.find(entity.entity);
         bool const same = former != nullptr && former->state == state;
+        changed = changed || !same;
         rows.push_back({entity.entity, state, same ? former->changed : now});
     }
-    m_former = rows;
     m_read = true;
-    return rows;
+    if (changed || rows.size() != m_former.size()) m_former = std::move(rows);
+    return m_former;
 }
 
 } // namespace kvloamd

@@ -10,6 +10,7 @@
 #include "agent/rows/EntityRows.h"
 #include "agent/rows/FaultRow.h"
 #include "agent/rows/InterfaceRows.h"
+#include "agent/rows/Rows.h"
 
 namespace kvloamd {
 
@@ -29,17 +30,22 @@ class EntityStates {
     explicit EntityStates(Now now);
 
     /// The states of those `entities` that have one: modules, their processors and ports. What is
-    /// found in the first reading has been as it is since the states were made.
-    std::vector<EntityStateRow> read(std::vector<PhysicalRow> const& entities,
-                                     std::vector<BoardRow> const& boards,
-                                     InterfaceRows const& interfaces,
-                                     std::vector<FaultRow> const& faults);
+    /// found in the first reading has been as it is since the states were made. States that have
+    /// not changed are shared with the reading before.
+    Rows<EntityStateRow> read(Rows<PhysicalRow> const& entities, Rows<BoardRow> const& boards,
+                              InterfaceRows const& interfaces, std::vector<FaultRow> const& faults);
 
   private:
     Now m_now;
     std::string m_started; ///< when, as `dateOctets`
     bool m_read = false;
-    std::vector<EntityStateRow> m_former;
+    Rows<EntityStateRow> m_former;
+    // What they follow from.
+    Rows<PhysicalRow> m_entities;
+    Rows<BoardRow> m_boards;
+    Rows<InterfaceRow> m_interfaces;
+    Rows<LineRow> m_lines;
+    std::vector<FaultRow> m_faults;
 };
 
 } // namespace kvloamd

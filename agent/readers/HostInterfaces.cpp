@@ -27,8 +27,7 @@ std::uint32_t HostInterfaces::highest() const {
     return highest;
 }
 
-std::uint32_t HostInterfaces::conflicts(std::vector<InterfaceRow> const& ours,
-                                        Clock::time_point now) {
+std::uint32_t HostInterfaces::conflicts(Rows<InterfaceRow> const& ours, Clock::time_point now) {
     if (std::exchange(m_asked, true) && now - m_last < kPause) return m_conflicts;
     m_last = now;
     std::uint32_t const former = std::exchange(m_conflicts, 0);

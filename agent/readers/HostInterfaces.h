@@ -9,6 +9,7 @@
 
 #include "agent/rows/Clock.h"
 #include "agent/rows/InterfaceRows.h"
+#include "agent/rows/Rows.h"
 
 namespace kvloamd {
 
@@ -34,7 +35,7 @@ class HostInterfaces {
     /// The highest ifIndex on the host; 0 if there is none.
     std::uint32_t highest() const;
     /// How many of `ours`, which are ascending by index, have an ifIndex of the host.
-    std::uint32_t conflicts(std::vector<InterfaceRow> const& ours, Clock::time_point now);
+    std::uint32_t conflicts(Rows<InterfaceRow> const& ours, Clock::time_point now);
 
   private:
     List m_list;

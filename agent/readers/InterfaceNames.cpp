@@ -35,24 +35,20 @@ std::string withSuffix(std::string const& text, std::string const& suffix) {
     return printable(text.substr(0, room) + suffix);
 }
 
-using Texts = std::unordered_map<std::string, int>;
-
-Texts countTexts(std::vector<InterfaceRow> const& interfaces, std::string InterfaceRow::*text) {
-    Texts counts;
-    counts.reserve(interfaces.size());
-    for (InterfaceRow const& row : interfaces)
-        ++counts[row.*text];
-    return counts;
-}
-
 /// Appends to each text that others have too. Returns whether there was one.
 template <class Suffix>
-bool appendToCommon(std::vector<InterfaceRow>& interfaces, std::string InterfaceRow::*text,
+bool appendToCommon(std::vector<InterfaceTexts>& interfaces, std::string InterfaceTexts::*text,
                     Suffix suffix) {
-    Texts const counts = countTexts(interfaces, text);
+    std::unordered_map<std::string_view, int> counts;
+    counts.reserve(interfaces.size());
+    for (InterfaceTexts const& each : interfaces)
+        ++counts[each.*text];
     if (counts.size() == interfaces.size()) return false;
-    for (InterfaceRow& row : interfaces)
-        if (counts.at(row.*text) > 1) row.*text = withSuffix(row.*text, suffix(row));
+    std::vector<InterfaceTexts*> common;
+    for (InterfaceTexts& each : interfaces)
+        if (counts.at(each.*text) > 1) common.push_back(&each);
+    for (InterfaceTexts* const each : common)
+        each->*text = withSuffix(each->*text, suffix(*each));
     return true;
 }
 
@@ -69,19 +65,19 @@ void completeName(InterfaceRow& row, IndexKey const& key, std::string const& boa
             withSuffix(std::string(words.description) + " " + key.name, " of board " + board);
 }
 
-void distinguishNames(std::vector<InterfaceRow>& interfaces,
+void distinguishNames(std::vector<InterfaceTexts>& interfaces,
                       std::unordered_map<std::uint32_t, std::string> const& boards) {
-    auto const board = [&](InterfaceRow const& row) {
+    auto const board = [&](InterfaceTexts const& row) {
         auto const found = boards.find(row.boardIndex);
         return found == boards.end() ? std::string() : found->second;
     };
-    auto const index = [](InterfaceRow const& row) { return "#" + std::to_string(row.ifIndex); };
-    if (appendToCommon(interfaces, &InterfaceRow::name,
-                       [&](InterfaceRow const& row) { return "@" + board(row); }))
-        appendToCommon(interfaces, &InterfaceRow::name, index);
-    if (appendToCommon(interfaces, &InterfaceRow::description,
-                       [&](InterfaceRow const& row) { return " of board " + board(row); }))
-        appendToCommon(interfaces, &InterfaceRow::description, index);
+    auto const index = [](InterfaceTexts const& row) { return "#" + std::to_string(row.ifIndex); };
+    if (appendToCommon(interfaces, &InterfaceTexts::name,
+                       [&](InterfaceTexts const& row) { return "@" + board(row); }))
+        appendToCommon(interfaces, &InterfaceTexts::name, index);
+    if (appendToCommon(interfaces, &InterfaceTexts::description,
+                       [&](InterfaceTexts const& row) { return " of board " + board(row); }))
+        appendToCommon(interfaces, &InterfaceTexts::description, index);
 }
 
 } // namespace kvloamd

@@ -4,61 +4,51 @@
 #include <algorithm>
 #include <array>
 #include <functional>
-#include <iterator>
 #include <set>
+#include <span>
 #include <utility>
 
 #include "agent/readers/BoardFaults.h"
-#include "agent/readers/BoardKeys.h"
 #include "agent/readers/Courtesy.h"
-#include "agent/readers/InterfaceNames.h"
 #include "agent/readers/InterfaceStates.h"
 #include "agent/readers/LongCounters.h"
+#include "board/DS1LineDevice.h"
 
 namespace kvloamd {
 
 namespace {
 
-/// Moves rows over, with their numbers on the board made indices; rows without one are left out.
+/// Puts indices in the place of numbers on the board, and sorts the rows by them. Rows without one
+/// are left out.
 template <class Row>
-void moveRows(std::vector<Row>& all, std::vector<Row>& rows,
-              std::vector<std::uint32_t> const& indices) {
-    for (Row& row : rows) {
+void placeRows(std::vector<Row>& rows, std::vector<std::uint32_t> const& indices) {
+    for (Row& row : rows)
         row.ifIndex = indices[row.ifIndex - 1];
-        if (row.ifIndex != 0) all.push_back(std::move(row));
-    }
-}
-
-/// Rows mostly come in order: boards do, and so do the indices that they were given.
-template <class Row, class Index = std::identity>
-void sortBy(std::vector<Row>& rows, Index index = {}) {
+    std::erase_if(rows, [](Row const& row) { return row.ifIndex == 0; });
+    // Rows mostly come in order.
+    auto const index = [](Row const& row) { return row.index(); };
     if (!std::ranges::is_sorted(rows, {}, index)) std::ranges::sort(rows, {}, index);
 }
 
 /// Each interface and what is below it, with nothing above the topmost and below the lowest.
-void completeStack(InterfaceRows& all) {
+void completeStack(BoardInterfaceRows& rows) {
     std::set<std::uint32_t> higher;
     std::set<std::uint32_t> lower;
-    for (StackRow const& row : all.stack) {
+    for (StackRow const& row : rows.stack) {
         higher.insert(row.higher);
         lower.insert(row.lower);
     }
-    for (InterfaceRow const& row : all.interfaces)
-        if (!lower.contains(row.ifIndex)) all.stack.push_back({0, row.ifIndex});
-    for (InterfaceRow const& row : all.interfaces)
-        if (!higher.contains(row.ifIndex)) all.stack.push_back({row.ifIndex, 0});
-    sortBy(all.stack);
+    for (InterfaceRow const& row : rows.interfaces) {
+        if (!lower.contains(row.ifIndex)) rows.stack.push_back({0, row.ifIndex});
+        if (!higher.contains(row.ifIndex)) rows.stack.push_back({row.ifIndex, 0});
+    }
+    std::ranges::sort(rows.stack);
 }
 
-/// What to call each board in the names of its interfaces, by its index.
-std::unordered_map<std::uint32_t, std::string> boardNames(std::vector<BoardRow> const& boards,
-                                                          std::vector<BoardKey> const& keys) {
-    std::unordered_map<std::uint32_t, std::string> names;
-    for (std::size_t i = 0; i < boards.size(); ++i) {
-        std::uint32_t const index = boards[i].boardIndex;
-        names.emplace(index, keys[i].stable ? keys[i].name : std::to_string(index));
-    }
-    return names;
+/// Whether the interface has counters, which change without anything else.
+bool countsTraffic(InterfaceRow const& row) {
+    return std::ranges::any_of(row.counters,
+                               [](auto const& counter) { return counter.has_value(); });
 }
 
 /// How long after an interface has changed this may become certain, in hundredths of a second.
@@ -72,123 +62,318 @@ std::array<std::uint64_t, kInterfaceCounters> interfaceLimits(CountLimits const&
     return all;
 }
 
+/// A `Joining` puts a table of all boards together from the boards' own.
+template <class Row>
+class Joining {
+  public:
+    Joining(Rows<Row>& all, std::shared_ptr<void const> owner) : m_all(all) {
+        m_all.clear();
+        m_all.append({}, std::move(owner));
+    }
+    /// Appends the rows of a board, which are ascending.
+    void append(std::span<Row const> rows, std::shared_ptr<void const> owner = nullptr) {
+        if (rows.empty()) return;
+        // Boards come in the order of their indices, and mostly got their ifIndices in this order.
+        m_sorted = m_sorted && (m_last == nullptr || m_last->index() < rows.front().index());
+        m_last = &rows.back();
+        m_all.append(rows, std::move(owner));
+    }
+    void end() {
+        if (!m_sorted) m_all.sortBy([](Row const& row) { return row.index(); });
+    }
+
+  private:
+    Rows<Row>& m_all;
+    Row const* m_last = nullptr;
+    bool m_sorted = true;
+};
+
 } // namespace
 
 InterfaceReader::InterfaceReader(BoardManager& manager, StableIndices& indices,
-                                 Clock::time_point started)
-    : m_manager(manager), m_indices(indices), m_uptime(started), m_changeTimes(started) {}
+                                 Clock::time_point started, BoardTurns* turns, Now now)
+    : m_manager(manager),
+      m_indices(indices),
+      m_turns(turns),
+      m_now(std::move(now)),
+      m_uptime(started),
+      m_toTicks([this](long seconds) { return m_uptime.of(seconds); }),
+      m_changeTimes(started) {}
 
-InterfaceRows InterfaceReader::read(std::vector<BoardRow> const& boards) {
-    InterfaceRows all;
-    // Hardly ever do interfaces come or go.
-    all.interfaces.reserve(m_formerIndices.size());
-    all.lines.reserve(m_formerLines);
-    all.stack.reserve(m_formerStack.size());
-    m_lines.clear();
+InterfaceRows InterfaceReader::read(Rows<BoardRow> const& boards) {
     ++m_reading;
-    m_histories.begin(Clock::now());
-    m_lineTotals.begin();
-    ToTicks const toTicks = [this](long seconds) { return m_uptime.of(seconds); };
-    std::vector<BoardKey> const keys = boardKeys(boards);
-    auto const names = boardNames(boards, keys);
+    m_changes = {};
+    m_histories.begin(m_now());
+    std::vector<BoardKey> const& keys = m_keys.of(boards);
+    if (m_keys.areAsBefore()) m_indices.presentAgain();
+    auto const dropGone = [this](KnownBoard& known) { drop(known); };
+    m_boards.begin();
     for (std::size_t i = 0; i < boards.size(); ++i) {
-        std::uint32_t const boardIndex = boards[i].boardIndex;
-        auto const board = m_manager.GetBoardByIndex(static_cast<int>(boardIndex));
-        Board* const asked = board.get();
-        if (asked == nullptr) continue;
-        readGuarded(boardIndex, "interfaces", [&] {
-            BoardInterfaces found = readInterfaces(*asked, toTicks, m_histories);
-            for (InterfaceRow& row : found.rows.interfaces)
-                completeName(row, found.keys[row.ifIndex - 1], names.at(boardIndex));
-            completeStates(found.rows);
-            auto const indices = m_indices.indicesOf(keys[i], found.keys);
-            append(all, std::move(found), indices, boardIndex);
-        });
+        readBoard(m_boards.at(boards[i].boardIndex, dropGone), boards[i], keys[i]);
         yieldBetweenBoards();
     }
+    m_boards.end(dropGone);
     m_indices.save();
-    m_lineTotals.end();
-    if (m_counted.size() > all.interfaces.size())
-        std::erase_if(m_counted,
-                      [this](auto const& entry) { return entry.second.reading != m_reading; });
-    sortBy(all.interfaces, &InterfaceRow::ifIndex);
-    sortBy(all.lines, &LineRow::ifIndex);
-    sortBy(all.bearers, &BearerRow::ifIndex);
-    sortBy(all.ds0Channels, &Ds0ChannelRow::index);
-    // Not std::ranges::unique, whose result clang 14 does not compile.
-    auto const twice = std::unique(all.ds0Channels.begin(), all.ds0Channels.end(),
-                                   [](Ds0ChannelRow const& one, Ds0ChannelRow const& other) {
-                                       return one.index() == other.index();
-                                   });
-    all.ds0Channels.erase(twice, all.ds0Channels.end());
-    sortBy(all.signalling, &SignallingRow::ifIndex);
-    sortBy(all.lapds, &LapdRow::ifIndex);
-    sortBy(all.ethernets, &EthernetRow::ifIndex);
-    sortBy(all.receiveAddresses, [](auto const& row) { return row.index(); });
-    sortBy(all.ports, &PortRow::ifIndex);
-    distinguishNames(all.interfaces, names);
-    completeStack(all);
-    std::size_t before = 0;
-    for (LineRow& line : all.lines) {
-        line.intervalsBefore = before;
-        before += line.closedIntervals();
-    }
-    noteChanges(all);
+    if (m_changes.texts) distinguish();
+    if (m_changes.tables) joinTables();
+    if (m_changes.lines || m_changes.lineObjects) joinLines();
+    if (m_changes.tables) noteChanges();
     m_read = true;
-    return all;
+    return m_all;
 }
 
-void InterfaceReader::append(InterfaceRows& all, BoardInterfaces&& board,
-                             std::vector<std::uint32_t> const& indices, std::uint32_t boardIndex) {
-    Clock::time_point const now = Clock::now();
+void InterfaceReader::readBoard(KnownBoard& known, BoardRow const& row, BoardKey const& key) {
+    bool full = known.rows == nullptr || !known.isShareable || isDue(m_turns, row.boardIndex);
+    if (known.rows == nullptr || known.key != key || known.serialNumber != row.serialNumber) {
+        full = true;
+        known.key = key;
+        known.name = key.stable ? key.name : std::to_string(row.boardIndex);
+        known.serialNumber = row.serialNumber;
+        m_changes.texts = true;
+    }
+    bool const answers = readGuarded(row.boardIndex, "interfaces", [&] {
+        if (full || !readCounts(known))
+            readFully(known, row);
+        else if (!m_keys.areAsBefore())
+            m_indices.indicesOf(key, {});
+    });
+    if (!answers) drop(known);
+}
+
+bool InterfaceReader::readCounts(KnownBoard& known) {
+    for (KnownLine const& line : known.lineObjects)
+        if (checkLine(*line.line.get()) != line.check) return false;
+    LineRows read;
+    for (std::size_t i = 0; i < known.lineObjects.size(); ++i) {
+        KnownLine const& line = known.lineObjects[i];
+        if (line.history.get() == nullptr) continue;
+        LineRow const& row = (*known.lines)[i];
+        // While a line is unavailable, every reading settles something.
+        bool const unavailable = (row.lineStatus.value_or(0) & DS1LineStatusUnavailSigState) != 0;
+        if (!unavailable && m_histories.stands(line.history, row)) continue;
+        if (read.empty()) read = *known.lines;
+        m_histories.read(line.history, read[i]);
+        m_lineTotals.add(read[i].ifIndex, read[i]);
+    }
+    if (read.empty() || read == *known.lines) return true;
+    known.lines = std::make_shared<LineRows const>(std::move(read));
+    m_changes.lines = true;
+    return true;
+}
+
+void InterfaceReader::readFully(KnownBoard& known, BoardRow const& row) {
+    auto const board = m_manager.GetBoardByIndex(static_cast<int>(row.boardIndex));
+    Board* const asked = board.get();
+    if (asked == nullptr) return drop(known);
+    BoardInterfaces found = readInterfaces(*asked, m_toTicks, m_histories);
+    for (InterfaceRow& interface : found.rows.interfaces)
+        completeName(interface, found.keys[interface.ifIndex - 1], known.name);
+    completeStates(found.rows);
+    auto const indices = m_indices.indicesOf(known.key, found.keys);
+    place(known, std::move(found), indices, row);
+}
+
+/// The board is not there, or does not answer: nothing of it is shown.
+void InterfaceReader::drop(KnownBoard& known) {
+    if (known.lines != nullptr)
+        for (LineRow const& line : *known.lines)
+            m_lineTotals.rest(line.ifIndex);
+    if (known.rows != nullptr) m_changes = {true, true, true, true};
+    known = {};
+}
+
+void InterfaceReader::place(KnownBoard& known, BoardInterfaces&& found,
+                            std::vector<std::uint32_t> const& indices, BoardRow const& row) {
+    Clock::time_point const now = m_now();
+    BoardInterfaceRows& rows = found.rows;
+    known.isShareable = found.hasOnlyLines && std::ranges::find(indices, 0U) == indices.end() &&
+                        std::ranges::none_of(rows.interfaces, countsTraffic);
     std::unordered_map<std::uint32_t, EthernetRow*> ethernets;
-    for (EthernetRow& row : board.rows.ethernets)
-        ethernets.emplace(row.ifIndex, &row);
-    for (InterfaceRow& row : board.rows.interfaces) {
-        auto const ethernet = ethernets.find(row.ifIndex);
-        std::uint32_t const index = indices[row.ifIndex - 1];
-        row.boardIndex = boardIndex;
-        if (index != 0)
-            countOn(row, index, ethernet == ethernets.end() ? nullptr : ethernet->second, now);
-    }
-    moveRows(all.interfaces, board.rows.interfaces, indices);
-    for (std::size_t i = 0; i < board.lines.size(); ++i) {
-        auto const index = indices[board.rows.lines[i].ifIndex - 1];
+    for (EthernetRow& ethernet : rows.ethernets)
+        ethernets.emplace(ethernet.ifIndex, &ethernet);
+    for (InterfaceRow& interface : rows.interfaces) {
+        interface.boardIndex = row.boardIndex;
+        interface.boardSerialNumber = row.serialNumber;
+        std::uint32_t const index = indices[interface.ifIndex - 1];
         if (index == 0) continue;
-        m_lineTotals.add(index, board.rows.lines[i]);
-        if (auto const date = board.lineChanges[i])
-            board.rows.lines[i].statusLastChange = m_changeTimes.at(index, *date, now);
-        m_lines.push_back({index, std::move(board.lines[i]), boardIndex});
+        auto const ethernet = ethernets.find(interface.ifIndex);
+        auto const [counted, isNew] = known.counted.try_emplace(index);
+        countOn(interface, counted->second, isNew,
+                ethernet == ethernets.end() ? nullptr : ethernet->second, now);
     }
-    moveRows(all.lines, board.rows.lines, indices);
-    for (BearerRow& row : board.rows.bearers)
-        if (row.signalling != 0) row.signalling = indices[row.signalling - 1];
-    moveRows(all.bearers, board.rows.bearers, indices);
-    moveRows(all.signalling, board.rows.signalling, indices);
-    moveRows(all.lapds, board.rows.lapds, indices);
-    moveRows(all.ethernets, board.rows.ethernets, indices);
-    moveRows(all.receiveAddresses, board.rows.receiveAddresses, indices);
-    for (PortRow& port : board.rows.ports)
-        port.boardIndex = boardIndex;
-    moveRows(all.ports, board.rows.ports, indices);
-    for (Ds0ChannelRow const& row : board.rows.ds0Channels) {
-        Ds0ChannelRow const placed{indices[row.line - 1], row.timeSlot, indices[row.channel - 1]};
-        if (placed.line != 0 && placed.channel != 0) all.ds0Channels.push_back(placed);
+    std::erase_if(known.counted,
+                  [this](auto const& entry) { return entry.second.reading != m_reading; });
+    placeLines(known, found, indices, row.boardIndex);
+    rows.lines.clear();
+    placeRows(rows.interfaces, indices);
+    for (BearerRow& bearer : rows.bearers)
+        if (bearer.signalling != 0) bearer.signalling = indices[bearer.signalling - 1];
+    placeRows(rows.bearers, indices);
+    placeRows(rows.signalling, indices);
+    placeRows(rows.lapds, indices);
+    placeRows(rows.ethernets, indices);
+    placeRows(rows.receiveAddresses, indices);
+    for (PortRow& port : rows.ports)
+        port.boardIndex = row.boardIndex;
+    placeRows(rows.ports, indices);
+    for (Ds0ChannelRow& channel : rows.ds0Channels)
+        channel = {indices[channel.line - 1], channel.timeSlot, indices[channel.channel - 1]};
+    std::erase_if(rows.ds0Channels,
+                  [](Ds0ChannelRow const& each) { return each.line == 0 || each.channel == 0; });
+    std::ranges::stable_sort(rows.ds0Channels, {}, &Ds0ChannelRow::index);
+    // Not std::ranges::unique, whose result clang 14 does not compile.
+    rows.ds0Channels.erase(std::unique(rows.ds0Channels.begin(), rows.ds0Channels.end(),
+                                       [](Ds0ChannelRow const& one, Ds0ChannelRow const& other) {
+                                           return one.index() == other.index();
+                                       }),
+                           rows.ds0Channels.end());
+    for (StackRow& each : rows.stack)
+        each = {indices[each.higher - 1], indices[each.lower - 1]};
+    std::erase_if(rows.stack,
+                  [](StackRow const& each) { return each.higher == 0 || each.lower == 0; });
+    completeStack(rows);
+    placeTables(known, std::move(rows));
+}
+
+void InterfaceReader::placeLines(KnownBoard& known, BoardInterfaces& found,
+                                 std::vector<std::uint32_t> const& indices,
+                                 std::uint32_t boardIndex) {
+    Clock::time_point const now = m_now();
+    std::vector<std::pair<std::uint32_t, std::size_t>> order; // ifIndex and place
+    for (std::size_t i = 0; i < found.lines.size(); ++i)
+        if (auto const index = indices[found.rows.lines[i].ifIndex - 1]; index != 0)
+            order.emplace_back(index, i);
+    std::ranges::sort(order);
+    LineRows rows;
+    std::vector<KnownLine> objects;
+    for (auto const& [index, i] : order) {
+        LineRow& row = rows.emplace_back(std::move(found.rows.lines[i]));
+        KnownLine& line = objects.emplace_back(std::move(found.lines[i]));
+        row.ifIndex = index;
+        m_lineTotals.add(index, row);
+        if (line.check.lastChange >= 0)
+            row.statusLastChange = m_changeTimes.at(index, line.check.lastChange, now);
     }
-    for (StackRow const& row : board.rows.stack) {
-        StackRow const placed{indices[row.higher - 1], indices[row.lower - 1]};
-        if (placed.higher != 0 && placed.lower != 0) all.stack.push_back(placed);
+    if (known.lines != nullptr)
+        for (LineRow const& former : *known.lines)
+            if (!std::ranges::binary_search(rows, former.ifIndex, {}, &LineRow::ifIndex))
+                m_lineTotals.rest(former.ifIndex);
+    auto const isSame = [](KnownLine const& one, KnownLine const& other) {
+        return one.line.get() == other.line.get();
+    };
+    if (!std::ranges::equal(objects, known.lineObjects, isSame)) m_changes.lineObjects = true;
+    // The resources of the board may say the same of its lines.
+    if (m_turns != nullptr &&
+        !std::ranges::equal(objects, known.lineObjects, {}, &KnownLine::check, &KnownLine::check))
+        m_turns->add(boardIndex);
+    known.lineObjects = std::move(objects);
+    if (known.lines != nullptr && *known.lines == rows) return;
+    known.lines = std::make_shared<LineRows const>(std::move(rows));
+    m_changes.lines = true;
+}
+
+void InterfaceReader::placeTables(KnownBoard& known, BoardInterfaceRows&& placed) {
+    std::vector<InterfaceTexts> texts;
+    texts.reserve(placed.interfaces.size());
+    for (InterfaceRow const& row : placed.interfaces)
+        texts.push_back({row.ifIndex, row.boardIndex, row.name, row.description});
+    if (known.rows != nullptr && texts == known.texts) {
+        // They were made different from the others' before.
+        for (std::size_t i = 0; i < texts.size(); ++i) {
+            placed.interfaces[i].name = known.rows->interfaces[i].name;
+            placed.interfaces[i].description = known.rows->interfaces[i].description;
+        }
+    } else {
+        known.texts = std::move(texts);
+        m_changes.texts = true;
+    }
+    if (known.rows != nullptr && *known.rows == placed) return;
+    if (m_turns != nullptr && !placed.interfaces.empty())
+        m_turns->add(placed.interfaces.front().boardIndex);
+    known.rows = std::make_shared<BoardInterfaceRows const>(std::move(placed));
+    m_changes.tables = true;
+}
+
+void InterfaceReader::distinguish() {
+    std::vector<InterfaceTexts> all;
+    std::unordered_map<std::uint32_t, std::string> names;
+    for (auto const& [boardIndex, known] : m_boards.all()) {
+        all.insert(all.end(), known.texts.begin(), known.texts.end());
+        names.emplace(boardIndex, known.name);
+    }
+    distinguishNames(all, names);
+    auto next = all.cbegin();
+    for (auto& [boardIndex, known] : m_boards.all()) {
+        auto const texts = next;
+        next += std::ssize(known.texts);
+        if (known.rows == nullptr) continue;
+        auto const isCalled = [](InterfaceRow const& row, InterfaceTexts const& called) {
+            return row.name == called.name && row.description == called.description;
+        };
+        if (std::equal(known.rows->interfaces.begin(), known.rows->interfaces.end(), texts,
+                       isCalled))
+            continue;
+        auto rows = std::make_shared<BoardInterfaceRows>(*known.rows);
+        for (std::size_t i = 0; i < rows->interfaces.size(); ++i) {
+            InterfaceTexts const& called = texts[static_cast<std::ptrdiff_t>(i)];
+            rows->interfaces[i].name = called.name;
+            rows->interfaces[i].description = called.description;
+        }
+        known.rows = std::move(rows);
+        m_changes.tables = true;
     }
 }
 
-void InterfaceReader::countOn(InterfaceRow& row, std::uint32_t ifIndex, EthernetRow* ethernet,
-                              Clock::time_point now) {
-    auto const [place, isNew] = m_counted.try_emplace(ifIndex);
-    Counted& counted = place->second;
+void InterfaceReader::joinTables() {
+    auto const parts = std::make_shared<std::vector<std::shared_ptr<BoardInterfaceRows const>>>();
+    for (auto const& [boardIndex, known] : m_boards.all())
+        if (known.rows != nullptr) parts->push_back(known.rows);
+    auto const join = [&](auto& all, auto table) {
+        Joining joining(all, parts);
+        for (auto const& part : *parts)
+            joining.append((*part).*table);
+        joining.end();
+    };
+    using Tables = InterfaceTables<RowVector>;
+    join(m_all.interfaces, &Tables::interfaces);
+    join(m_all.bearers, &Tables::bearers);
+    join(m_all.ds0Channels, &Tables::ds0Channels);
+    join(m_all.signalling, &Tables::signalling);
+    join(m_all.lapds, &Tables::lapds);
+    join(m_all.ethernets, &Tables::ethernets);
+    join(m_all.receiveAddresses, &Tables::receiveAddresses);
+    join(m_all.ports, &Tables::ports);
+    // The topmost interfaces of all boards come first, above which there is nothing.
+    Joining stack(m_all.stack, parts);
+    auto const lowerRows = [](BoardInterfaceRows const& part) {
+        return std::ranges::partition_point(part.stack,
+                                            [](StackRow const& row) { return row.higher == 0; });
+    };
+    for (auto const& part : *parts)
+        stack.append({part->stack.begin(), lowerRows(*part)});
+    for (auto const& part : *parts)
+        stack.append({lowerRows(*part), part->stack.end()});
+    stack.end();
+}
+
+void InterfaceReader::joinLines() {
+    Joining joining(m_all.lines, nullptr);
+    for (auto const& [boardIndex, known] : m_boards.all())
+        if (known.lines != nullptr) joining.append(*known.lines, known.lines);
+    joining.end();
+    countIntervals(m_all);
+    if (!m_changes.lineObjects) return;
+    m_lines.clear();
+    m_lines.reserve(m_all.lines.size());
+    for (auto const& [boardIndex, known] : m_boards.all())
+        for (std::size_t i = 0; i < known.lineObjects.size(); ++i)
+            m_lines.push_back({(*known.lines)[i].ifIndex, known.lineObjects[i].line, boardIndex});
+}
+
+void InterfaceReader::countOn(InterfaceRow& row, Counted& counted, bool isNew,
+                              EthernetRow* ethernet, Clock::time_point now) {
     std::uint32_t const ticks = m_read ? m_uptime.at(now) : 0;
-    if (isNew || counted.boardIndex != row.boardIndex) {
-        counted = {};
-        counted.boardIndex = row.boardIndex;
+    if (isNew) {
         counted.since = ticks;
         counted.operStatus = row.operStatus;
         counted.lastChange = row.lastChange.value_or(ticks);
@@ -226,18 +411,15 @@ void InterfaceReader::noteOperStatus(InterfaceRow& row, Counted& counted,
     row.lastChange = counted.lastChange;
 }
 
-void InterfaceReader::noteChanges(InterfaceRows& all) {
+void InterfaceReader::noteChanges() {
     std::vector<std::uint32_t> indices;
-    indices.reserve(all.interfaces.size());
-    for (InterfaceRow const& row : all.interfaces)
+    indices.reserve(m_all.interfaces.size());
+    for (InterfaceRow const& row : m_all.interfaces)
         indices.push_back(row.ifIndex);
-    if (m_read && indices != m_formerIndices) m_lastChange = m_uptime.now();
-    if (m_read && all.stack != m_formerStack) m_stackLastChange = m_uptime.now();
+    if (m_read && indices != m_formerIndices) m_all.lastChange = m_uptime.at(m_now());
+    if (m_read && m_all.stack != m_formerStack) m_all.stackLastChange = m_uptime.at(m_now());
     m_formerIndices = std::move(indices);
-    m_formerStack = all.stack;
-    m_formerLines = all.lines.size();
-    all.lastChange = m_lastChange;
-    all.stackLastChange = m_stackLastChange;
+    m_formerStack = m_all.stack;
 }
 
 } // namespace kvloamd

@@ -26,7 +26,7 @@ bool mayFollow(InterfaceRow const& row) {
 
 } // namespace
 
-void completeStates(InterfaceRows& rows) {
+void completeStates(BoardInterfaceRows& rows) {
     std::unordered_map<std::uint32_t, InterfaceRow*> interfaces;
     for (InterfaceRow& row : rows.interfaces) {
         if (!row.adminStatus) row.adminStatus = kUp;

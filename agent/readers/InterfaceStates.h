@@ -16,6 +16,6 @@ namespace kvloamd {
 ///   DS0s, whose line may not be known.
 ///
 /// The interfaces in `rows.stack` are meant by their `ifIndex`.
-void completeStates(InterfaceRows& rows);
+void completeStates(BoardInterfaceRows& rows);
 
 } // namespace kvloamd

@@ -71,6 +71,22 @@ void LineHistories::begin(Clock::time_point now) {
     m_readSince = 0;
 }
 
+bool LineHistories::stands(ReferenceCounter<DS1IntervalTable> const& handle, LineRow const& row) {
+    DS1IntervalTable& table = *handle.get();
+    auto const found = m_kept.find(&table);
+    if (found == m_kept.end()) return false;
+    Kept& kept = found->second;
+    // A second that is counted passes time.
+    if (!row.isWhole || row.history != kept.number || m_now - kept.readAt > kLongestGap ||
+        table.GetTimeElapsed() != row.timeElapsed)
+        return false;
+    if (kept.validity != nullptr && kept.validity->GetIntervalsClosed() != kept.intervalsClosed)
+        return false;
+    kept.readAt = m_now;
+    ++m_readSince;
+    return true;
+}
+
 void LineHistories::read(ReferenceCounter<DS1IntervalTable> const& handle, LineRow& row) {
     DS1IntervalTable& table = *handle.get();
     int const elapsed = table.GetTimeElapsed();

@@ -23,6 +23,9 @@ class LineHistories {
   public:
     /// Begins to read all lines once more.
     void begin(Clock::time_point now);
+    /// Whether the history has counted nothing since it filled the intervals of `row`, which then
+    /// stand.
+    bool stands(ReferenceCounter<DS1IntervalTable> const& handle, LineRow const& row);
     /// Fills the intervals of `row`.
     void read(ReferenceCounter<DS1IntervalTable> const& handle, LineRow& row);
 

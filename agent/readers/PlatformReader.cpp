@@ -30,9 +30,11 @@ void append(std::vector<Row>& all, std::vector<Row> const& rows) {
 
 } // namespace
 
-std::shared_ptr<PlatformRecords const> PlatformReader::read(std::vector<BoardRow> const& boards) {
+std::shared_ptr<PlatformRecords const> PlatformReader::read(Rows<BoardRow> const& boards) {
     auto const now = std::chrono::steady_clock::now();
     bool const all = !m_allRead || now - *m_allRead >= m_maxAge;
+    if (!all && boards.shares(m_boardRows)) return m_records;
+    m_boardRows = boards;
     bool const dropped = dropGoneBoards(boards);
     Wanted wanted;
     for (BoardRow const& board : boards)
@@ -49,7 +51,7 @@ std::shared_ptr<PlatformRecords const> PlatformReader::read(std::vector<BoardRow
     return m_records;
 }
 
-bool PlatformReader::dropGoneBoards(std::vector<BoardRow> const& boards) {
+bool PlatformReader::dropGoneBoards(Rows<BoardRow> const& boards) {
     // A board with another serial number is another board.
     return std::erase_if(m_boards, [&](auto const& kept) {
                auto const row =

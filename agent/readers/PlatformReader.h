@@ -12,6 +12,7 @@
 
 #include "agent/rows/BoardRow.h"
 #include "agent/rows/PlatformRecords.h"
+#include "agent/rows/Rows.h"
 
 namespace kvloamd {
 
@@ -34,7 +35,7 @@ class PlatformReader {
         : m_maxAge(maxAge), m_hasStore(hasStore) {}
 
     /// The records of `boards`, which are ascending by index.
-    std::shared_ptr<PlatformRecords const> read(std::vector<BoardRow> const& boards);
+    std::shared_ptr<PlatformRecords const> read(Rows<BoardRow> const& boards);
 
     // Whether it worked when it was read last. A store that the host does not have works.
     bool mapperAnswers() const { return m_mapperAnswers; }
@@ -49,7 +50,7 @@ class PlatformReader {
     using Wanted = std::vector<BoardRow const*>;
 
     /// Whether anything has been taken out.
-    bool dropGoneBoards(std::vector<BoardRow> const& boards);
+    bool dropGoneBoards(Rows<BoardRow> const& boards);
     void readObjects(Wanted const& wanted);
     void readStore(Wanted const& wanted);
     std::shared_ptr<PlatformRecords const> joined() const;
@@ -57,6 +58,7 @@ class PlatformReader {
     std::chrono::milliseconds m_maxAge;
     bool m_hasStore;
     std::optional<std::chrono::steady_clock::time_point> m_allRead; ///< when
+    Rows<BoardRow> m_boardRows;                                     ///< of the last reading
     std::map<std::uint32_t, BoardRecords> m_boards;                 ///< by board index
     std::shared_ptr<PlatformRecords const> m_records = std::make_shared<PlatformRecords>();
     bool m_mapperAnswers = true;

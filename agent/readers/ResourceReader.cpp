@@ -3,6 +3,7 @@
 
 #include <cstring>
 #include <string_view>
+#include <utility>
 
 #include "agent/readers/Answers.h"
 #include "agent/readers/BoardFaults.h"
@@ -80,19 +81,36 @@ void readBoardResources(Board& board, std::uint32_t boardIndex, std::vector<Reso
 
 } // namespace
 
-std::vector<ResourceRow> readResources(BoardManager& manager, std::vector<BoardRow> const& boards) {
-    std::vector<ResourceRow> rows;
+Rows<ResourceRow> ResourceReader::read(Rows<BoardRow> const& boards) {
+    bool changed = false;
+    auto const drop = [&](Part const& part) { changed = changed || part != nullptr; };
+    m_parts.begin();
     for (BoardRow const& row : boards) {
-        auto const board = manager.GetBoardByIndex(static_cast<int>(row.boardIndex));
-        std::size_t const before = rows.size();
-        if (Board* const asked = board.get();
-            asked != nullptr && !readGuarded(row.boardIndex, "resources", [&] {
-                readBoardResources(*asked, row.boardIndex, rows);
-            }))
-            rows.resize(before);
+        Part& part = m_parts.at(row.boardIndex, drop);
+        if (part != nullptr && !isDue(m_turns, row.boardIndex)) continue;
+        Part read = readPart(row.boardIndex, part);
+        changed = changed || read != part;
+        part = std::move(read);
         yieldBetweenBoards();
     }
-    return rows;
+    m_parts.end(drop);
+    if (!changed) return m_rows;
+    m_rows.clear();
+    for (auto const& [boardIndex, part] : m_parts.all())
+        if (part != nullptr && !part->empty()) m_rows.append(*part, part);
+    return m_rows;
+}
+
+ResourceReader::Part ResourceReader::readPart(std::uint32_t boardIndex, Part const& former) {
+    auto const board = m_manager.GetBoardByIndex(static_cast<int>(boardIndex));
+    Board* const asked = board.get();
+    if (asked == nullptr) return nullptr;
+    std::vector<ResourceRow> rows;
+    if (!readGuarded(boardIndex, "resources",
+                     [&] { readBoardResources(*asked, boardIndex, rows); }))
+        return nullptr;
+    if (former != nullptr && *former == rows) return former;
+    return std::make_shared<std::vector<ResourceRow> const>(std::move(rows));
 }
 
 } // namespace kvloamd

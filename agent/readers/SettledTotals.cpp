@@ -168,14 +168,11 @@ LineTotals SettledTotals::totals() const {
 }
 
 void AllSettledTotals::add(std::uint32_t ifIndex, LineRow& row) {
-    Line& line = m_lines[ifIndex];
-    line.round = m_round;
-    row.totals = line.totals.add(row);
+    row.totals = m_lines[ifIndex].add(row);
 }
 
-void AllSettledTotals::end() {
-    for (auto& [ifIndex, line] : m_lines)
-        if (line.round != m_round) line.totals.rest();
+void AllSettledTotals::rest(std::uint32_t ifIndex) {
+    if (auto const line = m_lines.find(ifIndex); line != m_lines.end()) line->second.rest();
 }
 
 } // namespace kvloamd

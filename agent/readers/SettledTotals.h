@@ -91,20 +91,13 @@ class SettledTotals {
 /// The `SettledTotals` of all lines. Unsynchronised.
 class AllSettledTotals {
   public:
-    /// Begins to read all lines once more.
-    void begin() { ++m_round; }
     /// Reads `row` of the line that has `ifIndex`, and fills its totals.
     void add(std::uint32_t ifIndex, LineRow& row);
-    /// All lines have been read: those that were not are not there.
-    void end();
+    /// The line is not there now.
+    void rest(std::uint32_t ifIndex);
 
   private:
-    struct Line {
-        SettledTotals totals;
-        std::uint64_t round = 0;
-    };
-    std::uint64_t m_round = 0;
-    std::unordered_map<std::uint32_t, Line> m_lines;
+    std::unordered_map<std::uint32_t, SettledTotals> m_lines;
 };
 
 } // namespace kvloamd

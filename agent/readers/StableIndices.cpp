@@ -73,10 +73,15 @@ std::vector<std::uint32_t> StableIndices::indicesOf(BoardKey const& key,
 }
 
 void StableIndices::present(std::string const& name, Board& board) {
-    board.reading = m_reading;
+    if (std::exchange(board.reading, m_reading) != m_reading) ++m_present;
     if (std::exchange(board.day, m_calendar.day) == m_calendar.day || !board.stable) return;
     m_unsaved.seen.push_back({name, m_calendar.day});
     m_changed = true;
+}
+
+void StableIndices::presentAgain() {
+    for (auto& [name, board] : m_boards)
+        if (board.reading + 1 == m_reading) present(name, board);
 }
 
 void StableIndices::makeRoom(std::string const& name, Board& board, std::size_t count) {
@@ -128,6 +133,7 @@ void StableIndices::countDays() {
 }
 
 void StableIndices::forgetBoards() {
+    if (std::exchange(m_present, 0) == m_boards.size()) return;
     std::vector<Place> away;
     for (auto board = m_boards.begin(); board != m_boards.end();) {
         auto const here = board++;
@@ -161,6 +167,7 @@ void StableIndices::forget(Place board) {
 void StableIndices::load(Database& database) {
     IndexRecords const records = readIndexTables(database);
     m_boards.clear();
+    m_present = 0;
     m_unsaved = {};
     m_changed = false;
     m_free = m_base;

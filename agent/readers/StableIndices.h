@@ -44,9 +44,14 @@ class StableIndices final : private StatePart {
     /// The indices of a board's things, in the order of `keys`, which are all different. 0 where
     /// no index is left, and where the thing is not known yet because the file is locked.
     std::vector<std::uint32_t> indicesOf(BoardKey const& key, std::span<IndexKey const> keys);
+    /// The boards that the last reading has asked for are present in this one as well. Before
+    /// anything else in a reading.
+    void presentAgain();
     /// Writes what is new since the last call, after every reading of all boards.
     void save();
 
+    /// False while nothing can be said about indices because the file is locked.
+    bool areKnown() const { return contentsKnown(); }
     /// From now on gives no index below `first` to a board that has no block with room.
     void skipTo(std::uint32_t first);
     /// Whether `index` belongs to something that is identified across restarts.
@@ -91,6 +96,7 @@ class StableIndices final : private StatePart {
     std::map<std::string, Board> m_boards; ///< by key
     Calendar m_calendar;
     std::uint64_t m_reading = 1;
+    std::size_t m_present = 0; ///< boards in this reading
     IndexRecords m_unsaved;
     bool m_changed = false; ///< `m_unsaved` has something
 };

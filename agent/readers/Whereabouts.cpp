@@ -1,38 +1,35 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/readers/Whereabouts.h"
 
-#include <algorithm>
-#include <vector>
+#include <cstddef>
+#include <optional>
+
+#include "agent/rows/RowFinder.h"
 
 namespace kvloamd {
 
-namespace {
-
-/// The row with this index; null if there is none.
-template <class Row>
-Row* find(std::vector<Row>& rows, std::uint32_t index) {
-    auto const found =
-        std::ranges::partition_point(rows, [&](Row const& row) { return row.index()[0] < index; });
-    return found == rows.end() || found->index()[0] != index ? nullptr : &*found;
-}
-
-} // namespace
-
 void noteWhereabouts(Snapshot& snapshot) {
-    for (PhysicalRow const& entity : snapshot.entities.physical->entities) {
-        if (BoardRow* const board = find(snapshot.boards, entity.boardIndex))
-            board->entity = entity.entity;
-        else if (InterfaceRow* const port = find(snapshot.interfaces.interfaces, entity.ifIndex))
-            port->entity = entity.entity;
+    EntityRows& entities = snapshot.entities;
+    auto const& boards = snapshot.boards;
+    auto const& interfaces = snapshot.interfaces.interfaces;
+    entities.ofBoards.assign(boards.size(), 0);
+    entities.ofInterfaces.assign(interfaces.size(), 0);
+    RowFinder const boardRows(boards);
+    RowFinder const interfaceRows(interfaces);
+    for (PhysicalRow const& entity : entities.physical->entities) {
+        if (auto const board = boardRows.placeOf(entity.boardIndex))
+            entities.ofBoards[*board] = entity.entity;
+        else if (auto const port = interfaceRows.placeOf(entity.ifIndex))
+            entities.ofInterfaces[*port] = entity.entity;
     }
-    BoardRow const* board = nullptr;
-    for (InterfaceRow& interface : snapshot.interfaces.interfaces) {
+    RowFinder const owners(boards);
+    std::optional<std::size_t> owner;
+    for (std::size_t place = 0; place < interfaces.size(); ++place) {
+        if (entities.ofInterfaces[place] != 0) continue;
+        std::uint32_t const boardIndex = interfaces[place].boardIndex;
         // A board's interfaces are neighbours.
-        if (board == nullptr || board->boardIndex != interface.boardIndex)
-            board = find(snapshot.boards, interface.boardIndex);
-        if (board == nullptr) continue;
-        interface.boardSerialNumber = board->serialNumber;
-        if (interface.entity == 0) interface.entity = board->entity;
+        if (!owner || boards[*owner].boardIndex != boardIndex) owner = owners.placeOf(boardIndex);
+        if (owner) entities.ofInterfaces[place] = entities.ofBoards[*owner];
     }
 }
 

@@ -30,7 +30,6 @@ struct BoardRow {
     std::optional<int> shelfId;
     std::optional<int> pciSlotNumber;
     std::optional<int> busNumber;
-    std::uint32_t entity = 0; ///< its entPhysicalIndex; 0: it has none
 
     /// The row's place in its table.
     std::array<std::uint32_t, 1> index() const { return {boardIndex}; }

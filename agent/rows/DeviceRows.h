@@ -52,6 +52,7 @@ struct ProcessorRow {
     std::string realTimeKernelFile;
 
     std::array<std::uint32_t, 2> index() const { return {boardIndex, auid}; }
+    bool operator==(ProcessorRow const&) const = default;
 };
 
 struct DeviceRows {

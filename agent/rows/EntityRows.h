@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "agent/rows/Oid.h"
+#include "agent/rows/Rows.h"
 
 namespace kvloamd {
 
@@ -60,9 +61,9 @@ struct AliasRow {
 
 /// What seldom changes. All ascending by index.
 struct PhysicalEntities {
-    std::vector<PhysicalRow> entities;
-    std::vector<ContainsRow> contains;
-    std::vector<AliasRow> aliases;
+    Rows<PhysicalRow> entities;
+    Rows<ContainsRow> contains;
+    Rows<AliasRow> aliases;
 
     bool operator==(PhysicalEntities const&) const = default;
 };
@@ -107,13 +108,18 @@ struct EntityStateRow {
     std::string changed; ///< when, as `dateOctets`
 
     std::array<std::uint32_t, 1> index() const { return {entity}; }
+    bool operator==(EntityStateRow const&) const = default;
 };
 
 struct EntityRows {
     std::shared_ptr<PhysicalEntities const> physical =
         std::make_shared<PhysicalEntities>(); ///< set
-    std::vector<EntityStateRow> states;
+    Rows<EntityStateRow> states;
     std::uint32_t lastChange = 0; ///< of `physical`: hundredths of a second since the agent's start
+
+    // Which entities there are of rows, in the order of the rows; 0: of none.
+    std::vector<std::uint32_t> ofBoards;
+    std::vector<std::uint32_t> ofInterfaces; ///< the port, else the board
 };
 
 } // namespace kvloamd

@@ -30,6 +30,7 @@ struct FaultRow {
     std::uint32_t times = 0;      ///< how often it has been raised since then
 
     std::array<std::uint32_t, 2> index() const { return {boardIndex, value}; }
+    bool operator==(FaultRow const&) const = default;
 };
 
 /// A `Faults` is the list of faults and its counts at one time.

@@ -11,6 +11,7 @@
 
 #include "agent/rows/ClosedIntervals.h"
 #include "agent/rows/IndexKey.h"
+#include "agent/rows/Rows.h"
 
 namespace kvloamd {
 
@@ -88,11 +89,10 @@ struct InterfaceRow {
     std::optional<int> connectorPresent; ///< the same
     /// The default of ifLinkUpDownTrapEnable: 1 enabled, 2 disabled.
     int linkUpDownTraps = 1;
-    // Whose it is, known when the entities are.
     std::string boardSerialNumber;
-    std::uint32_t entity = 0; ///< the entPhysicalIndex of its port, else of its board; 0: none
 
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
+    bool operator==(InterfaceRow const&) const = default;
 };
 
 /// One interface above another; 0 is none.
@@ -139,7 +139,6 @@ struct LineRow {
     std::optional<int> timeElapsed;                ///< of the running interval, in seconds
     LineCounts running{};                          ///< good when the line keeps a history
     std::shared_ptr<ClosedIntervals const> closed; ///< none: the line keeps no history
-    std::size_t intervalsBefore = 0;               ///< closed ones of all lines before this one
     std::uint64_t history = 0;        ///< a number of the history; a line may get another one
     std::int64_t intervalsClosed = 0; ///< ever, by the history
     /// No second was counted while the history was read, so that its counts fit together.
@@ -151,6 +150,7 @@ struct LineRow {
     bool isValid(std::size_t interval) const { return closed->valid[interval - 1]; }
     std::size_t closedIntervals() const { return keepsHistory() ? closed->counts.size() : 0; }
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
+    bool operator==(LineRow const&) const = default; ///< closed intervals that are shared are equal
 };
 
 /// A bearer channel's call, or its last one. The defaults are ISDN-MIB's for no call.
@@ -164,6 +164,8 @@ struct CallRow {
     std::uint32_t connectTime = 0;
     std::uint32_t chargedUnits = 0;
     bool connected = false; ///< it was, also if that was before the agent's start
+
+    bool operator==(CallRow const&) const = default;
 };
 
 struct BearerRow {
@@ -176,6 +178,7 @@ struct BearerRow {
     CallRow call = {};
 
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
+    bool operator==(BearerRow const&) const = default;
 };
 
 struct SignallingRow {
@@ -191,6 +194,7 @@ struct SignallingRow {
     std::optional<std::uint32_t> chargedUnits;
 
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
+    bool operator==(SignallingRow const&) const = default;
 };
 
 /// A time slot of a line and the channel in it.
@@ -200,6 +204,7 @@ struct Ds0ChannelRow {
     std::uint32_t channel = 0; ///< its ifIndex
 
     std::array<std::uint32_t, 2> index() const { return {line, timeSlot}; }
+    bool operator==(Ds0ChannelRow const&) const = default;
 };
 
 /// The data link (LAPD) below a signalling channel.
@@ -210,6 +215,7 @@ struct LapdRow {
     std::optional<std::uint32_t> recvdFrmr;
 
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
+    bool operator==(LapdRow const&) const = default;
 };
 
 /// The counters of an Ethernet interface, in the order of EtherLike-MIB's dot3StatsTable.
@@ -241,6 +247,7 @@ struct EthernetRow {
     std::optional<std::uint32_t> speed; ///< of its interface
 
     std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
+    bool operator==(EthernetRow const&) const = default;
 };
 
 /// An address for which an interface receives packets.
@@ -256,6 +263,7 @@ struct ReceiveAddressRow {
             name.push_back(static_cast<unsigned char>(octet));
         return name;
     }
+    bool operator==(ReceiveAddressRow const&) const = default;
 };
 
 /// A line or an Ethernet interface: where a board has a cable.
@@ -263,23 +271,55 @@ struct PortRow {
     std::uint32_t ifIndex = 0;
     std::uint32_t boardIndex = 0;
     IndexKey key; ///< on its board
+
+    std::array<std::uint32_t, 1> index() const { return {ifIndex}; }
+    bool operator==(PortRow const&) const = default;
 };
 
-/// All ascending by index.
-struct InterfaceRows {
-    std::vector<InterfaceRow> interfaces;
-    std::vector<StackRow> stack;
-    std::vector<LineRow> lines;
-    std::vector<BearerRow> bearers;
-    std::vector<Ds0ChannelRow> ds0Channels; ///< no two in one time slot
-    std::vector<SignallingRow> signalling;
-    std::vector<LapdRow> lapds;
-    std::vector<EthernetRow> ethernets;
-    std::vector<ReceiveAddressRow> receiveAddresses;
-    std::vector<PortRow> ports;
+/// The tables of interfaces. `Table`: what holds the rows of one.
+template <template <class> class Table>
+struct InterfaceTables {
+    Table<InterfaceRow> interfaces;
+    Table<StackRow> stack;
+    Table<LineRow> lines;
+    Table<BearerRow> bearers;
+    Table<Ds0ChannelRow> ds0Channels; ///< no two in one time slot
+    Table<SignallingRow> signalling;
+    Table<LapdRow> lapds;
+    Table<EthernetRow> ethernets;
+    Table<ReceiveAddressRow> receiveAddresses;
+    Table<PortRow> ports;
+
+    bool operator==(InterfaceTables const&) const = default;
+};
+
+template <class Row>
+using RowVector = std::vector<Row>;
+
+/// The tables of one board.
+struct BoardInterfaceRows : InterfaceTables<RowVector> {
+    bool operator==(BoardInterfaceRows const&) const = default;
+};
+
+/// The tables of all boards, ascending by index.
+struct InterfaceRows : InterfaceTables<Rows> {
+    /// For every line the closed intervals of all lines before it, and at the end those of all.
+    std::vector<std::size_t> intervalsBefore{0};
     // When interfaces last came or went: hundredths of a second since the agent's start.
     std::uint32_t lastChange = 0;
     std::uint32_t stackLastChange = 0;
 };
+
+/// Counts the intervals before every line of `rows`. To be called when the lines are complete.
+inline void countIntervals(InterfaceRows& rows) {
+    rows.intervalsBefore.clear();
+    rows.intervalsBefore.reserve(rows.lines.size() + 1);
+    std::size_t before = 0;
+    for (LineRow const& line : rows.lines) {
+        rows.intervalsBefore.push_back(before);
+        before += line.closedIntervals();
+    }
+    rows.intervalsBefore.push_back(before);
+}
 
 } // namespace kvloamd

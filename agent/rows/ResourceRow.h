@@ -35,6 +35,7 @@ struct ResourceRow {
     std::optional<int> timeSlotCount; ///< stations
 
     std::array<std::uint32_t, 2> index() const { return {boardIndex, place}; }
+    bool operator==(ResourceRow const&) const = default;
 };
 
 } // namespace kvloamd

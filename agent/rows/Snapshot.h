@@ -19,6 +19,7 @@
 #include "agent/rows/PlatformRecords.h"
 #include "agent/rows/ProcessRow.h"
 #include "agent/rows/ResourceRow.h"
+#include "agent/rows/Rows.h"
 #include "agent/rows/ServiceRows.h"
 #include "agent/rows/Settings.h"
 #include "agent/rows/ThresholdRow.h"
@@ -28,12 +29,12 @@ namespace kvloamd {
 /// A `Snapshot` has all rows as they were at one time. Immutable once it is published; requests
 /// share it.
 struct Snapshot {
-    std::vector<BoardRow> boards; ///< ascending by index, as all rows
+    Rows<BoardRow> boards; ///< ascending by index, as all rows
     std::vector<ModuleRow> modules;
     std::vector<ServiceRow> services;
     PlatformService platformService;
     std::vector<ProcessRow> processes;
-    std::vector<ResourceRow> resources;
+    Rows<ResourceRow> resources;
     Faults faults;
     std::shared_ptr<AlarmRows const> alarms = std::make_shared<AlarmRows>(); ///< set
     std::shared_ptr<NotificationLogRows const> notifications =

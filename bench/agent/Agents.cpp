@@ -97,11 +97,14 @@ int runChassisAgent(Folder const& folder, std::string const& address, int boards
     if (!front.open()) return 1;
     BoardRefresh refresh(boards);
     // Their seconds, not readings, would be what delays requests most.
-    refresh.stopLines();
     CollectorPace pace{std::chrono::hours(1), std::chrono::milliseconds(0), std::chrono::hours(1)};
     if (refreshes) pace.requestAge = std::chrono::milliseconds(0);
-    Collector collector([&](Snapshot& snapshot) { refresh.read(snapshot); }, Clock::now(), [] {},
-                        pace);
+    Collector collector(
+        [&](Snapshot& snapshot) {
+            refresh.let(Happened::Everything);
+            refresh.read(snapshot);
+        },
+        Clock::now(), [] {}, pace);
     serveFrom(front, kOurArc, [&] { return collector.snapshot(); });
     return 0;
 }

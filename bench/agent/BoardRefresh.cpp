@@ -1,13 +1,16 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "BoardRefresh.h"
 
+#include <atomic>
+#include <chrono>
+#include <cstdint>
 #include <ctime>
+#include <stdexcept>
 #include <string>
 
+#include "LineScheduler.h"
 #include "Z7SimBoardFactory.h"
-#include "agent/readers/ResourceReader.h"
-#include "agent/rows/ResourceRow.h"
-#include "platform/ActionScheduler_pthread.h"
+#include "agent/readers/Whereabouts.h"
 #include "simulator/exports/Control.h"
 
 namespace {
@@ -31,38 +34,88 @@ std::string chassis(int boards) {
     return text;
 }
 
-ReferenceCounter<BoardManager> managerOf(int boards) {
+/// The seconds of the lines.
+std::atomic<long> s_seconds{100'000};
+
+/// The lines' scheduler without a thread.
+class StillScheduler final : public LineScheduler {
+  public:
+    static StillScheduler& instance() {
+        static auto* const scheduler = new StillScheduler;
+        s_instance = scheduler;
+        return *scheduler;
+    }
+    using LineScheduler::pass;
+
+  private:
+    StillScheduler() = default;
+    ~StillScheduler() override = default;
+};
+
+ReferenceCounter<BoardManager> managerOf(int boards, BoardStatusListener& listener) {
+    StillScheduler::instance();
+    kvlsim::setLineClock([] { return std::chrono::nanoseconds(std::chrono::seconds(s_seconds)); });
     kvlsim::loadChassis(chassis(boards));
     ReferenceCounter<BoardManager> manager(new BoardManager);
     auto* const factory = new Z7SimBoardFactory;
     factory->SetPingInterval(0);
+    manager->AddBoardStatusListener(&listener);
     manager->Attach(ReferenceCounter<BoardFactory>(factory));
     return manager;
+}
+
+void command(nlohmann::json const& command) {
+    if (!kvlsim::execute(command).value("ok", false))
+        throw std::runtime_error("the platform refuses " + command.dump());
 }
 
 } // namespace
 
 BoardRefresh::BoardRefresh(int boards)
-    : m_manager(managerOf(boards)),
-      m_source(*m_manager.get()),
+    : m_boards(boards),
+      m_manager(managerOf(boards, *this)),
+      m_source(*m_manager.get(), &m_turns),
       m_indices(1000),
-      m_interfaces(*m_manager.get(), m_indices, kvloamd::Clock::now()),
+      m_interfaces(*m_manager.get(), m_indices, kvloamd::Clock::now(), &m_turns),
+      m_resources(*m_manager.get(), &m_turns),
       m_entityIndices(1),
       m_entities(m_entityIndices, m_settings, kvloamd::Clock::now(),
                  [] { return std::time(nullptr); }) {}
 
-void BoardRefresh::stopLines() {
-    auto* const scheduler = ActionScheduler_pthread::GetScheduler();
-    kvloamd::Snapshot snapshot;
-    read(snapshot);
-    for (kvloamd::PlacedLine const& line : m_interfaces.takeLines())
-        scheduler->Remove(line.line.get()->GetIntervalTable().get());
+int BoardRefresh::ProcessBoardStatusEvent(ReferenceCounter<BoardStatusEvent> event) {
+    // While boards appear, nothing is noted: they are new anyway.
+    BoardManager* const manager = m_manager.get();
+    if (manager == nullptr) return 0;
+    m_turns.note(static_cast<std::uint32_t>(manager->GetIndexByBoard(event->GetBoard())));
+    return 0;
+}
+
+void BoardRefresh::let(Happened happened) {
+    switch (happened) {
+    case Happened::Nothing:
+        break;
+    case Happened::Counting:
+        ++s_seconds;
+        StillScheduler::instance().pass(s_seconds);
+        break;
+    case Happened::StatusOf1:
+        command({{"command", m_changes % 2 == 0 ? "stop" : "start"},
+                 {"board", 1 + m_changes / 2 % m_boards}});
+        command({{"command", "drain"}});
+        ++m_changes;
+        break;
+    case Happened::Everything:
+        for (int board = 1; board <= m_boards; ++board)
+            m_turns.note(static_cast<std::uint32_t>(board));
+        break;
+    }
 }
 
 void BoardRefresh::read(kvloamd::Snapshot& snapshot) {
     snapshot.boards = m_source.read();
-    snapshot.resources = kvloamd::readResources(*m_manager.get(), snapshot.boards);
     snapshot.records = m_platform.read(snapshot.boards);
     snapshot.interfaces = m_interfaces.read(snapshot.boards);
+    snapshot.resources = m_resources.read(snapshot.boards);
     snapshot.entities = m_entities.read(snapshot);
+    kvloamd::noteWhereabouts(snapshot);
 }

@@ -4,5 +4,7 @@
 
 #include "Judgement.h"
 
-/// Refreshes 125 to 1,000 boards in turns. Enters the times and their growth.
+/// Refreshes 125 to 4,000 boards in turns, after several kinds of changes. Enters the times, their
+/// growth, and what a refresh takes that finds little changed relative to one that reads
+/// everything.
 void reportGrowth(Judgement& judgement);

@@ -9,7 +9,6 @@ kvloamd::Snapshot makeIntervals(std::uint32_t lines) {
     std::mt19937 random(1);
     // Counters of all sizes, mostly small.
     std::exponential_distribution<double> counts(1.0 / 50);
-    std::size_t before = 0;
     for (std::uint32_t i = 0; i < lines; ++i) {
         kvloamd::LineRow line;
         line.ifIndex = kFirstLine + i;
@@ -22,9 +21,8 @@ kvloamd::Snapshot makeIntervals(std::uint32_t lines) {
             closed->counts.push_back(interval);
         }
         line.closed = closed;
-        line.intervalsBefore = before;
-        before += line.closedIntervals();
         snapshot.interfaces.lines.push_back(std::move(line));
     }
+    countIntervals(snapshot.interfaces);
     return snapshot;
 }

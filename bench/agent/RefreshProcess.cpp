@@ -10,7 +10,6 @@
 #include <system_error>
 #include <utility>
 
-#include "BoardRefresh.h"
 #include "agent/log/Log.h"
 
 namespace {
@@ -31,8 +30,9 @@ int refreshWhenAsked(int socket, int boards) {
     // As in the agent, the former snapshot goes once the new one is there.
     kvloamd::Snapshot former;
     for (double seconds = 0;;) {
-        char asked = 0;
-        if (read(socket, &asked, 1) != 1) return 0;
+        Happened happened{};
+        if (read(socket, &happened, 1) != 1) return 0;
+        refresh.let(happened);
         double const begun = processorSeconds();
         kvloamd::Snapshot snapshot;
         refresh.read(snapshot);
@@ -60,16 +60,17 @@ RefreshProcess::RefreshProcess(int boards, Ends ends)
           return refreshWhenAsked(ends.theirs, boards);
       }) {
     close(ends.theirs);
-    refresh();
+    refresh(Happened::Nothing);
 }
 
 RefreshProcess::~RefreshProcess() {
     close(m_socket);
 }
 
-double RefreshProcess::refresh() const {
+double RefreshProcess::refresh(Happened happened) const {
     double seconds = 0;
-    if (write(m_socket, "r", 1) != 1 || read(m_socket, &seconds, sizeof seconds) != sizeof seconds)
+    if (write(m_socket, &happened, 1) != 1 ||
+        read(m_socket, &seconds, sizeof seconds) != sizeof seconds)
         throw std::runtime_error("the process that refreshes has ended");
     return seconds;
 }

@@ -2,6 +2,7 @@
 // Reads boards and lines anew in a process of its own, as often as it is asked to.
 #pragma once
 
+#include "BoardRefresh.h"
 #include "Child.h"
 
 class RefreshProcess {
@@ -12,8 +13,9 @@ class RefreshProcess {
     RefreshProcess(RefreshProcess const&) = delete;
     RefreshProcess& operator=(RefreshProcess const&) = delete;
 
-    /// Refreshes once; returns the processor's seconds that it took.
-    double refresh() const;
+    /// Lets something happen and refreshes once; returns the processor's seconds that the refresh
+    /// took.
+    double refresh(Happened happened) const;
 
   private:
     /// The two ends of a connection: this process's, and the child's.

@@ -119,8 +119,8 @@ class Encounter {
             Snapshot changed;
             changed.interfaces.interfaces.resize(input.choice(16));
             std::uint32_t index = 0;
-            for (InterfaceRow& row : changed.interfaces.interfaces)
-                row.ifIndex = index += 1U + input.octet();
+            changed.interfaces.interfaces.editAll(
+                [&](InterfaceRow& row) { row.ifIndex = index += 1U + input.octet(); });
             m_rows.update({changed, m_counters}, Clock::now());
             m_session->registerRows();
         }

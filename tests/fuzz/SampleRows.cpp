@@ -49,9 +49,9 @@ InterfaceRows sampleInterfaces() {
         line.lineStatus = 1;
         line.timeElapsed = 7;
         line.closed = closed;
-        line.intervalsBefore = rows.lines.size() * 2;
         rows.lines.push_back(line);
     }
+    countIntervals(rows);
     rows.stack = {{0, 1000}, {1000, 1001}};
     return rows;
 }

@@ -12,8 +12,8 @@ namespace kvloamd {
 namespace {
 
 /// The row of this index, of rows that ascend by `field`; null when there is none.
-template <class Row, class Field>
-Row const* rowOf(std::vector<Row> const& rows, std::uint32_t index, Field field) {
+template <class Rows, class Field>
+auto const* rowOf(Rows const& rows, std::uint32_t index, Field field) {
     auto const found = std::ranges::lower_bound(rows, index, {}, field);
     return found == rows.end() || std::invoke(field, *found) != index ? nullptr : &*found;
 }

@@ -85,15 +85,15 @@ TEST_F(AlarmEventsTest, BoardThatWasStoppedBeforeItWasRemovedIsNotMissed) {
 
 TEST_F(AlarmEventsTest, BoardThatStopsBecauseItGoesIsMissed) {
     // A snapshot may be read between the two.
-    m_snapshot.boards[0].status = BoardStatusStopped;
+    m_snapshot.boards.edit(0).status = BoardStatusStopped;
     update();
     announce(BoardStatusRemoved);
     EXPECT_THAT(active(), ElementsAre("boardGone of board S1"));
 }
 
 TEST_F(AlarmEventsTest, BoardThatWasFoundStoppedIsNotMissed) {
-    m_snapshot.boards[0].boardIndex = 2;
-    m_snapshot.boards[0].status = BoardStatusStopped;
+    m_snapshot.boards.edit(0).boardIndex = 2;
+    m_snapshot.boards.edit(0).status = BoardStatusStopped;
     update();
     m_events.boardStatus(2, FakeChassis::fake(m_board), BoardStatusRemoved);
     EXPECT_THAT(active(), IsEmpty());
@@ -108,7 +108,7 @@ TEST_F(AlarmEventsTest, FailedBoardThatIsRemovedHasGone) {
 
 TEST_F(AlarmEventsTest, BoardInTheSlotOfOneThatHasGoneReplacesIt) {
     announce(BoardStatusRemoved);
-    m_snapshot.boards[0].serialNumber = "S2";
+    m_snapshot.boards.edit(0).serialNumber = "S2";
     update();
     EXPECT_THAT(active(), IsEmpty());
 }

@@ -32,20 +32,18 @@ std::vector<std::string> texts(std::vector<Condition> const& conditions) {
 class AlarmSourcesTest : public ::testing::Test {
   protected:
     BoardRow& addBoard(std::string const& serialNumber, int status = BoardStatusStarted) {
-        BoardRow row;
-        row.boardIndex = static_cast<std::uint32_t>(m_snapshot.boards.size() + 1);
+        BoardRow& row = m_snapshot.boards.emplace_back();
+        row.boardIndex = static_cast<std::uint32_t>(m_snapshot.boards.size());
         row.serialNumber = serialNumber;
         row.status = status;
-        m_snapshot.boards.push_back(row);
-        return m_snapshot.boards.back();
+        return row;
     }
     InterfaceRow& addInterface(std::uint32_t ifIndex, std::string const& description) {
-        InterfaceRow row;
+        InterfaceRow& row = m_snapshot.interfaces.interfaces.emplace_back();
         row.ifIndex = ifIndex;
         row.boardIndex = 1;
         row.description = description;
-        m_snapshot.interfaces.interfaces.push_back(row);
-        return m_snapshot.interfaces.interfaces.back();
+        return row;
     }
     void addLine(std::uint32_t ifIndex, std::optional<int> status) {
         addInterface(ifIndex, "T1 line " + std::to_string(ifIndex));
@@ -168,7 +166,7 @@ TEST_F(AlarmSourcesTest, EthernetInterfaceIsDownUnlessItWasSwitchedOff) {
         addInterface(ifIndex, "Ethernet " + std::to_string(ifIndex)).operStatus =
             ifIndex == 1000 ? kUp : kDown;
     }
-    m_snapshot.interfaces.interfaces[2].adminStatus = kDown;
+    m_snapshot.interfaces.interfaces.edit(2).adminStatus = kDown;
     EXPECT_THAT(texts(read()), ElementsAre("linkDown of board S1, Ethernet 1001"));
 }
 

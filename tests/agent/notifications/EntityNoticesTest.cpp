@@ -124,8 +124,8 @@ TEST_F(EntityNoticesTest, EntityThatIsDisabledIsToldWithItsStateAndAlarm) {
     setOper({{17, OperState::Enabled}, {20, OperState::Enabled}});
     tell();
     setOper({{17, OperState::Enabled}, {20, OperState::Disabled}});
-    m_next.entities.states[1].state.admin = AdminState::Locked;
-    m_next.entities.states[1].state.alarm = static_cast<char>(kAlarmCritical);
+    m_next.entities.states.edit(1).state.admin = AdminState::Locked;
+    m_next.entities.states.edit(1).state.alarm = static_cast<char>(kAlarmCritical);
     m_next.begun = Clock::now();
     tell();
     auto const told = m_queue.pop();
@@ -229,7 +229,7 @@ TEST_F(EntityNoticesTest, OtherStatesAreNotTold) {
     setOper({{1, OperState::Disabled}, {2, OperState::Enabled}});
     tell();
     setOper({{1, OperState::Unknown}, {2, OperState::Testing}});
-    m_next.entities.states[0].state.usage = UsageState::Idle;
+    m_next.entities.states.edit(0).state.usage = UsageState::Idle;
     tell();
     EXPECT_THAT(told(), IsEmpty());
 }

@@ -277,10 +277,12 @@ TEST_F(LineFaultsInLogTest, BoardThatReturnsIsComparedAnew) {
 TEST(ShownLineFaultsTest, LinesAreCountedByBoardAndFault) {
     InterfaceRows rows;
     auto const add = [&](std::uint32_t ifIndex, std::uint32_t board, std::optional<int> status) {
-        rows.interfaces.emplace_back().ifIndex = ifIndex;
-        rows.interfaces.back().boardIndex = board;
-        rows.lines.emplace_back().ifIndex = ifIndex;
-        rows.lines.back().lineStatus = status;
+        InterfaceRow& interface = rows.interfaces.emplace_back();
+        interface.ifIndex = ifIndex;
+        interface.boardIndex = board;
+        LineRow& line = rows.lines.emplace_back();
+        line.ifIndex = ifIndex;
+        line.lineStatus = status;
     };
     add(1000, 1, 64 + 8192);
     add(1001, 1, 64);

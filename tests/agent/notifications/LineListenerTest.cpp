@@ -46,7 +46,7 @@ class LineListenerTest : public ::testing::Test {
         m_listener.listen(boards, m_reader.changeTimes());
         m_reader.read(boards);
         meanwhile();
-        auto const lines = m_reader.takeLines();
+        auto const lines = m_reader.lines();
         m_listener.place(lines);
         applySettings(m_settings, lines);
     }

@@ -33,7 +33,7 @@ class LineStormTest : public ::testing::Test {
         auto const boards = m_source.read();
         m_listener.listen(boards, m_reader.changeTimes());
         m_reader.read(boards);
-        auto const lines = m_reader.takeLines();
+        auto const lines = m_reader.lines();
         m_listener.place(lines);
         applySettings(m_settings, lines);
     }

@@ -1,6 +1,8 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/objects/Description.h"
 
+#include <algorithm>
+
 #include <gtest/gtest.h>
 
 namespace kvloamd {
@@ -18,7 +20,7 @@ constexpr Column<InterfaceRow> kColumns[] = {
     {"plain", 3, ValueType::Integer, status},
 };
 
-std::vector<InterfaceRow> const& rows(Snapshot const& snapshot) {
+Rows<InterfaceRow> const& rows(Snapshot const& snapshot) {
     return snapshot.interfaces.interfaces;
 }
 
@@ -27,7 +29,7 @@ class DescriptionTest : public ::testing::Test {
     /// The value of a column whose getter answers `number`.
     Value valueOf(std::size_t column, int number) {
         m_snapshot.interfaces.interfaces.resize(1);
-        m_snapshot.interfaces.interfaces[0].linkUpDownTraps = number;
+        m_snapshot.interfaces.interfaces.edit(0).linkUpDownTraps = number;
         return m_table.value(Facts{m_snapshot, m_counters}, column, 0);
     }
 
@@ -49,6 +51,30 @@ TEST_F(DescriptionTest, NumberThatTheModuleHasNoNameForIsNotKnown) {
 TEST_F(DescriptionTest, OtherNumbersAreServedWhereTheyAreLegal) {
     EXPECT_EQ(valueOf(1, 2), Value{std::int64_t{2}});
     EXPECT_EQ(valueOf(2, 2), Value{std::int64_t{2}});
+}
+
+TEST_F(DescriptionTest, RowIsFoundWhateverWasFoundBefore) {
+    Snapshot few;
+    for (std::uint32_t const index : {2U, 4U, 6U, 8U, 10U})
+        m_snapshot.interfaces.interfaces.emplace_back().ifIndex = index;
+    few.interfaces.interfaces.emplace_back().ifIndex = 4;
+    auto const find = [&](Snapshot const& snapshot, std::uint32_t index, bool orEqual) {
+        std::uint32_t const name[] = {index};
+        return m_table.firstRow(Facts{snapshot, m_counters}, name, orEqual);
+    };
+    for (std::uint32_t former = 0; former < 12; ++former)
+        for (std::uint32_t index = 0; index < 12; ++index)
+            for (bool const orEqual : {false, true}) {
+                find(m_snapshot, former, orEqual);
+                // So many of the even numbers lie below, or below or at the index.
+                std::uint32_t const above = orEqual ? index : index + 1;
+                std::size_t const before = std::min(above == 0 ? 0U : (above - 1U) / 2U, 5U);
+                EXPECT_EQ(find(m_snapshot, index, orEqual), before)
+                    << former << ' ' << index << ' ' << orEqual;
+                find(m_snapshot, former, orEqual);
+                EXPECT_EQ(find(few, index, orEqual), (orEqual ? index > 4 : index >= 4) ? 1U : 0U)
+                    << former << ' ' << index << ' ' << orEqual;
+            }
 }
 
 TEST_F(DescriptionTest, HeadTellsWhatPeopleNeed) {

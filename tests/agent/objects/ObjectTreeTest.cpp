@@ -194,7 +194,7 @@ TEST_F(ObjectTreeTest, WalkIsStrictlyIncreasingAndFindsEveryStep) {
 }
 
 TEST_F(ObjectTreeTest, StatusWithoutANameIsLeftOut) {
-    m_snapshot.boards[0].status = 7;
+    m_snapshot.boards.edit(0).status = 7;
     EXPECT_EQ(find({1, 1, 2, 4, 1, 2, 2}), Lookup::NoSuchInstance);
     EXPECT_EQ(find({1, 1, 2, 4, 1, 2, 5}), Lookup::Found);
 }

@@ -12,7 +12,6 @@ namespace {
 class StandardTablesTest : public ::testing::Test {
   protected:
     StandardTablesTest() {
-        std::size_t before = 0;
         for (auto const& [index, records] :
              {std::pair{10U, 3U}, std::pair{20U, 0U}, std::pair{30U, 97U}, std::pair{40U, 1U}}) {
             LineRow line;
@@ -29,10 +28,9 @@ class StandardTablesTest : public ::testing::Test {
                 if (n > 0) closed->valid.push_back(n < 96);
             }
             if (records > 0) line.closed = closed;
-            line.intervalsBefore = before;
-            before += line.closedIntervals();
             m_snapshot.interfaces.lines.push_back(std::move(line));
         }
+        countIntervals(m_snapshot.interfaces);
     }
 
     Lookup find(Oid const& name) { return m_tree.find(m_facts, name, m_found); }
@@ -202,7 +200,7 @@ TEST_F(StandardTablesTest, WhatBeganWithTheAgentBeganLaterThanAMasterThatRanBefo
     m_counters.master = Master::Connected;
     // When the state of an interface began that was there before is not known.
     EXPECT_EQ(times(), (std::vector<std::int64_t>{50000, 50000, 50000, 0}));
-    m_snapshot.interfaces.interfaces[0].discontinuity = 200;
+    m_snapshot.interfaces.interfaces.edit(0).discontinuity = 200;
     EXPECT_EQ(numberAt(discontinuity), 50200);
     // A master that has been restarted since.
     m_counters.setSysUpTime(100, m_counters.started + std::chrono::seconds(10));
@@ -274,7 +272,7 @@ TEST_F(StandardTablesTest, OldestIntervalOfAFullHistoryHasNoValidData) {
 }
 
 TEST_F(StandardTablesTest, IntervalThatMissedDataHasNoCounts) {
-    LineRow& line = m_snapshot.interfaces.lines[0];
+    LineRow& line = m_snapshot.interfaces.lines.edit(0);
     auto const closed = std::make_shared<ClosedIntervals>(*line.closed);
     closed->valid[0] = false;
     line.closed = closed;
@@ -298,7 +296,7 @@ TEST_F(StandardTablesTest, RunningIntervalIsTheFirstRecord) {
 }
 
 TEST_F(StandardTablesTest, CountThatALineDoesNotKnowHasNoInstance) {
-    LineRow& line = m_snapshot.interfaces.lines[0];
+    LineRow& line = m_snapshot.interfaces.lines.edit(0);
     auto const closed = std::make_shared<ClosedIntervals>(*line.closed);
     LineCounts newest = closed->counts[0];
     newest[9] = -2;
@@ -318,12 +316,13 @@ Oid const kAlias{31, 1, 1, 1, 18};
 class StandardSetTest : public StandardTablesTest {
   protected:
     StandardSetTest() {
-        for (LineRow& line : m_snapshot.interfaces.lines)
+        m_snapshot.interfaces.lines.editAll([](LineRow& line) {
             if (line.ifIndex != 20) line.statusChangeTrapEnable = 2;
+        });
         m_snapshot.interfaces.interfaces.resize(2);
-        m_snapshot.interfaces.interfaces[0].ifIndex = 10;
-        m_snapshot.interfaces.interfaces[1].ifIndex = 50;
-        m_snapshot.interfaces.interfaces[1].linkUpDownTraps = 2;
+        m_snapshot.interfaces.interfaces.edit(0).ifIndex = 10;
+        m_snapshot.interfaces.interfaces.edit(1).ifIndex = 50;
+        m_snapshot.interfaces.interfaces.edit(1).linkUpDownTraps = 2;
     }
 
     SetFault test(Oid const& name, std::optional<std::int64_t> integer) {

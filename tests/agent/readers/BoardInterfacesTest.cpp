@@ -42,7 +42,9 @@ class BoardInterfacesTest : public ::testing::Test {
             numbers.push_back(row.channelNumber);
         return numbers;
     }
-    InterfaceRows read() { return readInterfaces(*m_board.get(), m_toTicks, m_histories).rows; }
+    BoardInterfaceRows read() {
+        return readInterfaces(*m_board.get(), m_toTicks, m_histories).rows;
+    }
     LineRow readLine() {
         auto rows = read();
         EXPECT_THAT(rows.lines, SizeIs(1));

@@ -58,7 +58,7 @@ class CollectorTest : public ::testing::Test {
             std::scoped_lock const guard(m_mutex);
             ++m_reads;
             m_readingThreads.insert(std::this_thread::get_id());
-            snapshot.boards[0].name = m_name;
+            snapshot.boards.edit(0).name = m_name;
         }
         m_whileReading();
     }

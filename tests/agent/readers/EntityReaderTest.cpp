@@ -70,9 +70,9 @@ class EntityReaderTest : public ::testing::Test {
         addPort(2, 1016, {IndexKind::Line, "one"});
     }
     EntityRows read() { return m_reader.read(m_snapshot); }
-    std::vector<PhysicalRow> readEntities() { return read().physical->entities; }
+    Rows<PhysicalRow> readEntities() { return read().physical->entities; }
     /// What is in `rows`; the first of those that are called so or described so.
-    static PhysicalRow find(std::vector<PhysicalRow> const& rows, std::string const& name) {
+    static PhysicalRow find(Rows<PhysicalRow> const& rows, std::string const& name) {
         for (PhysicalRow const& row : rows)
             if (row.name == name || row.description == name) return row;
         ADD_FAILURE() << "no entity " << name;
@@ -293,7 +293,7 @@ TEST_F(EntityReaderTest, WhatIsThereAtTheStartIsNoChange) {
 TEST_F(EntityReaderTest, ComingGoingAndChangingAreTimedAndStayingIsNot) {
     addBoards();
     auto const first = read();
-    m_snapshot.boards[0].firmwareVersion = "5.0";
+    m_snapshot.boards.edit(0).firmwareVersion = "5.0";
     auto const changed = read();
     EXPECT_GE(changed.lastChange, 360000U); // an hour
     EXPECT_NE(changed.physical, first.physical);
@@ -319,8 +319,8 @@ TEST_F(EntityReaderTest, WhatOperatorsSetIsInTheRowsAndAChange) {
 TEST_F(EntityReaderTest, ChangeOfStateIsNoChangeOfEntities) {
     addBoards();
     read();
-    m_snapshot.boards[0].status = BoardStatusStopped;
-    m_snapshot.interfaces.interfaces[0].operStatus = 2;
+    m_snapshot.boards.edit(0).status = BoardStatusStopped;
+    m_snapshot.interfaces.interfaces.edit(0).operStatus = 2;
     EXPECT_EQ(read().lastChange, 0U);
 }
 
@@ -352,9 +352,9 @@ TEST_F(EntityReaderTest, IndicesAreTheSameAfterARestart) {
     };
     addBoards();
     auto const before = readAnew();
-    std::swap(m_snapshot.boards[0].serialNumber, m_snapshot.boards[1].serialNumber);
+    std::swap(m_snapshot.boards.edit(0).serialNumber, m_snapshot.boards.edit(1).serialNumber);
     auto const swapped = readAnew();
-    std::swap(m_snapshot.boards[0].serialNumber, m_snapshot.boards[1].serialNumber);
+    std::swap(m_snapshot.boards.edit(0).serialNumber, m_snapshot.boards.edit(1).serialNumber);
     EXPECT_EQ(readAnew(), before);
     // The serial number tells which is which, not the place.
     EXPECT_EQ(find(swapped, "bus 2 slot 4").entity, find(before, "bus 2 slot 4").entity);

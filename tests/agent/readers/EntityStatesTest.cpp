@@ -184,9 +184,7 @@ class EntityStatesTest : public ::testing::Test {
         m_board.boardIndex = 1;
         m_board.status = BoardStatusStarted;
     }
-    std::vector<EntityStateRow> read() {
-        return m_states.read({m_entity}, {m_board}, {}, m_faults);
-    }
+    Rows<EntityStateRow> read() { return m_states.read({m_entity}, {m_board}, {}, m_faults); }
     std::string readChanged() {
         auto const rows = read();
         EXPECT_THAT(rows, SizeIs(1));

@@ -13,7 +13,7 @@ using ::testing::ElementsAre;
 class InterfaceNamesTest : public ::testing::Test {
   protected:
     void add(std::string name, std::uint32_t board, std::string description = "") {
-        InterfaceRow row;
+        InterfaceTexts row;
         row.ifIndex = static_cast<std::uint32_t>(1000 + m_rows.size());
         row.boardIndex = board;
         row.description =
@@ -24,7 +24,7 @@ class InterfaceNamesTest : public ::testing::Test {
     std::vector<std::string> names() {
         distinguishNames(m_rows, {{1, "ONE"}, {2, "TWO"}});
         std::vector<std::string> all;
-        for (InterfaceRow const& row : m_rows)
+        for (InterfaceTexts const& row : m_rows)
             all.push_back(row.name);
         return all;
     }
@@ -35,7 +35,7 @@ class InterfaceNamesTest : public ::testing::Test {
         return row;
     }
 
-    std::vector<InterfaceRow> m_rows;
+    std::vector<InterfaceTexts> m_rows;
 };
 
 TEST_F(InterfaceNamesTest, InterfaceWithoutANameIsCalledAfterItsKind) {
@@ -80,7 +80,7 @@ TEST_F(InterfaceNamesTest, NoNamesAreEqualHoweverLongTheyAre) {
         add(longest, board, longest);
     auto const all = names();
     EXPECT_EQ(std::set<std::string>(all.begin(), all.end()).size(), 3U);
-    for (InterfaceRow const& row : m_rows) {
+    for (InterfaceTexts const& row : m_rows) {
         EXPECT_LE(row.name.size(), 255U);
         EXPECT_LE(row.description.size(), 255U);
     }

@@ -65,6 +65,13 @@ TEST_F(InterfaceReaderTest, BoardWithoutFeaturesHasNoInterfaces) {
     EXPECT_THAT(rows.stack, IsEmpty());
 }
 
+TEST_F(InterfaceReaderTest, InterfaceKnowsTheSerialNumberOfItsBoard) {
+    addPort(m_chassis.insert("A"));
+    EXPECT_EQ(readOne().boardSerialNumber, "A");
+    addPort(m_chassis.insert("B"));
+    EXPECT_EQ(read().interfaces[1].boardSerialNumber, "B");
+}
+
 TEST_F(InterfaceReaderTest, WhatAnInterfaceDoesNotSupportIsNotKnown) {
     addPort(m_chassis.insert("A"));
     InterfaceRow const row = readOne();

@@ -35,7 +35,7 @@ class InterfaceStatesTest : public ::testing::Test {
         return row(higher).operStatus;
     }
 
-    InterfaceRows m_rows;
+    BoardInterfaceRows m_rows;
 };
 
 TEST_F(InterfaceStatesTest, WhatIsNotKnownIsWantedUpAndUnknown) {

@@ -90,7 +90,7 @@ class ResourceRowsTest : public ::testing::Test {
         row.boardIndex = static_cast<std::uint32_t>(m_boards.size() + 1);
         m_boards.push_back(row);
     }
-    std::vector<ResourceRow> read() { return readResources(*m_chassis.manager.get(), m_boards); }
+    Rows<ResourceRow> read() { return m_reader.read(m_boards); }
     /// The row of the one device of one board.
     ResourceRow rowOf(Z7Device* device) {
         insert({device});
@@ -98,7 +98,8 @@ class ResourceRowsTest : public ::testing::Test {
     }
 
     FakeChassis m_chassis;
-    std::vector<BoardRow> m_boards;
+    Rows<BoardRow> m_boards;
+    ResourceReader m_reader{*m_chassis.manager.get()};
 };
 
 TEST_F(ResourceRowsTest, DevicesHavePlacesOnTheirBoards) {

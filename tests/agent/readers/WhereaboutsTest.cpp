@@ -39,39 +39,29 @@ class WhereaboutsTest : public ::testing::Test {
         row.boardIndex = boardIndex;
         row.ifIndex = ifIndex;
     }
-    InterfaceRow const& interface(std::size_t position) const {
-        return m_snapshot.interfaces.interfaces.at(position);
+    std::uint32_t entityOf(std::size_t interface) const {
+        return m_snapshot.entities.ofInterfaces.at(interface);
     }
 
     Snapshot m_snapshot;
 };
 
 TEST_F(WhereaboutsTest, BoardKnowsItsEntity) {
-    EXPECT_EQ(m_snapshot.boards[0].entity, 17U);
-    EXPECT_EQ(m_snapshot.boards[1].entity, 33U);
+    EXPECT_EQ(m_snapshot.entities.ofBoards.at(0), 17U);
+    EXPECT_EQ(m_snapshot.entities.ofBoards.at(1), 33U);
 }
 
 TEST_F(WhereaboutsTest, InterfaceKnowsItsPortAndAChannelItsBoard) {
-    EXPECT_EQ(interface(0).entity, 18U);
-    EXPECT_EQ(interface(1).entity, 17U);
-    EXPECT_EQ(interface(2).entity, 33U);
-}
-
-TEST_F(WhereaboutsTest, InterfaceKnowsTheSerialNumberOfItsBoard) {
-    EXPECT_EQ(interface(0).boardSerialNumber, "S1");
-    EXPECT_EQ(interface(1).boardSerialNumber, "S1");
-    EXPECT_EQ(interface(2).boardSerialNumber, "S2");
+    EXPECT_EQ(entityOf(0), 18U);
+    EXPECT_EQ(entityOf(1), 17U);
+    EXPECT_EQ(entityOf(2), 33U);
 }
 
 TEST_F(WhereaboutsTest, WhatHasNoEntityHasNone) {
-    for (BoardRow& board : m_snapshot.boards)
-        board.entity = 0;
-    for (InterfaceRow& row : m_snapshot.interfaces.interfaces)
-        row.entity = 0;
     m_snapshot.entities.physical = std::make_shared<PhysicalEntities>();
     noteWhereabouts(m_snapshot);
-    EXPECT_EQ(m_snapshot.boards[0].entity, 0U);
-    EXPECT_EQ(interface(1).entity, 0U);
+    EXPECT_EQ(m_snapshot.entities.ofBoards.at(0), 0U);
+    EXPECT_EQ(entityOf(1), 0U);
 }
 
 } // namespace

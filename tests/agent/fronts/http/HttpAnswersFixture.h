@@ -60,6 +60,7 @@ class HttpAnswersFixture : public ::testing::Test {
         row.timeElapsed = 100;
         row.closed = closed;
         m_snapshot->interfaces.lines = {row};
+        countIntervals(m_snapshot->interfaces);
         BearerRow bearer;
         bearer.ifIndex = 1001;
         m_snapshot->interfaces.bearers = {bearer};

@@ -35,7 +35,8 @@ TEST_F(HttpAnswersTest, LineIsJoinedFromTheTablesOfItsIndex) {
 }
 
 TEST_F(HttpAnswersTest, LineWithoutHistoryHasNoCounts) {
-    m_snapshot->interfaces.lines[0].closed = nullptr;
+    m_snapshot->interfaces.lines.edit(0).closed = nullptr;
+    countIntervals(m_snapshot->interfaces);
     Json const line = document("/api/v1/lines")["lines"][0];
     EXPECT_EQ(line["current"]["es"], nullptr);
     EXPECT_EQ(document("/api/v1/lines/1000")["line"]["intervals"], Json::array());
@@ -67,11 +68,11 @@ TEST_F(HttpAnswersTest, IntervalsBeginAQuarterOfAnHourApart) {
 }
 
 TEST_F(HttpAnswersTest, NameOfSeveralLinesIsAConflict) {
-    m_snapshot->interfaces.interfaces[1].name = "trunk-1";
+    m_snapshot->interfaces.interfaces.edit(1).name = "trunk-1";
     LineRow second = m_snapshot->interfaces.lines[0];
     second.ifIndex = 1001;
-    second.intervalsBefore = 2;
     m_snapshot->interfaces.lines.push_back(second);
+    countIntervals(m_snapshot->interfaces);
     EXPECT_EQ(get("/api/v1/lines/trunk-1").status, 409);
     EXPECT_EQ(document("/api/v1/lines/1001")["line"]["ifIndex"], 1001);
 }
@@ -106,7 +107,7 @@ TEST_F(HttpAnswersTest, CounterOf64BitsIsWhole) {
 }
 
 TEST_F(HttpAnswersTest, TableHasNamesAndUnitsOfItsModule) {
-    m_snapshot->interfaces.interfaces[0].lastChange = 150;
+    m_snapshot->interfaces.interfaces.edit(0).lastChange = 150;
     Json const answer = document("/api/v1/tables/ifTable");
     EXPECT_EQ(answer["table"], "ifTable");
     EXPECT_EQ(answer["rows"][0]["index"], Json::array({1000}));
@@ -186,7 +187,8 @@ TEST_F(HttpAnswersTest, StripIsShownOnRequest) {
     EXPECT_EQ(document("/api/v1/lines?fields=strip")["lines"][0]["strip"],
               Json::parse("[[3,2,0],null]"));
     m_snapshot->number = 8;
-    m_snapshot->interfaces.lines[0].closed = nullptr;
+    m_snapshot->interfaces.lines.edit(0).closed = nullptr;
+    countIntervals(m_snapshot->interfaces);
     EXPECT_EQ(document("/api/v1/lines?fields=strip")["lines"][0]["strip"], nullptr);
 }
 
@@ -208,7 +210,7 @@ TEST_F(HttpAnswersTest, ChannelsInUseAreCounted) {
     EXPECT_EQ(idle["channels"], 1);
     EXPECT_EQ(idle["channelsInUse"], 0);
     m_snapshot->number = 8;
-    m_snapshot->interfaces.bearers[0].operStatus = ISDNBChannelStatusActive;
+    m_snapshot->interfaces.bearers.edit(0).operStatus = ISDNBChannelStatusActive;
     EXPECT_EQ(document("/api/v1/lines")["lines"][0]["channelsInUse"], 1);
     EXPECT_EQ(document("/api/v1/health")["health"]["channelsInUse"], 1);
 }
@@ -325,8 +327,8 @@ TEST_F(HttpAnswersTest, MetricsComeInTheFormatThatTheRequestPrefers) {
 }
 
 TEST_F(HttpAnswersTest, MetricsOfChannelsComeIfAskedFor) {
-    m_snapshot->interfaces.interfaces[1].type = kTypeDs0;
-    m_snapshot->interfaces.bearers[0].operStatus = 1;
+    m_snapshot->interfaces.interfaces.edit(1).type = kTypeDs0;
+    m_snapshot->interfaces.bearers.edit(0).operStatus = 1;
     EXPECT_THAT(*get("/metrics").body, Not(HasSubstr("trunk-1/1")));
     EXPECT_THAT(*get("/metrics?channels=1").body, HasSubstr("channel=\"trunk-1/1\""));
     EXPECT_EQ(get("/metrics/more").status, 404);

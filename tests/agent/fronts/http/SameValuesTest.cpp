@@ -24,9 +24,10 @@ class SameValuesTest : public ::testing::Test {
   protected:
     SameValuesTest() {
         InterfaceRows& rows = m_snapshot->interfaces;
-        rows.interfaces[0].counters[kInOctets] = 0xfffffffffffffffeU;
-        rows.interfaces[1].mtu = 1500;
-        rows.interfaces[1].operStatus.reset();
+        rows.interfaces.edit(0).counters[kInOctets] = 0xfffffffffffffffeU;
+        InterfaceRow& second = rows.interfaces.edit(1);
+        second.mtu = 1500;
+        second.operStatus.reset();
         EthernetRow ethernet;
         ethernet.ifIndex = kFirstLine;
         ethernet.counters[kFcsErrors] = 3;

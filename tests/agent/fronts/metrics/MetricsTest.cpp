@@ -98,7 +98,7 @@ TEST_F(MetricsTest, TotalsOfLinesAreCounters) {
 }
 
 TEST_F(MetricsTest, TotalThatIsNotKnownHasNoSample) {
-    m_snapshot->interfaces.lines[0].totals[kDegradedMinutes] = kUnknownTotal;
+    m_snapshot->interfaces.lines.edit(0).totals[kDegradedMinutes] = kUnknownTotal;
     EXPECT_THAT(samples("kvloam_line_degraded_seconds_total"), IsEmpty());
     EXPECT_THAT(text(), Not(HasSubstr("kvloam_line_degraded")));
 }
@@ -109,7 +109,7 @@ TEST_F(MetricsTest, UnitsAreBaseUnits) {
     m_snapshot->refreshTime = std::chrono::milliseconds(1250);
     EXPECT_THAT(samples("kvloam_refresh_time_seconds"),
                 ElementsAre("kvloam_refresh_time_seconds 1.25"));
-    m_snapshot->interfaces.interfaces[0].counters[kInOctets] = 0xffffffffffffffffU;
+    m_snapshot->interfaces.interfaces.edit(0).counters[kInOctets] = 0xffffffffffffffffU;
     EXPECT_THAT(samples("kvloam_interface_in_bytes_total")[0], HasSubstr(" 18446744073709551615"));
 }
 
@@ -120,7 +120,7 @@ TEST_F(MetricsTest, TimesAreSecondsSinceTheEpoch) {
     EXPECT_THAT(samples("kvloam_board_change_timestamp_seconds")[0], HasSubstr(" 1795349730"));
     EXPECT_THAT(samples("kvloam_clock_timestamp_seconds"),
                 ElementsAre("kvloam_clock_timestamp_seconds 1800000000.5"));
-    m_snapshot->interfaces.lines[0].statusLastChange = 0;
+    m_snapshot->interfaces.lines.edit(0).statusLastChange = 0;
     EXPECT_THAT(samples("kvloam_line_status_last_change_timestamp_seconds"), IsEmpty());
 }
 
@@ -135,10 +135,9 @@ TEST_F(MetricsTest, BoardThatIsNotThereHasNothing) {
 TEST_F(MetricsTest, NoTwoSamplesAreTheSame) {
     m_snapshot = sampleBoards({3, 2, 2});
     m_options.channels = true;
-    for (BoardRow& board : m_snapshot->boards)
-        board.serialNumber = board.boardIndex == 3 ? "" : "SAME";
-    for (InterfaceRow& row : m_snapshot->interfaces.interfaces)
-        row.name = "same";
+    m_snapshot->boards.editAll(
+        [](BoardRow& board) { board.serialNumber = board.boardIndex == 3 ? "" : "SAME"; });
+    m_snapshot->interfaces.interfaces.editAll([](InterfaceRow& row) { row.name = "same"; });
     m_snapshot->modules = {{1, "twice", "", "", ""}, {2, "twice", "", "", ""}};
     std::istringstream all(text());
     std::set<std::string> seen;
@@ -169,7 +168,7 @@ TEST_F(MetricsTest, ChannelsOfALineAreCountedByState) {
 }
 
 TEST_F(MetricsTest, TextsThatAreNoTextsAreMadeHarmless) {
-    m_snapshot->boards[0].model = "a\\b\nc\x01\xff";
+    m_snapshot->boards.edit(0).model = "a\\b\nc\x01\xff";
     EXPECT_THAT(samples("kvloam_board_info")[0], HasSubstr("model=\"a\\\\b\\nc??\""));
 }
 

@@ -62,11 +62,11 @@ inline std::shared_ptr<Snapshot> sampleBoards(SampleSize const& size = {}) {
             line.statusLastChange = 1234;
             line.timeElapsed = 17;
             line.closed = closed;
-            line.intervalsBefore = rows.lines.size() * 2;
             line.totals = {10, 9, 8, 7, 6, 500, 4, 3, 2, 1000};
             rows.lines.push_back(line);
         }
     }
+    countIntervals(rows);
     if (size.channelsOfALine == 0) return snapshot;
     auto const lines = rows.lines;
     for (LineRow const& line : lines) {
