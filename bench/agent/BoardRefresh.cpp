@@ -52,14 +52,13 @@ class StillScheduler final : public LineScheduler {
     ~StillScheduler() override = default;
 };
 
-ReferenceCounter<BoardManager> managerOf(int boards, BoardStatusListener& listener) {
+ReferenceCounter<BoardManager> managerOf(int boards) {
     StillScheduler::instance();
     kvlsim::setLineClock([] { return std::chrono::nanoseconds(std::chrono::seconds(s_seconds)); });
     kvlsim::loadChassis(chassis(boards));
     ReferenceCounter<BoardManager> manager(new BoardManager);
     auto* const factory = new Z7SimBoardFactory;
     factory->SetPingInterval(0);
-    manager->AddBoardStatusListener(&listener);
     manager->Attach(ReferenceCounter<BoardFactory>(factory));
     return manager;
 }
@@ -73,20 +72,19 @@ void command(nlohmann::json const& command) {
 
 BoardRefresh::BoardRefresh(int boards)
     : m_boards(boards),
-      m_manager(managerOf(boards, *this)),
+      m_manager(managerOf(boards)),
       m_source(*m_manager.get(), &m_turns),
       m_indices(1000),
       m_interfaces(*m_manager.get(), m_indices, kvloamd::Clock::now(), &m_turns),
       m_resources(*m_manager.get(), &m_turns),
       m_entityIndices(1),
       m_entities(m_entityIndices, m_settings, kvloamd::Clock::now(),
-                 [] { return std::time(nullptr); }) {}
+                 [] { return std::time(nullptr); }) {
+    m_manager->AddBoardStatusListener(this);
+}
 
 int BoardRefresh::ProcessBoardStatusEvent(ReferenceCounter<BoardStatusEvent> event) {
-    // While boards appear, nothing is noted: they are new anyway.
-    BoardManager* const manager = m_manager.get();
-    if (manager == nullptr) return 0;
-    m_turns.note(static_cast<std::uint32_t>(manager->GetIndexByBoard(event->GetBoard())));
+    m_turns.note(static_cast<std::uint32_t>(m_manager->GetIndexByBoard(event->GetBoard())));
     return 0;
 }
 
