@@ -2,6 +2,7 @@
 // A board that never answers delays no request, and the stop only for a limited time.
 #include <csignal>
 #include <filesystem>
+#include <fstream>
 
 #include <gmock/gmock.h>
 
@@ -14,9 +15,10 @@ using ::testing::HasSubstr;
 
 class SlowBoardTest : public AgentFixture {
   protected:
-    /// Starts an agent whose board answers once, and waits until it hangs.
+    /// Starts an agent, lets its board hang, and waits until it does.
     void startWithHangingBoard() {
         auto variables = environment();
+        variables["SLOW_BOARD_ORDER"] = path("order");
         variables["SLOW_BOARD_MARK"] = path("mark");
         m_place = "127.0.0.1:" + std::to_string(freePort());
         m_agent = std::make_unique<Process>(
@@ -25,6 +27,7 @@ class SlowBoardTest : public AgentFixture {
                                      path("snmp.conf"), "--persistent-dir", path("persistent")},
             variables);
         ASSERT_TRUE(m_agent->waitFor("serving 1 board ")) << m_agent->output();
+        std::ofstream(path("order")) << "hang\n";
         // Requests make the agent refresh its snapshot.
         ASSERT_TRUE(eventually([this] {
             askForName();

@@ -1,9 +1,10 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// A board module whose one board answers once and then hangs, like a platform that hangs. It then
-// creates the file that the environment variable SLOW_BOARD_MARK names.
+// A board module whose one board hangs, like a platform that hangs, as soon as the file exists that
+// the environment variable SLOW_BOARD_ORDER names. It then creates the file of SLOW_BOARD_MARK.
 #include <unistd.h>
 
 #include <cstdlib>
+#include <filesystem>
 #include <fstream>
 
 #include "board/BoardModule.h"
@@ -16,9 +17,9 @@ class SlowFactory final : public BoardFactory {
     int Initialize(ReferenceCounter<BoardTable> table) override {
         auto* const board = new FakeBoard;
         ReferenceCounter<Board> const handle(board);
-        board->whenAsked = [asked = false]() mutable {
-            if (asked) hang();
-            asked = true;
+        board->whenAsked = [] {
+            char const* const order = std::getenv("SLOW_BOARD_ORDER");
+            if (order != nullptr && std::filesystem::exists(order)) hang();
         };
         enter_at_next_index(*table.get(), handle);
         return 0;
