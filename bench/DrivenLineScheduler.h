@@ -15,5 +15,6 @@ class DrivenLineScheduler final : public LineScheduler {
         s_instance = scheduler;
         return *scheduler;
     }
+    using LineScheduler::pass;
     void passOfNextSecond() { pass(time() + 1); }
 };

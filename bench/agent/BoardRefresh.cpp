@@ -8,7 +8,7 @@
 #include <stdexcept>
 #include <string>
 
-#include "LineScheduler.h"
+#include "DrivenLineScheduler.h"
 #include "Z7SimBoardFactory.h"
 #include "agent/readers/Whereabouts.h"
 #include "simulator/exports/Control.h"
@@ -37,23 +37,8 @@ std::string chassis(int boards) {
 /// The seconds of the lines.
 std::atomic<long> s_seconds{100'000};
 
-/// The lines' scheduler without a thread.
-class StillScheduler final : public LineScheduler {
-  public:
-    static StillScheduler& instance() {
-        static auto* const scheduler = new StillScheduler;
-        s_instance = scheduler;
-        return *scheduler;
-    }
-    using LineScheduler::pass;
-
-  private:
-    StillScheduler() = default;
-    ~StillScheduler() override = default;
-};
-
 ReferenceCounter<BoardManager> managerOf(int boards) {
-    StillScheduler::instance();
+    DrivenLineScheduler::install();
     kvlsim::setLineClock([] { return std::chrono::nanoseconds(std::chrono::seconds(s_seconds)); });
     kvlsim::loadChassis(chassis(boards));
     ReferenceCounter<BoardManager> manager(new BoardManager);
@@ -94,7 +79,7 @@ void BoardRefresh::let(Happened happened) {
         break;
     case Happened::Counting:
         ++s_seconds;
-        StillScheduler::instance().pass(s_seconds);
+        DrivenLineScheduler::install().pass(s_seconds);
         break;
     case Happened::StatusOf1:
         command({{"command", m_changes % 2 == 0 ? "stop" : "start"},

@@ -1,7 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // The identifier lists of objects whose classes have identifiers.
-#include <cstdlib>
-#include <fstream>
 #include <memory>
 #include <set>
 #include <string>
@@ -12,6 +10,7 @@
 
 #include "board/Interface.h"
 #include "core/RecyclingPool.h"
+#include "tests/support/AnonymousMemory.h"
 #include "tests/support/BareInterface.h"
 
 namespace {
@@ -35,16 +34,6 @@ bool isAsMade(Object const& object) {
     return list->is_element(KVL::IID("6Object")) && list->is_element(KVL::Interface::iid()) &&
            !list->is_element(KVL::IID()) && !list->is_element(KVL::IID("7Feature"));
 }
-
-#ifndef KVLOAM_NO_POOL
-long anonymousMemory() {
-    std::ifstream rollup("/proc/self/smaps_rollup");
-    for (std::string line; std::getline(rollup, line);)
-        if (line.starts_with("Anonymous:")) return 1024 * std::atol(line.c_str() + 10);
-    ADD_FAILURE() << "the system does not tell a process's memory";
-    return 0;
-}
-#endif
 
 TEST(ListKindsTest, EveryObjectHasAListOfItsOwn) {
     Interfaces const all = interfaces(kMany);

@@ -5,7 +5,6 @@
 
 #include <cstdlib>
 #include <filesystem>
-#include <fstream>
 #include <memory>
 #include <set>
 #include <string>
@@ -16,6 +15,7 @@
 
 #include "core/RecyclingPool.h"
 #include "core/ReferenceCounter.h"
+#include "tests/support/AnonymousMemory.h"
 
 namespace {
 
@@ -39,15 +39,6 @@ bool isPristine(Object const& object) {
 }
 
 #ifndef KVLOAM_NO_POOL
-/// The process's memory that is not shared with a file, in bytes.
-long anonymousMemory() {
-    std::ifstream rollup("/proc/self/smaps_rollup");
-    for (std::string line; std::getline(rollup, line);)
-        if (line.starts_with("Anonymous:")) return 1024 * std::atol(line.c_str() + 10);
-    ADD_FAILURE() << "the system does not tell a process's memory";
-    return 0;
-}
-
 /// The descriptor of the file of which lists are copies; -1: there is none.
 int listFile() {
     for (auto const& entry : std::filesystem::directory_iterator("/proc/self/fd")) {

@@ -1,10 +1,9 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // What a board costs the agent in memory does not grow unnoticed.
-#include <cstdlib>
-#include <fstream>
 #include <string>
 
 #include "tests/e2e/AgentFixture.h"
+#include "tests/support/AnonymousMemory.h"
 
 namespace kvloamd::e2e {
 namespace {
@@ -24,10 +23,7 @@ class MemoryTest : public AgentFixture {
         EXPECT_EQ(chassis.status, 0) << chassis.output;
         useChassis(chassis.output);
         startAgent();
-        std::ifstream rollup("/proc/" + std::to_string(agent().pid()) + "/smaps_rollup");
-        long memory = 0;
-        for (std::string line; std::getline(rollup, line);)
-            if (line.starts_with("Anonymous:")) memory = std::atol(line.c_str() + 10);
+        long const memory = anonymousMemory(std::to_string(agent().pid())) / 1024;
         EXPECT_GT(memory, 0);
         EXPECT_EQ(stopAgent(), 0);
         return memory;

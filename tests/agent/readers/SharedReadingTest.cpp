@@ -16,7 +16,6 @@
 #include <gtest/gtest.h>
 
 #include "LineClocks.h"
-#include "LineScheduler.h"
 #include "agent/readers/BoardSource.h"
 #include "agent/readers/BoardTurns.h"
 #include "agent/readers/EntityReader.h"
@@ -30,6 +29,7 @@
 #include "tests/modules/z7sim/OpenFactory.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/SimulatedPlatform.h"
+#include "tests/support/StillLineScheduler.h"
 
 namespace kvloamd {
 namespace {
@@ -48,21 +48,6 @@ constexpr int kChangesOfAReading = 10;
 std::atomic<long> s_seconds{3600};
 /// By how much the system's clock has been set.
 std::atomic<long> s_step{0};
-
-/// The lines' scheduler, whose passes the test makes.
-class StillScheduler final : public LineScheduler {
-  public:
-    static StillScheduler& install() {
-        static auto* const scheduler = new StillScheduler;
-        s_instance = scheduler;
-        return *scheduler;
-    }
-    using LineScheduler::pass;
-
-  private:
-    StillScheduler() = default;
-    ~StillScheduler() override = default;
-};
 
 /// Tells the source and the turns what the agent's listener tells them.
 class Listener final : public BoardStatusListener {
@@ -233,7 +218,7 @@ constexpr std::array kLines{11, 12, 21, 41};
 /// Changes the platform at random. What cannot be done now is refused, and changes nothing.
 class Platform {
   public:
-    Platform(unsigned seed, OpenFactory& factory, StillScheduler& scheduler)
+    Platform(unsigned seed, OpenFactory& factory, StillLineScheduler& scheduler)
         : m_random(seed), m_factory(factory), m_scheduler(scheduler) {}
 
     static void load() {
@@ -416,12 +401,12 @@ class Platform {
 
     std::mt19937 m_random;
     OpenFactory& m_factory;
-    StillScheduler& m_scheduler;
+    StillLineScheduler& m_scheduler;
 };
 
 TEST(SharedReadingTest, SharingShowsWhatReadingEverythingShows) {
     LogCapture const quiet;
-    StillScheduler& scheduler = StillScheduler::install();
+    StillLineScheduler& scheduler = StillLineScheduler::install();
     long const epoch = std::time(nullptr) - s_seconds;
     static long s_epoch;
     s_epoch = epoch;

@@ -12,29 +12,14 @@
 #include <gtest/gtest.h>
 
 #include "LineClocks.h"
-#include "LineScheduler.h"
 #include "Z7SimIntervalTable.h"
 #include "board/DS1LineDevice.h"
 #include "core/ReferenceCounter.h"
+#include "tests/support/StillLineScheduler.h"
 
 namespace {
 
 constexpr long kDay = 86'400;
-
-/// The lines' scheduler, whose passes the test makes.
-class DrivenLineScheduler final : public LineScheduler {
-  public:
-    static DrivenLineScheduler& install() {
-        static auto* const scheduler = new DrivenLineScheduler;
-        s_instance = scheduler;
-        return *scheduler;
-    }
-    using LineScheduler::pass;
-
-  private:
-    DrivenLineScheduler() = default;
-    ~DrivenLineScheduler() override = default;
-};
 
 /// The process's scheduler on a system's clock that the test sets. It calls everybody once for each
 /// second that the clock shows, as the real one does.
@@ -262,7 +247,7 @@ class World {
 
     std::minstd_rand m_random;
     SystemScheduler& m_system = SystemScheduler::install();
-    DrivenLineScheduler& m_lines = DrivenLineScheduler::install();
+    StillLineScheduler& m_lines = StillLineScheduler::install();
     std::shared_ptr<ScriptedLine> m_line = std::make_shared<ScriptedLine>();
     std::shared_ptr<LineState> m_state = std::make_shared<LineState>();
     ReferenceCounter<DS1IntervalTable> m_table;

@@ -8,13 +8,13 @@
 
 #include <gtest/gtest.h>
 
-#include "LineScheduler.h"
 #include "LineStatusDelivery.h"
 #include "Z7SimLineFeature.h"
 #include "board/BoardManager.h"
 #include "board/DS1IntervalValidity.h"
 #include "tests/modules/z7sim/OpenFactory.h"
 #include "tests/support/SimulatedPlatform.h"
+#include "tests/support/StillLineScheduler.h"
 
 /// The clock of the platform's lines.
 class LineClock {
@@ -31,23 +31,6 @@ class LineClock {
 
   private:
     static inline std::atomic<std::chrono::nanoseconds> s_now{};
-};
-
-/// The lines' scheduler without a thread: lines tick only when the test makes them. Made before any
-/// line.
-class StillScheduler final : public LineScheduler {
-  public:
-    static StillScheduler& install() {
-        static auto* const scheduler = new StillScheduler;
-        s_instance = scheduler;
-        return *scheduler;
-    }
-
-    using LineScheduler::pass;
-
-  private:
-    StillScheduler() = default;
-    ~StillScheduler() override = default;
 };
 
 /// Board 5 with line 51, as the reference factory makes it.
@@ -126,7 +109,7 @@ class LineTest : public testing::Test {
                                   "}, line: {" + line + "}}]")});
     }
 
-    StillScheduler& m_scheduler = StillScheduler::install();
+    StillLineScheduler& m_scheduler = StillLineScheduler::install();
     LineClock m_clock;
     ReferenceCounter<BoardManager> m_manager{new BoardManager};
     OpenFactory* m_factory = new OpenFactory;

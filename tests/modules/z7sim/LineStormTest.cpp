@@ -91,7 +91,7 @@ class LineListener final : public DS1LineStatusListener {
 
 TEST(LineStormTest, ReadersSeeNothingImpossibleAndNothingIsLeftOver) {
     LineClock const clock;
-    StillScheduler& scheduler = StillScheduler::install();
+    StillLineScheduler& scheduler = StillLineScheduler::install();
     int const before = ReferenceTable::get_instance()->referenced_objects();
     std::atomic<int> impossible{0};
     LineListener listener;

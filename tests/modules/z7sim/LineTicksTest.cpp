@@ -106,7 +106,7 @@ class LineTicksTest : public testing::Test {
         EXPECT_TRUE(isValid(device));
     }
 
-    StillScheduler& m_scheduler = StillScheduler::install();
+    StillLineScheduler& m_scheduler = StillLineScheduler::install();
     ScriptedBoard m_platform;
     std::map<long, ReferenceCounter<Z7SimIntervalTable>> m_tables;
     std::unique_ptr<LineTicks> m_ticks =

@@ -71,18 +71,18 @@ class LineAttributesTest : public testing::Test {
         return number;
     }
 
-    static std::vector<DS1LineCounters> past(long handle) {
-        std::string const bytes = read(handle, kDS1LinePast);
-        std::vector<DS1LineCounters> records(bytes.size() / sizeof(DS1LineCounters));
-        std::memcpy(records.data(), bytes.data(), records.size() * sizeof(DS1LineCounters));
-        return records;
-    }
-
-    static std::vector<DS1BoardLine> lines(long board, std::size_t capacity = 65536) {
-        std::string const bytes = read(board, kDS1BoardCounters, capacity);
-        std::vector<DS1BoardLine> all(bytes.size() / sizeof(DS1BoardLine));
-        std::memcpy(all.data(), bytes.data(), all.size() * sizeof(DS1BoardLine));
+    /// The records that `bytes` consists of, of which there may be none.
+    template <class Record>
+    static std::vector<Record> records(std::string const& bytes) {
+        std::vector<Record> all(bytes.size() / sizeof(Record));
+        if (!all.empty()) std::memcpy(all.data(), bytes.data(), all.size() * sizeof(Record));
         return all;
+    }
+    static std::vector<DS1LineCounters> past(long handle) {
+        return records<DS1LineCounters>(read(handle, kDS1LinePast));
+    }
+    static std::vector<DS1BoardLine> lines(long board, std::size_t capacity = 65536) {
+        return records<DS1BoardLine>(read(board, kDS1BoardCounters, capacity));
     }
     /// What the board answers for its lines is what each of them answers.
     static void expectTheSameAlone(std::vector<DS1BoardLine> const& lines) {
