@@ -121,7 +121,7 @@ IIDList* HandleLists::refill() {
         return cache.lists[--cache.count];
     }
     // The thread is ending: what it does not need goes back at once.
-    IIDList* lists[kBatch];
+    IIDList* lists[kBatch] = {};
     std::int32_t const count = stock().take(lists);
     if (count > 1) stock().give(lists + 1, count - 1);
     return lists[0];

@@ -30,7 +30,7 @@ class SystemScheduler final : public ActionScheduler_pthread {
         s_actionScheduler = scheduler;
         return *scheduler;
     }
-    void run() {
+    void catchUp() {
         for (int passes = 0; passes < 2 * kDay && s_system >= m_nextWakeUp; ++passes)
             run_pass(s_system);
     }
@@ -199,7 +199,7 @@ class World {
         m_line->pass(seconds);
         int const before = m_state->status();
         m_lines.pass(s_monotonic);
-        m_system.run();
+        m_system.catchUp();
         m_model.pass(seconds, m_line->answers, restarted);
         if (m_state->status() != before) {
             m_changedAt = s_monotonic;
