@@ -194,8 +194,8 @@ TEST_F(LineAttributesTest, PastHasOneRecordMoreThanSeconds) {
 }
 
 TEST_F(LineAttributesTest, PastThatDoesNotFitIsNotRead) {
-    EXPECT_EQ(read(11, kDS1LinePast, 41 * 36 - 1), "status 2");
-    EXPECT_EQ(read(11, kDS1LinePast, 41 * 36).size(), 41U * 36);
+    EXPECT_EQ(read(11, kDS1LinePast, 41UL * 36 - 1), "status 2");
+    EXPECT_EQ(read(11, kDS1LinePast, 41UL * 36).size(), 41U * 36);
 }
 
 TEST_F(LineAttributesTest, LiveCountersContinueThePast) {
