@@ -255,12 +255,12 @@ EntityReader::Part EntityReader::boardPart(Origin const& origin) {
         keys.push_back(port->key);
     std::vector<std::uint32_t> const indices = m_indices.indicesOf(origin.key, keys);
     auto index = indices.begin();
-    std::uint32_t const entity = *index++;
+    std::uint32_t const boardEntity = *index++;
     Part part;
-    if (entity == 0) return part;
+    if (boardEntity == 0) return part;
 
     PhysicalRow row;
-    row.entity = entity;
+    row.entity = boardEntity;
     row.containedIn = origin.container;
     row.physicalClass = PhysicalClass::Module;
     // A slot holds one board; where several claim it, their positions are not known.
@@ -275,12 +275,13 @@ EntityReader::Part EntityReader::boardPart(Origin const& origin) {
     add(part, std::move(row));
 
     for (ProcessorRow const& processor : origin.processors)
-        add(part, processorEntity(processor, *index++, entity));
+        add(part, processorEntity(processor, *index++, boardEntity));
     for (std::size_t i = 0; i < origin.ports.size(); ++i) {
         PortRow const& port = *origin.ports[i];
-        std::uint32_t const own = *index++;
-        if (own != 0) part.aliases.push_back(aliasOf(own, port.ifIndex));
-        add(part, portEntity(port, origin.interfaces[i], own, entity, static_cast<int>(i) + 1));
+        std::uint32_t const entity = *index++;
+        if (entity != 0) part.aliases.push_back(aliasOf(entity, port.ifIndex));
+        add(part,
+            portEntity(port, origin.interfaces[i], entity, boardEntity, static_cast<int>(i) + 1));
     }
     sort(part);
     return part;
