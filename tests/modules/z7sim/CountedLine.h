@@ -5,6 +5,7 @@
 #include <cstddef>
 #include <cstdint>
 
+#include <algorithm>
 #include <array>
 #include <ostream>
 #include <vector>
@@ -42,9 +43,8 @@ inline void PrintTo(LineFormat format, std::ostream* out) {
 }
 
 inline bool hasNegativeCount(LineCounts const& counts) {
-    for (auto const& field : kLineCountsFields)
-        if (counts.*field.count < 0) return true;
-    return false;
+    return std::ranges::any_of(
+        kLineCountsFields, [&](LineCountsField const& field) { return counts.*field.count < 0; });
 }
 
 /// A `CountedLine` is a line whose intervals the test can look at. A change that makes a count
