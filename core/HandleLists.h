@@ -21,10 +21,10 @@ class RootedIIDList : public IIDList {
 class HandleList final : public RootedIIDList {};
 
 /// `HandleLists` hands out the lists of objects that hardly ever get an identifier, and takes them
-/// back. Every list is a block of its own with room for all identifiers. But nobody adds one to the
-/// list of a handle, and of handles there are many. So the lists are private mappings of one file
-/// in memory, which contains such lists: they need memory of their own only when they are changed.
-/// Handing a list out or taking it back does not even read it.
+/// back. Every list is a block of its own with room for all identifiers. There are many handles,
+/// and programs do not add identifiers to their lists. The lists are therefore private mappings of
+/// one file in memory, and need memory of their own only when they are changed. As long as no list
+/// was changed, neither `take` nor `give` accesses the memory of a list.
 ///
 /// Each thread has a cache, which exchanges batches with a central stock. A list that was made is
 /// never unmapped. Where the system refuses mappings, lists come from the heap. Sanitizer builds

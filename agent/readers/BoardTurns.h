@@ -32,7 +32,7 @@ class BoardTurns {
     void begin(std::span<int const> present, Clock::time_point now);
     /// Whether this refresh reads the board in full.
     bool isDue(std::uint32_t index) const { return m_due.contains(index); }
-    /// A short check has found that the board has changed: those who read it after this read it in
+    /// A short check has found that the board has changed: from now on, this refresh reads it in
     /// full.
     void add(std::uint32_t index) { m_due.insert(index); }
 

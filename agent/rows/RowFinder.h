@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// Finds one row after the other.
+// Finds rows by their index.
 #pragma once
 
 #include <algorithm>
@@ -10,8 +10,8 @@
 namespace kvloamd {
 
 /// A `RowFinder` finds rows by the first number of their index, by which they are ascending. It
-/// refers to them. Fast for those who ask for most rows in their order: then the row is the one
-/// after the last that was found. Unsynchronised.
+/// keeps a reference to them. Finding the row after the one that was found last takes constant
+/// time, any other search logarithmic time. Unsynchronised.
 template <class All>
 class RowFinder {
     using Row = typename All::value_type;

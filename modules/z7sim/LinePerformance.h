@@ -127,8 +127,8 @@ class LinePerformance {
         std::int32_t seconds = 0;
         std::int32_t errors = 0;
     };
-    /// A second that may still be corrected. Every line has two dozen of them, so they are small:
-    /// what a second counts is 0 or 1, but for the violations.
+    /// A second that may still be corrected. Every line stores two dozen of them, so they are
+    /// packed: violations are numbers; each other count of a second is 0 or 1 and needs one bit.
     class Recent {
       public:
         Recent() = default;

@@ -80,7 +80,7 @@ function renderFreshness() {
     document.body.classList.toggle("away", isAway);
     setHidden(byId("notice"), !isAway);
     setText(byId("notice"), isAway ? awayText(silence) : "");
-    if (isAway !== wasAway) setText(byId("news"), isAway ? "" : "The agent can be reached again.");
+    if (isAway !== wasAway) setText(byId("announcement"), isAway ? "" : "The agent can be reached again.");
     wasAway = isAway;
 }
 

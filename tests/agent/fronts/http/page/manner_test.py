@@ -133,7 +133,8 @@ class AwayTest(PageCase):
         self.tab.wait_for_text("#chassis", "stopped")
         self.tab.wait_for_text("#connection", "live")
         self.assertEqual(self.tab.text("#notice"), "")
-        self.assertIn("can be reached again", self.tab.run("document.querySelector('#news').textContent"))
+        announced = self.tab.run("document.getElementById('announcement').textContent")
+        self.assertIn("can be reached again", announced)
 
     def test_agent_that_refuses_is_quoted(self):
         self.agent.broken = 503
