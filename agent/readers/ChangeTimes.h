@@ -5,6 +5,7 @@
 #include <cstdint>
 #include <mutex>
 #include <unordered_map>
+#include <utility>
 
 #include "agent/rows/Uptime.h"
 
@@ -15,7 +16,8 @@ namespace kvloamd {
 /// clock says when. Thread-safe.
 class ChangeTimes {
   public:
-    explicit ChangeTimes(Clock::time_point started) : m_uptime(started) {}
+    explicit ChangeTimes(Clock::time_point started, Clocks clocks = {})
+        : m_uptime(started, std::move(clocks)) {}
 
     Uptime const& uptime() const { return m_uptime; }
 

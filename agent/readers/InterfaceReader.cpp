@@ -91,19 +91,19 @@ class Joining {
 } // namespace
 
 InterfaceReader::InterfaceReader(BoardManager& manager, StableIndices& indices,
-                                 Clock::time_point started, BoardTurns* turns, Now now)
+                                 Clock::time_point started, BoardTurns* turns, Clocks clocks)
     : m_manager(manager),
       m_indices(indices),
       m_turns(turns),
-      m_now(std::move(now)),
-      m_uptime(started),
+      m_clocks(std::move(clocks)),
+      m_uptime(started, m_clocks),
       m_toTicks([this](long seconds) { return m_uptime.of(seconds); }),
-      m_changeTimes(started) {}
+      m_changeTimes(started, m_clocks) {}
 
 InterfaceRows InterfaceReader::read(Rows<BoardRow> const& boards) {
     ++m_reading;
     m_changes = {};
-    m_histories.begin(m_now());
+    m_histories.begin(m_clocks.now());
     std::vector<BoardKey> const& keys = m_keys.of(boards);
     if (m_keys.areAsBefore()) m_indices.presentAgain();
     auto const dropGone = [this](KnownBoard& known) { drop(known); };
@@ -184,7 +184,7 @@ void InterfaceReader::drop(KnownBoard& known) {
 
 void InterfaceReader::place(KnownBoard& known, BoardInterfaces&& found,
                             std::vector<std::uint32_t> const& indices, BoardRow const& row) {
-    Clock::time_point const now = m_now();
+    Clock::time_point const now = m_clocks.now();
     BoardInterfaceRows& rows = found.rows;
     known.isShareable = found.hasOnlyLines && std::ranges::find(indices, 0U) == indices.end() &&
                         std::ranges::none_of(rows.interfaces, countsTraffic);
@@ -238,7 +238,7 @@ void InterfaceReader::place(KnownBoard& known, BoardInterfaces&& found,
 void InterfaceReader::placeLines(KnownBoard& known, BoardInterfaces& found,
                                  std::vector<std::uint32_t> const& indices,
                                  std::uint32_t boardIndex) {
-    Clock::time_point const now = m_now();
+    Clock::time_point const now = m_clocks.now();
     std::vector<std::pair<std::uint32_t, std::size_t>> order; // ifIndex and place
     for (std::size_t i = 0; i < found.lines.size(); ++i)
         if (auto const index = indices[found.rows.lines[i].ifIndex - 1]; index != 0)
@@ -416,8 +416,8 @@ void InterfaceReader::noteChanges() {
     indices.reserve(m_all.interfaces.size());
     for (InterfaceRow const& row : m_all.interfaces)
         indices.push_back(row.ifIndex);
-    if (m_read && indices != m_formerIndices) m_all.lastChange = m_uptime.at(m_now());
-    if (m_read && m_all.stack != m_formerStack) m_all.stackLastChange = m_uptime.at(m_now());
+    if (m_read && indices != m_formerIndices) m_all.lastChange = m_uptime.at(m_clocks.now());
+    if (m_read && m_all.stack != m_formerStack) m_all.stackLastChange = m_uptime.at(m_clocks.now());
     m_formerIndices = std::move(indices);
     m_formerStack = m_all.stack;
 }

@@ -39,14 +39,11 @@ namespace kvloamd {
 /// discontinuity.
 class InterfaceReader {
   public:
-    using Now = std::function<Clock::time_point()>;
-
     /// `manager`, `indices` and `turns` outlive the reader. `started`: the agent's start. The
     /// reader adds the boards that it finds changed to `turns`; without turns it reads all boards
-    /// in full. `now`: the time of readings.
-    InterfaceReader(
-        BoardManager& manager, StableIndices& indices, Clock::time_point started,
-        BoardTurns* turns = nullptr, Now now = [] { return Clock::now(); });
+    /// in full.
+    InterfaceReader(BoardManager& manager, StableIndices& indices, Clock::time_point started,
+                    BoardTurns* turns = nullptr, Clocks clocks = {});
     InterfaceReader(InterfaceReader const&) = delete;
     InterfaceReader& operator=(InterfaceReader const&) = delete;
 
@@ -116,7 +113,7 @@ class InterfaceReader {
     BoardManager& m_manager;
     StableIndices& m_indices;
     BoardTurns* m_turns;
-    Now const m_now;
+    Clocks const m_clocks;
     Uptime const m_uptime;
     ToTicks const m_toTicks;
     ChangeTimes m_changeTimes;

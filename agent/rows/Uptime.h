@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <chrono>
+#include <utility>
 
 #include "agent/rows/Clock.h"
 
@@ -21,9 +22,10 @@ inline std::uint32_t timeTicks(Clock::duration time) {
 /// An `Uptime` converts times to hundredths of a second since the agent's start. Immutable.
 class Uptime {
   public:
-    explicit Uptime(Clock::time_point started) : m_started(started), m_startDate(startDate()) {}
+    explicit Uptime(Clock::time_point started, Clocks clocks = {})
+        : m_started(started), m_clocks(std::move(clocks)), m_startDate(startDate()) {}
 
-    std::uint32_t now() const { return at(Clock::now()); }
+    std::uint32_t now() const { return at(m_clocks.now()); }
     /// 0 for a time before the agent's start.
     std::uint32_t at(Clock::time_point when) const {
         return when <= m_started ? 0 : timeTicks(when - m_started);
@@ -33,7 +35,7 @@ class Uptime {
     std::uint32_t of(long seconds) const {
         std::chrono::seconds const date(std::clamp<std::int64_t>(seconds, 0, kLastDate));
         Clock::duration const since = date - (m_startDate + clockSteps());
-        Clock::duration const uptime = Clock::now() - m_started;
+        Clock::duration const uptime = m_clocks.now() - m_started;
         return since <= Clock::duration::zero() ? 0 : timeTicks(std::min(since, uptime));
     }
 
@@ -47,11 +49,12 @@ class Uptime {
     }
     /// The agent's start, since the epoch, as the system's clock counts now.
     std::chrono::milliseconds startDate() const {
-        return std::chrono::duration_cast<std::chrono::milliseconds>(
-            std::chrono::system_clock::now().time_since_epoch() - (Clock::now() - m_started));
+        return m_clocks.date() -
+               std::chrono::duration_cast<std::chrono::milliseconds>(m_clocks.now() - m_started);
     }
 
     Clock::time_point m_started;
+    Clocks m_clocks;
     std::chrono::milliseconds m_startDate; ///< since the epoch
 };
 

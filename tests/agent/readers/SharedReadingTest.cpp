@@ -5,7 +5,6 @@
 #include <atomic>
 #include <chrono>
 #include <cstdint>
-#include <ctime>
 #include <functional>
 #include <memory>
 #include <optional>
@@ -44,10 +43,21 @@ constexpr int kSteps = 100'000;
 /// A reading after every change would take minutes.
 constexpr int kChangesOfAReading = 10;
 
-/// The seconds of the lines, of the readers and, apart from its steps, of the system.
-std::atomic<long> s_seconds{3600};
-/// By how much the system's clock has been set.
-std::atomic<long> s_step{0};
+constexpr long kStarted = 3600;
+/// The seconds of the lines and of the readers.
+std::atomic<long> s_seconds{kStarted};
+/// The date at which these seconds begin. A step of the system's clock changes it.
+std::atomic<long> s_epoch{1'763'800'000};
+
+long dateOfLines() {
+    return s_epoch + s_seconds;
+}
+
+/// The clocks of the readers. They stand still between two readings, however slow the machine is.
+Clocks readersClocks() {
+    return {[] { return Clock::time_point(std::chrono::seconds(s_seconds)); },
+            [] { return std::chrono::milliseconds(std::chrono::seconds(dateOfLines())); }};
+}
 
 /// Tells the source and the turns what the agent's listener tells them.
 class Listener final : public BoardStatusListener {
@@ -66,8 +76,7 @@ class Reading {
     /// `turns`: null reads everything every time.
     Reading(BoardManager& manager, Clock::time_point started, BoardTurns* turns)
         : m_source(manager, turns),
-          m_interfaces(manager, m_indices, started, turns,
-                       [started] { return started + std::chrono::seconds(s_seconds); }),
+          m_interfaces(manager, m_indices, started, turns, readersClocks()),
           m_resources(manager, turns),
           m_entities(m_entityIndices, m_settings, started, [] { return 1'000'000'000L; }) {}
 
@@ -98,24 +107,6 @@ class Reading {
     EntityReader m_entities;
 };
 
-/// Dates become times since the start by the system's clock, which two readings do not ask at the
-/// same time: hundredths of a second.
-constexpr std::uint32_t kSlack = 50;
-
-void equalIfNear(std::uint32_t& one, std::uint32_t other) {
-    if ((one > other ? one - other : other - one) <= kSlack) one = other;
-}
-
-void equalIfNear(std::optional<std::uint32_t>& one, std::optional<std::uint32_t> const& other) {
-    if (one && other) equalIfNear(*one, *other);
-}
-
-bool isSame(InterfaceRow one, InterfaceRow const& other) {
-    equalIfNear(one.lastChange, other.lastChange);
-    equalIfNear(one.discontinuity, other.discontinuity);
-    return one == other;
-}
-
 std::vector<LineCounts> countsOf(ClosedIntervals const& closed) {
     std::vector<LineCounts> all;
     for (std::size_t i = 0; i < closed.counts.size(); ++i)
@@ -124,19 +115,12 @@ std::vector<LineCounts> countsOf(ClosedIntervals const& closed) {
 }
 
 bool isSame(LineRow one, LineRow const& other) {
-    equalIfNear(one.statusLastChange, other.statusLastChange);
     if (one.closed != nullptr && other.closed != nullptr) {
         ClosedIntervals const& a = *one.closed;
         ClosedIntervals const& b = *other.closed;
         if (countsOf(a) == countsOf(b) && a.valid == b.valid && a.total == b.total)
             one.closed = other.closed;
     }
-    return one == other;
-}
-
-bool isSame(BearerRow one, BearerRow const& other) {
-    equalIfNear(one.call.setupTime, other.call.setupTime);
-    equalIfNear(one.call.connectTime, other.call.connectTime);
     return one == other;
 }
 
@@ -383,7 +367,7 @@ class Platform {
     std::string pass() {
         switch (number(0, 9)) {
         case 0:
-            s_step = s_step + number(-5000, 5000);
+            s_epoch = s_epoch + number(-5000, 5000);
             return "a clock step";
         case 1:
             m_factory.ping_boards();
@@ -407,11 +391,7 @@ class Platform {
 TEST(SharedReadingTest, SharingShowsWhatReadingEverythingShows) {
     LogCapture const quiet;
     StillLineScheduler& scheduler = StillLineScheduler::install();
-    long const epoch = std::time(nullptr) - s_seconds;
-    static long s_epoch;
-    s_epoch = epoch;
-    LineClocks::inUse() = {[] { return s_epoch + s_seconds + s_step; },
-                           [] { return s_seconds.load(); }};
+    LineClocks::inUse() = {dateOfLines, [] { return s_seconds.load(); }};
     kvlsim::setLineClock([] { return std::chrono::nanoseconds(std::chrono::seconds(s_seconds)); });
     Platform::load();
     auto* const factory = new OpenFactory;
@@ -420,7 +400,7 @@ TEST(SharedReadingTest, SharingShowsWhatReadingEverythingShows) {
     auto* const manager = new BoardManager; // as in the agent, never destroyed
     static ReferenceCounter<BoardManager> const managerHandle(manager);
 
-    Clock::time_point const started = Clock::now() - std::chrono::hours(1);
+    Clock::time_point const started{std::chrono::seconds(kStarted)};
     static BoardTurns turns;
     static auto* const shared = new Reading(*manager, started, &turns);
     static auto* const full = new Reading(*manager, started, nullptr);
