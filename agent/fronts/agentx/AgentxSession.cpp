@@ -55,13 +55,15 @@ void writeRegion(AgentxWriter& packet, OidView name, std::optional<std::uint32_t
 } // namespace
 
 AgentxSession::AgentxSession(AgentxAddress address, std::vector<AgentxRoot> roots, SharedRows& rows,
-                             Answer answer, AgentxPace pace, std::vector<Capability> capabilities)
+                             Answer answer, AgentxPace pace, std::vector<Capability> capabilities,
+                             Now now)
     : m_address(std::move(address)),
       m_roots(std::move(roots)),
       m_rows(rows),
       m_answer(std::move(answer)),
       m_pace(pace),
       m_capabilities(std::move(capabilities)),
+      m_now(std::move(now)),
       m_pause(pace.retry) {
     connectNow();
 }
@@ -114,7 +116,7 @@ bool AgentxSession::isOverdue(Awaited const& awaited, Clock::time_point now) con
 }
 
 void AgentxSession::expireRequests() {
-    auto const now = Clock::now();
+    auto const now = m_now();
     for (auto at = m_awaited.begin(); at != m_awaited.end();) {
         if (!isOverdue(*at, now)) {
             ++at;
@@ -135,7 +137,7 @@ void AgentxSession::expireRequests() {
 
 void AgentxSession::checkTime() {
     expireRequests();
-    auto const now = Clock::now();
+    auto const now = m_now();
     if (now < deadline()) return;
     if (m_stage == Stage::Away) {
         connectNow();
@@ -152,7 +154,7 @@ void AgentxSession::connectNow() {
     m_socket = socket(m_address.socket.ss_family, SOCK_STREAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0);
     if (m_socket < 0) return drop(std::strerror(errno));
     m_stage = Stage::Connecting;
-    m_heard = Clock::now();
+    m_heard = m_now();
     if (connect(m_socket, reinterpret_cast<sockaddr const*>(&m_address.socket), m_address.size) ==
         0)
         connected();
@@ -243,8 +245,8 @@ void AgentxSession::send(Notification const& notification, Delivered delivered) 
 }
 
 AgentxWriter AgentxSession::request(AgentxKind kind) {
-    if (m_awaited.empty()) m_heard = Clock::now();
-    m_awaited.push_back({++m_lastPacket, kind, 0, Clock::now()});
+    if (m_awaited.empty()) m_heard = m_now();
+    m_awaited.push_back({++m_lastPacket, kind, 0, m_now()});
     return {kind, m_session, 0, m_lastPacket};
 }
 
@@ -292,7 +294,7 @@ void AgentxSession::receive() {
 }
 
 void AgentxSession::takePacket(AgentxHeader const& header, std::string_view payload) {
-    m_heard = Clock::now();
+    m_heard = m_now();
     if (header.kind == AgentxKind::Response) {
         takeResponse(header, payload);
     } else if (header.kind == AgentxKind::Close) {
@@ -313,7 +315,7 @@ void AgentxSession::takeResponse(AgentxHeader const& header, std::string_view pa
     std::size_t const root = awaited->root;
     m_awaited.erase(awaited);
     AgentxReader reader(payload, header.networkOrder);
-    m_masterTime = {reader.number(), Clock::now()};
+    m_masterTime = {reader.number(), m_now()};
     auto const fault = static_cast<AgentxFault>(reader.number16());
     if (fault == AgentxFault::NotOpen) return drop("it has forgotten the session");
     switch (kind) {
@@ -330,14 +332,14 @@ void AgentxSession::takeResponse(AgentxHeader const& header, std::string_view pa
         if (fault != AgentxFault::None) {
             std::string const line =
                 "the SNMP master does not list the agent in sysORTable: " + nameOf(fault);
-            if (m_repeats.passes(line, Clock::now())) log(LogLevel::Warning, line);
+            if (m_repeats.passes(line, m_now())) log(LogLevel::Warning, line);
         }
         break;
     case AgentxKind::Notify:
         // The master would refuse a refused one again.
         if (fault != AgentxFault::None) {
             std::string const line = "the SNMP master refuses a notification: " + nameOf(fault);
-            if (m_repeats.passes(line, Clock::now())) log(LogLevel::Warning, line);
+            if (m_repeats.passes(line, m_now())) log(LogLevel::Warning, line);
         }
         // An expired one has been given up.
         if (!m_delivered) break;
@@ -350,19 +352,19 @@ void AgentxSession::takeResponse(AgentxHeader const& header, std::string_view pa
 }
 
 void AgentxSession::drop(std::string const& why) {
-    m_retryAt = Clock::now() + nextPause(false);
+    m_retryAt = m_now() + nextPause(false);
     disconnect();
     tellLost(why);
 }
 
 void AgentxSession::dropMisbehaving(std::string const& why) {
-    m_retryAt = Clock::now() + nextPause(true);
+    m_retryAt = m_now() + nextPause(true);
     disconnect();
     tellLost(why);
 }
 
 std::chrono::milliseconds AgentxSession::nextPause(bool misbehaves) {
-    bool const wasSteady = isConnected() && Clock::now() >= m_connectedAt + m_pace.steady;
+    bool const wasSteady = isConnected() && m_now() >= m_connectedAt + m_pace.steady;
     if (wasSteady) m_pause = m_pace.retry;
     // One that is away, or refuses, is asked at the usual pace.
     if (!misbehaves && (!isConnected() || wasSteady)) return m_pace.retry;
@@ -383,7 +385,7 @@ void AgentxSession::disconnect() {
 void AgentxSession::tellConnected() {
     if (m_told == Told::Connected) return;
     m_told = Told::Connected;
-    m_connectedAt = Clock::now();
+    m_connectedAt = m_now();
     log(LogLevel::Info, "connected to the SNMP master at " + m_address.text);
 }
 

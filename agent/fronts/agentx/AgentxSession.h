@@ -50,11 +50,14 @@ class AgentxSession final : public NotificationSink {
     /// Returns the response to a request of the master, empty if there is none. May throw
     /// AgentxError.
     using Answer = std::function<std::string(AgentxHeader const&, std::string_view payload)>;
+    using Now = std::function<Clock::time_point()>;
 
     /// Registers `roots` and the cells of `rows`, and answers requests for them by `answer`. Adds
     /// `capabilities` to the master's sysORTable. Begins to connect. `rows` outlives the session.
+    /// `now`: the clock that `pace` refers to.
     AgentxSession(AgentxAddress address, std::vector<AgentxRoot> roots, SharedRows& rows,
-                  Answer answer, AgentxPace pace = {}, std::vector<Capability> capabilities = {});
+                  Answer answer, AgentxPace pace = {}, std::vector<Capability> capabilities = {},
+                  Now now = &Clock::now);
     /// Closes the session, so that the master removes the agent's objects at once.
     ~AgentxSession() override;
     AgentxSession(AgentxSession const&) = delete;
@@ -129,6 +132,7 @@ class AgentxSession final : public NotificationSink {
     Answer m_answer;
     AgentxPace m_pace;
     std::vector<Capability> m_capabilities;
+    Now const m_now;
 
     int m_socket = -1;
     Stage m_stage = Stage::Away;

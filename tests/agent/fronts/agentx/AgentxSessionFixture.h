@@ -114,10 +114,10 @@ class AgentxSessionFixture : public ::testing::Test {
         std::filesystem::remove_all(m_folder);
     }
 
-    /// A session that is patient for longer than any test runs, unless the test says otherwise.
+    /// A session that is patient for longer than any test lasts, unless the test says otherwise.
     static AgentxPace patient() {
-        return {std::chrono::milliseconds(1), kTestPatience * 10, kTestPatience * 10,
-                kTestPatience * 10};
+        return {std::chrono::milliseconds(1), kTestPatience * 100, kTestPatience * 100,
+                kTestPatience * 100};
     }
 
     void startMaster() { m_master.emplace(path()); }
@@ -127,9 +127,10 @@ class AgentxSessionFixture : public ::testing::Test {
             [](AgentxHeader const& header, std::string_view) {
                 return agentxResponse(header, AgentxFault::NotWritable);
             },
-            pace, m_capabilities);
+            pace, m_capabilities, [this] { return m_now; });
     }
-    /// Lets the session run until `condition` holds.
+    /// Lets the session run until `condition` holds. Each round takes a millisecond of the
+    /// session's clock, however long the machine takes.
     template <class Condition>
     bool runUntil(Condition condition) {
         auto const limit = Clock::now() + kTestPatience;
@@ -137,6 +138,7 @@ class AgentxSessionFixture : public ::testing::Test {
             if (Clock::now() > limit) return false;
             pollfd polled{m_session->descriptor(), m_session->events(), 0};
             poll(&polled, 1, 1);
+            m_now += std::chrono::milliseconds(1);
             m_session->advance(polled.revents);
         }
         return true;
@@ -212,7 +214,7 @@ class AgentxSessionFixture : public ::testing::Test {
     ObjectTree const m_tree{standardScalars(), m_tables};
     Snapshot m_snapshot;
     Counters m_counters;
-    Clock::time_point m_now = Clock::now();
+    Clock::time_point m_now{std::chrono::hours(1)};
     SharedRows m_rows{
         {{m_tree,
           kStandardArc,
