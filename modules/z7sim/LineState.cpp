@@ -61,8 +61,8 @@ int lineStatusOf(std::uint32_t alarms, LinePerformance const& performance) {
 
 LineState::LineState() : m_number(LineStatusDelivery::instance().reserve()) {}
 
-LineState::Date LineState::Date::now(long before) {
-    return {LineClocks::inUse().system() - before, ::clocksApart()};
+LineState::Date LineState::Date::now() {
+    return {LineClocks::inUse().system(), ::clocksApart()};
 }
 
 long LineState::Date::inUse() const {
@@ -99,7 +99,7 @@ void LineState::update(std::uint32_t alarms, LinePerformance const& performance)
         std::scoped_lock const guard(m_mutex);
         m_changed = Date::now();
         if (performance.unavailable() != m_unavailable)
-            m_availabilityChanged = Date::now(performance.decidedAfter());
+            m_availabilityChanged = m_changed.secondsBefore(performance.decidedAfter());
     }
     m_unavailable = performance.unavailable();
     m_status.store(now, std::memory_order_relaxed);

@@ -41,8 +41,8 @@ class LineState {
         long seconds = 0;
         long clocksApart = 0; ///< the system's clock minus the monotonic one, at that time
 
-        /// The present, or so many seconds before it.
-        static Date now(long before = 0);
+        static Date now();
+        Date secondsBefore(long count) const { return {seconds - count, clocksApart}; }
         /// As the system's clock counts it now.
         long inUse() const;
     };
