@@ -68,6 +68,21 @@ struct DS1BoardLine {
 
 static_assert(sizeof(DS1BoardLine) == 40 && offsetof(DS1BoardLine, counters) == 4);
 
+/// Attribute of the root object: a `DS1BoardGeneration` for each board that has lines, in ascending
+/// order of the boards' handles, all at one and the same moment; as many as the buffer holds.
+inline constexpr char const* kDS1LineGenerations = "LINE_GENERATIONS";
+
+/// Whether the lines of a board have changed. As long as the generation is the same, and is not 0,
+/// the board has the same lines, each counter but `seconds` stays as it is, and so do the alarms.
+/// Generations are unique: no board has one that another board, or this one, had before.
+struct DS1BoardGeneration {
+    std::int32_t board;       ///< its handle
+    std::uint32_t seconds;    ///< of its first line; the others' grow at the same moments
+    std::uint64_t generation; ///< 0: a line is counting, so that each moment may differ
+};
+
+static_assert(sizeof(DS1BoardGeneration) == 16 && offsetof(DS1BoardGeneration, generation) == 8);
+
 // A line that has lost its signal, or receives AIS, does not by that report the loss of frame: only
 // the root is named. With any of the three the platform sends RAI to the far end.
 inline constexpr std::uint32_t kDS1AlarmLossOfSignal = 1;

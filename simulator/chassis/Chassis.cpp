@@ -2,6 +2,8 @@
 // The chassis: its objects and the indexes over them.
 #include "simulator/chassis/Chassis.h"
 
+#include <algorithm>
+#include <atomic>
 #include <chrono>
 
 #include "simulator/base/Text.h"
@@ -19,6 +21,12 @@ std::size_t countObjects(ObjectDraft const& draft) {
     for (auto const& child : draft.children)
         count += countObjects(child);
     return count;
+}
+
+/// A generation of lines that none had before, in this chassis or another.
+std::uint64_t nextGeneration() {
+    static std::atomic<std::uint64_t> last{0};
+    return ++last;
 }
 
 /// The text of an attribute, or null when it is missing or no text.
@@ -91,11 +99,15 @@ void Chassis::insertBoard(ObjectDraft board) {
                                            " boards, devices, sub-devices and processors");
     if (auto const* serial = textAttribute(board.attributes, kSerialNumber))
         refuseSerial(serial->asText(), board.handle, board.line);
-    add(std::move(board), kRootHandle);
+    std::int32_t const handle = board.handle;
+    add(std::move(board), kRootHandle, lineTime());
+    if (m_objects.at(handle).lines)
+        renew(*m_boardsWithLines.insert(placeOfLines(handle), {.board = handle}));
 }
 
 void Chassis::removeBoard(std::int32_t handle) {
     std::erase(m_objects.at(kRootHandle).children, handle);
+    if (m_objects.at(handle).lines) m_boardsWithLines.erase(placeOfLines(handle));
     discard(handle);
 }
 
@@ -127,6 +139,8 @@ void Chassis::setLineClock(LineClock* clock) {
     LiveLine::Time const now = lineTime();
     for (auto& [handle, object] : m_objects)
         if (object.ds1Line) object.ds1Line->restart(now);
+    for (BoardLines& lines : m_boardsWithLines)
+        renew(lines);
 }
 
 LiveLine::Time Chassis::lineTime() const {
@@ -152,15 +166,14 @@ void Chassis::refuseSerial(std::string_view serialNumber, std::int32_t forBoard,
                                  " has it; serial numbers must differ");
 }
 
-void Chassis::add(ObjectDraft draft, std::int32_t parent) {
+void Chassis::add(ObjectDraft draft, std::int32_t parent, LiveLine::Time now) {
     ChassisObject object;
     object.kind = draft.kind;
     object.handle = draft.handle;
     object.parent = parent;
     object.order = m_nextOrder++;
     object.attributes = std::move(draft.attributes);
-    if (draft.ds1Line)
-        object.ds1Line = std::make_unique<LiveLine>(std::move(*draft.ds1Line), lineTime());
+    if (draft.ds1Line) object.ds1Line = std::make_unique<LiveLine>(std::move(*draft.ds1Line), now);
     if (draft.channels) object.channels = std::make_unique<Channels>(std::move(*draft.channels));
     ChassisObject const& added = m_objects.emplace(draft.handle, std::move(object)).first->second;
     ChassisObject& above = m_objects.at(parent);
@@ -172,7 +185,21 @@ void Chassis::add(ObjectDraft draft, std::int32_t parent) {
     index(added, kName);
     index(added, kSerialNumber);
     for (auto& child : draft.children)
-        add(std::move(child), draft.handle);
+        add(std::move(child), draft.handle, now);
+}
+
+/// Where the lines of a board stand, or would stand.
+std::vector<BoardLines>::iterator Chassis::placeOfLines(std::int32_t board) {
+    return std::ranges::lower_bound(m_boardsWithLines, board, {}, &BoardLines::board);
+}
+
+/// After a change of any line of a board.
+void Chassis::renew(BoardLines& lines) const {
+    auto const& all = *m_objects.at(lines.board).lines;
+    bool const isSteady =
+        std::ranges::all_of(all, [](auto const& each) { return each.line->isSteady(); });
+    lines.generation = isSteady ? nextGeneration() : 0;
+    lines.born = all.front().line->born();
 }
 
 void Chassis::discard(std::int32_t handle) {

@@ -46,6 +46,13 @@ struct LineOfBoard {
     LiveLine const* line = nullptr;
 };
 
+/// The `BoardLines` are the lines of a board as a whole.
+struct BoardLines {
+    std::int32_t board = 0;       ///< its handle
+    std::uint64_t generation = 0; ///< as in `DS1BoardGeneration`
+    LiveLine::Time born{}; ///< of the first line; the ages of the others differ by whole seconds
+};
+
 /// A `ChassisObject` is an object of the chassis: its root, a board, or an object of a board.
 struct ChassisObject {
     ObjectKind kind = ObjectKind::root;
@@ -108,8 +115,18 @@ class Chassis {
     void setLineClock(LineClock* clock);
     /// The time of the clock of the lines.
     LiveLine::Time lineTime() const;
-    /// To change them. Require: the object has one.
-    LiveLine& line(std::int32_t handle) { return *m_objects.at(handle).ds1Line; }
+    /// Calls `change(line)`, which may change the line. Requires: the object is a line.
+    template <typename Change>
+    void changeLine(std::int32_t handle, Change&& change) {
+        ChassisObject const& object = m_objects.at(handle);
+        BoardLines& lines = linesOf(object.parent);
+        lines.generation = 0; // and stays so if the change throws
+        std::forward<Change>(change)(*object.ds1Line);
+        renew(lines);
+    }
+    /// The boards that have lines, in the order of their handles.
+    std::vector<BoardLines> const& boardsWithLines() const { return m_boardsWithLines; }
+    /// To change them. Requires: the object has them.
     Channels& channels(std::int32_t handle) { return *m_objects.at(handle).channels; }
 
     /// The contents of the attribute store when it is created.
@@ -122,16 +139,21 @@ class Chassis {
   private:
     void refuseTaken(ObjectDraft const& draft) const;
     void refuseSerial(std::string_view serialNumber, std::int32_t forBoard, int line) const;
-    void add(ObjectDraft draft, std::int32_t parent);
+    /// `now`: the time of the clock of the lines, which is the same for all lines of a board.
+    void add(ObjectDraft draft, std::int32_t parent, LiveLine::Time now);
     void discard(std::int32_t handle);
     void index(ChassisObject const& object, std::string_view attribute);
     void unindex(ChassisObject const& object, std::string_view attribute);
+    std::vector<BoardLines>::iterator placeOfLines(std::int32_t board);
+    BoardLines& linesOf(std::int32_t board) { return *placeOfLines(board); }
+    void renew(BoardLines& lines) const;
 
     using Named = std::set<std::pair<std::uint64_t, std::int32_t>>;
 
     std::unordered_map<std::int32_t, ChassisObject> m_objects;
     std::unordered_map<std::string, Named, TextHash, std::equal_to<>> m_byName;
     std::unordered_map<std::string, std::int32_t, TextHash, std::equal_to<>> m_bySerial;
+    std::vector<BoardLines> m_boardsWithLines;
     std::uint64_t m_nextOrder = 0;
     LineClock* m_lineClock = nullptr;
     StoreDraft m_store;

@@ -64,7 +64,7 @@ DS1LineCounters Line::counters(Time age) const {
     for (std::size_t i = 0; i < counts.size(); ++i)
         counts[i] = m_counts[i].after(m_rates[i], age - m_since).whole;
     std::uint32_t const following = (m_raised & kFrameLosing) != 0 ? kDS1AlarmSendingRemote : 0;
-    return {static_cast<std::uint32_t>(std::chrono::floor<std::chrono::seconds>(age).count()),
+    return {wholeSeconds(age),
             counts[0],
             counts[1],
             counts[2],
@@ -73,6 +73,10 @@ DS1LineCounters Line::counters(Time age) const {
             m_outOfFrame.at(age),
             m_alarmIndication.at(age),
             m_raised | following};
+}
+
+bool Line::isSteady() const {
+    return m_rates == LineRates() && (m_raised & kFrameLosing) == 0;
 }
 
 void Line::add(LineErrors const& errors) {

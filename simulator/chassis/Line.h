@@ -59,10 +59,17 @@ class Line {
   public:
     using Time = std::chrono::nanoseconds;
 
+    /// What `DS1LineCounters` has as the seconds of this age.
+    static std::uint32_t wholeSeconds(Time age) {
+        return static_cast<std::uint32_t>(std::chrono::floor<std::chrono::seconds>(age).count());
+    }
+
     DS1LineCounters counters(Time age) const;
     LineRates const& rates() const { return m_rates; }
     /// The alarms that were raised, without those that they cause.
     std::uint32_t raised() const { return m_raised; }
+    /// Whether time adds nothing to the counters except for the age.
+    bool isSteady() const;
 
     /// Counts these at once.
     void add(LineErrors const& errors);

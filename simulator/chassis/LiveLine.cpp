@@ -8,11 +8,12 @@
 
 namespace kvlsim {
 
-LiveLine::LiveLine(LineDraft draft, Time now)
-    : m_draft(std::move(draft)), m_loaded(now), m_line(lineAtLoading(m_draft)) {}
+LiveLine::LiveLine(LineDraft draft, Time now) : m_draft(std::move(draft)) {
+    restart(now);
+}
 
 void LiveLine::restart(Time now) {
-    m_loaded = now;
+    m_born = now - std::chrono::seconds(m_draft.past.seconds);
     m_line = lineAtLoading(m_draft);
 }
 

@@ -31,7 +31,8 @@ Json changeLine(CommandContext const& context, Change change) {
         Chassis& chassis = present(maybe);
         ChassisObject const& object = lineOf(context, chassis);
         handle = object.handle;
-        change(chassis.line(handle), chassis.lineTime(), object.parent);
+        chassis.changeLine(
+            handle, [&](LiveLine& line) { change(line, chassis.lineTime(), object.parent); });
     });
     return {{"line", handle}};
 }

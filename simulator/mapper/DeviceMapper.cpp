@@ -53,6 +53,8 @@ std::int32_t readLines(DMAttribute& request, std::int32_t capacity,
                        std::vector<LineOfBoard> const& lines, LiveLine::Time now) {
     std::size_t const count =
         std::min(lines.size(), static_cast<std::size_t>(capacity) / sizeof(DS1BoardLine));
+    for (std::size_t i = 0; i < count; ++i)
+        lines[i].line->fetch();
     auto* to = static_cast<unsigned char*>(request.value);
     for (std::size_t i = 0; i < count; ++i) {
         DS1BoardLine const line{lines[i].device, lines[i].line->counters(now)};
@@ -63,11 +65,31 @@ std::int32_t readLines(DMAttribute& request, std::int32_t capacity,
     return 0;
 }
 
-/// The answer of a board's lines, a line or ISDN channels; none for an attribute that they do not
-/// answer.
+/// As many boards with lines as the buffer holds.
+std::int32_t readGenerations(DMAttribute& request, std::int32_t capacity, Chassis const& chassis) {
+    auto const& boards = chassis.boardsWithLines();
+    std::size_t const count =
+        std::min(boards.size(), static_cast<std::size_t>(capacity) / sizeof(DS1BoardGeneration));
+    LiveLine::Time const now = chassis.lineTime();
+    auto* to = static_cast<unsigned char*>(request.value);
+    for (std::size_t i = 0; i < count; ++i) {
+        BoardLines const& lines = boards[i];
+        DS1BoardGeneration const answer{lines.board, Line::wholeSeconds(now - lines.born),
+                                        lines.generation};
+        std::memcpy(to, &answer, sizeof answer);
+        to += sizeof answer;
+    }
+    request.size = static_cast<std::int32_t>(count * sizeof(DS1BoardGeneration));
+    return 0;
+}
+
+/// The answer of the chassis, a board's lines, a line or ISDN channels; none for an attribute that
+/// they do not answer.
 std::optional<std::int32_t> readLive(DMAttribute& request, std::int32_t capacity,
                                      ChassisObject const& object, Chassis const& chassis) {
     std::string_view const name = request.name;
+    if (object.kind == ObjectKind::root && name == kDS1LineGenerations)
+        return readGenerations(request, capacity, chassis);
     if (object.lines && object.kind == ObjectKind::board && name == kDS1BoardCounters)
         return readLines(request, capacity, *object.lines, chassis.lineTime());
     if (object.ds1Line) {
