@@ -159,6 +159,35 @@ void oneBoardInMemory(benchmark::State& state) {
 
 std::chrono::nanoseconds platformTime{};
 
+/// A thousand lines of the simulated platform. `line`: how each of them is described.
+void oneSecondOfThePlatform(benchmark::State& state, std::string const& line) {
+    kvlsim::setLineClock([] { return platformTime; });
+    constexpr std::size_t boards = 1000 / kLinesOfABoard;
+    std::string chassis = "boards:\n";
+    for (std::size_t board = 1; board <= boards; ++board) {
+        chassis += "- {handle: " + std::to_string(10 * board) + ", attributes: {SERIAL_NUMBER: S" +
+                   std::to_string(board) + "}, devices: [";
+        for (std::size_t i = 1; i <= kLinesOfABoard; ++i)
+            chassis +=
+                "{handle: " + std::to_string(10 * board + i) + ", type: 501, line: " + line + "}, ";
+        chassis += "]}\n";
+    }
+    kvlsim::loadChassis(chassis);
+    DrivenLineScheduler::install();
+    std::vector<std::unique_ptr<LineRecords>> records;
+    for (std::size_t board = 1; board <= boards; ++board) {
+        records.push_back(
+            std::make_unique<LineRecords>(static_cast<long>(10 * board), FailureTimes()));
+        for (std::size_t i = 1; i <= kLinesOfABoard; ++i)
+            records.back()->of(static_cast<long>(10 * board + i), LineFormat::esf);
+    }
+    for (auto _ : state) {
+        platformTime += std::chrono::seconds(1);
+        DrivenLineScheduler::install().passOfNextSecond();
+    }
+    kvlsim::setLineClock(nullptr);
+}
+
 /// A board of the simulated platform. `line`: how each of its lines is described.
 void oneBoardOfThePlatform(benchmark::State& state, std::string const& line) {
     kvlsim::setLineClock([] { return platformTime; });
@@ -195,5 +224,9 @@ BENCHMARK_CAPTURE(oneBoardOfThePlatform, errored, "{type: esf, errors: {path-vio
     ->Name("one second of four lines, counters of the simulated platform");
 BENCHMARK_CAPTURE(oneBoardOfThePlatform, clean, "{type: esf}")
     ->Name("one second of four lines without errors, counters of the simulated platform");
+BENCHMARK_CAPTURE(oneSecondOfThePlatform, errored, "{type: esf, errors: {path-violations: 3}}")
+    ->Name("one second of 1,000 lines of the simulated platform");
+BENCHMARK_CAPTURE(oneSecondOfThePlatform, clean, "{type: esf}")
+    ->Name("one second of 1,000 lines of the simulated platform without errors");
 
 } // namespace

@@ -9,6 +9,7 @@
 
 std::atomic<LineScheduler*> LineScheduler::s_instance{nullptr};
 std::atomic<long> LineScheduler::s_time{0};
+std::atomic<std::uint64_t> LineScheduler::s_passNumber{0};
 
 LineScheduler& LineScheduler::instance() {
     static std::mutex mutex;
@@ -48,6 +49,7 @@ void LineScheduler::Run() {
 void LineScheduler::pass(long time) {
     lock_list();
     s_time.store(time, std::memory_order_relaxed);
+    s_passNumber.store(passNumber() + 1, std::memory_order_relaxed);
     // Everything is due: entries have a period of a second, and are a second older at the least.
     m_nextWakeUp = std::min(m_nextWakeUp, time);
     run_pass(time);

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <atomic>
+#include <cstdint>
 
 #include "platform/ActionScheduler_pthread.h"
 
@@ -22,6 +23,8 @@ class LineScheduler : public ActionScheduler_pthread {
 
     /// The time of the pass under way, or of the last one: whole seconds of the monotonic clock.
     static long time() { return s_time.load(std::memory_order_relaxed); }
+    /// The number of the pass under way, or of the last one.
+    static std::uint64_t passNumber() { return s_passNumber.load(std::memory_order_relaxed); }
 
     /// Calls `change` while no pass is under way, so that it can change what a scheduled action
     /// uses. `change` must not call the scheduler.
@@ -46,4 +49,5 @@ class LineScheduler : public ActionScheduler_pthread {
 
   private:
     static std::atomic<long> s_time;
+    static std::atomic<std::uint64_t> s_passNumber;
 };

@@ -27,6 +27,8 @@ class LineSeconds {
     /// The same for a line that did not answer.
     void begin(std::int64_t time);
 
+    /// The line's age as it was read last.
+    std::uint32_t age() const { return m_age; }
     /// Whether a tick at `time` that reads this age is simply the next second, which is seen.
     bool isNext(std::uint32_t age, std::int64_t time) const {
         return m_hasBeginning && !m_isStill && time == m_time + 1 &&

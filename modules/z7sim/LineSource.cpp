@@ -3,6 +3,7 @@
 
 #include <cstdint>
 
+#include "LineGenerations.h"
 #include "ObjectAttributes.h"
 
 namespace {
@@ -34,6 +35,10 @@ std::vector<DS1LineCounters> PlatformLine::past() {
         return {};
     if (now.seconds - records.back().seconds > kFreshSeconds) return {};
     return records;
+}
+
+DS1BoardGeneration PlatformBoard::generation() {
+    return LineGenerations::instance().of(m_board, m_place);
 }
 
 std::size_t PlatformBoard::read(std::span<DS1BoardLine> lines) {

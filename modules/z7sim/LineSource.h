@@ -41,21 +41,26 @@ class PlatformLine final : public LineSource {
 class LineBatch {
   public:
     virtual ~LineBatch() = default;
+    /// The generation of the lines when the pass under way began; 0 when it is not known.
+    /// Thread-bound: the thread of the `LineScheduler`.
+    virtual DS1BoardGeneration generation() { return {}; }
     /// Fills the beginning of `lines` with the lines that answer, in any order. Returns how many
     /// there are.
     virtual std::size_t read(std::span<DS1BoardLine> lines) = 0;
 };
 
-/// The lines of a board of the device mapper. Thread-safe.
+/// The lines of a board of the device mapper. Thread-safe, apart from `generation`.
 class PlatformBoard final : public LineBatch {
   public:
     /// `board`: the board's handle.
     explicit PlatformBoard(long board) : m_board(board) {}
 
+    DS1BoardGeneration generation() override;
     std::size_t read(std::span<DS1BoardLine> lines) override;
 
   private:
     long m_board;
+    std::size_t m_place = 0; ///< among the generations
 };
 
 /// The defects that are there at the moment of a reading.

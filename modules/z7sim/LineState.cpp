@@ -29,16 +29,6 @@ constexpr AlarmStatus kStatuses[] = {
     {kDS1AlarmTestCode, DS1LineStatusRcvTestCode},
 };
 
-/// Everything that a status is made of, in one number.
-std::uint64_t ingredientsOf(std::uint32_t alarms, LinePerformance const& performance) {
-    LineDefects const failures = performance.failures();
-    std::uint64_t ingredients = alarms;
-    for (bool const each : {performance.unavailable(), failures.lossOfSignal, failures.outOfFrame,
-                            failures.alarmIndication})
-        ingredients = ingredients << 1U | (each ? 1U : 0U);
-    return ingredients;
-}
-
 long clocksApart() {
     return LineClocks::inUse().system() - LineClocks::inUse().monotonic();
 }
@@ -83,16 +73,11 @@ long LineState::availabilityChange() const {
 }
 
 void LineState::begin(std::uint32_t alarms, LinePerformance const& performance) {
-    m_madeOf = ingredientsOf(alarms, performance);
     m_unavailable = performance.unavailable();
     m_status.store(lineStatusOf(alarms, performance), std::memory_order_relaxed);
 }
 
 void LineState::update(std::uint32_t alarms, LinePerformance const& performance) {
-    // Nearly every second is like the one before.
-    std::uint64_t const madeOf = ingredientsOf(alarms, performance);
-    if (madeOf == m_madeOf) return;
-    m_madeOf = madeOf;
     int const now = lineStatusOf(alarms, performance);
     if (now == status()) return;
     {

@@ -33,6 +33,7 @@ class LineState {
     /// Sets the status that a line is found with; this is no change.
     void begin(std::uint32_t alarms, LinePerformance const& performance);
     /// Sets the status that a second ended with, and posts it when it differs from the last one.
+    /// There is nothing to do while the `lineStatusParts` are the same.
     void update(std::uint32_t alarms, LinePerformance const& performance);
 
   private:
@@ -48,7 +49,6 @@ class LineState {
     };
 
     std::uint64_t const m_number;
-    std::uint64_t m_madeOf = 0; ///< the alarms and failures that the status shows; for the tick
     bool m_unavailable = false; ///< for the tick
     std::atomic<int> m_status{1};
     std::atomic<int> m_trapEnable{2};
@@ -56,6 +56,16 @@ class LineState {
     Date m_changed;
     Date m_availabilityChanged;
 };
+
+/// All that the status of a line with these alarms depends on, in one number.
+inline std::uint64_t lineStatusParts(std::uint32_t alarms, LinePerformance const& performance) {
+    LineDefects const failures = performance.failures();
+    std::uint64_t parts = alarms;
+    for (bool const each : {performance.unavailable(), failures.lossOfSignal, failures.outOfFrame,
+                            failures.alarmIndication})
+        parts = parts << 1U | (each ? 1U : 0U);
+    return parts;
+}
 
 /// The status bits of a line with these alarms (`kDS1Alarm...`) and failures. Loss of signal, loss
 /// of frame and AIS are shown as failures only, and so is that the line sends RAI because of them.

@@ -36,6 +36,7 @@ void LineTicks::add(long device, Z7SimIntervalTable& table) {
     LineScheduler::instance().betweenPasses([&] {
         m_answers.resize(m_lines.size() + 1);
         m_lines.push_back({device, &table});
+        m_generation = 0;
     });
 }
 
@@ -51,14 +52,38 @@ int LineTicks::ScheduledAction() {
     // The tables lie all over memory; they are fetched while the platform answers.
     for (Line const& line : m_lines)
         line.table->fetch();
-    std::size_t const count = m_isTogether ? m_batch->read(m_answers) : 0;
-    auto const answers = std::span(m_answers).first(std::min(count, m_answers.size()));
-    std::size_t next = 0;
-    for (Line const& line : m_lines) {
-        if (auto const* const answer = find(answers, line.device, next))
-            line.table->tick(answer->counters);
-        else
-            line.table->ScheduledAction();
+    bool const together = m_isTogether;
+    auto const now = together ? m_batch->generation() : DS1BoardGeneration();
+    if (isNextSecondOf(now)) {
+        m_seconds = now.seconds;
+        for (Line const& line : m_lines)
+            line.table->tickUnchanged();
+    } else {
+        ask(together, now.generation);
     }
     return 0;
+}
+
+/// Whether the counters are those that the tables know, a second later.
+bool LineTicks::isNextSecondOf(DS1BoardGeneration const& now) const {
+    return m_generation != 0 && now.generation == m_generation && now.seconds == m_seconds + 1;
+}
+
+/// `generation`: one that the counters had before now.
+void LineTicks::ask(bool together, std::uint64_t generation) {
+    std::size_t const count = together ? m_batch->read(m_answers) : 0;
+    auto const answers = std::span(m_answers).first(std::min(count, m_answers.size()));
+    std::size_t next = 0;
+    bool haveAll = true;
+    for (Line const& line : m_lines) {
+        if (auto const* const answer = find(answers, line.device, next)) {
+            line.table->tick(answer->counters);
+        } else {
+            line.table->ScheduledAction();
+            haveAll = false;
+        }
+    }
+    // Counters that have changed since have another generation at the next tick.
+    m_generation = haveAll ? generation : 0;
+    if (haveAll) m_seconds = answers.front().counters.seconds;
 }

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <atomic>
+#include <cstdint>
 #include <memory>
 #include <vector>
 
@@ -12,8 +13,8 @@
 class Z7SimIntervalTable;
 
 /// A `LineTicks` ticks the interval tables of a board's lines together: once a second it asks for
-/// the counters of all of them in one request. A line that the answer lacks is asked alone. The
-/// `LineScheduler` ticks it.
+/// the counters of all of them in one request, unless their generation shows that they are as they
+/// were. A line that the answer lacks is asked alone. The `LineScheduler` ticks it.
 ///
 /// Thread-safe, apart from `ScheduledAction`. No scheduled action may call it.
 class LineTicks final : public Schedulable {
@@ -40,8 +41,15 @@ class LineTicks final : public Schedulable {
         Z7SimIntervalTable* table;
     };
 
+    bool isNextSecondOf(DS1BoardGeneration const& now) const;
+    void ask(bool together, std::uint64_t generation);
+
     std::unique_ptr<LineBatch> const m_batch;
     std::atomic<bool> m_isTogether{true};
+    // Of the counters that the tables know: their generation (0: not known, or not one for all),
+    // and the seconds of the board's first line.
+    std::uint64_t m_generation = 0;
+    std::uint32_t m_seconds = 0;
     // Changed between passes only.
     std::vector<Line> m_lines;
     std::vector<DS1BoardLine> m_answers; ///< to the last request, with room for all lines

@@ -60,6 +60,7 @@ void Z7SimIntervalTable::begin(std::vector<DS1LineCounters> const& past) {
         m_last = now;
     }
     m_seconds.begin(m_last.seconds, LineScheduler::time());
+    m_shown = lineStatusParts(now.alarms, m_performance);
     m_state->begin(now.alarms, m_performance);
     m_last.alarms = now.alarms; // which the status shows
 }
@@ -95,28 +96,29 @@ void Z7SimIntervalTable::tick(DS1LineCounters const& now) {
 }
 
 void Z7SimIntervalTable::fetch() const {
-    auto const* const first = reinterpret_cast<char const*>(&m_timeElapsed);
-    __builtin_prefetch(first, 1);
+    __builtin_prefetch(&m_timeElapsed, 1);
+    __builtin_prefetch(&m_current.LineCodeViolations, 1);
     auto const* const own = reinterpret_cast<char const*>(&m_last);
     for (std::size_t offset = 0; offset <= 2 * kCacheLine; offset += kCacheLine)
         __builtin_prefetch(own + offset, 1);
 }
 
 void Z7SimIntervalTable::answered(DS1LineCounters const& now) {
+    if (isCleanBetween(m_last, now) && countClean(now.seconds)) return;
     long const time = LineScheduler::time();
-    // Nearly every second is clean, and follows the one before.
-    if (isCleanBetween(m_last, now) && m_seconds.isNext(now.seconds, time) &&
-        m_performance.countClean()) {
-        m_seconds.goOn();
-        m_last.seconds = now.seconds;
-        m_timeElapsed += 1;
-        return;
-    }
     LineTick const tick = m_seconds.answered(now.seconds, time);
     if (tick.missed > 0) miss(tick.missed);
     if (tick.counts) count(now);
     m_last = now;
-    m_state->update(now.alarms, m_performance);
+    showStatus(now.alarms);
+}
+
+/// Nearly every second is like the one before, and does not touch the state.
+void Z7SimIntervalTable::showStatus(std::uint32_t alarms) {
+    std::uint64_t const shown = lineStatusParts(alarms, m_performance);
+    if (shown == m_shown) return;
+    m_shown = shown;
+    m_state->update(alarms, m_performance);
 }
 
 int Z7SimIntervalTable::CloseInterval() {

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "LinePerformance.h"
+#include "LineScheduler.h"
 #include "LineSeconds.h"
 #include "LineSource.h"
 #include "LineState.h"
@@ -34,6 +35,13 @@ class Z7SimIntervalTable final : public DS1IntervalTable, public DS1IntervalVali
 
     /// A tick at which the line answered this.
     void tick(DS1LineCounters const& now);
+    /// A tick at which the line is a second older, and otherwise as it was at the tick before.
+    void tickUnchanged() {
+        if (tickClean()) return;
+        DS1LineCounters now = m_last;
+        now.seconds = m_seconds.age() + 1;
+        tick(now);
+    }
     /// Prefetches what a tick uses.
     void fetch() const;
 
@@ -48,16 +56,32 @@ class Z7SimIntervalTable final : public DS1IntervalTable, public DS1IntervalVali
     int GetIntervalsClosed() override { return m_closed; }
 
   private:
+    /// Does `tickUnchanged` if the second is clean, as nearly every one is.
+    bool tickClean() {
+        if (m_timeElapsed >= kIntervalLength || (m_last.alarms & kFrameLosingAlarms) != 0)
+            return false;
+        return countClean(m_seconds.age() + 1);
+    }
+    /// Counts a second without errors or defects if it follows the one before. `age`: of the line.
+    bool countClean(std::uint32_t age) {
+        if (!m_seconds.isNext(age, LineScheduler::time()) || !m_performance.countClean())
+            return false;
+        m_seconds.goOn();
+        m_timeElapsed += 1;
+        return true;
+    }
     void begin(std::vector<DS1LineCounters> const& past);
     void replay(std::vector<DS1LineCounters> const& past);
     void answered(DS1LineCounters const& now);
+    void showStatus(std::uint32_t alarms);
     void count(DS1LineCounters const& now);
     void miss(std::int64_t seconds);
     void close();
 
     std::shared_ptr<LineSource> m_source;
     std::shared_ptr<LineState> m_state;
-    DS1LineCounters m_last{}; ///< as read last
+    std::uint64_t m_shown = 0; ///< the `lineStatusParts` of the status
+    DS1LineCounters m_last{};  ///< as read last; `m_seconds` has their seconds
     LineSeconds m_seconds;
     LinePerformance m_performance;
     DS1Counter m_closed;               ///< intervals

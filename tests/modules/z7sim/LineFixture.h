@@ -21,12 +21,16 @@ class LineClock {
   public:
     LineClock() {
         s_now = std::chrono::hours(1);
-        kvlsim::setLineClock([] { return s_now.load(); });
+        useAgain();
     }
     ~LineClock() { kvlsim::setLineClock(nullptr); }
     LineClock(LineClock const&) = delete;
     LineClock& operator=(LineClock const&) = delete;
 
+    /// All lines of the platform begin anew.
+    static void useAgain() {
+        kvlsim::setLineClock([] { return s_now.load(); });
+    }
     static void advance(std::chrono::nanoseconds by) { s_now = s_now.load() + by; }
 
   private:

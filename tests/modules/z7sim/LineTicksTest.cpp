@@ -30,6 +30,7 @@ struct ScriptedBoard {
     std::map<long, State> lines;
     std::vector<long> order; ///< of the answers; other lines follow in the order of their devices
     int asked = 0;           ///< for all lines
+    std::uint64_t generation = 0; ///< of the counters; 0: they may change at any time
     std::vector<long> askedAlone;
 };
 
@@ -37,6 +38,10 @@ class ScriptedBatch final : public LineBatch {
   public:
     explicit ScriptedBatch(ScriptedBoard& board) : m_board(board) {}
 
+    DS1BoardGeneration generation() override {
+        if (m_board.lines.empty()) return {};
+        return {0, m_board.lines.begin()->second.counters.seconds, m_board.generation};
+    }
     std::size_t read(std::span<DS1BoardLine> lines) override {
         ++m_board.asked;
         std::vector<long> devices = m_board.order;
@@ -249,6 +254,86 @@ TEST_F(LineTicksTest, LineWhoseAgeJumpsMissesSecondsAndTheOthersDoNot) {
     m_platform.lines[2].counters = {};
     pass();
     EXPECT_FALSE(isValid(2));
+}
+
+TEST_F(LineTicksTest, LinesAreNotAskedAgainInTheSameGeneration) {
+    add(0); // a line that counts no errors
+    m_platform.generation = 7;
+    pass(1000);
+    EXPECT_EQ(m_platform.asked, 1);
+    expectWhole(0, 100);
+    EXPECT_EQ(m_tables[0]->GetIntervalsClosed(), 1);
+}
+
+TEST_F(LineTicksTest, LinesAreAskedInAnotherGeneration) {
+    add(0);
+    m_platform.generation = 7;
+    pass(5);
+    m_platform.lines[0].counters.pathCodeViolations += 9;
+    m_platform.generation = 8;
+    pass(5);
+    EXPECT_EQ(m_platform.asked, 2);
+    EXPECT_EQ(errors(0), 9);
+    EXPECT_EQ(elapsed(0), 10);
+}
+
+TEST_F(LineTicksTest, LinesAreAskedWhenTheirSecondIsNotTheNext) {
+    add(0);
+    m_platform.generation = 7;
+    pass(5);
+    age(1);
+    pass();
+    EXPECT_EQ(m_platform.asked, 2);
+    expectWhole(0, 6);
+    age(100);
+    pass();
+    EXPECT_FALSE(isValid(0));
+}
+
+TEST_F(LineTicksTest, PassesThatAreLeftOutAreMissedInTheSameGeneration) {
+    add(0);
+    m_platform.generation = 7;
+    pass(5);
+    age(1);
+    m_scheduler.pass(LineScheduler::time() + 10);
+    EXPECT_EQ(m_platform.asked, 1);
+    EXPECT_EQ(elapsed(0), 15);
+    EXPECT_FALSE(isValid(0));
+}
+
+TEST_F(LineTicksTest, LineThatAppearsIsAskedInTheSameGeneration) {
+    add(0);
+    m_platform.generation = 7;
+    pass(5);
+    add(1);
+    pass();
+    EXPECT_EQ(m_platform.asked, 2);
+    expectWhole(0, 6);
+    expectWhole(1, 1);
+}
+
+TEST_F(LineTicksTest, LineThatTheAnswerLacksIsAskedInTheSameGeneration) {
+    add(0);
+    add(1);
+    m_platform.generation = 7;
+    m_platform.lines[1].answersTogether = false;
+    pass(3);
+    EXPECT_THAT(m_platform.askedAlone, ElementsAre(1, 1, 1));
+    expectWhole(0, 3);
+    expectWhole(1, 3);
+}
+
+TEST_F(LineTicksTest, LinesThatWereAskedAloneAreAskedInTheSameGeneration) {
+    add(0);
+    m_platform.generation = 7;
+    pass(2);
+    m_ticks->askTogether(false);
+    pass();
+    m_ticks->askTogether(true);
+    pass(2);
+    EXPECT_EQ(m_platform.asked, 2);
+    EXPECT_THAT(m_platform.askedAlone, ElementsAre(0));
+    expectWhole(0, 5);
 }
 
 TEST_F(LineTicksTest, IntervalsCloseAfterTheirSeconds) {
