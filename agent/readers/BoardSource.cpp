@@ -25,8 +25,8 @@ Rows<BoardRow> BoardSource::read() {
         auto const boardIndex = static_cast<std::uint32_t>(index);
         Known& known = m_known.at(boardIndex, drop);
         // No other board ever gets its index.
-        if (known.board.get() == nullptr) known.board = m_manager.GetBoardByIndex(index);
-        if (Board* const asked = known.board.get(); asked != nullptr) {
+        if (known.board.unlocked() == nullptr) known.board = m_manager.GetBoardByIndex(index);
+        if (Board* const asked = known.board.unlocked(); asked != nullptr) {
             if (isDue(m_turns, boardIndex) || !known.check || hasChanged(*asked, *known.check)) {
                 if (m_turns != nullptr) m_turns->add(boardIndex);
                 readRow(*asked, index, known);

@@ -11,6 +11,7 @@
 
 #include "agent/readers/BoardKeys.h"
 #include "agent/readers/Courtesy.h"
+#include "agent/readers/TableJoin.h"
 #include "agent/rows/IndexKey.h"
 #include "agent/rows/RowFinder.h"
 
@@ -83,24 +84,6 @@ AliasRow aliasOf(std::uint32_t entity, std::uint32_t ifIndex) {
     return {entity, std::move(alias)};
 }
 
-/// A table of all parts, ascending by index.
-template <class Part, class Row>
-Rows<Row> joinedTable(std::vector<std::shared_ptr<Part const>> const& parts,
-                      std::shared_ptr<void const> owner, std::vector<Row> Part::*table) {
-    Rows<Row> all;
-    bool sorted = true;
-    Row const* last = nullptr;
-    for (auto const& part : parts) {
-        std::vector<Row> const& rows = (*part).*table;
-        if (rows.empty()) continue;
-        sorted = sorted && (last == nullptr || last->index() < rows.front().index());
-        last = &rows.back();
-        all.append(rows, std::exchange(owner, nullptr));
-    }
-    if (!sorted) all.sortBy([](Row const& row) { return row.index(); });
-    return all;
-}
-
 } // namespace
 
 EntityReader::EntityReader(StableIndices& indices, Settings const& settings,
@@ -110,9 +93,15 @@ EntityReader::EntityReader(StableIndices& indices, Settings const& settings,
 EntityRows EntityReader::read(Snapshot const& snapshot) {
     if (isAsBefore(snapshot)) {
         m_indices.presentAgain();
-    } else if (build(snapshot)) {
-        if (m_physical) m_lastChange = m_uptime.now();
-        join();
+    } else {
+        // If this reading throws, the next one finds what it has left undone.
+        bool const anew = std::exchange(m_anew, true);
+        m_exchanges.begin(snapshot.boards.size(), anew);
+        if (build(snapshot, anew)) {
+            if (m_physical) m_lastChange = m_uptime.now();
+            join();
+        }
+        m_anew = false;
     }
     m_indices.save();
     return {m_physical,
@@ -124,16 +113,16 @@ EntityRows EntityReader::read(Snapshot const& snapshot) {
 }
 
 bool EntityReader::isAsBefore(Snapshot const& snapshot) const {
-    return m_physical != nullptr && m_known && m_indices.areKnown() &&
-           snapshot.boards.shares(m_boardRows) && snapshot.interfaces.ports.shares(m_portRows) &&
+    return !m_anew && m_known && m_indices.areKnown() && snapshot.boards.shares(m_boardRows) &&
+           snapshot.interfaces.ports.shares(m_portRows) &&
            snapshot.interfaces.interfaces.shares(m_interfaceRows) &&
            snapshot.records == m_records && m_settings.all(SettingIndex::Entity) == m_set;
 }
 
-bool EntityReader::build(Snapshot const& snapshot) {
+bool EntityReader::build(Snapshot const& snapshot, bool anew) {
     std::vector<SettingEntry> set = m_settings.all(SettingIndex::Entity);
     // While indices are waited for, they have to be asked for every time.
-    bool const anew = m_physical == nullptr || set != m_set || !m_indices.areKnown() || !m_known;
+    anew = anew || set != m_set || !m_indices.areKnown() || !m_known;
     m_known = m_indices.areKnown();
     m_set = std::move(set);
     m_setOf.clear();
@@ -151,13 +140,17 @@ bool EntityReader::build(Snapshot const& snapshot) {
         std::shared_ptr<Part const> const former = m_places;
         findSlots(snapshot.boards);
         changed = former == nullptr || *former != *m_places;
+        m_exchanges.add(former, m_places);
     } else {
         m_indices.presentAgain();
     }
     RowFinder const interfaces(snapshot.interfaces.interfaces);
     auto port = m_ports.cbegin();
     Origin origin; // one for all, because its vectors have room
-    auto const drop = [&](KnownBoard const& known) { changed = changed || known.part != nullptr; };
+    auto const drop = [&](KnownBoard const& known) {
+        changed = changed || known.part != nullptr;
+        m_exchanges.add(known.part, nullptr);
+    };
     m_boards.begin();
     for (std::size_t i = 0; i < keys.size(); ++i) {
         BoardRow const& board = snapshot.boards[i];
@@ -183,7 +176,8 @@ bool EntityReader::build(Snapshot const& snapshot) {
         if (anew || known.part == nullptr || known.origin != origin) {
             Part part = boardPart(origin);
             if (known.part == nullptr || *known.part != part) {
-                known.part = std::make_shared<Part const>(std::move(part));
+                auto const now = std::make_shared<Part const>(std::move(part));
+                m_exchanges.add(std::exchange(known.part, now), now);
                 changed = true;
             }
             std::swap(known.origin, origin);
@@ -324,14 +318,29 @@ void EntityReader::applySettings(PhysicalRow& row) const {
 }
 
 void EntityReader::join() {
-    auto const parts = std::make_shared<std::vector<std::shared_ptr<Part const>>>();
-    parts->push_back(m_places);
-    for (auto const& [boardIndex, known] : m_boards.all())
-        parts->push_back(known.part);
-    auto physical = std::make_shared<PhysicalEntities>();
-    physical->entities = joinedTable(*parts, parts, &Part::entities);
-    physical->contains = joinedTable(*parts, parts, &Part::contains);
-    physical->aliases = joinedTable(*parts, parts, &Part::aliases);
+    auto physical =
+        std::make_shared<PhysicalEntities>(m_physical ? *m_physical : PhysicalEntities{});
+    if (m_exchanges.areMany()) {
+        auto const parts = std::make_shared<std::vector<std::shared_ptr<Part const>>>();
+        parts->push_back(m_places);
+        for (auto const& [boardIndex, known] : m_boards.all())
+            parts->push_back(known.part);
+        auto const join = [&](auto& table, auto rowsOf) {
+            TableJoin joining(table, parts);
+            for (auto const& part : *parts)
+                joining.append((*part).*rowsOf);
+            joining.end();
+        };
+        join(physical->entities, &Part::entities);
+        join(physical->contains, &Part::contains);
+        join(physical->aliases, &Part::aliases);
+    } else {
+        auto const& parts = m_exchanges.all();
+        exchangeOf<PhysicalRow>(parts, &Part::entities).apply(physical->entities);
+        exchangeOf<ContainsRow>(parts, &Part::contains).apply(physical->contains);
+        exchangeOf<AliasRow>(parts, &Part::aliases).apply(physical->aliases);
+    }
+    m_exchanges.end();
     m_physical = std::move(physical);
 }
 

@@ -14,6 +14,7 @@
 #include "agent/readers/EntityStates.h"
 #include "agent/readers/PerBoard.h"
 #include "agent/readers/StableIndices.h"
+#include "agent/readers/TableJoin.h"
 #include "agent/rows/EntityRows.h"
 #include "agent/rows/PlatformRecords.h"
 #include "agent/rows/Rows.h"
@@ -71,8 +72,8 @@ class EntityReader {
     };
 
     bool isAsBefore(Snapshot const& snapshot) const;
-    /// Whether an entity is another than before.
-    bool build(Snapshot const& snapshot);
+    /// Whether an entity is another than before. `anew`: all are built.
+    bool build(Snapshot const& snapshot, bool anew);
     void findSlots(Rows<BoardRow> const& boards);
     void findPlace(Origin& origin) const;
     Part boardPart(Origin const& origin);
@@ -101,6 +102,8 @@ class EntityReader {
     std::shared_ptr<Part const> m_places; ///< the chassis and its slots
     std::vector<std::pair<std::uint32_t, std::size_t>> m_ports; ///< board index and place
     PerBoard<KnownBoard> m_boards;
+    PartExchanges<Part> m_exchanges;
+    bool m_anew = true; ///< nothing of the reading before can be used
     std::shared_ptr<PhysicalEntities const> m_physical; ///< null before the first reading
     std::uint32_t m_lastChange = 0;
 };

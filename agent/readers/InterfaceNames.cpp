@@ -2,7 +2,7 @@
 #include "agent/readers/InterfaceNames.h"
 
 #include <algorithm>
-#include <cstdint>
+#include <cstddef>
 #include <string_view>
 
 #include "agent/readers/Answers.h"
@@ -29,30 +29,12 @@ Words wordsOf(IndexKind kind) {
     }
 }
 
-/// `text` with `suffix`, of the longest length that is served.
+} // namespace
+
 std::string withSuffix(std::string const& text, std::string const& suffix) {
     std::size_t const room = kLongestText - std::min(suffix.size(), kLongestText);
     return printable(text.substr(0, room) + suffix);
 }
-
-/// Appends to each text that others have too. Returns whether there was one.
-template <class Suffix>
-bool appendToCommon(std::vector<InterfaceTexts>& interfaces, std::string InterfaceTexts::*text,
-                    Suffix suffix) {
-    std::unordered_map<std::string_view, int> counts;
-    counts.reserve(interfaces.size());
-    for (InterfaceTexts const& each : interfaces)
-        ++counts[each.*text];
-    if (counts.size() == interfaces.size()) return false;
-    std::vector<InterfaceTexts*> common;
-    for (InterfaceTexts& each : interfaces)
-        if (counts.at(each.*text) > 1) common.push_back(&each);
-    for (InterfaceTexts* const each : common)
-        each->*text = withSuffix(each->*text, suffix(*each));
-    return true;
-}
-
-} // namespace
 
 void completeName(InterfaceRow& row, IndexKey const& key, std::string const& board) {
     Words const words = wordsOf(key.kind);
@@ -63,21 +45,6 @@ void completeName(InterfaceRow& row, IndexKey const& key, std::string const& boa
     if (row.description.empty())
         row.description =
             withSuffix(std::string(words.description) + " " + key.name, " of board " + board);
-}
-
-void distinguishNames(std::vector<InterfaceTexts>& interfaces,
-                      std::unordered_map<std::uint32_t, std::string> const& boards) {
-    auto const board = [&](InterfaceTexts const& row) {
-        auto const found = boards.find(row.boardIndex);
-        return found == boards.end() ? std::string() : found->second;
-    };
-    auto const index = [](InterfaceTexts const& row) { return "#" + std::to_string(row.ifIndex); };
-    if (appendToCommon(interfaces, &InterfaceTexts::name,
-                       [&](InterfaceTexts const& row) { return "@" + board(row); }))
-        appendToCommon(interfaces, &InterfaceTexts::name, index);
-    if (appendToCommon(interfaces, &InterfaceTexts::description,
-                       [&](InterfaceTexts const& row) { return " of board " + board(row); }))
-        appendToCommon(interfaces, &InterfaceTexts::description, index);
 }
 
 } // namespace kvloamd

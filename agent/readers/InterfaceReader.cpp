@@ -3,13 +3,14 @@
 
 #include <algorithm>
 #include <array>
-#include <functional>
+#include <iterator>
+#include <optional>
 #include <set>
-#include <span>
 #include <utility>
 
 #include "agent/readers/BoardFaults.h"
 #include "agent/readers/Courtesy.h"
+#include "agent/readers/InterfaceNames.h"
 #include "agent/readers/InterfaceStates.h"
 #include "agent/readers/LongCounters.h"
 #include "board/DS1LineDevice.h"
@@ -62,32 +63,6 @@ std::array<std::uint64_t, kInterfaceCounters> interfaceLimits(CountLimits const&
     return all;
 }
 
-/// A `Joining` puts a table of all boards together from the boards' own.
-template <class Row>
-class Joining {
-  public:
-    Joining(Rows<Row>& all, std::shared_ptr<void const> owner) : m_all(all) {
-        m_all.clear();
-        m_all.append({}, std::move(owner));
-    }
-    /// Appends the rows of a board, which are ascending.
-    void append(std::span<Row const> rows, std::shared_ptr<void const> owner = nullptr) {
-        if (rows.empty()) return;
-        // Boards come in the order of their indices, and mostly got their ifIndices in this order.
-        m_sorted = m_sorted && (m_last == nullptr || m_last->index() < rows.front().index());
-        m_last = &rows.back();
-        m_all.append(rows, std::move(owner));
-    }
-    void end() {
-        if (!m_sorted) m_all.sortBy([](Row const& row) { return row.index(); });
-    }
-
-  private:
-    Rows<Row>& m_all;
-    Row const* m_last = nullptr;
-    bool m_sorted = true;
-};
-
 } // namespace
 
 InterfaceReader::InterfaceReader(BoardManager& manager, StableIndices& indices,
@@ -101,8 +76,11 @@ InterfaceReader::InterfaceReader(BoardManager& manager, StableIndices& indices,
       m_changeTimes(started, m_clocks) {}
 
 InterfaceRows InterfaceReader::read(Rows<BoardRow> const& boards) {
+    // Also if this reading throws, so that the next one finds what it has left undone.
+    bool const anew = std::exchange(m_anew, true);
     ++m_reading;
     m_changes = {};
+    m_joined.begin(boards.size(), anew);
     m_histories.begin(m_clocks.now());
     std::vector<BoardKey> const& keys = m_keys.of(boards);
     if (m_keys.areAsBefore()) m_indices.presentAgain();
@@ -114,22 +92,21 @@ InterfaceRows InterfaceReader::read(Rows<BoardRow> const& boards) {
     }
     m_boards.end(dropGone);
     m_indices.save();
-    if (m_changes.texts) distinguish();
-    if (m_changes.tables) joinTables();
-    if (m_changes.lines || m_changes.lineObjects) joinLines();
-    if (m_changes.tables) noteChanges();
+    distinguish(anew);
+    join(anew);
     m_read = true;
-    return m_all;
+    m_anew = m_turns == nullptr;
+    return m_joined.all();
 }
 
 void InterfaceReader::readBoard(KnownBoard& known, BoardRow const& row, BoardKey const& key) {
     bool full = known.rows == nullptr || !known.isShareable || isDue(m_turns, row.boardIndex);
     if (known.rows == nullptr || known.key != key || known.serialNumber != row.serialNumber) {
         full = true;
+        known.boardIndex = row.boardIndex;
         known.key = key;
         known.name = key.stable ? key.name : std::to_string(row.boardIndex);
         known.serialNumber = row.serialNumber;
-        m_changes.texts = true;
     }
     bool const answers = readGuarded(row.boardIndex, "interfaces", [&] {
         if (full || !readCounts(known))
@@ -142,11 +119,11 @@ void InterfaceReader::readBoard(KnownBoard& known, BoardRow const& row, BoardKey
 
 bool InterfaceReader::readCounts(KnownBoard& known) {
     for (KnownLine const& line : known.lineObjects)
-        if (checkLine(*line.line.get()) != line.check) return false;
+        if (checkLine(*line.line.unlocked()) != line.check) return false;
     LineRows read;
     for (std::size_t i = 0; i < known.lineObjects.size(); ++i) {
         KnownLine const& line = known.lineObjects[i];
-        if (line.history.get() == nullptr) continue;
+        if (line.history.unlocked() == nullptr) continue;
         LineRow const& row = (*known.lines)[i];
         // While a line is unavailable, every reading settles something.
         bool const unavailable = (row.lineStatus.value_or(0) & DS1LineStatusUnavailSigState) != 0;
@@ -156,8 +133,7 @@ bool InterfaceReader::readCounts(KnownBoard& known) {
         m_lineTotals.add(read[i].ifIndex, read[i]);
     }
     if (read.empty() || read == *known.lines) return true;
-    known.lines = std::make_shared<LineRows const>(std::move(read));
-    m_changes.lines = true;
+    showLines(known, std::move(read));
     return true;
 }
 
@@ -178,7 +154,10 @@ void InterfaceReader::drop(KnownBoard& known) {
     if (known.lines != nullptr)
         for (LineRow const& line : *known.lines)
             m_lineTotals.rest(line.ifIndex);
-    if (known.rows != nullptr) m_changes = {true, true, true, true};
+    m_joined.exchange(std::move(known.joined), nullptr);
+    m_joined.exchange(std::move(known.lines), nullptr);
+    if (!known.texts.board.empty()) m_names.remove(std::move(known.texts));
+    if (!known.lineObjects.empty()) m_changes.lineObjects.insert(known.boardIndex);
     known = {};
 }
 
@@ -259,115 +238,126 @@ void InterfaceReader::placeLines(KnownBoard& known, BoardInterfaces& found,
             if (!std::ranges::binary_search(rows, former.ifIndex, {}, &LineRow::ifIndex))
                 m_lineTotals.rest(former.ifIndex);
     auto const isSame = [](KnownLine const& one, KnownLine const& other) {
-        return one.line.get() == other.line.get();
+        return one.line.unlocked() == other.line.unlocked();
     };
-    if (!std::ranges::equal(objects, known.lineObjects, isSame)) m_changes.lineObjects = true;
+    auto const index = &LineRow::ifIndex;
+    if (known.lines == nullptr || !std::ranges::equal(objects, known.lineObjects, isSame) ||
+        !std::ranges::equal(rows, *known.lines, {}, index, index))
+        m_changes.lineObjects.insert(boardIndex);
     // The resources of the board may say the same of its lines.
     if (m_turns != nullptr &&
         !std::ranges::equal(objects, known.lineObjects, {}, &KnownLine::check, &KnownLine::check))
         m_turns->add(boardIndex);
     known.lineObjects = std::move(objects);
     if (known.lines != nullptr && *known.lines == rows) return;
-    known.lines = std::make_shared<LineRows const>(std::move(rows));
-    m_changes.lines = true;
+    showLines(known, std::move(rows));
+}
+
+void InterfaceReader::showLines(KnownBoard& known, LineRows&& rows) {
+    auto shown = std::make_shared<LineRows const>(std::move(rows));
+    m_joined.exchange(std::exchange(known.lines, shown), shown);
 }
 
 void InterfaceReader::placeTables(KnownBoard& known, BoardInterfaceRows&& placed) {
-    std::vector<InterfaceTexts> texts;
-    texts.reserve(placed.interfaces.size());
+    BoardTexts texts{known.name, {}};
+    texts.interfaces.reserve(placed.interfaces.size());
     for (InterfaceRow const& row : placed.interfaces)
-        texts.push_back({row.ifIndex, row.boardIndex, row.name, row.description});
+        texts.interfaces.push_back({row.ifIndex, row.name, row.description});
     if (known.rows != nullptr && texts == known.texts) {
         // They were made different from the others' before.
-        for (std::size_t i = 0; i < texts.size(); ++i) {
+        for (std::size_t i = 0; i < placed.interfaces.size(); ++i) {
             placed.interfaces[i].name = known.rows->interfaces[i].name;
             placed.interfaces[i].description = known.rows->interfaces[i].description;
         }
     } else {
+        m_changes.texts.insert(known.boardIndex);
+        if (!known.texts.board.empty()) m_names.remove(std::exchange(known.texts, {}));
+        m_names.add(texts);
         known.texts = std::move(texts);
-        m_changes.texts = true;
     }
     if (known.rows != nullptr && *known.rows == placed) return;
-    if (m_turns != nullptr && !placed.interfaces.empty())
-        m_turns->add(placed.interfaces.front().boardIndex);
+    if (m_turns != nullptr && !placed.interfaces.empty()) m_turns->add(known.boardIndex);
+    m_changes.tables.insert(known.boardIndex);
     known.rows = std::make_shared<BoardInterfaceRows const>(std::move(placed));
-    m_changes.tables = true;
 }
 
-void InterfaceReader::distinguish() {
-    std::vector<InterfaceTexts> all;
-    std::unordered_map<std::uint32_t, std::string> names;
-    for (auto const& [boardIndex, known] : m_boards.all()) {
-        all.insert(all.end(), known.texts.begin(), known.texts.end());
-        names.emplace(boardIndex, known.name);
+void InterfaceReader::distinguish(bool anew) {
+    if (!anew && m_names.update()) {
+        for (std::uint32_t const boardIndex : m_changes.texts)
+            if (KnownBoard* const known = m_boards.find(boardIndex)) distinguish(*known);
+        return;
     }
-    distinguishNames(all, names);
-    auto next = all.cbegin();
-    for (auto& [boardIndex, known] : m_boards.all()) {
-        auto const texts = next;
-        next += std::ssize(known.texts);
-        if (known.rows == nullptr) continue;
-        auto const isCalled = [](InterfaceRow const& row, InterfaceTexts const& called) {
-            return row.name == called.name && row.description == called.description;
-        };
-        if (std::equal(known.rows->interfaces.begin(), known.rows->interfaces.end(), texts,
-                       isCalled))
-            continue;
-        auto rows = std::make_shared<BoardInterfaceRows>(*known.rows);
-        for (std::size_t i = 0; i < rows->interfaces.size(); ++i) {
-            InterfaceTexts const& called = texts[static_cast<std::ptrdiff_t>(i)];
-            rows->interfaces[i].name = called.name;
-            rows->interfaces[i].description = called.description;
-        }
-        known.rows = std::move(rows);
-        m_changes.tables = true;
+    std::vector<BoardTexts const*> all;
+    for (auto const& [boardIndex, known] : m_boards.all())
+        if (known.rows != nullptr) all.push_back(&known.texts);
+    m_names.countAnew(all);
+    for (auto& [boardIndex, known] : m_boards.all())
+        distinguish(known);
+}
+
+void InterfaceReader::distinguish(KnownBoard& known) {
+    if (known.rows == nullptr) return;
+    std::vector<InterfaceTexts> const texts = m_names.distinguish(known.texts);
+    auto const isCalled = [](InterfaceRow const& row, InterfaceTexts const& called) {
+        return row.name == called.name && row.description == called.description;
+    };
+    if (std::ranges::equal(known.rows->interfaces, texts, isCalled)) return;
+    auto rows = std::make_shared<BoardInterfaceRows>(*known.rows);
+    for (std::size_t i = 0; i < texts.size(); ++i) {
+        rows->interfaces[i].name = texts[i].name;
+        rows->interfaces[i].description = texts[i].description;
     }
+    m_changes.tables.insert(known.boardIndex);
+    known.rows = std::move(rows);
 }
 
-void InterfaceReader::joinTables() {
-    auto const parts = std::make_shared<std::vector<std::shared_ptr<BoardInterfaceRows const>>>();
-    for (auto const& [boardIndex, known] : m_boards.all())
-        if (known.rows != nullptr) parts->push_back(known.rows);
-    auto const join = [&](auto& all, auto table) {
-        Joining joining(all, parts);
-        for (auto const& part : *parts)
-            joining.append((*part).*table);
-        joining.end();
+void InterfaceReader::join(bool anew) {
+    if (anew)
+        for (auto& [boardIndex, known] : m_boards.all())
+            known.joined = known.rows;
+    for (std::uint32_t const boardIndex : m_changes.tables)
+        if (KnownBoard* const known = m_boards.find(boardIndex))
+            m_joined.exchange(std::exchange(known->joined, known->rows), known->rows);
+    auto const partsOf = [this]<class Part>(std::shared_ptr<Part const> KnownBoard::*part) {
+        std::vector<std::shared_ptr<Part const>> parts;
+        for (auto const& [boardIndex, known] : m_boards.all())
+            if (known.*part != nullptr) parts.push_back(known.*part);
+        return parts;
     };
-    using Tables = InterfaceTables<RowVector>;
-    join(m_all.interfaces, &Tables::interfaces);
-    join(m_all.bearers, &Tables::bearers);
-    join(m_all.ds0Channels, &Tables::ds0Channels);
-    join(m_all.signalling, &Tables::signalling);
-    join(m_all.lapds, &Tables::lapds);
-    join(m_all.ethernets, &Tables::ethernets);
-    join(m_all.receiveAddresses, &Tables::receiveAddresses);
-    join(m_all.ports, &Tables::ports);
-    // The topmost interfaces of all boards come first, above which there is nothing.
-    Joining stack(m_all.stack, parts);
-    auto const lowerRows = [](BoardInterfaceRows const& part) {
-        return std::ranges::partition_point(part.stack,
-                                            [](StackRow const& row) { return row.higher == 0; });
-    };
-    for (auto const& part : *parts)
-        stack.append({part->stack.begin(), lowerRows(*part)});
-    for (auto const& part : *parts)
-        stack.append({lowerRows(*part), part->stack.end()});
-    stack.end();
+    std::optional<std::uint32_t> now;
+    if (m_read) now = m_uptime.at(m_clocks.now());
+    m_joined.update([&] { return partsOf(&KnownBoard::rows); },
+                    [&] { return partsOf(&KnownBoard::lines); }, now);
+    joinLineObjects(anew);
 }
 
-void InterfaceReader::joinLines() {
-    Joining joining(m_all.lines, nullptr);
-    for (auto const& [boardIndex, known] : m_boards.all())
-        if (known.lines != nullptr) joining.append(*known.lines, known.lines);
-    joining.end();
-    countIntervals(m_all);
-    if (!m_changes.lineObjects) return;
-    m_lines.clear();
-    m_lines.reserve(m_all.lines.size());
-    for (auto const& [boardIndex, known] : m_boards.all())
+void InterfaceReader::joinLineObjects(bool anew) {
+    auto const linesOf = [](KnownBoard const& known) {
+        std::vector<PlacedLine> lines;
         for (std::size_t i = 0; i < known.lineObjects.size(); ++i)
-            m_lines.push_back({(*known.lines)[i].ifIndex, known.lineObjects[i].line, boardIndex});
+            lines.push_back(
+                {(*known.lines)[i].ifIndex, known.lineObjects[i].line, known.boardIndex});
+        return lines;
+    };
+    auto const insert = [this](auto place, std::vector<PlacedLine>&& lines) {
+        m_lines.insert(place, std::make_move_iterator(lines.begin()),
+                       std::make_move_iterator(lines.end()));
+    };
+    if (anew || m_changes.lineObjects.size() > m_boards.all().size() / 8) {
+        m_lines.clear();
+        for (auto const& [boardIndex, known] : m_boards.all())
+            insert(m_lines.end(), linesOf(known));
+        return;
+    }
+    for (std::uint32_t const boardIndex : m_changes.lineObjects) {
+        auto const first =
+            std::ranges::lower_bound(m_lines, boardIndex, {}, &PlacedLine::boardIndex);
+        auto const last =
+            std::ranges::upper_bound(m_lines, boardIndex, {}, &PlacedLine::boardIndex);
+        auto const place = m_lines.erase(first, last);
+        if (KnownBoard const* const known = m_boards.find(boardIndex))
+            insert(place, linesOf(*known));
+    }
 }
 
 void InterfaceReader::countOn(InterfaceRow& row, Counted& counted, bool isNew,
@@ -409,17 +399,6 @@ void InterfaceReader::noteOperStatus(InterfaceRow& row, Counted& counted,
         counted.lastChange = isSaid ? *row.lastChange : seen;
     }
     row.lastChange = counted.lastChange;
-}
-
-void InterfaceReader::noteChanges() {
-    std::vector<std::uint32_t> indices;
-    indices.reserve(m_all.interfaces.size());
-    for (InterfaceRow const& row : m_all.interfaces)
-        indices.push_back(row.ifIndex);
-    if (m_read && indices != m_formerIndices) m_all.lastChange = m_uptime.at(m_clocks.now());
-    if (m_read && m_all.stack != m_formerStack) m_all.stackLastChange = m_uptime.at(m_clocks.now());
-    m_formerIndices = std::move(indices);
-    m_formerStack = m_all.stack;
 }
 
 } // namespace kvloamd

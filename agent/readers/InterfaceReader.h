@@ -5,6 +5,8 @@
 #include <cstdint>
 #include <functional>
 #include <memory>
+#include <optional>
+#include <set>
 #include <string>
 #include <unordered_map>
 #include <vector>
@@ -13,7 +15,8 @@
 #include "agent/readers/BoardKeys.h"
 #include "agent/readers/BoardTurns.h"
 #include "agent/readers/ChangeTimes.h"
-#include "agent/readers/InterfaceNames.h"
+#include "agent/readers/DistinctNames.h"
+#include "agent/readers/JoinedInterfaces.h"
 #include "agent/readers/PerBoard.h"
 #include "agent/readers/PlacedLine.h"
 #include "agent/readers/SettledTotals.h"
@@ -69,24 +72,25 @@ class InterfaceReader {
     using LineRows = std::vector<LineRow>;
     /// A board as it was read last. New while it has no rows.
     struct KnownBoard {
+        std::uint32_t boardIndex = 0;
         BoardKey key;
         std::string name;         ///< in the names of its interfaces
         std::string serialNumber; ///< as its interfaces have it
         /// All tables except for the lines'.
         std::shared_ptr<BoardInterfaceRows const> rows;
+        std::shared_ptr<BoardInterfaceRows const> joined; ///< `rows` as the joined tables have them
         std::shared_ptr<LineRows const> lines;
         std::vector<KnownLine> lineObjects; ///< in the order of `lines`
-        std::vector<InterfaceTexts> texts;  ///< before they are made different, in order of rows
+        BoardTexts texts; ///< before they are made different, in order of rows; empty: no rows
         std::unordered_map<std::uint32_t, Counted> counted; ///< by ifIndex
         /// It has only lines, which count nothing but their histories, and all have an index.
         bool isShareable = false;
     };
-    /// What is no longer as it was in the reading before.
+    /// The boards of which something is no longer as it was in the reading before.
     struct Changes {
-        bool tables = false;
-        bool lines = false;
-        bool lineObjects = false;
-        bool texts = false;
+        std::set<std::uint32_t> tables;
+        std::set<std::uint32_t> lineObjects;
+        std::set<std::uint32_t> texts;
     };
 
     void readBoard(KnownBoard& known, BoardRow const& row, BoardKey const& key);
@@ -99,16 +103,19 @@ class InterfaceReader {
     void placeLines(KnownBoard& known, BoardInterfaces& found,
                     std::vector<std::uint32_t> const& indices, std::uint32_t boardIndex);
     void placeTables(KnownBoard& known, BoardInterfaceRows&& placed);
+    void showLines(KnownBoard& known, LineRows&& rows);
     /// Makes the names and descriptions of all boards' interfaces different from each other.
-    void distinguish();
-    void joinTables();
-    void joinLines();
+    /// `anew`: without what is known of the reading before; so are the next two.
+    void distinguish(bool anew);
+    void distinguish(KnownBoard& known);
+    /// Puts the tables of all boards together.
+    void join(bool anew);
+    void joinLineObjects(bool anew);
     /// Extends the counters of the interface that gets `ifIndex`. `ethernet`: null if it is none.
     void countOn(InterfaceRow& row, Counted& counted, bool isNew, EthernetRow* ethernet,
                  Clock::time_point now);
     /// Says when the row's ifOperStatus changed, whatever else of the interface has changed.
     void noteOperStatus(InterfaceRow& row, Counted& counted, Clock::time_point now) const;
-    void noteChanges();
 
     BoardManager& m_manager;
     StableIndices& m_indices;
@@ -122,12 +129,12 @@ class InterfaceReader {
     KnownBoardKeys m_keys;
     PerBoard<KnownBoard> m_boards;
     Changes m_changes; ///< in this reading
-    InterfaceRows m_all;
+    DistinctNames m_names;
+    JoinedInterfaces m_joined;
     std::vector<PlacedLine> m_lines;
     std::uint64_t m_reading = 0; ///< which one this is
     bool m_read = false;
-    std::vector<std::uint32_t> m_formerIndices;
-    Rows<StackRow> m_formerStack;
+    bool m_anew = true; ///< nothing that was joined before can be used
 };
 
 } // namespace kvloamd

@@ -72,7 +72,7 @@ void LineHistories::begin(Clock::time_point now) {
 }
 
 bool LineHistories::stands(ReferenceCounter<DS1IntervalTable> const& handle, LineRow const& row) {
-    DS1IntervalTable& table = *handle.get();
+    DS1IntervalTable& table = *handle.unlocked();
     auto const found = m_kept.find(&table);
     if (found == m_kept.end()) return false;
     Kept& kept = found->second;
@@ -88,7 +88,7 @@ bool LineHistories::stands(ReferenceCounter<DS1IntervalTable> const& handle, Lin
 }
 
 void LineHistories::read(ReferenceCounter<DS1IntervalTable> const& handle, LineRow& row) {
-    DS1IntervalTable& table = *handle.get();
+    DS1IntervalTable& table = *handle.unlocked();
     int const elapsed = table.GetTimeElapsed();
     // The running interval lasts 900 seconds for the moment in which it is closed.
     row.timeElapsed = std::clamp(elapsed, 0, DS1IntervalTable::kIntervalLength - 1);

@@ -2,6 +2,7 @@
 // What a reader keeps of every board from one reading to the next.
 #pragma once
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <utility>
@@ -30,6 +31,12 @@ class PerBoard {
         dropUntil(std::uint64_t{1} << 32U, drop);
     }
 
+    /// What is kept of the board of this index. Null: nothing.
+    Kept* find(std::uint32_t index) {
+        auto const found =
+            std::ranges::lower_bound(m_all, index, {}, [](auto const& each) { return each.first; });
+        return found == m_all.end() || found->first != index ? nullptr : &found->second;
+    }
     /// With their board indices, ascending.
     std::vector<std::pair<std::uint32_t, Kept>>& all() { return m_all; }
 

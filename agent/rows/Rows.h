@@ -135,6 +135,35 @@ class Rows {
             contents.places.push_back(&row);
         if (owner) contents.owners.push_back(std::move(owner));
     }
+    /// Puts the rows `come`, which lie in `owners`, in the place of those that have the indices of
+    /// `gone`. The sequence and both lists are ascending by index, each without an index twice.
+    void exchange(std::span<Row const* const> gone, std::span<Row const* const> come,
+                  std::span<std::shared_ptr<void const> const> owners) {
+        auto const index = [](Row const* row) { return row->index(); };
+        auto const next = std::make_shared<Contents>();
+        if (m_contents) next->owners = m_contents->owners;
+        next->owners.insert(next->owners.end(), owners.begin(), owners.end());
+        Places const none;
+        Places const& former = m_contents ? m_contents->places : none;
+        next->places.reserve(former.size() + come.size());
+        auto from = former.begin();
+        while (!gone.empty() || !come.empty()) {
+            bool const takesOut =
+                come.empty() || (!gone.empty() && index(gone.front()) <= index(come.front()));
+            auto& rows = takesOut ? gone : come;
+            auto const to =
+                std::ranges::lower_bound(from, former.end(), index(rows.front()), {}, index);
+            next->places.insert(next->places.end(), from, to);
+            from = to;
+            if (!takesOut)
+                next->places.push_back(rows.front());
+            else if (from != former.end() && index(*from) == index(rows.front()))
+                ++from;
+            rows = rows.subspan(1);
+        }
+        next->places.insert(next->places.end(), from, former.end());
+        m_contents = next;
+    }
     /// Sorts the sequence by what `index` says of a row.
     template <class Index>
     void sortBy(Index index) {

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // Readings that share what has not changed, against readings of everything, while the simulated
 // platform changes at random.
+#include <algorithm>
 #include <array>
 #include <atomic>
 #include <chrono>
@@ -78,7 +79,8 @@ class Reading {
         : m_source(manager, turns),
           m_interfaces(manager, m_indices, started, turns, readersClocks()),
           m_resources(manager, turns),
-          m_entities(m_entityIndices, m_settings, started, [] { return 1'000'000'000L; }) {}
+          m_isFull(turns == nullptr),
+          m_started(started) {}
 
     BoardSource& source() { return m_source; }
     Settings& settings() { return m_settings; }
@@ -91,7 +93,10 @@ class Reading {
         snapshot.interfaces = m_interfaces.read(snapshot.boards);
         snapshot.resources = m_resources.read(snapshot.boards);
         snapshot.faults.rows = faults;
-        snapshot.entities = m_entities.read(snapshot);
+        if (!m_entities || m_isFull)
+            m_entities.emplace(m_entityIndices, m_settings, m_started,
+                               [] { return 1'000'000'000L; });
+        snapshot.entities = m_entities->read(snapshot);
         noteWhereabouts(snapshot);
         return snapshot;
     }
@@ -104,7 +109,9 @@ class Reading {
     PlatformReader m_platform{std::chrono::milliseconds(0), false};
     StableIndices m_entityIndices{1};
     Settings m_settings;
-    EntityReader m_entities;
+    bool m_isFull;
+    Clock::time_point m_started;
+    std::optional<EntityReader> m_entities;
 };
 
 std::vector<LineCounts> countsOf(ClosedIntervals const& closed) {
@@ -143,6 +150,16 @@ void compareRows(char const* name, Rows<Row> const& shared, Rows<Row> const& ful
         difference += std::string(name) + " differs in row " + std::to_string(i) + "; ";
         return;
     }
+}
+
+/// Appends whether the lines are others, or in other places.
+void compareLines(std::vector<PlacedLine> const& shared, std::vector<PlacedLine> const& full,
+                  std::string& difference) {
+    auto const isSame = [](PlacedLine const& one, PlacedLine const& other) {
+        return one.ifIndex == other.ifIndex && one.line.get() == other.line.get() &&
+               one.boardIndex == other.boardIndex;
+    };
+    if (!std::ranges::equal(shared, full, isSame)) difference += "the lines' objects differ; ";
 }
 
 /// Empty when both say the same.
@@ -422,12 +439,21 @@ TEST(SharedReadingTest, SharingShowsWhatReadingEverythingShows) {
     std::vector<FaultRow> faults;
     std::string since;
     std::size_t shownLines = 0;
+    Snapshot former;
+    Snapshot formerInFull;
     for (int step = 0; step < kSteps; ++step) {
         since += platform.change(*shared, *full, faults) + "\n";
         if (step % kChangesOfAReading != 0) continue;
         Snapshot const one = shared->read(faults);
         Snapshot const other = full->read(faults);
-        ASSERT_EQ(difference(one, other), "") << "step " << step << ", after\n" << since;
+        std::string different = difference(one, other);
+        compareLines(shared->lines(), full->lines(), different);
+        ASSERT_EQ(different, "") << "step " << step << ", after\n" << since;
+        ASSERT_EQ(difference(former, formerInFull), "")
+            << "the snapshot before step " << step << " has changed, after\n"
+            << since;
+        former = one;
+        formerInFull = other;
         since.clear();
         shownLines += one.interfaces.lines.size();
     }

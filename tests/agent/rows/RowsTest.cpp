@@ -5,7 +5,9 @@
 #include <array>
 #include <cstdint>
 #include <iterator>
+#include <map>
 #include <memory>
+#include <random>
 #include <string>
 #include <vector>
 
@@ -123,6 +125,80 @@ TEST(RowFinderTest, RowsAreFoundInAnyOrder) {
     EXPECT_EQ(finder.find(3), nullptr);
     EXPECT_EQ(finder.find(7), nullptr);
     EXPECT_EQ(finder.find(0), nullptr);
+}
+
+/// Rows of these numbers, whose text tells which generation they are of.
+std::shared_ptr<std::vector<Row> const> generation(std::vector<std::uint32_t> const& numbers,
+                                                   std::string const& text) {
+    std::vector<Row> rows;
+    for (std::uint32_t const number : numbers)
+        rows.push_back({number, text});
+    return std::make_shared<std::vector<Row> const>(std::move(rows));
+}
+
+std::vector<Row const*> placesOf(std::vector<Row> const& rows) {
+    std::vector<Row const*> places;
+    for (Row const& row : rows)
+        places.push_back(&row);
+    return places;
+}
+
+void exchange(Rows<Row>& rows, std::vector<std::uint32_t> const& gone,
+              std::vector<std::uint32_t> const& come, std::string const& text) {
+    auto const former = generation(gone, "");
+    auto const now = generation(come, text);
+    std::vector<std::shared_ptr<void const>> const owners{now};
+    rows.exchange(placesOf(*former), placesOf(*now), owners);
+}
+
+TEST(RowsTest, ExchangePutsRowsWhereTheirIndicesBelong) {
+    Rows<Row> rows{{2, "old"}, {4, "old"}, {6, "old"}};
+    exchange(rows, {4, 6}, {1, 5, 6, 9}, "new");
+    EXPECT_EQ(rows, (Rows<Row>{{1, "new"}, {2, "old"}, {5, "new"}, {6, "new"}, {9, "new"}}));
+}
+
+TEST(RowsTest, ExchangeLeavesCopiesAsTheyAre) {
+    Rows<Row> rows{{2, "old"}, {4, "old"}};
+    Rows<Row> const copy = rows;
+    exchange(rows, {2, 4}, {}, "");
+    EXPECT_TRUE(rows.empty());
+    EXPECT_EQ(copy, (Rows<Row>{{2, "old"}, {4, "old"}}));
+    EXPECT_FALSE(copy.shares(rows));
+}
+
+TEST(RowsTest, ExchangedRowsStayInMemoryAsLongAsASequenceHasThem) {
+    Rows<Row> rows;
+    exchange(rows, {}, {1, 2}, std::string(100, 'a'));
+    Rows<Row> const copy = rows;
+    for (int time = 0; time < 3; ++time)
+        exchange(rows, {1}, {1}, std::string(100, 'b'));
+    EXPECT_EQ(copy[0].text, std::string(100, 'a'));
+    EXPECT_EQ(rows[0].text, std::string(100, 'b'));
+    EXPECT_EQ(rows[1].text, std::string(100, 'a'));
+}
+
+TEST(RowsTest, AnyExchangeIsThatOfASet) {
+    std::mt19937 random(20261122);
+    Rows<Row> rows;
+    std::map<std::uint32_t, std::string> model;
+    for (int step = 0; step < 500; ++step) {
+        std::vector<std::uint32_t> gone;
+        std::vector<std::uint32_t> come;
+        std::string const text = std::to_string(step);
+        for (std::uint32_t number = 1; number <= 40; ++number) {
+            bool const goes = model.contains(number) && random() % 4 == 0;
+            bool const comes = (goes || !model.contains(number)) && random() % 4 == 0;
+            if (goes) gone.push_back(number);
+            if (comes) come.push_back(number);
+            if (goes) model.erase(number);
+            if (comes) model[number] = text;
+        }
+        exchange(rows, gone, come, text);
+        Rows<Row> expected;
+        for (auto const& [number, of] : model)
+            expected.push_back({number, of});
+        ASSERT_EQ(rows, expected) << "step " << step;
+    }
 }
 
 } // namespace
