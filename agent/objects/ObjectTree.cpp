@@ -55,8 +55,16 @@ ObjectTree::ObjectTree(std::span<Scalar const> scalars, std::span<Table const* c
 }
 
 std::vector<ObjectTree::Node>::const_iterator ObjectTree::nodeAbove(OidView name) const {
-    return std::ranges::partition_point(
+    // A walk mostly stays in a column. Whatever is above the column is above the name, too.
+    std::size_t const last = m_lastAbove.load(std::memory_order_relaxed);
+    if (last <= m_nodes.size() && startsWith(name, m_nodes[last - 1].place))
+        return m_nodes.begin() + static_cast<std::ptrdiff_t>(last);
+    auto const above = std::ranges::partition_point(
         m_nodes, [&](Node const& node) { return std::is_lteq(compare(node.place, name)); });
+    if (above != m_nodes.begin())
+        m_lastAbove.store(static_cast<std::size_t>(above - m_nodes.begin()),
+                          std::memory_order_relaxed);
+    return above;
 }
 
 ObjectTree::Node const* ObjectTree::nodeOf(OidView name) const {
@@ -143,6 +151,7 @@ bool ObjectTree::firstIn(Node const& node, Facts const& facts, OidView index, bo
         if (!fill(found, node, facts, node.scalar->get(facts))) return false;
         found.name = node.place;
         found.name.push_back(kScalarIndex[0]);
+        found.object = node.place;
         return true;
     }
     std::size_t const rows = node.table->rowCount(facts);
@@ -151,6 +160,7 @@ bool ObjectTree::firstIn(Node const& node, Facts const& facts, OidView index, bo
         found.name.reserve(kUsualName);
         found.name = node.place;
         node.table->appendIndex(facts, row, found.name);
+        found.object = node.place;
         return true;
     }
     return false;

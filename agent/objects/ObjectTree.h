@@ -2,6 +2,8 @@
 // Finds instances of managed objects by name, and the next one in order.
 #pragma once
 
+#include <atomic>
+#include <cstddef>
 #include <cstdint>
 #include <optional>
 #include <span>
@@ -13,7 +15,8 @@ namespace kvloamd {
 
 /// One instance and its value. The value is good while the facts that it came from are.
 struct Instance {
-    Oid name; ///< relative
+    Oid name;       ///< relative
+    OidView object; ///< the beginning of `name` that is the object's place; of the tree
     ValueType type = ValueType::Integer;
     Value value;
 };
@@ -48,14 +51,15 @@ struct Change {
     std::optional<SettingValue> value;
 };
 
-/// An `ObjectTree` holds all scalars and columns in the order of their places. Immutable. Every
-/// search is binary: over the objects, then over a table's rows.
+/// An `ObjectTree` holds all scalars and columns in the order of their places. Thread-safe: nothing
+/// but the place where a search begins ever changes. A search looks first where the last one ended;
+/// if it does not find the name there, it is binary: over the objects, then over a table's rows.
 class ObjectTree {
   public:
     /// `scalars` and `tables` outlive the tree.
     ObjectTree(std::span<Scalar const> scalars, std::span<Table const* const> tables);
 
-    /// The value of the instance `name`; `found.name` stays as it is.
+    /// The value of the instance `name`; `found.name` and `found.object` stay as they are.
     Lookup find(Facts const& facts, OidView name, Instance& found) const;
 
     /// The first instance after `name`, or at `name` if `orEqual`. False when there is none.
@@ -89,6 +93,8 @@ class ObjectTree {
                         Instance& found);
 
     std::vector<Node> m_nodes; ///< ascending; no place is the beginning of another
+    mutable std::atomic<std::size_t> m_lastAbove{1}; ///< what `nodeAbove` found last, and where it
+                                                     ///< looks first
 };
 
 } // namespace kvloamd

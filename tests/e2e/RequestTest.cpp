@@ -1,5 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 // Single requests: missing instances, read-only objects and views.
+#include <ostream>
+
 #include <gmock/gmock.h>
 
 #include "tests/e2e/AgentFixture.h"
@@ -7,10 +9,13 @@
 namespace kvloamd::e2e {
 namespace {
 
+using ::testing::AllOf;
 using ::testing::Each;
 using ::testing::ElementsAre;
+using ::testing::Gt;
 using ::testing::HasSubstr;
 using ::testing::IsEmpty;
+using ::testing::Lt;
 using ::testing::Not;
 using ::testing::SizeIs;
 
@@ -132,6 +137,73 @@ TEST_F(RestrictedViewTest, GetOfWhatTheReaderMayNotSeeIsNoObject) {
     startAgent();
     EXPECT_THAT(get("kvlBoardSerialNumber.1"), HasSubstr("No Such Object"));
 }
+
+/// What a view contains of the boards' table, in which the first board has row 1.
+struct PartialView {
+    char const* what;
+    std::vector<std::string> lines; ///< "included" or "excluded", the name below the entry, a mask
+
+    friend std::ostream& operator<<(std::ostream& to, PartialView const& view) {
+        return to << view.what;
+    }
+};
+
+/// Two readers: `public` has the view, `all` may see everything.
+class PartialViewTest : public AgentFixture, public ::testing::WithParamInterface<PartialView> {
+  protected:
+    PartialViewTest() {
+        std::string config = "com2sec reader 127.0.0.1 public\n"
+                             "group readers v2c reader\n"
+                             "access readers \"\" any noauth exact some none none\n"
+                             "rocommunity all 127.0.0.1\n";
+        for (std::string const& line : GetParam().lines)
+            config +=
+                "view some " + line.substr(0, 8) + " " + kTable + ".1" + line.substr(9) + "\n";
+        configureSnmp(config);
+    }
+    std::vector<std::string> namesOfAll() const {
+        std::vector<std::string> names;
+        Result const walked =
+            snmp("snmpbulkwalk", {"-v2c", "-c", "all", "-On", "-t", "30", address(), kTable});
+        for (Answer const& answer : parseAnswers(walked.output))
+            names.push_back(text(answer.name));
+        return names;
+    }
+    static std::string text(Oid const& name) {
+        std::string result;
+        for (std::uint32_t const number : name)
+            result += "." + std::to_string(number);
+        return result;
+    }
+};
+
+/// The library itself decides what a GET shows.
+TEST_P(PartialViewTest, WalksShowExactlyWhatGetsShow) {
+    startAgent();
+    std::vector<std::string> const all = namesOfAll();
+    std::vector<Answer> visible = answers("snmpget", all);
+    ASSERT_EQ(visible.size(), all.size());
+    std::erase_if(visible,
+                  [](Answer const& answer) { return answer.value.starts_with("No Such"); });
+    ASSERT_THAT(visible, SizeIs(AllOf(Gt(0U), Lt(all.size()))));
+    EXPECT_EQ(walk(kTable), visible);
+    for (char const* const repetitions : {"-Cr1", "-Cr2", "-Cr50"})
+        EXPECT_EQ(answers("snmpbulkwalk", {repetitions, kTable}), visible) << repetitions;
+}
+
+INSTANTIATE_TEST_SUITE_P(
+    , PartialViewTest,
+    ::testing::Values(PartialView{"AllButACell", {"included ", "excluded .4.2"}},
+                      PartialView{"CellsOfAColumn", {"included .4.1", "included .4.3"}},
+                      PartialView{"AllButAColumn", {"included ", "excluded .4"}},
+                      PartialView{"CellOfAnExcludedColumn",
+                                  {"included ", "excluded .4", "included .4.2"}},
+                      // The mask has a bit for each number of the name: any column matches, in the
+                      // last case of many tables.
+                      PartialView{"RowOfEveryColumn", {"included .1.2 ff:f7"}},
+                      PartialView{"AllButARow", {"included ", "excluded .1.2 ff:f7"}},
+                      PartialView{"AllButARowOfManyTables", {"included ", "excluded .1.2 ff:b7"}}),
+    [](auto const& test) { return test.param.what; });
 
 } // namespace
 } // namespace kvloamd::e2e

@@ -45,6 +45,8 @@ struct SnmpHandler::Call {
     netsnmp_pdu* pdu;
     Instance instance;
     std::vector<oid> name;
+    OidView seenObject;           ///< the object whose view was asked for last
+    bool seesWholeObject = false; ///< whether the client may see all instances of it
 
     static int answer(netsnmp_mib_handler* library, netsnmp_handler_registration* /*place*/,
                       netsnmp_agent_request_info* info, netsnmp_request_info* requests);
@@ -55,6 +57,11 @@ struct SnmpHandler::Call {
     Oid relative(netsnmp_variable_list const* variable, bool& orEqual) const;
     /// Sets `name` to an absolute name.
     void setName(OidView relativeName);
+    /// What the library says of the client's view of all that is below a name.
+    int viewOf(OidView subtree);
+    /// Whether the client may see the instance. Asks the library once for each object, and for each
+    /// instance only if the client may see some instances of the object and not others.
+    bool shows(Instance const& found);
     void get(netsnmp_request_info* request);
     void getNext(netsnmp_request_info* request);
     void getBulk(netsnmp_request_info* request);
@@ -72,6 +79,7 @@ int SnmpHandler::Call::answer(netsnmp_mib_handler* library, netsnmp_handler_regi
     Call call{handler,
               {snapshotOf(handler, info), handler.m_counters, &handler.m_settings},
               info->asp->pdu,
+              {},
               {},
               {}};
     if (info->mode == MODE_SET_UNDO) {
@@ -151,6 +159,23 @@ void SnmpHandler::Call::setName(OidView relativeName) {
     name.insert(name.end(), relativeName.begin(), relativeName.end());
 }
 
+int SnmpHandler::Call::viewOf(OidView subtree) {
+    setName(subtree);
+    return netsnmp_acm_check_subtree(pdu, name.data(), name.size());
+}
+
+bool SnmpHandler::Call::shows(Instance const& found) {
+    if (found.object.data() != seenObject.data()) {
+        seenObject = found.object;
+        // The first version hides instances by their type, too.
+        seesWholeObject = pdu->version != SNMP_VERSION_1 && viewOf(found.object) == VACM_SUCCESS;
+    }
+    if (seesWholeObject) return true;
+    setName(found.name);
+    std::size_t length = name.size();
+    return in_a_view(name.data(), &length, pdu, asnTypeOf(found.type)) == VACM_SUCCESS;
+}
+
 void SnmpHandler::Call::getNext(netsnmp_request_info* request) {
     bool orEqual = request->inclusive != 0;
     Oid const after = relative(request->requestvb, orEqual);
@@ -160,15 +185,9 @@ void SnmpHandler::Call::getNext(netsnmp_request_info* request) {
                                 request->range_end_len) >= 0;
     };
     // The library checks access only for a GETBULK's first variable; check every one here.
-    View const view{[&](Instance const& found) {
-                        setName(found.name);
-                        std::size_t length = name.size();
-                        return in_a_view(name.data(), &length, pdu, asnTypeOf(found.type)) ==
-                               VACM_SUCCESS;
-                    },
+    View const view{[&](Instance const& found) { return shows(found); },
                     [&](OidView subtree) {
-                        setName(subtree);
-                        int const seen = netsnmp_acm_check_subtree(pdu, name.data(), name.size());
+                        int const seen = viewOf(subtree);
                         return seen != VACM_SUCCESS && seen != VACM_SUBTREE_UNKNOWN;
                     }};
     // If a variable is left unchanged, the library asks the handler of the names after ours.

@@ -1,6 +1,7 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/objects/ObjectTree.h"
 
+#include <algorithm>
 #include <iterator>
 
 #include <gtest/gtest.h>
@@ -191,6 +192,59 @@ TEST_F(ObjectTreeTest, WalkIsStrictlyIncreasingAndFindsEveryStep) {
     // All scalars but the platform service's 2 and the master's 2; 8 texts and 2 statuses of 3
     // boards; the IRQ of 2.
     EXPECT_EQ(steps, std::ssize(scalars()) - 5 + 3L * 10 + 2);
+}
+
+TEST_F(ObjectTreeTest, NextBeginsWithTheObjectsPlace) {
+    ASSERT_FALSE(next(with(kName, {2})).empty());
+    EXPECT_TRUE(std::ranges::equal(m_found.object, kName));
+    ASSERT_EQ(next({1, 1, 2, 1}), (Oid{1, 1, 2, 1, 0}));
+    EXPECT_TRUE(std::ranges::equal(m_found.object, Oid{1, 1, 2, 1}));
+}
+
+/// A search looks first where the last one ended, which may be anywhere.
+TEST_F(ObjectTreeTest, FormerSearchesDoNotChangeWhatIsFound) {
+    struct Expected {
+        Oid name;
+        Oid next;
+        Lookup lookup;
+    };
+    std::vector<Expected> all;
+    auto const expect = [&](Oid const& name) {
+        ObjectTree const fresh(scalars(), m_tables);
+        Instance found;
+        bool const any = fresh.next(m_facts, name, false, found);
+        all.push_back({name, any ? found.name : Oid{}, Lookup::Found});
+        ObjectTree const another(scalars(), m_tables);
+        all.back().lookup = another.find(m_facts, name, found);
+    };
+    for (Oid const& name : {Oid{}, Oid{0}, Oid{1, 1, 2}, Oid{9}})
+        expect(name);
+    for (Oid name = next({}); !name.empty(); name = next(name)) {
+        expect(name);
+        expect(Oid(name.begin(), name.end() - 1));
+        expect(with(name, {1}));
+    }
+    ASSERT_GT(all.size(), 100U);
+    for (Expected const& former : all)
+        for (Expected const& asked : all) {
+            next(former.name);
+            ASSERT_EQ(next(asked.name), asked.next)
+                << ::testing::PrintToString(asked.name) << " after a search for "
+                << ::testing::PrintToString(former.name);
+            find(former.name);
+            ASSERT_EQ(find(asked.name), asked.lookup)
+                << ::testing::PrintToString(asked.name) << " after a search for "
+                << ::testing::PrintToString(former.name);
+        }
+}
+
+TEST_F(ObjectTreeTest, RowsThatVanishBetweenSearchesArePassedOver) {
+    ASSERT_EQ(next(with(kName, {2})), with(kName, {5}));
+    m_snapshot.boards.resize(1);
+    EXPECT_EQ(next(with(kName, {5})), with(Oid{1, 1, 2, 4, 1, 5}, {2}));
+    EXPECT_EQ(find(with(kName, {5})), Lookup::NoSuchInstance);
+    m_snapshot.boards.clear();
+    EXPECT_FALSE(startsWith(next(with(kName, {2})), kName));
 }
 
 TEST_F(ObjectTreeTest, StatusWithoutANameIsLeftOut) {
