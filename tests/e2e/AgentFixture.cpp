@@ -23,6 +23,17 @@ std::string inherited(char const* name) {
     return value == nullptr ? std::string() : value;
 }
 
+bool isFree(int type, int port) {
+    int const probe = socket(AF_INET, type | SOCK_CLOEXEC, 0);
+    sockaddr_in address{};
+    address.sin_family = AF_INET;
+    address.sin_addr.s_addr = htonl(INADDR_ANY);
+    address.sin_port = htons(static_cast<std::uint16_t>(port));
+    bool const bound = bind(probe, reinterpret_cast<sockaddr*>(&address), sizeof address) == 0;
+    close(probe);
+    return bound;
+}
+
 } // namespace
 
 std::vector<Answer> parseAnswers(std::string const& output) {
@@ -215,16 +226,16 @@ bool AgentFixture::udpPortIsBound(int port) {
 }
 
 int AgentFixture::freePort() {
-    int const probe = socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0);
-    sockaddr_in address{};
-    address.sin_family = AF_INET;
-    address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
-    socklen_t size = sizeof address;
-    bool const bound = bind(probe, reinterpret_cast<sockaddr*>(&address), size) == 0 &&
-                       getsockname(probe, reinterpret_cast<sockaddr*>(&address), &size) == 0;
-    close(probe);
-    if (!bound) throw std::runtime_error("no free port on loopback");
-    return ntohs(address.sin_port);
+    // The system gives higher ports to clients, so that one of them could take a port before the
+    // program that it is meant for. Every process begins at another place.
+    constexpr int first = 10000;
+    constexpr int count = 10000;
+    static int next = getpid() * 7919 % count;
+    for (int tried = 0; tried < count; ++tried) {
+        int const port = first + next++ % count;
+        if (isFree(SOCK_DGRAM, port) && isFree(SOCK_STREAM, port)) return port;
+    }
+    throw std::runtime_error("no free port on loopback");
 }
 
 std::string AgentFixture::moduleDirectory() const {

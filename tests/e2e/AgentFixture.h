@@ -86,6 +86,7 @@ class AgentFixture : public ::testing::Test {
     /// `access` is what the community public gets.
     void startWithReceiver(std::string const& access = "rocommunity");
 
+    /// A port at which nobody listens, neither by UDP nor by TCP.
     static int freePort();
     /// Whether a process on this host has bound the UDP port.
     static bool udpPortIsBound(int port);
