@@ -227,9 +227,9 @@ TEST_F(EntityTest, ChangesWithinThePauseAreToldAtItsEnd) {
     EXPECT_TRUE(trapReceiver().waitFor(kConfigChange, 2)) << trapReceiver().output();
     auto const times = uptimesOf(kConfigChange);
     ASSERT_GE(times.size(), 2U);
-    // One second less than the pause, to allow for a busy machine.
+    // Half of the pause, because a machine that stalls may send the first of two late.
     for (std::size_t i = 1; i < times.size(); ++i)
-        EXPECT_GE(times[i] - times[i - 1], 4.0);
+        EXPECT_GE(times[i] - times[i - 1], 2.5);
 }
 
 TEST_F(EntityTest, StoppedBoardIsLockedWhichIsNoFailure) {

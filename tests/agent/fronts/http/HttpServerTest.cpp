@@ -19,6 +19,7 @@ namespace {
 
 using support::HttpClient;
 using support::HttpReply;
+using ::testing::AnyOf;
 using ::testing::HasSubstr;
 
 constexpr char kBoards[] = "/api/v1/boards";
@@ -286,12 +287,13 @@ TEST_F(HttpSocketsTest, PathsThatCannotBeAreRefused) {
 }
 
 TEST_F(HttpSocketsTest, OnlyLoopbackNeedsNoToken) {
-    EXPECT_EQ(checkTcpAddress("127.0.0.1:18999", false), "");
-    EXPECT_EQ(checkTcpAddress("[::1]:18999", true), "");
-    EXPECT_THAT(checkTcpAddress("0.0.0.0:18999", false), HasSubstr("--http-token-file"));
-    EXPECT_EQ(checkTcpAddress("0.0.0.0:18999", true), "");
+    EXPECT_EQ(checkTcpAddress("127.0.0.1:8999", false), "");
+    // Not every host has IPv6.
+    EXPECT_THAT(checkTcpAddress("[::1]:8999", true), AnyOf("", HasSubstr("cannot listen")));
+    EXPECT_THAT(checkTcpAddress("0.0.0.0:8999", false), HasSubstr("--http-token-file"));
+    EXPECT_EQ(checkTcpAddress("0.0.0.0:8999", true), "");
     EXPECT_THAT(checkTcpAddress("nonsense", false), HasSubstr("not an address"));
-    EXPECT_THAT(checkTcpAddress("192.0.2.1:18999", true), HasSubstr("cannot listen"));
+    EXPECT_THAT(checkTcpAddress("192.0.2.1:8999", true), HasSubstr("cannot listen"));
 }
 
 TEST_F(HttpSocketsTest, TokenIsTheFirstLine) {
