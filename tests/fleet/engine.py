@@ -5,26 +5,24 @@ import json
 import os
 import re
 import shlex
-import socket
 import subprocess
+import sys
 import urllib.parse
 import urllib.request
 
+sys.path.insert(0, os.path.join(os.path.dirname(os.path.dirname(os.path.abspath(__file__))), 'support'))
 
-def free_port():
-    with socket.socket() as probe:
-        probe.bind(('127.0.0.1', 0))
-        return probe.getsockname()[1]
+from ports import free_port
 
 
 def configure(tree, folder, targets, replaced=(), relabelled=''):
-    """Writes the configuration into the folder: scrapes come every 2 seconds, and alerts fire at once.
+    """Writes the configuration into the folder: scrapes come every 4 seconds, and alerts fire at once.
     `targets` is what a file of discovery has. `replaced` are more pairs of texts, old and new, and
     `relabelled` are more relabelling rules of the one job."""
     with open(tree + '/fleet/prometheus/prometheus.yml', encoding='utf-8') as file:
         text = file.read()
-    for old, new in (('scrape_interval: 1m', 'scrape_interval: 2s'),
-                     ('scrape_timeout: 20s', 'scrape_timeout: 1s'),
+    for old, new in (('scrape_interval: 1m', 'scrape_interval: 4s'),
+                     ('scrape_timeout: 20s', 'scrape_timeout: 3s'),
                      ('evaluation_interval: 1m', 'evaluation_interval: 1s'), *replaced):
         assert old in text, old
         text = text.replace(old, new)
@@ -66,7 +64,7 @@ def victoria(tree, folder):
         text = file.read().replace('\\\n', ' ')
     replaced = {
         r'^victoria-metrics .*': (
-            ('/var/lib/victoria-metrics', folder + '/store'), ('=60s', '=2s'), ('$', ' -httpListenAddr=' + store)),
+            ('/var/lib/victoria-metrics', folder + '/store'), ('=60s', '=4s'), ('$', ' -httpListenAddr=' + store)),
         r'^vmalert .*': (
             ('/etc/prometheus', folder), ('localhost:8428', store), ('alerts:9093', '127.0.0.1:9'),
             ('=1m', '=1s'), ('$', ' -httpListenAddr=' + ruler)),

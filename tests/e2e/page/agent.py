@@ -3,22 +3,20 @@
 
 import os
 import pathlib
-import socket
 import subprocess
+import sys
 import tempfile
 import time
+
+sys.path.insert(0, str(pathlib.Path(__file__).resolve().parents[2] / "support"))
+
+from ports import free_port
 
 PATIENCE = int(os.environ.get("KVLOAM_TEST_PATIENCE", "120"))
 
 
 class AgentError(Exception):
     """A program has not done what a test needs."""
-
-
-def free_port(kind):
-    with socket.socket(socket.AF_INET, kind) as probe:
-        probe.bind(("127.0.0.1", 0))
-        return probe.getsockname()[1]
 
 
 class Agent:
@@ -39,7 +37,7 @@ class Agent:
             chassis = self._folder / "chassis.yaml"
             self.kvlsim("generate", "--boards", str(boards), "--lines", str(lines), "--output", str(chassis))
             self._variables["KVLSIM_CHASSIS"] = str(chassis)
-        self.port = free_port(socket.SOCK_STREAM)
+        self.port = free_port()
         self._child = None
         self.start()
 
@@ -58,7 +56,7 @@ class Agent:
         self._log = self._folder / "log"
         with self._log.open("w") as log:
             self._child = subprocess.Popen(
-                [self._bin / "kvloamd", "--port", str(free_port(socket.SOCK_DGRAM)), "--module", "z7sim", "--module-dir",
+                [self._bin / "kvloamd", "--port", str(free_port()), "--module", "z7sim", "--module-dir",
                  self._modules, "--snmp-config", self._folder / "snmp.conf", "--persistent-dir", self._folder / "kept",
                  "--http", f"127.0.0.1:{self.port}"],
                 env=self._variables, stdin=subprocess.DEVNULL, stdout=log, stderr=log)
