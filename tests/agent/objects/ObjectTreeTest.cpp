@@ -2,6 +2,7 @@
 #include "agent/objects/ObjectTree.h"
 
 #include <algorithm>
+#include <future>
 #include <iterator>
 
 #include <gtest/gtest.h>
@@ -236,6 +237,31 @@ TEST_F(ObjectTreeTest, FormerSearchesDoNotChangeWhatIsFound) {
                 << ::testing::PrintToString(asked.name) << " after a search for "
                 << ::testing::PrintToString(former.name);
         }
+}
+
+using ObjectTreeThreadsTest = ObjectTreeTest;
+
+/// Both threads look first where either has found something last.
+TEST_F(ObjectTreeThreadsTest, WalksOnTwoThreadsDoNotDisturbEachOther) {
+    auto const walk = [&] {
+        std::vector<Oid> names;
+        Instance found;
+        for (Oid name; m_tree.next(m_facts, name, false, found); name = found.name)
+            names.push_back(found.name);
+        return names;
+    };
+    std::vector<Oid> const expected = walk();
+    ASSERT_GT(expected.size(), 30U);
+    constexpr int kWalks = 50;
+    auto const walkOften = [&] {
+        int right = 0;
+        for (int i = 0; i < kWalks; ++i)
+            if (walk() == expected) ++right;
+        return right;
+    };
+    auto other = std::async(std::launch::async, walkOften);
+    EXPECT_EQ(walkOften(), kWalks);
+    EXPECT_EQ(other.get(), kWalks);
 }
 
 TEST_F(ObjectTreeTest, RowsThatVanishBetweenSearchesArePassedOver) {
