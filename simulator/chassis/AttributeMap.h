@@ -1,5 +1,5 @@
 // SPDX-License-Identifier: BSD-2-Clause
-// The attributes of one object, found by name.
+// The attributes of an object as it is described, found by name.
 #pragma once
 
 #include <cstddef>

@@ -3,7 +3,6 @@
 #include "simulator/chassis/AttributeValue.h"
 
 #include <cstring>
-#include <utility>
 
 namespace kvlsim {
 
@@ -25,13 +24,10 @@ T valueOf(std::string const& bytes) {
 
 } // namespace
 
-AttributeValue::AttributeValue(ValueForm form, std::string bytes)
-    : m_form(form), m_bytes(std::move(bytes)) {}
-
 AttributeValue AttributeValue::text(std::string_view text) {
     std::string bytes(text);
     bytes.push_back('\0');
-    return {ValueForm::text, std::move(bytes)};
+    return {ValueForm::text, bytes};
 }
 
 AttributeValue AttributeValue::number(std::int32_t value) {
@@ -47,7 +43,7 @@ AttributeValue AttributeValue::byte(std::int8_t value) {
 }
 
 AttributeValue AttributeValue::empty() {
-    return {ValueForm::empty, {}};
+    return {ValueForm::empty, ""};
 }
 
 AttributeValue AttributeValue::descriptor(DescriptorWords const& words) {

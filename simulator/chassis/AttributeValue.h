@@ -31,6 +31,8 @@ class AttributeValue {
     static AttributeValue byte(std::int8_t value);
     static AttributeValue empty();
     static AttributeValue descriptor(DescriptorWords const& words);
+    /// `bytes`: as `bytes()` of such a value are.
+    AttributeValue(ValueForm form, std::string_view bytes) : m_form(form), m_bytes(bytes) {}
 
     ValueForm form() const { return m_form; }
     /// The bytes that the client stores, a text's terminating NUL included.
@@ -43,8 +45,6 @@ class AttributeValue {
     DescriptorWords asDescriptor() const;
 
   private:
-    AttributeValue(ValueForm form, std::string bytes);
-
     ValueForm m_form;
     std::string m_bytes;
 };

@@ -29,11 +29,10 @@ std::uint64_t nextGeneration() {
     return ++last;
 }
 
-/// The text of an attribute, or null when it is missing or no text.
-AttributeValue const* textAttribute(AttributeMap const& attributes, std::string_view name) {
-    auto const found = attributes.find(name);
-    if (found == attributes.end() || found->second.form() != ValueForm::text) return nullptr;
-    return &found->second;
+std::optional<AttributeValue> textAttribute(ChassisObject const& object, std::string_view name) {
+    std::optional<AttributeValue> value = object.attribute(name);
+    if (value && value->form() != ValueForm::text) value.reset();
+    return value;
 }
 
 } // namespace
@@ -55,8 +54,9 @@ char const* nameOf(ObjectKind kind) {
 }
 
 std::string textOf(ChassisObject const* object, std::string_view attribute) {
-    AttributeValue const* const value = object == nullptr ? nullptr : object->attribute(attribute);
-    return value != nullptr && value->form() == ValueForm::text ? std::string(value->asText()) : "";
+    if (object == nullptr) return "";
+    auto const value = textAttribute(*object, attribute);
+    return value ? std::string(value->asText()) : "";
 }
 
 Chassis::Chassis() {
@@ -97,8 +97,9 @@ void Chassis::insertBoard(ObjectDraft board) {
                                            " is too much: a chassis has at most " +
                                            std::to_string(kMaxObjects) +
                                            " boards, devices, sub-devices and processors");
-    if (auto const* serial = textAttribute(board.attributes, kSerialNumber))
-        refuseSerial(serial->asText(), board.handle, board.line);
+    if (auto const serial = board.attributes.find(kSerialNumber);
+        serial != board.attributes.end() && serial->second.form() == ValueForm::text)
+        refuseSerial(serial->second.asText(), board.handle, board.line);
     std::int32_t const handle = board.handle;
     add(std::move(board), kRootHandle, lineTime());
     if (m_objects.at(handle).lines)
@@ -111,27 +112,25 @@ void Chassis::removeBoard(std::int32_t handle) {
     discard(handle);
 }
 
-void Chassis::setAttribute(std::int32_t handle, std::string const& name, AttributeValue value) {
+void Chassis::setAttribute(std::int32_t handle, std::string_view name,
+                           AttributeValue const& value) {
     ChassisObject& object = m_objects.at(handle);
     if (object.kind == ObjectKind::board && name == kSerialNumber &&
         value.form() == ValueForm::text)
         refuseSerial(value.asText(), handle, 0);
-    if (object.attributes.size() >= kMaxAttributes && object.attribute(name) == nullptr)
+    if (object.attributes.size() >= kMaxAttributes && !object.attribute(name))
         throw ChassisError(0, std::string(nameOf(object.kind)) + " " + std::to_string(handle) +
                                   " has " + std::to_string(kMaxAttributes) +
                                   " attributes, which is the most; unset one first");
     unindex(object, name);
-    object.attributes.insert_or_assign(name, std::move(value));
+    object.attributes.set(name, value);
     index(object, name);
 }
 
 bool Chassis::unsetAttribute(std::int32_t handle, std::string_view name) {
     ChassisObject& object = m_objects.at(handle);
-    auto const found = object.attributes.find(name);
-    if (found == object.attributes.end()) return false;
     unindex(object, name);
-    object.attributes.erase(found);
-    return true;
+    return object.attributes.unset(name);
 }
 
 void Chassis::setLineClock(LineClock* clock) {
@@ -172,7 +171,8 @@ void Chassis::add(ObjectDraft draft, std::int32_t parent, LiveLine::Time now) {
     object.handle = draft.handle;
     object.parent = parent;
     object.order = m_nextOrder++;
-    object.attributes = std::move(draft.attributes);
+    object.attributes = PackedAttributes(draft.attributes);
+    draft.attributes.clear();
     if (draft.ds1Line) object.ds1Line = std::make_unique<LiveLine>(std::move(*draft.ds1Line), now);
     if (draft.channels) object.channels = std::make_unique<Channels>(std::move(*draft.channels));
     ChassisObject const& added = m_objects.emplace(draft.handle, std::move(object)).first->second;
@@ -212,8 +212,8 @@ void Chassis::discard(std::int32_t handle) {
 }
 
 void Chassis::index(ChassisObject const& object, std::string_view attribute) {
-    auto const* const text = textAttribute(object.attributes, attribute);
-    if (text == nullptr) return;
+    auto const text = textAttribute(object, attribute);
+    if (!text) return;
     if (attribute == kName)
         m_byName[std::string(text->asText())].emplace(object.order, object.handle);
     else if (attribute == kSerialNumber && object.kind == ObjectKind::board)
@@ -221,8 +221,8 @@ void Chassis::index(ChassisObject const& object, std::string_view attribute) {
 }
 
 void Chassis::unindex(ChassisObject const& object, std::string_view attribute) {
-    auto const* const text = textAttribute(object.attributes, attribute);
-    if (text == nullptr) return;
+    auto const text = textAttribute(object, attribute);
+    if (!text) return;
     if (attribute == kName) {
         auto const found = m_byName.find(text->asText());
         found->second.erase({object.order, object.handle});

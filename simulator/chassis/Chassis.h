@@ -18,6 +18,7 @@
 #include "simulator/chassis/AttributeMap.h"
 #include "simulator/chassis/Channels.h"
 #include "simulator/chassis/LiveLine.h"
+#include "simulator/chassis/PackedAttributes.h"
 #include "simulator/chassis/ProcessDraft.h"
 #include "simulator/chassis/StoreDraft.h"
 
@@ -59,16 +60,15 @@ struct ChassisObject {
     std::int32_t handle = 0;
     std::int32_t parent = 0;
     std::uint64_t order = 0; ///< place in the chassis: objects found first have lower numbers
-    AttributeMap attributes;
+    PackedAttributes attributes;
     std::vector<std::int32_t> children; ///< in the order of the chassis
     std::unique_ptr<LiveLine> ds1Line;  ///< null: it is no line
     std::unique_ptr<Channels> channels; ///< null: it has no ISDN channels
     /// The lines among the children, in their order; null: there are none.
     std::unique_ptr<std::vector<LineOfBoard>> lines;
 
-    AttributeValue const* attribute(std::string_view name) const {
-        auto const found = attributes.find(name);
-        return found == attributes.end() ? nullptr : &found->second;
+    std::optional<AttributeValue> attribute(std::string_view name) const {
+        return attributes.find(name);
     }
 };
 
@@ -107,7 +107,7 @@ class Chassis {
     /// Throws ChassisError when this gives a board the serial number of another, or the object too
     /// many attributes.
     /// Requires: the object is there.
-    void setAttribute(std::int32_t handle, std::string const& name, AttributeValue value);
+    void setAttribute(std::int32_t handle, std::string_view name, AttributeValue const& value);
     /// Returns whether the object had the attribute. Requires: the object is there.
     bool unsetAttribute(std::int32_t handle, std::string_view name);
 

@@ -152,9 +152,9 @@ Json listCalls(CommandContext const& context) {
                 Json channels = Json::array();
                 for (std::int32_t i = 1; i <= object.channels->bearers(); ++i)
                     channels.push_back(nameOf(object.channels->state(i)));
-                AttributeValue const* const name = object.attribute("NAME");
+                auto const name = object.attribute("NAME");
                 trunks.push_back({{"trunk", child},
-                                  {"name", name == nullptr ? Json() : toJson("NAME", *name)},
+                                  {"name", !name ? Json() : toJson("NAME", *name)},
                                   {"board", handle},
                                   {"signalling", nameOf(object.channels->signalling())},
                                   {"channels", channels}});

@@ -23,10 +23,10 @@ using Json = nlohmann::json;
 using Context = CommandContext;
 
 /// Sets BOARD_CONDITION and, when that changes it, STATE_CHANGE_DATE.
-void setCondition(Chassis& chassis, std::int32_t board, AttributeValue condition) {
-    AttributeValue const* const before = chassis.find(board)->attribute("BOARD_CONDITION");
-    bool const changes = before == nullptr || before->bytes() != condition.bytes();
-    chassis.setAttribute(board, "BOARD_CONDITION", std::move(condition));
+void setCondition(Chassis& chassis, std::int32_t board, AttributeValue const& condition) {
+    auto const before = chassis.find(board)->attribute("BOARD_CONDITION");
+    bool const changes = !before || before->bytes() != condition.bytes();
+    chassis.setAttribute(board, "BOARD_CONDITION", condition);
     if (changes)
         chassis.setAttribute(board, "STATE_CHANGE_DATE", AttributeValue::text(currentDate()));
 }
@@ -82,16 +82,16 @@ Json replace(Context const& context) {
         throw CommandError("the serial number is given by \"serial\"; remove SERIAL_NUMBER from "
                            "the attributes");
     return changeBoard(context, [&](Chassis& chassis, std::int32_t board) {
-        auto const* const before = chassis.find(board)->attribute("SERIAL_NUMBER");
+        auto const before = chassis.find(board)->attribute("SERIAL_NUMBER");
         auto const now = AttributeValue::text(serial);
-        if (before != nullptr && before->bytes() == now.bytes())
+        if (before && before->bytes() == now.bytes())
             throw CommandError("board " + std::to_string(board) + " already has serial number " +
                                inQuotes(serial) + "; a replacement has another");
         chassis.setAttribute(board, "SERIAL_NUMBER", now);
         // A board that has just been plugged in runs, whatever the condition of its predecessor.
         setCondition(chassis, board, BoardCondition::started);
         chassis.setAttribute(board, "BOARD_PRESENT", AttributeValue::number(1));
-        for (auto& [name, value] : attributes)
+        for (auto const& [name, value] : attributes)
             chassis.setAttribute(board, name, value);
         context.announce(EventId::boardStarted, board);
     });
@@ -167,12 +167,12 @@ Json set(Context const& context) {
     Description const written = describeJson(context.arguments.value("value"));
     return changeAttribute(
         context, [&](Chassis& chassis, ChassisObject const& object, std::string const& name) {
-            AttributeValue value = readAttribute(name, written);
+            AttributeValue const value = readAttribute(name, written);
             refuseUnfitLineType(object, name, value);
             if (object.kind == ObjectKind::board && name == "BOARD_CONDITION")
-                setCondition(chassis, object.handle, std::move(value));
+                setCondition(chassis, object.handle, value);
             else
-                chassis.setAttribute(object.handle, name, std::move(value));
+                chassis.setAttribute(object.handle, name, value);
         });
 }
 

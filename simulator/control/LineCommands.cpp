@@ -59,8 +59,8 @@ Description describedArgument(CommandContext const& context, char const* name) {
 
 Json described(ChassisObject const& object, ChassisObject const& board, LiveLine::Time now) {
     auto const attribute = [](ChassisObject const& of, char const* name) {
-        AttributeValue const* const value = of.attribute(name);
-        return value == nullptr ? Json() : toJson(name, *value);
+        auto const value = of.attribute(name);
+        return !value ? Json() : toJson(name, *value);
     };
     LiveLine const& line = *object.ds1Line;
     DS1LineCounters const counters = line.counters(now);

@@ -37,9 +37,9 @@ nlohmann::json toJson(LinePast const& past) {
 }
 
 /// A line with the errors and alarms that it has now.
-nlohmann::json toJson(LiveLine const& line, AttributeValue const* type) {
+nlohmann::json toJson(LiveLine const& line, std::optional<AttributeValue> const& type) {
     LineDraft const& draft = line.draft();
-    bool const told = type != nullptr && type->form() == ValueForm::number;
+    bool const told = type && type->form() == ValueForm::number;
     auto const now = told ? static_cast<DS1LineType>(type->asNumber()) : draft.type;
     nlohmann::json json = {{"type", nameOf(now)},
                            {"errors", toJson(line.rates())},
@@ -84,13 +84,13 @@ nlohmann::json toJson(std::string_view attribute, AttributeValue const& value) {
 nlohmann::json toJson(ChassisObject const& object, Chassis const& chassis) {
     nlohmann::json json = {{"handle", object.handle}};
     nlohmann::json& attributes = json["attributes"] = nlohmann::json::object();
-    for (auto const& [name, value] : object.attributes) {
+    object.attributes.forEach([&](std::string_view name, AttributeValue const& value) {
         bool const isType = name == "TYPE";
         if (!isType)
-            attributes[name] = toJson(name, value);
+            attributes[std::string(name)] = toJson(name, value);
         else if (object.kind == ObjectKind::device || object.kind == ObjectKind::subDevice)
             json["type"] = value.asNumber();
-    }
+    });
     if (object.ds1Line) json["line"] = toJson(*object.ds1Line, object.attribute(kDS1LineType));
     if (object.channels)
         json["channels"] = {{"bearers", object.channels->bearers()},

@@ -15,8 +15,8 @@ namespace {
 
 /// Equal when sizes and bytes are equal; a text's size counts its terminating NUL.
 bool matches(ChassisObject const& object, DMAttribute const& criterion) {
-    AttributeValue const* const value = object.attribute(criterion.name);
-    if (value == nullptr) return false;
+    auto const value = object.attribute(criterion.name);
+    if (!value) return false;
     std::string_view const bytes = value->bytes();
     return bytes.size() == static_cast<std::size_t>(criterion.size) &&
            (bytes.empty() || std::memcmp(bytes.data(), criterion.value, bytes.size()) == 0);
@@ -133,8 +133,8 @@ void readInto(DMAttribute& request, ChassisObject const& object, Chassis const& 
         request.status = *status;
         return;
     }
-    AttributeValue const* const value = object.attribute(request.name);
-    if (value == nullptr) {
+    auto const value = object.attribute(request.name);
+    if (!value) {
         request.status = kNoAttribute;
         return;
     }

@@ -12,9 +12,9 @@ namespace {
 
 /// -1 when it is missing or no number.
 std::int32_t numberOf(ChassisObject const* board, std::string_view name) {
-    AttributeValue const* const value = board == nullptr ? nullptr : board->attribute(name);
-    if (value == nullptr || value->form() == ValueForm::text ||
-        value->form() == ValueForm::descriptor)
+    if (board == nullptr) return -1;
+    auto const value = board->attribute(name);
+    if (!value || value->form() == ValueForm::text || value->form() == ValueForm::descriptor)
         return -1;
     return value->asNumber();
 }

@@ -92,8 +92,8 @@ void collectTypes(Chassis const& chassis, ChassisObject const& object, ObjectKin
 
 std::set<std::string> collectNames(Chassis const& chassis, ChassisObject const& object) {
     std::set<std::string> names;
-    for (auto const& [name, value] : object.attributes)
-        names.insert(name);
+    object.attributes.forEach(
+        [&](std::string_view name, AttributeValue const&) { names.emplace(name); });
     for (std::int32_t const child : object.children)
         names.merge(collectNames(chassis, *chassis.find(child)));
     return names;
