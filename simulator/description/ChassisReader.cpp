@@ -228,17 +228,23 @@ ObjectDraft readBoardOnly(Description const& description, std::string const& dat
     return board;
 }
 
-std::vector<ObjectDraft> readBoards(Description const& list, Findings& findings) {
-    if (list.form == Form::nothing) return {};
+/// One board after the other, so that all need the memory of one draft: what drafts leave between
+/// the boards' objects is too small for most of what comes later.
+void readBoards(Description const& list, Chassis& chassis, Findings& findings) {
+    if (list.form == Form::nothing) return;
     if (list.form != Form::list)
         throw ChassisError(list.line,
                            "boards cannot be " + list.words() +
                                "; write a list, each board beginning with \"- handle:\"");
-    std::vector<ObjectDraft> boards;
     std::string const date = currentDate();
-    for (auto const& item : list.items)
+    HandlePlaces seen;
+    for (auto const& item : list.items) {
+        std::vector<ObjectDraft> boards;
         findings.part([&] { boards.push_back(readBoardOnly(item, date, findings)); });
-    return boards;
+        refuseSharedHandles(boards, seen, findings);
+        for (auto& board : boards)
+            findings.part([&] { chassis.insertBoard(std::move(board)); });
+    }
 }
 
 } // namespace
@@ -248,18 +254,13 @@ Chassis readChassis(Description const& file, Findings& findings) {
         throw ChassisError(1, "there is nothing in it; begin the chassis with \"boards:\"");
     requireMap(file, "a chassis", "boards:");
     findUnknownKeys(file, "the chassis", kChassisKeys, findings);
-    std::vector<ObjectDraft> boards;
+    Chassis chassis;
     findings.part([&] {
         Description const* const list = file.find("boards");
         if (list == nullptr)
             throw ChassisError(file.line, "no boards; begin the chassis with \"boards:\"");
-        boards = readBoards(*list, findings);
+        readBoards(*list, chassis, findings);
     });
-    HandlePlaces seen;
-    refuseSharedHandles(boards, seen, findings);
-    Chassis chassis;
-    for (auto& board : boards)
-        findings.part([&] { chassis.insertBoard(std::move(board)); });
     if (Description const* const store = file.find("store"))
         findings.part([&] {
             chassis.setStore(readStore(*store, findings));

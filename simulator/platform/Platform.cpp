@@ -2,17 +2,51 @@
 // The simulated platform of this process: its parts, and the loading of its chassis.
 #include "simulator/platform/Platform.h"
 
+#include <malloc.h>
+
 #include <cstdio>
 #include <cstdlib>
 #include <exception>
+#include <future>
+#include <string>
+#include <system_error>
+#include <thread>
 
+#include "simulator/base/ThreadStart.h"
 #include "simulator/chassis/ChassisError.h"
 #include "simulator/description/ChassisReader.h"
+#include "simulator/description/Description.h"
 #include "simulator/description/Findings.h"
 #include "simulator/platform/BundledChassis.h"
 #include "simulator/store/StoreContents.h"
 
 namespace kvlsim {
+
+namespace {
+
+/// Reads the text on a thread of its own, for which the C library has a heap of its own: what stays
+/// of a chassis would otherwise lie scattered over the memory of its description, and what is
+/// between would be too small for most of what comes later.
+Description describeApart(std::string const& yamlText, Findings& findings) {
+    std::packaged_task<Description()> reading([&] { return describeYaml(yamlText, findings); });
+    std::future<Description> description = reading.get_future();
+    try {
+        startThread("kvlsim-reader", [&] { reading(); }).join();
+    } catch (std::system_error const&) {
+        reading(); // there is no other thread to be had
+    }
+    return description.get();
+}
+
+/// Gives the memory that the description took back to the system. The C library itself keeps it
+/// where another thread uses the end of the same heap.
+void releaseFreeMemory() {
+#ifdef __GLIBC__
+    malloc_trim(0);
+#endif
+}
+
+} // namespace
 
 Platform::Platform()
     : m_store([this] {
@@ -55,11 +89,13 @@ void Platform::loadConfiguredChassis() {
     try {
         // Another thread's `loadChassis` may have come first: its chassis stays.
         Findings findings;
-        auto chassis =
-            readChassis(file.empty() ? kBundledChassis : readChassisFile(file), findings);
+        Chassis chassis = readChassis(
+            describeApart(file.empty() ? kBundledChassis : readChassisFile(file), findings),
+            findings);
         for (auto const& warning : findings.warnings(source))
             std::fprintf(stderr, "kvlsim: %s\n", warning.c_str());
-        m_chassis.putFirst(std::move(chassis).value());
+        m_chassis.putFirst(std::move(chassis));
+        releaseFreeMemory();
         return;
     } catch (ChassisError const& error) {
         source = describeError(source, error);
