@@ -11,6 +11,14 @@
 
 namespace {
 
+/// For the answers to a request, with room for the lines of any board. Boards tick one after the
+/// other; what they share stays in the processor's cache. Changed between passes only, and never
+/// destroyed, because the scheduler never ends.
+std::vector<DS1BoardLine>& sharedAnswers() {
+    static auto* const answers = new std::vector<DS1BoardLine>;
+    return *answers;
+}
+
 /// The answer of `device`. Answers usually stand in the order in which they are looked for: `next`
 /// is where to look first, and where to go on. Null if there is none.
 DS1BoardLine const* find(std::span<DS1BoardLine const> answers, long device, std::size_t& next) {
@@ -34,17 +42,16 @@ LineTicks::~LineTicks() {
 
 void LineTicks::add(long device, Z7SimIntervalTable& table) {
     LineScheduler::instance().betweenPasses([&] {
-        m_answers.resize(m_lines.size() + 1);
+        auto& answers = sharedAnswers();
+        answers.resize(std::max(answers.size(), m_lines.size() + 1));
         m_lines.push_back({device, &table});
         m_generation = 0;
     });
 }
 
 void LineTicks::remove(Z7SimIntervalTable const& table) {
-    LineScheduler::instance().betweenPasses([&] {
-        std::erase_if(m_lines, [&](Line const& line) { return line.table == &table; });
-        m_answers.resize(m_lines.size());
-    });
+    LineScheduler::instance().betweenPasses(
+        [&] { std::erase_if(m_lines, [&](Line const& line) { return line.table == &table; }); });
 }
 
 int LineTicks::ScheduledAction() {
@@ -71,8 +78,9 @@ bool LineTicks::isNextSecondOf(DS1BoardGeneration const& now) const {
 
 /// `generation`: one that the counters had before now.
 void LineTicks::ask(bool together, std::uint64_t generation) {
-    std::size_t const count = together ? m_batch->read(m_answers) : 0;
-    auto const answers = std::span(m_answers).first(std::min(count, m_answers.size()));
+    auto const room = std::span(sharedAnswers()).first(m_lines.size());
+    std::size_t const count = together ? m_batch->read(room) : 0;
+    auto const answers = room.first(std::min(count, room.size()));
     std::size_t next = 0;
     bool haveAll = true;
     for (Line const& line : m_lines) {

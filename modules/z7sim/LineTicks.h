@@ -52,5 +52,4 @@ class LineTicks final : public Schedulable {
     std::uint32_t m_seconds = 0;
     // Changed between passes only.
     std::vector<Line> m_lines;
-    std::vector<DS1BoardLine> m_answers; ///< to the last request, with room for all lines
 };

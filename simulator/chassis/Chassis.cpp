@@ -102,13 +102,14 @@ void Chassis::insertBoard(ObjectDraft board) {
         refuseSerial(serial->second.asText(), board.handle, board.line);
     std::int32_t const handle = board.handle;
     add(std::move(board), kRootHandle, lineTime());
-    if (m_objects.at(handle).lines)
-        renew(*m_boardsWithLines.insert(placeOfLines(handle), {.board = handle}));
+    gatherLines(m_objects.at(handle));
 }
 
 void Chassis::removeBoard(std::int32_t handle) {
     std::erase(m_objects.at(kRootHandle).children, handle);
-    if (m_objects.at(handle).lines) m_boardsWithLines.erase(placeOfLines(handle));
+    if (linesOf(handle) != nullptr)
+        m_boardsWithLines.erase(m_boardsWithLines.begin() +
+                                static_cast<std::ptrdiff_t>(placeOfLines(handle)));
     discard(handle);
 }
 
@@ -176,30 +177,45 @@ void Chassis::add(ObjectDraft draft, std::int32_t parent, LiveLine::Time now) {
     if (draft.ds1Line) object.ds1Line = std::make_unique<LiveLine>(std::move(*draft.ds1Line), now);
     if (draft.channels) object.channels = std::make_unique<Channels>(std::move(*draft.channels));
     ChassisObject const& added = m_objects.emplace(draft.handle, std::move(object)).first->second;
-    ChassisObject& above = m_objects.at(parent);
-    above.children.push_back(draft.handle);
-    if (added.ds1Line) {
-        if (!above.lines) above.lines = std::make_unique<std::vector<LineOfBoard>>();
-        above.lines->push_back({draft.handle, added.ds1Line.get()});
-    }
+    m_objects.at(parent).children.push_back(draft.handle);
     index(added, kName);
     index(added, kSerialNumber);
     for (auto& child : draft.children)
         add(std::move(child), draft.handle, now);
 }
 
+BoardLines const* Chassis::linesOf(long board) const {
+    auto const narrow = static_cast<std::int32_t>(board);
+    std::size_t const place = placeOfLines(narrow);
+    if (narrow != board || place == m_boardsWithLines.size()) return nullptr;
+    BoardLines const& lines = m_boardsWithLines[place];
+    return lines.board == narrow ? &lines : nullptr;
+}
+
 /// Where the lines of a board stand, or would stand.
-std::vector<BoardLines>::iterator Chassis::placeOfLines(std::int32_t board) {
-    return std::ranges::lower_bound(m_boardsWithLines, board, {}, &BoardLines::board);
+std::size_t Chassis::placeOfLines(std::int32_t board) const {
+    auto const place = std::ranges::lower_bound(m_boardsWithLines, board, {}, &BoardLines::board);
+    return static_cast<std::size_t>(place - m_boardsWithLines.begin());
+}
+
+void Chassis::gatherLines(ChassisObject const& board) {
+    BoardLines lines;
+    lines.board = board.handle;
+    for (std::int32_t const child : board.children)
+        if (auto const& line = m_objects.at(child).ds1Line)
+            lines.all.push_back({child, line.get()});
+    if (lines.all.empty()) return;
+    renew(lines);
+    auto const place = static_cast<std::ptrdiff_t>(placeOfLines(board.handle));
+    m_boardsWithLines.insert(m_boardsWithLines.begin() + place, std::move(lines));
 }
 
 /// After a change of any line of a board.
-void Chassis::renew(BoardLines& lines) const {
-    auto const& all = *m_objects.at(lines.board).lines;
+void Chassis::renew(BoardLines& lines) {
     bool const isSteady =
-        std::ranges::all_of(all, [](auto const& each) { return each.line->isSteady(); });
+        std::ranges::all_of(lines.all, [](auto const& each) { return each.line->isSteady(); });
     lines.generation = isSteady ? nextGeneration() : 0;
-    lines.born = all.front().line->born();
+    lines.born = lines.all.front().line->born();
 }
 
 void Chassis::discard(std::int32_t handle) {

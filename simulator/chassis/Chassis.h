@@ -47,11 +47,12 @@ struct LineOfBoard {
     LiveLine const* line = nullptr;
 };
 
-/// The `BoardLines` are the lines of a board as a whole.
+/// The `BoardLines` are the lines of a board.
 struct BoardLines {
     std::int32_t board = 0;       ///< its handle
     std::uint64_t generation = 0; ///< as in `DS1BoardGeneration`
     LiveLine::Time born{}; ///< of the first line; the ages of the others differ by whole seconds
+    std::vector<LineOfBoard> all; ///< in the order of the board's children; at least one
 };
 
 /// A `ChassisObject` is an object of the chassis: its root, a board, or an object of a board.
@@ -64,8 +65,6 @@ struct ChassisObject {
     std::vector<std::int32_t> children; ///< in the order of the chassis
     std::unique_ptr<LiveLine> ds1Line;  ///< null: it is no line
     std::unique_ptr<Channels> channels; ///< null: it has no ISDN channels
-    /// The lines among the children, in their order; null: there are none.
-    std::unique_ptr<std::vector<LineOfBoard>> lines;
 
     std::optional<AttributeValue> attribute(std::string_view name) const {
         return attributes.find(name);
@@ -119,13 +118,15 @@ class Chassis {
     template <typename Change>
     void changeLine(std::int32_t handle, Change&& change) {
         ChassisObject const& object = m_objects.at(handle);
-        BoardLines& lines = linesOf(object.parent);
+        BoardLines& lines = m_boardsWithLines[placeOfLines(object.parent)];
         lines.generation = 0; // and stays so if the change throws
         std::forward<Change>(change)(*object.ds1Line);
         renew(lines);
     }
     /// The boards that have lines, in the order of their handles.
     std::vector<BoardLines> const& boardsWithLines() const { return m_boardsWithLines; }
+    /// Null: there is no such board, or it has no lines.
+    BoardLines const* linesOf(long board) const;
     /// To change them. Requires: the object has them.
     Channels& channels(std::int32_t handle) { return *m_objects.at(handle).channels; }
 
@@ -144,9 +145,9 @@ class Chassis {
     void discard(std::int32_t handle);
     void index(ChassisObject const& object, std::string_view attribute);
     void unindex(ChassisObject const& object, std::string_view attribute);
-    std::vector<BoardLines>::iterator placeOfLines(std::int32_t board);
-    BoardLines& linesOf(std::int32_t board) { return *placeOfLines(board); }
-    void renew(BoardLines& lines) const;
+    std::size_t placeOfLines(std::int32_t board) const;
+    void gatherLines(ChassisObject const& board);
+    static void renew(BoardLines& lines);
 
     using Named = std::set<std::pair<std::uint64_t, std::int32_t>>;
 

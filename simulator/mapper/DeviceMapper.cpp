@@ -22,9 +22,15 @@ bool matches(ChassisObject const& object, DMAttribute const& criterion) {
            (bytes.empty() || std::memcmp(bytes.data(), criterion.value, bytes.size()) == 0);
 }
 
-bool isSound(DMAttribute const& criterion) {
-    return criterion.name != nullptr && criterion.size >= 0 &&
-           (criterion.value != nullptr || criterion.size == 0);
+/// `size`: of the value of a criterion, or of the buffer of a request.
+bool isSound(DMAttribute const& attribute, std::int32_t size) {
+    return attribute.name != nullptr && size >= 0 && (attribute.value != nullptr || size == 0);
+}
+
+/// Whether the request is one for the counters of a board's lines and nothing else.
+bool isForLines(std::span<DMAttribute const> requests) {
+    return requests.size() == 1 && isSound(requests[0], requests[0].size) &&
+           std::string_view(requests[0].name) == kDS1BoardCounters;
 }
 
 /// The whole past of a line, or nothing.
@@ -90,8 +96,9 @@ std::optional<std::int32_t> readLive(DMAttribute& request, std::int32_t capacity
     std::string_view const name = request.name;
     if (object.kind == ObjectKind::root && name == kDS1LineGenerations)
         return readGenerations(request, capacity, chassis);
-    if (object.lines && object.kind == ObjectKind::board && name == kDS1BoardCounters)
-        return readLines(request, capacity, *object.lines, chassis.lineTime());
+    if (object.kind == ObjectKind::board && name == kDS1BoardCounters)
+        if (BoardLines const* const lines = chassis.linesOf(object.handle))
+            return readLines(request, capacity, lines->all, chassis.lineTime());
     if (object.ds1Line) {
         LinePast const& past = object.ds1Line->draft().past;
         if (name == kDS1LineCounters) {
@@ -125,7 +132,7 @@ std::optional<std::int32_t> readLive(DMAttribute& request, std::int32_t capacity
 void readInto(DMAttribute& request, ChassisObject const& object, Chassis const& chassis) {
     std::int32_t const capacity = request.size;
     request.size = 0;
-    if (request.name == nullptr || capacity < 0 || (request.value == nullptr && capacity > 0)) {
+    if (!isSound(request, capacity)) {
         request.status = kInvalidAttribute;
         return;
     }
@@ -174,7 +181,8 @@ class Client final : public DeviceMapperClient {
             (auids == nullptr && capacity > 0))
             return kInvalidRequest;
         std::span const wanted(criteria, static_cast<std::size_t>(count));
-        if (!std::ranges::all_of(wanted, isSound)) return kInvalidRequest;
+        auto const isWhole = [](auto const& each) { return isSound(each, each.size); };
+        if (!std::ranges::all_of(wanted, isWhole)) return kInvalidRequest;
         return m_chassis.read([&](Chassis const* chassis) {
             if (chassis == nullptr) return kNoChassis;
             ChassisObject const* const object = chassis->find(parent);
@@ -215,6 +223,15 @@ class Client final : public DeviceMapperClient {
         if (count < 0 || (requests == nullptr && count > 0)) return kInvalidRequest;
         std::span const wanted(requests, static_cast<std::size_t>(count));
         return m_chassis.read([&](Chassis const* chassis) {
+            // Clients ask this every second. It is found without the board's object, which lies
+            // elsewhere in memory.
+            if (chassis != nullptr && isForLines(wanted))
+                if (BoardLines const* const lines = chassis->linesOf(auid)) {
+                    DMAttribute& request = wanted.front();
+                    request.status =
+                        readLines(request, request.size, lines->all, chassis->lineTime());
+                    return request.status == 0 ? 0 : kDMSomeAttributesFailed;
+                }
             ChassisObject const* const object = chassis == nullptr ? nullptr : chassis->find(auid);
             if (object == nullptr) {
                 failAll(wanted);
