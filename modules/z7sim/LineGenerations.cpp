@@ -2,10 +2,19 @@
 #include "LineGenerations.h"
 
 #include <algorithm>
+#include <new>
 
 #include "LineScheduler.h"
 #include "ObjectAttributes.h"
 #include "access/DeviceMapperIf.h"
+
+namespace {
+
+// Boards in the buffer.
+constexpr std::size_t kFewest = 64;
+constexpr std::size_t kMost = std::size_t{1} << 18U;
+
+} // namespace
 
 LineGenerations& LineGenerations::instance() {
     static auto* const generations = new LineGenerations;
@@ -24,20 +33,29 @@ DS1BoardGeneration LineGenerations::of(long board, std::size_t& place) {
 }
 
 void LineGenerations::ask() {
-    constexpr std::size_t fewest = 64;
     m_pass = LineScheduler::passNumber();
     m_boards = {};
-    if (m_buffer.empty()) m_buffer.resize(fewest);
     long root = 0;
     if (DeviceMapperIf::get_interface()->GetDMClient()->GetRootObject(&root) != 0) return;
-    for (;;) {
-        std::span<DS1BoardGeneration> const room(m_buffer);
-        std::size_t const size =
-            bytesAttribute(root, kDS1LineGenerations, room.data(), room.size_bytes());
-        std::size_t const count = size / sizeof(DS1BoardGeneration);
-        m_boards = room.first(std::min(count, room.size()));
-        // A full buffer may hold only a part of the answer.
-        if (count < room.size()) return;
-        m_buffer.resize(2 * m_buffer.size());
+    std::size_t count = ask(root);
+    // A full buffer may hold only a part of the answer.
+    while (count == m_buffer.size() && count < kMost && enlarge())
+        count = ask(root);
+    m_boards = std::span<DS1BoardGeneration const>(m_buffer).first(count);
+}
+
+std::size_t LineGenerations::ask(long root) {
+    std::size_t const size = bytesAttribute(root, kDS1LineGenerations, m_buffer.data(),
+                                            m_buffer.size() * sizeof(DS1BoardGeneration));
+    return std::min(size / sizeof(DS1BoardGeneration), m_buffer.size());
+}
+
+/// Without memory for all boards, the others are asked every second.
+bool LineGenerations::enlarge() {
+    try {
+        m_buffer.resize(std::max(2 * m_buffer.size(), kFewest));
+    } catch (std::bad_alloc const&) {
+        return false;
     }
+    return true;
 }

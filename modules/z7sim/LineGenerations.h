@@ -15,7 +15,7 @@
 /// Thread-bound: the scheduler's thread.
 class LineGenerations {
   public:
-    /// Never destroyed.
+    /// The process's instance, never destroyed. Thread-safe.
     static LineGenerations& instance();
 
     /// Those of a board's lines when the pass began; generation 0 when the platform has no answer.
@@ -24,6 +24,8 @@ class LineGenerations {
 
   private:
     void ask();
+    std::size_t ask(long root);
+    bool enlarge();
 
     std::uint64_t m_pass = 0; ///< in which the platform was asked
     std::vector<DS1BoardGeneration> m_buffer;

@@ -37,8 +37,11 @@ std::vector<DS1LineCounters> PlatformLine::past() {
     return records;
 }
 
+PlatformBoard::PlatformBoard(long board)
+    : m_board(board), m_generations(LineGenerations::instance()) {}
+
 DS1BoardGeneration PlatformBoard::generation() {
-    return LineGenerations::instance().of(m_board, m_place);
+    return m_generations.of(m_board, m_place);
 }
 
 std::size_t PlatformBoard::read(std::span<DS1BoardLine> lines) {

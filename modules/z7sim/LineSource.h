@@ -11,6 +11,8 @@
 #include "LinePerformance.h"
 #include "boardplatform/ds1_line.h"
 
+class LineGenerations;
+
 /// A `LineSource` answers a line's counters.
 class LineSource {
   public:
@@ -53,13 +55,14 @@ class LineBatch {
 class PlatformBoard final : public LineBatch {
   public:
     /// `board`: the board's handle.
-    explicit PlatformBoard(long board) : m_board(board) {}
+    explicit PlatformBoard(long board);
 
     DS1BoardGeneration generation() override;
     std::size_t read(std::span<DS1BoardLine> lines) override;
 
   private:
     long m_board;
+    LineGenerations& m_generations;
     std::size_t m_place = 0; ///< among the generations
 };
 

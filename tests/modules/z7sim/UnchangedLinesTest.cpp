@@ -228,6 +228,41 @@ class World {
     std::vector<std::unique_ptr<LineTicks>> m_boards;
 };
 
+TEST(UnchangedLinesTest, GenerationsOfAllBoardsAreKnownHoweverManyThereAre) {
+    StillLineScheduler& scheduler = StillLineScheduler::install();
+    LineClock const clock;
+    for (int const count : {1, 64, 200, 3, 0}) {
+        std::string text = count > 0 ? "boards:\n" : "boards: []";
+        for (int i = 1; i <= count; ++i)
+            text += sim::board(10 * i, "S" + std::to_string(i), "",
+                               "devices: [{handle: " + std::to_string(10 * i + 1) +
+                                   ", type: 501, line: {type: esf}}]");
+        kvlsim::loadChassis(text);
+        LineClock::advance(std::chrono::seconds(7));
+        scheduler.pass(LineScheduler::time() + 1);
+        for (int i = 1; i <= count; ++i) {
+            auto const answer = PlatformBoard(10 * i).generation();
+            EXPECT_EQ(answer.board, 10 * i);
+            EXPECT_EQ(answer.seconds, 7U);
+            EXPECT_NE(answer.generation, 0U);
+        }
+        EXPECT_EQ(PlatformBoard(10 * count + 10).generation().generation, 0U);
+        EXPECT_EQ(PlatformBoard(5).generation().generation, 0U);
+    }
+}
+
+TEST(UnchangedLinesTest, GenerationsAreThoseOfTheBeginningOfAPass) {
+    StillLineScheduler& scheduler = StillLineScheduler::install();
+    sim::load({sim::board(10, "S1", "", "devices: [{handle: 11, type: 501, line: {type: esf}}]")});
+    PlatformBoard board(10);
+    scheduler.pass(LineScheduler::time() + 1);
+    std::uint64_t const before = board.generation().generation;
+    sim::command({{"command", "line-errors"}, {"line", 11}, {"errors", errors(1, 0, 0)}});
+    EXPECT_EQ(board.generation().generation, before);
+    scheduler.pass(LineScheduler::time() + 1);
+    EXPECT_NE(board.generation().generation, before);
+}
+
 TEST(UnchangedLinesTest, HistoriesAreThoseOfLinesThatAreAskedOneByOne) {
     int seconds = 0;
     int requests = 0;
