@@ -117,30 +117,52 @@ Rows<EntityStateRow> EntityStates::read(Rows<PhysicalRow> const& entities,
                                         Rows<BoardRow> const& boards,
                                         InterfaceRows const& interfaces,
                                         std::vector<FaultRow> const& faults) {
-    if (m_read && entities.shares(m_entities) && boards.shares(m_boards) &&
-        interfaces.interfaces.shares(m_interfaces) && interfaces.lines.shares(m_lines) &&
-        faults == m_faults)
+    bool const sameFaults = m_read && faults == m_faults;
+    if (sameFaults && entities.shares(m_entities) && boards.shares(m_boards) &&
+        interfaces.interfaces.shares(m_interfaces) && interfaces.lines.shares(m_lines))
         return m_former;
-    m_entities = entities;
-    m_boards = boards;
-    m_interfaces = interfaces.interfaces;
-    m_lines = interfaces.lines;
-    m_faults = faults;
     std::vector<EntityStateRow> rows;
     rows.reserve(m_former.size());
+    std::vector<Origin> origins;
+    origins.reserve(entities.size());
     std::string const now = m_read ? dateOctets(m_now()) : m_started;
     RowFinder const boardRows(boards);
     RowFinder const interfaceRows(interfaces.interfaces);
     RowFinder const lineRows(interfaces.lines);
     RowFinder const faultRows(faults);
     RowFinder const formerRows(m_former);
+    // The rows of an origin are still there, at the same addresses.
+    auto const stands = [&](Origin const& origin) {
+        if (origin.board != nullptr) return sameFaults && boardRows.isNext(origin.board);
+        return origin.line != nullptr && interfaceRows.isNext(origin.interface) &&
+               lineRows.isNext(origin.line);
+    };
     bool changed = false;
+    auto known = m_origins.cbegin();
     for (PhysicalRow const& entity : entities) {
+        while (known != m_origins.cend() && known->entity != &entity &&
+               known->entity->entity < entity.entity)
+            ++known;
+        if (known != m_origins.cend() && known->entity == &entity && stands(*known)) {
+            if (known->board != nullptr) {
+                boardRows.skip();
+            } else {
+                interfaceRows.skip();
+                lineRows.skip();
+            }
+            origins.push_back(*known);
+            origins.back().state = rows.size();
+            rows.push_back(m_former[known->state]);
+            ++known;
+            continue;
+        }
+        Origin origin{&entity};
         EntityState state;
-        if (BoardRow const* const board = boardRows.find(entity.boardIndex)) {
-            state = boardState(*board, faultRows.find(entity.boardIndex) != nullptr);
-        } else if (InterfaceRow const* const interface = interfaceRows.find(entity.ifIndex)) {
-            state = portState(*interface, lineRows.find(entity.ifIndex));
+        if ((origin.board = boardRows.find(entity.boardIndex)) != nullptr) {
+            state = boardState(*origin.board, faultRows.find(entity.boardIndex) != nullptr);
+        } else if ((origin.interface = interfaceRows.find(entity.ifIndex)) != nullptr) {
+            origin.line = lineRows.find(entity.ifIndex);
+            state = portState(*origin.interface, origin.line);
         } else if (entity.physicalClass != PhysicalClass::Cpu) {
             // The platform does not tell how a processor is.
             continue;
@@ -148,10 +170,19 @@ Rows<EntityStateRow> EntityStates::read(Rows<PhysicalRow> const& entities,
         EntityStateRow const* const former = formerRows.find(entity.entity);
         bool const same = former != nullptr && former->state == state;
         changed = changed || !same;
+        origin.state = rows.size();
+        origins.push_back(origin);
         rows.push_back({entity.entity, state, same ? former->changed : now});
     }
+    std::vector<FaultRow> keptFaults = faults;
     m_read = true;
     if (changed || rows.size() != m_former.size()) m_former = std::move(rows);
+    m_origins = std::move(origins);
+    m_entities = entities;
+    m_boards = boards;
+    m_interfaces = interfaces.interfaces;
+    m_lines = interfaces.lines;
+    m_faults = std::move(keptFaults);
     return m_former;
 }
 

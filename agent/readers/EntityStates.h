@@ -2,6 +2,7 @@
 // The states of boards and ports in the words of ENTITY-STATE-MIB.
 #pragma once
 
+#include <cstddef>
 #include <functional>
 #include <string>
 #include <vector>
@@ -36,11 +37,21 @@ class EntityStates {
                               InterfaceRows const& interfaces, std::vector<FaultRow> const& faults);
 
   private:
+    /// The rows that a state follows from. Null: there is no such row.
+    struct Origin {
+        PhysicalRow const* entity = nullptr;
+        BoardRow const* board = nullptr;
+        InterfaceRow const* interface = nullptr; ///< null if there is a board
+        LineRow const* line = nullptr;
+        std::size_t state = 0; ///< its place
+    };
+
     Now m_now;
     std::string m_started; ///< when, as `dateOctets`
     bool m_read = false;
     Rows<EntityStateRow> m_former;
-    // What they follow from.
+    std::vector<Origin> m_origins; ///< of all states, in their order
+    // What they follow from. Rows that are kept do not lend their addresses to others.
     Rows<PhysicalRow> m_entities;
     Rows<BoardRow> m_boards;
     Rows<InterfaceRow> m_interfaces;

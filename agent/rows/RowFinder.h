@@ -36,6 +36,12 @@ class RowFinder {
         return m_next++;
     }
 
+    /// Whether the row after the one that was found last is this one, by its address. The row need
+    /// not be there any more.
+    bool isNext(Row const* row) const { return m_next < m_rows.size() && &m_rows[m_next] == row; }
+    /// Finds the row after the one that was found last. Requires that there is one.
+    void skip() const { ++m_next; }
+
   private:
     All const& m_rows;
     mutable std::size_t m_next = 0; ///< the place after the last row that was found

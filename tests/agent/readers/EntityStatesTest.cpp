@@ -1,6 +1,12 @@
 // SPDX-License-Identifier: BSD-2-Clause
 #include "agent/readers/EntityStates.h"
 
+#include <algorithm>
+#include <array>
+#include <map>
+#include <memory>
+#include <random>
+
 #include <gmock/gmock.h>
 
 #include "agent/readers/Answers.h"
@@ -240,6 +246,97 @@ TEST_F(EntityStatesTest, EntityThatComesIsInItsStateSinceThen) {
     EXPECT_THAT(m_states.read({}, {}, {}, {}), IsEmpty());
     m_now += 60;
     EXPECT_EQ(readChanged(), dateOctets(1'000'000'060));
+}
+
+/// Puts a row in its place, or takes out the one of this index; the others stay where they are.
+template <class Row>
+void put(Rows<Row>& rows, Row const& row, bool isThere) {
+    auto const shared = std::make_shared<Row const>(row);
+    std::array<Row const*, 1> const place{shared.get()};
+    std::array<std::shared_ptr<void const>, 1> const owner{shared};
+    if (isThere)
+        rows.exchange(place, place, owner);
+    else
+        rows.exchange(place, {}, {});
+}
+
+TEST(EntityStatesModelTest, SharedRowsHaveTheStatesAndDatesOfAllRows) {
+    std::mt19937 random(20261122);
+    auto const number = [&](int least, int most) {
+        return std::uniform_int_distribution(least, most)(random);
+    };
+    long now = 1'000'000'000;
+    EntityStates states([&] { return now; });
+    Rows<PhysicalRow> entities;
+    Rows<BoardRow> boards;
+    InterfaceRows interfaces;
+    std::vector<FaultRow> faults;
+    std::map<std::uint32_t, EntityStateRow> model;
+    std::size_t most = 0;
+    for (int step = 0; step < 5'000; ++step) {
+        auto const board = static_cast<std::uint32_t>(number(1, 5));
+        bool const isThere = number(0, 4) != 0;
+        switch (number(0, 6)) {
+        case 0: {
+            BoardRow row;
+            row.boardIndex = board;
+            row.status = number(0, 1) != 0 ? BoardStatusStarted : BoardStatusStopped;
+            put(boards, row, isThere);
+            break;
+        }
+        case 1: {
+            InterfaceRow row;
+            row.ifIndex = 100 + board;
+            row.operStatus = number(1, 2);
+            put(interfaces.interfaces, row, isThere);
+            break;
+        }
+        case 2: {
+            LineRow row;
+            row.ifIndex = 100 + board;
+            row.lineStatus = number(0, 1) != 0 ? DS1LineStatusNoAlarm : DS1LineStatusLossOfSignal;
+            put(interfaces.lines, row, isThere);
+            break;
+        }
+        case 3: {
+            PhysicalRow row;
+            row.entity = board * 10;
+            row.boardIndex = board;
+            put(entities, row, isThere);
+            break;
+        }
+        case 4: {
+            PhysicalRow row;
+            row.entity = board * 10 + 1;
+            row.ifIndex = 100 + board;
+            row.physicalClass = PhysicalClass::Port;
+            put(entities, row, isThere);
+            break;
+        }
+        case 5:
+            faults.assign(isThere ? 1 : 0, FaultRow{board, 17, 1, 0, "", 1});
+            break;
+        default:
+            break;
+        }
+        ++now;
+        auto const rows = states.read(entities, boards, interfaces, faults);
+        EntityStates anew([&] { return now; });
+        auto const expected = anew.read(entities, boards, interfaces, faults);
+        ASSERT_EQ(rows.size(), expected.size()) << "step " << step;
+        std::map<std::uint32_t, EntityStateRow> dated;
+        for (std::size_t i = 0; i < rows.size(); ++i) {
+            EntityStateRow row = expected[i];
+            auto const former = model.find(row.entity);
+            bool const same = former != model.end() && former->second.state == row.state;
+            row.changed = same ? former->second.changed : dateOctets(step == 0 ? now - 1 : now);
+            ASSERT_EQ(rows[i], row) << "step " << step;
+            dated[row.entity] = row;
+        }
+        model = std::move(dated);
+        most = std::max(most, model.size());
+    }
+    EXPECT_GT(most, 6U);
 }
 
 } // namespace

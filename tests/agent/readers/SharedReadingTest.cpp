@@ -85,10 +85,12 @@ class Reading {
     BoardSource& source() { return m_source; }
     Settings& settings() { return m_settings; }
     std::vector<PlacedLine> const& lines() const { return m_interfaces.lines(); }
+    /// Of the last reading.
+    Rows<BoardRow> const& boards() const { return m_boards; }
 
     Snapshot read(std::vector<FaultRow> const& faults) {
         Snapshot snapshot;
-        snapshot.boards = m_source.read();
+        snapshot.boards = m_boards = m_source.read();
         snapshot.records = m_platform.read(snapshot.boards);
         snapshot.interfaces = m_interfaces.read(snapshot.boards);
         snapshot.resources = m_resources.read(snapshot.boards);
@@ -103,6 +105,7 @@ class Reading {
 
   private:
     BoardSource m_source;
+    Rows<BoardRow> m_boards;
     StableIndices m_indices{1000};
     InterfaceReader m_interfaces;
     ResourceReader m_resources;
@@ -301,7 +304,7 @@ class Platform {
         case 19:
             return alias(first, second);
         case 20:
-            return faulty(board, faults);
+            return faulty(first, faults);
         default:
             return pass();
         }
@@ -372,11 +375,13 @@ class Platform {
         second.settings().exchange(key, text);
         return text;
     }
-    std::string faulty(int board, std::vector<FaultRow>& faults) {
+    std::string faulty(Reading const& reading, std::vector<FaultRow>& faults) {
         faults.clear();
-        if (number(0, 1) == 0) return "no fault";
+        if (number(0, 1) == 0 || reading.boards().empty()) return "no fault";
+        int const last = static_cast<int>(reading.boards().size()) - 1;
+        auto const place = static_cast<std::size_t>(number(0, last));
         faults.push_back({});
-        faults.back().boardIndex = static_cast<std::uint32_t>(board);
+        faults.back().boardIndex = reading.boards()[place].boardIndex;
         faults.back().value = 7;
         return "a fault";
     }
