@@ -25,7 +25,7 @@ struct Measured {
 constexpr std::array kMeasured{
     Measured{Happened::Everything, "everything", 0},
     Measured{Happened::Counting, "what lines have counted", 0.35},
-    Measured{Happened::StatusOf1, "one board that stops or starts", 0.45},
+    Measured{Happened::StatusOf1, "one board that stops or starts", 0.3},
 };
 
 using Samples = std::vector<double>;
