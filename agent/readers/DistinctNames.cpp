@@ -54,7 +54,7 @@ bool DistinctNames::update() {
         countGiven(texts, -1);
     for (BoardTexts const& texts : m_added)
         countGiven(texts, 1);
-    // Whether names of boards follow a text is now as it was when they were counted.
+    // The same texts are common as when the removed ones were counted, so that the counts match.
     if (m_names.hasCommonChanged() || m_descriptions.hasCommonChanged()) return false;
     for (BoardTexts const& texts : m_removed)
         countFollowed(texts, -1);

@@ -42,7 +42,7 @@ class TextCounts {
     /// Whether a text has become common since the last `settle`, or has ceased to be so, in either
     /// way.
     bool hasCommonChanged() const;
-    /// Takes the counts as they are for those that `hasCommonChanged` compares with.
+    /// Makes the present counts those with which `hasCommonChanged` compares.
     void settle();
     void clear();
 

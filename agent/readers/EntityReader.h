@@ -72,7 +72,7 @@ class EntityReader {
     };
 
     bool isAsBefore(Snapshot const& snapshot) const;
-    /// Whether an entity is another than before. `anew`: all are built.
+    /// Updates the entities. Returns whether any has changed. `anew`: builds all of them again.
     bool build(Snapshot const& snapshot, bool anew);
     void findSlots(Rows<BoardRow> const& boards);
     void findPlace(Origin& origin) const;

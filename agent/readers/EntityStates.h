@@ -51,7 +51,8 @@ class EntityStates {
     bool m_read = false;
     Rows<EntityStateRow> m_former;
     std::vector<Origin> m_origins; ///< of all states, in their order
-    // What they follow from. Rows that are kept do not lend their addresses to others.
+    // The rows that the states were derived from. They are kept so that no new row gets the address
+    // of an old one.
     Rows<PhysicalRow> m_entities;
     Rows<BoardRow> m_boards;
     Rows<InterfaceRow> m_interfaces;

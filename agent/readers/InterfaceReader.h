@@ -86,7 +86,7 @@ class InterfaceReader {
         /// It has only lines, which count nothing but their histories, and all have an index.
         bool isShareable = false;
     };
-    /// The boards of which something is no longer as it was in the reading before.
+    /// The indices of the boards that have changed since the previous reading, by what has changed.
     struct Changes {
         std::set<std::uint32_t> tables;
         std::set<std::uint32_t> lineObjects;
@@ -105,11 +105,13 @@ class InterfaceReader {
     void placeTables(KnownBoard& known, BoardInterfaceRows&& placed);
     void showLines(KnownBoard& known, LineRows&& rows);
     /// Makes the names and descriptions of all boards' interfaces different from each other.
-    /// `anew`: without what is known of the reading before; so are the next two.
+    /// `anew`: names all boards' interfaces, not only those of boards that have changed.
     void distinguish(bool anew);
     void distinguish(KnownBoard& known);
-    /// Puts the tables of all boards together.
+    /// Updates the tables of all boards. `anew`: puts them together from all boards again, instead
+    /// of exchanging the rows of boards that have changed.
     void join(bool anew);
+    /// The same for the list of lines.
     void joinLineObjects(bool anew);
     /// Extends the counters of the interface that gets `ifIndex`. `ethernet`: null if it is none.
     void countOn(InterfaceRow& row, Counted& counted, bool isNew, EthernetRow* ethernet,

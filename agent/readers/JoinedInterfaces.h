@@ -27,7 +27,7 @@ class JoinedInterfaces {
 
     /// Begins a reading of so many boards. `anew`: the tables are put together from all boards.
     void begin(std::size_t boards, bool anew);
-    // A board is to have other rows. Null: it has none.
+    // Replaces the rows `former` of a board by the rows `now` when `update` is called. Null: none.
     void exchange(std::shared_ptr<Tables const> former, std::shared_ptr<Tables const> now) {
         m_tables.add(std::move(former), std::move(now));
     }

@@ -41,8 +41,8 @@ class TableJoin {
     bool m_sorted = true;
 };
 
-/// A `PartExchange` is what a board has among the joined tables, and what it is to have. Null: it
-/// has nothing.
+/// A `PartExchange` is the part of a joined table that belongs to a board, and the part that
+/// replaces it. Null: the board has no part.
 template <class Part>
 struct PartExchange {
     std::shared_ptr<Part const> former;

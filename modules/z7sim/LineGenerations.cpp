@@ -10,7 +10,7 @@
 
 namespace {
 
-// Boards in the buffer.
+// How many boards the buffer holds.
 constexpr std::size_t kFewest = 64;
 constexpr std::size_t kMost = std::size_t{1} << 18U;
 
@@ -50,7 +50,7 @@ std::size_t LineGenerations::ask(long root) {
     return std::min(size / sizeof(DS1BoardGeneration), m_buffer.size());
 }
 
-/// Without memory for all boards, the others are asked every second.
+/// Makes room for more boards. Boards for which there is no memory are asked every second.
 bool LineGenerations::enlarge() {
     try {
         m_buffer.resize(std::max(2 * m_buffer.size(), kFewest));

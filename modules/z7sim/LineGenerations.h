@@ -9,8 +9,8 @@
 
 #include "boardplatform/ds1_line.h"
 
-/// The `LineGenerations` are what the platform answers to LINE_GENERATIONS, asked once in each pass
-/// of the `LineScheduler`.
+/// A `LineGenerations` asks the platform for LINE_GENERATIONS once in each pass of the
+/// `LineScheduler`, and finds the answer for each board.
 ///
 /// Thread-bound: the scheduler's thread.
 class LineGenerations {
@@ -18,8 +18,9 @@ class LineGenerations {
     /// The process's instance, never destroyed. Thread-safe.
     static LineGenerations& instance();
 
-    /// Those of a board's lines when the pass began; generation 0 when the platform has no answer.
-    /// `place`: where they stood in the pass before, and stand now.
+    /// What the platform answered for a board when the pass began. Generation 0: it did not answer.
+    /// `place`: the board's place in the previous answer, where the search begins; set to its place
+    /// in this answer.
     DS1BoardGeneration of(long board, std::size_t& place);
 
   private:

@@ -11,9 +11,9 @@
 
 namespace {
 
-/// For the answers to a request, with room for the lines of any board. Boards tick one after the
-/// other; what they share stays in the processor's cache. Changed between passes only, and never
-/// destroyed, because the scheduler never ends.
+/// The buffer for the answers to a request, with room for the lines of any board. Boards tick one
+/// after the other; what they share stays in the processor's cache. Changed between passes only,
+/// and never destroyed, because the scheduler never ends.
 std::vector<DS1BoardLine>& sharedAnswers() {
     static auto* const answers = new std::vector<DS1BoardLine>;
     return *answers;
@@ -71,12 +71,12 @@ int LineTicks::ScheduledAction() {
     return 0;
 }
 
-/// Whether the counters are those that the tables know, a second later.
+/// Whether a second has passed and the counters have not changed since the tables read them.
 bool LineTicks::isNextSecondOf(DS1BoardGeneration const& now) const {
     return m_generation != 0 && now.generation == m_generation && now.seconds == m_seconds + 1;
 }
 
-/// `generation`: one that the counters had before now.
+/// `generation`: of the counters, known before they are read.
 void LineTicks::ask(bool together, std::uint64_t generation) {
     auto const room = std::span(sharedAnswers()).first(m_lines.size());
     std::size_t const count = together ? m_batch->read(room) : 0;

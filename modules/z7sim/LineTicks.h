@@ -46,8 +46,8 @@ class LineTicks final : public Schedulable {
 
     std::unique_ptr<LineBatch> const m_batch;
     std::atomic<bool> m_isTogether{true};
-    // Of the counters that the tables know: their generation (0: not known, or not one for all),
-    // and the seconds of the board's first line.
+    // Of the counters that the tables have read: the generation (0: unknown, or not the same for
+    // all lines), and the seconds of the board's first line.
     std::uint64_t m_generation = 0;
     std::uint32_t m_seconds = 0;
     // Changed between passes only.

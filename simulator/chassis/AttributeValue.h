@@ -31,7 +31,7 @@ class AttributeValue {
     static AttributeValue byte(std::int8_t value);
     static AttributeValue empty();
     static AttributeValue descriptor(DescriptorWords const& words);
-    /// `bytes`: as `bytes()` of such a value are.
+    /// `bytes`: in the format that `bytes()` returns.
     AttributeValue(ValueForm form, std::string_view bytes) : m_form(form), m_bytes(bytes) {}
 
     ValueForm form() const { return m_form; }

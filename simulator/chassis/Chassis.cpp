@@ -23,7 +23,7 @@ std::size_t countObjects(ObjectDraft const& draft) {
     return count;
 }
 
-/// A generation of lines that none had before, in this chassis or another.
+/// A generation that no lines of any chassis of this process have had.
 std::uint64_t nextGeneration() {
     static std::atomic<std::uint64_t> last{0};
     return ++last;
@@ -192,7 +192,8 @@ BoardLines const* Chassis::linesOf(long board) const {
     return lines.board == narrow ? &lines : nullptr;
 }
 
-/// Where the lines of a board stand, or would stand.
+/// The place of a board in the list of boards with lines; if it has none, where it would be
+/// entered.
 std::size_t Chassis::placeOfLines(std::int32_t board) const {
     auto const place = std::ranges::lower_bound(m_boardsWithLines, board, {}, &BoardLines::board);
     return static_cast<std::size_t>(place - m_boardsWithLines.begin());
@@ -210,7 +211,7 @@ void Chassis::gatherLines(ChassisObject const& board) {
     m_boardsWithLines.insert(m_boardsWithLines.begin() + place, std::move(lines));
 }
 
-/// After a change of any line of a board.
+/// Gives a board's lines a new generation. To be called after each change of one of them.
 void Chassis::renew(BoardLines& lines) {
     bool const isSteady =
         std::ranges::all_of(lines.all, [](auto const& each) { return each.line->isSteady(); });

@@ -127,7 +127,7 @@ class Chassis {
     std::vector<BoardLines> const& boardsWithLines() const { return m_boardsWithLines; }
     /// Null: there is no such board, or it has no lines.
     BoardLines const* linesOf(long board) const;
-    /// To change them. Requires: the object has them.
+    /// The channels of an object, which the caller may change. Requires: the object has channels.
     Channels& channels(std::int32_t handle) { return *m_objects.at(handle).channels; }
 
     /// The contents of the attribute store when it is created.

@@ -59,7 +59,7 @@ class Line {
   public:
     using Time = std::chrono::nanoseconds;
 
-    /// What `DS1LineCounters` has as the seconds of this age.
+    /// The age in whole seconds, as `DS1LineCounters` reports it.
     static std::uint32_t wholeSeconds(Time age) {
         return static_cast<std::uint32_t>(std::chrono::floor<std::chrono::seconds>(age).count());
     }

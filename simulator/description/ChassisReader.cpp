@@ -228,8 +228,8 @@ ObjectDraft readBoardOnly(Description const& description, std::string const& dat
     return board;
 }
 
-/// One board after the other, so that all need the memory of one draft: what drafts leave between
-/// the boards' objects is too small for most of what comes later.
+/// Reads the boards one after the other, so that each draft uses the memory of the one before.
+/// Drafts that existed at once would leave gaps in memory too small for most later allocations.
 void readBoards(Description const& list, Chassis& chassis, Findings& findings) {
     if (list.form == Form::nothing) return;
     if (list.form != Form::list)

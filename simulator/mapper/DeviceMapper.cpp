@@ -71,7 +71,7 @@ std::int32_t readLines(DMAttribute& request, std::int32_t capacity,
     return 0;
 }
 
-/// As many boards with lines as the buffer holds.
+/// Writes the generations of as many boards as the buffer holds.
 std::int32_t readGenerations(DMAttribute& request, std::int32_t capacity, Chassis const& chassis) {
     auto const& boards = chassis.boardsWithLines();
     std::size_t const count =

@@ -57,7 +57,7 @@ struct SnmpHandler::Call {
     Oid relative(netsnmp_variable_list const* variable, bool& orEqual) const;
     /// Sets `name` to an absolute name.
     void setName(OidView relativeName);
-    /// What the library says of the client's view of all that is below a name.
+    /// Asks the library whether the client may see all of a subtree, some of it, or nothing.
     int viewOf(OidView subtree);
     /// Whether the client may see the instance. Asks the library once for each object, and for each
     /// instance only if the client may see some instances of the object and not others.

@@ -241,7 +241,7 @@ TEST_F(ObjectTreeTest, FormerSearchesDoNotChangeWhatIsFound) {
 
 using ObjectTreeThreadsTest = ObjectTreeTest;
 
-/// Both threads look first where either has found something last.
+/// A search on either thread begins where the last search of any thread ended.
 TEST_F(ObjectTreeThreadsTest, WalksOnTwoThreadsDoNotDisturbEachOther) {
     auto const walk = [&] {
         std::vector<Oid> names;

@@ -16,7 +16,8 @@ using ::testing::ElementsAre;
 /// board 2 has 2000.
 class DistinctNamesTest : public ::testing::Test {
   protected:
-    /// Gives the board interfaces of these names. Returns whether those of other boards stay.
+    /// Gives the board interfaces with these names. Returns whether the interfaces of all other
+    /// boards keep their names.
     bool put(int board, std::vector<std::string> const& names) {
         BoardTexts texts{"B" + std::to_string(board), {}};
         auto index = static_cast<std::uint32_t>(board) * 1000;
@@ -118,7 +119,7 @@ TEST_F(DistinctNamesTest, NoNamesAreEqualHoweverLongTheyAre) {
 }
 
 TEST_F(DistinctNamesTest, CountingChangesIsCountingAnew) {
-    // Few names, some of which are what others become.
+    // Few names. Some are equal to what others become when the name of a board follows them.
     std::vector<std::string> const some{"a", "b", "c", "d", "a@B1", "b@B2", "a@B1@B2"};
     std::mt19937 random(20261122);
     auto const number = [&](int least, int most) {

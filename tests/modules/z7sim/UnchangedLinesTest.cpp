@@ -280,7 +280,7 @@ TEST(UnchangedLinesTest, HistoriesAreThoseOfLinesThatAreAskedOneByOne) {
         seconds += world.seconds;
         requests += world.requests;
     }
-    // Both ways were gone, each often.
+    // Boards were asked often, and left unasked often.
     EXPECT_GT(requests, seconds / 10);
     EXPECT_LT(requests, seconds / 10 * 9);
 }

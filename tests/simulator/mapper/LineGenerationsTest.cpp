@@ -42,7 +42,7 @@ class LineGenerationsTest : public testing::Test {
         EXPECT_EQ(dm_getDeviceMapperClient()->GetRootObject(&root), 0);
         return records<DS1BoardGeneration>(root, kDS1LineGenerations, capacity);
     }
-    /// That of board 1, which is the first.
+    /// The generation of board 1, which comes first in the answer.
     static std::uint64_t generation() { return generations().at(0).generation; }
 
     static void run(std::string const& command) {
