@@ -76,7 +76,8 @@ DS1LineCounters Line::counters(Time age) const {
 }
 
 bool Line::isSteady() const {
-    return m_rates == LineRates() && (m_raised & kFrameLosing) == 0;
+    bool const isWithoutErrors = std::ranges::all_of(m_rates, [](auto rate) { return rate == 0; });
+    return isWithoutErrors && (m_raised & kFrameLosing) == 0;
 }
 
 void Line::add(LineErrors const& errors) {
